@@ -1,0 +1,28 @@
+#pragma once
+
+#include <QString>
+#include <QStringList>
+
+#include <functional>
+
+/// Finds files and folders by the end of their name, in a folder and all folders below it.
+class FileFinder {
+public:
+    /// `ending` is the end of the names looked for, with its dot (".vst3"), compared without regard to case.
+    explicit FileFinder(const QString &ending);
+
+    /// Asked before each folder; the search ends early when it answers true.
+    void setCancelled(std::function<bool()> cancelled) { m_cancelled = std::move(cancelled); }
+
+    /// The full paths found, "/" as separator: those of a folder in the order of their names, followed by
+    /// what lies in its sub-folders. A folder that matches is listed and searched. Hidden entries are passed
+    /// over and linked folders are not entered, so the search cannot loop. A folder that cannot be read gives
+    /// one log line.
+    QStringList find(const QString &folder) const;
+
+private:
+    void searchFolder(const QString &folder, QStringList &found) const;
+
+    QString m_ending;
+    std::function<bool()> m_cancelled;
+};

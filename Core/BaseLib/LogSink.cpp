@@ -1,0 +1,34 @@
+#include "Core/BaseLib/LogSink.h"
+
+#include "Core/BaseLib/NativeFile.h"
+#include "Core/BaseLib/TextFile.h"
+
+std::shared_ptr<FileLogSink> FileLogSink::onStandardError()
+{
+    return std::make_shared<FileLogSink>(stderr, false);
+}
+
+std::shared_ptr<FileLogSink> FileLogSink::appendingTo(const QString &path)
+{
+    std::FILE *stream = openStream(path, "ab");
+    return stream ? std::make_shared<FileLogSink>(stream, true) : nullptr;
+}
+
+FileLogSink::FileLogSink(std::FILE *stream, bool ownsStream)
+    : m_stream(stream)
+    , m_ownsStream(ownsStream)
+{}
+
+FileLogSink::~FileLogSink()
+{
+    if (m_ownsStream)
+        std::fclose(m_stream);
+}
+
+void FileLogSink::write(int, const QString &line)
+{
+    const QByteArray bytes = line.toUtf8() + kLineEnd;
+    const std::lock_guard<std::mutex> lock(m_mutex);
+    std::fwrite(bytes.constData(), 1, static_cast<std::size_t>(bytes.size()), m_stream);
+    std::fflush(m_stream);
+}

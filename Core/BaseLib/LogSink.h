@@ -1,0 +1,36 @@
+#pragma once
+
+#include <QString>
+
+#include <cstdio>
+#include <memory>
+#include <mutex>
+
+/// Where finished log lines are stored. An implementation serialises: any thread may write.
+class LogSink {
+public:
+    virtual ~LogSink() = default;
+    /// Stores one line, given without its line end.
+    virtual void write(int level, const QString &line) = 0;
+};
+
+/// Writes lines as UTF-8 to a C stream, each in one piece and flushed, so that the last line before a crash
+/// is there.
+class FileLogSink : public LogSink {
+public:
+    static std::shared_ptr<FileLogSink> onStandardError();
+    /// Null when the file cannot be opened.
+    static std::shared_ptr<FileLogSink> appendingTo(const QString &path);
+
+    FileLogSink(std::FILE *stream, bool ownsStream);
+    ~FileLogSink() override;
+    FileLogSink(const FileLogSink &) = delete;
+    FileLogSink &operator=(const FileLogSink &) = delete;
+
+    void write(int level, const QString &line) override;
+
+private:
+    std::FILE *m_stream;
+    bool m_ownsStream;
+    std::mutex m_mutex;
+};

@@ -1,0 +1,46 @@
+#pragma once
+
+#include <QString>
+
+#include <string>
+
+/// One dynamic library handle. Loading runs the library's own start-up code on the calling thread.
+class PluginLibrary {
+public:
+    PluginLibrary() = default;
+    /// Frees the library as `free()` does.
+    ~PluginLibrary();
+    PluginLibrary(const PluginLibrary &) = delete;
+    PluginLibrary &operator=(const PluginLibrary &) = delete;
+
+    /// Loads the library with this full path. True when a handle was obtained; otherwise `errorText()` says
+    /// why.
+    bool load(const std::wstring &path);
+    bool load(const QString &path);
+    /// The address of an exported symbol, or null.
+    void *symbol(const char *name) const;
+    /// Unloads the library, unless the process cache keeps it.
+    void free();
+    /// Drops the handle and leaves the library mapped for the rest of the process.
+    void leaveMapped();
+
+    bool isLoaded() const { return m_handle != nullptr; }
+    /// The system's own words for why the last load failed.
+    const QString &errorText() const { return m_errorText; }
+
+    /// Whether a file exists at the path.
+    static bool exists(const QString &path);
+
+    /// When set, handles are remembered in one process-wide table by full path and never freed.
+    bool useProcessCache = false;
+    /// When set, the library's own folder is searched first for its dependencies. Only Windows has such a
+    /// switch; elsewhere a library names that folder itself.
+    bool searchDllLoadDir = false;
+
+private:
+    /// Asks the system's loader; null on failure, with `m_errorText` set.
+    void *loadUncached(const QString &path);
+
+    void *m_handle = nullptr;
+    QString m_errorText;
+};

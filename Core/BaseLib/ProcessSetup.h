@@ -1,0 +1,15 @@
+#pragma once
+
+/// Prepares the process before the application object exists: a crash brings up no system box, no crash
+/// reporter and no core dump, file names are text in the system's own encoding, a closed output pipe kills
+/// nobody, and a machine without a display gets Qt's offscreen platform.
+void prepareProcess();
+
+/// To be called when the application object exists, which sets the user's locale: numbers are printed and
+/// read with a point again, for us and for plug-ins.
+void settleLocale();
+
+/// Ends the process at once: what is written is flushed, but no exit handler and no static destructor runs.
+/// Modules that stayed mapped belong to strangers, and a crash in their exit handlers would look like a
+/// failed scan.
+[[noreturn]] void leaveProcess(int exitCode);

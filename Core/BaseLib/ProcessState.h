@@ -1,0 +1,21 @@
+#pragma once
+
+#include <memory>
+
+/// What a plug-in may change for the whole process and later code relies on: signal handlers and mask, a
+/// pending alarm, locale, file creation mask, working directory and the calling thread's floating-point
+/// environment. Taken once, put back after each plug-in, on the same thread.
+class ProcessState {
+public:
+    ProcessState();
+    ~ProcessState();
+    ProcessState(const ProcessState &) = delete;
+    ProcessState &operator=(const ProcessState &) = delete;
+
+    /// Puts back what differs from the state taken.
+    void restore() const;
+
+private:
+    struct Snapshot;
+    std::unique_ptr<Snapshot> m_snapshot;
+};

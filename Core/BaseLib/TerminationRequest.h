@@ -1,0 +1,42 @@
+#pragma once
+
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <thread>
+
+/// The system's request that the process end: a termination signal, or the end of the user's session.
+namespace TerminationSignal {
+
+/// From now on the system's request no longer kills the process but is waited for.
+void install();
+/// Makes the request by hand. Safe in a signal handler.
+void raise();
+/// True when a request came within the time given; each request is told once.
+bool wait(std::chrono::milliseconds timeout);
+
+} // namespace TerminationSignal
+
+/// Waits for a termination request on a thread of its own.
+class TerminationWatcher {
+public:
+    /// `requested` is called once, when a request comes. When the watcher still lives `grace` later,
+    /// `overdue` is called, and then again every tenth of a second: whoever asked will not wait for ever.
+    /// Both run on the watcher's thread.
+    TerminationWatcher(std::function<void()> requested, std::function<void()> overdue,
+                       std::chrono::milliseconds grace);
+    /// Stops watching; waits for a running call to return.
+    ~TerminationWatcher();
+    TerminationWatcher(const TerminationWatcher &) = delete;
+    TerminationWatcher &operator=(const TerminationWatcher &) = delete;
+
+private:
+    void watch();
+    bool sleepUnlessStopped(std::chrono::milliseconds time);
+
+    std::function<void()> m_requested;
+    std::function<void()> m_overdue;
+    std::chrono::milliseconds m_grace;
+    std::atomic<bool> m_stop{false};
+    std::thread m_thread;
+};

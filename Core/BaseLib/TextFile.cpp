@@ -1,0 +1,63 @@
+#include "Core/BaseLib/TextFile.h"
+
+#include "Core/BaseLib/NativeFile.h"
+
+#include <QFile>
+#include <QFileInfo>
+
+namespace {
+
+FileResult writeAll(QFile &file, const QByteArray &content, Durability durability)
+{
+    if (file.write(content) != content.size() || !file.flush())
+        return {file.errorString()};
+    if (durability == Durability::Synced)
+        syncToDisk(file.handle());
+    file.close();
+    return file.error() == QFile::NoError ? FileResult{} : FileResult{file.errorString()};
+}
+
+FileResult writeDirectly(const QString &path, const QByteArray &content, Durability durability)
+{
+    QFile file(path);
+    if (!file.open(QIODevice::WriteOnly | QIODevice::Truncate))
+        return {file.errorString()};
+    return writeAll(file, content, durability);
+}
+
+} // namespace
+
+FileResult replaceFile(const QString &path, const QByteArray &content, Durability durability)
+{
+    const QFileInfo existing(path);
+    const bool exists = existing.exists();
+    // A file reached through a link is replaced where it lies; the link stays.
+    const QString target = exists ? existing.canonicalFilePath() : path;
+    if (exists) {
+        QFile probe(target);
+        if (!probe.open(QIODevice::WriteOnly | QIODevice::Append))
+            return {probe.errorString()};
+    }
+    QFile temporary(target + QStringLiteral(".tmp"));
+    if (!temporary.open(QIODevice::WriteOnly | QIODevice::Truncate))
+        return writeDirectly(target, content, durability);
+    if (exists)
+        temporary.setPermissions(existing.permissions());
+    FileResult result = writeAll(temporary, content, durability);
+    if (result) {
+        result = renameOver(temporary.fileName(), target);
+        if (result)
+            return result;
+    }
+    temporary.remove();
+    return result;
+}
+
+FileResult readWholeFile(const QString &path, QByteArray &content)
+{
+    QFile file(path);
+    if (!file.open(QIODevice::ReadOnly))
+        return {file.errorString()};
+    content = file.readAll();
+    return file.error() == QFile::NoError ? FileResult{} : FileResult{file.errorString()};
+}

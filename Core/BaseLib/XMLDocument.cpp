@@ -1,0 +1,85 @@
+#include "Core/BaseLib/XMLDocument.h"
+
+#include "Core/BaseLib/FormatText.h"
+#include "Core/BaseLib/TextFile.h"
+
+#include <charconv>
+#include <cstdlib>
+
+#include <pugixml.hpp>
+
+namespace {
+
+// A text of nothing but blanks is a value too: plug-ins may be called " ".
+constexpr unsigned kParseOptions = pugi::parse_default | pugi::parse_ws_pcdata_single;
+
+} // namespace
+
+XMLElement XMLElement::child(const char *name) const
+{
+    return XMLElement(pugi::xml_node(m_node).child(name).internal_object());
+}
+
+std::vector<XMLElement> XMLElement::children(const char *name) const
+{
+    std::vector<XMLElement> found;
+    for (const pugi::xml_node node : pugi::xml_node(m_node).children(name))
+        found.push_back(XMLElement(node.internal_object()));
+    return found;
+}
+
+QString XMLElement::text() const { return QString::fromUtf8(pugi::xml_node(m_node).text().get()); }
+
+std::optional<QString> XMLElement::attribute(const char *name) const
+{
+    const pugi::xml_attribute found = pugi::xml_node(m_node).attribute(name);
+    if (!found)
+        return std::nullopt;
+    return QString::fromUtf8(found.value());
+}
+
+XMLDocument::XMLDocument()
+    : m_document(std::make_unique<pugi::xml_document>())
+{}
+
+XMLDocument::~XMLDocument() = default;
+
+bool XMLDocument::load(const QString &path)
+{
+    QByteArray content;
+    if (const FileResult read = readWholeFile(path, content); !read) {
+        m_document->reset();
+        m_error = read.reason;
+        return false;
+    }
+    return parse(content);
+}
+
+bool XMLDocument::parse(const QByteArray &xml)
+{
+    const pugi::xml_parse_result result =
+        m_document->load_buffer(xml.constData(), static_cast<std::size_t>(xml.size()), kParseOptions);
+    m_error.clear();
+    if (!result)
+        m_error = formatText(L"%s at byte %lld", result.description(), static_cast<long long>(result.offset));
+    return m_error.isEmpty();
+}
+
+XMLElement XMLDocument::root(const char *name) const
+{
+    return XMLElement(m_document->child(name).internal_object());
+}
+
+qint64 parseInteger(const QString &text)
+{
+    const QByteArray digits = text.toUtf8();
+    return std::strtoll(digits.constData(), nullptr, 10);
+}
+
+double parseDecimal(const QString &text)
+{
+    const QByteArray digits = text.trimmed().toUtf8();
+    double value = 0.0;
+    std::from_chars(digits.constData(), digits.constData() + digits.size(), value);
+    return value;
+}

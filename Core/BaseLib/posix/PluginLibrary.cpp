@@ -1,0 +1,29 @@
+#include "Core/BaseLib/PluginLibrary.h"
+
+#include <QFile>
+
+#include <dlfcn.h>
+
+void *PluginLibrary::loadUncached(const QString &path)
+{
+    if (path.isEmpty()) { // dlopen would answer with the program itself
+        m_errorText = QStringLiteral("no path given");
+        return nullptr;
+    }
+    // Bound at once: with lazy binding a missing symbol ends the process in the middle of a call; this way it
+    // is a reason.
+    void *handle = dlopen(QFile::encodeName(path).constData(), RTLD_NOW | RTLD_LOCAL);
+    if (!handle)
+        m_errorText = QString::fromLocal8Bit(dlerror());
+    return handle;
+}
+
+void *PluginLibrary::symbol(const char *name) const { return m_handle ? dlsym(m_handle, name) : nullptr; }
+
+void PluginLibrary::free()
+{
+    if (useProcessCache || !m_handle)
+        return;
+    dlclose(m_handle);
+    m_handle = nullptr;
+}
