@@ -1,11 +1,17 @@
 #include "Core/BaseLib/PluginLibrary.h"
 
+#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/ThreadCount.h"
+
 #include <QFile>
 
 #include <map>
 #include <mutex>
 
 namespace {
+
+/// How long threads that were asked to end get to do so.
+constexpr std::chrono::milliseconds kThreadPatience(50);
 
 struct ProcessCache {
     std::mutex mutex;
@@ -27,6 +33,8 @@ bool PluginLibrary::load(const std::wstring &path) { return load(QString::fromSt
 bool PluginLibrary::load(const QString &path)
 {
     m_errorText.clear();
+    m_path = path;
+    m_threadsBefore = runningThreads();
     if (!useProcessCache) {
         m_handle = loadUncached(path);
         return m_handle != nullptr;
@@ -41,5 +49,14 @@ bool PluginLibrary::load(const QString &path)
 }
 
 void PluginLibrary::leaveMapped() { m_handle = nullptr; }
+
+void PluginLibrary::freeUnlessRunning()
+{
+    if (m_handle && !useProcessCache && !threadsSettleTo(m_threadsBefore, kThreadPatience)) {
+        DebugLog(L"%ls left threads running and stays in memory", m_path);
+        leaveMapped();
+    }
+    free();
+}
 
 bool PluginLibrary::exists(const QString &path) { return QFile::exists(path); }

@@ -23,8 +23,14 @@ public:
     void free();
     /// Drops the handle and leaves the library mapped for the rest of the process.
     void leaveMapped();
+    /// Unloads the library, unless more threads run than before it was loaded: a thread in unmapped code
+    /// would kill the process while another library is being blamed. Such a library stays mapped, with a log
+    /// line.
+    void freeUnlessRunning();
 
     bool isLoaded() const { return m_handle != nullptr; }
+    /// The system's handle, or null.
+    void *handle() const { return m_handle; }
     /// The system's own words for why the last load failed.
     const QString &errorText() const { return m_errorText; }
 
@@ -42,5 +48,7 @@ private:
     void *loadUncached(const QString &path);
 
     void *m_handle = nullptr;
+    QString m_path;
+    int m_threadsBefore = 0; ///< threads of the process before the library was loaded
     QString m_errorText;
 };

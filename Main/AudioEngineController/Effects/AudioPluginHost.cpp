@@ -1,0 +1,227 @@
+#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FileFinder.h"
+#include "Main/AudioEngineController/Effects/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/VLib/ApplicationContext.h"
+
+#include <QDir>
+#include <QFile>
+
+namespace {
+
+const QByteArray &textOf(const CatalogueFormat &format, const ListedEffect &effect)
+{
+    if (effect.rendered.isNull())
+        effect.rendered = renderRecord(format, effect.record);
+    return effect.rendered;
+}
+
+} // namespace
+
+QString AudioPluginHost::cataloguePath() const
+{
+    return m_catalogueFolder + QString::fromLatin1(m_format->fileName);
+}
+
+QStringList AudioPluginHost::folders() const
+{
+    const IQuillonInterface *application = ApplicationContext::instance().quillonInterface;
+    return application ? application->scanFolders() : QStringList();
+}
+
+bool AudioPluginHost::catalogueChanged()
+{
+    if (!m_format)
+        return false;
+    const FileStamp stamp = fileStamp(cataloguePath());
+    const TAutoLockCS lock(&m_ks);
+    const bool changed = stamp != m_lastSeen;
+    m_lastSeen = stamp;
+    return changed;
+}
+
+bool AudioPluginHost::Scan(bool, bool)
+{
+    refillEffects();
+    return false;
+}
+
+quint32 AudioPluginHost::maskToCategory(quint32 mask) const
+{
+    return CategoryTable::instance().maskToCategory(mask);
+}
+
+quint32 AudioPluginHost::categoryToMask(quint32 category) const
+{
+    return CategoryTable::instance().categoryToMask(category);
+}
+
+bool AudioPluginHost::AddEffect(const EffectRecord &record)
+{
+    const TAutoLockCS lock(&m_ks);
+    return m_effects.add(record);
+}
+
+std::vector<EffectRecord> AudioPluginHost::effects() const
+{
+    const TAutoLockCS lock(&m_ks);
+    std::vector<EffectRecord> records;
+    records.reserve(m_effects.size());
+    for (const auto &entry : m_effects.entries())
+        records.push_back(entry.second.record);
+    return records;
+}
+
+bool AudioPluginHost::isListed(const EffectRecord &record) const
+{
+    const TAutoLockCS lock(&m_ks);
+    const EffectRecord *listed = m_effects.find(record.id);
+    return listed && listed->isSamePlugin(record);
+}
+
+void AudioPluginHost::clearEffects()
+{
+    const TAutoLockCS lock(&m_ks);
+    m_effects.clear();
+}
+
+void AudioPluginHost::refillEffects()
+{
+    clearEffects();
+    for (const EffectRecord *record : m_known.all())
+        AddEffect(*record);
+}
+
+void AudioPluginHost::ReadCatalogue()
+{
+    if (!m_format)
+        return;
+    const TAutoLockCS lock(&m_ks);
+    m_known.clear();
+    m_leftAlone.clear();
+    readKnownRecords();
+    absorbMarkers();
+}
+
+void AudioPluginHost::readKnownRecords()
+{
+    m_catalogueOutdated = false;
+    const QString path = cataloguePath();
+    if (!QFile::exists(path))
+        return;
+    const CatalogueContents contents = readCatalogueFile(*m_format, path);
+    if (!contents)
+        DebugLog(L"Cannot use the catalogue %ls: %ls", path, contents.reason);
+    for (const EffectRecord &record : contents.records)
+        m_known.file(record);
+    m_catalogueOutdated = contents.upgraded;
+}
+
+void AudioPluginHost::absorbMarkers()
+{
+    if (!QDir(m_catalogueFolder).exists())
+        return;
+    const QStringList paths =
+        FileFinder(QString::fromLatin1(m_format->marker.ending)).find(m_catalogueFolder);
+    std::vector<EffectRecord> markers;
+    std::set<QString> filesWithCrashedChild;
+    for (const QString &path : paths) {
+        markers.push_back(readMarkerFile(m_format->marker, path));
+        if (markers.back().subId != 0)
+            filesWithCrashedChild.insert(markers.back().path);
+    }
+    for (const EffectRecord &marker : markers) {
+        // The marker of a whole shell is there beside its child's; the child is the culprit.
+        if (marker.subId != 0 || filesWithCrashedChild.count(marker.path) == 0)
+            absorbMarker(marker);
+    }
+    if (paths.isEmpty())
+        return;
+    if (!writeKnownRecords())
+        return; // The markers stay: nothing else holds what they say.
+    m_catalogueOutdated = false;
+    for (const QString &path : paths)
+        QFile::remove(path);
+}
+
+bool AudioPluginHost::writeKnownRecords()
+{
+    WaitingRecords sorted;
+    for (const EffectRecord *record : m_known.all())
+        if (!record->path.isEmpty()) // an unreadable marker's has none
+            sorted.insert({record->id, {*record, {}}});
+    std::vector<const QByteArray *> texts;
+    for (const auto &entry : sorted)
+        texts.push_back(&textOf(*m_format, entry.second));
+    return writeRecords(texts, Durability::Synced);
+}
+
+void AudioPluginHost::absorbMarker(const EffectRecord &marker)
+{
+    DebugLog(L"A crash marker names %ls, %ls", marker.name, marker.path);
+    if (isMarkerWithoutRecord(marker)) {
+        m_leftAlone.insert(marker.path);
+        return;
+    }
+    EffectRecord &crashed = m_known.applyCrash(marker);
+    crashed.id = freeIdentifier(crashed, marker.name);
+}
+
+QString AudioPluginHost::freeIdentifier(const EffectRecord &plugin, const QString &name) const
+{
+    const QString candidates[] = {name, plugin.path,
+                                  plugin.path + QLatin1Char(':') + QString::number(plugin.subId)};
+    for (const QString &candidate : candidates) {
+        const EffectRecord *listed = m_effects.find(candidate);
+        if (!(listed && !listed->isSamePlugin(plugin)) && !m_known.isIdHeldByOther(candidate, plugin))
+            return candidate;
+    }
+    return candidates[2];
+}
+
+void AudioPluginHost::completeFailedRecord(EffectRecord &record) const
+{
+    NameFromPath(record);
+    record.id = freeIdentifier(record, record.name);
+    record.enabled = true;
+    record.working = false;
+}
+
+QString AudioPluginHost::WriteCrashMarker(const EffectRecord &plugin, const QString &name)
+{
+    const QString marker = markerPath(m_format->marker, m_catalogueFolder, plugin.path, name);
+    EffectRecord content = plugin;
+    content.name = name;
+    if (name.isNull())
+        NameFromPath(content);
+    if (const FileResult written = writeMarkerFile(m_format->marker, marker, content); !written)
+        DebugLog(L"Cannot write the crash marker %ls: %ls", marker, written.reason);
+    return marker;
+}
+
+void AudioPluginHost::WriteCatalogue(const WaitingRecords &waiting, Durability durability)
+{
+    const TAutoLockCS lock(&m_ks);
+    std::vector<const QByteArray *> texts;
+    texts.reserve(m_effects.size() + waiting.size());
+    auto next = waiting.begin();
+    for (const auto &[id, effect] : m_effects.entries()) {
+        for (; next != waiting.end() && next->first < id; ++next)
+            texts.push_back(&textOf(*m_format, next->second));
+        texts.push_back(&textOf(*m_format, effect));
+    }
+    for (; next != waiting.end(); ++next)
+        texts.push_back(&textOf(*m_format, next->second));
+    writeRecords(texts, durability);
+}
+
+bool AudioPluginHost::writeRecords(const std::vector<const QByteArray *> &records, Durability durability)
+{
+    const QString path = cataloguePath();
+    const FileResult written = replaceFile(path, renderCatalogue(*m_format, records), durability);
+    if (!written)
+        DebugLog(L"Cannot write the catalogue %ls: %ls", path, written.reason);
+    return bool(written);
+}

@@ -1,0 +1,117 @@
+#pragma once
+
+#include "Core/BaseLib/FileTime.h"
+#include "Core/BaseLib/KriticalSection.h"
+#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/EffectList.h"
+#include "Main/AudioEngineController/Effects/KnownList.h"
+
+#include <QStringList>
+
+#include <atomic>
+#include <set>
+
+/// Base of the per-format hosts. Holds one format's catalogue: what the previous run left (the known list)
+/// and what this run found (the effect list), and reads and writes the files that carry them.
+///
+/// One thread at a time scans; `effects` may be asked from any thread. The critical section `m_ks` guards the
+/// lists and is never held while plug-in code runs.
+class AudioPluginHost {
+public:
+    virtual ~AudioPluginHost() = default;
+    AudioPluginHost(const AudioPluginHost &) = delete;
+    AudioPluginHost &operator=(const AudioPluginHost &) = delete;
+
+    /// Sets the folder in which the catalogue and the crash markers lie, without a separator at its end.
+    void setCatalogueFolder(const QString &folder) { m_catalogueFolder = folder; }
+    const QString &catalogueFolder() const { return m_catalogueFolder; }
+
+    /// Reads the previous catalogue into the known list, which is emptied first, and absorbs the crash
+    /// markers: the catalogue is rewritten with what they say, and only then are they deleted, so that the
+    /// knowledge outlives another crash.
+    virtual void ReadCatalogue();
+    /// The plug-in folders to scan, as the host application lists them.
+    virtual QStringList folders() const;
+    /// True when the catalogue file differs from the one seen at the last call.
+    virtual bool catalogueChanged();
+    /// Scans the folders (true) or only refreshes the effect list from the known list (false). `inProcess`
+    /// matters to the registry only. True when the catalogue was written.
+    virtual bool Scan(bool scan, bool inProcess);
+    /// Sets what plug-ins are told about the audio they will be used for.
+    virtual void setAudioSettings(int /*sampleRate*/, int /*blockSize*/) {}
+    /// Category set of a file to the form used in memory, and back.
+    virtual quint32 maskToCategory(quint32 mask) const;
+    virtual quint32 categoryToMask(quint32 category) const;
+
+    /// Adds a record to the effect list; true when it was added.
+    virtual bool AddEffect(const EffectRecord &record);
+
+    /// Writes the effect list, and with it the records of files still waiting for their probe, to the
+    /// catalogue file. A file that cannot be written is logged and stays as it was.
+    void WriteCatalogue(const WaitingRecords &waiting = {}, Durability durability = Durability::Synced);
+
+    /// Writes the crash marker for a plug-in that is about to be touched and gives its full path. A null name
+    /// is made from the record's path. A marker that cannot be written is logged; the plug-in is probed
+    /// unprotected.
+    QString WriteCrashMarker(const EffectRecord &plugin, const QString &name = QString());
+
+    /// Completes the record of a file that failed to load or lists nothing: named after the file, enabled,
+    /// not working, so that it is shown and not probed again until it changes.
+    void completeFailedRecord(EffectRecord &record) const;
+
+    /// A copy of the effect list's records, in the order of their identifiers.
+    std::vector<EffectRecord> effects() const;
+
+    const KnownList &known() const { return m_known; }
+    /// True for a file that this run must not touch although nothing is recorded about it.
+    bool isLeftAlone(const QString &path) const { return m_leftAlone.count(path) != 0; }
+    std::size_t effectCount() const { return m_effects.size(); }
+    /// True when the effect list holds a record of the same plug-in under the same identifier.
+    bool isListed(const EffectRecord &record) const;
+    /// True when the catalogue file holds something else than the known list, being of an earlier version.
+    bool isCatalogueOutdated() const { return m_catalogueOutdated; }
+
+    /// Asks a running scan to stop after the current file; any thread. The next scan starts without the
+    /// request.
+    void cancel() { m_cancelled = true; }
+    bool isCancelled() const { return m_cancelled; }
+    /// Forgets an earlier request to stop.
+    void clearCancel() { m_cancelled = false; }
+
+    /// Empties the effect list.
+    void clearEffects();
+    /// Empties the effect list and fills it from the known list.
+    void refillEffects();
+
+protected:
+    /// `format` describes the catalogue file and must outlive the host; null: the host has none.
+    explicit AudioPluginHost(const CatalogueFormat *format = nullptr)
+        : m_format(format)
+    {}
+
+    const CatalogueFormat *format() const { return m_format; }
+    QString cataloguePath() const;
+    EffectList &effectList() { return m_effects; }
+
+    /// Whether a crash marker only keeps its file from being touched in this run, without a record.
+    virtual bool isMarkerWithoutRecord(const EffectRecord & /*marker*/) const { return false; }
+
+    mutable KriticalSection m_ks;
+
+private:
+    void readKnownRecords();
+    void absorbMarkers();
+    void absorbMarker(const EffectRecord &marker);
+    bool writeKnownRecords();
+    bool writeRecords(const std::vector<const QByteArray *> &records, Durability durability);
+    QString freeIdentifier(const EffectRecord &plugin, const QString &name) const;
+
+    const CatalogueFormat *m_format;
+    QString m_catalogueFolder;
+    FileStamp m_lastSeen;
+    KnownList m_known;
+    EffectList m_effects;
+    std::set<QString> m_leftAlone;
+    bool m_catalogueOutdated = false;
+    std::atomic<bool> m_cancelled{false};
+};

@@ -1,0 +1,87 @@
+#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+
+namespace {
+
+EffectRecord readRecord(const CatalogueFormat &format, const XMLElement &effect)
+{
+    EffectRecord record;
+    for (const CatalogueElement &element : format.elements) {
+        if (!element.read)
+            continue;
+        if (const XMLElement child = effect.child(element.name))
+            element.read(record, child);
+    }
+    return record;
+}
+
+void upgradeRecord(const CatalogueFormat &format, double version, EffectRecord &record)
+{
+    if (version < format.fileTimesTrustedFrom)
+        record.fileTime = format.fileTime(record.path);
+    if (version < format.categoryMasksFrom)
+        record.category = 0;
+}
+
+} // namespace
+
+CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path)
+{
+    CatalogueContents contents;
+    XMLDocument document;
+    if (!document.load(path)) {
+        contents.reason = document.error();
+        return contents;
+    }
+    const XMLElement root = document.root("Effects");
+    if (!root) {
+        contents.reason = QStringLiteral("it has no \"Effects\" element");
+        return contents;
+    }
+    const std::optional<QString> stated = root.attribute("version");
+    if (!stated && format.versionRequired) {
+        contents.reason = QStringLiteral("it states no version");
+        return contents;
+    }
+    const double version = stated ? parseDecimal(*stated) : 1.0;
+    contents.upgraded = version < format.fileTimesTrustedFrom || version < format.categoryMasksFrom;
+    for (const XMLElement &effect : root.children("Effect")) {
+        contents.records.push_back(readRecord(format, effect));
+        upgradeRecord(format, version, contents.records.back());
+    }
+    return contents;
+}
+
+QByteArray xmlHeaderLine() { return QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>") + kLineEnd; }
+
+QByteArray elementLine(int indent, const char *name, const QByteArray &content)
+{
+    return QByteArray(indent, '\t') + '<' + name + '>' + content + "</" + name + '>' + kLineEnd;
+}
+
+QByteArray renderRecord(const CatalogueFormat &format, const EffectRecord &record)
+{
+    QByteArray text = QByteArray("\t<Effect>") + kLineEnd;
+    for (const CatalogueElement &element : format.elements) {
+        if (!element.content)
+            continue;
+        if (const std::optional<QByteArray> content = element.content(record))
+            text += elementLine(2, element.name, *content);
+    }
+    return text + "\t</Effect>" + kLineEnd;
+}
+
+QByteArray renderCatalogue(const CatalogueFormat &format, const std::vector<const QByteArray *> &records)
+{
+    const QByteArray root = QByteArray("<Effects version=\"") + format.version + "\">" + kLineEnd;
+    const QByteArray end = QByteArray("</Effects>") + kLineEnd;
+    int size = xmlHeaderLine().size() + root.size() + end.size();
+    for (const QByteArray *record : records)
+        size += record->size();
+    QByteArray text;
+    text.reserve(size);
+    text += xmlHeaderLine();
+    text += root;
+    for (const QByteArray *record : records)
+        text += *record;
+    return text + end;
+}

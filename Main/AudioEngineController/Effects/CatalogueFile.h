@@ -1,0 +1,30 @@
+#pragma once
+
+#include "Core/BaseLib/TextFile.h"
+#include "Main/AudioEngineController/Effects/CatalogueFormat.h"
+
+#include <vector>
+
+/// What a catalogue file held.
+struct CatalogueContents {
+    QString reason;                    ///< why the file could not be used; empty when it was
+    std::vector<EffectRecord> records; ///< in the order of the file
+    bool upgraded = false;             ///< an earlier version, whose records were changed while reading
+
+    explicit operator bool() const { return reason.isEmpty(); }
+};
+
+/// Reads a catalogue file, upgrading records of earlier versions.
+CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path);
+
+/// A record as the catalogue file holds it, line ends included. Nothing is escaped: the files' other readers
+/// and writers do not expect it.
+QByteArray renderRecord(const CatalogueFormat &format, const EffectRecord &record);
+
+/// A whole catalogue file made of rendered records.
+QByteArray renderCatalogue(const CatalogueFormat &format, const std::vector<const QByteArray *> &records);
+
+/// The line every file of ours starts with, its end included.
+QByteArray xmlHeaderLine();
+/// `indent` tabs, the element with its unescaped content, and the line end.
+QByteArray elementLine(int indent, const char *name, const QByteArray &content);

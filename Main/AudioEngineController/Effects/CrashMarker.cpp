@@ -1,0 +1,122 @@
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/XMLDocument.h"
+#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+
+#include <QFile>
+
+#include <mutex>
+#include <set>
+
+namespace {
+
+/// Longest file name in bytes that the usual file systems take (NAME_MAX in limits.h; 255 UTF-16 units on
+/// NTFS).
+constexpr int kMaxFileName = 255;
+
+QString usableFileName(QString name)
+{
+    name.replace(QLatin1String(".."), QLatin1String("__"));
+    for (QChar &character : name)
+        if (character < QLatin1Char(' ') || QLatin1String("<>:\"/\\|?*").contains(character))
+            character = QLatin1Char('_');
+    return name;
+}
+
+QString cutToBytes(QString text, int limit)
+{
+    while (text.toUtf8().size() > limit)
+        text = cutText(text, text.size() - 1);
+    return text;
+}
+
+struct Markers {
+    std::mutex mutex;
+    std::set<QString> paths;
+};
+
+Markers &activeMarkers()
+{
+    static Markers &markers = *new Markers; // outlives the watcher that may abandon them
+    return markers;
+}
+
+} // namespace
+
+QString markerPath(const MarkerFormat &format, const QString &folder, const QString &path,
+                   const QString &name)
+{
+    EffectRecord record;
+    record.path = path;
+    record.name = name;
+    if (name.isNull())
+        NameFromPath(record);
+    const QString ending = QString::fromLatin1(format.ending);
+    return folder + QLatin1Char('/') + cutToBytes(usableFileName(record.name), kMaxFileName - ending.size()) +
+           ending;
+}
+
+FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, const EffectRecord &record)
+{
+    QByteArray text = xmlHeaderLine() + "<CrashedPlugin>" + kLineEnd;
+    if (!format.leavesOutEmpty || !record.path.isEmpty())
+        text += elementLine(1, "Path", record.path.toUtf8());
+    if (!format.leavesOutEmpty || !record.fileTime.isEmpty())
+        text += elementLine(1, "Created", record.fileTime.toUtf8());
+    text += elementLine(1, "Name", record.name.toUtf8());
+    // Signed, unlike the catalogue's: markers of earlier versions carry it so.
+    if (format.hasSubId && record.subId != 0)
+        text += elementLine(1, "SubID", QByteArray::number(static_cast<qint32>(record.subId)));
+    text += QByteArray("</CrashedPlugin>") + kLineEnd;
+
+    QFile file(marker);
+    if (file.open(QIODevice::WriteOnly | QIODevice::Truncate) && file.write(text) == text.size() &&
+        file.flush())
+        return {};
+    return {file.errorString()};
+}
+
+EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
+{
+    EffectRecord record;
+    record.enabled = false;
+    XMLDocument document;
+    if (!document.load(marker)) {
+        DebugLog(L"Cannot read the crash marker %ls: %ls", marker, document.error());
+        return record;
+    }
+    const XMLElement crashed = document.root("CrashedPlugin");
+    record.path = crashed.child("Path").text();
+    record.fileTime = crashed.child("Created").text();
+    record.name = crashed.child("Name").text();
+    if (format.hasSubId)
+        record.subId = static_cast<quint32>(parseInteger(crashed.child("SubID").text()));
+    return record;
+}
+
+void ActiveMarkers::add(const QString &marker)
+{
+    Markers &markers = activeMarkers();
+    const std::lock_guard<std::mutex> lock(markers.mutex);
+    markers.paths.insert(marker);
+}
+
+void ActiveMarkers::remove(const QString &marker)
+{
+    Markers &markers = activeMarkers();
+    const std::lock_guard<std::mutex> lock(markers.mutex);
+    QFile::remove(marker);
+    markers.paths.erase(marker);
+}
+
+void ActiveMarkers::abandon(const std::function<void()> &then)
+{
+    Markers &markers = activeMarkers();
+    const std::lock_guard<std::mutex> lock(markers.mutex);
+    if (markers.paths.empty())
+        return;
+    for (const QString &marker : markers.paths)
+        QFile::remove(marker);
+    then();
+}

@@ -1,0 +1,20 @@
+#include "Main/AudioEngineController/Effects/EffectRecord.h"
+
+QString fileNameOf(const QString &path) { return path.mid(path.lastIndexOf(QLatin1Char('/')) + 1); }
+
+bool NameFromPath(EffectRecord &record)
+{
+    const int dot = record.path.lastIndexOf(QLatin1Char('.'));
+    if (dot < 0)
+        return false;
+    const int start = record.path.lastIndexOf(QLatin1Char('/')) + 1;
+    // A "." in a folder's name is no ending of the file's.
+    QString name = dot < start ? record.path.mid(start) : record.path.mid(start, dot - start);
+    for (const QLatin1String mark : {QLatin1String("x64"), QLatin1String("_64"), QLatin1String(" 64bit")}) {
+        const int at = name.indexOf(mark);
+        if (at >= 0)
+            name.remove(at, mark.size());
+    }
+    record.name = name;
+    return true;
+}

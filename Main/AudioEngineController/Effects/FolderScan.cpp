@@ -1,0 +1,138 @@
+#include "Main/AudioEngineController/Effects/FolderScan.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FileFinder.h"
+#include "Main/VLib/SimpleGUI.h"
+#include "Main/VLib/VProgressDisplay.h"
+
+#include <algorithm>
+#include <exception>
+
+FolderScan::FolderScan(AudioPluginHost &host, const QString &ending)
+    : m_host(host)
+    , m_ending(ending)
+{}
+
+FolderScan::~FolderScan() = default;
+
+bool FolderScan::run()
+{
+    try {
+        scan();
+    } catch (const std::exception &error) {
+        DebugLog(L"The scan ended early: %s", error.what());
+    } catch (...) {
+        DebugLog(L"The scan ended early");
+    }
+    return m_written;
+}
+
+void FolderScan::scan()
+{
+    m_host.clearEffects();
+    m_host.clearCancel();
+    m_progress = createProgressDisplay();
+    m_knownAtStart = m_host.known().size();
+    const QStringList paths = findFiles();
+    m_items = arrange(paths);
+    announceItems();
+    if (processItems())
+        finish();
+    else
+        finishCancelled();
+}
+
+bool FolderScan::isCancelled() const
+{
+    return m_host.isCancelled() || (m_progress && m_progress->isCancelled());
+}
+
+QStringList FolderScan::findFiles() const
+{
+    QStringList paths;
+    std::set<QString> seen;
+    FileFinder finder(m_ending);
+    finder.setCancelled([this] { return isCancelled(); });
+    for (const QString &folder : m_host.folders())
+        for (const QString &path : finder.find(folder))
+            if (seen.insert(path).second)
+                paths.append(path);
+    return paths;
+}
+
+void FolderScan::announceItems()
+{
+    if (m_progress)
+        m_progress->setRange(static_cast<int>(m_items.size()), QString());
+    for (const ScanItem &item : m_items)
+        for (const EffectRecord &record : item.knownRecords)
+            addWaiting(record);
+}
+
+bool FolderScan::processItems()
+{
+    int done = 0;
+    for (const ScanItem &item : m_items) {
+        if (isCancelled())
+            return false;
+        processItem(item);
+        if (m_progress)
+            m_progress->setValue(++done);
+    }
+    return !isCancelled();
+}
+
+void FolderScan::processItem(const ScanItem &item)
+{
+    const bool added = process(item);
+    removeWaiting(item);
+    if (!item.probe)
+        return;
+    m_probed.insert(item.path);
+    if (!added)
+        return;
+    m_added = true;
+    write(Durability::Buffered);
+}
+
+void FolderScan::finishCancelled()
+{
+    // Nothing is lost: whatever this run did not get to stays as it was.
+    m_waiting.clear();
+    for (const EffectRecord *record : m_host.known().all())
+        if (m_probed.count(record->path) == 0)
+            addWaiting(*record);
+    write(Durability::Synced);
+}
+
+void FolderScan::finish()
+{
+    complete();
+    m_waiting.clear();
+    const bool countDiffers = m_host.effectCount() != m_knownAtStart;
+    if (m_added || countDiffers || m_knownAtStart == 0 || m_host.isCatalogueOutdated())
+        write(Durability::Synced);
+}
+
+void FolderScan::write(Durability durability)
+{
+    m_host.WriteCatalogue(m_waiting, durability);
+    m_written = true;
+}
+
+void FolderScan::addWaiting(const EffectRecord &record)
+{
+    if (!record.path.isEmpty() && !m_host.isListed(record))
+        m_waiting.insert({record.id, {record, {}}});
+}
+
+void FolderScan::removeWaiting(const ScanItem &item)
+{
+    for (const EffectRecord &record : item.knownRecords) {
+        const auto [first, last] = m_waiting.equal_range(record.id);
+        const auto entry = std::find_if(
+            first, last, [&](const auto &waiting) { return waiting.second.record.isSamePlugin(record); });
+        if (entry != last)
+            m_waiting.erase(entry);
+    }
+}

@@ -1,0 +1,71 @@
+#pragma once
+
+#include "Core/BaseLib/ProcessState.h"
+#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+
+#include <memory>
+#include <vector>
+
+class VProgressDisplay;
+
+/// A file that a scan has to deal with.
+struct ScanItem {
+    QString path;
+    QString fileTime;
+    bool probe = true; ///< false: what is known is kept
+    std::vector<EffectRecord>
+        knownRecords; ///< what the previous catalogue says of the file, the one that speaks for it first
+};
+
+/// One scan of a host's folders: finds the files, has the format decide which to probe, and goes through them
+/// with progress, cancel and interim writes. Used once, on the scan worker.
+class FolderScan {
+public:
+    /// `ending` is the end of the module files' names, with its dot.
+    FolderScan(AudioPluginHost &host, const QString &ending);
+    virtual ~FolderScan();
+    FolderScan(const FolderScan &) = delete;
+    FolderScan &operator=(const FolderScan &) = delete;
+
+    /// True when the catalogue was written at least once. Never throws.
+    bool run();
+
+protected:
+    /// Looks at the files found, in the order of the folders, keeps what is known of those that need no
+    /// probe, and gives the rest.
+    virtual std::vector<ScanItem> arrange(const QStringList &paths) = 0;
+    /// Probes one file, or keeps it, as the item says. True when a record was added to the catalogue.
+    virtual bool process(const ScanItem &item) = 0;
+    /// Called when all items were processed, before the last write.
+    virtual void complete() {}
+
+    AudioPluginHost &host() { return m_host; }
+    const ProcessState &processState() const { return m_processState; }
+    VProgressDisplay *progress() const { return m_progress.get(); }
+    std::size_t itemCount() const { return m_items.size(); }
+    /// True when the user, the host or the system asked the scan to stop.
+    bool isCancelled() const;
+
+private:
+    void scan();
+    QStringList findFiles() const;
+    void announceItems();
+    bool processItems();
+    void processItem(const ScanItem &item);
+    void finishCancelled();
+    void finish();
+    void write(Durability durability);
+    void addWaiting(const EffectRecord &record);
+    void removeWaiting(const ScanItem &item);
+
+    AudioPluginHost &m_host;
+    QString m_ending;
+    ProcessState m_processState;
+    std::shared_ptr<VProgressDisplay> m_progress;
+    std::vector<ScanItem> m_items;
+    WaitingRecords m_waiting;
+    std::set<QString> m_probed; ///< paths
+    std::size_t m_knownAtStart = 0;
+    bool m_added = false;
+    bool m_written = false;
+};

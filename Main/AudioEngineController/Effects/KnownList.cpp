@@ -1,0 +1,91 @@
+#include "Main/AudioEngineController/Effects/KnownList.h"
+
+#include <QFile>
+
+#include <algorithm>
+#include <tuple>
+
+namespace {
+
+int rankOf(const EffectRecord &record)
+{
+    if (record.isCrashedFile())
+        return 0;
+    return record.subId != 0 && !record.enabled ? 2 : 1;
+}
+
+} // namespace
+
+bool KnownList::file(const EffectRecord &record)
+{
+    const QString fileName = fileNameOf(record.path);
+    const auto [first, last] = m_records.equal_range(fileName);
+    const bool isThere =
+        std::any_of(first, last, [&](const auto &entry) { return entry.second.id == record.id; });
+    if (!isThere)
+        m_records.emplace(fileName, record);
+    return !isThere;
+}
+
+EffectRecord *KnownList::recordForCrash(const EffectRecord &marker)
+{
+    for (const EffectRecord *record : recordsOfFileName(marker.path)) {
+        const bool applies = marker.subId != 0 ? record->isSamePlugin(marker)
+                                               : record->path == marker.path || !QFile::exists(record->path);
+        if (applies)
+            return const_cast<EffectRecord *>(record); // one of ours, handed out as const
+    }
+    return nullptr;
+}
+
+EffectRecord &KnownList::applyCrash(const EffectRecord &marker)
+{
+    EffectRecord *record = recordForCrash(marker);
+    if (!record)
+        record = &m_records.emplace(fileNameOf(marker.path), marker)->second;
+    record->path = marker.path;
+    record->fileTime = marker.fileTime;
+    record->enabled = false;
+    record->working = false;
+    return *record;
+}
+
+KnownList::Records KnownList::recordsOfFileName(const QString &path) const
+{
+    Records records;
+    const auto [first, last] = m_records.equal_range(fileNameOf(path));
+    for (auto entry = first; entry != last; ++entry)
+        records.push_back(&entry->second);
+    const auto place = [&](const EffectRecord *record) {
+        return std::make_tuple(record->path != path, rankOf(*record));
+    };
+    std::stable_sort(
+        records.begin(), records.end(),
+        [&](const EffectRecord *left, const EffectRecord *right) { return place(left) < place(right); });
+    return records;
+}
+
+KnownList::Records KnownList::recordsOfPath(const QString &path) const
+{
+    Records records = recordsOfFileName(path);
+    const auto others = std::find_if(records.begin(), records.end(),
+                                     [&](const EffectRecord *record) { return record->path != path; });
+    records.erase(others, records.end());
+    return records;
+}
+
+bool KnownList::isIdHeldByOther(const QString &id, const EffectRecord &plugin) const
+{
+    return std::any_of(m_records.begin(), m_records.end(), [&](const auto &entry) {
+        return entry.second.id == id && !entry.second.isSamePlugin(plugin);
+    });
+}
+
+KnownList::Records KnownList::all() const
+{
+    Records records;
+    records.reserve(m_records.size());
+    for (const auto &entry : m_records)
+        records.push_back(&entry.second);
+    return records;
+}

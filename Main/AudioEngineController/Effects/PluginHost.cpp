@@ -1,0 +1,146 @@
+#include "Main/AudioEngineController/Effects/PluginHost.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Main/AudioEngineController/Effects/AudioUnitHost.h"
+#include "Main/AudioEngineController/Effects/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/ScanList.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
+#include "Main/VLib/ApplicationContext.h"
+#include "Main/VLib/SimpleGUI.h"
+
+#include <QCoreApplication>
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+
+namespace {
+
+constexpr std::size_t kScanOrder[] = {1, 0, 2, 3}; ///< VST 3 first
+
+#ifdef _WIN32
+constexpr char kScannerProgram[] = "/FxProbe.exe";
+#else
+constexpr char kScannerProgram[] = "/FxProbe";
+#endif
+
+IQuillonInterface *application() { return ApplicationContext::instance().quillonInterface; }
+
+bool isSameOrInside(const QString &folder, const QString &outer)
+{
+    const QString inside = QFileInfo(folder).canonicalFilePath() + QLatin1Char('/');
+    return inside.startsWith(QFileInfo(outer).canonicalFilePath() + QLatin1Char('/'));
+}
+
+} // namespace
+
+PluginHost &PluginHost::instance()
+{
+    static PluginHost registry;
+    return registry;
+}
+
+PluginHost::PluginHost()
+    : m_hosts{std::make_unique<VSTHost>(), std::make_unique<VST3Host>(), std::make_unique<AudioUnitHost>(),
+              std::make_unique<MRLAudioPluginHost>()}
+    , m_sortedCategoryNames(CategoryTable::instance().sortedNames())
+    , m_instrumentPosition(CategoryTable::instance().instrumentPosition())
+    , m_ambisonicsPosition(CategoryTable::instance().ambisonicsPosition())
+{}
+
+PluginHost::~PluginHost() = default;
+
+void PluginHost::initialise(const QString &dataFolder, const QString &previousEffectsFolder, int sampleRate,
+                            int blockSize)
+{
+    setCatalogueFolder(dataFolder + QStringLiteral("/Effects"));
+    m_pluginMetadataFolder = dataFolder + QStringLiteral("/Plugin Metadata");
+    for (const auto &host : m_hosts)
+        host->setCatalogueFolder(effectsFolder());
+    setAudioSettings(sampleRate, blockSize);
+    if (!previousEffectsFolder.isEmpty())
+        moveOldCatalogue(previousEffectsFolder);
+}
+
+void PluginHost::moveOldCatalogue(const QString &previousEffectsFolder) const
+{
+    const QString file = QString::fromLatin1(vstCatalogueFormat().fileName);
+    const QString old = previousEffectsFolder + file;
+    if (!QFile::exists(old))
+        return;
+    QDir().mkpath(effectsFolder());
+    QFile source(old);
+    if (!source.rename(effectsFolder() + file)) {
+        DebugLog(L"Cannot move %ls to %ls: %ls", old, effectsFolder(), source.errorString());
+        return;
+    }
+    // The old folder goes with all its content, but never with the new one inside.
+    if (!isSameOrInside(effectsFolder(), previousEffectsFolder))
+        QDir(previousEffectsFolder).removeRecursively();
+}
+
+void PluginHost::ReadCatalogue()
+{
+    for (const auto &host : m_hosts)
+        host->ReadCatalogue();
+}
+
+QStringList PluginHost::folders() const { return m_hosts.front()->folders(); }
+
+bool PluginHost::catalogueChanged()
+{
+    bool changed = false;
+    for (const auto &host : m_hosts)
+        changed |= host->catalogueChanged();
+    return changed;
+}
+
+void PluginHost::setAudioSettings(int sampleRate, int blockSize)
+{
+    m_sampleRate = sampleRate;
+    m_blockSize = blockSize;
+    for (const auto &host : m_hosts)
+        host->setAudioSettings(sampleRate, blockSize);
+}
+
+void PluginHost::setIntParameter(IntParameter parameter, int value)
+{
+    const bool isRate = parameter == IntParameter::SampleRate;
+    setAudioSettings(isRate ? value : m_sampleRate, isRate ? m_blockSize : value);
+}
+
+void PluginHost::WriteScanList() const
+{
+    if (application() && application()->isScanner())
+        return;
+    const QString path = effectsFolder() + QLatin1String(kScanListFile);
+    if (const FileResult written = ::WriteScanList(path, folders()); !written)
+        DebugLog(L"Cannot write the scan list %ls: %ls", path, written.reason);
+}
+
+bool PluginHost::Scan(bool scan, bool)
+{
+    if (!m_completed)
+        m_completed = std::make_unique<ManualResetEvent>();
+    m_completed->reset();
+    ReadCatalogue();
+    m_scannerPath = QCoreApplication::applicationDirPath() + QLatin1String(kScannerProgram);
+    WriteScanList();
+    const bool written = scanHosts(scan);
+    if (scan && application())
+        application()->pluginListsChanged();
+    DebugLog(L"Plugin Scan Complete");
+    showStatus(L"Plugin Scan Complete");
+    m_completed->set();
+    return written;
+}
+
+bool PluginHost::scanHosts(bool scan)
+{
+    bool written = false;
+    for (const std::size_t index : kScanOrder)
+        written |= m_hosts[index]->Scan(scan, true);
+    return written;
+}

@@ -1,0 +1,75 @@
+#pragma once
+
+#include "Core/BaseLib/ManualResetEvent.h"
+#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/ParameterHandler.h"
+
+#include <array>
+#include <memory>
+
+/// The registry: owns one host per plug-in format and scans with all of them.
+class PluginHost : public AudioPluginHost, public IntParameterHandler {
+public:
+    /// Sample rate in Hz and block size in samples that plug-ins are told by default.
+    static constexpr int kDefaultSampleRate = 48000;
+    static constexpr int kDefaultBlockSize = 1024;
+
+    /// The process's registry, made on first use.
+    static PluginHost &instance();
+
+    PluginHost();
+    ~PluginHost() override;
+
+    /// Prepares the hosts for a data folder, given without a separator at its end. `previousEffectsFolder` is
+    /// where an earlier version kept its Effects folder (empty: nowhere): its VST 2 catalogue is moved to the
+    /// new Effects folder and the old folder removed, unless nothing could be moved.
+    virtual void initialise(const QString &dataFolder, const QString &previousEffectsFolder, int sampleRate,
+                            int blockSize);
+
+    void ReadCatalogue() override;
+    /// The folder list of the host whose list feeds the scan list.
+    QStringList folders() const override;
+    bool catalogueChanged() override;
+    /// Reads the catalogues and lets every host scan, or only refresh its lists. The completion event is set
+    /// when it returns.
+    bool Scan(bool scan, bool inProcess) override;
+    void setAudioSettings(int sampleRate, int blockSize) override;
+    void setIntParameter(IntParameter parameter, int value) override;
+
+    /// Writes the list of folders to scan. Only the workstation does; the scanner reads it.
+    void WriteScanList() const;
+
+    /// Set while no scan runs and one has run; null before the first.
+    const ManualResetEvent *completionEvent() const { return m_completed.get(); }
+
+    /// The catalogue folder of all hosts: the data folder plus "/Effects".
+    const QString &effectsFolder() const { return catalogueFolder(); }
+    /// The data folder plus "/Plugin Metadata".
+    const QString &pluginMetadataFolder() const { return m_pluginMetadataFolder; }
+    /// Full path of the scanner program, known once a scan was asked for.
+    const QString &scannerPath() const { return m_scannerPath; }
+
+    /// The categories' display names in the order in which the browser shows them.
+    const QStringList &sortedCategoryNames() const { return m_sortedCategoryNames; }
+    /// Internal positions of the two categories that the application asks for by itself.
+    int instrumentPosition() const { return m_instrumentPosition; }
+    int ambisonicsPosition() const { return m_ambisonicsPosition; }
+
+    AudioPluginHost &vst2Host() { return *m_hosts[0]; }
+    AudioPluginHost &vst3Host() { return *m_hosts[1]; }
+
+private:
+    bool scanHosts(bool scan);
+    void moveOldCatalogue(const QString &previousEffectsFolder) const;
+
+    /// In this order: VST 2, VST 3, Audio Units, built-in effects.
+    std::array<std::unique_ptr<AudioPluginHost>, 4> m_hosts;
+    QString m_pluginMetadataFolder;
+    QString m_scannerPath;
+    std::unique_ptr<ManualResetEvent> m_completed;
+    QStringList m_sortedCategoryNames;
+    int m_instrumentPosition;
+    int m_ambisonicsPosition;
+    int m_sampleRate = kDefaultSampleRate;
+    int m_blockSize = kDefaultBlockSize;
+};

@@ -1,0 +1,21 @@
+#include "Main/AudioEngineController/Effects/ProbeBracket.h"
+
+#include "Core/BaseLib/NativeFile.h"
+#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
+
+ProbeBracket::ProbeBracket(AudioPluginHost &host, const ProcessState &state, const EffectRecord &plugin,
+                           const QString &name)
+    : m_state(state)
+    , m_marker(host.WriteCrashMarker(plugin, name))
+{
+    ActiveMarkers::add(m_marker);
+}
+
+ProbeBracket::~ProbeBracket()
+{
+    m_state.restore();
+    ActiveMarkers::remove(m_marker);
+}
+
+void ProbeBracket::showProgress() const { touchFile(m_marker); }

@@ -1,0 +1,6 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/CatalogueFormat.h"
+
+/// The VST 3 catalogue file: one record per audio class.
+const CatalogueFormat &vst3CatalogueFormat();

@@ -1,0 +1,144 @@
+#include "Main/AudioEngineController/Effects/VST3/VST3FolderScan.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Main/AudioEngineController/Effects/ProbeBracket.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
+#include "Main/VLib/SimpleGUI.h"
+
+#include <QFile>
+
+#include <algorithm>
+
+namespace {
+
+constexpr char kEnding[] = ".vst3";
+/// From this many records of a file, or files of a scan, on the user interface hears of them once in advance.
+constexpr std::size_t kMany = 3;
+
+QString displayName(const QString &path)
+{
+    return fileNameOf(path).chopped(static_cast<int>(sizeof kEnding - 1));
+}
+
+/// The old record whose marks a new one takes over: its own; where either of them only stands for a file that
+/// failed, the one that speaks for the file. Null when there is none.
+const EffectRecord *sourceOfMarks(const std::vector<EffectRecord> &known, const EffectRecord &record)
+{
+    const auto own = std::find_if(known.begin(), known.end(),
+                                  [&](const EffectRecord &old) { return old.id == record.id; });
+    if (own != known.end())
+        return &*own;
+    const bool standsForFile = !known.empty() && !(known.front().working && record.working);
+    return standsForFile ? &known.front() : nullptr;
+}
+
+/// The marks of the user outlive a new probe.
+void carryMarks(const std::vector<EffectRecord> &known, EffectRecord &record)
+{
+    const EffectRecord *source = sourceOfMarks(known, record);
+    if (!source)
+        return;
+    record.favourite = source->favourite;
+    record.enabled = !source->isSwitchedOff();
+    // A file that failed at first has no category of its own to hand on.
+    if (source->working || source->category != 0)
+        record.category = source->category;
+}
+
+/// Whether the previous catalogue's records do not speak for the file any more. `known` starts with the one
+/// that decides.
+bool needsProbe(const KnownList::Records &known, const QString &path, const QString &fileTime)
+{
+    if (known.empty())
+        return true;
+    const EffectRecord &first = *known.front();
+    const bool isMoved = first.path != path && !QFile::exists(first.path);
+    return isMoved || (first.enabled && first.fileTime != fileTime);
+}
+
+} // namespace
+
+VST3FolderScan::VST3FolderScan(AudioPluginHost &host)
+    : FolderScan(host, QString::fromLatin1(kEnding))
+{}
+
+std::vector<ScanItem> VST3FolderScan::arrange(const QStringList &paths)
+{
+    std::vector<ScanItem> queue;
+    for (const QString &path : paths)
+        if (VST3ModuleFile::isModule(path))
+            decide(path, queue);
+    return queue;
+}
+
+void VST3FolderScan::decide(const QString &path, std::vector<ScanItem> &queue)
+{
+    const KnownList::Records own = host().known().recordsOfPath(path);
+    if (host().isLeftAlone(path)) {
+        keep(own);
+        return;
+    }
+    const KnownList::Records known = own.empty() ? host().known().recordsOfFileName(path) : own;
+    ScanItem item{path, VST3ModuleFile::fileTime(path), true, {}};
+    if (needsProbe(known, path, item.fileTime)) {
+        for (const EffectRecord *record : known)
+            item.knownRecords.push_back(*record);
+        queue.push_back(std::move(item));
+    } else if (!own.empty()) {
+        keep(own);
+    } else {
+        m_keptByName.insert(m_keptByName.end(), known.begin(), known.end());
+    }
+}
+
+void VST3FolderScan::keep(const KnownList::Records &records)
+{
+    for (const EffectRecord *record : records)
+        host().AddEffect(*record);
+}
+
+void VST3FolderScan::complete() { keep(m_keptByName); }
+
+bool VST3FolderScan::process(const ScanItem &item)
+{
+    EffectRecord file;
+    file.path = item.path;
+    file.fileTime = item.fileTime;
+    showScanning(displayName(item.path));
+    const ProbeBracket bracket(host(), processState(), file);
+    DebugTrace(L"Probing %ls", item.path);
+    VST3Plugin plugin; // unloads its module before the bracket deletes the marker
+    plugin.setClassObserver([&bracket] { bracket.showProgress(); });
+    ClassListing records;
+    bool factoryFound = true;
+    const bool isNew = item.knownRecords.empty();
+    plugin.listClasses(records, item.path, isNew, factoryFound);
+    if (!records.empty())
+        return addRecords(item, file, records);
+    const bool leaveUnrecorded = !factoryFound || item.path.contains(QLatin1String("WaveShell"));
+    return !leaveUnrecorded && addFailedRecord(item, file);
+}
+
+bool VST3FolderScan::addRecords(const ScanItem &item, const EffectRecord &file, ClassListing &records)
+{
+    const bool announceFirst = records.size() >= kMany || itemCount() >= kMany;
+    if (announceFirst)
+        notifyUI(MessageCode::kEntryAdded);
+    bool added = false;
+    for (EffectRecord &record : records) {
+        record.path = file.path;
+        record.fileTime = file.fileTime;
+        carryMarks(item.knownRecords, record);
+        added |= host().AddEffect(record);
+    }
+    if (added && !announceFirst)
+        notifyUI(MessageCode::kEntryAdded);
+    return added;
+}
+
+bool VST3FolderScan::addFailedRecord(const ScanItem &item, EffectRecord record)
+{
+    host().completeFailedRecord(record);
+    carryMarks(item.knownRecords, record);
+    return host().AddEffect(record);
+}

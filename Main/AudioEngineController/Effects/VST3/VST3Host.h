@@ -1,0 +1,14 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+
+/// The host of VST 3 plug-ins.
+class VST3Host : public AudioPluginHost {
+public:
+    VST3Host();
+
+    bool Scan(bool scan, bool inProcess) override;
+
+protected:
+    bool isMarkerWithoutRecord(const EffectRecord &marker) const override;
+};

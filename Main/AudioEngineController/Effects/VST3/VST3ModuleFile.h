@@ -1,0 +1,21 @@
+#pragma once
+
+#include "Core/BaseLib/PluginLibrary.h"
+
+#include <QString>
+
+/// How a VST 3 module lies on disk and is started, which differs from platform to platform.
+namespace VST3ModuleFile {
+
+/// False for a path that a folder search finds although it is no module of its own: a part of a bundle.
+bool isModule(const QString &path);
+/// The file to load for a module's path; empty, with a reason, when the bundle holds none for this platform.
+QString binary(const QString &path, QString &reason);
+/// The time stamp of the file that an update of the module replaces.
+QString fileTime(const QString &path);
+/// Calls the module's start function, if it exports one. False when the function reports failure.
+bool start(PluginLibrary &library);
+/// Calls the module's end function, if it exports one.
+void end(PluginLibrary &library);
+
+} // namespace VST3ModuleFile

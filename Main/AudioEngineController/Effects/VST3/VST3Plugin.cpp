@@ -1,0 +1,212 @@
+#include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
+#include "Main/VLib/SimpleGUI.h"
+
+#include <pluginterfaces/base/smartpointer.h>
+
+#include <algorithm>
+#include <cstring>
+#include <limits>
+#include <set>
+#include <stdexcept>
+
+using namespace Steinberg;
+
+namespace {
+
+constexpr char kAudioModuleClass[] = "Audio Module Class"; // kVstAudioEffectClass of the SDK
+/// Modules of more classes than this report each one as it is listed.
+constexpr int32 kManyClasses = 6;
+/// More buses than any plug-in has; what a plug-in states beyond is not believed.
+constexpr int32 kMaxBuses = 1024;
+
+/// Text of a fixed-size field, which need not be terminated; invalid UTF-8 is replaced.
+template <std::size_t Size>
+QString fixedText(const char8 (&field)[Size])
+{
+    return QString::fromUtf8(field, static_cast<int>(strnlen(field, Size)));
+}
+
+/// Asks for an interface; null when the object lacks it, whatever it answered.
+template <typename Interface>
+IPtr<Interface> queryFor(FUnknown *object)
+{
+    void *found = nullptr;
+    if (object->queryInterface(Interface::iid, &found) != kResultOk)
+        return nullptr;
+    return owned(static_cast<Interface *>(found));
+}
+
+/// What the factory's newer interfaces tell about a class; zeroed where the factory lacks them.
+PClassInfo2 classDetails(IPluginFactory *factory, int32 index)
+{
+    PClassInfo2 details;
+    std::memset(static_cast<void *>(&details), 0, sizeof details);
+    if (const IPtr<IPluginFactory2> factory2 = queryFor<IPluginFactory2>(factory))
+        factory2->getClassInfo2(index, &details);
+    if (const IPtr<IPluginFactory3> factory3 = queryFor<IPluginFactory3>(factory)) {
+        PClassInfoW unicode; // fetched as hosts do, and not used
+        std::memset(static_cast<void *>(&unicode), 0, sizeof unicode);
+        factory3->getClassInfoUnicode(index, &unicode);
+    }
+    return details;
+}
+
+QString factoryVendor(IPluginFactory *factory)
+{
+    PFactoryInfo info;
+    std::memset(static_cast<void *>(&info), 0, sizeof info);
+    factory->getFactoryInfo(&info);
+    return fixedText(info.vendor);
+}
+
+QString classIdText(const FUID &classId)
+{
+    char8 text[33] = {}; // 32 digits, see FUID::toString
+    classId.toString(text);
+    return QString::fromLatin1(text);
+}
+
+} // namespace
+
+/// A factory while its classes are listed.
+struct VST3Plugin::FactoryView {
+    IPluginFactory *factory;
+    QString vendor;
+    std::set<QString> names; ///< of the classes met so far
+};
+
+VST3Plugin::VST3Plugin()
+    : m_hostContext(VST3HostContext::createOwned(nullptr))
+{}
+
+VST3Plugin::~VST3Plugin() { m_module.close(); }
+
+void VST3Plugin::listClasses(ClassListing &records, const QString &path, bool notifyEachClass,
+                             bool &factoryFound)
+{
+    try {
+        openAndList(records, path, notifyEachClass, factoryFound);
+    } catch (const std::exception &error) {
+        DebugLog(L"%ls: %s", path, error.what());
+    } catch (...) {
+        DebugLog(L"%ls: the plug-in threw something that is no standard exception", path);
+    }
+}
+
+void VST3Plugin::openAndList(ClassListing &records, const QString &path, bool notifyEachClass,
+                             bool &factoryFound)
+{
+    records.clear();
+    if (!m_module.open(path))
+        throw std::runtime_error("VST3 Exception: Failed to get load module:" + path.toStdString());
+    factoryFound = false;
+    IPluginFactory *module = m_module.factory();
+    void *factory = nullptr;
+    if (!module || module->queryInterface(IPluginFactory::iid, &factory) != kResultOk || !factory)
+        throw std::runtime_error("VST3 Exception: Failed to get factory function");
+    factoryFound = true;
+    listFactory(records, static_cast<IPluginFactory *>(factory), notifyEachClass);
+}
+
+void VST3Plugin::listFactory(ClassListing &records, IPluginFactory *factory, bool notifyEachClass)
+{
+    FactoryView view{factory, factoryVendor(factory), {}};
+    const int32 count = factory->countClasses();
+    const std::size_t before = records.size();
+    for (int32 index = 0; index < count; ++index)
+        listClass(records, view, index, notifyEachClass || count > kManyClasses);
+    if (records.size() == before)
+        DebugLog(L"No audio class could be listed, of %d classes", count);
+    // Not released when the plug-in threw: its state is unknown then.
+    factory->release();
+}
+
+void VST3Plugin::listClass(ClassListing &records, FactoryView &view, int32 index, bool notify)
+{
+    PClassInfo info;
+    std::memset(static_cast<void *>(&info), 0, sizeof info);
+    view.factory->getClassInfo(index, &info);
+    if (std::strncmp(info.category, kAudioModuleClass, sizeof info.category) != 0)
+        return;
+    const QString name = fixedText(info.name);
+    if (view.names.count(name) != 0)
+        return;
+    const PClassInfo2 details = classDetails(view.factory, index);
+    m_classId = FUID::fromTUID(info.cid);
+    view.names.insert(name);
+    if (m_classObserver)
+        m_classObserver();
+    showScanning(name);
+    instantiate(records, view, name, details);
+    if (notify)
+        notifyUI(MessageCode::kEntryAdded);
+}
+
+void VST3Plugin::instantiate(ClassListing &records, const FactoryView &view, const QString &name,
+                             const PClassInfo2 &details)
+{
+    m_component = nullptr;
+    void *component = nullptr;
+    const tresult created =
+        view.factory->createInstance(m_classId.toTUID(), Vst::IComponent::iid, &component);
+    if (created != kResultOk || !component) {
+        DebugLog(L"The class %ls could not be created: 0x%08X", name, created);
+        return;
+    }
+    m_component = static_cast<Vst::IComponent *>(component);
+    const tresult initialised = m_component->initialize(m_hostContext->unknown());
+    if (initialised != kResultOk) {
+        // Neither terminated nor released: a component that could not start is not called again.
+        DebugLog(L"The class %ls could not be initialised: 0x%08X", name, initialised);
+        return;
+    }
+    m_instantiated = true;
+    records.push_back(describe(view, name, details));
+    m_component->terminate();
+    m_component->release();
+    m_component = nullptr;
+}
+
+EffectRecord VST3Plugin::describe(const FactoryView &view, const QString &name,
+                                  const PClassInfo2 &details) const
+{
+    EffectRecord record;
+    record.name = name;
+    record.inputs = channelCount(Vst::kInput);
+    record.outputs = channelCount(Vst::kOutput);
+    record.id = classIdText(m_classId);
+    record.categories = fixedText(details.subCategories);
+    record.category = categoryFromSubCategories(record.categories);
+    record.vendor = fixedText(details.vendor);
+    if (record.vendor.isEmpty())
+        record.vendor = view.vendor;
+    if (record.inputs == 0 && record.outputs == 0) {
+        record.outputs = 2;
+        record.inputs = isInstrumentCategory(record.category) ? 0 : 2;
+    }
+    return record;
+}
+
+int32 VST3Plugin::channelCount(Vst::BusDirection direction) const
+{
+    int64 ofAll = 0;
+    int64 ofMain = 0;
+    bool hasMain = false;
+    const int32 buses = std::min(m_component->getBusCount(Vst::kAudio, direction), kMaxBuses);
+    for (int32 index = 0; index < buses; ++index) {
+        Vst::BusInfo info = {};
+        if (m_component->getBusInfo(Vst::kAudio, direction, index, info) != kResultOk)
+            continue;
+        const int64 channels = std::max<int32>(info.channelCount, 0);
+        ofAll += channels;
+        if (info.busType == Vst::kMain) {
+            hasMain = true;
+            ofMain += channels;
+        }
+    }
+    const int64 channels = hasMain ? ofMain : ofAll;
+    return static_cast<int32>(std::min<int64>(channels, std::numeric_limits<int32>::max()));
+}

@@ -1,0 +1,60 @@
+#include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
+
+#include "Core/BaseLib/FileTime.h"
+#include "Main/AudioEngineController/Effects/EffectRecord.h"
+
+#include <QDir>
+#include <QFileInfo>
+
+namespace {
+
+// Bundle layout, module name and entry functions are those of the VST 3 documentation, "Plug-in format
+// structure" (Linux).
+constexpr char kBinaryFolder[] = "/Contents/x86_64-linux";
+
+using EntryFunction = bool (*)(void *libraryHandle);
+using ExitFunction = bool (*)();
+
+} // namespace
+
+bool VST3ModuleFile::isModule(const QString &path)
+{
+    // A bundle for several systems holds another system's module, which bears the same ending.
+    return !path.contains(QLatin1String(".vst3/Contents/"), Qt::CaseInsensitive);
+}
+
+QString VST3ModuleFile::binary(const QString &path, QString &reason)
+{
+    if (!QFileInfo(path).isDir())
+        return path;
+    const QString folder = path + QLatin1String(kBinaryFolder);
+    const QString usual =
+        folder + QLatin1Char('/') + QFileInfo(path).completeBaseName() + QLatin1String(".so");
+    if (QFileInfo::exists(usual))
+        return usual;
+    const QStringList found = QDir(folder).entryList({QStringLiteral("*.so")}, QDir::Files);
+    if (found.size() == 1)
+        return folder + QLatin1Char('/') + found.first();
+    reason = found.isEmpty() ? QStringLiteral("the bundle has no module in Contents/x86_64-linux")
+                             : QStringLiteral("the bundle has several modules and none of its own name");
+    return QString();
+}
+
+QString VST3ModuleFile::fileTime(const QString &path)
+{
+    QString reason;
+    const QString file = binary(path, reason);
+    return fileTimeText(file.isEmpty() ? path : file);
+}
+
+bool VST3ModuleFile::start(PluginLibrary &library)
+{
+    const auto entry = reinterpret_cast<EntryFunction>(library.symbol("ModuleEntry"));
+    return !entry || entry(library.handle());
+}
+
+void VST3ModuleFile::end(PluginLibrary &library)
+{
+    if (const auto exit = reinterpret_cast<ExitFunction>(library.symbol("ModuleExit")))
+        exit();
+}

@@ -1,0 +1,84 @@
+#include "Scanner/ScannerEntry.h"
+
+#include "Core/BaseLib/AudioPlugins.h"
+#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/ProcessSetup.h"
+#include "Core/BaseLib/TerminationRequest.h"
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/PluginHost.h"
+#include "Main/AudioEngineController/Effects/ScanList.h"
+#include "Main/AudioEngineController/Effects/ScanLock.h"
+#include "Main/ReWire/ReWireProbe.h"
+#include "Main/VLib/UiFxProbe.h"
+#include "Scanner/QuillonInterfaceImpl.h"
+
+#include <QApplication>
+#include <QDir>
+#include <QFile>
+
+#include <cstdio>
+
+namespace {
+
+/// Where the workstation keeps its scan list, below the user's home folder.
+constexpr char kDefaultScanList[] =
+    "/AppData/Roaming/Morrow Labs/Quillon/Preferences/Tessel/Effects/FXScan.xml";
+constexpr char kReWireArgument[] = "-rewire_version";
+/// How long a plug-in may go on after somebody asked the process to end.
+constexpr std::chrono::seconds kTerminationGrace(2);
+
+int reportReWireVersion()
+{
+    const int verdict = probeReWireVersion();
+    std::fputs(verdict == 0 ? "INSTALLED REWIRE VERSION OK\n" : "REWIRE VERSION UPDATE REQUIRED\n", stdout);
+    std::fflush(stdout);
+    return verdict;
+}
+
+/// The scan itself; runs on the dialog's worker thread.
+void scanEverything(const QString &dataFolder)
+{
+    PluginHost &registry = PluginHost::instance();
+    AudioPlugins::setRegistry(&registry);
+    registry.initialise(dataFolder, QString(), PluginHost::kDefaultSampleRate, PluginHost::kDefaultBlockSize);
+    registry.Scan(true, true);
+}
+
+void runDialog(QApplication &application, const QString &dataFolder, bool isDefaultPath)
+{
+    // Outlives the dialog, whose destructor waits for the plug-in at hand.
+    const TerminationWatcher watcher(
+        [&application] {
+            QMetaObject::invokeMethod(&application, &QApplication::quit, Qt::QueuedConnection);
+        },
+        [] { ActiveMarkers::abandon([] { leaveProcess(0); }); }, kTerminationGrace);
+    QObject::connect(
+        &application, &QGuiApplication::commitDataRequest, &application,
+        [](QSessionManager &) { TerminationSignal::raise(); }, Qt::DirectConnection);
+    UiFxProbe dialog(dataFolder, scanEverything);
+    dialog.run(application, isDefaultPath);
+}
+
+} // namespace
+
+int runScanner(QApplication &application)
+{
+    const QStringList arguments = application.arguments();
+    const bool isDefaultPath = arguments.size() < 2;
+    const QString path = isDefaultPath ? QDir::homePath() + QLatin1String(kDefaultScanList) : arguments.at(1);
+    if (path == QLatin1String(kReWireArgument))
+        return reportReWireVersion();
+    if (!QFile::exists(path))
+        return 0;
+    const QString dataFolder = dataFolderOf(path);
+    const ScanLock lock(dataFolder + QStringLiteral("/Effects"));
+    if (lock.isHeldByOther()) {
+        DebugLog(L"Another scanner is at work for %ls", dataFolder);
+        return 0;
+    }
+    QuillonInterfaceImpl workstation(dataFolder, ReadScanList(path));
+    ApplicationContext::instance().quillonInterface = &workstation;
+    runDialog(application, dataFolder, isDefaultPath);
+    ApplicationContext::instance().quillonInterface = nullptr;
+    return 0;
+}

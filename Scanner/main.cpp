@@ -1,0 +1,18 @@
+#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/ProcessSetup.h"
+#include "Scanner/ScannerEntry.h"
+
+#include <QApplication>
+
+int main(int argc, char **argv)
+{
+    prepareProcess();
+    configureLogFromEnvironment();
+    int exitCode = 0;
+    {
+        QApplication application(argc, argv);
+        settleLocale();
+        exitCode = runScanner(application);
+    }
+    leaveProcess(exitCode);
+}

@@ -1,0 +1,162 @@
+#include "Main/AudioEngineController/Effects/PluginHost.h"
+
+#include "Core/BaseLib/AudioPlugins.h"
+#include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
+#include "Main/VLib/ApplicationContext.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/PrintTo.h"
+
+#include <QDir>
+#include <QFile>
+#include <QTemporaryDir>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+class TestApplication : public IQuillonInterface {
+public:
+    TestApplication() { ApplicationContext::instance().quillonInterface = this; }
+    ~TestApplication() override { ApplicationContext::instance().quillonInterface = nullptr; }
+    QString dataFolder() const override { return QString(); }
+    QStringList scanFolders() const override { return folders; }
+    bool isScanner() const override { return scanner; }
+    void pluginListsChanged() override { ++changes; }
+
+    QStringList folders;
+    bool scanner = false;
+    int changes = 0;
+};
+
+void write(const QString &path, const QByteArray &text)
+{
+    ASSERT_TRUE(replaceFile(path, text, Durability::Buffered));
+}
+
+} // namespace
+
+TEST(PluginHost, AScanWritesItsFilesAndSaysSo)
+{
+    const QTemporaryDir data;
+    ASSERT_TRUE(QDir(data.path()).mkdir(QStringLiteral("Effects")));
+    TestApplication application;
+    application.folders = QStringList(data.path());
+    PluginHost registry;
+    registry.initialise(data.path(), QString(), 96000, 512);
+    EXPECT_EQ(registry.completionEvent(), nullptr);
+    const CapturedLog log;
+    EXPECT_TRUE(registry.Scan(true, true));
+    EXPECT_TRUE(registry.completionEvent()->isSet());
+    EXPECT_TRUE(log.contains(QStringLiteral("Plugin Scan Complete")));
+    EXPECT_EQ(application.changes, 1);
+    EXPECT_EQ(registry.pluginMetadataFolder(), data.path() + QStringLiteral("/Plugin Metadata"));
+    EXPECT_EQ(QDir(data.filePath(QStringLiteral("Effects"))).entryList(QDir::Files),
+              QStringList({QStringLiteral("FXScan.xml"), QStringLiteral("VST3Configuration.xml")}));
+}
+
+TEST(PluginHost, TheScannerLeavesTheScanListAlone)
+{
+    const QTemporaryDir data;
+    ASSERT_TRUE(QDir(data.path()).mkdir(QStringLiteral("Effects")));
+    TestApplication application;
+    application.scanner = true;
+    PluginHost registry;
+    registry.initialise(data.path(), QString(), 48000, 1024);
+    registry.Scan(true, true);
+    EXPECT_FALSE(QFile::exists(data.filePath(QStringLiteral("Effects/FXScan.xml"))));
+    EXPECT_FALSE(QFile::exists(data.filePath(QStringLiteral("Effects/TesselFXConfiguration.xml"))));
+}
+
+TEST(PluginHost, RefreshingDoesNotNotify)
+{
+    const QTemporaryDir data;
+    TestApplication application;
+    PluginHost registry;
+    registry.initialise(data.path(), QString(), 48000, 1024);
+    registry.Scan(false, true);
+    EXPECT_EQ(application.changes, 0);
+    EXPECT_TRUE(registry.completionEvent()->isSet());
+}
+
+TEST(PluginHost, AudioSettingsReachTheHosts)
+{
+    PluginHost registry;
+    auto &vst2 = static_cast<VSTHost &>(registry.vst2Host());
+    EXPECT_EQ(vst2.sampleRate(), 44100);
+    EXPECT_EQ(vst2.blockSize(), 256);
+    registry.initialise(QStringLiteral("/nowhere"), QString(), 48000, 1024);
+    EXPECT_EQ(vst2.sampleRate(), 48000);
+    registry.setIntParameter(IntParameter::BlockSize, 64);
+    EXPECT_EQ(vst2.sampleRate(), 48000);
+    EXPECT_EQ(vst2.blockSize(), 64);
+}
+
+TEST(PluginHost, MovingTheOldEffectsFolder)
+{
+    const struct {
+        const char *name;
+        bool oldHasCatalogue;
+        bool newHasCatalogue;
+        const char *newFolder; ///< data folder, below the test's
+        bool isMoved;
+        bool oldRemains;
+    } rows[] = {
+        {"moved and removed", true, false, "new", true, false},
+        {"nothing to move, nothing removed", false, false, "new", false, true},
+        {"never over an existing file", true, true, "new", false, true},
+        {"the new folder inside the old one", true, false, "old/Effects/inner", true, true},
+    };
+    for (const auto &row : rows) {
+        const QTemporaryDir test;
+        const QString old = test.filePath(QStringLiteral("old/Effects"));
+        const QString data = test.filePath(QString::fromLatin1(row.newFolder));
+        const QString moved = data + QStringLiteral("/Effects/FXConfiguration.xml");
+        QDir().mkpath(old + QStringLiteral("/sub"));
+        write(old + QStringLiteral("/sub/file"), "x");
+        if (row.oldHasCatalogue)
+            write(old + QStringLiteral("/FXConfiguration.xml"), "old");
+        if (row.newHasCatalogue) {
+            QDir().mkpath(data + QStringLiteral("/Effects"));
+            write(moved, "new");
+        }
+        const CapturedLog log;
+        PluginHost registry;
+        registry.initialise(data, old, 48000, 1024);
+        QByteArray text;
+        EXPECT_EQ(bool(readWholeFile(moved, text)), row.isMoved || row.newHasCatalogue) << row.name;
+        EXPECT_EQ(text == "old", row.isMoved) << row.name;
+        EXPECT_EQ(QDir(old).exists(), row.oldRemains) << row.name;
+    }
+}
+
+TEST(PluginHost, BuiltInEffectsTakeTheirMarks)
+{
+    const QTemporaryDir folder;
+    write(folder.filePath(QStringLiteral("TesselFXConfiguration.xml")),
+          "<Effects "
+          "version=\"1.2\"><Effect><ID>mrl:a</ID><Favourite>5</Favourite><CategoryMask>2</CategoryMask>"
+          "</Effect><Effect><ID>mrl:gone</ID><Favourite>1</Favourite></Effect></Effects>");
+    MRLAudioPluginHost host;
+    host.setCatalogueFolder(folder.path());
+    EffectRecord effect;
+    effect.id = effect.name = QStringLiteral("mrl:a");
+    host.setBuiltInEffects({effect});
+    host.ReadCatalogue();
+    ASSERT_EQ(host.effects().size(), 1u);
+    EXPECT_TRUE(host.effects()[0].favourite);
+    EXPECT_EQ(host.effects()[0].category, 0u) << "the mask is written only";
+}
+
+TEST(AudioPlugins, AskingForAnUnsetRegistryIsReported)
+{
+    const CapturedLog log;
+    EXPECT_EQ(AudioPlugins::registry(), nullptr);
+    ASSERT_EQ(log.lines().size(), 1);
+    EXPECT_TRUE(log.contains(QStringLiteral("0 != _this")));
+    EXPECT_TRUE(log.contains(QStringLiteral("Core/BaseLib/AudioPlugins, line 24")));
+    PluginHost registry;
+    AudioPlugins::setRegistry(&registry);
+    EXPECT_EQ(AudioPlugins::registry(), &registry);
+    AudioPlugins::setRegistry(nullptr);
+}

@@ -1,0 +1,63 @@
+#include "Main/AudioEngineController/Effects/ScanList.h"
+
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/PrintTo.h"
+
+#include <QTemporaryDir>
+
+#include <gtest/gtest.h>
+
+TEST(ScanList, DataFolderOfAPath)
+{
+    const struct {
+        const char *path;
+        const char *dataFolder;
+    } rows[] = {
+        {"C:\\x\\Effects\\FXScan.xml", "C:\\x"},
+        {"C:/a/Effects/b/Effects/FXScan.xml", "C:/a/Effects/b"},
+        {"/home/me/effects/FXScan.xml", ""},
+        {"C:\\x/Effects/FXScan.xml", "C:\\x"},
+        {"C:\\x\\Effects\\y/Effects/FXScan.xml", "C:\\x\\Effects\\y"},
+        {"C:/x/Effects/y\\Effects\\FXScan.xml", "C:/x"}, // the forward form is tried first
+        {"/Effects/FXScan.xml", ""},
+        {"Effects/FXScan.xml", ""},
+        {"FXScan.xml", ""},
+        {"", ""},
+        {"/Effects/", ""},
+        {"/データ/Effects/FXScan.xml", "/データ"},
+    };
+    for (const auto &row : rows)
+        EXPECT_EQ(dataFolderOf(QString::fromUtf8(row.path)), QString::fromUtf8(row.dataFolder)) << row.path;
+}
+
+TEST(ScanList, WrittenAndReadBack)
+{
+    const QTemporaryDir folder;
+    const QString path = folder.filePath(QStringLiteral("FXScan.xml"));
+    const QStringList folders = {QStringLiteral("/usr/lib/vst3"), QStringLiteral("/プラグイン 🎹"), QString()};
+    ASSERT_TRUE(WriteScanList(path, folders));
+    QByteArray text;
+    ASSERT_TRUE(readWholeFile(path, text));
+    EXPECT_EQ(text.replace(kLineEnd, "\n"), QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
+                                                       "<Scan>\n"
+                                                       "\t<Path>/usr/lib/vst3</Path>\n"
+                                                       "\t<Path>/プラグイン 🎹</Path>\n"
+                                                       "\t<Path></Path>\n"
+                                                       "</Scan>\n"));
+    EXPECT_EQ(ReadScanList(path), folders);
+}
+
+TEST(ScanList, UnusableFilesGiveAnEmptyListAndALogLine)
+{
+    const QTemporaryDir folder;
+    for (const char *text : {"", "no xml", "<Scan><Path>/a</Path>"}) {
+        const QString path = folder.filePath(QStringLiteral("FXScan.xml"));
+        ASSERT_TRUE(replaceFile(path, text, Durability::Buffered));
+        const CapturedLog log;
+        EXPECT_TRUE(ReadScanList(path).isEmpty()) << text;
+        EXPECT_TRUE(log.contains(path)) << text;
+    }
+    ASSERT_TRUE(
+        replaceFile(folder.filePath(QStringLiteral("Other.xml")), "<Effects/>", Durability::Buffered));
+    EXPECT_TRUE(ReadScanList(folder.filePath(QStringLiteral("Other.xml"))).isEmpty());
+}
