@@ -5,7 +5,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
 #include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/PrintTo.h"
+#include "Tests/Support/QtPrinters.h"
 
 #include <QDir>
 #include <QTemporaryDir>

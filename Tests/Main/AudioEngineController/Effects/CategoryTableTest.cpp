@@ -2,7 +2,7 @@
 
 #include "Main/AudioEngineController/Effects/PluginIdentifier.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
-#include "Tests/Support/PrintTo.h"
+#include "Tests/Support/QtPrinters.h"
 
 #include <gtest/gtest.h>
 

@@ -3,7 +3,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/PrintTo.h"
+#include "Tests/Support/QtPrinters.h"
 
 #include <QDir>
 #include <QFile>

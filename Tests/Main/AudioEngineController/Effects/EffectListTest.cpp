@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/EffectList.h"
 
-#include "Tests/Support/PrintTo.h"
+#include "Tests/Support/QtPrinters.h"
 
 #include <gtest/gtest.h>
 

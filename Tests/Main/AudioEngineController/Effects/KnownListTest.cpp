@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/KnownList.h"
 
 #include "Core/BaseLib/TextFile.h"
-#include "Tests/Support/PrintTo.h"
+#include "Tests/Support/QtPrinters.h"
 
 #include <QTemporaryDir>
 

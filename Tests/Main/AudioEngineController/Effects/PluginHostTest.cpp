@@ -5,7 +5,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/VLib/ApplicationContext.h"
 #include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/PrintTo.h"
+#include "Tests/Support/QtPrinters.h"
 
 #include <QDir>
 #include <QFile>

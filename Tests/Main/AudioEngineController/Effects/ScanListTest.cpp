@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/ScanList.h"
 
 #include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/PrintTo.h"
+#include "Tests/Support/QtPrinters.h"
 
 #include <QTemporaryDir>
 

@@ -6,10 +6,16 @@
 
 #include <ostream>
 
-/// Lets GoogleTest print Qt's texts when an expectation fails.
+// What a failed comparison shows; without these, GoogleTest prints Qt's texts as lists of numbers.
+
 inline void PrintTo(const QString &text, std::ostream *out) { *out << '"' << text.toStdString() << '"'; }
+
 inline void PrintTo(const QByteArray &text, std::ostream *out) { *out << '"' << text.toStdString() << '"'; }
+
 inline void PrintTo(const QStringList &texts, std::ostream *out)
 {
-    *out << '[' << texts.join(QStringLiteral(" | ")).toStdString() << ']';
+    *out << "[";
+    for (const QString &text : texts)
+        *out << "\n  \"" << text.toStdString() << '"';
+    *out << "]";
 }

@@ -1,0 +1,38 @@
+#pragma once
+
+#include <cstdint>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+/// A script that cannot be understood. The text names the line.
+class ScriptError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
+/// One statement of a script: its key and the words behind it.
+struct ScriptStatement {
+    int line = 0; ///< counted from 1
+    std::string key;
+    std::vector<std::string> words;
+
+    /// The word at an index; throws ScriptError when the statement has fewer.
+    const std::string &word(std::size_t index) const;
+    /// The word at an index, or an empty text.
+    std::string optionalWord(std::size_t index) const;
+    /// The word at an index as a 32-bit number, decimal or with 0x; a hexadecimal one may set the top bit.
+    std::int32_t number(std::size_t index) const;
+    /// Throws ScriptError when the statement has more words than this.
+    void allowWords(std::size_t most) const;
+    /// Throws ScriptError for this statement.
+    [[noreturn]] void fail(const std::string &reason) const;
+};
+
+/// Splits a script into its statements: one per line, words between blanks, texts with blanks in double
+/// quotes, \xHH \n \t \\ \" for bytes that cannot stand as they are, `#` in front of a comment. Throws
+/// ScriptError.
+std::vector<ScriptStatement> parseScript(const std::string &script);
+
+/// A text as a 32-bit number as ScriptStatement::number reads it; throws ScriptError.
+std::int32_t parseNumber(const std::string &text);

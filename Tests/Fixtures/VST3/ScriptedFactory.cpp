@@ -1,0 +1,188 @@
+#include "Tests/Fixtures/VST3/ScriptedFactory.h"
+
+#include "Tests/Fixtures/FixtureMisuse.h"
+#include "Tests/Fixtures/VST3/ScriptedComponent.h"
+
+#include <algorithm>
+#include <cstring>
+
+using namespace Steinberg;
+
+namespace {
+
+/// Copies a text into a field of the SDK. A text that fills the field gets no terminator; what lies behind a
+/// shorter one is left as it was.
+template <std::size_t Size>
+void fill(char8 (&field)[Size], const std::string &text)
+{
+    std::memcpy(field, text.data(), std::min(Size, text.size()));
+    if (text.size() < Size)
+        field[text.size()] = '\0';
+}
+
+template <std::size_t Size>
+void fill(char16 (&field)[Size], const std::string &text)
+{
+    for (std::size_t i = 0; i < std::min(Size, text.size()); ++i)
+        field[i] = static_cast<unsigned char>(text[i]);
+    if (text.size() < Size)
+        field[text.size()] = 0;
+}
+
+/// What the three forms of a class's information have in common.
+template <typename Info>
+void fillCommon(Info &info, const ScriptedClass &described)
+{
+    described.id.toTUID(info.cid);
+    info.cardinality = PClassInfo::kManyInstances;
+    fill(info.category, described.category);
+    fill(info.name, described.name);
+}
+
+/// What the two newer forms have beyond that.
+template <typename Info>
+void fillNewer(Info &info, const ScriptedClass &described)
+{
+    info.classFlags = 0;
+    fill(info.subCategories, described.subCategories);
+    fill(info.vendor, described.vendor);
+    fill(info.version, described.version);
+    fill(info.sdkVersion, "VST 3.7");
+}
+
+/// The class at an index, or null.
+const ScriptedClass *classAt(int32 index)
+{
+    const auto &classes = scriptedModule().classes;
+    const bool exists = index >= 0 && static_cast<std::size_t>(index) < classes.size();
+    return exists ? &classes[static_cast<std::size_t>(index)] : nullptr;
+}
+
+const ScriptedClass *classWithId(FIDString id)
+{
+    for (const ScriptedClass &described : scriptedModule().classes) {
+        if (FUnknownPrivate::iidEqual(described.id.toTUID(), id))
+            return &described;
+    }
+    return nullptr;
+}
+
+/// Announces a request for the information on a class; null when it is to be refused with `result`. An index
+/// out of range is not in the trace: a host that believes a huge count would fill the disk.
+const ScriptedClass *announce(const char *stage, int32 index, tresult &result)
+{
+    const ScriptedClass *described = classAt(index);
+    result = kInvalidArgument;
+    if (!described)
+        return nullptr;
+    scriptedModule().stages.reach(stage, described->name);
+    result = scriptedModule().result(stage, described->name);
+    return result == kResultOk ? described : nullptr;
+}
+
+} // namespace
+
+bool ScriptedFactory::offers(const TUID interfaceId) const
+{
+    const FUID generations[] = {FUnknown::iid, IPluginFactory::iid, IPluginFactory2::iid,
+                                IPluginFactory3::iid};
+    for (int generation = 0; generation <= scriptedModule().generation; ++generation) {
+        if (FUnknownPrivate::iidEqual(interfaceId, generations[generation].toTUID()))
+            return true;
+    }
+    return false;
+}
+
+tresult ScriptedFactory::queryInterface(const TUID interfaceId, void **object)
+{
+    *object = nullptr;
+    if (!offers(interfaceId))
+        return kNoInterface;
+    *object = static_cast<IPluginFactory3 *>(this);
+    addRef();
+    return kResultOk;
+}
+
+uint32 ScriptedFactory::addRef() { return ++m_references; }
+
+uint32 ScriptedFactory::release()
+{
+    if (m_references == 0)
+        reportMisuse("the factory was released once too often");
+    if (--m_references == 0)
+        scriptedModule().stages.reach("factory-release");
+    return m_references;
+}
+
+tresult ScriptedFactory::getFactoryInfo(PFactoryInfo *info)
+{
+    const ScriptedModule &module = scriptedModule();
+    module.stages.reach("factory-info");
+    const tresult result = module.result("factory-info");
+    if (result != kResultOk)
+        return result;
+    fill(info->vendor, module.vendor);
+    fill(info->url, module.url);
+    fill(info->email, module.email);
+    info->flags = PFactoryInfo::kUnicode;
+    return kResultOk;
+}
+
+int32 ScriptedFactory::countClasses()
+{
+    const ScriptedModule &module = scriptedModule();
+    module.stages.reach("count-classes");
+    return module.stages.answer("count-classes") ? module.result("count-classes")
+                                                 : static_cast<int32>(module.classes.size());
+}
+
+tresult ScriptedFactory::getClassInfo(int32 index, PClassInfo *info)
+{
+    tresult result = kResultOk;
+    if (const ScriptedClass *described = announce("class-info", index, result))
+        fillCommon(*info, *described);
+    return result;
+}
+
+tresult ScriptedFactory::getClassInfo2(int32 index, PClassInfo2 *info)
+{
+    tresult result = kResultOk;
+    if (const ScriptedClass *described = announce("class-info2", index, result)) {
+        fillCommon(*info, *described);
+        fillNewer(*info, *described);
+    }
+    return result;
+}
+
+tresult ScriptedFactory::getClassInfoUnicode(int32 index, PClassInfoW *info)
+{
+    tresult result = kResultOk;
+    if (const ScriptedClass *described = announce("class-info-unicode", index, result)) {
+        fillCommon(*info, *described);
+        fillNewer(*info, *described);
+    }
+    return result;
+}
+
+tresult ScriptedFactory::setHostContext(FUnknown *)
+{
+    scriptedModule().stages.reach("set-host-context");
+    return scriptedModule().result("set-host-context");
+}
+
+tresult ScriptedFactory::createInstance(FIDString classId, FIDString interfaceId, void **object)
+{
+    const ScriptedClass *described = classWithId(classId);
+    *object = nullptr;
+    if (!described)
+        return kInvalidArgument;
+    scriptedModule().stages.reach("create-instance", described->name);
+    const tresult result = scriptedModule().result("create-instance", described->name);
+    if (result != kResultOk || scriptedModule().answers("null", "create-instance", described->name))
+        return result;
+    if (!FUnknownPrivate::iidEqual(interfaceId, Vst::IComponent::iid) &&
+        !FUnknownPrivate::iidEqual(interfaceId, FUnknown::iid))
+        return kNoInterface;
+    *object = ScriptedComponent::create(*described);
+    return kResultOk;
+}

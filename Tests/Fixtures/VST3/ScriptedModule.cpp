@@ -1,0 +1,118 @@
+#include "Tests/Fixtures/VST3/ScriptedModule.h"
+
+#include "Tests/Fixtures/FixtureMisuse.h"
+#include "Tests/Fixtures/FixturePlatform.h"
+#include "Tests/Fixtures/VST3/ResultName.h"
+#include "Tests/Fixtures/VST3/ScriptedClassReader.h"
+
+using namespace Steinberg;
+
+namespace {
+
+std::vector<FixtureStage> stagesOfVST3()
+{
+    return {{"static-constructor"},
+            {"module-entry", true},
+            {"get-factory", true},
+            {"set-host-context", true},
+            {"factory-info", true},
+            {"count-classes", true},
+            {"class-info", true},
+            {"class-info2", true},
+            {"class-info-unicode", true},
+            {"create-instance", true},
+            {"set-io-mode", true},
+            {"initialize", true},
+            {"bus-count"},
+            {"bus-info", true},
+            {"terminate", true},
+            {"release"},
+            {"factory-release"},
+            {"module-exit", true},
+            {"static-destructor"}};
+}
+
+/// The file name of a path without its ending.
+std::string baseName(const std::string &path)
+{
+    const std::string name = path.substr(path.find_last_of("/\\") + 1);
+    return name.substr(0, name.rfind('.'));
+}
+
+bool takeFactoryStatement(ScriptedModule &module, const ScriptStatement &statement)
+{
+    if (statement.key == "generation") {
+        module.generation = statement.number(0);
+        if (module.generation < 0 || module.generation > 3)
+            statement.fail("a generation is 0 to 3");
+    } else if (statement.key == "factory-vendor")
+        module.vendor = statement.word(0);
+    else if (statement.key == "factory-url")
+        module.url = statement.word(0);
+    else if (statement.key == "factory-email")
+        module.email = statement.word(0);
+    else
+        return false;
+    statement.allowWords(1);
+    return true;
+}
+
+void takeStatement(ScriptedModule &module, const ScriptStatement &statement)
+{
+    if (module.stages.take(statement) || takeFactoryStatement(module, statement))
+        return;
+    if (statement.key == "class")
+        module.classes.push_back(scriptedClass(statement.word(0)));
+    else if (module.classes.empty() || !takeClassStatement(module.classes.back(), statement))
+        statement.fail("unknown here");
+}
+
+/// An answer is read when it is due, in the middle of a call: it must not throw into the host.
+tresult resultOf(const std::string &text)
+{
+    try {
+        return resultFromName(text);
+    } catch (const ScriptError &error) {
+        reportMisuse(error.what());
+    }
+}
+
+} // namespace
+
+ScriptedModule::ScriptedModule()
+    : stages(stagesOfVST3())
+{
+    const std::string path = modulePath();
+    std::string script;
+    if (!readFile(path + ".script", script)) {
+        classes.push_back(scriptedClass(baseName(path)));
+        return;
+    }
+    for (const ScriptStatement &statement : parseScript(script))
+        takeStatement(*this, statement);
+}
+
+tresult ScriptedModule::result(const std::string &stage, const std::string &className) const
+{
+    const std::string *answer = stages.answer(stage, className);
+    return answer ? resultOf(*answer) : kResultOk;
+}
+
+bool ScriptedModule::answers(const std::string &answer, const std::string &stage,
+                             const std::string &className) const
+{
+    const std::string *scripted = stages.answer(stage, className);
+    return scripted && *scripted == answer;
+}
+
+const ScriptedModule &scriptedModule()
+{
+    static const ScriptedModule module = [] {
+        try {
+            return ScriptedModule();
+        } catch (const ScriptError &error) {
+            reportMisuse(error.what());
+        }
+    }();
+    return module;
+}

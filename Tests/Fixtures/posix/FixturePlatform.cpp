@@ -1,0 +1,87 @@
+#include "Tests/Fixtures/FixturePlatform.h"
+
+#include <chrono>
+#include <csignal>
+#include <cstdlib>
+#include <fstream>
+#include <iterator>
+#include <thread>
+
+#include <dlfcn.h>
+#include <fcntl.h>
+#include <pthread.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace {
+
+const struct {
+    const char *name;
+    int number;
+} kSignals[] = {{"segv", SIGSEGV}, {"fpe", SIGFPE}, {"ill", SIGILL},  {"abrt", SIGABRT},
+                {"term", SIGTERM}, {"int", SIGINT}, {"alrm", SIGALRM}};
+
+void ignoreSignal(int) {}
+
+} // namespace
+
+std::string modulePath()
+{
+    Dl_info info = {};
+    dladdr(reinterpret_cast<void *>(&modulePath), &info);
+    return info.dli_fname ? info.dli_fname : "";
+}
+
+bool readFile(const std::string &path, std::string &content)
+{
+    std::ifstream file(path, std::ios::binary);
+    content.assign(std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>());
+    return file.is_open();
+}
+
+bool appendToFile(const std::string &path, const std::string &text)
+{
+    const int file = open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0666);
+    if (file < 0)
+        return false;
+    const ssize_t written = write(file, text.data(), text.size());
+    close(file);
+    return written == static_cast<ssize_t>(text.size());
+}
+
+void sleepMilliseconds(int milliseconds)
+{
+    std::this_thread::sleep_for(std::chrono::milliseconds(milliseconds));
+}
+
+void endProcess(int exitCode) { _exit(exitCode); }
+
+void killProcess() { kill(getpid(), SIGKILL); }
+
+void endThread() { pthread_exit(nullptr); }
+
+bool changeFileMask(const std::string &octal)
+{
+    char *end = nullptr;
+    const unsigned long mask = std::strtoul(octal.c_str(), &end, 8);
+    umask(static_cast<mode_t>(mask));
+    return !octal.empty() && *end == '\0';
+}
+
+bool changeWorkingFolder(const std::string &path) { return chdir(path.c_str()) == 0; }
+
+bool installSignalHandler(const std::string &signalName)
+{
+    for (const auto &entry : kSignals) {
+        if (signalName == entry.name)
+            return std::signal(entry.number, ignoreSignal) != SIG_ERR;
+    }
+    return false;
+}
+
+bool startAlarm(const std::string &seconds)
+{
+    const int count = std::atoi(seconds.c_str());
+    alarm(static_cast<unsigned>(count));
+    return count > 0;
+}

@@ -1,0 +1,135 @@
+#include "Tests/Support/ScannerRun.h"
+
+#include "Tests/Fixtures/FixtureMisuse.h"
+#include "Tests/Support/TestFolder.h"
+
+#include <QFile>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+const char kLogFile[] = "scanner.log";
+/// The exit code of a process that a sanitizer ended, chosen so that no program of ours has it.
+const int kSanitizerExit = 97;
+
+/// Sanitizers leave the faults of plug-ins to the system, so that they end in a signal as they do for a user.
+void settleSanitizers(QProcessEnvironment &environment)
+{
+    const QString settings =
+        QStringLiteral(
+            "exitcode=%1:handle_segv=0:handle_sigbus=0:handle_sigfpe=0:handle_sigill=0:handle_abort=0")
+            .arg(kSanitizerExit);
+    for (const QString &name :
+         {QStringLiteral("ASAN_OPTIONS"), QStringLiteral("UBSAN_OPTIONS"), QStringLiteral("TSAN_OPTIONS")}) {
+        const QString given = environment.value(name);
+        environment.insert(name, given.isEmpty() ? settings : settings + QLatin1Char(':') + given);
+    }
+}
+
+bool holdsSanitizerReport(const QByteArray &text)
+{
+    for (const char *sign :
+         {"ERROR: AddressSanitizer", "ERROR: LeakSanitizer", "WARNING: ThreadSanitizer", "runtime error: "}) {
+        if (text.contains(sign))
+            return true;
+    }
+    return false;
+}
+
+} // namespace
+
+ScannerRun::ScannerRun(const QString &program, const TestFolder &folder)
+    : m_folder(folder)
+    , m_program(program)
+    , m_arguments(folder.scanList())
+    , m_environment(QProcessEnvironment::systemEnvironment())
+{
+    m_environment.insert(QStringLiteral("QT_QPA_PLATFORM"), QStringLiteral("offscreen"));
+    m_environment.insert(QStringLiteral("FXPROBE_LOG"), folder.path(QLatin1String(kLogFile)));
+    settleSanitizers(m_environment);
+}
+
+ScannerRun::~ScannerRun()
+{
+    if (m_process.state() == QProcess::NotRunning)
+        return;
+    m_process.kill();
+    m_process.waitForFinished(-1);
+}
+
+bool ScannerRun::start()
+{
+    QFile::remove(m_folder.path(QLatin1String(kLogFile)));
+    m_outcome = ScannerOutcome();
+    m_deadline = QDeadlineTimer(m_limit);
+    m_process.setProcessEnvironment(m_environment);
+    m_process.start(m_program, m_arguments);
+    m_outcome.started = m_process.waitForStarted(static_cast<int>(m_limit.count()));
+    EXPECT_TRUE(m_outcome.started) << qPrintable(m_program) << ": " << qPrintable(m_process.errorString());
+    return m_outcome.started;
+}
+
+bool ScannerRun::waitUntil(const std::function<bool()> &condition)
+{
+    while (!condition()) {
+        if (m_deadline.hasExpired() || m_process.state() == QProcess::NotRunning)
+            return false;
+        m_process.waitForFinished(5);
+    }
+    return true;
+}
+
+void ScannerRun::requestTermination() { ::requestTermination(m_process); }
+
+const ScannerOutcome &ScannerRun::wait()
+{
+    if (!m_outcome.started)
+        return m_outcome;
+    if (!waitUntil([this] { return m_process.state() == QProcess::NotRunning; })) {
+        m_outcome.timedOut = true;
+        m_process.kill();
+        m_process.waitForFinished(-1);
+    }
+    readOutcome();
+    reportFaults();
+    return m_outcome;
+}
+
+const ScannerOutcome &ScannerRun::run()
+{
+    start();
+    return wait();
+}
+
+void ScannerRun::readOutcome()
+{
+    m_outcome.standardOutput = m_process.readAllStandardOutput();
+    m_outcome.standardError = m_process.readAllStandardError();
+    m_outcome.log = QString::fromUtf8(m_folder.read(QLatin1String(kLogFile)));
+    m_outcome.signal = endingSignal(m_process);
+    const bool bySignal = m_process.exitStatus() == QProcess::CrashExit;
+    m_outcome.exitCode = bySignal ? -1 : m_process.exitCode();
+    m_outcome.crashed = bySignal || m_outcome.exitCode == kSanitizerExit;
+}
+
+void ScannerRun::reportFaults() const
+{
+    EXPECT_FALSE(m_outcome.timedOut) << qPrintable(m_program)
+                                     << " overran its time limit and was killed; log:\n"
+                                     << qPrintable(m_outcome.log);
+    EXPECT_NE(m_outcome.exitCode, kFixtureMisused) << m_outcome.standardError.constData();
+    EXPECT_FALSE(holdsSanitizerReport(m_outcome.standardError)) << m_outcome.standardError.constData();
+}
+
+std::vector<ScannerOutcome> runUntilSettled(const QString &program, const TestFolder &folder, int mostRuns)
+{
+    std::vector<ScannerOutcome> outcomes;
+    do {
+        ScannerRun run(program, folder);
+        outcomes.push_back(run.run());
+    } while (!folder.markers().isEmpty() && static_cast<int>(outcomes.size()) < mostRuns &&
+             outcomes.back().started);
+    EXPECT_TRUE(folder.markers().isEmpty()) << qPrintable(folder.markers().join(QStringLiteral(", ")));
+    return outcomes;
+}

@@ -1,0 +1,76 @@
+#pragma once
+
+#include "Tests/Support/ChildProcess.h"
+
+#include <QDeadlineTimer>
+#include <QProcessEnvironment>
+#include <QString>
+#include <QStringList>
+
+#include <chrono>
+#include <functional>
+#include <vector>
+
+class TestFolder;
+
+/// How a run of the scanner ended. A run that never started counts as failed in each field.
+struct ScannerOutcome {
+    bool started = false;
+    bool timedOut = false; ///< ended by force at the time limit
+    bool crashed = false;  ///< ended by a signal, or by a sanitizer in place of one
+    int exitCode = -1;     ///< -1 when a signal ended it
+    int signal = 0;        ///< the signal that ended it, or 0
+    QByteArray standardOutput;
+    QByteArray standardError;
+    QString log; ///< what this run wrote to its debug log
+
+    /// Ended by itself with exit code 0.
+    bool succeeded() const { return started && !timedOut && !crashed && exitCode == 0; }
+};
+
+/// One run of the real scanner, or of another program, in a process of its own, without a screen. The test
+/// fails when the program cannot be started, overruns its time limit, calls a fixture wrongly or is found
+/// faulty by a sanitizer. A run that was not waited for is killed with this object.
+class ScannerRun {
+public:
+    ScannerRun(const QString &program, const TestFolder &folder);
+    ~ScannerRun();
+    ScannerRun(const ScannerRun &) = delete;
+    ScannerRun &operator=(const ScannerRun &) = delete;
+
+    /// The scan list of the folder, unless set.
+    void setArguments(const QStringList &arguments) { m_arguments = arguments; }
+    void setEnvironment(const QString &name, const QString &value) { m_environment.insert(name, value); }
+    void setTimeLimit(std::chrono::milliseconds limit) { m_limit = limit; }
+
+    bool start();
+    /// Waits in a started run until the condition holds; false when the run or its time limit ended before.
+    bool waitUntil(const std::function<bool()> &condition);
+    /// Asks the program to end (SIGTERM).
+    void requestTermination();
+    /// Ends the program by force (SIGKILL).
+    void kill() { m_process.kill(); }
+    qint64 processId() const { return m_process.processId(); }
+    /// Waits for the end of a started run.
+    const ScannerOutcome &wait();
+    /// start() and wait() in one.
+    const ScannerOutcome &run();
+
+private:
+    void readOutcome();
+    void reportFaults() const;
+
+    const TestFolder &m_folder;
+    QString m_program;
+    QStringList m_arguments;
+    QProcessEnvironment m_environment;
+    std::chrono::milliseconds m_limit = std::chrono::seconds(60);
+    QDeadlineTimer m_deadline;
+    ChildProcess m_process;
+    ScannerOutcome m_outcome;
+};
+
+/// Runs the program on the folder's scan list again and again as long as crash markers survive, as the
+/// workstation does. Returns the outcome of each run; the test fails when markers survive the last one.
+std::vector<ScannerOutcome> runUntilSettled(const QString &program, const TestFolder &folder,
+                                            int mostRuns = 10);

@@ -1,0 +1,73 @@
+#include "Tests/Support/VST3Fixture.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+#ifdef _WIN32
+const char kBundleFolder[] = "x86_64-win";
+const char kBundleEnding[] = ".vst3";
+#else
+const char kBundleFolder[] = "x86_64-linux";
+const char kBundleEnding[] = ".so";
+#endif
+
+/// Replaces what is at the path, so that a test can also update a plug-in.
+void putModule(const QString &path, const QByteArray &script, VST3Fixture fixture)
+{
+    const QString source = vst3FixturePath(fixture);
+    QFile scriptFile(path + QStringLiteral(".script"));
+    QDir().mkpath(QFileInfo(path).path());
+    QFile::remove(path);
+    scriptFile.remove();
+    EXPECT_TRUE(QFile::copy(source, path)) << qPrintable(source) << " to " << qPrintable(path);
+    if (script.isNull())
+        return;
+    const bool written = scriptFile.open(QIODevice::WriteOnly) && scriptFile.write(script) == script.size();
+    EXPECT_TRUE(written) << qPrintable(scriptFile.errorString());
+}
+
+QString modulePathIn(const QString &folder, const QString &name)
+{
+    return folder + QLatin1Char('/') + name + QStringLiteral(".vst3");
+}
+
+} // namespace
+
+QString vst3FixturePath(VST3Fixture fixture)
+{
+    switch (fixture) {
+    case VST3Fixture::Plain:
+        return QStringLiteral(FXPROBE_PLAIN_VST3);
+    case VST3Fixture::NoEntry:
+        return QStringLiteral(FXPROBE_NO_ENTRY_VST3);
+    case VST3Fixture::Scripted:
+        break;
+    }
+    return QStringLiteral(FXPROBE_SCRIPTED_VST3);
+}
+
+QString addVST3File(const QString &folder, const QString &name, const QByteArray &script, VST3Fixture fixture)
+{
+    const QString path = modulePathIn(folder, name);
+    putModule(path, script, fixture);
+    return path;
+}
+
+QString addVST3Bundle(const QString &folder, const QString &name, const QByteArray &script,
+                      VST3Fixture fixture)
+{
+    const QString bundle = modulePathIn(folder, name);
+    putModule(vst3BundleBinary(bundle), script, fixture);
+    return bundle;
+}
+
+QString vst3BundleBinary(const QString &bundle)
+{
+    return bundle + QStringLiteral("/Contents/") + QLatin1String(kBundleFolder) + QLatin1Char('/') +
+           QFileInfo(bundle).completeBaseName() + QLatin1String(kBundleEnding);
+}
