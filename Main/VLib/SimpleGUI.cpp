@@ -8,44 +8,59 @@
 #include <utility>
 
 namespace {
-std::shared_ptr<VUI> s_ui;
+
+/// Only reached through the atomic operations: threads that plug-ins left behind may still send messages
+/// while the interface goes. Never destroyed, for the same reason.
+std::shared_ptr<VUI> &uiSlot()
+{
+    static auto &slot = *new std::shared_ptr<VUI>;
+    return slot;
 }
 
-void installVUI(std::shared_ptr<VUI> ui) { s_ui = std::move(ui); }
+} // namespace
 
-std::shared_ptr<VUI> installedVUI() { return s_ui; }
+void installVUI(std::shared_ptr<VUI> ui) { std::atomic_store(&uiSlot(), std::move(ui)); }
+
+void uninstallVUI(const std::shared_ptr<VUI> &ui)
+{
+    std::shared_ptr<VUI> expected = ui;
+    std::atomic_compare_exchange_strong(&uiSlot(), &expected, std::shared_ptr<VUI>());
+}
+
+std::shared_ptr<VUI> installedVUI() { return std::atomic_load(&uiSlot()); }
 
 void SimpleGUIDetail::showStatus(const QString &text)
 {
-    if (s_ui)
-        s_ui->showStatus(text);
+    if (const auto ui = installedVUI())
+        ui->showStatus(text);
 }
 
 void SimpleGUIDetail::showStatus(int level, const QString &text)
 {
-    if (s_ui)
-        s_ui->showStatus(level, text);
+    if (const auto ui = installedVUI())
+        ui->showStatus(level, text);
 }
 
 void SimpleGUIDetail::userWarning(const QString &text)
 {
     DebugLog(L"User Warning - %ls", text);
-    if (s_ui)
-        s_ui->warn(text);
+    if (const auto ui = installedVUI())
+        ui->warn(text);
 }
 
 bool SimpleGUIDetail::askUser(const QString &text)
 {
     DebugLog(L"Asking user \"%s\"", text);
-    const bool yes = s_ui ? s_ui->askUser(text) : true;
+    const auto ui = installedVUI();
+    const bool yes = ui ? ui->askUser(text) : true;
     DebugLog(L"User answered %s", yes ? "yes" : "no");
     return yes;
 }
 
 int userMessageBox(const QString &text, int flags)
 {
-    if (s_ui)
-        return s_ui->messageBox(text, flags);
+    if (const auto ui = installedVUI())
+        return ui->messageBox(text, flags);
     DebugLog(L"UserMessageBox");
     DebugLog(L": No globalUi - using AfxMessageBox");
     reportAssertion("0", SourcePlace{"Main/VLib/SimpleGUI", 216});
@@ -54,14 +69,14 @@ int userMessageBox(const QString &text, int flags)
 
 void requestShow()
 {
-    if (s_ui)
-        s_ui->requestShow();
+    if (const auto ui = installedVUI())
+        ui->requestShow();
 }
 
 void notifyUI(quint32 value)
 {
-    if (s_ui)
-        s_ui->notify(value);
+    if (const auto ui = installedVUI())
+        ui->notify(value);
 }
 
 void showScanning(const QString &what)
@@ -72,5 +87,6 @@ void showScanning(const QString &what)
 
 std::shared_ptr<VProgressDisplay> createProgressDisplay()
 {
-    return s_ui ? s_ui->createProgressDisplay() : nullptr;
+    const auto ui = installedVUI();
+    return ui ? ui->createProgressDisplay() : nullptr;
 }

@@ -21,9 +21,11 @@ inline constexpr quint32 kEntryAdded = 0x0FFFFFFF; ///< an entry came into a cat
 /// Longest message text in UTF-16 units; a longer one is cut.
 inline constexpr int kMaxUserMessage = 550;
 
-/// Replaces the process-wide user interface and releases the previous one. Call while no other thread sends
-/// messages.
+/// Replaces the process-wide user interface and releases the previous one. Any thread; a message under way
+/// still reaches the previous one.
 void installVUI(std::shared_ptr<VUI> ui);
+/// Removes the user interface if it is still the one installed.
+void uninstallVUI(const std::shared_ptr<VUI> &ui);
 /// The installed user interface, or null.
 std::shared_ptr<VUI> installedVUI();
 

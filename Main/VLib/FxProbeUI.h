@@ -1,0 +1,24 @@
+#pragma once
+
+#include "Main/VLib/VUI.h"
+
+#include <memory>
+
+class StatusHandover;
+
+/// The program's messages as the scanner's window shows them: status texts, progress and the wish to be seen.
+/// Warnings and questions have no place there; a question is answered no.
+class FxProbeUI : public VUI {
+public:
+    /// `status` is what the window polls; operations after the window is gone change nothing.
+    explicit FxProbeUI(std::shared_ptr<StatusHandover> status);
+
+    void showStatus(const QString &text) override;
+    void showStatus(int level, const QString &text) override;
+    void notify(quint32 value) override;
+    std::shared_ptr<VProgressDisplay> createProgressDisplay() override;
+    void requestShow() override;
+
+private:
+    std::shared_ptr<StatusHandover> m_status;
+};

@@ -1,0 +1,241 @@
+#include "Main/VLib/UiFxProbe.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Main/VLib/FxProbeUI.h"
+#include "Main/VLib/SimpleGUI.h"
+#include "Main/VLib/StatusHandover.h"
+
+#include <QAbstractEventDispatcher>
+#include <QCloseEvent>
+#include <QCoreApplication>
+#include <QLabel>
+#include <QProgressBar>
+#include <QTimer>
+#include <QVBoxLayout>
+
+#include <cxxabi.h>
+
+#include <utility>
+
+namespace {
+
+constexpr int kWidth = 333;
+constexpr int kHeight = 80;
+constexpr int kTickMilliseconds = 50;
+
+/// Calls back when it goes out of scope, also while the stack is unwound.
+template <typename Callback>
+class AtScopeEnd {
+public:
+    explicit AtScopeEnd(Callback callback)
+        : m_callback(std::move(callback))
+    {}
+    ~AtScopeEnd() { m_callback(); }
+    AtScopeEnd(const AtScopeEnd &) = delete;
+    AtScopeEnd &operator=(const AtScopeEnd &) = delete;
+
+private:
+    Callback m_callback;
+};
+
+QPalette labelPalette()
+{
+    const QBrush brush(QColor(200, 200, 200, 255), Qt::SolidPattern);
+    QPalette palette;
+    for (const auto group : {QPalette::Active, QPalette::Inactive, QPalette::Disabled})
+        for (const auto role : {QPalette::WindowText, QPalette::Text, QPalette::ButtonText})
+            palette.setBrush(group, role, brush);
+    return palette;
+}
+
+} // namespace
+
+UiFxProbe::Installation::Installation(std::shared_ptr<FxProbeUI> ui)
+    : m_ui(std::move(ui))
+{
+    installVUI(m_ui);
+}
+
+UiFxProbe::Installation::~Installation() { uninstallVUI(m_ui); }
+
+UiFxProbe::UiFxProbe(const QString &dataFolder, std::function<void(const QString &)> scanRun, QWidget *parent)
+    : QDialog(parent)
+    , m_dataFolder(dataFolder)
+    , m_status(std::make_shared<StatusHandover>())
+{
+    setUpWidgets();
+    m_installation = std::make_unique<Installation>(std::make_shared<FxProbeUI>(m_status));
+    setWindowFlags(Qt::Window | Qt::WindowMinimizeButtonHint | Qt::WindowStaysOnTopHint |
+                   Qt::WindowCloseButtonHint);
+    m_worker = std::thread([this, scan = std::move(scanRun)] { runScan(scan); });
+}
+
+UiFxProbe::~UiFxProbe()
+{
+    m_closed = true;
+    m_status->setClosing();
+    // A plug-in may be waiting for this thread to answer a message; without events the join would never end.
+    // On the worker itself nothing is waited for: there the join reports the mistake.
+    while (!m_status->isFinished() && std::this_thread::get_id() != m_worker.get_id())
+        QCoreApplication::processEvents(QEventLoop::WaitForMoreEvents);
+    if (m_worker.joinable())
+        m_worker.join();
+}
+
+void UiFxProbe::setUpWidgets()
+{
+    setUpWindow();
+    setUpLabel();
+    setUpProgressBar();
+    setWindowTitle(QCoreApplication::translate("FxProbeClass", "Quillon Audio FX"));
+    m_label->setText(QString());
+    QMetaObject::connectSlotsByName(this);
+}
+
+void UiFxProbe::setUpWindow()
+{
+    if (objectName().isEmpty())
+        setObjectName(QStringLiteral("FxProbeClass"));
+    resize(kWidth, kHeight);
+    setMinimumSize(kWidth, kHeight);
+    setMaximumSize(kWidth, kHeight);
+    setStyleSheet(QStringLiteral("QDialog {background-color:rgb(55, 57, 62);\nborder: 1px solid black; }\n"));
+    m_layout = new QVBoxLayout(this);
+    m_layout->setSpacing(6);
+    m_layout->setContentsMargins(11, 11, 11, 11);
+    m_layout->setObjectName(QStringLiteral("verticalLayout_3"));
+    m_layout->setContentsMargins(20, -1, 20, 20); // -1: as the style has it
+}
+
+void UiFxProbe::setUpLabel()
+{
+    m_label = new QLabel(this);
+    m_label->setObjectName(QStringLiteral("label"));
+    m_label->setPalette(labelPalette());
+    QFont font;
+    font.setPointSize(10);
+    m_label->setFont(font);
+    m_label->setStyleSheet(QStringLiteral("color:rgb(200,200,200);"));
+    // Texts hold names that plug-ins chose; one that looks like HTML must not be read as such.
+    m_label->setTextFormat(Qt::PlainText);
+    m_layout->addWidget(m_label);
+}
+
+void UiFxProbe::setUpProgressBar()
+{
+    m_progressBar = new QProgressBar(this);
+    m_progressBar->setObjectName(QStringLiteral("progressBar"));
+    QSizePolicy policy(QSizePolicy::Expanding, QSizePolicy::Fixed);
+    policy.setHorizontalStretch(0);
+    policy.setVerticalStretch(0);
+    policy.setHeightForWidth(m_progressBar->sizePolicy().hasHeightForWidth());
+    m_progressBar->setSizePolicy(policy);
+    m_progressBar->setStyleSheet(QStringLiteral("background:rgb(67, 71, 77);\n\n"));
+    m_progressBar->setValue(24);
+    m_progressBar->setTextVisible(false);
+    m_layout->addWidget(m_progressBar);
+}
+
+// The exception of a forced unwind has no object, so the reference to it is null; that is the compiler's way.
+[[gnu::no_sanitize("null")]] void UiFxProbe::runScan(const std::function<void(const QString &)> &scanRun)
+{
+    const AtScopeEnd finished([this] { markFinished(); });
+    try {
+        scanRun(m_dataFolder);
+    } catch (const abi::__forced_unwind &) {
+        // A plug-in ends the thread with pthread_exit; to swallow that would abort the process.
+        DebugLog(L"The scan's thread was ended by a plug-in");
+        throw;
+    } catch (const std::exception &exception) {
+        DebugLog(L"The scan ended with an exception: %s", exception.what());
+    } catch (...) {
+        DebugLog(L"The scan ended with an unknown exception");
+    }
+}
+
+void UiFxProbe::markFinished()
+{
+    m_status->setFinished();
+    // The destructor may be asleep until the next event.
+    if (auto *dispatcher = QAbstractEventDispatcher::instance(thread()))
+        dispatcher->wakeUp();
+}
+
+void UiFxProbe::run(QCoreApplication &application, bool defaultPath)
+{
+    if (defaultPath)
+        m_status->requestShow();
+    else
+        setWindowState(Qt::WindowMinimized);
+    auto *timer = new QTimer(this);
+    connect(timer, &QTimer::timeout, this, &UiFxProbe::OnTimer);
+    timer->start(kTickMilliseconds);
+    // Already closed: there was no loop to end yet, and nobody would end this one.
+    if (!m_closed)
+        application.exec();
+}
+
+void UiFxProbe::OnTimer()
+{
+    if (m_closed)
+        return;
+    if (m_status->isFinished()) {
+        close();
+        return;
+    }
+    if (m_status->takeShowRequest())
+        showWindow();
+    showPendingStatus();
+    QCoreApplication::processEvents();
+}
+
+void UiFxProbe::showWindow()
+{
+    setWindowState(Qt::WindowNoState);
+    show();
+    raise();
+    activateWindow();
+}
+
+void UiFxProbe::showPendingStatus()
+{
+    const PendingStatus pending = m_status->take();
+    if (!pending.text.isEmpty())
+        m_label->setText(pending.text);
+    if (pending.minimum != pending.maximum) {
+        m_progressBar->setMinimum(pending.minimum);
+        m_progressBar->setMaximum(pending.maximum);
+    }
+    if (pending.value != -1)
+        m_progressBar->setValue(pending.value);
+}
+
+void UiFxProbe::setRange(int minimum, int maximum) { m_status->setRange(minimum, maximum); }
+
+void UiFxProbe::setText(const QString &text) { m_status->setText(text); }
+
+void UiFxProbe::requestClose() { QMetaObject::invokeMethod(this, "close", Qt::QueuedConnection); }
+
+bool UiFxProbe::isFinished() const { return m_status->isFinished(); }
+
+void UiFxProbe::closeEvent(QCloseEvent *event)
+{
+    QDialog::closeEvent(event);
+    if (event->isAccepted())
+        endEventLoop();
+}
+
+// The Escape key comes here without a close event.
+void UiFxProbe::done(int result)
+{
+    QDialog::done(result);
+    endEventLoop();
+}
+
+// Not left to the toolkit, which ends the loop only when no other window of the process is in sight: plug-ins
+// may have some.
+void UiFxProbe::endEventLoop()
+{
+    m_closed = true;
+    QCoreApplication::quit();
+}

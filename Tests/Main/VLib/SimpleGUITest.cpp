@@ -1,0 +1,138 @@
+#include "Main/VLib/SimpleGUI.h"
+
+#include "Main/VLib/VProgressDisplay.h"
+#include "Main/VLib/VUI.h"
+#include "Tests/Support/CapturedLog.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+/// Notes what reaches the user interface, one line for each message.
+class NotingUI : public VUI {
+public:
+    void showStatus(const QString &text) override { heard << text; }
+    void showStatus(int level, const QString &text) override { heard << QString::number(level) + ' ' + text; }
+    void notify(quint32 value) override { heard << "notified " + QString::number(value, 16); }
+    void warn(const QString &text) override { heard << "warned " + text; }
+    std::shared_ptr<VProgressDisplay> createProgressDisplay() override { return nullptr; }
+    void requestShow() override { heard << QStringLiteral("show"); }
+    int messageBox(const QString &text, int flags) override
+    {
+        heard << "box " + text;
+        return flags + 1;
+    }
+
+    QStringList heard;
+};
+
+class SimpleGUI : public ::testing::Test {
+protected:
+    ~SimpleGUI() override { installVUI(nullptr); }
+
+    std::shared_ptr<NotingUI> installUI() const
+    {
+        auto ui = std::make_shared<NotingUI>();
+        installVUI(ui);
+        return ui;
+    }
+
+    const CapturedLog log;
+};
+
+QString repeated(const char *utf8, int count) { return QString::fromUtf8(utf8).repeated(count); }
+
+} // namespace
+
+TEST_F(SimpleGUI, WithoutInterfaceQuestionsAreAnsweredYes)
+{
+    EXPECT_TRUE(askUser(L"Load %ls?", QStringLiteral("Fuzz")));
+    EXPECT_EQ(log.lines(), QStringList({"Asking user \"Load Fuzz?\"", "User answered yes"}));
+}
+
+TEST_F(SimpleGUI, InterfaceThatCannotAskAnswersNo)
+{
+    installUI();
+    EXPECT_FALSE(askUser(L"Load?"));
+    EXPECT_EQ(log.lines(), QStringList({"Asking user \"Load?\"", "User answered no"}));
+}
+
+TEST_F(SimpleGUI, WithoutInterfaceMessageBoxIsAnAssertion)
+{
+    EXPECT_EQ(userMessageBox(QStringLiteral("Hello"), 4), 0);
+    EXPECT_EQ(log.lines(), QStringList({"UserMessageBox", ": No globalUi - using AfxMessageBox",
+                                        "Assertion failed: \"0\", Main/VLib/SimpleGUI, line 216"}));
+}
+
+TEST_F(SimpleGUI, MessageBoxAnswerIsTheInterfaces)
+{
+    const auto ui = installUI();
+    EXPECT_EQ(userMessageBox(QStringLiteral("50% done"), 4), 5);
+    EXPECT_EQ(ui->heard, QStringList(QStringLiteral("box 50% done")));
+    EXPECT_TRUE(log.lines().isEmpty());
+}
+
+TEST_F(SimpleGUI, WithoutInterfaceMessagesVanish)
+{
+    showStatus(L"one");
+    showScanning(QStringLiteral("two"));
+    notifyUI(MessageCode::kEntryAdded);
+    EXPECT_EQ(createProgressDisplay(), nullptr);
+    EXPECT_TRUE(log.lines().isEmpty());
+}
+
+TEST_F(SimpleGUI, EachMessageReachesTheInterface)
+{
+    const auto ui = installUI();
+    showStatus(L"%d of %d", 1, 2);
+    showScanning(QStringLiteral("Fuzz"));
+    notifyUI(MessageCode::kEntryAdded);
+    userWarning(L"No %ls", QStringLiteral("entry"));
+    EXPECT_EQ(ui->heard,
+              QStringList({"1 of 2", "60000 Scanning: Fuzz", "show", "notified fffffff", "warned No entry"}));
+    EXPECT_EQ(log.lines(), QStringList(QStringLiteral("User Warning - No entry")));
+}
+
+TEST_F(SimpleGUI, TextsArriveWholeUpToTheLimit)
+{
+    const QString japanese = QString::fromUtf8("日本語プラグイン");
+    const struct {
+        const char *name;
+        QString text;
+        QString shown;
+    } rows[] = {
+        {"at the limit", repeated("x", 550), repeated("x", 550)},
+        {"one too long", repeated("x", 551), repeated("x", 550)},
+        {"far too long", repeated("x", 70000), repeated("x", 550)},
+        {"Japanese, too long", repeated("語", 600), repeated("語", 550)},
+        {"emoji across the limit", "x" + repeated("🎛", 300), "x" + repeated("🎛", 274)},
+        {"emoji up to the limit", repeated("🎛", 300), repeated("🎛", 275)},
+        {"Japanese", japanese, japanese},
+        {"percent signs are no format", QStringLiteral("100%s %n %ls"), QStringLiteral("100%s %n %ls")},
+    };
+    for (const auto &row : rows) {
+        const auto ui = installUI();
+        showStatus(L"%ls", row.text);
+        EXPECT_EQ(ui->heard, QStringList(row.shown)) << row.name;
+    }
+}
+
+TEST_F(SimpleGUI, NullFormatIsAnEmptyText)
+{
+    const auto ui = installUI();
+    const wchar_t *none = nullptr;
+    showStatus(none);
+    userWarning(none);
+    EXPECT_EQ(ui->heard, QStringList({"", "warned "}));
+}
+
+TEST_F(SimpleGUI, OnlyTheInstalledInterfaceIsRemoved)
+{
+    const auto first = installUI();
+    const auto second = installUI();
+    uninstallVUI(first);
+    EXPECT_EQ(installedVUI(), second);
+    uninstallVUI(second);
+    EXPECT_EQ(installedVUI(), nullptr);
+    EXPECT_EQ(second.use_count(), 1);
+}

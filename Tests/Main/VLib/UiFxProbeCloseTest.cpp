@@ -1,0 +1,96 @@
+#include "Tests/Main/VLib/HeldScan.h"
+
+#include <QKeyEvent>
+#include <QTimer>
+#include <QWindow>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+/// What the close button of the window's frame does.
+void pressCloseButton(UiFxProbe &dialog) { dialog.windowHandle()->close(); }
+
+void pressEscape(UiFxProbe &dialog)
+{
+    QKeyEvent press(QEvent::KeyPress, Qt::Key_Escape, Qt::NoModifier);
+    QCoreApplication::sendEvent(&dialog, &press);
+}
+
+struct CloseRow {
+    const char *name;
+    bool defaultPath; ///< the window is shown at the first tick
+    void (*close)(HeldScan &scan);
+};
+
+const CloseRow kCloseRows[] = {
+    {"scan over, never shown", false, [](HeldScan &scan) { scan.finish(); }},
+    {"scan over, in sight", true, [](HeldScan &scan) { scan.finish(); }},
+    {"scan over, minimised by the user", true,
+     [](HeldScan &scan) {
+         scan.dialog.showMinimized();
+         scan.finish();
+     }},
+    {"close button", true, [](HeldScan &scan) { pressCloseButton(scan.dialog); }},
+    {"close button while minimised", true,
+     [](HeldScan &scan) {
+         scan.dialog.showMinimized();
+         pressCloseButton(scan.dialog);
+     }},
+    {"Escape key", true, [](HeldScan &scan) { pressEscape(scan.dialog); }},
+    {"closed, never shown", false, [](HeldScan &scan) { scan.dialog.close(); }},
+    {"close requested by another thread, never shown", false,
+     [](HeldScan &scan) { std::thread([&scan] { scan.dialog.requestClose(); }).join(); }},
+    {"close requested by another thread, in sight", true,
+     [](HeldScan &scan) { std::thread([&scan] { scan.dialog.requestClose(); }).join(); }},
+};
+
+/// Calls the row's action once the window is as the row wants it.
+void closeWhenReady(HeldScan &scan, const CloseRow &row, QTimer &poll)
+{
+    QObject::connect(&poll, &QTimer::timeout, [&] {
+        if (scan.dialog.isVisible() != row.defaultPath)
+            return;
+        poll.stop();
+        row.close(scan);
+    });
+    poll.start(1);
+}
+
+} // namespace
+
+TEST(UiFxProbeClose, EndsTheEventLoop)
+{
+    // A window of some plug-in must not keep the scanner alive.
+    QWidget stranger;
+    stranger.show();
+    for (const CloseRow &row : kCloseRows) {
+        SCOPED_TRACE(row.name);
+        HeldScan scan;
+        QTimer poll;
+        closeWhenReady(scan, row, poll);
+        scan.dialog.run(*QCoreApplication::instance(), row.defaultPath);
+        EXPECT_FALSE(poll.isActive());
+        EXPECT_FALSE(scan.dialog.isVisible());
+        EXPECT_TRUE(stranger.isVisible());
+    }
+}
+
+TEST(UiFxProbeClose, BeforeTheLoopStartsIsNotForgotten)
+{
+    HeldScan scan;
+    scan.dialog.requestClose();
+    QCoreApplication::processEvents();
+    scan.dialog.run(*QCoreApplication::instance(), true);
+    EXPECT_FALSE(scan.dialog.isVisible());
+}
+
+TEST(UiFxProbeClose, ScanThatIsOverAtOnceIsNeverShown)
+{
+    UiFxProbe dialog(QString(), [](const QString &) { requestShow(); });
+    while (!dialog.isFinished())
+        std::this_thread::yield();
+    dialog.run(*QCoreApplication::instance(), false);
+    EXPECT_FALSE(dialog.isVisible());
+    EXPECT_FALSE(dialog.testAttribute(Qt::WA_WState_ExplicitShowHide));
+}

@@ -1,0 +1,162 @@
+#include "Tests/Main/VLib/HeldScan.h"
+
+#include "Main/VLib/VUI.h"
+#include "Tests/Support/CapturedLog.h"
+
+#include <gtest/gtest.h>
+
+#include <system_error>
+
+#include <pthread.h>
+
+namespace {
+
+/// A scan that goes on until its window asks it to stop.
+void scanUntilCancelled()
+{
+    const auto progress = createProgressDisplay();
+    while (!progress->isCancelled())
+        std::this_thread::yield();
+}
+
+QString logAfterScan(std::function<void(const QString &)> scanRun)
+{
+    const CapturedLog log;
+    UiFxProbe dialog(QString(), std::move(scanRun));
+    dialog.run(*QCoreApplication::instance(), false);
+    return log.lines().join('\n');
+}
+
+} // namespace
+
+TEST(UiFxProbeScan, GetsTheDataFolder)
+{
+    QString folder;
+    UiFxProbe(QString::fromUtf8("C:/Daten/ü"), [&folder](const QString &given) { folder = given; });
+    EXPECT_EQ(folder, QString::fromUtf8("C:/Daten/ü"));
+}
+
+TEST(UiFxProbeScan, IsCancelledWhenTheWindowGoes)
+{
+    bool over = false;
+    {
+        UiFxProbe dialog(QString(), [&over](const QString &) {
+            scanUntilCancelled();
+            over = true;
+        });
+        dialog.requestClose();
+        dialog.run(*QCoreApplication::instance(), true);
+    }
+    EXPECT_TRUE(over);
+}
+
+TEST(UiFxProbeScan, MessagesToTheWindowAreAnsweredWhileItGoes)
+{
+    int answered = 0;
+    {
+        UiFxProbe dialog(QString(), [&dialog, &answered](const QString &) {
+            scanUntilCancelled();
+            for (int message = 0; message < 100; ++message)
+                answered +=
+                    QMetaObject::invokeMethod(&dialog, "update", Qt::BlockingQueuedConnection) ? 1 : 0;
+        });
+    }
+    EXPECT_EQ(answered, 100);
+}
+
+TEST(UiFxProbeScan, EndsWhateverItThrows)
+{
+    EXPECT_EQ(logAfterScan([](const QString &) {}), QString());
+    EXPECT_EQ(logAfterScan([](const QString &) { throw std::runtime_error("100% broken"); }),
+              "The scan ended with an exception: 100* broken");
+    EXPECT_EQ(logAfterScan([](const QString &) { throw 5; }), "The scan ended with an unknown exception");
+    EXPECT_EQ(logAfterScan(nullptr), "The scan ended with an exception: bad_function_call");
+}
+
+TEST(UiFxProbeScan, EndsWhenAPluginEndsTheThread)
+{
+#ifndef __GLIBC__
+    GTEST_SKIP() << "only here does the end of a thread unwind its stack";
+#else
+    EXPECT_EQ(logAfterScan([](const QString &) { pthread_exit(nullptr); }),
+              "The scan's thread was ended by a plug-in");
+#endif
+}
+
+TEST(UiFxProbeScan, NothingStaysInstalledWithoutAThread)
+{
+#ifndef __GLIBC__
+    GTEST_SKIP() << "no way to make the start of a thread fail";
+#else
+    pthread_attr_t normal;
+    pthread_attr_t impossible;
+    pthread_getattr_default_np(&normal);
+    pthread_attr_init(&impossible);
+    pthread_attr_setstacksize(&impossible, size_t(1) << 47);
+    ASSERT_EQ(pthread_setattr_default_np(&impossible), 0);
+    bool started = false;
+    try {
+        UiFxProbe(QString(), [&started](const QString &) { started = true; });
+        ADD_FAILURE() << "no exception";
+    } catch (const std::system_error &error) {
+        EXPECT_EQ(error.code(), std::errc::resource_unavailable_try_again);
+    }
+    pthread_setattr_default_np(&normal);
+    pthread_attr_destroy(&normal);
+    EXPECT_FALSE(started);
+    EXPECT_EQ(installedVUI(), nullptr);
+#endif
+}
+
+TEST(UiFxProbeScan, NobodyReachesAWindowThatIsGone)
+{
+    std::shared_ptr<VUI> ui;
+    std::shared_ptr<VProgressDisplay> progress;
+    {
+        const HeldScan scan;
+        ui = installedVUI();
+        progress = createProgressDisplay();
+        EXPECT_FALSE(progress->isCancelled());
+    }
+    EXPECT_EQ(installedVUI(), nullptr);
+    ui->showStatus("anybody there?");
+    ui->requestShow();
+    progress->setRange(5, "hello?");
+    EXPECT_TRUE(progress->isCancelled());
+}
+
+TEST(UiFxProbeScan, LaterInterfaceSurvivesTheWindow)
+{
+    auto first = std::make_unique<HeldScan>();
+    const HeldScan second;
+    const auto installed = installedVUI();
+    first.reset();
+    EXPECT_EQ(installedVUI(), installed);
+}
+
+// Meant for the thread sanitizer above all.
+TEST(UiFxProbeScan, TextAndRangeStayTogetherWhileTheWindowTicks)
+{
+    constexpr int kRounds = 2000;
+    ManualResetEvent seen;
+    UiFxProbe dialog(QString(), [&seen](const QString &) {
+        const auto progress = createProgressDisplay();
+        for (int round = 1; round <= kRounds; ++round) {
+            progress->setRange(round, QString::number(round));
+            progress->setValue(round);
+            requestShow();
+            notifyUI(MessageCode::kEntryAdded);
+        }
+        seen.waitFor(std::chrono::minutes(1));
+    });
+    const auto &label = *dialog.findChild<QLabel *>("label");
+    const auto &bar = *dialog.findChild<QProgressBar *>("progressBar");
+    while (bar.value() != kRounds) {
+        QMetaObject::invokeMethod(&dialog, "OnTimer");
+        if (!label.text().isEmpty()) {
+            ASSERT_EQ(label.text().toInt(), bar.maximum());
+        }
+    }
+    seen.set();
+    EXPECT_TRUE(dialog.isVisible());
+}
