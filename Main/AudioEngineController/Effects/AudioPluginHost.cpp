@@ -74,6 +74,13 @@ std::vector<EffectRecord> AudioPluginHost::effects() const
     return records;
 }
 
+std::optional<EffectRecord> AudioPluginHost::findEffect(const QString &id) const
+{
+    const TAutoLockCS lock(&m_ks);
+    const EffectRecord *listed = m_effects.find(id);
+    return listed ? std::optional<EffectRecord>(*listed) : std::nullopt;
+}
+
 bool AudioPluginHost::isListed(const EffectRecord &record) const
 {
     const TAutoLockCS lock(&m_ks);
@@ -183,7 +190,8 @@ QString AudioPluginHost::freeIdentifier(const EffectRecord &plugin, const QStrin
 
 void AudioPluginHost::completeFailedRecord(EffectRecord &record) const
 {
-    NameFromPath(record);
+    if (record.subId == 0)
+        NameFromPath(record);
     record.id = freeIdentifier(record, record.name);
     record.enabled = true;
     record.working = false;
@@ -191,7 +199,11 @@ void AudioPluginHost::completeFailedRecord(EffectRecord &record) const
 
 QString AudioPluginHost::WriteCrashMarker(const EffectRecord &plugin, const QString &name)
 {
-    const QString marker = markerPath(m_format->marker, m_catalogueFolder, plugin.path, name);
+    QString marker = markerPath(m_format->marker, m_catalogueFolder, plugin.path, name);
+    // A sub-plug-in may bear the name of its shell, whose own marker must stay as it is.
+    if (ActiveMarkers::contains(marker))
+        marker = markerPath(m_format->marker, m_catalogueFolder, plugin.path,
+                            name + QLatin1Char('_') + QString::number(plugin.subId));
     EffectRecord content = plugin;
     content.name = name;
     if (name.isNull())

@@ -9,6 +9,7 @@
 #include <QStringList>
 
 #include <atomic>
+#include <optional>
 #include <set>
 
 /// Base of the per-format hosts. Holds one format's catalogue: what the previous run left (the known list)
@@ -55,10 +56,13 @@ public:
     /// unprotected.
     QString WriteCrashMarker(const EffectRecord &plugin, const QString &name = QString());
 
-    /// Completes the record of a file that failed to load or lists nothing: named after the file, enabled,
-    /// not working, so that it is shown and not probed again until it changes.
+    /// Completes the record of a file, or of a sub-plug-in, that failed to load or lists nothing: named after
+    /// the file (a sub-plug-in keeps its name), enabled, not working, so that it is shown and not probed
+    /// again until it changes.
     void completeFailedRecord(EffectRecord &record) const;
 
+    /// A copy of the effect list's record of that identifier; nothing when there is none.
+    std::optional<EffectRecord> findEffect(const QString &id) const;
     /// A copy of the effect list's records, in the order of their identifiers.
     std::vector<EffectRecord> effects() const;
 

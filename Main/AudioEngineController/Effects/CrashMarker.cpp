@@ -6,6 +6,7 @@
 
 #include <QFile>
 
+#include <algorithm>
 #include <mutex>
 #include <set>
 
@@ -21,7 +22,8 @@ QString usableFileName(QString name)
     for (QChar &character : name)
         if (character < QLatin1Char(' ') || QLatin1String("<>:\"/\\|?*").contains(character))
             character = QLatin1Char('_');
-    return name;
+    // A name that starts with a dot would be hidden, and its marker never found.
+    return name.isEmpty() || name.startsWith(QLatin1Char('.')) ? QLatin1Char('_') + name : name;
 }
 
 QString cutToBytes(QString text, int limit)
@@ -100,6 +102,15 @@ void ActiveMarkers::add(const QString &marker)
     Markers &markers = activeMarkers();
     const std::lock_guard<std::mutex> lock(markers.mutex);
     markers.paths.insert(marker);
+}
+
+bool ActiveMarkers::contains(const QString &marker)
+{
+    Markers &markers = activeMarkers();
+    const std::lock_guard<std::mutex> lock(markers.mutex);
+    return std::any_of(markers.paths.begin(), markers.paths.end(), [&](const QString &path) {
+        return QString::compare(path, marker, Qt::CaseInsensitive) == 0;
+    });
 }
 
 void ActiveMarkers::remove(const QString &marker)

@@ -24,6 +24,8 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker);
 /// The markers of this process that are on disk now. Any thread.
 namespace ActiveMarkers {
 void add(const QString &marker);
+/// True when a marker of that path is on disk; compared without case, as some file systems do.
+bool contains(const QString &marker);
 /// Deletes the marker's file and forgets it.
 void remove(const QString &marker);
 /// When a plug-in is being probed: deletes its markers, so that nobody is blamed, and calls `then` while no

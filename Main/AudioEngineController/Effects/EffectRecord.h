@@ -17,6 +17,7 @@ struct EffectRecord {
     bool working = true;    ///< false: loading or probing it failed or crashed
     bool favourite = false; ///< the user's mark
     qint32 vstCategory = 0; ///< VST 2: the plug-in's own category number
+    qint32 behaviour = 0;   ///< VST 2: handle of `PluginBehaviour`; no file carries it
     qint32 width = 0;       ///< VST 2: channel width
     qint32 latency = 0;     ///< VST 2: samples
     QString subName;        ///< VST 2: name of a shell's sub-plug-in

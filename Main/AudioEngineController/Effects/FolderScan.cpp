@@ -35,7 +35,7 @@ void FolderScan::scan()
     m_knownAtStart = m_host.known().size();
     const QStringList paths = findFiles();
     m_items = arrange(paths);
-    announceItems();
+    collectWaiting();
     if (processItems())
         finish();
     else
@@ -60,10 +60,22 @@ QStringList FolderScan::findFiles() const
     return paths;
 }
 
-void FolderScan::announceItems()
+void FolderScan::showItemProgress()
 {
-    if (m_progress)
-        m_progress->setRange(static_cast<int>(m_items.size()), QString());
+    if (!m_progress)
+        return;
+    m_progress->setRange(static_cast<int>(m_items.size()), QString());
+    m_progress->setValue(m_done);
+}
+
+void FolderScan::keep(const KnownList::Records &records)
+{
+    for (const EffectRecord *record : records)
+        m_host.AddEffect(*record);
+}
+
+void FolderScan::collectWaiting()
+{
     for (const ScanItem &item : m_items)
         for (const EffectRecord &record : item.knownRecords)
             addWaiting(record);
@@ -71,13 +83,14 @@ void FolderScan::announceItems()
 
 bool FolderScan::processItems()
 {
-    int done = 0;
+    showItemProgress();
     for (const ScanItem &item : m_items) {
         if (isCancelled())
             return false;
         processItem(item);
+        ++m_done;
         if (m_progress)
-            m_progress->setValue(++done);
+            m_progress->setValue(m_done);
     }
     return !isCancelled();
 }

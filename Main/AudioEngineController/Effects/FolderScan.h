@@ -43,13 +43,17 @@ protected:
     const ProcessState &processState() const { return m_processState; }
     VProgressDisplay *progress() const { return m_progress.get(); }
     std::size_t itemCount() const { return m_items.size(); }
+    /// Shows the range and value of the files again, after a file used the bar for itself.
+    void showItemProgress();
+    /// Adds what is known of a file to the effect list as it stands.
+    void keep(const KnownList::Records &records);
     /// True when the user, the host or the system asked the scan to stop.
     bool isCancelled() const;
 
 private:
     void scan();
     QStringList findFiles() const;
-    void announceItems();
+    void collectWaiting();
     bool processItems();
     void processItem(const ScanItem &item);
     void finishCancelled();
@@ -66,6 +70,7 @@ private:
     WaitingRecords m_waiting;
     std::set<QString> m_probed; ///< paths
     std::size_t m_knownAtStart = 0;
+    int m_done = 0; ///< items
     bool m_added = false;
     bool m_written = false;
 };

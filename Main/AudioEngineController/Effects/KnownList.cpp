@@ -74,6 +74,16 @@ KnownList::Records KnownList::recordsOfPath(const QString &path) const
     return records;
 }
 
+KnownList::Records KnownList::recordsOfMovedFile(const QString &path) const
+{
+    Records records = recordsOfFileName(path);
+    const auto remains = [&](const EffectRecord *record) {
+        return record->path == path || QFile::exists(record->path);
+    };
+    records.erase(std::remove_if(records.begin(), records.end(), remains), records.end());
+    return records;
+}
+
 bool KnownList::isIdHeldByOther(const QString &id, const EffectRecord &plugin) const
 {
     return std::any_of(m_records.begin(), m_records.end(), [&](const auto &entry) {

@@ -33,6 +33,10 @@ public:
     /// The same for all records of a file name, those of the full path before the others.
     Records recordsOfFileName(const QString &path) const;
 
+    /// The records of files of that name whose own file is gone: what is left of a file that was moved to the
+    /// path.
+    Records recordsOfMovedFile(const QString &path) const;
+
     /// True when a record of another plug-in holds the identifier.
     bool isIdHeldByOther(const QString &id, const EffectRecord &plugin) const;
 

@@ -5,8 +5,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 #include "Main/VLib/SimpleGUI.h"
 
-#include <QFile>
-
 #include <algorithm>
 
 namespace {
@@ -45,15 +43,10 @@ void carryMarks(const std::vector<EffectRecord> &known, EffectRecord &record)
         record.category = source->category;
 }
 
-/// Whether the previous catalogue's records do not speak for the file any more. `known` starts with the one
-/// that decides.
-bool needsProbe(const KnownList::Records &known, const QString &path, const QString &fileTime)
+/// Whether the record that speaks for a file does not fit it any more.
+bool isOutdated(const EffectRecord &first, const QString &fileTime)
 {
-    if (known.empty())
-        return true;
-    const EffectRecord &first = *known.front();
-    const bool isMoved = first.path != path && !QFile::exists(first.path);
-    return isMoved || (first.enabled && first.fileTime != fileTime);
+    return first.enabled && first.fileTime != fileTime;
 }
 
 } // namespace
@@ -78,9 +71,11 @@ void VST3FolderScan::decide(const QString &path, std::vector<ScanItem> &queue)
         keep(own);
         return;
     }
-    const KnownList::Records known = own.empty() ? host().known().recordsOfFileName(path) : own;
+    const KnownList::Records moved = own.empty() ? host().known().recordsOfMovedFile(path) : own;
+    const KnownList::Records known = moved.empty() ? host().known().recordsOfFileName(path) : moved;
     ScanItem item{path, VST3ModuleFile::fileTime(path), true, {}};
-    if (needsProbe(known, path, item.fileTime)) {
+    const bool isMoved = own.empty() && !moved.empty();
+    if (known.empty() || isMoved || isOutdated(*known.front(), item.fileTime)) {
         for (const EffectRecord *record : known)
             item.knownRecords.push_back(*record);
         queue.push_back(std::move(item));
@@ -89,12 +84,6 @@ void VST3FolderScan::decide(const QString &path, std::vector<ScanItem> &queue)
     } else {
         m_keptByName.insert(m_keptByName.end(), known.begin(), known.end());
     }
-}
-
-void VST3FolderScan::keep(const KnownList::Records &records)
-{
-    for (const EffectRecord *record : records)
-        host().AddEffect(*record);
 }
 
 void VST3FolderScan::complete() { keep(m_keptByName); }

@@ -40,7 +40,8 @@ TEST(CrashMarker, FileNames)
         {"/fx/Shell.vst3", QStringLiteral("Q10"), "/e/Q10.scan3"},
         {"/fx/Shell.vst3", QStringLiteral("../A/B: <C>\"|?*\\"), "/e/___A_B_ _C______.scan3"},
         {"/fx/Shell.vst3", QStringLiteral("tab\tnew\nline"), "/e/tab_new_line.scan3"},
-        {"/fx/Shell.vst3", QStringLiteral(""), "/e/.scan3"},
+        {"/fx/Shell.vst3", QStringLiteral(""), "/e/_.scan3"},
+        {"/fx/Shell.vst3", QStringLiteral(".hidden"), "/e/_.hidden.scan3"},
     };
     for (const auto &row : rows)
         EXPECT_EQ(markerPath(vst3(), QStringLiteral("/e"), QString::fromUtf8(row.path), row.name),

@@ -52,7 +52,8 @@ TEST(PluginHost, AScanWritesItsFilesAndSaysSo)
     EXPECT_EQ(application.changes, 1);
     EXPECT_EQ(registry.pluginMetadataFolder(), data.path() + QStringLiteral("/Plugin Metadata"));
     EXPECT_EQ(QDir(data.filePath(QStringLiteral("Effects"))).entryList(QDir::Files),
-              QStringList({QStringLiteral("FXScan.xml"), QStringLiteral("VST3Configuration.xml")}));
+              QStringList({QStringLiteral("FXConfiguration.xml"), QStringLiteral("FXScan.xml"),
+                           QStringLiteral("VST3Configuration.xml")}));
 }
 
 TEST(PluginHost, TheScannerLeavesTheScanListAlone)

@@ -1,0 +1,157 @@
+#include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FileTime.h"
+#include "Main/AudioEngineController/Effects/ProbeBracket.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
+#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Main/VLib/SimpleGUI.h"
+#include "Main/VLib/VProgressDisplay.h"
+
+#include <algorithm>
+
+namespace {
+
+bool hasNoEntryPoint(const QString &path)
+{
+    return findExports(path, {"VSTPluginMain", "main"}) == ExportAnswer::NotExported;
+}
+
+/// Whether the previous catalogue's records do not speak for the file any more.
+bool needsProbe(const KnownList::Records &known, const QString &fileTime)
+{
+    if (known.empty())
+        return true;
+    const EffectRecord &first = *known.front();
+    if (!first.enabled)
+        return first.subId != 0; // all sub-plug-ins of a shell are disabled
+    return first.fileTime != fileTime;
+}
+
+/// The old record of the same plug-in or sub-plug-in, or null.
+const EffectRecord *ownRecord(const ScanItem &item, const EffectRecord &record)
+{
+    const auto own = std::find_if(item.knownRecords.begin(), item.knownRecords.end(),
+                                  [&](const EffectRecord &old) { return old.subId == record.subId; });
+    return own == item.knownRecords.end() ? nullptr : &*own;
+}
+
+/// The marks of the user outlive a new probe: a sub-plug-in takes them from its own old record, else from the
+/// one that speaks for the file.
+void carryMarks(const ScanItem &item, EffectRecord &record)
+{
+    const EffectRecord *source = ownRecord(item, record);
+    if (!source && !item.knownRecords.empty() && item.knownRecords.front().enabled)
+        source = &item.knownRecords.front();
+    if (!source)
+        return;
+    record.category = source->category;
+    record.favourite = source->favourite;
+    record.enabled = !source->isSwitchedOff();
+}
+
+} // namespace
+
+VSTFolderScan::VSTFolderScan(VSTHost &host)
+    : FolderScan(host, VSTModuleFile::ending())
+    , m_vstHost(host)
+{}
+
+std::vector<ScanItem> VSTFolderScan::arrange(const QStringList &paths)
+{
+    const std::set<QString> sorted(paths.begin(), paths.end());
+    std::vector<ScanItem> items;
+    items.reserve(sorted.size());
+    for (const QString &path : sorted) {
+        KnownList::Records known = host().known().recordsOfPath(path);
+        ScanItem item{path, fileTimeText(path), true, {}};
+        item.probe = needsProbe(known, item.fileTime);
+        if (known.empty())
+            known = host().known().recordsOfMovedFile(path);
+        for (const EffectRecord *record : known)
+            item.knownRecords.push_back(*record);
+        items.push_back(std::move(item));
+    }
+    return items;
+}
+
+bool VSTFolderScan::process(const ScanItem &item)
+{
+    if (item.probe)
+        return probe(item);
+    for (const EffectRecord &record : item.knownRecords)
+        host().AddEffect(record);
+    return false;
+}
+
+bool VSTFolderScan::probe(const ScanItem &item)
+{
+    if (hasNoEntryPoint(item.path)) {
+        DebugTrace(L"%ls exports no VST 2 entry point", item.path);
+        return false;
+    }
+    EffectRecord file;
+    file.path = item.path;
+    file.fileTime = item.fileTime;
+    showScanning(fileNameOf(item.path));
+    const ProbeBracket bracket(host(), processState(), file);
+    DebugTrace(L"Probing %ls", item.path);
+    VSTPlugin plugin(m_vstHost); // unloads its module before the bracket deletes the marker
+    bool isPluginModule = true;
+    if (!plugin.load(item.path, VSTHostCallback, isPluginModule)) {
+        DebugLog(L"%ls, Didn't manage it", item.path);
+        return isPluginModule && addFailed(item, file);
+    }
+    plugin.readInto(file);
+    return file.vstCategory == kPlugCategShell ? expandShell(item, plugin, file) : addProbed(item, file);
+}
+
+bool VSTFolderScan::addProbed(const ScanItem &item, EffectRecord record)
+{
+    carryMarks(item, record);
+    const bool added = host().AddEffect(record);
+    if (added)
+        notifyUI(MessageCode::kEntryAdded);
+    return added;
+}
+
+bool VSTFolderScan::addFailed(const ScanItem &item, EffectRecord record)
+{
+    host().completeFailedRecord(record);
+    return addProbed(item, record);
+}
+
+bool VSTFolderScan::expandShell(const ScanItem &item, VSTPlugin &plugin, const EffectRecord &shell)
+{
+    const std::vector<VSTSubPlugin> children = plugin.subPlugins();
+    if (progress())
+        progress()->setRange(static_cast<int>(children.size()), QStringLiteral("Scanning WaveShell"));
+    bool added = false;
+    int done = 0;
+    for (const VSTSubPlugin &sub : children) {
+        EffectRecord child = shell;
+        child.name = child.subName = sub.name;
+        child.subId = sub.id;
+        added |= addChild(item, plugin, child);
+        if (progress())
+            progress()->setValue(++done);
+    }
+    showItemProgress();
+    return children.empty() ? addFailed(item, shell) : added;
+}
+
+bool VSTFolderScan::addChild(const ScanItem &item, VSTPlugin &plugin, const EffectRecord &child)
+{
+    const EffectRecord *old = ownRecord(item, child);
+    if (old && !old->enabled && !old->working && old->fileTime == child.fileTime)
+        return host().AddEffect(
+            *old); // it killed the scanner; another version of the file gets another chance
+    showScanning(child.subName);
+    const ProbeBracket bracket(host(), processState(), child, child.subName);
+    if (!plugin.load(child, VSTHostCallback, 1))
+        return addFailed(item, child);
+    EffectRecord record = child;
+    plugin.readInto(record);
+    return addProbed(item, record);
+}

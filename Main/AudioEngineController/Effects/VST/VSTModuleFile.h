@@ -1,0 +1,13 @@
+#pragma once
+
+#include "Core/BaseLib/BinaryExports.h"
+
+#include <QString>
+
+/// How VST 2 modules lie on disk, which differs from platform to platform.
+namespace VSTModuleFile {
+
+/// The end of the files' names, with its dot.
+QString ending();
+
+} // namespace VSTModuleFile
