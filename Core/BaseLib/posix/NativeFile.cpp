@@ -2,8 +2,10 @@
 
 #include <QFile>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <limits>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -30,5 +32,8 @@ qint64 modifiedNanoseconds(const QString &path)
     struct stat status = {};
     if (stat(QFile::encodeName(path).constData(), &status) != 0)
         return -1;
-    return status.st_mtim.tv_sec * qint64(1000000000) + status.st_mtim.tv_nsec;
+    // 64 bits of nanoseconds end in 2262, file systems later; a time beyond counts as the last one.
+    constexpr qint64 kLastSecond = std::numeric_limits<qint64>::max() / 1000000000 - 1;
+    const qint64 seconds = std::clamp<qint64>(status.st_mtim.tv_sec, -kLastSecond, kLastSecond);
+    return seconds * 1000000000 + status.st_mtim.tv_nsec;
 }
