@@ -50,6 +50,11 @@ QString reasonAgainst(const QFileInfo &folder)
     return QString();
 }
 
+void logUnsearchable(const QString &folder, const QString &reason)
+{
+    DebugLog(L"Cannot search the folder \"%ls\": %ls", folder, reason);
+}
+
 } // namespace
 
 FileFinder::FileFinder(const QString &ending)
@@ -59,7 +64,10 @@ FileFinder::FileFinder(const QString &ending)
 QStringList FileFinder::find(const QString &folder) const
 {
     QStringList found;
-    searchFolder(QDir(folder).absolutePath(), found);
+    if (folder.isEmpty()) // made absolute, it would be the working folder
+        logUnsearchable(folder, QStringLiteral("no folder is given"));
+    else
+        searchFolder(QDir(folder).absolutePath(), found);
     return found;
 }
 
@@ -71,7 +79,7 @@ void FileFinder::searchFolder(const QString &folder, QStringList &found) const
     if (entries.empty()) {
         const QString reason = reasonAgainst(QFileInfo(folder));
         if (!reason.isEmpty())
-            DebugLog(L"Cannot search the folder %ls: %ls", folder, reason);
+            logUnsearchable(folder, reason);
         return;
     }
     const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');

@@ -16,8 +16,8 @@ public:
 
     /// The full paths found, "/" as separator: those of a folder in the order of their names, followed by
     /// what lies in its sub-folders. A folder that matches is listed and searched. Hidden entries are passed
-    /// over and linked folders are not entered, so the search cannot loop. A folder that cannot be read gives
-    /// one log line.
+    /// over and linked folders are not entered, so the search cannot loop. Names that are no valid text
+    /// are passed over. A folder that cannot be read, or an empty path, gives one log line.
     QStringList find(const QString &folder) const;
 
 private:
