@@ -60,8 +60,10 @@ bool XMLDocument::parse(const QByteArray &xml)
     const pugi::xml_parse_result result =
         m_document->load_buffer(xml.constData(), static_cast<std::size_t>(xml.size()), kParseOptions);
     m_error.clear();
-    if (!result)
+    if (!result) {
+        m_document->reset();
         m_error = formatText(L"%s at byte %lld", result.description(), static_cast<long long>(result.offset));
+    }
     return m_error.isEmpty();
 }
 

@@ -45,7 +45,8 @@ public:
     XMLDocument(const XMLDocument &) = delete;
     XMLDocument &operator=(const XMLDocument &) = delete;
 
-    /// Reads and parses a file. False when it cannot be read or is not well-formed; `error` then says why.
+    /// Reads and parses a file. False when it cannot be read or is not well-formed; `error` then says why
+    /// and the document is empty.
     bool load(const QString &path);
     /// Parses a text held in memory.
     bool parse(const QByteArray &xml);
