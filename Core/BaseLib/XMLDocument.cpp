@@ -4,6 +4,7 @@
 #include "Core/BaseLib/TextFile.h"
 
 #include <charconv>
+#include <cmath>
 #include <cstdlib>
 
 #include <pugixml.hpp>
@@ -83,5 +84,6 @@ double parseDecimal(const QString &text)
     const QByteArray digits = text.trimmed().toUtf8();
     double value = 0.0;
     std::from_chars(digits.constData(), digits.constData() + digits.size(), value);
-    return value;
+    // "nan" and "inf" parse too, and as a file version would pass or fail every comparison.
+    return std::isfinite(value) ? value : 0.0;
 }
