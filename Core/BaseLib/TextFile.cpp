@@ -33,6 +33,9 @@ FileResult replaceFile(const QString &path, const QByteArray &content, Durabilit
     const bool exists = existing.exists();
     // A file reached through a link is replaced where it lies; the link stays.
     const QString target = exists ? existing.canonicalFilePath() : path;
+    // A device or a pipe is written to; renaming a file over it would take it away.
+    if (exists && !existing.isFile())
+        return writeDirectly(target, content, durability);
     if (exists) {
         QFile probe(target);
         if (!probe.open(QIODevice::WriteOnly | QIODevice::Append))

@@ -21,7 +21,8 @@ struct FileResult {
 
 /// Replaces a file as a whole, so that a reader sees the old content or the new and a crash leaves one of
 /// them: writes a temporary file in the same folder and renames it. Where no temporary file can be made
-/// there, the file is written directly. A file that exists but is not writable is left alone and reported.
+/// there, or the path leads to a device, it is written directly. A file that exists but is not writable is
+/// left alone and reported.
 FileResult replaceFile(const QString &path, const QByteArray &content, Durability durability);
 
 /// Reads a whole file into `content`.
