@@ -73,6 +73,8 @@ void debugLogMessage(const QString &message) noexcept
     try {
         deliver(message);
     } catch (...) {
-        qDebug(" Caught an exception");
+        reportLogException();
     }
 }
+
+void reportLogException() noexcept { qDebug(" Caught an exception"); }

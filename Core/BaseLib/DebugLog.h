@@ -33,18 +33,25 @@ void configureLogFromEnvironment();
 
 /// Logs one finished message. Any thread; never throws.
 void debugLogMessage(const QString &message) noexcept;
+/// Tells Qt's debug channel that logging a line threw.
+void reportLogException() noexcept;
 
 /// Logs one line, printf-style. Any thread; never throws.
 template <typename... Arguments>
-void DebugLog(const wchar_t *format, const Arguments &...arguments)
+void DebugLog(const wchar_t *format, const Arguments &...arguments) noexcept
 {
-    if (!debugLogSettings().off)
+    if (debugLogSettings().off)
+        return;
+    try {
         debugLogMessage(formatText(format, arguments...));
+    } catch (...) {
+        reportLogException();
+    }
 }
 
 /// The same for the lines that describe each single call; formats nothing while the trace switch is off.
 template <typename... Arguments>
-void DebugTrace(const wchar_t *format, const Arguments &...arguments)
+void DebugTrace(const wchar_t *format, const Arguments &...arguments) noexcept
 {
     if (debugLogSettings().trace)
         DebugLog(format, arguments...);
