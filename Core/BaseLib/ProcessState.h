@@ -3,8 +3,8 @@
 #include <memory>
 
 /// What a plug-in may change for the whole process and later code relies on: signal handlers and mask, a
-/// pending alarm, locale, file creation mask, working directory and the calling thread's floating-point
-/// environment. Taken once, put back after each plug-in, on the same thread.
+/// pending alarm, locale (C and C++), file creation mask, working directory and the calling thread's
+/// floating-point environment. Taken once, put back after each plug-in, on the same thread.
 class ProcessState {
 public:
     ProcessState();

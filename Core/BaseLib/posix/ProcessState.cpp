@@ -8,6 +8,7 @@
 #include <clocale>
 #include <csignal>
 #include <cstring>
+#include <locale>
 #include <string>
 
 #include <fcntl.h>
@@ -40,6 +41,7 @@ struct ProcessState::Snapshot {
     std::array<SignalAction, NSIG> actions;
     sigset_t signalMask = {};
     std::string locale;
+    std::locale streamLocale; ///< constructed as the global one
     mode_t fileMask = 0;
     int workingFolder = -1;
     std::fenv_t floatingPoint = {};
@@ -77,6 +79,8 @@ void ProcessState::restore() const
     }
     pthread_sigmask(SIG_SETMASK, &m_snapshot->signalMask, nullptr);
     uselocale(LC_GLOBAL_LOCALE);
+    if (std::locale() != m_snapshot->streamLocale)
+        std::locale::global(m_snapshot->streamLocale);
     if (m_snapshot->locale != std::setlocale(LC_ALL, nullptr))
         std::setlocale(LC_ALL, m_snapshot->locale.c_str());
     umask(m_snapshot->fileMask);
