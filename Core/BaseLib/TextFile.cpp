@@ -9,7 +9,14 @@ namespace {
 
 FileResult writeAll(QFile &file, const QByteArray &content, Durability durability)
 {
-    if (file.write(content) != content.size() || !file.flush())
+    // A disk that fills up takes a part first; only the next attempt says why.
+    for (qint64 written = 0; written < content.size();) {
+        const qint64 taken = file.write(content.constData() + written, content.size() - written);
+        if (taken <= 0)
+            return {file.errorString()};
+        written += taken;
+    }
+    if (!file.flush())
         return {file.errorString()};
     if (durability == Durability::Synced)
         syncToDisk(file.handle());
