@@ -2,7 +2,23 @@
 
 #include <QFile>
 
+#include <cerrno>
+#include <cstring>
+
 #include <dlfcn.h>
+
+namespace {
+
+/// The loader passes over a library for another processor as if it were not there, and then says so.
+QString withTheFilesPresence(const QString &loaderText, const QString &path)
+{
+    const QString missing = QString::fromLocal8Bit(std::strerror(ENOENT));
+    if (loaderText.startsWith(path) && loaderText.endsWith(missing) && QFile::exists(path))
+        return loaderText + QStringLiteral(" (the file is there, perhaps built for another machine)");
+    return loaderText;
+}
+
+} // namespace
 
 void *PluginLibrary::loadUncached(const QString &path)
 {
@@ -14,7 +30,7 @@ void *PluginLibrary::loadUncached(const QString &path)
     // is a reason.
     void *handle = dlopen(QFile::encodeName(path).constData(), RTLD_NOW | RTLD_LOCAL);
     if (!handle)
-        m_errorText = QString::fromLocal8Bit(dlerror());
+        m_errorText = withTheFilesPresence(QString::fromLocal8Bit(dlerror()), path);
     return handle;
 }
 
