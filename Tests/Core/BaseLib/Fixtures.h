@@ -1,0 +1,86 @@
+#pragma once
+
+#include "Core/BaseLib/TextFile.h"
+
+#include <QDir>
+#include <QTemporaryDir>
+
+#include <clocale>
+#include <string>
+
+inline QString operator""_q(const char *utf8, std::size_t length)
+{
+    return QString::fromUtf8(utf8, static_cast<int>(length));
+}
+
+/// A folder of a test's own, gone when the test ends.
+class TestFolder {
+public:
+    QString path(const QString &name = QString()) const { return m_folder.filePath(name); }
+    QByteArray nativePath(const QByteArray &name) const { return QFile::encodeName(path()) + '/' + name; }
+
+    /// Writes a file, and the folders it lies in; gives its path.
+    QString write(const QString &name, const QByteArray &content = QByteArray()) const
+    {
+        QDir().mkpath(QFileInfo(path(name)).path());
+        QFile file(path(name));
+        if (!file.open(QIODevice::WriteOnly) || file.write(content) != content.size())
+            qFatal("cannot write a test's file");
+        return path(name);
+    }
+
+    /// Everything that lies directly in the folder, by name.
+    QStringList names() const
+    {
+        return QDir(path()).entryList(QDir::AllEntries | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot);
+    }
+
+private:
+    QTemporaryDir m_folder;
+};
+
+inline QByteArray contentOf(const QString &path)
+{
+    QByteArray content;
+    const FileResult read = readWholeFile(path, content);
+    return read ? content : QByteArray("unreadable: ") + read.reason.toUtf8();
+}
+
+/// Collects what goes to Qt's debug channel while it lives.
+class QtMessages {
+public:
+    QtMessages()
+        : m_previous(qInstallMessageHandler(
+              [](QtMsgType, const QMessageLogContext &, const QString &line) { s_lines.append(line); }))
+    {
+        s_lines.clear();
+    }
+    ~QtMessages() { qInstallMessageHandler(m_previous); }
+    Q_DISABLE_COPY(QtMessages)
+
+    const QStringList &lines() const { return s_lines; }
+
+private:
+    inline static QStringList s_lines;
+    QtMessageHandler m_previous;
+};
+
+/// The locales that text and numbers have to survive: plain bytes, UTF-8, and one with a decimal comma.
+inline constexpr const char *kLocales[] = {"C", "C.UTF-8", "de_DE.UTF-8"};
+
+/// Sets the C locale for a scope, where the machine has it.
+class LocaleScope {
+public:
+    explicit LocaleScope(const char *name)
+        : m_previous(std::setlocale(LC_ALL, nullptr))
+        , m_isSet(std::setlocale(LC_ALL, name) != nullptr)
+    {}
+    ~LocaleScope() { std::setlocale(LC_ALL, m_previous.c_str()); }
+    Q_DISABLE_COPY(LocaleScope)
+
+    bool isSet() const { return m_isSet; }
+
+private:
+    std::string m_previous;
+    bool m_isSet;
+};

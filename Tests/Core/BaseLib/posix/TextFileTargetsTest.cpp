@@ -1,0 +1,100 @@
+#include "Core/BaseLib/TextFile.h"
+
+#include "Tests/Core/BaseLib/Fixtures.h"
+#include "Tests/Core/BaseLib/posix/OrdinaryUser.h"
+
+#include <csignal>
+#include <cstring>
+
+#include <sys/resource.h>
+#include <sys/stat.h>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+QString reasonOf(int error) { return QString::fromLocal8Bit(std::strerror(error)); }
+
+mode_t modeOf(const QByteArray &path)
+{
+    struct stat status = {};
+    return stat(path.constData(), &status) == 0 ? status.st_mode : 0;
+}
+
+} // namespace
+
+TEST(ReplaceFile, LinksPermissionsAndReadersStay)
+{
+    for (const mode_t mode : {0600U, 0640U, 0666U, 0755U}) {
+        const TestFolder here;
+        const TestFolder there;
+        QFile reader(there.write("a.xml"_q, "old"));
+        const QString link = here.path("link.xml"_q);
+        chmod(there.nativePath("a.xml").constData(), mode);
+        ASSERT_TRUE(QFile::link(reader.fileName(), link) && reader.open(QIODevice::ReadOnly));
+        EXPECT_TRUE(replaceFile(link, "new", Durability::Buffered));
+        EXPECT_EQ(QFile::symLinkTarget(link), reader.fileName());
+        EXPECT_EQ(contentOf(reader.fileName()), "new");
+        EXPECT_EQ(modeOf(there.nativePath("a.xml")) & 07777U, mode);
+        EXPECT_EQ(reader.readAll(), "old") << "who has it open sees the old content whole";
+        EXPECT_EQ(here.names() + there.names(), QStringList({"link.xml"_q, "a.xml"_q}));
+    }
+}
+
+TEST(ReplaceFile, AFullDeviceIsReportedAndStaysADevice)
+{
+    const TestFolder folder;
+    const QString link = folder.path("full.xml"_q);
+    ASSERT_TRUE(QFile::link("/dev/full"_q, link));
+    chmod(folder.nativePath("").constData(), 0755);
+    // Not as root: a fault here must not cost this machine its device.
+    EXPECT_TRUE(trueForOrdinaryUser(
+        [&link] { return replaceFile(link, "new", Durability::Buffered).reason == reasonOf(ENOSPC); }));
+    const QByteArray ownDevice = folder.nativePath("null");
+    if (mknod(ownDevice.constData(), S_IFCHR | 0666, 0x103) != 0)
+        GTEST_SKIP() << "only root can make a device of its own";
+    replaceFile(folder.path("null"_q), "new", Durability::Buffered);
+    EXPECT_TRUE(S_ISCHR(modeOf(ownDevice)));
+}
+
+TEST(ReplaceFile, AFailedWriteKeepsTheOldContentAndLeavesNoTemporary)
+{
+    const TestFolder folder;
+    const QString path = folder.write("a.xml"_q, "old");
+    rlimit before = {};
+    getrlimit(RLIMIT_FSIZE, &before);
+    const rlimit small = {1 << 20, before.rlim_max};
+    const auto handler = std::signal(SIGXFSZ, SIG_IGN);
+    setrlimit(RLIMIT_FSIZE, &small);
+    const FileResult result = replaceFile(path, QByteArray(2 << 20, 'x'), Durability::Buffered);
+    setrlimit(RLIMIT_FSIZE, &before);
+    std::signal(SIGXFSZ, handler);
+    EXPECT_EQ(result.reason, reasonOf(EFBIG));
+    EXPECT_EQ(contentOf(path), "old");
+    EXPECT_EQ(folder.names(), QStringList("a.xml"_q));
+}
+
+TEST(ReplaceFile, ObeysPermissions)
+{
+    const struct {
+        const char *name;
+        mode_t folder;
+        mode_t file;
+        bool replaced;
+    } rows[] = {
+        {"a folder that takes no temporary file", 0555, 0666, true},
+        {"a file that is not to be written, in an open folder", 0777, 0444, false},
+    };
+    for (const auto &row : rows) {
+        const TestFolder folder;
+        const QString path = folder.write("a.xml"_q, "long old content");
+        chmod(folder.nativePath("a.xml").constData(), row.file);
+        chmod(folder.nativePath("").constData(), row.folder);
+        EXPECT_TRUE(trueForOrdinaryUser([&] {
+            return bool(replaceFile(path, "new", Durability::Buffered)) == row.replaced;
+        })) << row.name;
+        chmod(folder.nativePath("").constData(), 0755);
+        EXPECT_EQ(contentOf(path), row.replaced ? "new" : "long old content") << row.name;
+        EXPECT_EQ(folder.names(), QStringList("a.xml"_q)) << row.name;
+    }
+}
