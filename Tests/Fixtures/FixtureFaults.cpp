@@ -102,7 +102,7 @@ const struct SideEffect {
 } kSideEffects[] = {{"locale", true, changeLocale},         {"umask", true, changeFileMask},
                     {"chdir", true, changeWorkingFolder},   {"rounding", true, changeRounding},
                     {"signal", true, installSignalHandler}, {"alarm", true, startAlarm},
-                    {"thread", false, leaveThreadRunning}};
+                    {"repair", true, repairOwnViolation},   {"thread", false, leaveThreadRunning}};
 
 const SideEffect *findSideEffect(const std::string &kind)
 {

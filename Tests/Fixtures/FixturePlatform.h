@@ -27,5 +27,9 @@ bool changeFileMask(const std::string &octal);
 bool changeWorkingFolder(const std::string &path);
 /// Installs a handler that does nothing, for "segv", "fpe", "ill", "abrt", "term", "int" or "alrm".
 bool installSignalHandler(const std::string &signalName);
+/// Touches memory that is not there and repairs that in a handler of its own, as copy protection does. "keep"
+/// leaves the handler behind, which ends the process at any other violation; "restore" puts the one before
+/// back.
+bool repairOwnViolation(const std::string &afterwards);
 /// Lets an alarm signal arrive after so many seconds.
 bool startAlarm(const std::string &seconds);

@@ -148,3 +148,9 @@ std::int32_t parseNumber(const std::string &text)
         throw ScriptError("'" + text + "' is no 32-bit number");
     return static_cast<std::int32_t>(static_cast<std::uint32_t>(value));
 }
+
+std::string baseName(const std::string &path)
+{
+    const std::string name = path.substr(path.find_last_of("/\\") + 1);
+    return name.substr(0, name.rfind('.'));
+}

@@ -36,3 +36,6 @@ std::vector<ScriptStatement> parseScript(const std::string &script);
 
 /// A text as a 32-bit number as ScriptStatement::number reads it; throws ScriptError.
 std::int32_t parseNumber(const std::string &text);
+
+/// The file name of a path without its ending: what a plug-in without a script is called.
+std::string baseName(const std::string &path);

@@ -29,10 +29,10 @@ bool FixtureStages::take(const ScriptStatement &statement)
     return true;
 }
 
-void FixtureStages::reach(const std::string &stage, const std::string &subject,
+void FixtureStages::reach(const std::string &stage, const FixtureSubject &subject,
                           const std::string &detail) const
 {
-    m_trace.write(stage, subject, detail);
+    m_trace.write(stage, subject.name, detail);
     for (const Kind kind : {Kind::SideEffect, Kind::Delay, Kind::Fault}) {
         for (const Order &order : m_orders) {
             if (order.kind == kind && order.concerns(stage, subject))
@@ -41,13 +41,13 @@ void FixtureStages::reach(const std::string &stage, const std::string &subject,
     }
 }
 
-void FixtureStages::note(const std::string &stage, const std::string &subject,
+void FixtureStages::note(const std::string &stage, const FixtureSubject &subject,
                          const std::string &detail) const
 {
-    m_trace.write(stage, subject, detail);
+    m_trace.write(stage, subject.name, detail);
 }
 
-const std::string *FixtureStages::answer(const std::string &stage, const std::string &subject) const
+const std::string *FixtureStages::answer(const std::string &stage, const FixtureSubject &subject) const
 {
     for (const Order &order : m_orders) {
         if (order.kind == Kind::Answer && order.concerns(stage, subject))
@@ -56,17 +56,24 @@ const std::string *FixtureStages::answer(const std::string &stage, const std::st
     return nullptr;
 }
 
-bool FixtureStages::Order::concerns(const std::string &atStage, const std::string &atSubject) const
+bool FixtureStages::Order::concerns(const std::string &atStage, const FixtureSubject &atSubject) const
 {
-    return stage == atStage && (subject.empty() || subject == atSubject);
+    return stage == atStage && subject.admits(atSubject);
+}
+
+bool FixtureStages::knows(const std::string &stage) const { return findStage(stage) != nullptr; }
+
+const FixtureStage *FixtureStages::findStage(const std::string &name) const
+{
+    const auto stage = std::find_if(m_known.begin(), m_known.end(),
+                                    [&name](const FixtureStage &entry) { return entry.name == name; });
+    return stage == m_known.end() ? nullptr : &*stage;
 }
 
 void FixtureStages::checkStage(const ScriptStatement &statement, Kind kind) const
 {
-    const auto stage = std::find_if(m_known.begin(), m_known.end(), [&statement](const FixtureStage &entry) {
-        return entry.name == statement.word(0);
-    });
-    if (stage == m_known.end())
+    const FixtureStage *stage = findStage(statement.word(0));
+    if (!stage)
         statement.fail("no stage '" + statement.word(0) + "'");
     if (kind == Kind::Answer && !stage->takesAnswer)
         statement.fail("stage '" + stage->name + "' takes no answer");
@@ -88,7 +95,7 @@ FixtureStages::Order FixtureStages::readOrder(const ScriptStatement &statement, 
         order.value = statement.word(read++);
     if (kind == Kind::Delay)
         order.milliseconds = statement.number(1);
-    order.subject = statement.optionalWord(read++);
+    order.subject = FixtureSubjectFilter(statement.optionalWord(read++));
     statement.allowWords(read);
     return order;
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Tests/Fixtures/FixtureScript.h"
+#include "Tests/Fixtures/FixtureSubject.h"
 #include "Tests/Fixtures/FixtureTrace.h"
 
 #include <string>
@@ -23,27 +24,31 @@ public:
     bool take(const ScriptStatement &statement);
 
     /// Tells that the module is called: writes the trace line, then causes the side effects, the delays and
-    /// the fault that the script has for this stage and subject (the name of a class or sub-plug-in).
-    void reach(const std::string &stage, const std::string &subject = {},
+    /// the fault that the script has for this stage and subject.
+    void reach(const std::string &stage, const FixtureSubject &subject = {},
                const std::string &detail = {}) const;
     /// Writes a trace line only.
-    void note(const std::string &stage, const std::string &subject, const std::string &detail) const;
+    void note(const std::string &stage, const FixtureSubject &subject, const std::string &detail) const;
     /// The scripted answer for a stage and subject, or null.
-    const std::string *answer(const std::string &stage, const std::string &subject = {}) const;
+    const std::string *answer(const std::string &stage, const FixtureSubject &subject = {}) const;
+    /// Whether the format has this stage.
+    bool knows(const std::string &stage) const;
 
 private:
     enum class Kind { SideEffect, Delay, Fault, Answer };
     struct Order {
         Kind kind = Kind::Fault;
         std::string stage;
-        std::string subject; ///< empty: every one
-        std::string what;    ///< the kind of fault or side effect, or the answer
-        std::string value;   ///< of a side effect
+        FixtureSubjectFilter subject;
+        std::string what;  ///< the kind of fault or side effect, or the answer
+        std::string value; ///< of a side effect
         int milliseconds = 0;
 
-        bool concerns(const std::string &atStage, const std::string &atSubject) const;
+        bool concerns(const std::string &atStage, const FixtureSubject &atSubject) const;
     };
 
+    /// The stage of a name, or null.
+    const FixtureStage *findStage(const std::string &name) const;
     void checkStage(const ScriptStatement &statement, Kind kind) const;
     Order readOrder(const ScriptStatement &statement, Kind kind) const;
     void takeTrace(const ScriptStatement &statement);

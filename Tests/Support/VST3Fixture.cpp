@@ -1,10 +1,8 @@
 #include "Tests/Support/VST3Fixture.h"
 
-#include <QDir>
-#include <QFile>
-#include <QFileInfo>
+#include "Tests/Support/FixtureFile.h"
 
-#include <gtest/gtest.h>
+#include <QFileInfo>
 
 namespace {
 
@@ -15,21 +13,6 @@ const char kBundleEnding[] = ".vst3";
 const char kBundleFolder[] = "x86_64-linux";
 const char kBundleEnding[] = ".so";
 #endif
-
-/// Replaces what is at the path, so that a test can also update a plug-in.
-void putModule(const QString &path, const QByteArray &script, VST3Fixture fixture)
-{
-    const QString source = vst3FixturePath(fixture);
-    QFile scriptFile(path + QStringLiteral(".script"));
-    QDir().mkpath(QFileInfo(path).path());
-    QFile::remove(path);
-    scriptFile.remove();
-    EXPECT_TRUE(QFile::copy(source, path)) << qPrintable(source) << " to " << qPrintable(path);
-    if (script.isNull())
-        return;
-    const bool written = scriptFile.open(QIODevice::WriteOnly) && scriptFile.write(script) == script.size();
-    EXPECT_TRUE(written) << qPrintable(scriptFile.errorString());
-}
 
 QString modulePathIn(const QString &folder, const QString &name)
 {
@@ -54,7 +37,7 @@ QString vst3FixturePath(VST3Fixture fixture)
 QString addVST3File(const QString &folder, const QString &name, const QByteArray &script, VST3Fixture fixture)
 {
     const QString path = modulePathIn(folder, name);
-    putModule(path, script, fixture);
+    putFixture(vst3FixturePath(fixture), path, script);
     return path;
 }
 
@@ -62,7 +45,7 @@ QString addVST3Bundle(const QString &folder, const QString &name, const QByteArr
                       VST3Fixture fixture)
 {
     const QString bundle = modulePathIn(folder, name);
-    putModule(vst3BundleBinary(bundle), script, fixture);
+    putFixture(vst3FixturePath(fixture), vst3BundleBinary(bundle), script);
     return bundle;
 }
 

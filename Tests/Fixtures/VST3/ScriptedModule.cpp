@@ -32,13 +32,6 @@ std::vector<FixtureStage> stagesOfVST3()
             {"static-destructor"}};
 }
 
-/// The file name of a path without its ending.
-std::string baseName(const std::string &path)
-{
-    const std::string name = path.substr(path.find_last_of("/\\") + 1);
-    return name.substr(0, name.rfind('.'));
-}
-
 bool takeFactoryStatement(ScriptedModule &module, const ScriptStatement &statement)
 {
     if (statement.key == "generation") {

@@ -10,6 +10,7 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <pthread.h>
+#include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -22,6 +23,19 @@ const struct {
                 {"term", SIGTERM}, {"int", SIGINT}, {"alrm", SIGALRM}};
 
 void ignoreSignal(int) {}
+
+char *volatile repairedPage = nullptr;
+const std::size_t kPageSize = 4096;
+
+/// Makes the page writable. At another address the default action is due: it comes when the instruction runs
+/// again.
+void repairPage(int, siginfo_t *information, void *)
+{
+    if (information->si_addr == repairedPage)
+        mprotect(repairedPage, kPageSize, PROT_READ | PROT_WRITE);
+    else
+        std::signal(SIGSEGV, SIG_DFL);
+}
 
 } // namespace
 
@@ -77,6 +91,23 @@ bool installSignalHandler(const std::string &signalName)
             return std::signal(entry.number, ignoreSignal) != SIG_ERR;
     }
     return false;
+}
+
+bool repairOwnViolation(const std::string &afterwards)
+{
+    void *page = mmap(nullptr, kPageSize, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    if (page == MAP_FAILED || (afterwards != "keep" && afterwards != "restore"))
+        return false;
+    struct sigaction own = {};
+    struct sigaction previous = {};
+    own.sa_sigaction = repairPage;
+    own.sa_flags = SA_SIGINFO;
+    repairedPage = static_cast<char *>(page);
+    sigaction(SIGSEGV, &own, &previous);
+    *static_cast<volatile char *>(page) = 1;
+    if (afterwards == "restore")
+        sigaction(SIGSEGV, &previous, nullptr);
+    return munmap(page, kPageSize) == 0;
 }
 
 bool startAlarm(const std::string &seconds)

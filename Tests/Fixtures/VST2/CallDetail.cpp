@@ -1,0 +1,51 @@
+#include "Tests/Fixtures/VST2/CallDetail.h"
+
+#include <algorithm>
+#include <charconv>
+
+namespace {
+
+/// The most bytes of a chunk that a trace shows.
+const VstIntPtr kShownBytes = 64;
+
+/// "TYPE(SPEAKERS…)".
+std::string arrangementText(const void *pointer)
+{
+    const auto *arrangement = static_cast<const VstSpeakerArrangement *>(pointer);
+    if (!arrangement)
+        return "null";
+    std::string speakers;
+    for (int index = 0; index < arrangement->numChannels; ++index)
+        speakers += (index ? " " : "") + std::to_string(arrangement->speakers[index].type);
+    return std::to_string(arrangement->type) + "(" + speakers + ")";
+}
+
+} // namespace
+
+bool needsPointer(int opcode)
+{
+    const int opcodes[] = {effGetParamName,      effGetChunk,        effSetChunk,
+                           effGetEffectName,     effGetVendorString, VstPublished::effGetParameterProperties,
+                           effShellGetNextPlugin};
+    return std::find(std::begin(opcodes), std::end(opcodes), opcode) != std::end(opcodes);
+}
+
+std::string callDetail(int opcode, int index, VstIntPtr value, const void *pointer)
+{
+    if (opcode == effSetSpeakerArrangement)
+        return arrangementText(reinterpret_cast<const void *>(value)) + " -> " + arrangementText(pointer);
+    if (index == 0 && value == 0)
+        return {};
+    std::string detail = std::to_string(index) + " " + std::to_string(value);
+    if (opcode == effSetChunk)
+        detail.append(" ").append(static_cast<const char *>(pointer),
+                                  static_cast<std::size_t>(std::clamp<VstIntPtr>(value, 0, kShownBytes)));
+    return detail;
+}
+
+std::string floatText(float value)
+{
+    char text[64] = {};
+    const auto result = std::to_chars(text, text + sizeof text, value);
+    return std::string(text, result.ptr);
+}
