@@ -13,7 +13,7 @@ struct ElfTables {
     ByteView symbols;       ///< up to the end of its segment: its own length is written nowhere
     ByteView strings;       ///< the symbols' names
     ByteView hash;          ///< the look-up table, up to the end of its segment
-    bool isGnuHash = false; ///< which of the two forms it has; of a library with both, the loader takes this
+    bool isGnuHash = false; ///< the form of DT_GNU_HASH, which the loader prefers, or of DT_HASH
 };
 
 /// Finds the tables of an x86-64 shared library, by the program headers and the dynamic section as the loader
