@@ -9,7 +9,7 @@ void prepareProcess();
 /// read with a point again, for us and for plug-ins.
 void settleLocale();
 
-/// Ends the process at once: what is written is flushed, but no exit handler and no static destructor runs.
+/// Ends the process at once, from any thread: no exit handler and no static destructor runs.
 /// Modules that stayed mapped belong to strangers, and a crash in their exit handlers would look like a
 /// failed scan.
 [[noreturn]] void leaveProcess(int exitCode);

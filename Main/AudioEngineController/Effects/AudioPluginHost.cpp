@@ -204,6 +204,8 @@ QString AudioPluginHost::WriteCrashMarker(const EffectRecord &plugin, const QStr
     if (ActiveMarkers::contains(marker))
         marker = markerPath(m_format->marker, m_catalogueFolder, plugin.path,
                             name + QLatin1Char('_') + QString::number(plugin.subId));
+    // Registered first: whoever abandons the markers must find this one whenever it is on disk.
+    ActiveMarkers::add(marker);
     EffectRecord content = plugin;
     content.name = name;
     if (name.isNull())

@@ -47,6 +47,8 @@ protected:
     void showItemProgress();
     /// Adds what is known of a file to the effect list as it stands.
     void keep(const KnownList::Records &records);
+    /// Has interim writes carry a known record that this run has not settled yet.
+    void addWaiting(const EffectRecord &record);
     /// True when the user, the host or the system asked the scan to stop.
     bool isCancelled() const;
 
@@ -59,7 +61,6 @@ private:
     void finishCancelled();
     void finish();
     void write(Durability durability);
-    void addWaiting(const EffectRecord &record);
     void removeWaiting(const ScanItem &item);
 
     AudioPluginHost &m_host;

@@ -8,9 +8,7 @@ ProbeBracket::ProbeBracket(AudioPluginHost &host, const ProcessState &state, con
                            const QString &name)
     : m_state(state)
     , m_marker(host.WriteCrashMarker(plugin, name))
-{
-    ActiveMarkers::add(m_marker);
-}
+{}
 
 ProbeBracket::~ProbeBracket()
 {

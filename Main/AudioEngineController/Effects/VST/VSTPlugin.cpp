@@ -128,6 +128,7 @@ AEffect *VSTPlugin::enter(void *entryPoint, VSTHostCallbackFunction callback)
 
 bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
 {
+    m_faulted |= m_effect.hasFaulted();
     m_effect = effect;
     const auto isSame = [&](const VSTEffect &other) { return other.isSame(effect); };
     if (std::none_of(m_handedOut.begin(), m_handedOut.end(), isSame))

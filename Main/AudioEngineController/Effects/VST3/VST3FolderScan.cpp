@@ -82,8 +82,15 @@ void VST3FolderScan::decide(const QString &path, std::vector<ScanItem> &queue)
     } else if (!own.empty()) {
         keep(own);
     } else {
-        m_keptByName.insert(m_keptByName.end(), known.begin(), known.end());
+        keepLater(known);
     }
+}
+
+void VST3FolderScan::keepLater(const KnownList::Records &records)
+{
+    m_keptByName.insert(m_keptByName.end(), records.begin(), records.end());
+    for (const EffectRecord *record : records)
+        addWaiting(*record);
 }
 
 void VST3FolderScan::complete() { keep(m_keptByName); }

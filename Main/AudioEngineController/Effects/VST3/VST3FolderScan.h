@@ -15,6 +15,7 @@ protected:
 
 private:
     void decide(const QString &path, std::vector<ScanItem> &queue);
+    void keepLater(const KnownList::Records &records);
     bool addRecords(const ScanItem &item, const EffectRecord &file, ClassListing &records);
     bool addFailedRecord(const ScanItem &item, EffectRecord record);
 
