@@ -5,6 +5,7 @@
 #include <cfenv>
 #include <clocale>
 #include <cstdint>
+#include <cstdio>
 #include <cstdlib>
 #include <exception>
 #include <stdexcept>
@@ -95,14 +96,30 @@ bool leaveThreadRunning(const std::string &)
     return true;
 }
 
+bool printMuch(const std::string &kibibytes)
+{
+    const int count = std::atoi(kibibytes.c_str());
+    const std::string text = std::string(1023, '.') + '\n';
+    for (int i = 0; i < count; ++i)
+        for (std::FILE *stream : {stdout, stderr})
+            std::fputs(text.c_str(), stream);
+    std::fflush(stdout);
+    return count > 0;
+}
+
 const struct SideEffect {
     const char *kind;
     bool takesValue;
     bool (*cause)(const std::string &value);
-} kSideEffects[] = {{"locale", true, changeLocale},         {"umask", true, changeFileMask},
-                    {"chdir", true, changeWorkingFolder},   {"rounding", true, changeRounding},
-                    {"signal", true, installSignalHandler}, {"alarm", true, startAlarm},
-                    {"repair", true, repairOwnViolation},   {"thread", false, leaveThreadRunning}};
+} kSideEffects[] = {{"locale", true, changeLocale},
+                    {"umask", true, changeFileMask},
+                    {"chdir", true, changeWorkingFolder},
+                    {"rounding", true, changeRounding},
+                    {"signal", true, installSignalHandler},
+                    {"alarm", true, startAlarm},
+                    {"repair", true, repairOwnViolation},
+                    {"print", true, printMuch},
+                    {"thread", false, leaveThreadRunning}};
 
 const SideEffect *findSideEffect(const std::string &kind)
 {

@@ -41,6 +41,8 @@ public:
     /// The scan list of the folder, unless set.
     void setArguments(const QStringList &arguments) { m_arguments = arguments; }
     void setEnvironment(const QString &name, const QString &value) { m_environment.insert(name, value); }
+    void removeEnvironment(const QString &name) { m_environment.remove(name); }
+    void setWorkingFolder(const QString &folder) { m_process.setWorkingDirectory(folder); }
     void setTimeLimit(std::chrono::milliseconds limit) { m_limit = limit; }
 
     bool start();

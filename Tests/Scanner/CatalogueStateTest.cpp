@@ -1,0 +1,139 @@
+#include "Tests/Scanner/ScannerTest.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+
+namespace {
+
+const QString kComp = QStringLiteral("Comp");
+
+class CatalogueState : public ScannerTest {
+protected:
+    QString temporaryPath() const { return cataloguePath() + QStringLiteral(".tmp"); }
+    QDateTime modified() const { return QFileInfo(cataloguePath()).lastModified(); }
+};
+
+} // namespace
+
+TEST_F(CatalogueState, AnUnusableCatalogueIsReplaced)
+{
+    addListedModules({kComp});
+    const QByteArray good = m_folder.catalogue();
+    const struct {
+        const char *name;
+        QByteArray text;
+    } rows[] = {
+        {"an empty file", ""},
+        {"no XML", "not a catalogue\n"},
+        {"another root", "<Scan></Scan>"},
+        {"bytes", QByteArray("\0\xFF\xFE<Effects", 11)},
+        {"cut in the middle of a record", good.left(good.indexOf("<Vendor>"))},
+    };
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.name);
+        m_folder.write(cataloguePath(), row.text);
+        forgetTrace();
+        const ScannerOutcome outcome = run();
+        EXPECT_TRUE(outcome.succeeded());
+        EXPECT_EQ(m_folder.catalogue(), good);
+        EXPECT_EQ(
+            logLines(outcome).filter(QStringLiteral("Cannot use the catalogue ") + cataloguePath()).size(), 1)
+            << qPrintable(outcome.log);
+    }
+}
+
+TEST_F(CatalogueState, AFolderInThePlaceOfTheCatalogueStays)
+{
+    addModule(kComp);
+    m_folder.write(QStringLiteral("Effects/VST3Configuration.xml/kept"), "old");
+    const ScannerOutcome outcome = run();
+    EXPECT_TRUE(outcome.succeeded());
+    EXPECT_EQ(loaded(), QStringList(kComp));
+    EXPECT_FALSE(logLines(outcome).filter(QStringLiteral("Cannot write the catalogue")).isEmpty())
+        << qPrintable(outcome.log);
+    EXPECT_EQ(QDir(cataloguePath()).entryList(QDir::Files), QStringList(QStringLiteral("kept")));
+    EXPECT_EQ(m_folder.markers(), QStringList());
+    EXPECT_FALSE(QFileInfo::exists(temporaryPath()));
+}
+
+TEST_F(CatalogueState, AWriteProtectedCatalogueKeepsItsContent)
+{
+    addListedModules({kComp});
+    const QByteArray before = m_folder.catalogue();
+    QFile::setPermissions(cataloguePath(), QFile::ReadOwner);
+    if (QFileInfo(cataloguePath()).isWritable())
+        GTEST_SKIP() << "the superuser writes everything";
+    addModule(QStringLiteral("New"));
+    const ScannerOutcome outcome = run();
+    EXPECT_TRUE(outcome.succeeded());
+    EXPECT_TRUE(outcome.log.contains(QStringLiteral("Cannot write the catalogue")))
+        << qPrintable(outcome.log);
+    EXPECT_EQ(m_folder.catalogue(), before);
+    EXPECT_FALSE(QFileInfo::exists(temporaryPath()));
+}
+
+TEST_F(CatalogueState, LeftoversOfATemporaryFileDoNoHarm)
+{
+    addModule(kComp);
+    m_folder.write(temporaryPath(), QByteArray(100000, 'x'));
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(listed(), QStringList(kComp));
+    EXPECT_FALSE(QFileInfo::exists(temporaryPath()));
+
+    m_folder.write(temporaryPath() + QStringLiteral("/x"), "a folder in its place");
+    addModule(QStringLiteral("New"));
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(listed(), QStringList({kComp, QStringLiteral("New")}));
+}
+
+TEST_F(CatalogueState, ACatalogueThatIsALinkStaysOne)
+{
+    addListedModules({kComp});
+    const QString target = m_folder.path(QStringLiteral("elsewhere.xml"));
+    ASSERT_TRUE(QFile::rename(cataloguePath(), target));
+    if (!QFile::link(target, cataloguePath()) || !QFileInfo(cataloguePath()).isSymLink())
+        GTEST_SKIP() << "no links here";
+    addModule(QStringLiteral("New"));
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(QFileInfo(cataloguePath()).symLinkTarget(), target);
+    EXPECT_EQ(m_folder.read(target).count("<Effect>"), 2);
+    EXPECT_EQ(listed(), QStringList({kComp, QStringLiteral("New")}));
+}
+
+TEST_F(CatalogueState, EarlierVersionsAreBroughtUpToDateWithoutLoadingAnything)
+{
+    for (const char *version : {"<Effects>", "<Effects version=\"1.0\">", "<Effects version=\"0.9\">"}) {
+        SCOPED_TRACE(version);
+        QFile::remove(cataloguePath());
+        addListedModules({kComp});
+        const QByteArray current = m_folder.catalogue();
+        editCatalogue("<Effects version=\"1.1\">", version);
+        editCatalogue("2020-01-02 03:04", "02.01.20 03:04:05");
+        EXPECT_TRUE(run().succeeded());
+        EXPECT_EQ(m_folder.catalogue(), current);
+        EXPECT_EQ(loaded(), QStringList());
+    }
+}
+
+TEST_F(CatalogueState, NothingNewLoadsNothingAndWritesNothing)
+{
+    addListedModules({kComp, QStringLiteral("Delay")});
+    m_folder.setModified(cataloguePath(), listedTime());
+    const auto before = effectsFolder();
+    const ScannerOutcome outcome = run();
+    EXPECT_TRUE(outcome.succeeded());
+    EXPECT_EQ(loaded(), QStringList());
+    EXPECT_EQ(modified(), listedTime());
+    EXPECT_EQ(effectsFolder(), before);
+    EXPECT_EQ(logLines(outcome), QStringList());
+}
+
+TEST_F(CatalogueState, ARemovedPluginLeavesTheCatalogue)
+{
+    addListedModules({kComp, QStringLiteral("Delay")});
+    QFile::remove(m_folder.path(QStringLiteral("Plugins/Comp.vst3")));
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(listed(), QStringList(QStringLiteral("Delay")));
+    EXPECT_EQ(loaded(), QStringList());
+}

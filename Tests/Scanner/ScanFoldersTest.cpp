@@ -1,0 +1,120 @@
+#include "Tests/Scanner/ScannerTest.h"
+
+#include <QFile>
+#include <QFileInfo>
+
+namespace {
+
+const char kEmptyCatalogue[] = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
+                               "<Effects version=\"1.1\">\n"
+                               "</Effects>\n";
+
+class ScanFolders : public ScannerTest {
+protected:
+    /// Runs with a scan list of these folders.
+    ScannerOutcome runFolders(const QStringList &folders) const
+    {
+        m_folder.writeScanList(folders);
+        return run();
+    }
+};
+
+} // namespace
+
+TEST_F(ScanFolders, ScanListsThatNameNothing)
+{
+    addModule(QStringLiteral("Comp"));
+    const struct {
+        const char *name;
+        QByteArray scanList;
+        int logged; ///< lines about it
+    } rows[] = {
+        {"an empty file", "", 1},
+        {"no XML", "C:\\Plugins\n", 1},
+        {"bytes", QByteArray("\xFF\xFE\0\0<\0S", 8), 1},
+        {"cut in the middle of its first folder", "<Scan>\n\t<Path>/nowhere</Pa", 1},
+        {"another root", "<Folders><Path>/nowhere</Path></Folders>", 0},
+        {"no folder", "<Scan></Scan>", 0},
+        {"other elements", "<Scan><Folder>/nowhere</Folder><Group><Path>/nowhere</Path></Group></Scan>", 0},
+    };
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.name);
+        m_folder.write(m_folder.scanList(), row.scanList);
+        QFile::remove(cataloguePath());
+        const ScannerOutcome outcome = run();
+        EXPECT_TRUE(outcome.succeeded());
+        EXPECT_EQ(m_folder.catalogue(), textLines(kEmptyCatalogue));
+        EXPECT_EQ(m_folder.read(m_folder.scanList()), row.scanList);
+        EXPECT_EQ(logLines(outcome).size(), row.logged) << qPrintable(outcome.log);
+        EXPECT_EQ(outcome.log.count(m_folder.scanList()), row.logged) << qPrintable(outcome.log);
+    }
+    EXPECT_EQ(loaded(), QStringList());
+}
+
+TEST_F(ScanFolders, AFolderThatCannotBeSearchedCostsOneLogLine)
+{
+    const QString shut = m_folder.path(QStringLiteral("Shut"));
+    m_folder.write(QStringLiteral("File"), "x");
+    m_folder.write(QStringLiteral("Shut/x"), "x");
+    const struct {
+        const char *name;
+        QString folder;
+        const char *reason;
+    } rows[] = {
+        {"does not exist", m_folder.path(QStringLiteral("Missing")), "it does not exist"},
+        {"does not exist, foreign letters", m_folder.path(QString::fromUtf8("無い 🎛")),
+         "it does not exist"},
+        {"is a file", m_folder.path(QStringLiteral("File")), "it is not a folder"},
+        {"is not readable", shut, "it is not readable"},
+    };
+    addModule(QStringLiteral("Comp"));
+    QFile::setPermissions(shut, QFile::Permissions());
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.name);
+        if (row.folder == shut && QFileInfo(shut).isReadable())
+            continue; // the superuser reads everything
+        const ScannerOutcome outcome = runFolders({row.folder, m_folder.plugins()});
+        EXPECT_TRUE(outcome.succeeded());
+        EXPECT_EQ(logLines(outcome), QStringList(QStringLiteral("Cannot search the folder %1: %2")
+                                                     .arg(row.folder, QLatin1String(row.reason))));
+        EXPECT_EQ(listed(), QStringList(QStringLiteral("Comp")));
+    }
+    QFile::setPermissions(shut, QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
+}
+
+TEST_F(ScanFolders, AModuleReachedInSeveralWaysIsProbedOnce)
+{
+    const QString folder = m_folder.plugins();
+    const QString inner = folder + QStringLiteral("/Inner");
+    addVST3File(inner, QStringLiteral("Deep"), "trace \"" + tracePath().toUtf8() + "\" Deep\nclass Deep\n");
+    addModule(QStringLiteral("Comp"));
+    const struct {
+        const char *name;
+        QStringList folders;
+        QStringList order;
+    } rows[] = {
+        {"the same folder twice", {folder, folder}, {QStringLiteral("Comp"), QStringLiteral("Deep")}},
+        {"with and without a slash behind it",
+         {folder, folder + QLatin1Char('/')},
+         {QStringLiteral("Comp"), QStringLiteral("Deep")}},
+        {"a folder inside another, listed later",
+         {folder, inner},
+         {QStringLiteral("Comp"), QStringLiteral("Deep")}},
+        {"a folder inside another, listed first",
+         {inner, folder},
+         {QStringLiteral("Deep"), QStringLiteral("Comp")}},
+        {"a detour",
+         {inner + QStringLiteral("/.."), folder},
+         {QStringLiteral("Comp"), QStringLiteral("Deep")}},
+    };
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.name);
+        QFile::remove(cataloguePath());
+        forgetTrace();
+        const ScannerOutcome outcome = runFolders(row.folders);
+        EXPECT_TRUE(outcome.succeeded());
+        EXPECT_EQ(loaded(), row.order);
+        EXPECT_EQ(logLines(outcome), QStringList());
+        EXPECT_EQ(listed(), QStringList({QStringLiteral("Comp"), QStringLiteral("Deep")}));
+    }
+}

@@ -1,0 +1,72 @@
+#include "Tests/Scanner/ScannerTest.h"
+
+#include <QFile>
+
+namespace {
+
+class SecondScanner : public ScannerTest {
+protected:
+    SecondScanner()
+    {
+        addModule(QStringLiteral("Slow"), "class Slow\nfault initialize hang\n");
+        addModule(QStringLiteral("After"));
+        m_folder.write(QStringLiteral("Effects/Earlier.scan"), "<CrashedPlugin>");
+    }
+    /// Starts a scanner that stops in the middle of its second module.
+    bool startFirst()
+    {
+        return m_first.start() && waitForStage(m_first, QStringLiteral("Slow"), "initialize");
+    }
+
+    ScannerRun m_first{scannerProgram(), m_folder};
+};
+
+} // namespace
+
+TEST_F(SecondScanner, LeavesABusyFolderAlone)
+{
+    const QString link = m_folder.path(QStringLiteral("Link"));
+    const bool linked = QFile::link(m_folder.dataFolder(), link);
+    ASSERT_TRUE(startFirst());
+    const auto before = effectsFolder();
+    const QStringList traceBefore = trace();
+    for (const QString &scanList :
+         {m_folder.scanList(), m_folder.path(QStringLiteral("Effects/../Effects/FXScan.xml")),
+          link + QStringLiteral("/Effects/FXScan.xml")}) {
+        SCOPED_TRACE(qPrintable(scanList));
+        if (!linked && scanList.startsWith(link))
+            continue;
+        ScannerRun second(scannerProgram(), m_folder);
+        second.setArguments({scanList});
+        const ScannerOutcome outcome = second.run();
+        EXPECT_TRUE(outcome.succeeded());
+        EXPECT_TRUE(outcome.log.contains(QStringLiteral("Another scanner is at work")))
+            << qPrintable(outcome.log);
+        EXPECT_EQ(effectsFolder(), before);
+        EXPECT_EQ(trace(), traceBefore);
+    }
+}
+
+TEST_F(SecondScanner, TheLockOfAKilledScannerCountsForNothing)
+{
+    ASSERT_TRUE(startFirst());
+    m_first.kill();
+    EXPECT_TRUE(m_first.wait().crashed);
+    EXPECT_TRUE(m_folder.markers().contains(QStringLiteral("Slow.scan3")));
+    forgetTrace();
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(loaded(), QStringList());
+    EXPECT_EQ(listed(), QStringList({QStringLiteral("After"), QStringLiteral("Slow")}));
+    EXPECT_FALSE(records()[QStringLiteral("Slow")].working);
+}
+
+TEST_F(SecondScanner, AnotherFolderIsAnotherMatter)
+{
+    ASSERT_TRUE(startFirst());
+    const TestFolder other;
+    addVST3File(other.plugins(), QStringLiteral("Comp"));
+    other.writeScanList();
+    EXPECT_TRUE(ScannerRun(scannerProgram(), other).run().succeeded());
+    EXPECT_TRUE(other.catalogue().contains("<Name>Comp</Name>")) << other.catalogue().constData();
+    EXPECT_TRUE(m_folder.markers().contains(QStringLiteral("Slow.scan3")));
+}

@@ -1,0 +1,47 @@
+#pragma once
+
+#include "Tests/Support/ChildProcess.h"
+
+#include <QString>
+#include <QStringList>
+
+#include <xcb/xcb.h>
+
+/// An X server without hardware (Xvfb), and a connection that notices every window that appears on it.
+class VirtualScreen {
+public:
+    VirtualScreen();
+    ~VirtualScreen();
+    VirtualScreen(const VirtualScreen &) = delete;
+    VirtualScreen &operator=(const VirtualScreen &) = delete;
+
+    /// Why there is no screen; empty when there is.
+    QString reasonAgainst() const { return m_reason; }
+    /// The value of DISPLAY for its programs.
+    QString name() const { return m_name; }
+    /// How many windows appeared since the last call.
+    int takeAppeared();
+    /// The titles of the windows that can be seen now.
+    QStringList visibleTitles() const;
+    /// Width and height of the visible window with this title, as "WxH".
+    QString sizeOf(const QString &title) const;
+    /// Asks a window to close, as its close button does.
+    void requestClose(const QString &title) const;
+    /// Ends the server under its programs.
+    void kill();
+
+private:
+    bool startServer();
+    xcb_atom_t atom(const char *name) const;
+    QString titleOf(xcb_window_t window) const;
+    bool isVisible(xcb_window_t window) const;
+    std::vector<xcb_window_t> visibleWindows() const;
+    /// 0 when there is none.
+    xcb_window_t windowTitled(const QString &title) const;
+
+    ChildProcess m_server;
+    QString m_reason;
+    QString m_name;
+    xcb_connection_t *m_connection = nullptr;
+    xcb_window_t m_root = 0;
+};
