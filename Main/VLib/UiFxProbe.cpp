@@ -1,7 +1,10 @@
 #include "Main/VLib/UiFxProbe.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/ProcessSetup.h"
+#include "Core/BaseLib/TerminationRequest.h"
 #include "Main/VLib/FxProbeUI.h"
+#include "Main/VLib/ScreenLoss.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/StatusHandover.h"
 
@@ -22,6 +25,7 @@ namespace {
 constexpr int kWidth = 333;
 constexpr int kHeight = 80;
 constexpr int kTickMilliseconds = 50;
+constexpr std::chrono::milliseconds kPollInterval(10);
 
 /// Calls back when it goes out of scope, also while the stack is unwound.
 template <typename Callback>
@@ -37,6 +41,17 @@ public:
 private:
     Callback m_callback;
 };
+
+/// With the screen the user's session is over: the scan ends as on any other request, and no plug-in is to
+/// blame.
+void endWithoutScreen(StatusHandover &status)
+{
+    status.setClosing();
+    TerminationSignal::raise();
+    while (!status.isFinished())
+        std::this_thread::sleep_for(kPollInterval);
+    leaveProcess(0);
+}
 
 QPalette labelPalette()
 {
@@ -65,6 +80,7 @@ UiFxProbe::UiFxProbe(const QString &dataFolder, std::function<void(const QString
 {
     setUpWidgets();
     m_installation = std::make_unique<Installation>(std::make_shared<FxProbeUI>(m_status));
+    m_screenLoss = std::make_unique<ScreenLoss>([status = m_status] { endWithoutScreen(*status); });
     setWindowFlags(Qt::Window | Qt::WindowMinimizeButtonHint | Qt::WindowStaysOnTopHint |
                    Qt::WindowCloseButtonHint);
     m_worker = std::thread([this, scan = std::move(scanRun)] { runScan(scan); });

@@ -12,6 +12,7 @@ class QCoreApplication;
 class QLabel;
 class QProgressBar;
 class QVBoxLayout;
+class ScreenLoss;
 class StatusHandover;
 
 /// The scanner's window: one line of text and a progress bar. It owns the thread on which the scan runs, and
@@ -81,5 +82,6 @@ private:
     /// The window was closed or is going: it must not come back into sight.
     bool m_closed = false;
     std::unique_ptr<Installation> m_installation;
+    std::unique_ptr<ScreenLoss> m_screenLoss;
     std::thread m_worker;
 };

@@ -37,6 +37,8 @@ protected:
     ScannerRun m_scanner{scannerProgram(), m_folder};
 };
 
+class LosingTheScreen : public OnScreen, public testing::WithParamInterface<const char *> {};
+
 } // namespace
 
 TEST_F(NoScreen, DoesNotKeepTheScannerFromItsWork)
@@ -95,3 +97,22 @@ TEST_F(OnScreen, WithNothingToProbeNoWindowAppears)
     EXPECT_TRUE(m_scanner.wait().succeeded());
     EXPECT_EQ(m_screen.takeAppeared(), 0);
 }
+
+TEST_P(LosingTheScreen, BlamesNobody)
+{
+    addListedModules({QStringLiteral("Before")});
+    addModule(kComp, GetParam());
+    ASSERT_TRUE(waitForWindow());
+    m_screen.kill();
+    EXPECT_TRUE(m_scanner.wait().succeeded());
+    EXPECT_EQ(m_folder.markers(), QStringList());
+
+    addModule(kComp);
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(listed(), QStringList({QStringLiteral("Before"), kComp}));
+    EXPECT_TRUE(records()[kComp].working);
+}
+
+INSTANTIATE_TEST_SUITE_P(Under, LosingTheScreen,
+                         testing::Values("delay initialize 1000\n", "fault initialize hang\n"),
+                         [](const auto &row) { return row.index == 0 ? "SlowPlugin" : "HangingPlugin"; });
