@@ -25,6 +25,8 @@ void settleSanitizers(QProcessEnvironment &environment)
         const QString given = environment.value(name);
         environment.insert(name, given.isEmpty() ? settings : settings + QLatin1Char(':') + given);
     }
+    environment.insert(QStringLiteral("LSAN_OPTIONS"),
+                       QStringLiteral("print_suppressions=0:suppressions=" FXPROBE_LEAK_SUPPRESSIONS));
 }
 
 bool holdsSanitizerReport(const QByteArray &text)
