@@ -5,6 +5,8 @@
 
 #include <pluginterfaces/base/ipluginbase.h>
 
+#include <exception>
+
 namespace {
 using FactoryFunction = Steinberg::IPluginFactory *(PLUGIN_API *)();
 }
@@ -13,6 +15,7 @@ VST3Module::~VST3Module() { close(); }
 
 bool VST3Module::open(const QString &path)
 {
+    m_path = path;
     if (!m_library.isLoaded()) {
         QString reason;
         const QString binary = VST3ModuleFile::binary(path, reason);
@@ -40,14 +43,30 @@ Steinberg::IPluginFactory *VST3Module::factory()
     return m_factory;
 }
 
+/// Takes one step of closing. It happens in a destructor, out of which an exception would end the process: a
+/// plug-in that was listed in full would be blamed for a crash.
+template <typename Step>
+void VST3Module::closeStep(Step step)
+{
+    try {
+        step();
+    } catch (const std::exception &error) {
+        DebugLog(L"%ls: closing it, the plug-in threw: %s", m_path, error.what());
+    } catch (...) {
+        DebugLog(L"%ls: closing it, the plug-in threw something that is no standard exception", m_path);
+    }
+}
+
 void VST3Module::close()
 {
     if (!m_initialised)
         return;
-    if (m_factory)
-        m_factory->release();
+    closeStep([this] {
+        if (m_factory)
+            m_factory->release();
+    });
     m_factory = nullptr;
-    VST3ModuleFile::end(m_library);
+    closeStep([this] { VST3ModuleFile::end(m_library); });
     m_library.freeUnlessRunning();
     m_initialised = false;
 }

@@ -27,9 +27,14 @@ public:
     /// The factory, asked for once; owned by the module. Null when the module exports none or answers null.
     Steinberg::IPluginFactory *factory();
     /// Releases the factory, ends the module and unloads it. A module that left threads running stays mapped.
+    /// Exceptions of the module are logged and go no further.
     void close();
 
 private:
+    template <typename Step>
+    void closeStep(Step step);
+
+    QString m_path;
     PluginLibrary m_library;
     Steinberg::IPluginFactory *m_factory = nullptr;
     bool m_initialised = false;
