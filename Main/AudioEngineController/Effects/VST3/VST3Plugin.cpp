@@ -19,6 +19,9 @@ namespace {
 constexpr char kAudioModuleClass[] = "Audio Module Class"; // kVstAudioEffectClass of the SDK
 /// Modules of more classes than this report each one as it is listed.
 constexpr int32 kManyClasses = 6;
+/// More classes than any module has. A factory that states more is only asked for these: two thousand million
+/// calls for classes that do not exist take minutes.
+constexpr int32 kMaxClasses = 0x10000;
 /// More buses than any plug-in has; what a plug-in states beyond is not believed.
 constexpr int32 kMaxBuses = 1024;
 
@@ -116,7 +119,7 @@ void VST3Plugin::listFactory(ClassListing &records, IPluginFactory *factory, boo
     FactoryView view{factory, factoryVendor(factory), {}};
     const int32 count = factory->countClasses();
     const std::size_t before = records.size();
-    for (int32 index = 0; index < count; ++index)
+    for (int32 index = 0; index < std::min(count, kMaxClasses); ++index)
         listClass(records, view, index, notifyEachClass || count > kManyClasses);
     if (records.size() == before)
         DebugLog(L"No audio class could be listed, of %d classes", count);
