@@ -1,0 +1,133 @@
+#include "Tests/Main/AudioEngineController/Effects/VST3/VST3ScanBench.h"
+
+#include <QDir>
+#include <QFile>
+
+namespace {
+
+class VST3Files : public VST3ScanBench {
+protected:
+    QString addBundle(const QString &name) const
+    {
+        const QByteArray traced =
+            "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\" \"" + name.toUtf8() + "\"\n";
+        const QString bundle =
+            addVST3Bundle(m_folder.plugins(), name, traced + "class \"" + name.toUtf8() + "\"\n");
+        m_folder.setModified(vst3BundleBinary(bundle), QDateTime({2021, 3, 4}, {5, 6}));
+        return bundle;
+    }
+    QString inPlugins(const char *name) const
+    {
+        return m_folder.plugins() + QLatin1Char('/') + QLatin1String(name);
+    }
+    QStringList names() const { return sortedRecords("Name"); }
+};
+
+} // namespace
+
+TEST_F(VST3Files, TheBinaryInsideABundleIsWhatCounts)
+{
+    const QString bundle = addBundle(QStringLiteral("Bundle"));
+    scan();
+    EXPECT_EQ(records("Name Path FileTime"),
+              QStringList{QStringLiteral("Bundle|") + bundle + QStringLiteral("|2021-03-04 05:06")});
+    m_folder.write(bundle + QStringLiteral("/Contents/moduleinfo.json"), "{}"); // the folder is newer now
+    m_folder.write(bundle + QStringLiteral("/Contents/x86_64-linux/data"), "x");
+    scan();
+    EXPECT_EQ(loaded(), QStringList());
+    m_folder.setModified(vst3BundleBinary(bundle), QDateTime({2022, 3, 4}, {5, 6}));
+    scan();
+    EXPECT_EQ(loaded(), texts({"Bundle"}));
+    EXPECT_EQ(records("FileTime"), texts({"2022-03-04 05:06"}));
+}
+
+TEST_F(VST3Files, BundlesInTheWild)
+{
+    // A bundle for several systems: the other system's module is no plug-in of this one.
+    const QString several = addBundle(QStringLiteral("Several"));
+    m_folder.write(several + QStringLiteral("/Contents/x86_64-win/Several.vst3"), "MZ");
+    // A bundle that was renamed by its user holds a module of the old name.
+    const QString renamed = addBundle(QStringLiteral("Before"));
+    ASSERT_TRUE(QDir().rename(renamed, modulePath(QStringLiteral("After"))));
+    // Capitals, as they come from other systems.
+    ASSERT_TRUE(QDir().rename(addBundle(QStringLiteral("Loud")), inPlugins("Loud.VST3")));
+    ASSERT_TRUE(QFile::rename(add(QStringLiteral("Plain")), inPlugins("Plain.VST3")));
+    QFile::rename(modulePath(QStringLiteral("Plain")) + QStringLiteral(".script"),
+                  inPlugins("Plain.VST3.script"));
+    scan();
+    EXPECT_EQ(names(), texts({"Before", "Loud", "Plain", "Several"}));
+    EXPECT_EQ(records("Working").count(QStringLiteral("1")), 4);
+    scan();
+    EXPECT_EQ(loaded(), QStringList());
+}
+
+TEST_F(VST3Files, WhatTheSearchFinds)
+{
+    add(QStringLiteral("deep/er/and/Deeper"));
+    add(QStringLiteral("ünï cödé & <b>/Tëst"));
+    add(QStringLiteral("A.folder.vst3/Contents2/Inside"));
+    add(QStringLiteral(".Hidden"));
+    add(QStringLiteral(".hidden folder/Unseen"));
+    add(QStringLiteral("Not one.vst3.bak"));
+    m_folder.write(inPlugins("Not one.vst3.txt"), "text");
+    ASSERT_TRUE(QFile::rename(modulePath(QStringLiteral("Not one.vst3.bak")), inPlugins("Not one.vst3.bak")));
+    scan();
+    EXPECT_EQ(loaded(), texts({"Inside", "Deeper", "Tëst"}));
+    QStringList found = sortedRecords("Name Working");
+    EXPECT_EQ(found, texts({"A.folder|0", "Deeper|1", "Inside|1", "Tëst|1"}));
+}
+
+TEST_F(VST3Files, AModuleReachedOnSeveralWaysIsProbedOnce)
+{
+    add(QStringLiteral("sub/Comp"));
+    const QString plugins = m_folder.plugins();
+    m_folder.writeScanList({plugins, plugins, plugins + QLatin1Char('/'), plugins + QStringLiteral("/sub"),
+                            plugins + QStringLiteral("/sub/../sub/.")});
+    ASSERT_TRUE(QFile::link(inPlugins("sub"), inPlugins("linked folder")));
+    ASSERT_TRUE(QFile::link(plugins, inPlugins("sub/circle")));
+    scan();
+    EXPECT_EQ(loaded(), texts({"Comp"}));
+    EXPECT_EQ(records("Name Path"),
+              QStringList{QStringLiteral("Comp|") + modulePath(QStringLiteral("sub/Comp"))});
+}
+
+TEST_F(VST3Files, LinkedModulesAndFoldersAreFollowedWhereTheyAreListed)
+{
+    const QString elsewhere = m_folder.path(QStringLiteral("Elsewhere"));
+    const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\" ";
+    m_folder.write(inPlugins("File.vst3.script"), traced + "File\nclass File\n"); // beside the link
+    const QString file = addVST3File(elsewhere, QStringLiteral("File"));
+    const QString bundle =
+        addVST3Bundle(elsewhere, QStringLiteral("Bundle"), traced + "Bundle\nclass Bundle\n");
+    ASSERT_TRUE(QFile::link(file, inPlugins("File.vst3")));
+    ASSERT_TRUE(QFile::link(bundle, inPlugins("Bundle.vst3")));
+    ASSERT_TRUE(QFile::link(inPlugins("gone.vst3"), inPlugins("Dangling.vst3")));
+    addVST3File(m_folder.path(QStringLiteral("Root")), QStringLiteral("Rooted"),
+                traced + "Rooted\nclass Rooted\n");
+    ASSERT_TRUE(
+        QFile::link(m_folder.path(QStringLiteral("Root")), m_folder.path(QStringLiteral("Linked root"))));
+    m_folder.writeScanList({m_folder.plugins(), m_folder.path(QStringLiteral("Linked root"))});
+    scan();
+    EXPECT_EQ(loaded(), texts({"Bundle", "File", "Rooted"}));
+    EXPECT_EQ(names(), texts({"Bundle", "File", "Rooted"}));
+    scan();
+    EXPECT_EQ(loaded(), QStringList());
+    // The time of a linked module is that of what it points to.
+    m_folder.setModified(file, QDateTime({2022, 3, 4}, {5, 6}));
+    scan();
+    EXPECT_EQ(loaded(), texts({"File"}));
+}
+
+TEST_F(VST3Files, OneModuleInTwoPlaces)
+{
+    const QByteArray script = "class Comp\nid 0000000000000000000000000000000A\n";
+    const QString first = add(QStringLiteral("a/Comp"), script);
+    add(QStringLiteral("b/Comp"), script);
+    scan();
+    const QStringList expected{QStringLiteral("Comp|") + first};
+    EXPECT_EQ(records("Name Path"), expected);
+    // The copy has nothing of its own to say, and is not loaded each time to find that out.
+    scan();
+    EXPECT_EQ(loaded(), QStringList());
+    EXPECT_EQ(records("Name Path"), expected);
+}

@@ -1,0 +1,236 @@
+#include "Tests/Main/AudioEngineController/Effects/VST3/VST3ScanBench.h"
+
+#include <QElapsedTimer>
+
+TEST_F(VST3ScanBench, AHealthyModuleGivesThisCatalogue)
+{
+    const QByteArray path = add(QStringLiteral("Comp x64"), "factory-vendor \"Fixture & Co\"\n"
+                                                            "class \"Comp, große\"\n"
+                                                            "id 00112233445566778899AABBCCDDEEFF\n"
+                                                            "subcategories Fx|Dynamics|Mastering\n"
+                                                            "inputs 2 1:aux\noutputs 6\n")
+                                .toUtf8();
+    scan();
+    const QByteArray expected = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
+                                "<Effects version=\"1.1\">\n"
+                                "\t<Effect>\n"
+                                "\t\t<Path>" +
+                                path +
+                                "</Path>\n"
+                                "\t\t<FileTime>2021-03-04 05:06</FileTime>\n"
+                                "\t\t<Name>Comp, große</Name>\n"
+                                "\t\t<ID>00112233445566778899AABBCCDDEEFF</ID>\n"
+                                "\t\t<Categories>Fx|Dynamics|Mastering</Categories>\n"
+                                "\t\t<CategoryMask>264</CategoryMask>\n"
+                                "\t\t<Favourite>0</Favourite>\n"
+                                "\t\t<Vendor>Fixture & Co</Vendor>\n"
+                                "\t\t<Inputs>2</Inputs>\n"
+                                "\t\t<Outputs>2</Outputs>\n"
+                                "\t\t<Enabled>1</Enabled>\n"
+                                "\t\t<Working>1</Working>\n"
+                                "\t</Effect>\n"
+                                "</Effects>\n";
+    EXPECT_EQ(m_folder.catalogue().replace("\r\n", "\n"), expected);
+}
+
+TEST_F(VST3ScanBench, NoModulesGiveAnEmptyCatalogue)
+{
+    m_folder.writeScanList({m_folder.path(QStringLiteral("nowhere")), m_folder.plugins()});
+    scan();
+    EXPECT_EQ(
+        m_folder.lines(QStringLiteral("Effects/VST3Configuration.xml")),
+        texts({"<?xml version=\"1.0\" encoding=\"UTF-8\"?>", "<Effects version=\"1.1\">", "</Effects>"}));
+}
+
+TEST_F(VST3ScanBench, TextsComeAsTheFactoryGivesThem)
+{
+    const QByteArray longName(64, 'n');
+    const struct {
+        const char *row;
+        QByteArray script;
+        QByteArray expected; // Name|Vendor|Categories
+    } cases[] = {
+        {"class vendor", "class cv\nvendor \"Class Maker\"\n", "cv|Class Maker|Fx"},
+        {"factory vendor", "factory-vendor FV\nclass fv\n", "fv|FV|Fx"},
+        {"no vendor at all", "factory-vendor \"\"\nclass nv\n", "nv||Fx"},
+        {"old factory", "generation 1\nclass old\nvendor Unasked\n", "old|Fixture Works|"},
+        {"newer information refused", "class nir\nvendor V\nanswer class-info2 false\n",
+         "nir|Fixture Works|"},
+        {"Unicode information refused", "class uir\nvendor V\nanswer class-info-unicode false\n", "uir|V|Fx"},
+        {"factory information refused", "class fir\nanswer factory-info false\n", "fir||Fx"},
+        {"64 bytes, no terminator", "class " + longName + "\n", longName + "|Fixture Works|Fx"},
+        {"vendor of 64 bytes", "class lv\nvendor " + longName + "v\n", "lv|" + longName + "|Fx"},
+        {"sub-categories of 128 bytes", "class lc\nsubcategories " + longName + longName + "\n",
+         "lc|Fixture Works|" + longName + longName},
+        {"invalid UTF-8", "class \"a\\xFF\\xC3(b\"\nvendor \"\\x80\"\n", "a\uFFFD\uFFFD(b|\uFFFD|Fx"},
+        {"a character cut by the field", "class \"" + longName.left(63) + "é\"\n",
+         longName.left(63) + "\uFFFD|Fixture Works|Fx"},
+        {"Japanese", "class リバーブ\nvendor 株式会社\n", "リバーブ|株式会社|Fx"},
+        {"emoji", "class \"🎛 Comp\"\n", "🎛 Comp|Fixture Works|Fx"},
+        {"blanks", "class \" a  b \"\n", " a  b |Fixture Works|Fx"},
+        {"nothing but a blank", "class \" \"\n", " |Fixture Works|Fx"},
+        {"empty name", "class \"\"\n", "|Fixture Works|Fx"},
+        {"ampersand", "class \"A & B\"\n", "A & B|Fixture Works|Fx"},
+        {"percent sign", "class \"%s%n 100%\"\n", "%s%n 100%|Fixture Works|Fx"},
+    };
+    for (const auto &row : cases)
+        add(QString::fromLatin1(row.row), row.script);
+    scan();
+    const QStringList found = records("Name Vendor Categories");
+    EXPECT_EQ(found.size(), static_cast<int>(std::size(cases)));
+    for (const auto &row : cases)
+        EXPECT_TRUE(found.contains(QString::fromUtf8(row.expected))) << row.row;
+    // What was written is also understood: nothing is loaded, nothing changes.
+    const QByteArray catalogue = m_folder.catalogue();
+    scan();
+    EXPECT_EQ(loaded(), QStringList());
+    EXPECT_EQ(m_folder.catalogue(), catalogue);
+}
+
+TEST_F(VST3ScanBench, SubCategoriesBecomeACategoryMask)
+{
+    const struct {
+        const char *subCategories;
+        quint32 mask;
+    } cases[] = {{"Fx", 0},
+                 {"", 0},
+                 {"Fx|Reverb", 0x4000},
+                 {"Fx|EQ|Dynamics", 0x18},
+                 {"Instrument|Synth", 0x80},
+                 {"Instrument|Drum", 0x400080},
+                 {"Fx|Filter", 0x10},
+                 {"Fx|Analyzer", 0x1000000},
+                 {"Fx|Channel Strip", 0x2},
+                 {"Fx|Up-Downmix", 0x8000},
+                 {"Fx|Pitch Shift", 0x2000},
+                 {"Fx|Ambisonics", 0x4000000},
+                 {"Fx|reverb", 0},
+                 {"Fx|Reverberation", 0},
+                 {"|Delay||Nonsense|", 0x4}};
+    QStringList expected;
+    for (const auto &row : cases) {
+        const QByteArray name = QByteArray("of ") + row.subCategories;
+        add(QString::fromLatin1(name),
+            "class \"" + name + "\"\nsubcategories \"" + row.subCategories + "\"\n");
+        expected.append(QStringLiteral("%1|%2").arg(QLatin1String(row.subCategories)).arg(row.mask));
+    }
+    scan();
+    QStringList found = sortedRecords("Categories CategoryMask");
+    expected.sort();
+    EXPECT_EQ(found, expected);
+}
+
+TEST_F(VST3ScanBench, ClassesThatShareANameOrAnIdentifier)
+{
+    add(QStringLiteral("A twice"),
+        "class A\nid 0000000000000000000000000000000A\n"
+        "class A\nid 0000000000000000000000000000000B\nclass After\nid 0000000000000000000000000000000C\n");
+    add(QStringLiteral("B one id twice"), "class B1\nid 000000000000000000000000000000B1\n"
+                                          "class B2\nid 000000000000000000000000000000B1\n");
+    add(QStringLiteral("C name x64"), "class Shared\nid 000000000000000000000000000000C1\n");
+    add(QStringLiteral("D name x64"), "class Shared\nid 000000000000000000000000000000D1\n");
+    add(QStringLiteral("E id"), "class \"Held first\"\nid 000000000000000000000000000000E1\n");
+    add(QStringLiteral("F id"), "class \"Held second\"\nid 000000000000000000000000000000E1\n");
+    add(QStringLiteral("G zero id"), "class Zero\nid 00000000000000000000000000000000\n");
+    scan();
+    EXPECT_EQ(records("Name ID"),
+              texts({"Zero|00000000000000000000000000000000", "A|0000000000000000000000000000000A",
+                     "After|0000000000000000000000000000000C", "B1|000000000000000000000000000000B1",
+                     "Shared|000000000000000000000000000000C1", "D name |000000000000000000000000000000D1",
+                     "Held first|000000000000000000000000000000E1"}));
+    EXPECT_EQ(traceOf(QStringLiteral("A twice")).filter(QStringLiteral("create-instance")),
+              texts({"create-instance A", "create-instance After"}));
+}
+
+TEST_F(VST3ScanBench, OnlyAudioClassesAreAskedFurther)
+{
+    add(QStringLiteral("Mixed"), "class Controller\ncategory \"Component Controller Class\"\n"
+                                 "class Audio\n"
+                                 "class Longer\ncategory \"Audio Module Class 2\"\n"
+                                 "class Shorter\ncategory \"Audio Module\"\n"
+                                 "class Lower\ncategory \"audio module class\"\n"
+                                 "class Unterminated\ncategory \"Audio Module Class and 32 bytes!!\"\n"
+                                 "class Unnamed\ncategory \"\"\n"
+                                 "class Refusing\nanswer class-info false Refusing\n");
+    scan();
+    EXPECT_EQ(records("Name"), texts({"Audio"}));
+    EXPECT_EQ(traceOf(QStringLiteral("Mixed")).filter(QStringLiteral("class-info2")),
+              texts({"class-info2 Audio"}));
+}
+
+TEST_F(VST3ScanBench, ClassesThatFailAreLeftOut)
+{
+    const char *answers[] = {"create-instance false",     "create-instance no-interface",
+                             "create-instance null",      "create-instance 0x80004005",
+                             "initialize internal-error", "initialize false"};
+    QByteArray script;
+    for (const char *answer : answers)
+        script += QByteArray("class \"") + answer + "\"\nanswer " + answer + " \"" + answer + "\"\n";
+    add(QStringLiteral("Some"), script + "class Last\nanswer terminate internal-error Last\n");
+    const ScannerOutcome outcome = scan();
+    EXPECT_EQ(records("Name Working"), texts({"Last|1"}));
+    for (const char *answer : answers)
+        EXPECT_TRUE(outcome.log.contains(QLatin1String("The class ") + QLatin1String(answer) +
+                                         QLatin1String(" could not be ")))
+            << answer;
+}
+
+TEST_F(VST3ScanBench, AModuleOfHundredsOfClasses)
+{
+    QByteArray script;
+    for (int index = 0; index < 300; ++index)
+        script += "class \"Class " + QByteArray::number(index) + "\"\n";
+    add(QStringLiteral("Many"), script);
+    scan();
+    QStringList names = records("Name");
+    EXPECT_EQ(names.size(), 300);
+    EXPECT_EQ(names.removeDuplicates(), 0);
+}
+
+TEST_F(VST3ScanBench, StatedClassCountsAreNotBelieved)
+{
+    const QByteArray classes = "class \"%1 A\"\nclass \"%1 B\"\n";
+    const struct {
+        const char *name;
+        const char *count;
+        bool listsAll;
+    } cases[] = {{"Largest", "2147483647", true},
+                 {"Some more", "1000", true},
+                 {"Negative", "-1", false},
+                 {"Smallest", "-2147483648", false},
+                 {"None", "0", false}};
+    for (const auto &row : cases)
+        add(QString::fromLatin1(row.name), QByteArray("answer count-classes ") + row.count + "\n" +
+                                               QByteArray(classes).replace("%1", row.name));
+    QElapsedTimer clock;
+    clock.start();
+    scan();
+    EXPECT_LT(clock.elapsed(), 10000) << "counted what is not there";
+    QStringList found = sortedRecords("Name Working");
+    EXPECT_EQ(found, texts({"Largest A|1", "Largest B|1", "Negative|0", "None|0", "Smallest|0",
+                            "Some more A|1", "Some more B|1"}));
+}
+
+// What the writer does not escape is kept as it is; nothing of such a file is understood by the next run.
+TEST_F(VST3ScanBench, ANameThatBreaksTheCatalogueCausesANewProbe)
+{
+    add(QStringLiteral("Broken"), "class \"a < b\"\n");
+    add(QStringLiteral("Comp"));
+    for (int run = 0; run < 2; ++run) {
+        SCOPED_TRACE(run);
+        const ScannerOutcome outcome = scan();
+        EXPECT_EQ(loaded(), texts({"Broken", "Comp"}));
+        QStringList names = sortedRecords("Name Working");
+        EXPECT_EQ(names, texts({"Comp|1", "a < b|1"}));
+        EXPECT_EQ(outcome.log.contains(QStringLiteral("Cannot use the catalogue")), run == 1);
+    }
+}
+
+TEST_F(VST3ScanBench, TheHostAnswersQuestions)
+{
+    add(QStringLiteral("Asking"), "class A\nask-host name message attributes unknown\n");
+    scan();
+    EXPECT_EQ(traceOf(QStringLiteral("Asking")).filter(QStringLiteral("host-")),
+              texts({"host-name A: ok Quillon", "host-message A: ok fixture 42",
+                     "host-attributes A: ok same 42", "host-unknown A: not-implemented null"}));
+}
