@@ -131,7 +131,7 @@ TEST(DebugLog, ExceptionsEndInQtsDebugChannel)
 TEST(DebugLog, LinesOfSeveralThreadsStayWholeInTheFileThatTheEnvironmentNames)
 {
     const CapturedLog log;
-    const TestFolder folder;
+    const EmptyFolder folder;
     qputenv("FXPROBE_LOG", folder.write("音.log"_q, QByteArray("earlier run") + kLineEnd).toUtf8());
     qputenv("FXPROBE_TRACE", "1");
     configureLogFromEnvironment();

@@ -7,7 +7,7 @@
 
 namespace {
 
-QStringList pathsIn(const TestFolder &folder, const QStringList &names)
+QStringList pathsIn(const EmptyFolder &folder, const QStringList &names)
 {
     QStringList paths;
     for (const QString &name : names)
@@ -22,7 +22,7 @@ FileFinder moduleFinder() { return FileFinder(".vst3"_q); }
 TEST(FileFinder, ListsAFolderByNameAndThenWhatLiesBelow)
 {
     const CapturedLog log;
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString tree =
         "sub/deep/z.vst3|sub/a.vst3|b.vst3|A.VST3|C.vst3/Contents/C.so|C.vst3/Contents/inner.vst3|🎸.vst3|"
         "残響/残響.vst3|a %1 [x]*.vst3|.hidden.vst3|.hidden/x.vst3|x.vst3.bak|vst3|x.dll|none/x.txt"_q;
@@ -40,7 +40,7 @@ TEST(FileFinder, ListsAFolderByNameAndThenWhatLiesBelow)
 
 TEST(FileFinder, AFolderThatCannotBeSearchedIsOneLogLine)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const struct {
         const char *name;
         QString path;
@@ -62,7 +62,7 @@ TEST(FileFinder, AFolderThatCannotBeSearchedIsOneLogLine)
 
 TEST(FileFinder, CancelIsAskedBeforeEachFolder)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     folder.write("a.vst3"_q);
     folder.write("b/b.vst3"_q);
     folder.write("c/c.vst3"_q);

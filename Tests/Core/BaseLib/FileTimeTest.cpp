@@ -24,7 +24,7 @@ QDateTime localTime(const char *text)
 
 TEST(FileTime, IsLocalTimeInMinutes)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString path = folder.write("残響.vst3"_q);
     const QString epoch = QDateTime::fromMSecsSinceEpoch(0).toString("yyyy-MM-dd hh:mm"_q);
     const struct {
@@ -48,7 +48,7 @@ TEST(FileTime, IsLocalTimeInMinutes)
 
 TEST(FileStamp, SeesWhatTheTextCannot)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString path = folder.write("a.xml"_q, "1");
     const QDateTime time = localTime("2024-03-09T07:05:10.100");
     setModified(path, time);
@@ -66,7 +66,7 @@ TEST(FileStamp, SeesWhatTheTextCannot)
 
 TEST(FileStamp, BeyondItsRangeStaysInOrderAndTouchingMeansNow)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString path = folder.write("残響.scan3"_q);
     constexpr qint64 kYear2200 = 7258118400000000000;
     setModified(path, localTime("2300-01-01T12:00:00"));

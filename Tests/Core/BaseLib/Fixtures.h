@@ -2,6 +2,8 @@
 
 #include "Core/BaseLib/TextFile.h"
 
+#include "Tests/Support/QtPrinters.h"
+
 #include <QDir>
 #include <QTemporaryDir>
 
@@ -13,8 +15,8 @@ inline QString operator""_q(const char *utf8, std::size_t length)
     return QString::fromUtf8(utf8, static_cast<int>(length));
 }
 
-/// A folder of a test's own, gone when the test ends.
-class TestFolder {
+/// A folder of a test's own, empty at first and gone when the test ends.
+class EmptyFolder {
 public:
     QString path(const QString &name = QString()) const { return m_folder.filePath(name); }
     QByteArray nativePath(const QByteArray &name) const { return QFile::encodeName(path()) + '/' + name; }

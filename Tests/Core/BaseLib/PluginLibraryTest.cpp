@@ -30,7 +30,7 @@ TEST(PluginLibrary, UnloadsWhenItShould)
         {"freed in the process cache", true, [](PluginLibrary &l) { l.free(); }, true, 0},
     };
     for (const auto &row : rows) {
-        const TestFolder folder;
+        const EmptyFolder folder;
         const QString path = folder.path("残響🎸.vst3"_q);
         ASSERT_TRUE(QFile::copy(ONE_FUNCTION_LIBRARY, path));
         int unloaded = 0;
@@ -55,7 +55,7 @@ TEST(PluginLibrary, UnloadsWhenItShould)
 
 TEST(PluginLibrary, ProcessCacheSharesHandlesAndForgetsFailures)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString path = folder.path("later.vst3"_q);
     EXPECT_FALSE(PluginLibrary::exists(path));
     PluginLibrary first;

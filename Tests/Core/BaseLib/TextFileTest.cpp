@@ -20,7 +20,7 @@ TEST(ReplaceFile, LeavesTheNewContentAndNothingElse)
         {"bytes as they are", "x", QByteArray("\xE6\xAE\x8B\0\r\n\n", 7), Durability::Synced},
     };
     for (const auto &row : rows) {
-        const TestFolder folder;
+        const EmptyFolder folder;
         if (!row.before.isNull())
             folder.write("残響.xml"_q, row.before);
         const FileResult result = replaceFile(folder.path("残響.xml"_q), row.content, row.durability);
@@ -32,7 +32,7 @@ TEST(ReplaceFile, LeavesTheNewContentAndNothingElse)
 
 TEST(ReplaceFile, SaysWhyItCannot)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     folder.write("folder.xml/kept"_q);
     for (const QString &name : {"folder.xml"_q, "missing/a.xml"_q})
         EXPECT_FALSE(replaceFile(folder.path(name), "new", Durability::Buffered)) << name.toStdString();

@@ -62,7 +62,7 @@ TEST(XMLDocument, RefusesWhatIsNotWellFormed)
 
 TEST(XMLDocument, LoadSaysWhyAFileCannotBeRead)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString good = folder.write("音.xml"_q, effectNamed("Fuzz"));
     XMLDocument document;
     for (const QString &path : {folder.path("none.xml"_q), folder.path(), QString()}) {

@@ -12,7 +12,7 @@
 
 namespace {
 
-QStringList modulesIn(const TestFolder &folder)
+QStringList modulesIn(const EmptyFolder &folder)
 {
     QStringList names = FileFinder(".vst3"_q).find(folder.path());
     for (QString &name : names)
@@ -24,7 +24,7 @@ QStringList modulesIn(const TestFolder &folder)
 
 TEST(FileFinderLinks, AreListedAndNeverEntered)
 {
-    const TestFolder elsewhere;
+    const EmptyFolder elsewhere;
     elsewhere.write("in/x.vst3"_q);
     const QString inside = elsewhere.path("in"_q);
     const struct {
@@ -43,7 +43,7 @@ TEST(FileFinderLinks, AreListedAndNeverEntered)
     };
     for (const auto &row : rows) {
         const CapturedLog log;
-        const TestFolder folder;
+        const EmptyFolder folder;
         ASSERT_TRUE(QFile::link(row.target, folder.path(row.link))) << row.name;
         EXPECT_EQ(modulesIn(folder), row.found) << row.name;
         EXPECT_EQ(log.lines(), QStringList()) << row.name;
@@ -52,7 +52,7 @@ TEST(FileFinderLinks, AreListedAndNeverEntered)
 
 TEST(FileFinder, PassesOverWhatCanBeNoModule)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QByteArray noText = folder.nativePath("bad\xFF.vst3");
     const QByteArray noTextFolder = folder.nativePath("cut\xE6\xAE.vst3");
     folder.write("good.vst3"_q);
@@ -67,7 +67,7 @@ TEST(FileFinder, PassesOverWhatCanBeNoModule)
 
 TEST(FileFinder, AnUnreadableFolderIsOneLogLineAndItsNeighboursAreFound)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     folder.write("a/a.vst3"_q);
     const QByteArray closed = folder.nativePath("closed");
     folder.write("closed/x.vst3"_q);

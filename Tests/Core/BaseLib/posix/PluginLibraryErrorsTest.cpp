@@ -28,7 +28,7 @@ QByteArray elfHeader(unsigned char elfClass, Elf64_Half machine)
 
 TEST(PluginLibraryErrors, KeepTheLoadersOwnWords)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const struct {
         const char *name;
         QString path;

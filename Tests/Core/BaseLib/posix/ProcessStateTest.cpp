@@ -54,7 +54,7 @@ void blockUserSignal()
 
 void enterAndRemoveAFolder()
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     EXPECT_EQ(chdir(QFile::encodeName(folder.path()).constData()), 0);
 }
 

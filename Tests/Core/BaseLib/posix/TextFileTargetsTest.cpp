@@ -26,8 +26,8 @@ mode_t modeOf(const QByteArray &path)
 TEST(ReplaceFile, LinksPermissionsAndReadersStay)
 {
     for (const mode_t mode : {0600U, 0640U, 0666U, 0755U}) {
-        const TestFolder here;
-        const TestFolder there;
+        const EmptyFolder here;
+        const EmptyFolder there;
         QFile reader(there.write("a.xml"_q, "old"));
         const QString link = here.path("link.xml"_q);
         chmod(there.nativePath("a.xml").constData(), mode);
@@ -43,7 +43,7 @@ TEST(ReplaceFile, LinksPermissionsAndReadersStay)
 
 TEST(ReplaceFile, AFullDeviceIsReportedAndStaysADevice)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString link = folder.path("full.xml"_q);
     ASSERT_TRUE(QFile::link("/dev/full"_q, link));
     chmod(folder.nativePath("").constData(), 0755);
@@ -59,7 +59,7 @@ TEST(ReplaceFile, AFullDeviceIsReportedAndStaysADevice)
 
 TEST(ReplaceFile, AFailedWriteKeepsTheOldContentAndLeavesNoTemporary)
 {
-    const TestFolder folder;
+    const EmptyFolder folder;
     const QString path = folder.write("a.xml"_q, "old");
     rlimit before = {};
     getrlimit(RLIMIT_FSIZE, &before);
@@ -86,7 +86,7 @@ TEST(ReplaceFile, ObeysPermissions)
         {"a file that is not to be written, in an open folder", 0777, 0444, false},
     };
     for (const auto &row : rows) {
-        const TestFolder folder;
+        const EmptyFolder folder;
         const QString path = folder.write("a.xml"_q, "long old content");
         chmod(folder.nativePath("a.xml").constData(), row.file);
         chmod(folder.nativePath("").constData(), row.folder);
