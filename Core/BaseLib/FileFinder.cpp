@@ -7,6 +7,8 @@
 #include <QFileInfo>
 
 #include <algorithm>
+#include <mutex>
+#include <set>
 #include <vector>
 
 namespace {
@@ -50,9 +52,23 @@ QString reasonAgainst(const QFileInfo &folder)
     return QString();
 }
 
+/// The folders that were reported as unsearchable already.
+struct Reports {
+    std::mutex mutex;
+    std::set<QString> folders;
+};
+
+Reports &reports()
+{
+    static Reports instance;
+    return instance;
+}
+
 void logUnsearchable(const QString &folder, const QString &reason)
 {
-    DebugLog(L"Cannot search the folder \"%ls\": %ls", folder, reason);
+    const std::lock_guard<std::mutex> lock(reports().mutex);
+    if (reports().folders.insert(folder).second)
+        DebugLog(L"Cannot search the folder \"%ls\": %ls", folder, reason);
 }
 
 } // namespace
@@ -60,6 +76,12 @@ void logUnsearchable(const QString &folder, const QString &reason)
 FileFinder::FileFinder(const QString &ending)
     : m_ending(ending)
 {}
+
+void FileFinder::forgetReports()
+{
+    const std::lock_guard<std::mutex> lock(reports().mutex);
+    reports().folders.clear();
+}
 
 QStringList FileFinder::find(const QString &folder) const
 {

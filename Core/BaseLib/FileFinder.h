@@ -20,6 +20,9 @@ public:
     /// are passed over. A folder that cannot be read, or an empty path, gives one log line.
     QStringList find(const QString &folder) const;
 
+    /// Lets folders that cannot be read be reported anew.
+    static void forgetReports();
+
 private:
     void searchFolder(const QString &folder, QStringList &found) const;
 

@@ -44,8 +44,9 @@ public:
     bool searchDllLoadDir = false;
 
 private:
-    /// Asks the system's loader; null on failure, with `m_errorText` set.
-    void *loadUncached(const QString &path);
+    /// Asks the system's loader; null on failure, with `m_errorText` set. What a library's start-up code
+    /// throws ends the process: it would leave the loader in the middle of its work, with its lock held.
+    void *loadUncached(const QString &path) noexcept;
 
     void *m_handle = nullptr;
     QString m_path;

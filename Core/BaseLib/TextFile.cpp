@@ -66,6 +66,10 @@ FileResult replaceFile(const QString &path, const QByteArray &content, Durabilit
 FileResult readWholeFile(const QString &path, QByteArray &content)
 {
     QFile file(path);
+    // A pipe or a device may have no end.
+    const QFileInfo info(path);
+    if (info.exists() && !info.isFile())
+        return {QStringLiteral("it is not a regular file")};
     if (!file.open(QIODevice::ReadOnly))
         return {file.errorString()};
     content = file.readAll();

@@ -75,7 +75,7 @@ TEST_F(ScanFolders, AFolderThatCannotBeSearchedCostsOneLogLine)
             continue; // the superuser reads everything
         const ScannerOutcome outcome = runFolders({row.folder, m_folder.plugins()});
         EXPECT_TRUE(outcome.succeeded());
-        EXPECT_EQ(logLines(outcome), QStringList(QStringLiteral("Cannot search the folder %1: %2")
+        EXPECT_EQ(logLines(outcome), QStringList(QStringLiteral("Cannot search the folder \"%1\": %2")
                                                      .arg(row.folder, QLatin1String(row.reason))));
         EXPECT_EQ(listed(), QStringList(QStringLiteral("Comp")));
     }

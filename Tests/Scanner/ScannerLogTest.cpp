@@ -10,7 +10,7 @@ protected:
     QString foreign() const { return m_folder.path(QString::fromUtf8("無い 🎛 ö")); }
     QByteArray lineAboutForeign() const
     {
-        return ": Cannot search the folder " + foreign().toUtf8() + ": it does not exist";
+        return ": Cannot search the folder \"" + foreign().toUtf8() + "\": it does not exist";
     }
 };
 

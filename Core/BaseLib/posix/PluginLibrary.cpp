@@ -20,7 +20,7 @@ QString withTheFilesPresence(const QString &loaderText, const QString &path)
 
 } // namespace
 
-void *PluginLibrary::loadUncached(const QString &path)
+void *PluginLibrary::loadUncached(const QString &path) noexcept
 {
     if (path.isEmpty()) { // dlopen would answer with the program itself
         m_errorText = QStringLiteral("no path given");

@@ -44,6 +44,29 @@ Markers &activeMarkers()
     return markers;
 }
 
+/// The raw content of one of our own lines; empty where there is none.
+QString rawElement(const QString &text, const char *name)
+{
+    const QString start = QStringLiteral("\t<%1>").arg(QLatin1String(name));
+    const int from = text.indexOf(start);
+    const int to = text.indexOf(QStringLiteral("</%1>").arg(QLatin1String(name)), from);
+    return from < 0 || to < 0 ? QString() : text.mid(from + start.size(), to - from - start.size());
+}
+
+/// Markers are not escaped, so one of a path with "<" is no XML. A complete one is read by its lines instead:
+/// its plug-in would crash every run otherwise.
+void readRawMarker(const QString &marker, EffectRecord &record)
+{
+    QByteArray content;
+    if (!readWholeFile(marker, content) || !content.trimmed().endsWith("</CrashedPlugin>"))
+        return;
+    const QString text = QString::fromUtf8(content);
+    record.path = rawElement(text, "Path");
+    record.fileTime = rawElement(text, "Created");
+    record.name = rawElement(text, "Name");
+    record.subId = static_cast<quint32>(parseInteger(rawElement(text, "SubID")));
+}
+
 } // namespace
 
 QString markerPath(const MarkerFormat &format, const QString &folder, const QString &path,
@@ -86,6 +109,7 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
     XMLDocument document;
     if (!document.load(marker)) {
         DebugLog(L"Cannot read the crash marker %ls: %ls", marker, document.error());
+        readRawMarker(marker, record);
         return record;
     }
     const XMLElement crashed = document.root("CrashedPlugin");

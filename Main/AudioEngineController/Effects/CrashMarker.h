@@ -17,7 +17,7 @@ QString markerPath(const MarkerFormat &format, const QString &folder, const QStr
 /// Writes a marker, replacing any file of that name.
 FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, const EffectRecord &record);
 
-/// Reads a marker into a fresh record that is not enabled. A marker that does not parse gives empty fields.
+/// Reads a marker into a fresh record that is not enabled. One that is damaged gives empty fields.
 /// The file stays: it is deleted once the catalogue holds what it said.
 EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker);
 

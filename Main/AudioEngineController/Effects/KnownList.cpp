@@ -3,6 +3,7 @@
 #include <QFile>
 
 #include <algorithm>
+#include <iterator>
 #include <tuple>
 
 namespace {
@@ -74,14 +75,21 @@ KnownList::Records KnownList::recordsOfPath(const QString &path) const
     return records;
 }
 
-KnownList::Records KnownList::recordsOfMovedFile(const QString &path) const
+KnownList::Knowledge KnownList::lookUp(const QString &path) const
 {
-    Records records = recordsOfFileName(path);
-    const auto remains = [&](const EffectRecord *record) {
-        return record->path == path || QFile::exists(record->path);
-    };
-    records.erase(std::remove_if(records.begin(), records.end(), remains), records.end());
-    return records;
+    Records ofName = recordsOfFileName(path);
+    if (ofName.empty())
+        return {KnownAs::Unknown, {}};
+    if (ofName.front()->path == path)
+        return {KnownAs::Own, recordsOfPath(path)};
+    Records moved;
+    std::copy_if(ofName.begin(), ofName.end(), std::back_inserter(moved),
+                 [](const EffectRecord *record) { return !QFile::exists(record->path); });
+    if (!moved.empty())
+        return {KnownAs::Moved, std::move(moved)};
+    if (ofName.front()->isCrashedFile())
+        return {KnownAs::Unknown, {}};
+    return {KnownAs::Namesake, std::move(ofName)};
 }
 
 bool KnownList::isIdHeldByOther(const QString &id, const EffectRecord &plugin) const

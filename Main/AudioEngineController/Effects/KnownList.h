@@ -5,6 +5,15 @@
 #include <map>
 #include <vector>
 
+/// How a file is known.
+enum class KnownAs {
+    Unknown,
+    Own,      ///< by its full path
+    Moved,    ///< by the name of a file that is gone
+    Namesake, ///< by the name of another file that is there, and did not crash: a crash says nothing of a
+              ///< namesake
+};
+
 /// What the previous catalogue and the surviving crash markers say: records sorted by the file name of their
 /// path, those of one file name in the order in which they were filed. Records stay where they are in memory
 /// until the list is cleared.
@@ -33,9 +42,12 @@ public:
     /// The same for all records of a file name, those of the full path before the others.
     Records recordsOfFileName(const QString &path) const;
 
-    /// The records of files of that name whose own file is gone: what is left of a file that was moved to the
-    /// path.
-    Records recordsOfMovedFile(const QString &path) const;
+    /// What the previous catalogue says of a file found in a folder.
+    struct Knowledge {
+        KnownAs how;
+        Records records; ///< the one that speaks for them first
+    };
+    Knowledge lookUp(const QString &path) const;
 
     /// True when a record of another plug-in holds the identifier.
     bool isIdHeldByOther(const QString &id, const EffectRecord &plugin) const;

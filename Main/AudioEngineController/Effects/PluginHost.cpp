@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FileFinder.h"
 #include "Main/AudioEngineController/Effects/AudioUnitHost.h"
 #include "Main/AudioEngineController/Effects/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
@@ -125,6 +126,7 @@ bool PluginHost::Scan(bool scan, bool)
     if (!m_completed)
         m_completed = std::make_unique<ManualResetEvent>();
     m_completed->reset();
+    FileFinder::forgetReports();
     ReadCatalogue();
     m_scannerPath = QCoreApplication::applicationDirPath() + QLatin1String(kScannerProgram);
     WriteScanList();

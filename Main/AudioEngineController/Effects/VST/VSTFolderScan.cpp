@@ -18,12 +18,9 @@ bool hasNoEntryPoint(const QString &path)
     return findExports(path, {"VSTPluginMain", "main"}) == ExportAnswer::NotExported;
 }
 
-/// Whether the previous catalogue's records do not speak for the file any more.
-bool needsProbe(const KnownList::Records &known, const QString &fileTime)
+/// Whether the record that speaks for a file does not fit it any more.
+bool isOutdated(const EffectRecord &first, const QString &fileTime)
 {
-    if (known.empty())
-        return true;
-    const EffectRecord &first = *known.front();
     if (!first.enabled)
         return first.subId != 0; // all sub-plug-ins of a shell are disabled
     return first.fileTime != fileTime;
@@ -64,13 +61,12 @@ std::vector<ScanItem> VSTFolderScan::arrange(const QStringList &paths)
     std::vector<ScanItem> items;
     items.reserve(sorted.size());
     for (const QString &path : sorted) {
-        KnownList::Records known = host().known().recordsOfPath(path);
+        const KnownList::Knowledge known = host().known().lookUp(path);
         ScanItem item{path, fileTimeText(path), true, {}};
-        item.probe = needsProbe(known, item.fileTime);
-        if (known.empty())
-            known = host().known().recordsOfMovedFile(path);
-        for (const EffectRecord *record : known)
-            item.knownRecords.push_back(*record);
+        item.probe = known.how != KnownAs::Own || isOutdated(*known.records.front(), item.fileTime);
+        if (known.how != KnownAs::Namesake) // files of one name are told apart by their paths
+            for (const EffectRecord *record : known.records)
+                item.knownRecords.push_back(*record);
         items.push_back(std::move(item));
     }
     return items;

@@ -66,23 +66,21 @@ std::vector<ScanItem> VST3FolderScan::arrange(const QStringList &paths)
 
 void VST3FolderScan::decide(const QString &path, std::vector<ScanItem> &queue)
 {
-    const KnownList::Records own = host().known().recordsOfPath(path);
     if (host().isLeftAlone(path)) {
-        keep(own);
+        keep(host().known().recordsOfPath(path));
         return;
     }
-    const KnownList::Records moved = own.empty() ? host().known().recordsOfMovedFile(path) : own;
-    const KnownList::Records known = moved.empty() ? host().known().recordsOfFileName(path) : moved;
+    const KnownList::Knowledge known = host().known().lookUp(path);
     ScanItem item{path, VST3ModuleFile::fileTime(path), true, {}};
-    const bool isMoved = own.empty() && !moved.empty();
-    if (known.empty() || isMoved || isOutdated(*known.front(), item.fileTime)) {
-        for (const EffectRecord *record : known)
+    const bool isSettled = known.how == KnownAs::Own || known.how == KnownAs::Namesake;
+    if (!isSettled || isOutdated(*known.records.front(), item.fileTime)) {
+        for (const EffectRecord *record : known.records)
             item.knownRecords.push_back(*record);
         queue.push_back(std::move(item));
-    } else if (!own.empty()) {
-        keep(own);
+    } else if (known.how == KnownAs::Own) {
+        keep(known.records);
     } else {
-        keepLater(known);
+        keepLater(known.records);
     }
 }
 

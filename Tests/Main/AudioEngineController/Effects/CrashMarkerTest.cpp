@@ -95,6 +95,20 @@ TEST(CrashMarker, TextAndWhatIsReadBack)
     }
 }
 
+TEST(CrashMarker, TextThatIsNoXmlIsReadByItsLines)
+{
+    const QTemporaryDir folder;
+    const QString path = folder.filePath(QStringLiteral("marker"));
+    const EffectRecord record = crashed("/fx/a<b>&.so", "2024-01-02 03:04", "<<", 2147483648u);
+    ASSERT_TRUE(writeMarkerFile(vst2(), path, record));
+    const CapturedLog log;
+    const EffectRecord back = readMarkerFile(vst2(), path);
+    EXPECT_EQ(back.path, record.path);
+    EXPECT_EQ(back.fileTime, record.fileTime);
+    EXPECT_EQ(back.name, record.name);
+    EXPECT_EQ(back.subId, record.subId);
+}
+
 TEST(CrashMarker, EveryTruncationIsRead)
 {
     const QTemporaryDir folder;
