@@ -10,7 +10,7 @@
 namespace {
 
 /// Enough for the handler, whatever the processor's vector registers add to its frame.
-constexpr std::size_t kHandlerStackSize = 256 * 1024;
+constexpr std::size_t kHandlerStackSize = std::size_t(256) * 1024;
 constexpr int kFaultSignals[] = {SIGSEGV, SIGBUS, SIGFPE, SIGILL};
 
 /// One guarded call in progress on this thread.

@@ -17,7 +17,7 @@ int *volatile g_nowhere = nullptr;
 
 [[gnu::noinline]] int overflowStack(int depth)
 {
-    volatile char block[4096];
+    volatile char block[4096] = {};
     block[depth % 4096] = char(depth);
     return depth < 0 ? 0 : overflowStack(depth + 1) + block[0];
 }

@@ -112,7 +112,7 @@ bool repairOwnViolation(const std::string &afterwards)
 
 bool startAlarm(const std::string &seconds)
 {
-    const int count = std::atoi(seconds.c_str());
+    const long count = std::strtol(seconds.c_str(), nullptr, 10);
     alarm(static_cast<unsigned>(count));
     return count > 0;
 }
