@@ -111,14 +111,10 @@ const struct SideEffect {
     const char *kind;
     bool takesValue;
     bool (*cause)(const std::string &value);
-} kSideEffects[] = {{"locale", true, changeLocale},
-                    {"umask", true, changeFileMask},
-                    {"chdir", true, changeWorkingFolder},
-                    {"rounding", true, changeRounding},
-                    {"signal", true, installSignalHandler},
-                    {"alarm", true, startAlarm},
-                    {"repair", true, repairOwnViolation},
-                    {"print", true, printMuch},
+} kSideEffects[] = {{"locale", true, changeLocale},         {"umask", true, changeFileMask},
+                    {"chdir", true, changeWorkingFolder},   {"rounding", true, changeRounding},
+                    {"signal", true, installSignalHandler}, {"alarm", true, startAlarm},
+                    {"repair", true, repairOwnViolation},   {"print", true, printMuch},
                     {"thread", false, leaveThreadRunning}};
 
 const SideEffect *findSideEffect(const std::string &kind)
