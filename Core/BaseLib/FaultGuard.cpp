@@ -2,6 +2,9 @@
 
 #include "Core/BaseLib/FormatText.h"
 
+#include <array>
+#include <cstring>
+
 namespace {
 
 std::string describe(quint32 code)
@@ -17,3 +20,17 @@ SEException::SEException(quint32 code)
     : std::runtime_error(describe(code))
     , m_code(code)
 {}
+
+QString guardedText(const std::exception &exception)
+{
+    std::array<char, 512> text = {};
+    try {
+        callGuarded([&] {
+            if (const char *what = exception.what())
+                std::strncpy(text.data(), what, text.size() - 1);
+        });
+    } catch (...) {
+        return QString();
+    }
+    return QString::fromUtf8(text.data());
+}

@@ -1,6 +1,6 @@
 #pragma once
 
-#include <QtGlobal>
+#include <QString>
 
 #include <stdexcept>
 #include <type_traits>
@@ -56,3 +56,6 @@ auto callGuarded(Function &&function) -> std::invoke_result_t<Function &>
         return call.result;
     }
 }
+
+/// The text of an exception that a stranger threw, whose own code gives it; empty when that code fails.
+QString guardedText(const std::exception &exception);

@@ -52,7 +52,7 @@ void PluginLibrary::leaveMapped() { m_handle = nullptr; }
 
 void PluginLibrary::freeUnlessRunning()
 {
-    if (m_handle && !useProcessCache && !threadsSettleTo(m_threadsBefore, kThreadPatience)) {
+    if (m_handle && !useProcessCache && !newThreadsEnd(m_threadsBefore, kThreadPatience)) {
         DebugLog(L"%ls left threads running and stays in memory", m_path);
         leaveMapped();
     }

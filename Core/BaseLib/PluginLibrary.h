@@ -2,6 +2,7 @@
 
 #include <QString>
 
+#include <set>
 #include <string>
 
 /// One dynamic library handle. Loading runs the library's own start-up code on the calling thread.
@@ -50,6 +51,6 @@ private:
 
     void *m_handle = nullptr;
     QString m_path;
-    int m_threadsBefore = 0; ///< threads of the process before the library was loaded
+    std::set<int> m_threadsBefore; ///< threads of the process before the library was loaded
     QString m_errorText;
 };

@@ -1,10 +1,11 @@
 #pragma once
 
 #include <chrono>
+#include <set>
 
-/// How many threads this process runs now; 0 when the system does not tell.
-int runningThreads();
+/// The system's identifiers of the threads that this process runs now; none when the system does not tell.
+std::set<int> runningThreads();
 
-/// True when no more than `allowed` threads run, waiting up to `patience` for threads that are just ending: a
-/// joined thread may still be counted for a moment.
-bool threadsSettleTo(int allowed, std::chrono::milliseconds patience);
+/// True when no other threads run than those given, waiting up to `patience` for new ones that are just
+/// ending: a joined thread may still be listed for a moment.
+bool newThreadsEnd(const std::set<int> &before, std::chrono::milliseconds patience);

@@ -39,8 +39,9 @@ std::optional<QString> XMLElement::attribute(const char *name) const
     return QString::fromUtf8(found.value());
 }
 
-XMLDocument::XMLDocument()
-    : m_document(std::make_unique<pugi::xml_document>())
+XMLDocument::XMLDocument(Entities entities)
+    : m_entities(entities)
+    , m_document(std::make_unique<pugi::xml_document>())
 {}
 
 XMLDocument::~XMLDocument() = default;
@@ -58,8 +59,10 @@ bool XMLDocument::load(const QString &path)
 
 bool XMLDocument::parse(const QByteArray &xml)
 {
+    const unsigned options =
+        m_entities == Entities::Decoded ? kParseOptions : kParseOptions & ~pugi::parse_escapes;
     const pugi::xml_parse_result result =
-        m_document->load_buffer(xml.constData(), static_cast<std::size_t>(xml.size()), kParseOptions);
+        m_document->load_buffer(xml.constData(), static_cast<std::size_t>(xml.size()), options);
     m_error.clear();
     if (!result) {
         m_document->reset();

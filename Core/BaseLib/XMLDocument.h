@@ -40,7 +40,11 @@ private:
 /// An XML file held in memory, queried by element name.
 class XMLDocument {
 public:
-    XMLDocument();
+    /// How "&amp;" and its like are read: as the characters that they stand for, or as they stand, for files
+    /// whose writers escape nothing.
+    enum class Entities { Decoded, Literal };
+
+    explicit XMLDocument(Entities entities = Entities::Decoded);
     ~XMLDocument();
     XMLDocument(const XMLDocument &) = delete;
     XMLDocument &operator=(const XMLDocument &) = delete;
@@ -57,6 +61,7 @@ public:
     XMLElement root(const char *name) const;
 
 private:
+    Entities m_entities;
     std::unique_ptr<pugi::xml_document> m_document;
     QString m_error;
 };

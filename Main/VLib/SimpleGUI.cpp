@@ -60,7 +60,7 @@ bool SimpleGUIDetail::askUser(const QString &text)
 int userMessageBox(const QString &text, int flags)
 {
     if (const auto ui = installedVUI())
-        return ui->messageBox(text, flags);
+        return ui->messageBox(cutText(text, kMaxUserMessage), flags);
     DebugLog(L"UserMessageBox");
     DebugLog(L": No globalUi - using AfxMessageBox");
     reportAssertion("0", SourcePlace{"Main/VLib/SimpleGUI", 216});

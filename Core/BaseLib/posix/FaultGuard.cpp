@@ -71,13 +71,17 @@ void arm()
 {
     thread_local const HandlerStack stack;
     stack.install();
+    sigset_t signals;
+    sigemptyset(&signals);
     for (const int number : kFaultSignals) {
+        sigaddset(&signals, number);
         struct sigaction action = {};
         action.sa_sigaction = onFault;
         action.sa_flags = SA_SIGINFO | SA_ONSTACK;
         sigemptyset(&action.sa_mask);
         sigaction(number, &action, nullptr);
     }
+    pthread_sigmask(SIG_UNBLOCK, &signals, nullptr);
 }
 
 /// Makes a guard the innermost one of its thread for a scope.

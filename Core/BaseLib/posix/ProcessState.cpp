@@ -14,6 +14,7 @@
 #include <fcntl.h>
 #include <locale.h>
 #include <sys/stat.h>
+#include <sys/time.h>
 #include <unistd.h>
 
 namespace {
@@ -70,7 +71,10 @@ ProcessState::~ProcessState()
 
 void ProcessState::restore() const
 {
-    alarm(0);
+    for (const int timer : {ITIMER_REAL, ITIMER_VIRTUAL, ITIMER_PROF}) {
+        const itimerval none = {};
+        setitimer(static_cast<__itimer_which_t>(timer), &none, nullptr);
+    }
     for (int number = 1; number < NSIG; ++number) {
         const SignalAction &entry = m_snapshot->actions[static_cast<std::size_t>(number)];
         struct sigaction current = {};

@@ -1,18 +1,18 @@
 #include "Core/BaseLib/ThreadCount.h"
 
+#include <cstdlib>
+
 #include <dirent.h>
 
-int runningThreads()
+std::set<int> runningThreads()
 {
-    // One entry per thread (proc(5)); a stat of the folder would not do, its link count is not kept up
-    // everywhere.
-    DIR *tasks = opendir("/proc/self/task");
+    std::set<int> threads;
+    DIR *tasks = opendir("/proc/self/task"); // one entry per thread (proc(5))
     if (!tasks)
-        return 0;
-    int count = 0;
+        return threads;
     while (const dirent *entry = readdir(tasks))
         if (entry->d_name[0] != '.')
-            ++count;
+            threads.insert(static_cast<int>(std::strtol(entry->d_name, nullptr, 10)));
     closedir(tasks);
-    return count;
+    return threads;
 }

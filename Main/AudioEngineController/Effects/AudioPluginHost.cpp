@@ -108,6 +108,7 @@ void AudioPluginHost::ReadCatalogue()
     const TAutoLockCS lock(&m_ks);
     m_known.clear();
     m_leftAlone.clear();
+    m_heldMarkers.clear();
     readKnownRecords();
     absorbMarkers();
 }
@@ -119,8 +120,11 @@ void AudioPluginHost::readKnownRecords()
     if (!QFile::exists(path))
         return;
     const CatalogueContents contents = readCatalogueFile(*m_format, path);
-    if (!contents)
+    if (!contents) {
         DebugLog(L"Cannot use the catalogue %ls: %ls", path, contents.reason);
+        for (const EffectRecord &crash : salvageCrashes(*m_format, path))
+            m_known.file(crash);
+    }
     for (const EffectRecord &record : contents.records)
         m_known.file(record);
     m_catalogueOutdated = contents.upgraded;
@@ -135,22 +139,36 @@ void AudioPluginHost::absorbMarkers()
     std::vector<EffectRecord> markers;
     std::set<QString> filesWithCrashedChild;
     for (const QString &path : paths) {
-        markers.push_back(readMarkerFile(m_format->marker, path));
+        markers.push_back(ReadCrashMarker(path));
         if (markers.back().subId != 0)
             filesWithCrashedChild.insert(markers.back().path);
     }
-    for (const EffectRecord &marker : markers) {
+    QStringList absorbed;
+    for (std::size_t index = 0; index < markers.size(); ++index) {
+        const EffectRecord &marker = markers[index];
+        const QString &path = paths.at(static_cast<int>(index));
+        (isMarkerWithoutRecord(marker) ? m_heldMarkers : absorbed).append(path);
         // The marker of a whole shell is there beside its child's; the child is the culprit.
         if (marker.subId != 0 || filesWithCrashedChild.count(marker.path) == 0)
             absorbMarker(marker);
     }
-    if (paths.isEmpty())
-        return;
-    if (!writeKnownRecords())
-        return; // The markers stay: nothing else holds what they say.
+    if (absorbed.isEmpty() || !writeKnownRecords())
+        return; // Markers stay where nothing else holds what they say.
     m_catalogueOutdated = false;
-    for (const QString &path : paths)
+    for (const QString &path : absorbed)
         QFile::remove(path);
+}
+
+EffectRecord AudioPluginHost::ReadCrashMarker(const QString &marker) const
+{
+    return readMarkerFile(m_format->marker, marker);
+}
+
+void AudioPluginHost::releaseHeldMarkers()
+{
+    for (const QString &path : m_heldMarkers)
+        QFile::remove(path);
+    m_heldMarkers.clear();
 }
 
 bool AudioPluginHost::writeKnownRecords()
@@ -178,11 +196,14 @@ void AudioPluginHost::absorbMarker(const EffectRecord &marker)
 
 QString AudioPluginHost::freeIdentifier(const EffectRecord &plugin, const QString &name) const
 {
+    if (plugin.path.isEmpty())
+        return name; // of an unreadable marker: nothing to tell apart
     const QString candidates[] = {name, plugin.path,
                                   plugin.path + QLatin1Char(':') + QString::number(plugin.subId)};
     for (const QString &candidate : candidates) {
         const EffectRecord *listed = m_effects.find(candidate);
-        if (!(listed && !listed->isSamePlugin(plugin)) && !m_known.isIdHeldByOther(candidate, plugin))
+        if (!candidate.isEmpty() && !(listed && !listed->isSamePlugin(plugin)) &&
+            !m_known.isIdHeldByOther(candidate, plugin))
             return candidate;
     }
     return candidates[2];
@@ -215,7 +236,7 @@ QString AudioPluginHost::WriteCrashMarker(const EffectRecord &plugin, const QStr
     return marker;
 }
 
-void AudioPluginHost::WriteCatalogue(const WaitingRecords &waiting, Durability durability)
+bool AudioPluginHost::WriteCatalogue(const WaitingRecords &waiting, Durability durability)
 {
     const TAutoLockCS lock(&m_ks);
     std::vector<const QByteArray *> texts;
@@ -228,7 +249,7 @@ void AudioPluginHost::WriteCatalogue(const WaitingRecords &waiting, Durability d
     }
     for (; next != waiting.end(); ++next)
         texts.push_back(&textOf(*m_format, next->second));
-    writeRecords(texts, durability);
+    return writeRecords(texts, durability);
 }
 
 bool AudioPluginHost::writeRecords(const std::vector<const QByteArray *> &records, Durability durability)

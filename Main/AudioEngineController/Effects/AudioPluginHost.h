@@ -48,13 +48,20 @@ public:
     virtual bool AddEffect(const EffectRecord &record);
 
     /// Writes the effect list, and with it the records of files still waiting for their probe, to the
-    /// catalogue file. A file that cannot be written is logged and stays as it was.
-    void WriteCatalogue(const WaitingRecords &waiting = {}, Durability durability = Durability::Synced);
+    /// catalogue file. A file that cannot be written is logged and stays as it was; false then.
+    bool WriteCatalogue(const WaitingRecords &waiting = {}, Durability durability = Durability::Synced);
 
     /// Writes the crash marker for a plug-in that is about to be touched and gives its full path. A null name
     /// is made from the record's path. A marker that cannot be written is logged; the plug-in is probed
     /// unprotected.
     QString WriteCrashMarker(const EffectRecord &plugin, const QString &name = QString());
+
+    /// Reads a crash marker into a fresh record that is not enabled. The file stays: it is deleted once the
+    /// catalogue holds what it said.
+    EffectRecord ReadCrashMarker(const QString &marker) const;
+    /// Deletes the markers of files that are left alone. Called when a scan has come to its end: until then
+    /// another crash must not bring those files back.
+    void releaseHeldMarkers();
 
     /// Completes the record of a file, or of a sub-plug-in, that failed to load or lists nothing: named after
     /// the file (a sub-plug-in keeps its name), enabled, not working, so that it is shown and not probed
@@ -116,6 +123,7 @@ private:
     KnownList m_known;
     EffectList m_effects;
     std::set<QString> m_leftAlone;
+    QStringList m_heldMarkers; ///< of the files left alone
     bool m_catalogueOutdated = false;
     std::atomic<bool> m_cancelled{false};
 };

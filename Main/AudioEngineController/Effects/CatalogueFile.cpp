@@ -1,5 +1,7 @@
 #include "Main/AudioEngineController/Effects/CatalogueFile.h"
 
+#include <QList>
+
 namespace {
 
 EffectRecord readRecord(const CatalogueFormat &format, const XMLElement &effect)
@@ -22,12 +24,23 @@ void upgradeRecord(const CatalogueFormat &format, double version, EffectRecord &
         record.category = 0;
 }
 
+/// A line of ours with its content escaped; lines of any other form as they are.
+QByteArray escapedLine(const QByteArray &line)
+{
+    const int start = line.indexOf('>') + 1;
+    const int end = line.lastIndexOf("</");
+    if (start <= 0 || end < start)
+        return line;
+    const QByteArray content = QString::fromUtf8(line.mid(start, end - start)).toHtmlEscaped().toUtf8();
+    return line.left(start) + content + line.mid(end);
+}
+
 } // namespace
 
 CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path)
 {
     CatalogueContents contents;
-    XMLDocument document;
+    XMLDocument document(XMLDocument::Entities::Literal);
     if (!document.load(path)) {
         contents.reason = document.error();
         return contents;
@@ -49,6 +62,28 @@ CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString
         upgradeRecord(format, version, contents.records.back());
     }
     return contents;
+}
+
+std::vector<EffectRecord> salvageCrashes(const CatalogueFormat &format, const QString &path)
+{
+    std::vector<EffectRecord> crashes;
+    QByteArray content;
+    QByteArray block;
+    if (!readWholeFile(path, content))
+        return crashes;
+    const QList<QByteArray> lines = content.replace("\r\n", "\n").split('\n');
+    for (const QByteArray &line : lines) {
+        if (line == "\t<Effect>")
+            block.clear();
+        block += escapedLine(line) + '\n';
+        XMLDocument document;
+        if (line != "\t</Effect>" || !document.parse(block))
+            continue;
+        const EffectRecord record = readRecord(format, document.root("Effect"));
+        if (!record.enabled && !record.working)
+            crashes.push_back(record);
+    }
+    return crashes;
 }
 
 QByteArray xmlHeaderLine() { return QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>") + kLineEnd; }

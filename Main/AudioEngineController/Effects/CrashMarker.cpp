@@ -65,6 +65,8 @@ void readRawMarker(const QString &marker, EffectRecord &record)
     record.fileTime = rawElement(text, "Created");
     record.name = rawElement(text, "Name");
     record.subId = static_cast<quint32>(parseInteger(rawElement(text, "SubID")));
+    if (record.subId != 0)
+        record.subName = record.name;
 }
 
 } // namespace
@@ -106,7 +108,7 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
 {
     EffectRecord record;
     record.enabled = false;
-    XMLDocument document;
+    XMLDocument document(XMLDocument::Entities::Literal);
     if (!document.load(marker)) {
         DebugLog(L"Cannot read the crash marker %ls: %ls", marker, document.error());
         readRawMarker(marker, record);
@@ -116,8 +118,12 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
     record.path = crashed.child("Path").text();
     record.fileTime = crashed.child("Created").text();
     record.name = crashed.child("Name").text();
-    if (format.hasSubId)
-        record.subId = static_cast<quint32>(parseInteger(crashed.child("SubID").text()));
+    // The last one: a name, which is not escaped, may hold something that looks like another.
+    const std::vector<XMLElement> ids = crashed.children("SubID");
+    if (format.hasSubId && !ids.empty())
+        record.subId = static_cast<quint32>(parseInteger(ids.back().text()));
+    if (record.subId != 0)
+        record.subName = record.name;
     return record;
 }
 

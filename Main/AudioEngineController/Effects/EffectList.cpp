@@ -20,7 +20,8 @@ bool EffectList::add(const EffectRecord &record)
     if (!isNew)
         return false;
     entry->second.record = record;
-    if (!m_names.insert(record.name).second)
+    entry->second.ownsName = m_names.insert(record.name).second;
+    if (!entry->second.ownsName)
         NameFromPath(entry->second.record);
     return true;
 }
@@ -39,6 +40,7 @@ void EffectList::remove(const QString &id)
     const auto entry = m_entries.find(id);
     if (entry == m_entries.end())
         return;
-    m_names.erase(entry->second.record.name);
+    if (entry->second.ownsName)
+        m_names.erase(entry->second.record.name);
     m_entries.erase(entry);
 }

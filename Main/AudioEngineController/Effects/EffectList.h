@@ -12,6 +12,7 @@
 struct ListedEffect {
     EffectRecord record;
     mutable QByteArray rendered;
+    bool ownsName = false; ///< the name counts as used because of this record
 };
 
 /// Old records of files that still wait for their probe, sorted by identifier: interim writes carry them, so

@@ -2,6 +2,18 @@
 
 QString fileNameOf(const QString &path) { return path.mid(path.lastIndexOf(QLatin1Char('/')) + 1); }
 
+void takeMarks(EffectRecord &record, const EffectRecord &old)
+{
+    record.favourite = old.favourite;
+    // A file that failed at first has no category of its own to hand on.
+    if (old.working || old.category != 0)
+        record.category = old.category;
+    if (!old.isSwitchedOff())
+        return;
+    record.enabled = false;
+    record.working = true;
+}
+
 bool NameFromPath(EffectRecord &record)
 {
     const int dot = record.path.lastIndexOf(QLatin1Char('.'));

@@ -34,6 +34,11 @@ struct EffectRecord {
 /// The last component of a path.
 QString fileNameOf(const QString &path);
 
+/// Takes over the marks that the user set on an old record of the same plug-in: favourite, category, and the
+/// switch-off. A plug-in that is switched off stays so, and is not shown as failed, also when it fails to
+/// load.
+void takeMarks(EffectRecord &record, const EffectRecord &old);
+
 /// Gives the record a name made from its path: the file name up to its last ".", with the first "x64", then
 /// the first
 /// "_64", then the first " 64bit" taken out. False, and no change, for a path without a ".".

@@ -40,6 +40,7 @@ void FolderScan::scan()
         finish();
     else
         finishCancelled();
+    m_host.releaseHeldMarkers();
 }
 
 bool FolderScan::isCancelled() const
@@ -127,11 +128,7 @@ void FolderScan::finish()
         write(Durability::Synced);
 }
 
-void FolderScan::write(Durability durability)
-{
-    m_host.WriteCatalogue(m_waiting, durability);
-    m_written = true;
-}
+void FolderScan::write(Durability durability) { m_written |= m_host.WriteCatalogue(m_waiting, durability); }
 
 void FolderScan::addWaiting(const EffectRecord &record)
 {

@@ -47,6 +47,8 @@ protected:
     void showItemProgress();
     /// Adds what is known of a file to the effect list as it stands.
     void keep(const KnownList::Records &records);
+    /// True when this run has probed the file.
+    bool wasProbed(const QString &path) const { return m_probed.count(path) != 0; }
     /// Has interim writes carry a known record that this run has not settled yet.
     void addWaiting(const EffectRecord &record);
     /// True when the user, the host or the system asked the scan to stop.

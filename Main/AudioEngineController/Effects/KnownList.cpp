@@ -31,9 +31,11 @@ bool KnownList::file(const EffectRecord &record)
 EffectRecord *KnownList::recordForCrash(const EffectRecord &marker)
 {
     for (const EffectRecord *record : recordsOfFileName(marker.path)) {
-        const bool applies = marker.subId != 0 ? record->isSamePlugin(marker)
-                                               : record->path == marker.path || !QFile::exists(record->path);
-        if (applies)
+        const bool isSame = record->isSamePlugin(marker);
+        // The crash of a whole shell is none of its sub-plug-ins': their records stay, beside a new one for
+        // the file.
+        const bool isMoved = marker.subId == 0 && record->subId == 0 && !QFile::exists(record->path);
+        if (isSame || isMoved)
             return const_cast<EffectRecord *>(record); // one of ours, handed out as const
     }
     return nullptr;

@@ -56,7 +56,8 @@ PluginHost::~PluginHost() = default;
 void PluginHost::initialise(const QString &dataFolder, const QString &previousEffectsFolder, int sampleRate,
                             int blockSize)
 {
-    setCatalogueFolder(dataFolder + QStringLiteral("/Effects"));
+    // Absolute: a plug-in may change the working folder while its marker must be found.
+    setCatalogueFolder(QFileInfo(dataFolder + QStringLiteral("/Effects")).absoluteFilePath());
     m_pluginMetadataFolder = dataFolder + QStringLiteral("/Plugin Metadata");
     for (const auto &host : m_hosts)
         host->setCatalogueFolder(effectsFolder());

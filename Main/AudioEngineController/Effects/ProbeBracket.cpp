@@ -4,6 +4,8 @@
 #include "Main/AudioEngineController/Effects/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
 
+#include <QCoreApplication>
+
 ProbeBracket::ProbeBracket(AudioPluginHost &host, const ProcessState &state, const EffectRecord &plugin,
                            const QString &name)
     : m_state(state)
@@ -12,6 +14,9 @@ ProbeBracket::ProbeBracket(AudioPluginHost &host, const ProcessState &state, con
 
 ProbeBracket::~ProbeBracket()
 {
+    // Events that the plug-in left for this thread lead into its code: they come while its marker still
+    // stands.
+    QCoreApplication::processEvents();
     m_state.restore();
     ActiveMarkers::remove(m_marker);
 }

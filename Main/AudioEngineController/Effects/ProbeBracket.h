@@ -12,8 +12,8 @@ class AudioPluginHost;
 /// on the scan worker.
 class ProbeBracket {
 public:
-    /// Writes the marker for the plug-in (path, file time and sub-plug-in count); a null name is made from
-    /// its path. `state` must outlive the bracket.
+    /// Writes the marker for the plug-in (path, file time and sub-plug-in identifier); a null name is made
+    /// from its path. `state` must outlive the bracket.
     ProbeBracket(AudioPluginHost &host, const ProcessState &state, const EffectRecord &plugin,
                  const QString &name = QString());
     /// Puts the process state back and deletes the marker.

@@ -32,14 +32,14 @@ TEST(ManualResetEvent, StaysSetForEveryWaiterUntilReset)
 
 TEST(ThreadCount, SeesAThreadThatIsLeftBehind)
 {
-    const int before = runningThreads();
+    const std::set<int> before = runningThreads();
     ManualResetEvent mayEnd;
     std::thread left([&mayEnd] { mayEnd.waitFor(kLong); });
-    EXPECT_EQ(runningThreads(), before + 1);
-    EXPECT_FALSE(threadsSettleTo(before, kAtOnce));
+    EXPECT_EQ(runningThreads().size(), before.size() + 1);
+    EXPECT_FALSE(newThreadsEnd(before, kAtOnce));
     mayEnd.set();
     left.join();
-    EXPECT_TRUE(threadsSettleTo(before, kLong));
+    EXPECT_TRUE(newThreadsEnd(before, kLong));
 }
 
 TEST(TerminationWatcher, AsksOnceAndThenRemindsAfterTheGrace)

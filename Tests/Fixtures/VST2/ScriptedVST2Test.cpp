@@ -326,9 +326,9 @@ TEST_F(ScriptedVST2, OwnViolationsAreRepaired)
 
 TEST_F(ScriptedVST2, ThreadsOfEffectsThatWereNotClosedDieWithTheModule)
 {
-    const int threads = runningThreads();
+    const std::set<int> threads = runningThreads();
     dispatch(enterNew("own-thread\n"), effClose);
-    EXPECT_TRUE(threadsSettleTo(threads, std::chrono::seconds(30)));
+    EXPECT_TRUE(newThreadsEnd(threads, std::chrono::seconds(30)));
     const auto unload = [this] {
         std::signal(SIGSEGV, SIG_DFL);
         enterNew("own-thread\n");

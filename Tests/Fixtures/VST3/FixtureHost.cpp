@@ -166,7 +166,7 @@ std::vector<std::string> processState()
             "folder " + std::filesystem::current_path().string(),
             "rounding " + std::to_string(std::fegetround()),
             std::string("signal ") + (termination.sa_handler == SIG_DFL ? "default" : "handled"),
-            "threads " + std::to_string(runningThreads())};
+            "threads " + std::to_string(runningThreads().size())};
 }
 
 void sayWhatChanged(const std::vector<std::string> &before)

@@ -38,7 +38,7 @@ std::optional<VSTEffect::Fields> VSTEffect::fields() const
         });
     } catch (const SEException &fault) {
         if (!vstExceptionFilter(fault.code()))
-            throw;
+            throw; // nothing that reading does: for the guards around
         return std::nullopt;
     }
     return fields;
@@ -95,7 +95,7 @@ VstIntPtr VSTEffect::call(VstInt32 opcode, VstIntPtr value, void *pointer, float
         m_faulted = true;
         DebugLog(L"VST plug-in call %d: %s", opcode, fault.what());
     } catch (const std::exception &exception) {
-        DebugLog(L"VST plug-in call %d threw: %s", opcode, exception.what());
+        DebugLog(L"VST plug-in call %d threw: %ls", opcode, guardedText(exception));
     } catch (...) {
         DebugLog(L"VST plug-in call %d threw something that is no standard exception", opcode);
     }

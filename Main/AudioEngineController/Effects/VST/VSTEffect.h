@@ -6,8 +6,9 @@
 
 #include <optional>
 
-/// The checking wrapper around a plug-in's `AEffect`: it alone holds the pointer and calls the plug-in. Every
-/// call is guarded: what the plug-in throws or faults ends in a log line and a neutral answer. Scan worker.
+/// The checking wrapper around a plug-in's `AEffect`: it alone holds the pointer and calls the dispatcher.
+/// Every call is guarded: what the plug-in throws or faults ends in a log line and a neutral answer. Scan
+/// worker.
 class VSTEffect {
 public:
     /// The fields that are read, as they stood when asked.

@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FaultGuard.h"
 #include "Core/BaseLib/FileTime.h"
 #include "Main/AudioEngineController/Effects/ProbeBracket.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
@@ -9,13 +10,20 @@
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
+#include <QFileInfo>
+
 #include <algorithm>
 
 namespace {
 
 bool hasNoEntryPoint(const QString &path)
 {
-    return findExports(path, {"VSTPluginMain", "main"}) == ExportAnswer::NotExported;
+    try {
+        const auto ask = [&] { return findExports(path, {"VSTPluginMain", "main"}); };
+        return callGuarded(ask) == ExportAnswer::NotExported;
+    } catch (const SEException &) {
+        return false; // the file shrank while it was read; loading decides
+    }
 }
 
 /// Whether the record that speaks for a file does not fit it any more.
@@ -41,11 +49,8 @@ void carryMarks(const ScanItem &item, EffectRecord &record)
     const EffectRecord *source = ownRecord(item, record);
     if (!source && !item.knownRecords.empty() && item.knownRecords.front().enabled)
         source = &item.knownRecords.front();
-    if (!source)
-        return;
-    record.category = source->category;
-    record.favourite = source->favourite;
-    record.enabled = !source->isSwitchedOff();
+    if (source)
+        takeMarks(record, *source);
 }
 
 } // namespace
@@ -61,6 +66,8 @@ std::vector<ScanItem> VSTFolderScan::arrange(const QStringList &paths)
     std::vector<ScanItem> items;
     items.reserve(sorted.size());
     for (const QString &path : sorted) {
+        if (!QFileInfo(path).isFile()) // a folder of that name; or a pipe, which would be waited for
+            continue;
         const KnownList::Knowledge known = host().known().lookUp(path);
         ScanItem item{path, fileTimeText(path), true, {}};
         item.probe = known.how != KnownAs::Own || isOutdated(*known.records.front(), item.fileTime);
@@ -93,14 +100,32 @@ bool VSTFolderScan::probe(const ScanItem &item)
     showScanning(fileNameOf(item.path));
     const ProbeBracket bracket(host(), processState(), file);
     DebugTrace(L"Probing %ls", item.path);
-    VSTPlugin plugin(m_vstHost); // unloads its module before the bracket deletes the marker
+    std::vector<EffectRecord> children; // outlive the plug-in, whose end still closes them
+    VSTPlugin plugin(m_vstHost);        // unloads its module before the bracket deletes the marker
+    plugin.setCloseBracket([&](VstInt32 shellId) { return bracketOfChild(children, shellId); });
     bool isPluginModule = true;
     if (!plugin.load(item.path, VSTHostCallback, isPluginModule)) {
         DebugLog(L"%ls, Didn't manage it", item.path);
         return isPluginModule && addFailed(item, file);
     }
     plugin.readInto(file);
-    return file.vstCategory == kPlugCategShell ? expandShell(item, plugin, file) : addProbed(item, file);
+    if (file.vstCategory != kPlugCategShell)
+        return addProbed(item, file);
+    for (const VSTSubPlugin &sub : plugin.subPlugins()) {
+        children.push_back(file);
+        children.back().name = children.back().subName = sub.name;
+        children.back().subId = sub.id;
+    }
+    return children.empty() ? addFailed(item, file) : expandShell(item, plugin, children, bracket);
+}
+
+std::shared_ptr<ProbeBracket> VSTFolderScan::bracketOfChild(const std::vector<EffectRecord> &children,
+                                                            VstInt32 shellId)
+{
+    for (const EffectRecord &child : children)
+        if (child.subId == static_cast<quint32>(shellId))
+            return std::make_shared<ProbeBracket>(host(), processState(), child, child.subName);
+    return nullptr;
 }
 
 bool VSTFolderScan::addProbed(const ScanItem &item, EffectRecord record)
@@ -118,23 +143,21 @@ bool VSTFolderScan::addFailed(const ScanItem &item, EffectRecord record)
     return addProbed(item, record);
 }
 
-bool VSTFolderScan::expandShell(const ScanItem &item, VSTPlugin &plugin, const EffectRecord &shell)
+bool VSTFolderScan::expandShell(const ScanItem &item, VSTPlugin &plugin,
+                                const std::vector<EffectRecord> &children, const ProbeBracket &bracket)
 {
-    const std::vector<VSTSubPlugin> children = plugin.subPlugins();
     if (progress())
         progress()->setRange(static_cast<int>(children.size()), QStringLiteral("Scanning WaveShell"));
     bool added = false;
     int done = 0;
-    for (const VSTSubPlugin &sub : children) {
-        EffectRecord child = shell;
-        child.name = child.subName = sub.name;
-        child.subId = sub.id;
+    for (const EffectRecord &child : children) {
         added |= addChild(item, plugin, child);
+        bracket.showProgress();
         if (progress())
             progress()->setValue(++done);
     }
     showItemProgress();
-    return children.empty() ? addFailed(item, shell) : added;
+    return added;
 }
 
 bool VSTFolderScan::addChild(const ScanItem &item, VSTPlugin &plugin, const EffectRecord &child)

@@ -87,8 +87,11 @@ bool VSTHost::AddEffect(const EffectRecord &record)
         return AudioPluginHost::AddEffect(record);
     if (waveShellVersion(fileNameOf(record.path)) <= waveShellVersion(fileNameOf(stored->path)))
         return false;
+    EffectRecord later = record;
+    if (later.category == 0 && !later.favourite && later.enabled)
+        takeMarks(later, *stored);
     effectList().remove(record.id);
-    return AudioPluginHost::AddEffect(record);
+    return AudioPluginHost::AddEffect(later);
 }
 
 std::unique_ptr<VSTPlugin> VSTHost::loadByKey(const QString &key)

@@ -32,7 +32,8 @@ private:
 } // namespace VSTCallbackNesting
 
 /// The one function through which every VST 2 plug-in talks to the host (the `audioMasterCallback` of the
-/// interface). Any thread. Answers from the settings of `VSTHost::instance()`; trusts no pointer of the
-/// plug-in beyond reading from it, and takes no lock that a scan holds while it calls a plug-in.
+/// interface). Any thread. Answers from the settings of `VSTHost::instance()`; checks pointers of the
+/// plug-in for null and uses them only for what the opcode says, and takes no lock that a scan holds while it
+/// calls a plug-in.
 VstIntPtr VSTHostCallback(AEffect *effect, VstInt32 opcode, VstInt32 index, VstIntPtr value, void *ptr,
                           float opt);

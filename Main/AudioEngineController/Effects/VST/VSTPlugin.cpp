@@ -118,7 +118,7 @@ AEffect *VSTPlugin::enter(void *entryPoint, VSTHostCallbackFunction callback)
         m_faulted = true;
         DebugLog(L"VST plug-in entry point: %s", fault.what());
     } catch (const std::exception &exception) {
-        DebugLog(L"VST plug-in entry point threw: %s", exception.what());
+        DebugLog(L"VST plug-in entry point threw: %ls", guardedText(exception));
     } catch (...) {
         DebugLog(L"VST plug-in entry point threw something that is no standard exception");
     }
@@ -130,9 +130,9 @@ bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
 {
     m_faulted |= m_effect.hasFaulted();
     m_effect = effect;
-    const auto isSame = [&](const VSTEffect &other) { return other.isSame(effect); };
+    const auto isSame = [&](const HandedOut &other) { return other.effect.isSame(effect); };
     if (std::none_of(m_handedOut.begin(), m_handedOut.end(), isSame))
-        m_handedOut.push_back(effect);
+        m_handedOut.push_back({effect, m_shellId});
     try {
         m_effect.setOwner(this);
     } catch (const SEException &fault) {
@@ -175,6 +175,7 @@ VstInt32 VSTPlugin::statedCategory()
 void VSTPlugin::readInto(EffectRecord &record)
 {
     record.vstCategory = statedCategory();
+    m_fields = m_effect.fields().value_or(m_fields); // the calls may have changed them
     record.behaviour = m_behaviour;
     record.vendor = widen(m_effect.dispatchText(effGetVendorString, kVendorSize).bytes);
     record.width = m_fields.numOutputs;
@@ -201,13 +202,15 @@ std::vector<VSTSubPlugin> VSTPlugin::subPlugins()
 
 void VSTPlugin::closeEffects()
 {
-    std::vector<VSTEffect> effects;
+    std::vector<HandedOut> effects;
     effects.swap(m_handedOut);
     m_faulted |= m_effect.hasFaulted();
     m_effect = VSTEffect();
-    for (auto effect = effects.rbegin(); effect != effects.rend() && !m_faulted; ++effect) {
-        effect->dispatch(effClose);
-        m_faulted |= effect->hasFaulted();
+    for (auto entry = effects.rbegin(); entry != effects.rend() && !m_faulted; ++entry) {
+        const bool isBracketed = m_closeBracket && entry->shellId != 0;
+        const std::shared_ptr<void> bracket = isBracketed ? m_closeBracket(entry->shellId) : nullptr;
+        entry->effect.dispatch(effClose);
+        m_faulted |= entry->effect.hasFaulted();
     }
 }
 

@@ -7,6 +7,8 @@
 #include <QString>
 
 #include <atomic>
+#include <functional>
+#include <memory>
 #include <vector>
 
 class VSTHost;
@@ -27,6 +29,10 @@ public:
     /// More sub-plug-ins than any shell has: an enumeration that goes on beyond is cut.
     static constexpr int kMaxSubPlugins = 4096;
 
+    /// Gives an object that lives while the effect of a sub-plug-in is closed; null for an effect that needs
+    /// none.
+    using CloseBracket = std::function<std::shared_ptr<void>(VstInt32 shellId)>;
+
     explicit VSTPlugin(VSTHost &host);
     /// Releases the plug-in (`effClose` to every effect that the module handed out) and unloads its module.
     ~VSTPlugin();
@@ -44,6 +50,8 @@ public:
     void readInto(EffectRecord &record);
     /// Asks a shell for its sub-plug-ins, each identifier once.
     std::vector<VSTSubPlugin> subPlugins();
+
+    void setCloseBracket(CloseBracket bracket) { m_closeBracket = std::move(bracket); }
 
     const QString &name() const { return m_name; }
     /// Name, colon and unique id: the identifier in the catalogue.
@@ -71,6 +79,12 @@ public:
     void refreshDisplay() {}
 
 private:
+    /// An effect of the module, and the sub-plug-in it was made for (0: none).
+    struct HandedOut {
+        VSTEffect effect;
+        VstInt32 shellId;
+    };
+
     VSTEffect callEntryPoint(const QString &path, VSTHostCallbackFunction callback, bool &isPluginModule);
     AEffect *enter(void *entryPoint, VSTHostCallbackFunction callback);
     bool adopt(const VSTEffect &effect, const QString &path);
@@ -85,9 +99,10 @@ private:
     bool m_loaded = false;
     bool m_faulted = false; ///< a hardware fault was caught in this module: it is neither closed nor unloaded
     VSTEffect m_effect;
-    std::vector<VSTEffect> m_handedOut; ///< every effect of the module that was not closed yet, in order
+    std::vector<HandedOut> m_handedOut; ///< every effect of the module that was not closed yet, in order
+    CloseBracket m_closeBracket;
     VSTEffect::Fields m_fields = {};
-    VstInt32 m_shellId = 0;
+    std::atomic<VstInt32> m_shellId{0};
     bool m_isProbe = false;
     QString m_name;
     QString m_key;

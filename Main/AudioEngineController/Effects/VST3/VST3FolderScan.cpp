@@ -33,14 +33,8 @@ const EffectRecord *sourceOfMarks(const std::vector<EffectRecord> &known, const 
 /// The marks of the user outlive a new probe.
 void carryMarks(const std::vector<EffectRecord> &known, EffectRecord &record)
 {
-    const EffectRecord *source = sourceOfMarks(known, record);
-    if (!source)
-        return;
-    record.favourite = source->favourite;
-    record.enabled = !source->isSwitchedOff();
-    // A file that failed at first has no category of its own to hand on.
-    if (source->working || source->category != 0)
-        record.category = source->category;
+    if (const EffectRecord *source = sourceOfMarks(known, record))
+        takeMarks(record, *source);
 }
 
 /// Whether the record that speaks for a file does not fit it any more.
@@ -91,7 +85,12 @@ void VST3FolderScan::keepLater(const KnownList::Records &records)
         addWaiting(*record);
 }
 
-void VST3FolderScan::complete() { keep(m_keptByName); }
+void VST3FolderScan::complete()
+{
+    for (const EffectRecord *record : m_keptByName)
+        if (!wasProbed(record->path)) // else the probe said what is true now
+            host().AddEffect(*record);
+}
 
 bool VST3FolderScan::process(const ScanItem &item)
 {
@@ -109,8 +108,13 @@ bool VST3FolderScan::process(const ScanItem &item)
     plugin.listClasses(records, item.path, isNew, factoryFound);
     if (!records.empty())
         return addRecords(item, file, records);
-    const bool leaveUnrecorded = !factoryFound || item.path.contains(QLatin1String("WaveShell"));
-    return !leaveUnrecorded && addFailedRecord(item, file);
+    if (factoryFound && !item.path.contains(QLatin1String("WaveShell")))
+        return addFailedRecord(item, file);
+    // Tried again next time; until then a shell that listed something once keeps its records and their marks.
+    if (factoryFound)
+        for (const EffectRecord &record : item.knownRecords)
+            host().AddEffect(record);
+    return false;
 }
 
 bool VST3FolderScan::addRecords(const ScanItem &item, const EffectRecord &file, ClassListing &records)

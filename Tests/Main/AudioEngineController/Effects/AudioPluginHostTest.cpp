@@ -101,6 +101,10 @@ TEST_F(HostFolder, MarkersOfTheSpecialShells)
     host.ReadCatalogue();
     EXPECT_TRUE(host.known().isEmpty());
     EXPECT_TRUE(host.isLeftAlone(QStringLiteral("/fx/WaveShell1-VST3.vst3")));
+    host.ReadCatalogue();
+    EXPECT_TRUE(host.isLeftAlone(QStringLiteral("/fx/WaveShell1-VST3.vst3")))
+        << "until a scan came to its end";
+    host.releaseHeldMarkers();
     EXPECT_FALSE(QFile::exists(pathOf("WaveShell1-VST3.scan3")));
     host.ReadCatalogue();
     EXPECT_FALSE(host.isLeftAlone(QStringLiteral("/fx/WaveShell1-VST3.vst3")))
@@ -167,6 +171,42 @@ TEST_F(HostFolder, UnusableCataloguesCountAsEmpty)
         EXPECT_TRUE(host.known().isEmpty()) << text;
         EXPECT_TRUE(log.contains(QStringLiteral("Cannot use the catalogue"))) << text;
     }
+}
+
+TEST_F(HostFolder, AnotherPluginsNameLosesNoCrash)
+{
+    const CapturedLog log;
+    VST3Host host;
+    prepare(host);
+    EffectRecord healthy;
+    healthy.path = QStringLiteral("/fx/a<b.vst3");
+    healthy.id = healthy.name = QStringLiteral("a<b");
+    EffectRecord killer;
+    killer.path = QStringLiteral("/fx/Röhre & <Co>.vst3");
+    killer.id = killer.name = QStringLiteral("Röhre & <Co>");
+    killer.fileTime = QStringLiteral("t");
+    killer.enabled = killer.working = false;
+    host.AddEffect(healthy);
+    host.AddEffect(killer);
+    host.WriteCatalogue();
+    host.ReadCatalogue();
+    ASSERT_EQ(host.known().size(), 1u);
+    const EffectRecord &known = *host.known().all().front();
+    EXPECT_EQ(known.path, killer.path);
+    EXPECT_EQ(known.name, killer.name);
+    EXPECT_EQ(known.fileTime, killer.fileTime);
+    EXPECT_TRUE(known.isCrashedFile());
+}
+
+TEST_F(HostFolder, ACrashedFileWithoutANameOfItsOwnIsRecorded)
+{
+    write("_.scan", markerText("/fx/x64.so", ""));
+    VSTHost host;
+    prepare(host);
+    host.ReadCatalogue();
+    host.refillEffects();
+    ASSERT_EQ(host.effects().size(), 1u);
+    EXPECT_EQ(host.effects().front().id, QStringLiteral("/fx/x64.so"));
 }
 
 TEST_F(HostFolder, AnUnreadableMarkerIsRemovedAndMakesNoEntry)

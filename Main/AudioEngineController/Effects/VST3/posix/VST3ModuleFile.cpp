@@ -25,7 +25,12 @@ bool VST3ModuleFile::isModule(const QString &path)
 
 QString VST3ModuleFile::binary(const QString &path, QString &reason)
 {
-    if (!QFileInfo(path).isDir())
+    const QFileInfo module(path);
+    if (module.exists() && !module.isDir() && !module.isFile()) {
+        reason = QStringLiteral("it is not a regular file"); // a pipe would be waited for
+        return QString();
+    }
+    if (!module.isDir())
         return path;
     const QString folder = path + QLatin1String(kBinaryFolder);
     const QString usual =

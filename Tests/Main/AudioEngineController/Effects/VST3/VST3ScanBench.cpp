@@ -2,30 +2,6 @@
 
 #include <QFileInfo>
 
-namespace {
-
-const QDateTime kFirstDate({2021, 3, 4}, {5, 6, 7});
-const QDateTime kLaterDate({2022, 3, 4}, {5, 6, 7});
-
-/// The text of an element in a record's block; "-" where there is none.
-QByteArray elementOf(const QByteArray &block, const QByteArray &name)
-{
-    const int start = block.indexOf("\t<" + name + '>');
-    const int end = block.indexOf("</" + name + '>', start);
-    const int content = start + name.size() + 3;
-    return start < 0 || end < 0 ? QByteArray("-") : block.mid(content, end - content);
-}
-
-} // namespace
-
-QStringList texts(std::initializer_list<const char *> utf8)
-{
-    QStringList result;
-    for (const char *text : utf8)
-        result.append(QString::fromUtf8(text));
-    return result;
-}
-
 QString VST3ScanBench::modulePath(const QString &name) const
 {
     return m_folder.plugins() + QLatin1Char('/') + name + QStringLiteral(".vst3");
@@ -34,98 +10,21 @@ QString VST3ScanBench::modulePath(const QString &name) const
 QString VST3ScanBench::add(const QString &name, const QByteArray &script, VST3Fixture fixture) const
 {
     const QByteArray label = QFileInfo(name).fileName().toUtf8();
-    const QByteArray traced =
-        "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\" \"" + label + "\"\n";
     const QByteArray classes = script.isNull() ? "class \"" + label + "\"\n" : script;
-    const QString path = addVST3File(m_folder.plugins(), name, traced + classes, fixture);
-    m_folder.setModified(path, kFirstDate);
+    const QString path = addVST3File(m_folder.plugins(), name, traceStatement(name) + classes, fixture);
+    dateFirst(path);
     return path;
 }
 
 void VST3ScanBench::update(const QString &name, const QByteArray &script) const
 {
-    m_folder.setModified(add(name, script), kLaterDate);
+    dateLater(add(name, script));
 }
 
 QString VST3ScanBench::addRaw(const QString &name, const QByteArray &content) const
 {
     const QString path = modulePath(name);
     m_folder.write(path, content);
-    m_folder.setModified(path, kFirstDate);
+    dateFirst(path);
     return path;
-}
-
-ScannerOutcome VST3ScanBench::scanOnce() const
-{
-    m_folder.write(QStringLiteral("trace"), {});
-    ScannerRun run(QStringLiteral(FXPROBE), m_folder);
-    return run.run();
-}
-
-ScannerOutcome VST3ScanBench::scan() const
-{
-    const ScannerOutcome outcome = scanOnce();
-    EXPECT_TRUE(outcome.succeeded()) << "exit code " << outcome.exitCode << ", signal " << outcome.signal
-                                     << ", log:\n"
-                                     << qPrintable(outcome.log);
-    EXPECT_EQ(m_folder.markers(), QStringList());
-    return outcome;
-}
-
-int VST3ScanBench::scanUntilSettled() const
-{
-    const int mostRuns = 60;
-    return static_cast<int>(runUntilSettled(QStringLiteral(FXPROBE), m_folder, mostRuns).size());
-}
-
-QStringList VST3ScanBench::traceOf(const QString &name) const
-{
-    QStringList calls;
-    for (const QString &line : trace())
-        if (line.startsWith(name + QLatin1Char(' ')))
-            calls.append(line.mid(name.size() + 1));
-    return calls;
-}
-
-QStringList VST3ScanBench::loaded() const
-{
-    const QString call = QStringLiteral(" static-constructor");
-    QStringList names;
-    for (const QString &line : trace())
-        if (line.endsWith(call))
-            names.append(line.chopped(call.size()));
-    return names;
-}
-
-QStringList VST3ScanBench::records(const char *elements) const
-{
-    QStringList found;
-    const QByteArray catalogue = m_folder.catalogue();
-    for (int at = catalogue.indexOf("\t<Effect>"); at >= 0; at = catalogue.indexOf("\t<Effect>", at + 1)) {
-        const QByteArray block = catalogue.mid(at, catalogue.indexOf("\t</Effect>", at) - at);
-        QByteArray line;
-        for (const QByteArray &element : QByteArray(elements).split(' '))
-            line += (line.isNull() ? "" : "|") + elementOf(block, element);
-        found.append(QString::fromUtf8(line));
-    }
-    return found;
-}
-
-QStringList VST3ScanBench::sortedRecords(const char *elements) const
-{
-    QStringList found = records(elements);
-    found.sort();
-    return found;
-}
-
-void VST3ScanBench::mark(const QString &name, const char *element, const QByteArray &value) const
-{
-    QByteArray catalogue = m_folder.catalogue();
-    const int named = catalogue.indexOf("<Name>" + name.toUtf8() + "</Name>");
-    ASSERT_GE(named, 0) << qPrintable(name);
-    const int record = catalogue.lastIndexOf("<Effect>", named);
-    const QByteArray tag = QByteArray("<") + element + '>';
-    const int content = catalogue.indexOf(tag, record) + tag.size();
-    catalogue.replace(content, catalogue.indexOf('<', content) - content, value);
-    m_folder.write(QStringLiteral("Effects/VST3Configuration.xml"), catalogue);
 }

@@ -1,0 +1,200 @@
+#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Main/VLib/ApplicationContext.h"
+#include "Main/VLib/SimpleGUI.h"
+#include "Main/VLib/VProgressDisplay.h"
+#include "Main/VLib/VUI.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/VST2Fixture.h"
+
+#include <QFileInfo>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+class TestApplication : public IQuillonInterface {
+public:
+    explicit TestApplication(const QString &folder)
+        : m_folder(folder)
+    {
+        ApplicationContext::instance().quillonInterface = this;
+    }
+    ~TestApplication() override { ApplicationContext::instance().quillonInterface = nullptr; }
+    QString dataFolder() const override { return QString(); }
+    QStringList scanFolders() const override { return {m_folder}; }
+    bool isScanner() const override { return true; }
+    void pluginListsChanged() override {}
+
+private:
+    QString m_folder;
+};
+
+/// Notes what a user gets to see of a scan, one line for each change.
+class NotingUI : public VUI {
+public:
+    void showStatus(const QString &text) override { seen << text; }
+    void showStatus(int level, const QString &text) override { seen << QString::number(level) + ' ' + text; }
+    void notify(quint32 value) override { seen << "notified " + QString::number(value, 16); }
+    void requestShow() override {}
+    std::shared_ptr<VProgressDisplay> createProgressDisplay() override
+    {
+        return std::make_shared<Display>(*this);
+    }
+
+    QStringList seen;
+
+private:
+    class Display : public VProgressDisplay {
+    public:
+        explicit Display(NotingUI &ui)
+            : VProgressDisplay(0)
+            , m_ui(ui)
+        {}
+        void begin(const QString &, int) override {}
+        void finish() override {}
+        void setValue(int value) override { m_ui.seen << "value " + QString::number(value); }
+        void step(int) override {}
+        void setRange(int total, const QString &text) override
+        {
+            m_ui.seen << "range " + QString::number(total) + ' ' + text;
+        }
+        void setText(const QString &) override {}
+        bool isCancelled() const override { return false; }
+
+    private:
+        NotingUI &m_ui;
+    };
+};
+
+class VSTHostTest : public testing::Test {
+protected:
+    VSTHostTest() { m_host.setCatalogueFolder(m_folder.effects()); }
+
+    /// Adds a module and its record; the identifier is the name.
+    void list(const char *id, const QByteArray &script = {}, qint32 category = 1, bool enabled = true)
+    {
+        EffectRecord record;
+        record.name = record.id = QString::fromUtf8(id);
+        record.path = addVST2File(m_folder.plugins(), record.id, script);
+        record.vstCategory = category;
+        record.enabled = enabled;
+        EXPECT_TRUE(m_host.AddEffect(record));
+    }
+
+    TestFolder m_folder;
+    const CapturedLog m_log;
+    VSTHost m_host;
+};
+
+} // namespace
+
+TEST_F(VSTHostTest, DefaultsHoldUntilSomethingIsSet)
+{
+    EXPECT_EQ(m_host.sampleRate(), 44100);
+    EXPECT_EQ(m_host.blockSize(), 256);
+    EXPECT_EQ(m_host.processLevel(), 1);
+    EXPECT_EQ(m_host.timeInfo(), nullptr);
+    EXPECT_FALSE(m_host.isIgnored(std::make_unique<VSTPlugin>(m_host).get()));
+    EXPECT_EQ(&VSTHost::instance(), &m_host);
+}
+
+TEST_F(VSTHostTest, LoadedPluginsAreLogged)
+{
+    list("First");
+    list("Second");
+    const auto first = m_host.loadByKey(QStringLiteral("First"));
+    const auto second = m_host.loadByKey(QStringLiteral("Second"));
+    ASSERT_TRUE(first && second);
+    const int before = m_log.lines().size();
+    m_host.logLoadedPlugins();
+    EXPECT_EQ(m_log.lines().mid(before), QStringList({"VSTs ", "vst: First: ", "vst: Second: "}));
+}
+
+TEST_F(VSTHostTest, LoadsByKey)
+{
+    list("Comp");
+    list("Off", {}, 1, false);
+    list("Offline", {}, 9);
+    list("Q10");
+    list("ves Q10", "name \"Cut at the front\"");
+    list("Broken", "answer entry null");
+    const QString retrying = QStringLiteral("Found an old Waves plug-in, retrying as:");
+    const struct {
+        const char *key;
+        const char *loaded; // name, or null
+        QStringList lines;
+    } cases[] = {{"Comp", "Comp", {"Found: Comp, trying to load"}},
+                 {"Off", nullptr, {"Found: Off, trying to load"}},
+                 {"Offline", nullptr, {"Found: Offline, trying to load"}},
+                 {"Broken",
+                  nullptr,
+                  {"Found: Broken, trying to load",
+                   "VSTPlugin::Load - Failed to Load DLL: " +
+                       addVST2File(m_folder.plugins(), "Broken", "answer entry null"),
+                   "Broken, Didn't manage it"}},
+                 {"Waves Q10", "Q10", {retrying, "Found: Q10, trying to load"}},
+                 {"Waves Waves Q10", "Q10", {retrying, retrying, "Found: Q10, trying to load"}},
+                 {"Old Waves Q10", "Cut at the front", {retrying, "Found: ves Q10, trying to load"}},
+                 {"Waves Gone", nullptr, {retrying}},
+                 {"Waves ", nullptr, {retrying}},
+                 {"Waves", nullptr, {}},
+                 {"waves Q10", nullptr, {}},
+                 {"comp", nullptr, {}},
+                 {"", nullptr, {}}};
+    for (const auto &row : cases) {
+        SCOPED_TRACE(row.key);
+        const CapturedLog log;
+        const auto plugin = m_host.loadByKey(QString::fromUtf8(row.key));
+        EXPECT_EQ(log.lines(), row.lines);
+        ASSERT_EQ(bool(plugin), row.loaded != nullptr);
+        if (plugin) {
+            EXPECT_EQ(plugin->name(), QString::fromUtf8(row.loaded));
+        }
+    }
+}
+
+TEST_F(VSTHostTest, ARefreshCleansNamesUp)
+{
+    const auto effect = [](const char *file, const char *name) {
+        return QByteArray("<Effect><Path>/fx/") + file + ".so</Path><FileTime>t</FileTime><Name>" + name +
+               "</Name><ID>" + file + "</ID></Effect>";
+    };
+    m_folder.write(QStringLiteral("Effects/FXConfiguration.xml"),
+                   "<Effects version=\"1.4\">" + effect("A", "Comp [2.4]") +
+                       effect("B", "EQ [2.4] old [2.4]") + effect("C", "Gate[2.4]") + effect("D", "Comp") +
+                       "</Effects>");
+    const QByteArray before = m_folder.catalogue(QStringLiteral("FXConfiguration.xml"));
+    m_host.ReadCatalogue();
+    EXPECT_TRUE(m_host.Scan(false, true));
+    QStringList names;
+    for (const EffectRecord &record : m_host.effects())
+        names.append(record.name);
+    EXPECT_EQ(names, QStringList({"Comp", "EQ", "Gate[2.4]", "D"})) << "no name twice";
+    const QByteArray written = m_folder.catalogue(QStringLiteral("FXConfiguration.xml"));
+    EXPECT_NE(written, before);
+    EXPECT_TRUE(written.contains("<Name>EQ</Name>"));
+    m_host.ReadCatalogue();
+    EXPECT_FALSE(m_host.Scan(false, true)) << "clean now";
+    EXPECT_EQ(m_folder.catalogue(QStringLiteral("FXConfiguration.xml")), written);
+}
+
+TEST_F(VSTHostTest, AShellLeavesTheProgressToTheFilesAgain)
+{
+    addVST2File(m_folder.plugins(), QStringLiteral("a Shell"),
+                "child 11 A\nchild 12 B\nanswer entry null B\n");
+    addVST2File(m_folder.plugins(), QStringLiteral("b Comp"));
+    const TestApplication application(m_folder.plugins());
+    const auto ui = std::make_shared<NotingUI>();
+    installVUI(ui);
+    EXPECT_TRUE(m_host.Scan(true, true));
+    installVUI(nullptr);
+    EXPECT_EQ(ui->seen,
+              QStringList({"range 2 ", "value 0", "60000 Scanning: a Shell.so", "range 2 Scanning WaveShell",
+                           "60000 Scanning: A", "notified fffffff", "value 1", "60000 Scanning: B",
+                           "notified fffffff", "value 2", "range 2 ", "value 0", "value 1",
+                           "60000 Scanning: b Comp.so", "notified fffffff", "value 2"}));
+}

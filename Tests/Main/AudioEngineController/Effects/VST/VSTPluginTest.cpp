@@ -1,0 +1,291 @@
+#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+
+#include "Core/BaseLib/DebugLog.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/VST2Fixture.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+const char kInvalid[] = "VSTPlugin::Load - Invalid VST Plugin";
+const char kFailed[] = "VSTPlugin::Load - Failed to Load DLL: ";
+
+class VSTPluginTest : public testing::Test {
+protected:
+    QString add(const QByteArray &script = {}, const char *name = "Comp",
+                VST2Fixture fixture = VST2Fixture::Scripted) const
+    {
+        const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n";
+        return addVST2File(m_folder.plugins(), QString::fromUtf8(name), traced + script, fixture);
+    }
+    static bool load(VSTPlugin &plugin, const QString &path)
+    {
+        bool isPluginModule = false;
+        return plugin.load(path, VSTHostCallback, isPluginModule) && isPluginModule;
+    }
+    static EffectRecord record(const QString &path, quint32 subId = 0)
+    {
+        EffectRecord result;
+        result.path = path;
+        result.subId = subId;
+        return result;
+    }
+    EffectRecord probe(const QByteArray &script)
+    {
+        VSTPlugin plugin(m_host);
+        EffectRecord result;
+        EXPECT_TRUE(load(plugin, add(script)));
+        plugin.readInto(result);
+        return result;
+    }
+    /// The calls so far; they are forgotten then.
+    QStringList takeTrace() const
+    {
+        const QStringList lines = m_folder.lines(QStringLiteral("trace"));
+        m_folder.write(QStringLiteral("trace"), {});
+        return lines;
+    }
+
+    TestFolder m_folder;
+    const CapturedLog m_log;
+    VSTHost m_host;
+};
+
+/// What does not load, and what the log says of it.
+const struct FailureRow {
+    const char *name;
+    const char *script; // null: no such file
+    VST2Fixture fixture;
+    bool isPluginModule;
+    bool isInvalid;
+} kFailures[] = {
+    {"null effect", "answer entry null", VST2Fixture::Scripted, true, false},
+    {"wrong magic", "magic 0x50747356", VST2Fixture::Scripted, true, true},
+    {"effect outside of memory", "answer entry no-memory", VST2Fixture::Scripted, true, true},
+    {"exception", "fault entry throw-std", VST2Fixture::Scripted, true, false},
+    {"exception of no standard kind", "fault entry throw-int", VST2Fixture::Scripted, true, false},
+    {"fault", "fault entry segv", VST2Fixture::Scripted, true, false},
+    {"no entry point", "", VST2Fixture::NoEntry, false, false},
+    {"missing module", nullptr, VST2Fixture::Scripted, true, false}};
+
+} // namespace
+
+TEST_F(VSTPluginTest, FailuresByPathAreToldApart)
+{
+    for (const FailureRow &row : kFailures) {
+        SCOPED_TRACE(row.name);
+        const QString path = row.script ? add(row.script, row.name, row.fixture) : m_folder.path(row.name);
+        VSTPlugin plugin(m_host);
+        bool isPluginModule = !row.isPluginModule;
+        EXPECT_FALSE(plugin.load(path, VSTHostCallback, isPluginModule));
+        EXPECT_EQ(isPluginModule, row.isPluginModule);
+        EXPECT_FALSE(plugin.isProbe());
+    }
+    EXPECT_FALSE(m_log.contains(QStringLiteral("VSTPlugin::Load")));
+}
+
+TEST_F(VSTPluginTest, FailuresByRecordHaveTheirLines)
+{
+    for (const FailureRow &row : kFailures) {
+        SCOPED_TRACE(row.name);
+        const QString path = row.script ? add(row.script, row.name, row.fixture) : m_folder.path(row.name);
+        const CapturedLog log;
+        VSTPlugin plugin(m_host);
+        EXPECT_FALSE(plugin.load(record(path), VSTHostCallback, 0));
+        const QStringList lines = log.lines().filter(QStringLiteral("VSTPlugin::Load"));
+        QStringList expected{QLatin1String(kFailed) + path};
+        if (row.isInvalid)
+            expected.prepend(QLatin1String(kInvalid));
+        EXPECT_EQ(lines, expected);
+        EXPECT_FALSE(m_host.shellIdOfPluginBeingLoaded(*std::make_unique<VstInt32>()));
+    }
+}
+
+TEST_F(VSTPluginTest, AFailedObjectLoadsTheNextPlugin)
+{
+    for (const FailureRow &row : kFailures) {
+        SCOPED_TRACE(row.name);
+        VSTPlugin plugin(m_host);
+        const QString path = row.script ? add(row.script, row.name, row.fixture) : m_folder.path(row.name);
+        EXPECT_FALSE(plugin.load(record(path), VSTHostCallback, 0));
+        EXPECT_TRUE(plugin.load(record(add("name Good", "Good")), VSTHostCallback, 0));
+        EXPECT_EQ(plugin.name(), QStringLiteral("Good"));
+    }
+}
+
+TEST_F(VSTPluginTest, WhoIsAskedForItsName)
+{
+    const struct {
+        const char *name;
+        const char *file;
+        const char *script;
+        quint32 subId;
+        const char *expected;
+    } cases[] = {
+        {"effect", "Comp", "name Told", 0, "Told"},
+        {"instrument with inputs", "My Synth.x64", "name Told\ncategory 2", 0, "My Synth"},
+        {"no inputs", "My Synth.x64", "name Told\ninputs 0", 0, "My Synth"},
+        {"negative inputs", "Comp", "name Told\ninputs -1", 0, "Told"},
+        {"child without inputs", "Shell", "child 11 Told\ninputs 0", 11, "Told"},
+        {"instrument child with inputs", "Shell", "child 11 Told\ncategory 2", 11, "Told"},
+        {"child of a negative number", "Shell", "child -2 Told\ninputs 0", 0xFFFFFFFE, "Told"},
+        {"nothing told", "Comp.64.x", "name Told\nname \"\"\nanswer get-effect-name 0", 0, "Comp"},
+        {"an empty name told", "Comp", "name \"\"", 0, ""},
+        {"a name told in spite of 0", "Comp", "name Told\nanswer get-effect-name 0", 0, "Told"},
+        {"hidden file", ".Comp", "inputs 0", 0, ""},
+        {"bytes are Latin-1", "Comp", "name \\xC9t\\xE9\\xFF\\x80", 0, "\xC3\x89t\xC3\xA9\xC3\xBF\xC2\x80"},
+        {"file names are not", "Caf\xC3\xA9", "inputs 0", 0, "Caf\xC3\xA9"}};
+    for (const auto &row : cases) {
+        SCOPED_TRACE(row.name);
+        VSTPlugin plugin(m_host);
+        EXPECT_TRUE(plugin.load(record(add(row.script, row.file), row.subId), VSTHostCallback, 0));
+        EXPECT_EQ(plugin.name(), QString::fromUtf8(row.expected));
+    }
+}
+
+TEST_F(VSTPluginTest, APathWithoutASlashGivesNoName)
+{
+    VSTPlugin plugin(m_host);
+    EXPECT_TRUE(plugin.load(record(add("inputs 0")), VSTHostCallback, 0));
+    EXPECT_EQ(plugin.name(), QStringLiteral("Comp"));
+    EXPECT_TRUE(plugin.load(record(QStringLiteral("Comp.so")), VSTHostCallback, 1));
+    EXPECT_EQ(plugin.name(), QString());
+    EXPECT_EQ(plugin.key(), QStringLiteral(":1000"));
+}
+
+TEST_F(VSTPluginTest, ReadsWhatTheCatalogueHolds)
+{
+    const EffectRecord read = probe("name Told\nvendor V\xFC\nid -2147483648\ninputs -2147483648\n"
+                                    "outputs 2147483647\nlatency -5\ncategory 77\n");
+    EXPECT_EQ(read.id, QStringLiteral("Told:-2147483648"));
+    EXPECT_EQ(read.vendor, QString::fromUtf8("V\xC3\xBC"));
+    EXPECT_EQ(read.width, 2147483647);
+    EXPECT_EQ(read.latency, -5);
+    EXPECT_EQ(read.vstCategory, 77);
+    EXPECT_EQ(probe("inputs 0\ncategory 10").vstCategory, 2) << "no inputs: an instrument, whatever it says";
+    EXPECT_EQ(probe("vendor \"\"").vendor, QString());
+}
+
+TEST_F(VSTPluginTest, TextsEndAtTheBuffer)
+{
+    const QByteArray name(1024, 'n');
+    const QByteArray vendor(256, 'v');
+    const EffectRecord read = probe("name " + name + "\nvendor " + vendor + "\n");
+    EXPECT_EQ(read.name, QString::fromLatin1(name));
+    EXPECT_EQ(read.vendor, QString::fromLatin1(vendor));
+    EXPECT_EQ(read.id, QString(255, QLatin1Char('n'))) << "the key is cut";
+    EXPECT_EQ(probe("name " + QByteArray(250, 'n')).id, QString(250, QLatin1Char('n')) + ":1000");
+    EXPECT_EQ(probe("name " + QByteArray(251, 'n')).id, QString(251, QLatin1Char('n')) + ":100");
+}
+
+TEST_F(VSTPluginTest, Mode0ClosesAndUnloadsWhatWasHeld)
+{
+    const QString path = add("child 11 A\nchild 12 B\n", "Shell");
+    {
+        VSTPlugin plugin(m_host);
+        EXPECT_TRUE(load(plugin, path));
+        EXPECT_TRUE(plugin.isProbe());
+        EXPECT_TRUE(plugin.load(record(path, 11), VSTHostCallback, 1));
+        EXPECT_FALSE(plugin.isProbe());
+        EXPECT_EQ(plugin.shellId(), 11);
+        takeTrace();
+        EXPECT_TRUE(plugin.load(record(path, 12), VSTHostCallback, 0));
+        EXPECT_EQ(takeTrace(),
+                  QStringList({"close A", "close Shell", "static-destructor", "static-constructor",
+                               "entry B: 12", "get-plug-category B", "get-effect-name B"}));
+    }
+    EXPECT_EQ(takeTrace(), QStringList({"close B", "static-destructor"}));
+}
+
+TEST_F(VSTPluginTest, AThrowingEntryClosesAndUnloadsToo)
+{
+    const QString path = add("child 11 A\nchild 12 B\nfault entry throw-std B\n", "Shell");
+    VSTPlugin plugin(m_host);
+    EXPECT_TRUE(load(plugin, path));
+    EXPECT_TRUE(plugin.load(record(path, 11), VSTHostCallback, 1));
+    takeTrace();
+    EXPECT_FALSE(plugin.load(record(path, 12), VSTHostCallback, 1));
+    EXPECT_EQ(takeTrace(), QStringList({"entry B: 12", "close A", "close Shell", "static-destructor"}));
+    EXPECT_TRUE(plugin.load(record(path, 11), VSTHostCallback, 1)) << "the module is loaded anew";
+}
+
+TEST_F(VSTPluginTest, AnEnumerationWithoutEndIsCut)
+{
+    VSTPlugin plugin(m_host);
+    EXPECT_TRUE(load(plugin, add("name Mad\nafter-children endless\n")));
+    const std::vector<VSTSubPlugin> found = plugin.subPlugins();
+    ASSERT_EQ(found.size(), 4096u);
+    EXPECT_EQ(found.front().id, 1000000u);
+    EXPECT_EQ(found.back().id, 1004095u);
+    EXPECT_EQ(found.back().name, QStringLiteral("Endless 1004095"));
+    EXPECT_TRUE(m_log.contains(
+        QStringLiteral("The shell Mad names more than 4096 sub-plug-ins; the rest is left out")));
+}
+
+TEST_F(VSTPluginTest, AnIdentifierThatComesAgainIsListedOnce)
+{
+    VSTPlugin plugin(m_host);
+    EXPECT_TRUE(load(plugin, add("child 11 A\nchild -2 B\nchild 11 Again\nafter-children repeat\n")));
+    const std::vector<VSTSubPlugin> found = plugin.subPlugins();
+    ASSERT_EQ(found.size(), 2u);
+    EXPECT_EQ(found[0].name, QStringLiteral("A"));
+    EXPECT_EQ(found[1].id, 0xFFFFFFFEu);
+}
+
+TEST_F(VSTPluginTest, ACallThatFailsSaysWhyAndAnswersZero)
+{
+    const struct {
+        const char *kind;
+        const char *line;
+    } cases[] = {{"segv", "VST plug-in call 47: SE Exception: Access Violation"},
+                 {"divide", "VST plug-in call 47: SE Exception: 0xC0000094"},
+                 {"illegal", "VST plug-in call 47: SE Exception: 0xC000001D"},
+                 {"throw-std", "VST plug-in call 47 threw: thrown by the fixture"},
+                 {"throw-int", "VST plug-in call 47 threw something that is no standard exception"}};
+    for (const auto &row : cases) {
+        const QByteArray script = QByteArray("fault get-vendor-string ") + row.kind;
+        // A file of its own: a module in which a fault was caught stays in memory.
+        VSTPlugin plugin(m_host);
+        EffectRecord result;
+        EXPECT_TRUE(load(plugin, add(script, row.kind)));
+        plugin.readInto(result);
+        EXPECT_EQ(result.vendor, QString()) << row.kind;
+        EXPECT_TRUE(m_log.contains(QLatin1String(row.line))) << row.kind;
+    }
+}
+
+TEST_F(VSTPluginTest, AFaultInsideNestedHostCallsLeavesTheCounterAsItWas)
+{
+    probe("ask-host get-vendor-string 1 nested 5\nfault edit-idle segv\n");
+    EXPECT_EQ(VSTCallbackNesting::active(), 0);
+    VSTPlugin thrower(m_host);
+    load(thrower, add("ask-host entry 1 nested 5\nfault edit-idle throw-int\n", "Thrower"));
+    EXPECT_EQ(VSTCallbackNesting::active(), 0);
+}
+
+TEST_F(VSTPluginTest, DispatchesAreTraced)
+{
+    VSTEffect nothing;
+    EXPECT_EQ(nothing.dispatch(effClose), 0);
+    EXPECT_TRUE(m_log.contains(QStringLiteral("\"0 != _plugin\"")));
+    VSTPlugin plugin(m_host);
+    EXPECT_TRUE(load(plugin, add()));
+    debugLogSettings().trace = true;
+    const int before = m_log.lines().size();
+    AEffect effect = {};
+    effect.dispatcher = [](AEffect *, int opcode, int, VstIntPtr value, void *pointer, float number) {
+        return opcode + value + reinterpret_cast<VstIntPtr>(pointer) + static_cast<VstIntPtr>(number * 4);
+    };
+    VSTEffect held(&effect);
+    EXPECT_EQ(held.dispatch(100), 100);
+    EXPECT_EQ(held.dispatch(100, reinterpret_cast<void *>(0x10)), 116);
+    EXPECT_EQ(held.dispatchValue(100, -7), 93);
+    EXPECT_EQ(held.dispatchFloat(100, 0.25f), 101);
+    EXPECT_EQ(m_log.lines().mid(before),
+              QStringList({"VST Plugin Dispatch(100,0x10);", "VST Plugin Dispatch(100,-7);",
+                           "VST Plugin Dispatch(100,0.250000);"}));
+}
