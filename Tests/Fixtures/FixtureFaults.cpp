@@ -98,9 +98,9 @@ bool leaveThreadRunning(const std::string &)
 
 bool printMuch(const std::string &kibibytes)
 {
-    const int count = std::atoi(kibibytes.c_str());
+    const long count = std::strtol(kibibytes.c_str(), nullptr, 10);
     const std::string text = std::string(1023, '.') + '\n';
-    for (int i = 0; i < count; ++i)
+    for (long i = 0; i < count; ++i)
         for (std::FILE *stream : {stdout, stderr})
             std::fputs(text.c_str(), stream);
     std::fflush(stdout);

@@ -92,7 +92,7 @@ void KillSweep::expectSettled(const std::set<QString> &named) const
 
 TEST_P(InterruptedRescan, AKilledScannerCostsNoMarks)
 {
-    const QString culprit = kThree[GetParam()];
+    const QString &culprit = kThree[GetParam()];
     addModule(culprit, "fault initialize hang\n");
     touchModules(kThree);
     ScannerRun scanner(scannerProgram(), m_folder);
