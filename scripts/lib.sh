@@ -26,17 +26,6 @@ step() {
     if ((SECONDS - started > 1)); then printf 'done (%d s)\n' $((SECONDS - started)); else printf 'done\n'; fi
 }
 
-# as_root COMMAND…
-as_root() {
-    if ((EUID == 0)); then
-        "$@"
-    elif command -v sudo >/dev/null; then
-        sudo "$@"
-    else
-        fail "packages are missing and there is no sudo; run as root: scripts/setup"
-    fi
-}
-
 # configure PRESET: with tests.
 configure() {
     if ! grep -qs '^FXPROBE_BUILD_TESTS:BOOL=ON$' "$root/build/$1/CMakeCache.txt" || [[ ! -f $root/build/$1/build.ninja ]]; then
