@@ -43,7 +43,7 @@ protected:
     /// The catalogue's records in their order, each as the values of some elements, "A|B|C". The text is
     /// taken as it is, so that what no XML reader takes can be looked at too.
     QStringList records(const char *elements) const { return recordsOf(m_catalogue, elements); }
-    QStringList recordsOf(const QString &catalogue, const char *elements) const;
+    QStringList recordsOf(const QString &file, const char *elements) const;
     /// The same, sorted.
     QStringList sortedRecords(const char *elements) const;
     /// What the workstation does when the user marks a plug-in: changes one element of the record with the

@@ -219,8 +219,8 @@ TEST_F(VSTHostCallbackTest, TextsAreWrittenWithTheirZeroAndNothingMore)
     const struct {
         VstInt32 opcode;
         std::string written;
-    } cases[] = {{audioMasterGetVendorString, std::string("Tessel", 7)},
-                 {audioMasterGetProductString, std::string("Vantage II", 11)}};
+    } cases[] = {{audioMasterGetVendorString, std::string("Tessel") + '\0'},
+                 {audioMasterGetProductString, std::string("Vantage II") + '\0'}};
     for (const auto &row : cases) {
         std::string buffer(64, '\x5A');
         EXPECT_EQ(call(nullptr, row.opcode, 0, 0, buffer.data()), 1);
