@@ -3,7 +3,7 @@ find_path(FST_INCLUDE_DIR pluginterfaces/fst/fst.h REQUIRED NO_CMAKE_FIND_ROOT_P
 # In a folder of its own: the folder that it is found in also holds the headers of this machine's system, which is not
 # always the one that is built for.
 set(fst_copy "${PROJECT_BINARY_DIR}/fst")
-configure_file("${FST_INCLUDE_DIR}/pluginterfaces/fst/fst.h" "${fst_copy}/pluginterfaces/fst/fst.h" COPYONLY)
+file(COPY "${FST_INCLUDE_DIR}/pluginterfaces/fst" DESTINATION "${fst_copy}/pluginterfaces")
 add_library(vst2interface INTERFACE)
 target_include_directories(vst2interface SYSTEM INTERFACE "${fst_copy}")
 # The header's notes to its own authors come as warnings, which not even a system header keeps to itself.

@@ -20,7 +20,8 @@ void killProcess();
 /// Ends the calling thread only.
 void endThread();
 
-// Side effects that real plug-ins leave behind. Each answers false for a value it does not know.
+// Side effects that real plug-ins leave behind. Each answers false for a value it does not know, and does
+// nothing where the system has no such thing.
 
 /// Sets the mask of file permissions, given in octal.
 bool changeFileMask(const std::string &octal);
@@ -28,7 +29,7 @@ bool changeWorkingFolder(const std::string &path);
 /// Installs a handler that does nothing, for "segv", "fpe", "ill", "abrt", "term", "int" or "alrm".
 bool installSignalHandler(const std::string &signalName);
 /// Touches memory that is not there and repairs that in a handler of its own, as copy protection does. "keep"
-/// leaves the handler behind, which ends the process at any other violation; "restore" puts the one before
+/// leaves a handler behind, which ends the process at any other violation; "restore" puts the one before
 /// back.
 bool repairOwnViolation(const std::string &afterwards);
 /// Lets an alarm signal arrive after so many seconds.

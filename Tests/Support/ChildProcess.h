@@ -4,6 +4,9 @@
 
 /// A process that does not outlive the test program, also when that is killed for taking too long.
 class ChildProcess : public QProcess {
+public:
+    ChildProcess();
+
 protected:
     void setupChildProcess() override;
 };

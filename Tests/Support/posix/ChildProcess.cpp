@@ -4,6 +4,8 @@
 
 #include <sys/prctl.h>
 
+ChildProcess::ChildProcess() = default;
+
 void ChildProcess::setupChildProcess() { prctl(PR_SET_PDEATHSIG, SIGKILL); }
 
 void requestTermination(QProcess &process) { process.terminate(); }

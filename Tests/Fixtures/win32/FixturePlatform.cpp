@@ -1,0 +1,174 @@
+#include "Tests/Fixtures/FixturePlatform.h"
+
+#include <csignal>
+#include <cstdlib>
+
+#include <io.h>
+#include <windows.h>
+
+namespace {
+
+const int kNoSuchSignal = 0;
+
+const struct {
+    const char *name;
+    int number;
+} kSignals[] = {{"segv", SIGSEGV}, {"fpe", SIGFPE}, {"ill", SIGILL},        {"abrt", SIGABRT},
+                {"term", SIGTERM}, {"int", SIGINT}, {"alrm", kNoSuchSignal}};
+
+void ignoreSignal(int) {}
+
+std::wstring widened(const std::string &text)
+{
+    const int length = MultiByteToWideChar(CP_UTF8, 0, text.c_str(), -1, nullptr, 0);
+    std::wstring wide(static_cast<std::size_t>(length), L'\0');
+    MultiByteToWideChar(CP_UTF8, 0, text.c_str(), -1, wide.data(), length);
+    wide.resize(wide.size() - 1);
+    return wide;
+}
+
+std::string narrowed(const std::wstring &text)
+{
+    const int length = WideCharToMultiByte(CP_UTF8, 0, text.c_str(), -1, nullptr, 0, nullptr, nullptr);
+    std::string narrow(static_cast<std::size_t>(length), '\0');
+    WideCharToMultiByte(CP_UTF8, 0, text.c_str(), -1, narrow.data(), length, nullptr, nullptr);
+    narrow.resize(narrow.size() - 1);
+    return narrow;
+}
+
+/// Whoever opens a file of ours must be able to read, append to and remove it meanwhile, as elsewhere.
+HANDLE openFile(const std::string &path, DWORD access, DWORD disposition)
+{
+    return CreateFileW(widened(path).c_str(), access, FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE,
+                       nullptr, disposition, FILE_ATTRIBUTE_NORMAL, nullptr);
+}
+
+const std::size_t kPageSize = 4096;
+
+bool isViolation(const EXCEPTION_RECORD &record)
+{
+    return record.ExceptionCode == EXCEPTION_ACCESS_VIOLATION;
+}
+
+LONG WINAPI endAtViolation(EXCEPTION_POINTERS *fault)
+{
+    if (isViolation(*fault->ExceptionRecord))
+        TerminateProcess(GetCurrentProcess(), EXCEPTION_ACCESS_VIOLATION);
+    return EXCEPTION_CONTINUE_SEARCH;
+}
+
+} // namespace
+
+extern "C" {
+
+/// Writes one byte, in a frame whose handler is repairPage.
+void writeIntoRepairedPage(void *address);
+
+/// Makes the page at the address of the violation writable.
+__attribute__((used)) EXCEPTION_DISPOSITION repairPage(EXCEPTION_RECORD *record, void *, CONTEXT *, void *)
+{
+    DWORD previous = 0;
+    if (!isViolation(*record) || !VirtualProtect(reinterpret_cast<void *>(record->ExceptionInformation[1]),
+                                                 kPageSize, PAGE_READWRITE, &previous))
+        return ExceptionContinueSearch;
+    return ExceptionContinueExecution;
+}
+}
+
+__asm__(".text\n"
+        ".seh_proc writeIntoRepairedPage\n"
+        "writeIntoRepairedPage:\n"
+        "  subq $40, %rsp\n"
+        "  .seh_stackalloc 40\n"
+        "  .seh_endprologue\n"
+        "  .seh_handler repairPage, @except\n"
+        "  movb $1, (%rcx)\n"
+        "  nop\n"
+        "  addq $40, %rsp\n"
+        "  ret\n"
+        ".seh_endproc\n");
+
+std::string modulePath()
+{
+    HMODULE module = nullptr;
+    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
+                       reinterpret_cast<const wchar_t *>(&modulePath), &module);
+    std::wstring path(32768, L'\0');
+    path.resize(GetModuleFileNameW(module, path.data(), static_cast<DWORD>(path.size())));
+    std::string text = narrowed(path);
+    for (char &letter : text)
+        letter = letter == '\\' ? '/' : letter;
+    return text;
+}
+
+bool readFile(const std::string &path, std::string &content)
+{
+    content.clear();
+    const HANDLE file = openFile(path, GENERIC_READ, OPEN_EXISTING);
+    if (file == INVALID_HANDLE_VALUE)
+        return false;
+    char buffer[4096];
+    DWORD read = 0;
+    while (ReadFile(file, buffer, sizeof buffer, &read, nullptr) && read > 0)
+        content.append(buffer, read);
+    CloseHandle(file);
+    return true;
+}
+
+bool appendToFile(const std::string &path, const std::string &text)
+{
+    const HANDLE file = openFile(path, FILE_APPEND_DATA, OPEN_ALWAYS);
+    if (file == INVALID_HANDLE_VALUE)
+        return false;
+    DWORD written = 0;
+    WriteFile(file, text.data(), static_cast<DWORD>(text.size()), &written, nullptr);
+    CloseHandle(file);
+    return written == text.size();
+}
+
+void sleepMilliseconds(int milliseconds) { Sleep(static_cast<DWORD>(milliseconds)); }
+
+void endProcess(int exitCode)
+{
+    TerminateProcess(GetCurrentProcess(), static_cast<UINT>(exitCode));
+    std::abort();
+}
+
+void killProcess() { TerminateProcess(GetCurrentProcess(), 1); }
+
+void endThread() { ExitThread(0); }
+
+bool changeFileMask(const std::string &octal)
+{
+    char *end = nullptr;
+    const unsigned long mask = std::strtoul(octal.c_str(), &end, 8);
+    _umask(static_cast<int>(mask));
+    return !octal.empty() && *end == '\0';
+}
+
+bool changeWorkingFolder(const std::string &path)
+{
+    return SetCurrentDirectoryW(widened(path).c_str()) != FALSE;
+}
+
+bool installSignalHandler(const std::string &signalName)
+{
+    for (const auto &entry : kSignals) {
+        if (signalName == entry.name)
+            return entry.number == kNoSuchSignal || std::signal(entry.number, ignoreSignal) != SIG_ERR;
+    }
+    return false;
+}
+
+bool repairOwnViolation(const std::string &afterwards)
+{
+    void *page = VirtualAlloc(nullptr, kPageSize, MEM_RESERVE | MEM_COMMIT, PAGE_NOACCESS);
+    if (!page || (afterwards != "keep" && afterwards != "restore"))
+        return false;
+    writeIntoRepairedPage(page);
+    if (afterwards == "keep")
+        SetUnhandledExceptionFilter(endAtViolation);
+    return VirtualFree(page, 0, MEM_RELEASE) != FALSE;
+}
+
+bool startAlarm(const std::string &seconds) { return std::strtol(seconds.c_str(), nullptr, 10) > 0; }
