@@ -10,7 +10,10 @@ function(fxprobe_install)
     endif()
 endfunction()
 
-set(document_folder "${CMAKE_INSTALL_DOCDIR}")
+# To pack the programs, only they need be built.
+set(CMAKE_SKIP_INSTALL_ALL_DEPENDENCY ON)
+
+set(document_folder "${CMAKE_INSTALL_DATADIR}/doc/fxprobe")
 set(licence_name copyright) # where Debian's users look for it
 if(WIN32)
     set(document_folder .)

@@ -1,0 +1,42 @@
+# shellcheck shell=bash
+# A Wine of its own for one run, with a screen of its own. Sourced after lib.sh, never run.
+
+export WINEDEBUG=-all
+# Neither the .NET nor the HTML engine is needed, nor entries in anybody's menu; without this, Wine asks about them.
+export WINEDLLOVERRIDES='mscoree=;mshtml=;winemenubuilder.exe='
+
+wine_folder=''
+screen=''
+
+# start_wine: sets WINEPREFIX and DISPLAY; both end with the script. A script that runs inside another uses the other's.
+start_wine() {
+    [[ -z ${FXPROBE_WINE-} ]] || return 0
+    export FXPROBE_WINE=1
+    local number
+    wine_folder=$(mktemp -d)
+    trap stop_wine EXIT
+    trap 'exit 130' INT TERM
+    export WINEPREFIX=$wine_folder/prefix
+    mkfifo "$wine_folder/display"
+    exec 7<>"$wine_folder/display"
+    Xvfb -displayfd 7 -screen 0 1280x800x24 -nolisten tcp >/dev/null 2>&1 &
+    screen=$!
+    read -r -t 30 -u 7 number || fail "Xvfb did not start"
+    exec 7>&-
+    export DISPLAY=:$number
+    step "Starting Wine" prepare_wine
+}
+
+prepare_wine() {
+    wine wineboot --init
+    wineserver --wait
+    wineserver --persistent
+}
+
+# shellcheck disable=SC2317 # called by the trap
+stop_wine() {
+    wineserver --kill || true
+    if [[ -n $screen ]]; then kill "$screen" 2>/dev/null || true; fi
+    wait
+    rm -rf "$wine_folder"
+}
