@@ -22,7 +22,7 @@ build_cached() {
     prefix=$(cached_path "$1" "$2")
     [[ ! -d $prefix ]] || return 0
     mkdir -p "$cache"
-    exec 8>"$cache/lock"
+    exec 8>"$cache/$1.lock"
     if ! flock --nonblock 8; then
         printf 'Waiting for another build in %s\n' "$cache"
         flock 8
@@ -30,7 +30,7 @@ build_cached() {
     [[ ! -d $prefix ]] || return 0
 
     # An interrupted build, its processes gone with the lock.
-    rm -rf "$cache"/*.part
+    rm -rf "$cache/$1"-*.part
     mkdir "$prefix.part"
     shift 2
     while (($# > 0)); do
@@ -59,6 +59,12 @@ debian_source() {
     done
     printf 'The mirror has another version of %s than this machine: apt-get upgrade\n' "$1" >&2
     return 1
+}
+
+# unpack PACKAGE FOLDER: the upstream archive of a source package.
+unpack() {
+    mkdir -p "$2"
+    tar -xf "$(debian_source "$1")" -C "$2" --strip-components=1
 }
 
 upstream_version_of() {

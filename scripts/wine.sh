@@ -28,13 +28,12 @@ start_wine() {
 }
 
 prepare_wine() {
-    wine wineboot --init
-    wineserver --wait
-    wineserver --persistent
+    wine wineboot --init && wineserver --wait && wineserver --persistent
 }
 
 # shellcheck disable=SC2317 # called by the trap
 stop_wine() {
+    [[ -n $wine_folder ]] || return 0
     wineserver --kill || true
     if [[ -n $screen ]]; then kill "$screen" 2>/dev/null || true; fi
     wait
