@@ -12,6 +12,8 @@ const char kEnding[] = ".so";
 
 } // namespace
 
+QString vst2Ending() { return QLatin1String(kEnding); }
+
 QString vst2FixturePath(VST2Fixture fixture)
 {
     switch (fixture) {
@@ -29,7 +31,7 @@ QString vst2FixturePath(VST2Fixture fixture)
 
 QString addVST2File(const QString &folder, const QString &name, const QByteArray &script, VST2Fixture fixture)
 {
-    const QString path = folder + QLatin1Char('/') + name + QLatin1String(kEnding);
+    const QString path = folder + QLatin1Char('/') + name + vst2Ending();
     putFixture(vst2FixturePath(fixture), path, script);
     return path;
 }

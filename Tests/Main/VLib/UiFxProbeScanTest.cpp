@@ -5,10 +5,6 @@
 
 #include <gtest/gtest.h>
 
-#include <system_error>
-
-#include <pthread.h>
-
 namespace {
 
 /// A scan that goes on until its window asks it to stop.
@@ -74,41 +70,6 @@ TEST(UiFxProbeScan, EndsWhateverItThrows)
               "The scan ended with an exception: 100* broken");
     EXPECT_EQ(logAfterScan([](const QString &) { throw 5; }), "The scan ended with an unknown exception");
     EXPECT_EQ(logAfterScan(nullptr), "The scan ended with an exception: bad_function_call");
-}
-
-TEST(UiFxProbeScan, EndsWhenAPluginEndsTheThread)
-{
-#ifndef __GLIBC__
-    GTEST_SKIP() << "only here does the end of a thread unwind its stack";
-#else
-    EXPECT_EQ(logAfterScan([](const QString &) { pthread_exit(nullptr); }),
-              "The scan's thread was ended by a plug-in");
-#endif
-}
-
-TEST(UiFxProbeScan, NothingStaysInstalledWithoutAThread)
-{
-#ifndef __GLIBC__
-    GTEST_SKIP() << "no way to make the start of a thread fail";
-#else
-    pthread_attr_t normal;
-    pthread_attr_t impossible;
-    pthread_getattr_default_np(&normal);
-    pthread_attr_init(&impossible);
-    pthread_attr_setstacksize(&impossible, size_t(1) << 47);
-    ASSERT_EQ(pthread_setattr_default_np(&impossible), 0);
-    bool started = false;
-    try {
-        const UiFxProbe dialog(QString(), [&started](const QString &) { started = true; });
-        ADD_FAILURE() << "no exception";
-    } catch (const std::system_error &error) {
-        EXPECT_EQ(error.code(), std::errc::resource_unavailable_try_again);
-    }
-    pthread_setattr_default_np(&normal);
-    pthread_attr_destroy(&normal);
-    EXPECT_FALSE(started);
-    EXPECT_EQ(installedVUI(), nullptr);
-#endif
 }
 
 TEST(UiFxProbeScan, NobodyReachesAWindowThatIsGone)

@@ -192,9 +192,10 @@ TEST_F(VSTHostTest, AShellLeavesTheProgressToTheFilesAgain)
     installVUI(ui);
     EXPECT_TRUE(m_host.Scan(true, true));
     installVUI(nullptr);
-    EXPECT_EQ(ui->seen,
-              QStringList({"range 2 ", "value 0", "60000 Scanning: a Shell.so", "range 2 Scanning WaveShell",
-                           "60000 Scanning: A", "notified fffffff", "value 1", "60000 Scanning: B",
-                           "notified fffffff", "value 2", "range 2 ", "value 0", "value 1",
-                           "60000 Scanning: b Comp.so", "notified fffffff", "value 2"}));
+    EXPECT_EQ(
+        ui->seen,
+        QStringList({"range 2 ", "value 0", "60000 Scanning: a Shell" + vst2Ending(),
+                     "range 2 Scanning WaveShell", "60000 Scanning: A", "notified fffffff", "value 1",
+                     "60000 Scanning: B", "notified fffffff", "value 2", "range 2 ", "value 0", "value 1",
+                     "60000 Scanning: b Comp" + vst2Ending(), "notified fffffff", "value 2"}));
 }

@@ -4,7 +4,7 @@
 
 QString VSTScanBench::modulePath(const QString &name) const
 {
-    return m_folder.plugins() + QLatin1Char('/') + name + QStringLiteral(".so");
+    return m_folder.plugins() + QLatin1Char('/') + name + vst2Ending();
 }
 
 QString VSTScanBench::add(const QString &name, const QByteArray &script, VST2Fixture fixture) const

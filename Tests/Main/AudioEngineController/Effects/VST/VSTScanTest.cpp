@@ -81,7 +81,7 @@ TEST_F(VSTScan, MarksSurviveAnUpdate)
     // Moved, the file is probed again with its marks, also the switch-off.
     const QString moved = m_folder.plugins() + QStringLiteral("/sub");
     ASSERT_TRUE(QDir().mkpath(moved));
-    ASSERT_TRUE(QFile::rename(modulePath(QStringLiteral("B")), moved + QStringLiteral("/B.so")));
+    ASSERT_TRUE(QFile::rename(modulePath(QStringLiteral("B")), moved + QStringLiteral("/B") + vst2Ending()));
     ASSERT_TRUE(QFile::remove(modulePath(QStringLiteral("C"))));
     scan();
     EXPECT_EQ(records("Name Enabled"), texts({"A|1", "B|0"}));
@@ -120,7 +120,8 @@ TEST_F(VSTScan, WhatAPluginChangesIsPutBack)
     EXPECT_EQ(records("Name").size(), number + 2);
     EXPECT_EQ(sortedRecords("Working"),
               QStringList(QVector<QString>(number + 2, QStringLiteral("1")).toList()));
-    EXPECT_TRUE(outcome.log.contains(QStringLiteral("Thread.so left threads running and stays in memory")));
+    EXPECT_TRUE(outcome.log.contains(QStringLiteral("Thread") + vst2Ending() +
+                                     QStringLiteral(" left threads running and stays in memory")));
     const QString catalogue = m_folder.path(QStringLiteral("Effects/FXConfiguration.xml"));
     EXPECT_TRUE(QFile::permissions(catalogue) & QFile::ReadOther);
     expectSettled();

@@ -115,7 +115,8 @@ TEST_F(VSTShell, OfTwoSpecialShellsTheLaterVersionStays)
         add(QStringLiteral("%1/WaveShell2-VST 9.2_x64").arg(laterFirst ? "b" : "c"), child);
         scan();
         ASSERT_EQ(records("Name").size(), 1);
-        EXPECT_TRUE(records("Path").first().endsWith(QStringLiteral("WaveShell1-VST 9.3_x64.so")));
+        EXPECT_TRUE(
+            records("Path").first().endsWith(QStringLiteral("WaveShell1-VST 9.3_x64") + vst2Ending()));
         for (const char *folder : {"a", "b"})
             EXPECT_TRUE(
                 QDir(m_folder.plugins() + QLatin1Char('/') + QLatin1String(folder)).removeRecursively());
