@@ -2,6 +2,7 @@
 
 #include <QByteArray>
 
+#include <algorithm>
 #include <cstring>
 #include <optional>
 #include <type_traits>
@@ -52,6 +53,18 @@ public:
         const std::optional<ByteView> place = part(offset, length + 1);
         return place && std::memcmp(place->m_data, text.constData(), length) == 0 &&
                place->m_data[length] == 0;
+    }
+
+    /// The text that starts at `offset` and ends with a zero; none when it has more than `most` characters.
+    std::optional<QByteArray> text(quint64 offset, quint64 most) const
+    {
+        const ByteView rest = from(offset);
+        const auto length = std::min(rest.m_size, most + 1);
+        const void *end = length == 0 ? nullptr : std::memchr(rest.m_data, 0, length);
+        if (!end)
+            return std::nullopt;
+        const auto *start = reinterpret_cast<const char *>(rest.m_data);
+        return QByteArray(start, static_cast<int>(static_cast<const char *>(end) - start));
     }
 
 private:

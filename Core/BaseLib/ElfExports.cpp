@@ -113,10 +113,9 @@ ExportAnswer findByGnuHash(const ElfTables &tables, const QByteArray &name)
 
 } // namespace
 
-ExportAnswer findElfExports(const uchar *data, qint64 size, const std::vector<QByteArray> &names)
+ExportAnswer findElfExports(ByteView file, const std::vector<QByteArray> &names)
 {
-    const std::optional<ElfTables> tables =
-        data && size > 0 ? readElfTables(ByteView(data, static_cast<quint64>(size))) : std::nullopt;
+    const std::optional<ElfTables> tables = readElfTables(file);
     if (!tables)
         return ExportAnswer::Unknown;
     for (const QByteArray &name : names) {

@@ -1,9 +1,7 @@
 #include "Core/BaseLib/ElfTables.h"
 
 #include "Core/BaseLib/ElfFormat.h"
-
-#include <limits>
-#include <vector>
+#include "Core/BaseLib/LoadedParts.h"
 
 namespace {
 
@@ -13,48 +11,20 @@ bool isSharedLibrary(const ElfHeader &header)
            header.machine == kElfMachineX86_64 && header.programHeaderSize == sizeof(ElfProgramHeader);
 }
 
-/// Where the loader would put the file's parts.
-class Segments {
-public:
-    /// False when the file has no such part, or when its place is not behind that of the one before.
-    bool add(ByteView file, const ElfProgramHeader &header)
-    {
-        const std::optional<ByteView> content = file.part(header.offset, header.fileSize);
-        if (!content || header.fileSize > header.memorySize || header.address < m_end ||
-            header.memorySize > std::numeric_limits<quint64>::max() - header.address)
-            return false;
-        m_end = header.address + header.memorySize;
-        m_segments.push_back({header.address, *content});
-        return true;
-    }
-
-    /// The bytes from an address to the end of what its segment has in the file; empty when there are none.
-    ByteView from(quint64 address) const
-    {
-        for (const Segment &segment : m_segments) {
-            if (address >= segment.address && address - segment.address < segment.content.size())
-                return segment.content.from(address - segment.address);
-        }
-        return {};
-    }
-
-private:
-    struct Segment {
-        quint64 address;
-        ByteView content;
-    };
-    std::vector<Segment> m_segments;
-    quint64 m_end = 0;
-};
+bool addSegment(LoadedParts &segments, ByteView file, const ElfProgramHeader &header)
+{
+    const std::optional<ByteView> content = file.part(header.offset, header.fileSize);
+    return content && segments.add(header.address, header.memorySize, *content);
+}
 
 struct LoadPlan {
-    Segments segments;
+    LoadedParts segments;
     std::optional<ElfProgramHeader> dynamic;
 
     bool add(ByteView file, const ElfProgramHeader &header)
     {
         if (header.type == kElfSegmentLoad)
-            return segments.add(file, header);
+            return addSegment(segments, file, header);
         if (header.type != kElfSegmentDynamic)
             return true;
         const bool isFirst = !dynamic;
@@ -141,7 +111,7 @@ std::optional<ElfTables> readElfTables(ByteView file)
     const std::optional<DynamicSection> dynamic = plan ? readDynamicSection(*plan) : std::nullopt;
     if (!dynamic || !dynamic->isComplete())
         return std::nullopt;
-    const Segments &segments = plan->segments;
+    const LoadedParts &segments = plan->segments;
     const std::optional<ByteView> strings = segments.from(*dynamic->strings).part(0, *dynamic->stringsSize);
     if (!strings)
         return std::nullopt;

@@ -32,7 +32,7 @@ ExportAnswer ask(const QByteArray &content, const std::vector<QByteArray> &names
     const auto size = static_cast<size_t>(content.size());
     const std::unique_ptr<uchar[]> bytes(new uchar[size + 1]);
     std::memcpy(bytes.get() + 1, content.constData(), size);
-    return findElfExports(bytes.get() + 1, content.size(), names);
+    return findElfExports(ByteView(bytes.get() + 1, size), names);
 }
 
 /// A library's content, with means to change it. The tables of the fixtures lie in the first segment, where
@@ -175,7 +175,7 @@ TEST(BinaryExports, FilesThatCannotBeReadAreLeftToTheLoader)
     ASSERT_EQ(mkfifo(QFile::encodeName(folder.path(QStringLiteral("pipe.so"))).constData(), 0600), 0);
     for (const char *name : {"empty.so", "text.so", "pe.so", "pipe.so", "missing.so", "Plugins", "/dev/zero"})
         EXPECT_EQ(findExports(folder.path(QLatin1String(name)), kEntryPoints), ExportAnswer::Unknown) << name;
-    EXPECT_EQ(findElfExports(nullptr, 0, kEntryPoints), ExportAnswer::Unknown);
+    EXPECT_EQ(findElfExports(ByteView(), kEntryPoints), ExportAnswer::Unknown);
 }
 
 namespace {
