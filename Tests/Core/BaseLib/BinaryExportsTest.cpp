@@ -1,5 +1,6 @@
 #include "Core/BaseLib/BinaryExports.h"
 
+#include "Tests/Core/BaseLib/Fixtures.h"
 #include "Tests/Support/TestFolder.h"
 
 #include <QDir>
@@ -119,12 +120,6 @@ struct Library {
 };
 
 } // namespace
-
-void PrintTo(ExportAnswer answer, std::ostream *out)
-{
-    const char *const kNames[] = {"Exported", "NotExported", "Unknown"};
-    *out << kNames[static_cast<int>(answer)];
-}
 
 class BuiltLibrary
     : public testing::TestWithParam<std::tuple<std::pair<const char *, ExportAnswer>, const char *>> {};

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Core/BaseLib/BinaryExports.h"
 #include "Core/BaseLib/TextFile.h"
 
 #include "Tests/Support/QtPrinters.h"
@@ -8,7 +9,14 @@
 #include <QTemporaryDir>
 
 #include <clocale>
+#include <ostream>
 #include <string>
+
+inline void PrintTo(ExportAnswer answer, std::ostream *out)
+{
+    const char *const kNames[] = {"Exported", "NotExported", "Unknown"};
+    *out << kNames[static_cast<int>(answer)];
+}
 
 inline QString operator""_q(const char *utf8, std::size_t length)
 {

@@ -1,0 +1,224 @@
+#include "Core/BaseLib/PeImage.h"
+#include "Core/BaseLib/LoadFailure.h"
+
+#include "Tests/Core/BaseLib/Fixtures.h"
+#include "Tests/Core/BaseLib/PeBuilder.h"
+
+#include <gtest/gtest.h>
+
+#include <map>
+#include <memory>
+
+namespace {
+
+using Answer = ExportAnswer;
+const std::vector<QByteArray> kEntryPoints = {"VSTPluginMain", "main"};
+const PeContent kPlugin = {{"alpha", "main", "omega"}, {"KERNEL32.dll", "drums.dll"}, {"late.dll"}};
+
+/// What is read from an image, with the bytes at an odd address and nothing behind them, where a sanitizer
+/// sees every step aside.
+struct Reading {
+    std::unique_ptr<uchar[]> bytes;
+    std::optional<PeImage> image;
+
+    explicit Reading(const QByteArray &content)
+        : bytes(new uchar[static_cast<size_t>(content.size()) + 1])
+    {
+        std::memcpy(bytes.get() + 1, content.constData(), static_cast<size_t>(content.size()));
+        image = PeImage::read(ByteView(bytes.get() + 1, static_cast<quint64>(content.size())));
+    }
+    Answer exports(const std::vector<QByteArray> &names = kEntryPoints) const
+    {
+        return image ? image->findExports(names) : Answer::Unknown;
+    }
+    /// The imported libraries, the late ones behind a bar; "?" for an unreadable table.
+    QString libraries() const
+    {
+        const auto text = [](const std::optional<QStringList> &names) {
+            return names ? names->join(QLatin1Char(' ')) : QStringLiteral("?");
+        };
+        return image ? text(image->imports()) + '|' + text(image->delayImports()) : "?|?"_q;
+    }
+};
+
+const QString kAllLibraries = "KERNEL32.dll drums.dll|late.dll"_q;
+
+/// An image changed at one place.
+struct Damage {
+    const char *name;
+    int offset;
+    int width;
+    quint32 value;
+    Answer exports = Answer::Unknown;
+    QString libraries = "?|?"_q;
+};
+
+using namespace PePlace;
+const Damage kDamages[] = {
+    {"nothing", 0, 1, 'M', Answer::Exported, kAllLibraries},
+    {"no library", kFlags, 2, 2, Answer::Exported, kAllLibraries},
+    {"without the DOS magic", 0, 1, 'N'},
+    {"without the PE magic", 0x40, 1, 'N'},
+    {"header far behind the file", kNewHeader, 4, ~0U},
+    {"header at the end of the file", kNewHeader, 4, 0x3fe},
+    {"neither 32-bit nor 64-bit", kOptionalHeader, 2, 0x107},
+    {"optional header too short", kOptionalHeaderSize, 2, 71},
+    {"optional header up to the directories", kOptionalHeaderSize, 2, 112},
+    {"optional header beyond the file", kOptionalHeaderSize, 2, 0xffff},
+    {"laid out as a driver", kSectionAlignment, 4, 512},
+    {"headers beyond the file", kHeadersSize, 4, ~0U},
+    {"headers over the section", kHeadersSize, 4, 0x1001},
+    {"no directories", kDirectoryCount, 4, 0, Answer::NotExported, "|"_q},
+    {"directories up to the imports", kDirectoryCount, 4, 2, Answer::Exported, "KERNEL32.dll drums.dll|"_q},
+    {"more directories than there is room for", kDirectoryCount, 4, ~0U, Answer::Exported, kAllLibraries},
+    {"no section", kSectionCount, 2, 0, Answer::Unknown, "?|?"_q},
+    {"more sections than there are", kSectionCount, 2, 2},
+    {"section in memory nowhere", kSection + 12, 4, 0xfffff000},
+    {"section of no size in memory", kSection + 8, 4, 0, Answer::Exported, kAllLibraries},
+    {"section ends with its page", kSection + 8, 4, 1, Answer::Exported, kAllLibraries},
+    {"section of no size in the file", kSection + 16, 4, 0},
+    {"section longer than the file", kSection + 16, 4, 0x1000},
+    {"section wraps around", kSection + 16, 4, ~0U},
+    {"section behind the file", kSection + 20, 4, 0x10000},
+    {"section within a sector", kSection + 20, 4, kTables + 1},
+    {"exports nowhere", kDirectories, 4, ~0U, Answer::Unknown, kAllLibraries},
+    {"exports at the end of the section", kDirectories, 4, 0x11f0, Answer::Unknown, kAllLibraries},
+    {"no functions", kFunctionCount, 4, 0, Answer::Unknown, kAllLibraries},
+    {"names up to the one before", kNameCount, 4, 1, Answer::NotExported, kAllLibraries},
+    {"all names there can be", kNameCount, 4, ~0U, Answer::Unknown, kAllLibraries},
+    {"functions nowhere", kFunctionTable, 4, 0x8000, Answer::Unknown, kAllLibraries},
+    {"functions at zeros", kFunctionTable, 4, 0x1000, Answer::NotExported, kAllLibraries},
+    {"names nowhere", kNameTable, 4, 0x8000, Answer::Unknown, kAllLibraries},
+    {"ordinals nowhere", kOrdinalTable, 4, 0x8000, Answer::Unknown, kAllLibraries},
+    {"imports nowhere", kDirectories + 8, 4, ~0U, Answer::Exported, "?|late.dll"_q},
+    {"imports at the end of the section", kDirectories + 8, 4, 0x11f0, Answer::Exported, "?|late.dll"_q},
+    {"no imports", kDirectories + 8, 4, 0, Answer::Exported, "|late.dll"_q},
+    {"late imports nowhere", kDirectories + 104, 4, ~0U, Answer::Exported, "KERNEL32.dll drums.dll|?"_q},
+    {"late imports by the names of the others", kDirectories + 104, 4, 0x1000, Answer::Exported,
+     "KERNEL32.dll drums.dll|"_q},
+};
+
+} // namespace
+
+TEST(PeImage, TablesAreReadAndChecked)
+{
+    for (const Damage &damage : kDamages) {
+        SCOPED_TRACE(damage.name);
+        QByteArray content = PeBuilder(kPlugin).build();
+        PeBuilder::put(content, damage.offset, damage.width, damage.value);
+        const Reading reading(content);
+        EXPECT_EQ(reading.exports(), damage.exports);
+        EXPECT_EQ(reading.libraries(), damage.libraries);
+    }
+}
+
+TEST(PeImage, AnImageCutShortIsLeftToTheLoader)
+{
+    const QByteArray content = PeBuilder(kPlugin).build();
+    for (int size = 0; size < content.size(); ++size) {
+        const Reading reading(content.left(size));
+        ASSERT_EQ(reading.exports(), Answer::Unknown) << size << " bytes";
+        ASSERT_EQ(reading.libraries(), "?|?"_q) << size << " bytes";
+    }
+}
+
+TEST(PeImage, DamageInventsNothing)
+{
+    QByteArray content = PeBuilder(kPlugin).build();
+    std::map<Answer, int> seen;
+    for (int position = 0; position < content.size(); ++position) {
+        const char original = content.at(position);
+        for (const char value : {'\0', '\x01', '\xff', char(~original)}) {
+            content[position] = value;
+            const Reading reading(content);
+            ASSERT_NE(reading.exports({"GetPluginFactory"}), Answer::Exported) << "byte " << position;
+            ASSERT_LE(reading.libraries().size(), 2 * kAllLibraries.size()) << "byte " << position;
+            ++seen[reading.exports()];
+        }
+        content[position] = original;
+    }
+    EXPECT_EQ(seen.size(), 3U) << "the damage did not reach what is read";
+}
+
+TEST(PeImage, AnyMachinesExportsCount)
+{
+    const struct {
+        const char *name;
+        PeContent content;
+        Answer expected;
+    } rows[] = {
+        {"ours", {{"VSTPluginMain"}, {}, {}}, Answer::Exported},
+        {"32-bit x86", {{"VSTPluginMain"}, {"a.dll"}, {}, 0x014c, false}, Answer::Exported},
+        {"ARM64, older entry point", {{"x", "main"}, {}, {}, 0xaa64}, Answer::Exported},
+        {"32-bit x86, no entry point", {{"mainly", "mai", ""}, {}, {}, 0x014c, false}, Answer::NotExported},
+        {"no exports", {}, Answer::NotExported},
+        {"as many exports as there can be",
+         {std::vector<QByteArray>(1 << 16, "x"), {}, {}},
+         Answer::NotExported},
+        {"more exports than there can be",
+         {std::vector<QByteArray>((1 << 16) + 1, "x"), {}, {}},
+         Answer::Unknown},
+    };
+    const EmptyFolder folder;
+    for (const auto &row : rows) {
+        const QString path = folder.write("some.dll"_q, PeBuilder(row.content).build());
+        EXPECT_EQ(findExports(path, kEntryPoints), row.expected) << row.name;
+    }
+}
+
+namespace {
+
+struct Folder {
+    EmptyFolder files;
+    /// Finds what was written, and the system's "KERNEL32.dll".
+    std::optional<QString> find(const QString &name) const
+    {
+        const QString path = files.path(name);
+        return name == "KERNEL32.dll"_q ? QString()
+               : QFile::exists(path)    ? std::make_optional(path)
+                                        : std::nullopt;
+    }
+};
+
+} // namespace
+
+TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
+{
+    const Folder folder;
+    const auto add = [&](const char *name, const PeContent &content) {
+        folder.files.write(QLatin1String(name), PeBuilder(content).build());
+    };
+    add("ring1.dll", {{}, {"KERNEL32.dll", "RING2.dll"}, {}});
+    add("RING2.dll", {{}, {"ring1.dll", "ring2.DLL"}, {}});
+    add("old.dll", {{}, {}, {}, 0x014c, false});
+    add("lacking.dll", {{}, {"ring1.dll", "gone.dll"}, {}});
+    folder.files.write("empty.dll"_q);
+    folder.files.write("text.dll"_q, "text");
+    folder.files.write("short.dll"_q, PeBuilder(kPlugin).build().left(600));
+    const struct {
+        const char *name;
+        PeContent content;
+        const char *reason;
+    } rows[] = {
+        {"nothing wrong, and imports in circles", {{}, {"KERNEL32.dll", "ring1.dll"}, {}}, ""},
+        {"late imports do not matter", {{}, {}, {"gone.dll"}}, ""},
+        {"32-bit x86", {{}, {"gone.dll"}, {}, 0x014c, false}, "is built for 32-bit x86"},
+        {"32-bit ARM", {{}, {}, {}, 0x01c4, false}, "is built for 32-bit ARM"},
+        {"ARM64", {{}, {}, {}, 0xaa64}, "is built for ARM64"},
+        {"unheard of", {{}, {}, {}, 0x0bad}, "is built for another machine (type 0x0BAD)"},
+        {"missing", {{}, {"ring1.dll", "gone.dll", "x.dll"}, {}}, "needs gone.dll, which is not found"},
+        {"missing one level down",
+         {{}, {"lacking.dll"}, {}},
+         "needs lacking.dll, which needs gone.dll, which is not found"},
+        {"needs another machine's", {{}, {"old.dll"}, {}}, "needs old.dll, which is built for 32-bit x86"},
+        {"needs a text", {{}, {"text.dll"}, {}}, "needs text.dll, which is no Windows library"},
+        {"needs a part", {{}, {"short.dll"}, {}}, "needs short.dll, which is cut short or damaged"},
+        {"the loader knows about an empty file", {{}, {"empty.dll"}, {}}, ""},
+    };
+    const auto search = [&](const QString &name) { return folder.find(name); };
+    for (const auto &row : rows) {
+        const QString path = folder.files.write("plugin.dll"_q, PeBuilder(row.content).build());
+        EXPECT_EQ(whyNotLoadable(path, search), QLatin1String(row.reason)) << row.name;
+    }
+    EXPECT_EQ(whyNotLoadable("missing.dll"_q, search), QString());
+}
