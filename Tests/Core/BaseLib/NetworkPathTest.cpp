@@ -94,7 +94,7 @@ TEST(NetworkPath, IsFoundByShareOrByServer)
         {"server by a shorter name", R"(\\srv\D$\x)"_q, R"(\\sr\a)"_q, {}, false, R"(P:\x)"_q},
         {"share on a later drive", R"(\\s\D$\x)"_q, R"(\\s\a \\s\D$)"_q, R"(Q:\x)"_q, true},
         {"by server, too long", R"(\\s\$\x)"_q + kLong, R"(\\s\a)"_q, {}, true, R"(P:\x)"_q + kLong},
-        {"no server", R"(\\)"_q, R"(\\s\a)"_q, {}, false},
+        {"no server", R"(\\)"_q, R"(\\s\a \\)"_q, {}, false},
         {"remote name without a server", R"(\\s\a)"_q, R"(\\)"_q, {}, false},
         {"empty path", {}, R"(\\s\a)"_q, {}, false},
     };

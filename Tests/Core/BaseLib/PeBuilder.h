@@ -126,8 +126,8 @@ private:
         put32(directory(0) - 4, directories);
         put32(section + 8, m_bytes.size() - kTables);
         put32(section + 12, kTablesAddress);
-        put32(section + 16, m_bytes.size() - kTables);
-        put32(section + 20, kTables);
+        put32(section + 16, m_bytes.size() - kTables - 1);
+        put32(section + 20, kTables + 1); // rounded down when it is loaded
     }
 
     QByteArray m_bytes;

@@ -54,6 +54,9 @@ struct Damage {
 };
 
 using namespace PePlace;
+constexpr int kImports = kTables + 40 + 3 * 10 + 17;       // behind three exports and their names
+constexpr int kDelayImports = kImports + 3 * 20 + 13 + 10; // behind two imports and their names
+
 const Damage kDamages[] = {
     {"nothing", 0, 1, 'M', Answer::Exported, kAllLibraries},
     {"no library", kFlags, 2, 2, Answer::Exported, kAllLibraries},
@@ -80,7 +83,6 @@ const Damage kDamages[] = {
     {"section longer than the file", kSection + 16, 4, 0x1000},
     {"section wraps around", kSection + 16, 4, ~0U},
     {"section behind the file", kSection + 20, 4, 0x10000},
-    {"section within a sector", kSection + 20, 4, kTables + 1},
     {"exports nowhere", kDirectories, 4, ~0U, Answer::Unknown, kAllLibraries},
     {"exports at the end of the section", kDirectories, 4, 0x11f0, Answer::Unknown, kAllLibraries},
     {"no functions", kFunctionCount, 4, 0, Answer::Unknown, kAllLibraries},
@@ -93,6 +95,9 @@ const Damage kDamages[] = {
     {"imports nowhere", kDirectories + 8, 4, ~0U, Answer::Exported, "?|late.dll"_q},
     {"imports at the end of the section", kDirectories + 8, 4, 0x11f0, Answer::Exported, "?|late.dll"_q},
     {"no imports", kDirectories + 8, 4, 0, Answer::Exported, "|late.dll"_q},
+    {"imports end with a missing name", kImports + 12, 4, 0, Answer::Exported, "|late.dll"_q},
+    {"imports end with a missing table", kImports + 36, 4, 0, Answer::Exported, "KERNEL32.dll|late.dll"_q},
+    {"late imports of the last century", kDelayImports, 4, 0, Answer::Exported, "KERNEL32.dll drums.dll|?"_q},
     {"late imports nowhere", kDirectories + 104, 4, ~0U, Answer::Exported, "KERNEL32.dll drums.dll|?"_q},
     {"late imports by the names of the others", kDirectories + 104, 4, 0x1000, Answer::Exported,
      "KERNEL32.dll drums.dll|"_q},
