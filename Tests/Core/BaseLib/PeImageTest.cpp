@@ -169,6 +169,8 @@ TEST(PeImage, AnyMachinesExportsCount)
         const QString path = folder.write("some.dll"_q, PeBuilder(row.content).build());
         EXPECT_EQ(findExports(path, kEntryPoints), row.expected) << row.name;
     }
+    EXPECT_EQ(findExports(ONE_FUNCTION_LIBRARY, {"countUnloading"}), Answer::Exported) << "this system's";
+    EXPECT_EQ(findExports(ONE_FUNCTION_LIBRARY, kEntryPoints), Answer::NotExported) << "this system's";
 }
 
 namespace {
