@@ -11,6 +11,7 @@ namespace FaultCode {
 inline constexpr quint32 kAccessViolation = 0xC0000005;
 inline constexpr quint32 kIllegalInstruction = 0xC000001D;
 inline constexpr quint32 kIntegerDivideByZero = 0xC0000094;
+inline constexpr quint32 kStackOverflow = 0xC00000FD;
 } // namespace FaultCode
 
 /// A hardware fault that guarded code committed, as an ordinary exception: "SE Exception: " with "Access
@@ -24,30 +25,37 @@ private:
     quint32 m_code;
 };
 
-namespace FaultGuardDetail {
-/// Calls `function(argument)`. A hardware fault in it on this thread ends the call and is thrown from here as
-/// an `SEException`; C++ exceptions pass through.
-void run(void (*function)(void *), void *argument);
-} // namespace FaultGuardDetail
+/// A C++ exception of another compiler's run-time library, which this program's `catch` does not see, as an
+/// ordinary one: its own text, or its type. Only Windows has such compilers.
+class ForeignException : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
 
-/// Calls a function of strangers with hardware faults turned into exceptions (`SEException`). Guards nest and
-/// are per thread; outside a guard a fault ends the process as ever. Frames of the function itself are left
-/// without unwinding, so what it calls in our own code must not hold locks or memory while it touches the
-/// stranger's.
+namespace FaultGuardDetail {
+
+/// What ends a guarded call and becomes an exception.
+enum class Watch { FaultsAndForeignExceptions, ForeignExceptions };
+
+/// Calls `function(argument)`. What is watched for and happens in it on this thread ends the call and is
+/// thrown from here as an `SEException` or a `ForeignException`; C++ exceptions pass through.
+void run(Watch watch, void (*function)(void *), void *argument);
+
 template <typename Function>
-auto callGuarded(Function &&function) -> std::invoke_result_t<Function &>
+auto call(Watch watch, Function &function) -> std::invoke_result_t<Function &>
 {
     using Result = std::invoke_result_t<Function &>;
-    using Callee = std::remove_reference_t<Function>;
     if constexpr (std::is_void_v<Result>) {
-        FaultGuardDetail::run([](void *callee) { (*static_cast<Callee *>(callee))(); }, &function);
+        run(
+            watch, [](void *callee) { (*static_cast<Function *>(callee))(); }, &function);
     } else {
         static_assert(std::is_trivially_destructible_v<Result>);
         struct Call {
-            Callee *callee;
+            Function *callee;
             Result result;
         } call{&function, {}};
-        FaultGuardDetail::run(
+        run(
+            watch,
             [](void *data) {
                 auto *guarded = static_cast<Call *>(data);
                 guarded->result = (*guarded->callee)();
@@ -55,6 +63,25 @@ auto callGuarded(Function &&function) -> std::invoke_result_t<Function &>
             &call);
         return call.result;
     }
+}
+
+} // namespace FaultGuardDetail
+
+/// Calls a function of strangers with hardware faults turned into exceptions (`SEException`), and so are the
+/// C++ exceptions of other compilers (`ForeignException`). Guards nest and are per thread; outside a guard a
+/// fault ends the process as ever. Frames of the function itself are left without unwinding, so what it calls
+/// in our own code must not hold locks or memory while it touches the stranger's.
+template <typename Function>
+auto callGuarded(Function &&function) -> std::invoke_result_t<Function &>
+{
+    return FaultGuardDetail::call(FaultGuardDetail::Watch::FaultsAndForeignExceptions, function);
+}
+
+/// The same for C++ exceptions of other compilers alone: a fault ends the process as without a guard.
+template <typename Function>
+auto callTranslated(Function &&function) -> std::invoke_result_t<Function &>
+{
+    return FaultGuardDetail::call(FaultGuardDetail::Watch::ForeignExceptions, function);
 }
 
 /// The text of an exception that a stranger threw, whose own code gives it; empty when that code fails.

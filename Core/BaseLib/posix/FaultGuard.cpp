@@ -99,8 +99,13 @@ public:
 
 } // namespace
 
-void FaultGuardDetail::run(void (*function)(void *), void *argument)
+void FaultGuardDetail::run(Watch watch, void (*function)(void *), void *argument)
 {
+    // All compilers of the system share one run-time library for exceptions: none is foreign.
+    if (watch == Watch::ForeignExceptions) {
+        function(argument);
+        return;
+    }
     arm();
     Guard guard;
     const Nesting nesting(guard);

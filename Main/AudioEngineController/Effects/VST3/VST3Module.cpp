@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Module.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
 #include <pluginterfaces/base/ipluginbase.h>
@@ -28,7 +29,7 @@ bool VST3Module::open(const QString &path)
         m_initialised = true;
     if (!m_initialised)
         return false;
-    const bool started = VST3ModuleFile::start(m_library);
+    const bool started = callTranslated([this] { return VST3ModuleFile::start(m_library); });
     if (!started)
         DebugLog(L"The module %ls reports that it could not start", path);
     return started;
@@ -39,7 +40,7 @@ Steinberg::IPluginFactory *VST3Module::factory()
     if (m_factory)
         return m_factory;
     if (const auto getFactory = reinterpret_cast<FactoryFunction>(m_library.symbol("GetPluginFactory")))
-        m_factory = getFactory();
+        m_factory = callTranslated([&] { return getFactory(); });
     return m_factory;
 }
 
@@ -49,7 +50,7 @@ template <typename Step>
 void VST3Module::closeStep(Step step)
 {
     try {
-        step();
+        callTranslated(step);
     } catch (const std::exception &error) {
         DebugLog(L"%ls: closing it, the plug-in threw: %s", m_path, error.what());
     } catch (...) {

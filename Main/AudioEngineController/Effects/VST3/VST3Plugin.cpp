@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 #include "Main/VLib/SimpleGUI.h"
 
@@ -107,6 +108,13 @@ void VST3Plugin::openAndList(ClassListing &records, const QString &path, bool no
         throw std::runtime_error("VST3 Exception: Failed to get load module:" + path.toStdString());
     factoryFound = false;
     IPluginFactory *module = m_module.factory();
+    // Not around the loading as well: what passes the system's loader ends the process.
+    callTranslated([&] { listModule(records, module, notifyEachClass, factoryFound); });
+}
+
+void VST3Plugin::listModule(ClassListing &records, IPluginFactory *module, bool notifyEachClass,
+                            bool &factoryFound)
+{
     void *factory = nullptr;
     if (!module || module->queryInterface(IPluginFactory::iid, &factory) != kResultOk || !factory)
         throw std::runtime_error("VST3 Exception: Failed to get factory function");

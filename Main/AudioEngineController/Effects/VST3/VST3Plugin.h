@@ -35,6 +35,8 @@ private:
     struct FactoryView;
 
     void openAndList(ClassListing &records, const QString &path, bool notifyEachClass, bool &factoryFound);
+    void listModule(ClassListing &records, Steinberg::IPluginFactory *module, bool notifyEachClass,
+                    bool &factoryFound);
     void listFactory(ClassListing &records, Steinberg::IPluginFactory *factory, bool notifyEachClass);
     void listClass(ClassListing &records, FactoryView &view, Steinberg::int32 index, bool notify);
     void instantiate(ClassListing &records, const FactoryView &view, const QString &name,
