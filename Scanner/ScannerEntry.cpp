@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/AudioPlugins.h"
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/PluginThread.h"
 #include "Core/BaseLib/ProcessSetup.h"
 #include "Core/BaseLib/TerminationRequest.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
@@ -38,6 +39,7 @@ int reportReWireVersion()
 /// The scan itself; runs on the dialog's worker thread.
 void scanEverything(const QString &dataFolder)
 {
+    const PluginThread thread;
     PluginHost &registry = PluginHost::instance();
     AudioPlugins::setRegistry(&registry);
     registry.initialise(dataFolder, QString(), PluginHost::kDefaultSampleRate, PluginHost::kDefaultBlockSize);

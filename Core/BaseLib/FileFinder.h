@@ -16,7 +16,8 @@ public:
 
     /// The full paths found, "/" as separator: those of a folder in the order of their names, followed by
     /// what lies in its sub-folders. A folder that matches is listed and searched. Hidden entries are passed
-    /// over and linked folders are not entered, so the search cannot loop. Names that are no valid text
+    /// over and linked folders are not entered; junctions are (people keep plug-ins on other drives by them),
+    /// unless one leads back to where the search comes from: it cannot loop. Names that are no valid text
     /// are passed over. A folder that cannot be read, or an empty path, gives one log line.
     QStringList find(const QString &folder) const;
 
@@ -24,7 +25,7 @@ public:
     static void forgetReports();
 
 private:
-    void searchFolder(const QString &folder, QStringList &found) const;
+    void searchFolder(const QString &folder, const QStringList &route, QStringList &found) const;
 
     QString m_ending;
     std::function<bool()> m_cancelled;

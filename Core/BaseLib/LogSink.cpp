@@ -1,7 +1,6 @@
 #include "Core/BaseLib/LogSink.h"
 
 #include "Core/BaseLib/NativeFile.h"
-#include "Core/BaseLib/TextFile.h"
 
 std::shared_ptr<FileLogSink> FileLogSink::onStandardError()
 {
@@ -10,7 +9,7 @@ std::shared_ptr<FileLogSink> FileLogSink::onStandardError()
 
 std::shared_ptr<FileLogSink> FileLogSink::appendingTo(const QString &path)
 {
-    std::FILE *stream = openStream(path, "ab");
+    std::FILE *stream = openStream(path, "a");
     return stream ? std::make_shared<FileLogSink>(stream, true) : nullptr;
 }
 
@@ -27,7 +26,7 @@ FileLogSink::~FileLogSink()
 
 void FileLogSink::write(int, const QString &line)
 {
-    const QByteArray bytes = line.toUtf8() + kLineEnd;
+    const QByteArray bytes = line.toUtf8() + '\n'; // the stream's text mode makes it the platform's
     const std::lock_guard<std::mutex> lock(m_mutex);
     std::fwrite(bytes.constData(), 1, static_cast<std::size_t>(bytes.size()), m_stream);
     std::fflush(m_stream);

@@ -6,7 +6,28 @@
 
 #include <cstdio>
 
+/// Whether file names that differ in nothing but case are two.
+#ifdef _WIN32
+inline constexpr Qt::CaseSensitivity kPathCase = Qt::CaseInsensitive;
+#else
+inline constexpr Qt::CaseSensitivity kPathCase = Qt::CaseSensitive;
+#endif
+
 /// File operations whose system call differs from platform to platform.
+
+/// Whether two paths are spelt alike, but for what file names do not tell apart.
+inline bool isSamePath(const QString &left, const QString &right)
+{
+    return QString::compare(left, right, kPathCase) == 0;
+}
+
+/// Orders paths and file names so.
+struct PathLess {
+    bool operator()(const QString &left, const QString &right) const
+    {
+        return QString::compare(left, right, kPathCase) < 0;
+    }
+};
 
 /// fopen for a path with any characters; null when it fails.
 std::FILE *openStream(const QString &path, const char *mode);
@@ -15,6 +36,9 @@ FileResult renameOver(const QString &from, const QString &to);
 /// Waits until what was written to an open file has reached the disk; systems that cannot do so are not
 /// blamed.
 void syncToDisk(int fileDescriptor);
+/// The path of a file or folder with all links on the way resolved, in a form for comparing with its like;
+/// empty when it is not there.
+QString realPath(const QString &path);
 /// Sets a file's modification time to now.
 void touchFile(const QString &path);
 /// A file's modification time in nanoseconds since 1970, as fine as the file system keeps it; -1 when there

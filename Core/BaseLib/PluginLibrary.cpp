@@ -1,6 +1,7 @@
 #include "Core/BaseLib/PluginLibrary.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/PluginThread.h"
 #include "Core/BaseLib/ThreadCount.h"
 
 #include <QFile>
@@ -52,6 +53,7 @@ void PluginLibrary::leaveMapped() { m_handle = nullptr; }
 
 void PluginLibrary::freeUnlessRunning()
 {
+    PluginThread::deliverMessages(); // while the code that they lead to is there
     if (m_handle && !useProcessCache && !newThreadsEnd(m_threadsBefore, kThreadPatience)) {
         DebugLog(L"%ls left threads running and stays in memory", m_path);
         leaveMapped();

@@ -2,7 +2,8 @@
 
 /// Prepares the process before the application object exists: a crash brings up no system box, no crash
 /// reporter and no core dump, file names are text in the system's own encoding, a closed output pipe kills
-/// nobody, and a machine without a display gets Qt's offscreen platform.
+/// nobody, a machine without a display gets Qt's offscreen platform, and a Windows program without a console
+/// writes into the one from which it was started.
 void prepareProcess();
 
 /// To be called when the application object exists, which sets the user's locale: numbers are printed and

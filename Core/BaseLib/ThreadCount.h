@@ -3,7 +3,8 @@
 #include <chrono>
 #include <set>
 
-/// The system's identifiers of the threads that this process runs now; none when the system does not tell.
+/// The system's identifiers of the threads that this process runs now, without those that the system employs
+/// for itself; none when the system does not tell.
 std::set<int> runningThreads();
 
 /// True when no other threads run than those given, waiting up to `patience` for new ones that are just

@@ -1,6 +1,7 @@
 #include "Core/BaseLib/NativeFile.h"
 
 #include <QFile>
+#include <QFileInfo>
 
 #include <algorithm>
 #include <cerrno>
@@ -22,6 +23,8 @@ FileResult renameOver(const QString &from, const QString &to)
         return {};
     return {QString::fromLocal8Bit(std::strerror(errno))};
 }
+
+QString realPath(const QString &path) { return QFileInfo(path).canonicalFilePath(); }
 
 void syncToDisk(int fileDescriptor) { fsync(fileDescriptor); }
 

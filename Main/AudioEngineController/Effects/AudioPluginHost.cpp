@@ -137,7 +137,7 @@ void AudioPluginHost::absorbMarkers()
     const QStringList paths =
         FileFinder(QString::fromLatin1(m_format->marker.ending)).find(m_catalogueFolder);
     std::vector<EffectRecord> markers;
-    std::set<QString> filesWithCrashedChild;
+    std::set<QString, PathLess> filesWithCrashedChild;
     for (const QString &path : paths) {
         markers.push_back(ReadCrashMarker(path));
         if (markers.back().subId != 0)

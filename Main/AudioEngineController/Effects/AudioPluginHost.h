@@ -122,7 +122,7 @@ private:
     FileStamp m_lastSeen;
     KnownList m_known;
     EffectList m_effects;
-    std::set<QString> m_leftAlone;
+    std::set<QString, PathLess> m_leftAlone;
     QStringList m_heldMarkers; ///< of the files left alone
     bool m_catalogueOutdated = false;
     std::atomic<bool> m_cancelled{false};

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Core/BaseLib/NativeFile.h"
+
 #include <QString>
 
 /// One plug-in as the catalogue knows it. A value type; lists copy it.
@@ -28,7 +30,10 @@ struct EffectRecord {
     /// True when the user switched the plug-in off: what crashed is not working as well.
     bool isSwitchedOff() const { return !enabled && working; }
     /// True when both records stand for the same file, or the same sub-plug-in of one.
-    bool isSamePlugin(const EffectRecord &other) const { return subId == other.subId && path == other.path; }
+    bool isSamePlugin(const EffectRecord &other) const
+    {
+        return subId == other.subId && isSamePath(path, other.path);
+    }
 };
 
 /// The last component of a path.

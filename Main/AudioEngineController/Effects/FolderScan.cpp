@@ -51,7 +51,7 @@ bool FolderScan::isCancelled() const
 QStringList FolderScan::findFiles() const
 {
     QStringList paths;
-    std::set<QString> seen;
+    std::set<QString, PathLess> seen;
     FileFinder finder(m_ending);
     finder.setCancelled([this] { return isCancelled(); });
     for (const QString &folder : m_host.folders())

@@ -71,7 +71,7 @@ private:
     std::shared_ptr<VProgressDisplay> m_progress;
     std::vector<ScanItem> m_items;
     WaitingRecords m_waiting;
-    std::set<QString> m_probed; ///< paths
+    std::set<QString, PathLess> m_probed; ///< paths
     std::size_t m_knownAtStart = 0;
     int m_done = 0; ///< items
     bool m_added = false;

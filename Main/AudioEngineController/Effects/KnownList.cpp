@@ -60,7 +60,7 @@ KnownList::Records KnownList::recordsOfFileName(const QString &path) const
     for (auto entry = first; entry != last; ++entry)
         records.push_back(&entry->second);
     const auto place = [&](const EffectRecord *record) {
-        return std::make_tuple(record->path != path, rankOf(*record));
+        return std::make_tuple(!isSamePath(record->path, path), rankOf(*record));
     };
     std::stable_sort(
         records.begin(), records.end(),
@@ -71,8 +71,9 @@ KnownList::Records KnownList::recordsOfFileName(const QString &path) const
 KnownList::Records KnownList::recordsOfPath(const QString &path) const
 {
     Records records = recordsOfFileName(path);
-    const auto others = std::find_if(records.begin(), records.end(),
-                                     [&](const EffectRecord *record) { return record->path != path; });
+    const auto others = std::find_if(records.begin(), records.end(), [&](const EffectRecord *record) {
+        return !isSamePath(record->path, path);
+    });
     records.erase(others, records.end());
     return records;
 }
@@ -82,7 +83,7 @@ KnownList::Knowledge KnownList::lookUp(const QString &path) const
     Records ofName = recordsOfFileName(path);
     if (ofName.empty())
         return {KnownAs::Unknown, {}};
-    if (ofName.front()->path == path)
+    if (isSamePath(ofName.front()->path, path))
         return {KnownAs::Own, recordsOfPath(path)};
     Records moved;
     std::copy_if(ofName.begin(), ofName.end(), std::back_inserter(moved),

@@ -58,5 +58,5 @@ public:
 private:
     EffectRecord *recordForCrash(const EffectRecord &marker);
 
-    std::multimap<QString, EffectRecord> m_records;
+    std::multimap<QString, EffectRecord, PathLess> m_records;
 };

@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/ProbeBracket.h"
 
 #include "Core/BaseLib/NativeFile.h"
+#include "Core/BaseLib/PluginThread.h"
 #include "Main/AudioEngineController/Effects/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
 
@@ -17,6 +18,7 @@ ProbeBracket::~ProbeBracket()
     // Events that the plug-in left for this thread lead into its code: they come while its marker still
     // stands.
     QCoreApplication::processEvents();
+    PluginThread::deliverMessages();
     m_state.restore();
     ActiveMarkers::remove(m_marker);
 }

@@ -1,0 +1,105 @@
+#include "Core/BaseLib/NativeFile.h"
+
+#include "Core/BaseLib/win32/WindowsText.h"
+
+#include <QDir>
+
+#include <limits>
+
+#include <io.h>
+
+namespace {
+
+/// How long others may hold a file that is to be replaced: readers, indexers and virus scanners hold it for
+/// moments.
+constexpr DWORD kPatience = 1000; ///< ms
+constexpr DWORD kPause = 10;      ///< ms
+
+/// Between 1601, where the system's times start, and 1970, in units of 100 ns.
+constexpr qint64 kEpoch = 116444736000000000;
+constexpr qint64 kNanosecondsPerUnit = 100;
+
+class FileHandle {
+public:
+    FileHandle(const QString &path, DWORD access)
+        : m_handle(CreateFileW(nativePath(path).c_str(), access,
+                               FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr, OPEN_EXISTING,
+                               FILE_FLAG_BACKUP_SEMANTICS, nullptr)) // for folders too
+    {}
+    ~FileHandle()
+    {
+        if (isOpen())
+            CloseHandle(m_handle);
+    }
+    FileHandle(const FileHandle &) = delete;
+    FileHandle &operator=(const FileHandle &) = delete;
+
+    bool isOpen() const { return m_handle != INVALID_HANDLE_VALUE; }
+    HANDLE get() const { return m_handle; }
+
+private:
+    HANDLE m_handle;
+};
+
+bool isHeldByOthers(DWORD error) { return error == ERROR_SHARING_VIOLATION || error == ERROR_ACCESS_DENIED; }
+
+qint64 unitsOf(const FILETIME &time)
+{
+    return static_cast<qint64>(quint64(time.dwHighDateTime) << 32 | time.dwLowDateTime);
+}
+
+} // namespace
+
+std::FILE *openStream(const QString &path, const char *mode)
+{
+    return _wfopen(nativePath(path).c_str(), QString::fromLatin1(mode).toStdWString().c_str());
+}
+
+FileResult renameOver(const QString &from, const QString &to)
+{
+    const std::wstring source = nativePath(from);
+    const std::wstring target = nativePath(to);
+    for (DWORD waited = 0;; waited += kPause) {
+        if (MoveFileExW(source.c_str(), target.c_str(), MOVEFILE_REPLACE_EXISTING))
+            return {};
+        const DWORD error = GetLastError();
+        if (!isHeldByOthers(error) || waited >= kPatience)
+            return {systemMessage(error, to)};
+        Sleep(kPause);
+    }
+}
+
+QString realPath(const QString &path)
+{
+    const FileHandle file(path, FILE_READ_ATTRIBUTES);
+    std::wstring text(32768, L'\0'); // longest path of the system
+    // Some drives have no letter.
+    for (const DWORD form : {VOLUME_NAME_DOS, VOLUME_NAME_GUID}) {
+        const DWORD length = GetFinalPathNameByHandleW(file.get(), text.data(), DWORD(text.size()), form);
+        if (length > 0 && length < text.size())
+            return QDir::fromNativeSeparators(QString::fromWCharArray(text.data(), static_cast<int>(length)));
+    }
+    return QString();
+}
+
+void syncToDisk(int fileDescriptor) { _commit(fileDescriptor); }
+
+void touchFile(const QString &path)
+{
+    const FileHandle file(path, FILE_WRITE_ATTRIBUTES);
+    FILETIME now = {};
+    GetSystemTimeAsFileTime(&now);
+    if (file.isOpen())
+        SetFileTime(file.get(), nullptr, nullptr, &now);
+}
+
+qint64 modifiedNanoseconds(const QString &path)
+{
+    const FileHandle file(path, FILE_READ_ATTRIBUTES);
+    FILETIME modified = {};
+    if (!file.isOpen() || !GetFileTime(file.get(), nullptr, nullptr, &modified))
+        return -1;
+    // 64 bits of nanoseconds end in 2262, file systems later; a time beyond counts as the last one.
+    constexpr qint64 kLast = std::numeric_limits<qint64>::max() / kNanosecondsPerUnit;
+    return qBound(-kLast, unitsOf(modified) - kEpoch, kLast) * kNanosecondsPerUnit;
+}

@@ -1,0 +1,3 @@
+#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
+
+QString VSTModuleFile::ending() { return QStringLiteral(".dll"); }
