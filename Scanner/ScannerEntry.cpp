@@ -7,6 +7,7 @@
 #include "Core/BaseLib/TerminationRequest.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/ScanList.h"
 #include "Main/AudioEngineController/Effects/ScanLock.h"
 #include "Main/ReWire/ReWireProbe.h"
@@ -44,6 +45,7 @@ void scanEverything(const QString &dataFolder)
     AudioPlugins::setRegistry(&registry);
     registry.initialise(dataFolder, QString(), PluginHost::kDefaultSampleRate, PluginHost::kDefaultBlockSize);
     registry.Scan(true, true);
+    ProbeReport::instance().finish();
 }
 
 void runDialog(QApplication &application, const QString &dataFolder, bool isDefaultPath)
@@ -73,9 +75,11 @@ int runScanner(QApplication &application)
     if (!QFile::exists(path))
         return 0;
     const QString dataFolder = dataFolderOf(path);
+    ProbeReport::instance().openFromEnvironment();
     const ScanLock lock(dataFolder + QStringLiteral("/Effects"));
     if (lock.isHeldByOther()) {
         DebugLog(L"Another scanner is at work for %ls", dataFolder);
+        ProbeReport::instance().busy();
         return 0;
     }
     QuillonInterfaceImpl workstation(dataFolder, ReadScanList(path));

@@ -4,6 +4,7 @@
 #include "Core/BaseLib/FileFinder.h"
 #include "Main/AudioEngineController/Effects/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/VLib/ApplicationContext.h"
 
 #include <QDir>
@@ -111,6 +112,7 @@ void AudioPluginHost::ReadCatalogue()
     m_heldMarkers.clear();
     readKnownRecords();
     absorbMarkers();
+    m_lastSeen = fileStamp(cataloguePath());
 }
 
 void AudioPluginHost::readKnownRecords()
@@ -256,7 +258,9 @@ bool AudioPluginHost::writeRecords(const std::vector<const QByteArray *> &record
 {
     const QString path = cataloguePath();
     const FileResult written = replaceFile(path, renderCatalogue(*m_format, records), durability);
-    if (!written)
+    if (!written) {
         DebugLog(L"Cannot write the catalogue %ls: %ls", path, written.reason);
+        ProbeReport::instance().unwritten(path, written.reason);
+    }
     return bool(written);
 }

@@ -2,14 +2,16 @@
 
 #include "Core/BaseLib/DebugLog.h"
 #include "Core/BaseLib/FileFinder.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
 #include <algorithm>
 #include <exception>
 
-FolderScan::FolderScan(AudioPluginHost &host, const QString &ending)
+FolderScan::FolderScan(AudioPluginHost &host, const char *format, const QString &ending)
     : m_host(host)
+    , m_format(format)
     , m_ending(ending)
 {}
 
@@ -30,11 +32,11 @@ bool FolderScan::run()
 void FolderScan::scan()
 {
     m_host.clearEffects();
-    m_host.clearCancel();
     m_progress = createProgressDisplay();
     m_knownAtStart = m_host.known().size();
     const QStringList paths = findFiles();
     m_items = arrange(paths);
+    reportPlan(static_cast<std::size_t>(paths.size()));
     collectWaiting();
     if (processItems())
         finish();
@@ -82,6 +84,13 @@ void FolderScan::collectWaiting()
             addWaiting(record);
 }
 
+void FolderScan::reportPlan(std::size_t files) const
+{
+    const auto isProbed = [](const ScanItem &item) { return item.probe; };
+    const auto probes = std::count_if(m_items.begin(), m_items.end(), isProbed);
+    ProbeReport::instance().plan(m_format, files, static_cast<std::size_t>(probes));
+}
+
 bool FolderScan::processItems()
 {
     showItemProgress();
@@ -111,6 +120,7 @@ void FolderScan::processItem(const ScanItem &item)
 
 void FolderScan::finishCancelled()
 {
+    ProbeReport::instance().cancelled();
     // Nothing is lost: whatever this run did not get to stays as it was.
     m_waiting.clear();
     for (const EffectRecord *record : m_host.known().all())

@@ -21,8 +21,8 @@ struct ScanItem {
 /// with progress, cancel and interim writes. Used once, on the scan worker.
 class FolderScan {
 public:
-    /// `ending` is the end of the module files' names, with its dot.
-    FolderScan(AudioPluginHost &host, const QString &ending);
+    /// `format` names the format in the report; `ending` is the end of the module files' names, with its dot.
+    FolderScan(AudioPluginHost &host, const char *format, const QString &ending);
     virtual ~FolderScan();
     FolderScan(const FolderScan &) = delete;
     FolderScan &operator=(const FolderScan &) = delete;
@@ -40,6 +40,7 @@ protected:
     virtual void complete() {}
 
     AudioPluginHost &host() { return m_host; }
+    const char *format() const { return m_format; }
     const ProcessState &processState() const { return m_processState; }
     VProgressDisplay *progress() const { return m_progress.get(); }
     std::size_t itemCount() const { return m_items.size(); }
@@ -58,6 +59,7 @@ private:
     void scan();
     QStringList findFiles() const;
     void collectWaiting();
+    void reportPlan(std::size_t files) const;
     bool processItems();
     void processItem(const ScanItem &item);
     void finishCancelled();
@@ -66,6 +68,7 @@ private:
     void removeWaiting(const ScanItem &item);
 
     AudioPluginHost &m_host;
+    const char *m_format;
     QString m_ending;
     ProcessState m_processState;
     std::shared_ptr<VProgressDisplay> m_progress;

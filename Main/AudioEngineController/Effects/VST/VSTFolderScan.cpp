@@ -4,6 +4,7 @@
 #include "Core/BaseLib/FaultGuard.h"
 #include "Core/BaseLib/FileTime.h"
 #include "Main/AudioEngineController/Effects/ProbeBracket.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 #include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
@@ -56,7 +57,7 @@ void carryMarks(const ScanItem &item, EffectRecord &record)
 } // namespace
 
 VSTFolderScan::VSTFolderScan(VSTHost &host)
-    : FolderScan(host, VSTModuleFile::ending())
+    : FolderScan(host, "vst2", VSTModuleFile::ending())
     , m_vstHost(host)
 {}
 
@@ -92,12 +93,15 @@ bool VSTFolderScan::probe(const ScanItem &item)
 {
     if (hasNoEntryPoint(item.path)) {
         DebugTrace(L"%ls exports no VST 2 entry point", item.path);
+        ProbeReport::instance().skipped(format(), item.path,
+                                        QStringLiteral("it exports no VST 2 entry point"));
         return false;
     }
     EffectRecord file;
     file.path = item.path;
     file.fileTime = item.fileTime;
     showScanning(fileNameOf(item.path));
+    ProbeEntry entry(format(), file);
     const ProbeBracket bracket(host(), processState(), file);
     DebugTrace(L"Probing %ls", item.path);
     std::vector<EffectRecord> children; // outlive the plug-in, whose end still closes them
@@ -106,16 +110,22 @@ bool VSTFolderScan::probe(const ScanItem &item)
     bool isPluginModule = true;
     if (!plugin.load(item.path, VSTHostCallback, isPluginModule)) {
         DebugLog(L"%ls, Didn't manage it", item.path);
+        if (!isPluginModule)
+            entry.isNoPlugin();
         return isPluginModule && addFailed(item, file);
     }
     plugin.readInto(file);
-    if (file.vstCategory != kPlugCategShell)
+    if (file.vstCategory != kPlugCategShell) {
+        entry.listed(1);
         return addProbed(item, file);
+    }
     for (const VSTSubPlugin &sub : plugin.subPlugins()) {
         children.push_back(file);
         children.back().name = children.back().subName = sub.name;
         children.back().subId = sub.id;
     }
+    if (children.empty())
+        ProbeReport::reason(QStringLiteral("it is a shell and lists no sub-plug-in"));
     return children.empty() ? addFailed(item, file) : expandShell(item, plugin, children, bracket);
 }
 
@@ -167,9 +177,11 @@ bool VSTFolderScan::addChild(const ScanItem &item, VSTPlugin &plugin, const Effe
         return host().AddEffect(
             *old); // it killed the scanner; another version of the file gets another chance
     showScanning(child.subName);
+    ProbeEntry entry(format(), child);
     const ProbeBracket bracket(host(), processState(), child, child.subName);
     if (!plugin.load(child, VSTHostCallback, 1))
         return addFailed(item, child);
+    entry.listed(1);
     EffectRecord record = child;
     plugin.readInto(record);
     return addProbed(item, record);

@@ -4,6 +4,7 @@
 #include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/PluginBehaviour.h"
 #include "Main/AudioEngineController/Effects/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 
@@ -62,7 +63,7 @@ QString VSTPlugin::identifierPrefix() { return QString::fromLatin1(PluginPrefix:
 bool VSTPlugin::load(const QString &path, VSTHostCallbackFunction callback, bool &isPluginModule)
 {
     const VSTEffect effect = callEntryPoint(path, callback, isPluginModule);
-    if (!effect.isEffect() || !adopt(effect, path))
+    if (!isUsable(effect) || !adopt(effect, path))
         return false;
     m_isProbe = true;
     return true;
@@ -81,7 +82,7 @@ bool VSTPlugin::load(const EffectRecord &record, VSTHostCallbackFunction callbac
         bool isPluginModule = true;
         effect = callEntryPoint(record.path, callback, isPluginModule);
     }
-    if (effect.isEffect() && adopt(effect, record.path))
+    if (isUsable(effect) && adopt(effect, record.path))
         return true;
     if (effect.isHeld() && !effect.isEffect())
         DebugLog(L"VSTPlugin::Load - Invalid VST Plugin");
@@ -89,12 +90,24 @@ bool VSTPlugin::load(const EffectRecord &record, VSTHostCallbackFunction callbac
     return false;
 }
 
+bool VSTPlugin::isUsable(const VSTEffect &effect)
+{
+    if (effect.isEffect())
+        return true;
+    ProbeReport::reason(effect.isHeld() ? QStringLiteral("what its entry point gives is no VST 2 plug-in")
+                                        : QStringLiteral("its entry point gives no plug-in"));
+    return false;
+}
+
 VSTEffect VSTPlugin::callEntryPoint(const QString &path, VSTHostCallbackFunction callback,
                                     bool &isPluginModule)
 {
     isPluginModule = true;
+    if (!m_library.isLoaded())
+        ProbeReport::stage(ProbeStage::Load);
     if (!m_library.isLoaded() && !m_library.load(path)) {
         DebugLog(L"Cannot load the module %ls: %ls", path, m_library.errorText());
+        ProbeReport::reason(QStringLiteral("it could not be loaded: ") + m_library.errorText());
         return VSTEffect();
     }
     m_loaded = true;
@@ -104,6 +117,7 @@ VSTEffect VSTPlugin::callEntryPoint(const QString &path, VSTHostCallbackFunction
     if (!entryPoint) {
         isPluginModule = false;
         DebugLog(L"The module %ls exports neither 'VSTPluginMain' nor 'main'", path);
+        ProbeReport::reason(QStringLiteral("it exports no VST 2 entry point"));
         return VSTEffect();
     }
     return VSTEffect(enter(entryPoint, callback));
@@ -111,16 +125,21 @@ VSTEffect VSTPlugin::callEntryPoint(const QString &path, VSTHostCallbackFunction
 
 AEffect *VSTPlugin::enter(void *entryPoint, VSTHostCallbackFunction callback)
 {
+    ProbeReport::stage(ProbeStage::Start);
     const VSTCallbackNesting::Restore nesting;
     try {
         return callGuarded([&] { return reinterpret_cast<EntryPoint>(entryPoint)(callback); });
     } catch (const SEException &fault) {
         m_faulted = true;
         DebugLog(L"VST plug-in entry point: %s", fault.what());
+        ProbeReport::reason(QStringLiteral("its entry point failed: ") + QString::fromLatin1(fault.what()));
     } catch (const std::exception &exception) {
-        DebugLog(L"VST plug-in entry point threw: %ls", guardedText(exception));
+        const QString text = guardedText(exception);
+        DebugLog(L"VST plug-in entry point threw: %ls", text);
+        ProbeReport::reason(QStringLiteral("its entry point threw: ") + text);
     } catch (...) {
         DebugLog(L"VST plug-in entry point threw something that is no standard exception");
+        ProbeReport::reason(QStringLiteral("its entry point threw something that is no standard exception"));
     }
     unload();
     return nullptr;
@@ -130,6 +149,7 @@ bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
 {
     m_faulted |= m_effect.hasFaulted();
     m_effect = effect;
+    ProbeReport::stage(ProbeStage::Ask);
     const auto isSame = [&](const HandedOut &other) { return other.effect.isSame(effect); };
     if (std::none_of(m_handedOut.begin(), m_handedOut.end(), isSame))
         m_handedOut.push_back({effect, m_shellId});
@@ -138,6 +158,7 @@ bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
     } catch (const SEException &fault) {
         m_faulted = true;
         DebugLog(L"The effect of %ls cannot be written to: %s", path, fault.what());
+        ProbeReport::reason(QStringLiteral("what its entry point gives is no VST 2 plug-in"));
         return false;
     }
     m_fields = m_effect.fields().value_or(VSTEffect::Fields{});
@@ -218,6 +239,7 @@ void VSTPlugin::unload()
 {
     if (!m_loaded)
         return;
+    ProbeReport::stage(ProbeStage::Close);
     closeEffects();
     if (m_faulted)
         m_library.leaveMapped(); // it may hold locks and own threads

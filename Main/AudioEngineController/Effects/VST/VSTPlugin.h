@@ -87,6 +87,7 @@ private:
 
     VSTEffect callEntryPoint(const QString &path, VSTHostCallbackFunction callback, bool &isPluginModule);
     AEffect *enter(void *entryPoint, VSTHostCallbackFunction callback);
+    static bool isUsable(const VSTEffect &effect);
     bool adopt(const VSTEffect &effect, const QString &path);
     void nameFrom(const QString &path);
     bool asksForName();

@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/DebugLog.h"
 #include "Main/AudioEngineController/Effects/ProbeBracket.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 #include "Main/VLib/SimpleGUI.h"
 
@@ -46,7 +47,7 @@ bool isOutdated(const EffectRecord &first, const QString &fileTime)
 } // namespace
 
 VST3FolderScan::VST3FolderScan(AudioPluginHost &host)
-    : FolderScan(host, QString::fromLatin1(kEnding))
+    : FolderScan(host, "vst3", QString::fromLatin1(kEnding))
 {}
 
 std::vector<ScanItem> VST3FolderScan::arrange(const QStringList &paths)
@@ -98,6 +99,7 @@ bool VST3FolderScan::process(const ScanItem &item)
     file.path = item.path;
     file.fileTime = item.fileTime;
     showScanning(displayName(item.path));
+    ProbeEntry entry(format(), file);
     const ProbeBracket bracket(host(), processState(), file);
     DebugTrace(L"Probing %ls", item.path);
     VST3Plugin plugin; // unloads its module before the bracket deletes the marker
@@ -106,6 +108,7 @@ bool VST3FolderScan::process(const ScanItem &item)
     bool factoryFound = true;
     const bool isNew = item.knownRecords.empty();
     plugin.listClasses(records, item.path, isNew, factoryFound);
+    entry.listed(records.size());
     if (!records.empty())
         return addRecords(item, file, records);
     if (factoryFound && !item.path.contains(QLatin1String("WaveShell")))

@@ -26,11 +26,14 @@ public:
     bool open(const QString &path);
     /// The factory, asked for once; owned by the module. Null when the module exports none or answers null.
     Steinberg::IPluginFactory *factory();
+    /// Whether the loaded module exports the function that gives a factory.
+    bool exportsFactory() const;
     /// Releases the factory, ends the module and unloads it. A module that left threads running stays mapped.
     /// Exceptions of the module are logged and go no further.
     void close();
 
 private:
+    void load();
     template <typename Step>
     void closeStep(Step step);
 

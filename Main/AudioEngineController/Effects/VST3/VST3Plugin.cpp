@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/DebugLog.h"
 #include "Core/BaseLib/FaultGuard.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 #include "Main/VLib/SimpleGUI.h"
 
@@ -95,8 +96,10 @@ void VST3Plugin::listClasses(ClassListing &records, const QString &path, bool no
         openAndList(records, path, notifyEachClass, factoryFound);
     } catch (const std::exception &error) {
         DebugLog(L"%ls: %s", path, error.what());
+        ProbeReport::reason(QStringLiteral("it threw: ") + QString::fromUtf8(error.what()));
     } catch (...) {
         DebugLog(L"%ls: the plug-in threw something that is no standard exception", path);
+        ProbeReport::reason(QStringLiteral("it threw something that is no standard exception"));
     }
 }
 
@@ -107,6 +110,7 @@ void VST3Plugin::openAndList(ClassListing &records, const QString &path, bool no
     if (!m_module.open(path))
         throw std::runtime_error("VST3 Exception: Failed to get load module:" + path.toStdString());
     factoryFound = false;
+    ProbeReport::stage(ProbeStage::Ask);
     IPluginFactory *module = m_module.factory();
     // Not around the loading as well: what passes the system's loader ends the process.
     callTranslated([&] { listModule(records, module, notifyEachClass, factoryFound); });
@@ -116,8 +120,11 @@ void VST3Plugin::listModule(ClassListing &records, IPluginFactory *module, bool 
                             bool &factoryFound)
 {
     void *factory = nullptr;
-    if (!module || module->queryInterface(IPluginFactory::iid, &factory) != kResultOk || !factory)
+    if (!module || module->queryInterface(IPluginFactory::iid, &factory) != kResultOk || !factory) {
+        ProbeReport::reason(m_module.exportsFactory() ? QStringLiteral("it gives no plug-in factory")
+                                                      : QStringLiteral("it exports no \"GetPluginFactory\""));
         throw std::runtime_error("VST3 Exception: Failed to get factory function");
+    }
     factoryFound = true;
     listFactory(records, static_cast<IPluginFactory *>(factory), notifyEachClass);
 }
@@ -129,8 +136,10 @@ void VST3Plugin::listFactory(ClassListing &records, IPluginFactory *factory, boo
     const std::size_t before = records.size();
     for (int32 index = 0; index < std::min(count, kMaxClasses); ++index)
         listClass(records, view, index, notifyEachClass || count > kManyClasses);
-    if (records.size() == before)
+    if (records.size() == before) {
         DebugLog(L"No audio class could be listed, of %d classes", count);
+        ProbeReport::reason(QStringLiteral("it lists no audio plug-in, of %1 classes").arg(count));
+    }
     // Not released when the plug-in threw: its state is unknown then.
     factory->release();
 }
@@ -165,6 +174,8 @@ void VST3Plugin::instantiate(ClassListing &records, const FactoryView &view, con
         view.factory->createInstance(m_classId.toTUID(), Vst::IComponent::iid, &component);
     if (created != kResultOk || !component) {
         DebugLog(L"The class %ls could not be created: 0x%08X", name, created);
+        ProbeReport::reason(
+            formatText(L"its class \"%ls\" could not be created (result 0x%08X)", name, created));
         return;
     }
     m_component = static_cast<Vst::IComponent *>(component);
@@ -172,6 +183,8 @@ void VST3Plugin::instantiate(ClassListing &records, const FactoryView &view, con
     if (initialised != kResultOk) {
         // Neither terminated nor released: a component that could not start is not called again.
         DebugLog(L"The class %ls could not be initialised: 0x%08X", name, initialised);
+        ProbeReport::reason(
+            formatText(L"its class \"%ls\" could not be initialised (result 0x%08X)", name, initialised));
         return;
     }
     m_instantiated = true;
