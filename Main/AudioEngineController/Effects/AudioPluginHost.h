@@ -33,7 +33,7 @@ public:
     virtual void ReadCatalogue();
     /// The plug-in folders to scan, as the host application lists them.
     virtual QStringList folders() const;
-    /// True when the catalogue file differs from the one seen at the last call.
+    /// True when the catalogue file differs from the one seen last: at the last call, or when it was read.
     virtual bool catalogueChanged();
     /// Scans the folders (true) or only refreshes the effect list from the known list (false). `inProcess`
     /// matters to the registry only. True when the catalogue was written.
@@ -82,11 +82,11 @@ public:
     /// True when the catalogue file holds something else than the known list, being of an earlier version.
     bool isCatalogueOutdated() const { return m_catalogueOutdated; }
 
-    /// Asks a running scan to stop after the current file; any thread. The next scan starts without the
-    /// request.
+    /// Asks a running scan to stop after the current file; any thread. The request stands until it is
+    /// cleared.
     void cancel() { m_cancelled = true; }
     bool isCancelled() const { return m_cancelled; }
-    /// Forgets an earlier request to stop.
+    /// Forgets an earlier request to stop; the registry does so when a scan starts.
     void clearCancel() { m_cancelled = false; }
 
     /// Empties the effect list.

@@ -5,6 +5,7 @@
 #include "Main/AudioEngineController/Effects/AudioUnitHost.h"
 #include "Main/AudioEngineController/Effects/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/ScanList.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
@@ -51,7 +52,12 @@ PluginHost::PluginHost()
     , m_ambisonicsPosition(CategoryTable::instance().ambisonicsPosition())
 {}
 
-PluginHost::~PluginHost() = default;
+PluginHost::~PluginHost()
+{
+    m_launcher.cancel();
+    if (m_launcherThread.joinable())
+        m_launcherThread.join();
+}
 
 void PluginHost::initialise(const QString &dataFolder, const QString &previousEffectsFolder, int sampleRate,
                             int blockSize)
@@ -122,18 +128,32 @@ void PluginHost::WriteScanList() const
         DebugLog(L"Cannot write the scan list %ls: %ls", path, written.reason);
 }
 
-bool PluginHost::Scan(bool scan, bool)
+void PluginHost::notifyWorkstation() const
 {
+    if (application())
+        application()->pluginListsChanged();
+}
+
+bool PluginHost::Scan(bool scan, bool inProcess)
+{
+    if (m_launching)
+        return false;
     if (!m_completed)
         m_completed = std::make_unique<ManualResetEvent>();
     m_completed->reset();
+    m_launcher.reset();
+    for (const auto &host : m_hosts)
+        host->clearCancel();
     FileFinder::forgetReports();
     ReadCatalogue();
     m_scannerPath = QCoreApplication::applicationDirPath() + QLatin1String(kScannerProgram);
     WriteScanList();
-    const bool written = scanHosts(scan);
-    if (scan && application())
-        application()->pluginListsChanged();
+    const bool isLaunched = scan && !inProcess && QFile::exists(m_scannerPath);
+    const bool written = scanHosts(scan && !isLaunched);
+    if (scan)
+        notifyWorkstation();
+    if (isLaunched)
+        startLauncher();
     DebugLog(L"Plugin Scan Complete");
     showStatus(L"Plugin Scan Complete");
     m_completed->set();
@@ -143,7 +163,62 @@ bool PluginHost::Scan(bool scan, bool)
 bool PluginHost::scanHosts(bool scan)
 {
     bool written = false;
-    for (const std::size_t index : kScanOrder)
+    for (const std::size_t index : kScanOrder) {
+        if (scan && m_launcher.isCancelled()) { // what the host knows stays in its catalogue
+            ProbeReport::instance().cancelled();
+            break;
+        }
         written |= m_hosts[index]->Scan(scan, true);
+    }
     return written;
+}
+
+void PluginHost::cancelScan()
+{
+    m_launcher.cancel();
+    for (const auto &host : m_hosts)
+        host->cancel();
+}
+
+void PluginHost::startLauncher()
+{
+    if (m_launcherThread.joinable())
+        m_launcherThread.join(); // of an earlier launch, which has ended
+    m_launching = true;
+    try {
+        m_launcherThread = std::thread([this] { launch(); });
+    } catch (...) {
+        m_launching = false;
+        m_completed->set();
+        throw;
+    }
+}
+
+/// The launcher thread.
+void PluginHost::launch()
+{
+    const TAutoLockCS lock(&m_ks);
+    try {
+        m_launcher.run({m_scannerPath, effectsFolder() + QLatin1String(kScanListFile), effectsFolder(),
+                        m_probeLimit, [this] { WriteScanList(); }});
+        if (!m_launcher.isCancelled())
+            reloadChanged();
+    } catch (const std::exception &error) {
+        DebugLog(L"The scanner's launcher ended early: %s", error.what());
+    }
+    m_launching = false;
+}
+
+void PluginHost::reloadChanged()
+{
+    bool changed = false;
+    for (const auto &host : m_hosts) {
+        if (!host->catalogueChanged())
+            continue;
+        host->ReadCatalogue();
+        host->Scan(false, true);
+        changed = true;
+    }
+    if (changed)
+        notifyWorkstation();
 }

@@ -3,9 +3,12 @@
 #include "Core/BaseLib/ManualResetEvent.h"
 #include "Main/AudioEngineController/Effects/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/ParameterHandler.h"
+#include "Main/AudioEngineController/Effects/ScannerLauncher.h"
 
 #include <array>
+#include <atomic>
 #include <memory>
+#include <thread>
 
 /// The registry: owns one host per plug-in format and scans with all of them.
 class PluginHost : public AudioPluginHost, public IntParameterHandler {
@@ -30,9 +33,23 @@ public:
     /// The folder list of the host whose list feeds the scan list.
     QStringList folders() const override;
     bool catalogueChanged() override;
-    /// Reads the catalogues and lets every host scan, or only refresh its lists. The completion event is set
-    /// when it returns.
+    /// Reads the catalogues and lets every host scan in this process, or only refresh its lists. A scan that
+    /// need not be in this process, and for which the scanner program is there, is left to the launcher: the
+    /// lists are refreshed, and the launcher goes on when this returns. The completion event is set when it
+    /// returns. While the launcher runs, a call does nothing. Throws std::system_error when the launcher's
+    /// thread cannot be started.
     bool Scan(bool scan, bool inProcess) override;
+
+    /// Asks a running scan to end, in this process or the scanner's; any thread. The next scan starts without
+    /// the request.
+    void cancelScan();
+    /// True while the launcher runs scanners. It holds `m_ks` all the while.
+    bool isLauncherRunning() const { return m_launching; }
+    /// How the scanners of the last launch ended so far; any thread.
+    std::vector<ScannerRunEnd> scannerEnds() const { return m_launcher.ends(); }
+    /// Seconds after which a scanner that is busy with one plug-in is ended, so that the next run records
+    /// that plug-in as disabled; 0, the default: never. Set while no launcher runs.
+    void setProbeLimit(int seconds) { m_probeLimit = seconds; }
     void setAudioSettings(int sampleRate, int blockSize) override;
     void setIntParameter(IntParameter parameter, int value) override;
 
@@ -60,6 +77,10 @@ public:
 
 private:
     bool scanHosts(bool scan);
+    void startLauncher();
+    void launch();
+    void reloadChanged();
+    void notifyWorkstation() const;
     void moveOldCatalogue(const QString &previousEffectsFolder) const;
 
     /// In this order: VST 2, VST 3, Audio Units, built-in effects.
@@ -72,4 +93,8 @@ private:
     int m_ambisonicsPosition;
     int m_sampleRate = kDefaultSampleRate;
     int m_blockSize = kDefaultBlockSize;
+    int m_probeLimit = 0; ///< seconds
+    ScannerLauncher m_launcher;
+    std::atomic<bool> m_launching{false};
+    std::thread m_launcherThread; ///< joined before the next launch, and at the end
 };

@@ -1,0 +1,34 @@
+#include "Main/AudioEngineController/Effects/ScannerChild.h"
+
+#include <csignal>
+#include <cstring>
+
+#include <sys/prctl.h>
+#include <unistd.h>
+
+ScannerChild::ScannerChild() = default;
+
+ScannerChild::~ScannerChild() = default;
+
+void ScannerChild::setupChildProcess()
+{
+    setpgid(0, 0);
+    // Sent when the thread that started the scanner ends, be it with the whole process.
+    prctl(PR_SET_PDEATHSIG, SIGTERM);
+}
+
+void ScannerChild::tieToThisProcess() {}
+
+bool ScannerChild::requestEnd()
+{
+    terminate();
+    return true;
+}
+
+// NOTE: Qt documents no exit code for a crashed process; on these platforms Qt 5 puts the signal there.
+QString ScannerChild::crashText(int code)
+{
+    return QStringLiteral("it was killed by signal %1 (%2)")
+        .arg(code)
+        .arg(QString::fromLocal8Bit(strsignal(code)));
+}

@@ -1,0 +1,45 @@
+#include "Main/AudioEngineController/Effects/ScannerChild.h"
+
+#include "Core/BaseLib/FormatText.h"
+
+#include <qt_windows.h>
+
+ScannerChild::ScannerChild()
+{
+    setCreateProcessArgumentsModifier(
+        [](QProcess::CreateProcessArguments *arguments) { arguments->flags |= CREATE_NEW_PROCESS_GROUP; });
+}
+
+ScannerChild::~ScannerChild()
+{
+    if (m_job)
+        CloseHandle(m_job);
+}
+
+void ScannerChild::setupChildProcess() {}
+
+void ScannerChild::tieToThisProcess()
+{
+    m_job = CreateJobObjectW(nullptr, nullptr);
+    if (!m_job)
+        return;
+    JOBOBJECT_EXTENDED_LIMIT_INFORMATION limits = {};
+    limits.BasicLimitInformation.LimitFlags = JOB_OBJECT_LIMIT_KILL_ON_JOB_CLOSE;
+    SetInformationJobObject(m_job, JobObjectExtendedLimitInformation, &limits, sizeof limits);
+    AssignProcessToJobObject(m_job, pid()->hProcess);
+}
+
+bool ScannerChild::requestEnd()
+{
+    // Reaches a scanner that shares our console; without one nobody can ask.
+    return GenerateConsoleCtrlEvent(CTRL_BREAK_EVENT, static_cast<DWORD>(processId())) != 0;
+}
+
+QString ScannerChild::crashText(int code)
+{
+    const auto status = static_cast<quint32>(code);
+    const char *const text = status == EXCEPTION_ACCESS_VIOLATION ? " (access violation)"
+                             : status == EXCEPTION_STACK_OVERFLOW ? " (stack overflow)"
+                                                                  : "";
+    return formatText(L"it ended with the unhandled fault 0x%08X%s", status, text);
+}
