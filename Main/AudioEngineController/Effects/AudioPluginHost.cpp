@@ -124,8 +124,10 @@ void AudioPluginHost::readKnownRecords()
     const CatalogueContents contents = readCatalogueFile(*m_format, path);
     if (!contents) {
         DebugLog(L"Cannot use the catalogue %ls: %ls", path, contents.reason);
-        for (const EffectRecord &crash : salvageCrashes(*m_format, path))
-            m_known.file(crash);
+        // What crashed must not be loaded again only because of another plug-in's name.
+        for (const EffectRecord &record : salvageRecords(*m_format, path))
+            if (!record.enabled && !record.working)
+                m_known.file(record);
     }
     for (const EffectRecord &record : contents.records)
         m_known.file(record);

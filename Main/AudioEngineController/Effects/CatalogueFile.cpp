@@ -64,26 +64,23 @@ CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString
     return contents;
 }
 
-std::vector<EffectRecord> salvageCrashes(const CatalogueFormat &format, const QString &path)
+std::vector<EffectRecord> salvageRecords(const CatalogueFormat &format, const QString &path)
 {
-    std::vector<EffectRecord> crashes;
+    std::vector<EffectRecord> records;
     QByteArray content;
     QByteArray block;
     if (!readWholeFile(path, content))
-        return crashes;
+        return records;
     const QList<QByteArray> lines = content.replace("\r\n", "\n").split('\n');
     for (const QByteArray &line : lines) {
         if (line == "\t<Effect>")
             block.clear();
         block += escapedLine(line) + '\n';
         XMLDocument document;
-        if (line != "\t</Effect>" || !document.parse(block))
-            continue;
-        const EffectRecord record = readRecord(format, document.root("Effect"));
-        if (!record.enabled && !record.working)
-            crashes.push_back(record);
+        if (line == "\t</Effect>" && document.parse(block))
+            records.push_back(readRecord(format, document.root("Effect")));
     }
-    return crashes;
+    return records;
 }
 
 QByteArray xmlHeaderLine() { return QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>") + kLineEnd; }

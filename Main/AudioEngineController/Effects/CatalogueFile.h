@@ -17,9 +17,9 @@ struct CatalogueContents {
 /// Reads a catalogue file, upgrading records of earlier versions.
 CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path);
 
-/// The records of crashed plug-ins in a catalogue that is no XML (texts are not escaped, and a plug-in's name
-/// may hold "<"), read by its lines: they must not be loaded again only because of another plug-in's name.
-std::vector<EffectRecord> salvageCrashes(const CatalogueFormat &format, const QString &path);
+/// The records of a catalogue that is no XML (texts are not escaped, and a plug-in's name may hold "<"), read
+/// by its lines.
+std::vector<EffectRecord> salvageRecords(const CatalogueFormat &format, const QString &path);
 
 /// A record as the catalogue file holds it, line ends included. Nothing is escaped: the files' other readers
 /// and writers do not expect it.

@@ -128,6 +128,11 @@ void PluginHost::WriteScanList() const
         DebugLog(L"Cannot write the scan list %ls: %ls", path, written.reason);
 }
 
+QString PluginHost::usualScannerPath()
+{
+    return QCoreApplication::applicationDirPath() + QLatin1String(kScannerProgram);
+}
+
 void PluginHost::notifyWorkstation() const
 {
     if (application())
@@ -146,7 +151,7 @@ bool PluginHost::Scan(bool scan, bool inProcess)
         host->clearCancel();
     FileFinder::forgetReports();
     ReadCatalogue();
-    m_scannerPath = QCoreApplication::applicationDirPath() + QLatin1String(kScannerProgram);
+    m_scannerPath = usualScannerPath();
     WriteScanList();
     const bool isLaunched = scan && !inProcess && QFile::exists(m_scannerPath);
     const bool written = scanHosts(scan && !isLaunched);

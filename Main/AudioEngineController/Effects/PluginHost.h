@@ -63,6 +63,8 @@ public:
     const QString &effectsFolder() const { return catalogueFolder(); }
     /// The data folder plus "/Plugin Metadata".
     const QString &pluginMetadataFolder() const { return m_pluginMetadataFolder; }
+    /// Where the scanner program lies: beside this program.
+    static QString usualScannerPath();
     /// Full path of the scanner program, known once a scan was asked for.
     const QString &scannerPath() const { return m_scannerPath; }
 

@@ -35,6 +35,7 @@ FileResult ProbeReport::open(const QString &path)
         return {file->errorString()};
     m_file = std::move(file);
     m_complete = true;
+    write("start", {});
     return {};
 }
 
@@ -120,7 +121,8 @@ void ProbeReport::reason(const QString &text)
 {
     ProbeEntry *entry = instance().m_current;
     if (entry && entry->m_reason.isEmpty())
-        entry->m_reason = text;
+        entry->m_reason =
+            QString(text).remove(entry->m_path + QLatin1String(": ")); // the path stands beside it
 }
 
 void ProbeReport::stage(ProbeStage stage)

@@ -32,7 +32,7 @@ public:
     static ProbeReport &instance();
     ~ProbeReport();
 
-    /// Opens the file for appending.
+    /// Opens the file for appending, and marks the start of a scan in it.
     FileResult open(const QString &path);
     /// Opens the file that "FXPROBE_REPORT" names, if it is set; a file that cannot be opened is logged.
     void openFromEnvironment();

@@ -3,14 +3,18 @@
 #include <QLockFile>
 #include <QString>
 
-/// Keeps a second scanner away from an Effects folder, for as long as the object lives. The lock lies in the
-/// system's temporary folder, so that the Effects folder holds nothing that its other readers do not know. A
-/// lock left by a process that died counts for nothing.
+/// Keeps a second scanner, or a second workstation, away from an Effects folder, for as long as the object
+/// lives. The lock lies in the system's temporary folder, so that the Effects folder holds nothing that its
+/// other readers do not know. A lock left by a process that died counts for nothing.
 class ScanLock {
 public:
-    explicit ScanLock(const QString &effectsFolder);
+    /// A scanner and the workstation that started it are at work on a folder at the same time.
+    enum class Role { Scanner, Workstation };
 
-    /// True when another process scans the folder. Where no lock can be made at all, nobody else is assumed.
+    explicit ScanLock(const QString &effectsFolder, Role role = Role::Scanner);
+
+    /// True when another process of that role is at work on the folder. Where no lock can be made at all,
+    /// nobody else is assumed.
     bool isHeldByOther() const { return m_heldByOther; }
 
 private:

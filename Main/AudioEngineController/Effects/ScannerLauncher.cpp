@@ -55,7 +55,7 @@ QString ScannerRunEnd::description() const
     case How::Exited:
         return QStringLiteral("it ended by itself with exit code %1").arg(code);
     case How::Crashed:
-        return text;
+        return QStringLiteral("it was ended by ") + text;
     case How::TimeLimit:
         return QStringLiteral("it was ended after %1 seconds without an answer").arg(code);
     case How::Cancelled:

@@ -41,5 +41,5 @@ QString ScannerChild::crashText(int code)
     const char *const text = status == EXCEPTION_ACCESS_VIOLATION ? " (access violation)"
                              : status == EXCEPTION_STACK_OVERFLOW ? " (stack overflow)"
                                                                   : "";
-    return formatText(L"it ended with the unhandled fault 0x%08X%s", status, text);
+    return formatText(L"unhandled fault 0x%08X%s", status, text);
 }

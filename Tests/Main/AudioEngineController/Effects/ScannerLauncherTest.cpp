@@ -1,0 +1,197 @@
+#include "Main/AudioEngineController/Effects/ScannerLauncher.h"
+
+#include "Main/AudioEngineController/Effects/PluginHost.h"
+#include "Main/VLib/ApplicationContext.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/VST2Fixture.h"
+#include "Tests/Support/VST3Fixture.h"
+
+#include <QElapsedTimer>
+#include <QFile>
+
+#include <gtest/gtest.h>
+
+#include <thread>
+
+namespace {
+
+using How = ScannerRunEnd::How;
+
+class Launcher : public testing::Test {
+protected:
+    ScannerLauncher::Job job(int limit = 0)
+    {
+        return {QStringLiteral(FXPROBE_STAND_IN), m_folder.scanList(), m_folder.effects(), limit,
+                [this] { ++m_listsWritten; }};
+    }
+    void script(const char *lines) const { m_folder.write(QStringLiteral("stand-in"), lines); }
+    int runs() const { return static_cast<int>(m_folder.lines(QStringLiteral("runs")).size()); }
+    /// Cancels a launch as soon as its first run is there.
+    std::thread cancelWhenRunning()
+    {
+        return std::thread([this] {
+            while (runs() == 0 && m_launcher.ends().empty())
+                std::this_thread::sleep_for(std::chrono::milliseconds(5));
+            m_launcher.cancel();
+        });
+    }
+
+    TestFolder m_folder;
+    ScannerLauncher m_launcher;
+    int m_listsWritten = 0;
+};
+
+/// Counts what the registry tells the workstation.
+class Workstation : public IQuillonInterface {
+public:
+    explicit Workstation(const TestFolder &folder)
+        : m_folder(folder)
+    {
+        ApplicationContext::instance().quillonInterface = this;
+    }
+    ~Workstation() override { ApplicationContext::instance().quillonInterface = nullptr; }
+    QString dataFolder() const override { return m_folder.dataFolder(); }
+    QStringList scanFolders() const override { return QStringList(m_folder.plugins()); }
+    bool isScanner() const override { return false; }
+    void pluginListsChanged() override { ++changes; }
+
+    std::atomic<int> changes{0};
+
+private:
+    const TestFolder &m_folder;
+};
+
+void waitForLauncher(const PluginHost &registry)
+{
+    while (registry.isLauncherRunning())
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+}
+
+} // namespace
+
+TEST_F(Launcher, RunsAgainWhileMarkersSurvive)
+{
+    const struct {
+        const char *name;
+        const char *script;
+        int runs;
+        How lastEnd;
+        int lastCode;
+        const char *culprit; ///< of the first run
+    } rows[] = {
+        {"no marker: one run", "exit=0", 1, How::Exited, 0, nullptr},
+        {"a failing exit code alone is no reason to run again", "exit=3", 1, How::Exited, 3, nullptr},
+        {"a crash without a marker neither", "abort", 1, How::Crashed, -1, nullptr},
+        {"a marker: again", "marker=A.scan abort\nclear", 2, How::Exited, 0, "/p/A.scan"},
+        {"a VST 3 marker too", "marker=A.scan3 exit=0\nclear", 2, How::Exited, 0, "/p/A.scan3"},
+        {"a new marker in every run: ten runs", "clear marker=A.scan abort", 10, How::Crashed, -1,
+         "/p/A.scan"},
+    };
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.name);
+        QFile::remove(m_folder.path(QStringLiteral("runs")));
+        QFile::remove(m_folder.path(QStringLiteral("Effects/A.scan")));
+        script(row.script);
+        m_launcher.reset();
+        m_listsWritten = 0;
+        m_launcher.run(job());
+        EXPECT_EQ(runs(), row.runs);
+        EXPECT_EQ(m_listsWritten, row.runs);
+        const std::vector<ScannerRunEnd> ends = m_launcher.ends();
+        ASSERT_EQ(static_cast<int>(ends.size()), row.runs);
+        EXPECT_EQ(ends.back().how, row.lastEnd);
+        if (row.lastEnd == How::Exited) {
+            EXPECT_EQ(ends.back().code, row.lastCode);
+        }
+        ASSERT_EQ(ends.front().culprits.size(), row.culprit ? 1u : 0u);
+        if (row.culprit) {
+            EXPECT_EQ(ends.front().culprits[0].plugin.path, QLatin1String(row.culprit));
+        }
+    }
+}
+
+TEST_F(Launcher, TheLogTellsTheEndsApart)
+{
+    const struct {
+        const char *script;
+        const char *line;
+    } rows[] = {{"exit=7", "it ended by itself with exit code 7"},
+                {"marker=B.scan hang\nclear", "it was ended after 1 seconds without an answer"}};
+    for (const auto &row : rows) {
+        QFile::remove(m_folder.path(QStringLiteral("runs")));
+        script(row.script);
+        const CapturedLog log;
+        m_launcher.run(job(1));
+        EXPECT_TRUE(log.contains(QStringLiteral("The scanner has ended: ") + QLatin1String(row.line)))
+            << row.line;
+    }
+}
+
+TEST_F(Launcher, CancellingBlamesNobodyAndRunsNothingElse)
+{
+    // The marker of an earlier crash, which the run has not absorbed, is none of ours to delete.
+    m_folder.write(QStringLiteral("Effects/Earlier.scan3"), "<CrashedPlugin>");
+    script("marker=A.scan hang");
+    std::thread canceller = cancelWhenRunning();
+    m_launcher.run(job());
+    canceller.join();
+    EXPECT_EQ(runs(), 1);
+    EXPECT_EQ(m_folder.markers(), QStringList(QStringLiteral("Earlier.scan3")));
+    ASSERT_EQ(m_launcher.ends().size(), 1u);
+    EXPECT_EQ(m_launcher.ends()[0].how, How::Cancelled);
+}
+
+TEST_F(Launcher, AScannerThatCannotStartIsWaitedForUntilTheCancel)
+{
+    const CapturedLog log;
+    ScannerLauncher::Job missing = job();
+    missing.program = m_folder.path(QStringLiteral("no-such-program"));
+    std::thread canceller = cancelWhenRunning();
+    m_launcher.run(missing);
+    canceller.join();
+    EXPECT_TRUE(log.contains(QStringLiteral("Scanner failed to Start: 0"))); // QProcess::FailedToStart
+    ASSERT_EQ(m_launcher.ends().size(), 1u);
+    EXPECT_EQ(m_launcher.ends()[0].how, How::NotStarted);
+    EXPECT_FALSE(m_launcher.ends()[0].text.isEmpty());
+}
+
+TEST_F(Launcher, TheRegistryScansOutOfProcessAndReloadsWhatChanged)
+{
+    const Workstation workstation(m_folder);
+    addVST3File(m_folder.plugins(), QStringLiteral("Comp"));
+    addVST2File(m_folder.plugins(), QStringLiteral("Echo")); // a catalogue of nothing is written every time
+    PluginHost registry;
+    registry.initialise(m_folder.dataFolder(), QString(), 48000, 1024);
+    registry.Scan(true, false);
+    EXPECT_TRUE(registry.completionEvent()->isSet());
+    EXPECT_EQ(workstation.changes, 1) << "the lists as they were";
+    EXPECT_FALSE(registry.Scan(true, false)) << "one launcher at a time";
+    EXPECT_EQ(workstation.changes, 1);
+    waitForLauncher(registry);
+    ASSERT_EQ(registry.vst3Host().effects().size(), 1u);
+    EXPECT_EQ(registry.vst3Host().effects()[0].name, QStringLiteral("Comp"));
+    EXPECT_EQ(workstation.changes, 2);
+
+    registry.Scan(true, false);
+    waitForLauncher(registry);
+    EXPECT_EQ(workstation.changes, 3) << "nothing changed, nothing reloaded";
+    EXPECT_EQ(registry.vst3Host().effects().size(), 1u);
+}
+
+TEST_F(Launcher, TheRegistryEndsItsLauncherWhenItGoes)
+{
+    const Workstation workstation(m_folder);
+    addVST3File(m_folder.plugins(), QStringLiteral("Hang"), "class Hang\nfault initialize hang\n");
+    QElapsedTimer time;
+    {
+        PluginHost registry;
+        registry.initialise(m_folder.dataFolder(), QString(), 48000, 1024);
+        registry.Scan(true, false);
+        while (m_folder.markers().isEmpty())
+            std::this_thread::sleep_for(std::chrono::milliseconds(5));
+        time.start();
+    }
+    EXPECT_LT(time.elapsed(), 20000);
+    EXPECT_TRUE(m_folder.markers().isEmpty()) << "a cancel blames nobody";
+}

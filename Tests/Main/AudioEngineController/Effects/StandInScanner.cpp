@@ -1,0 +1,69 @@
+// Plays the scanner for tests of its launcher: takes the scan list's path as the scanner does and carries out
+// one line of the file "stand-in" in the data folder for each run, the last one again and again. Words of a
+// line:
+//   marker=NAME   writes a crash marker of VST 2 (NAME has its ending)
+//   clear         deletes all markers first
+//   catalogue     changes the VST 2 catalogue
+//   hang, abort, exit=N   how it ends (exit=0 without any)
+#include <chrono>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <string>
+#include <thread>
+
+namespace {
+
+namespace fs = std::filesystem;
+
+/// The line of this run; runs are counted in the file "runs".
+std::string lineOfRun(const fs::path &data)
+{
+    std::ofstream(data / "runs", std::ios::app) << "run\n";
+    const auto runs = fs::file_size(data / "runs") / std::string("run\n").size();
+    std::ifstream script(data / "stand-in");
+    std::string line;
+    std::string last;
+    for (std::uintmax_t run = 0; run < runs && std::getline(script, line); ++run)
+        last = line;
+    return last;
+}
+
+void clearMarkers(const fs::path &effects)
+{
+    for (const auto &entry : fs::directory_iterator(effects))
+        if (entry.path().extension() == ".scan" || entry.path().extension() == ".scan3")
+            fs::remove(entry.path());
+}
+
+void carryOut(const std::string &word, const fs::path &effects)
+{
+    const std::string value = word.substr(word.find('=') + 1);
+    if (word == "clear")
+        clearMarkers(effects);
+    else if (word == "catalogue")
+        std::ofstream(effects / "FXConfiguration.xml", std::ios::app) << "<!-- -->";
+    else if (word == "abort")
+        std::abort();
+    else if (word == "hang")
+        std::this_thread::sleep_for(std::chrono::hours(1));
+    else if (word.rfind("marker=", 0) == 0)
+        std::ofstream(effects / value)
+            << "<CrashedPlugin>\n\t<Path>/p/" << value << "</Path>\n</CrashedPlugin>\n";
+    else if (word.rfind("exit=", 0) == 0)
+        std::_Exit(std::stoi(value));
+}
+
+} // namespace
+
+int main(int argc, char **argv)
+{
+    if (argc != 2)
+        return 86;
+    const fs::path effects = fs::path(argv[1]).parent_path();
+    std::istringstream words(lineOfRun(effects.parent_path()));
+    for (std::string word; words >> word;)
+        carryOut(word, effects);
+    return 0;
+}

@@ -1,0 +1,254 @@
+#include "Tests/Support/ScannerRun.h"
+#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/VST2Fixture.h"
+#include "Tests/Support/VST3Fixture.h"
+
+#include <QFile>
+#include <QJsonArray>
+#include <QJsonDocument>
+#include <QJsonObject>
+
+#include <gtest/gtest.h>
+
+#include <map>
+
+namespace {
+
+/// The real fxscan with the real scanner on scripted plug-ins.
+class FxScan : public testing::Test {
+protected:
+    ScannerOutcome run(const QStringList &options) const
+    {
+        ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
+        prepare(fxscan, options);
+        return fxscan.run();
+    }
+    void prepare(ScannerRun &fxscan, const QStringList &options) const
+    {
+        fxscan.removeEnvironment(QStringLiteral("FXPROBE_LOG"));
+        fxscan.setArguments(QStringList({QStringLiteral("--data-folder"), m_folder.dataFolder()}) + options);
+    }
+    ScannerOutcome scan(const QStringList &options = {}) const
+    {
+        return run(QStringList({QStringLiteral("--format"), QStringLiteral("json"), m_folder.plugins()}) +
+                   options);
+    }
+    static QJsonObject json(const ScannerOutcome &outcome)
+    {
+        const QJsonDocument document = QJsonDocument::fromJson(outcome.standardOutput);
+        EXPECT_TRUE(document.isObject())
+            << outcome.standardOutput.constData() << outcome.standardError.constData();
+        return document.object();
+    }
+    /// Name to state of everything listed.
+    static std::map<QString, QString> states(const QJsonObject &result)
+    {
+        std::map<QString, QString> states;
+        for (const QJsonValue &plugin : result[QStringLiteral("plugins")].toArray())
+            states[plugin[QStringLiteral("name")].toString()] = plugin[QStringLiteral("state")].toString();
+        return states;
+    }
+    static QString reason(const QJsonObject &result, const QString &name)
+    {
+        for (const QJsonValue &failure : result[QStringLiteral("failures")].toArray())
+            if (failure[QStringLiteral("name")].toString() == name)
+                return failure[QStringLiteral("reason")].toString();
+        return QStringLiteral("(none)");
+    }
+    static int number(const QJsonObject &result, const char *key)
+    {
+        return result[QStringLiteral("scan")].toObject()[QLatin1String(key)].toInt(-1);
+    }
+    QByteArray tracing(const char *script) const
+    {
+        return "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n" + script;
+    }
+    void addVst3(const char *name, const char *script) const
+    {
+        addVST3File(m_folder.plugins(), QLatin1String(name),
+                    tracing(("class " + QByteArray(name) + '\n' + script).constData()));
+    }
+    void addVst2(const char *name, const char *script) const
+    {
+        addVST2File(m_folder.plugins(), QLatin1String(name), tracing(script));
+    }
+
+    TestFolder m_folder;
+};
+
+} // namespace
+
+TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
+{
+    const struct {
+        const char *name;
+        bool isVst3;
+        const char *script;
+        const char *state;
+        const char *reason; ///< a part of it
+    } rows[] = {
+        {"Good3", true, "", "ok", nullptr},
+        {"Good2", false, "", "ok", nullptr},
+        {"Crash3", true, "fault initialize abort\n", "disabled", "while it was asked for its data"},
+        {"Crash2", false, "fault entry abort\n", "disabled", "while it was starting"},
+        {"Close2", false, "fault static-destructor abort\n", "disabled",
+         "while it was being closed and unloaded"},
+        {"Exit3", true, "fault module-entry _exit\n", "disabled", "exit code 0 while it was starting"},
+        {"Hang2", false, "fault get-vendor-string hang\n", "disabled",
+         "no answer for 2 seconds while it was asked for its data"},
+        {"Null2", false, "answer entry null\n", "failed", "its entry point gives no plug-in"},
+        {"Throw2", false, "fault entry throw-std\n", "failed", "thrown by the fixture"},
+        {"Refuse3", true, "answer initialize false\n", "failed", "could not be initialised (result 0x"},
+        {"Start3", true, "answer module-entry false\n", "failed", "could not start"},
+        {"Factory3", true, "answer get-factory null\n", nullptr, "it gives no plug-in factory"},
+    };
+    for (const auto &row : rows)
+        row.isVst3 ? addVst3(row.name, row.script) : addVst2(row.name, row.script);
+    m_folder.write(QStringLiteral("Plugins/Text3.vst3"), "no library at all");
+    const ScannerOutcome outcome = scan({QStringLiteral("--timeout"), QStringLiteral("2")});
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
+    const QJsonObject first = json(outcome);
+    for (const auto &row : rows) {
+        const auto states = FxScan::states(first);
+        const auto state = states.find(QLatin1String(row.name));
+        EXPECT_EQ(state == states.end() ? QString() : state->second, QLatin1String(row.state)) << row.name;
+        const QString name = QLatin1String(row.name) +
+                             (row.state ? QString() : QStringLiteral(".vst3")); // no record: the file's
+        if (row.reason) {
+            EXPECT_TRUE(reason(first, name).contains(QLatin1String(row.reason)))
+                << row.name << ": " << qPrintable(reason(first, name));
+        }
+    }
+    EXPECT_TRUE(reason(first, QStringLiteral("Text3")).startsWith(QLatin1String("it could not be loaded: ")));
+    EXPECT_TRUE(first[QStringLiteral("scan")][QStringLiteral("finished")].toBool());
+
+    // The same again: nothing to do but what has no record, and the reasons are still known.
+    QFile::remove(m_folder.path(QStringLiteral("trace")));
+    const ScannerOutcome strict = scan({QStringLiteral("--strict")});
+    EXPECT_EQ(strict.exitCode, 1);
+    const QJsonObject second = json(strict);
+    EXPECT_EQ(number(second, "unchanged"), number(first, "new"));
+    EXPECT_EQ(number(second, "new") + number(second, "updated"), 0);
+    for (const auto &row : rows) {
+        if (row.state && row.reason) {
+            EXPECT_TRUE(reason(second, QLatin1String(row.name)).contains(QLatin1String(row.reason)))
+                << row.name;
+        }
+    }
+    for (const QString &call : m_folder.lines(QStringLiteral("trace")))
+        EXPECT_FALSE(call.contains(QLatin1String("initialize"))) << qPrintable(call);
+}
+
+TEST_F(FxScan, ARetryBringsOneBackWithItsMarks)
+{
+    addVst3("Crash", "fault initialize abort\n");
+    addVst3("Other", "fault initialize abort\n");
+    addVst2("Shell", "child 1 One\nchild 2 Two\nfault entry abort Two\n");
+    EXPECT_EQ(scan().exitCode, 0);
+    QByteArray catalogue = m_folder.catalogue();
+    m_folder.write(QStringLiteral("Effects/VST3Configuration.xml"),
+                   catalogue.replace("<Favourite>0<", "<Favourite>1<"));
+    addVst3("Crash", "");
+    addVst2("Shell", "child 1 One\nchild 2 Two\n");
+    const QJsonObject result = json(scan({QStringLiteral("--retry"), QStringLiteral("crash"),
+                                          QStringLiteral("--retry"), QStringLiteral("Two")}));
+    EXPECT_EQ(states(result),
+              (std::map<QString, QString>{{QStringLiteral("Crash"), QStringLiteral("ok")},
+                                          {QStringLiteral("Other"), QStringLiteral("disabled")},
+                                          {QStringLiteral("One"), QStringLiteral("ok")},
+                                          {QStringLiteral("Two"), QStringLiteral("ok")}}));
+    EXPECT_EQ(m_folder.catalogue().count("<Favourite>1<"), 2);
+    EXPECT_EQ(run({QStringLiteral("--retry"), QStringLiteral("One")}).exitCode, 2) << "it works";
+    addVst3("Other", "");
+    EXPECT_EQ(states(json(run({QStringLiteral("--format"), QStringLiteral("json"),
+                               QStringLiteral("--retry-failed")})))
+                  .at(QStringLiteral("Other")),
+              QStringLiteral("ok"))
+        << "in the folders of the last scan";
+}
+
+TEST_F(FxScan, MoreKillersThanOneLaunchHasRuns)
+{
+    for (int index = 0; index < 12; ++index)
+        addVst3(qPrintable(QStringLiteral("K%1").arg(index, 2, 10, QLatin1Char('0'))),
+                "fault initialize _exit\n");
+    addVst3("Last", "");
+    const ScannerOutcome outcome = scan();
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
+    EXPECT_EQ(states(json(outcome)).at(QStringLiteral("Last")), QStringLiteral("ok"));
+    EXPECT_TRUE(m_folder.markers().isEmpty());
+}
+
+TEST_F(FxScan, TerminationEndsItCleanly)
+{
+    addVst3("Earlier", "");
+    addVst3("Hang", "fault initialize hang\n");
+    ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
+    prepare(fxscan, {QStringLiteral("--timeout"), QStringLiteral("0"), m_folder.plugins()});
+    ASSERT_TRUE(fxscan.start());
+    ASSERT_TRUE(
+        fxscan.waitUntil([this] { return m_folder.markers().contains(QStringLiteral("Hang.scan3")); }));
+    fxscan.requestTermination();
+    EXPECT_EQ(fxscan.wait().exitCode, 3);
+    EXPECT_TRUE(m_folder.markers().isEmpty()) << qPrintable(m_folder.markers().join(QLatin1Char(' ')));
+    EXPECT_TRUE(m_folder.catalogue().contains("<Name>Earlier<"));
+    EXPECT_FALSE(m_folder.catalogue().contains("<Name>Hang<"));
+}
+
+TEST_F(FxScan, ListingTouchesNothing)
+{
+    addVst3("Comp", "");
+    EXPECT_EQ(scan().exitCode, 0);
+    m_folder.write(QStringLiteral("Effects/Comp.scan3"), "<CrashedPlugin>");
+    QFile::remove(m_folder.path(QStringLiteral("trace")));
+    const ScannerOutcome listed = run({QStringLiteral("--list")});
+    EXPECT_TRUE(listed.succeeded());
+    EXPECT_TRUE(listed.standardOutput.contains("VST 3   Comp  Fixture Works"))
+        << listed.standardOutput.constData();
+    EXPECT_EQ(m_folder.markers(), QStringList(QStringLiteral("Comp.scan3")));
+    EXPECT_TRUE(m_folder.lines(QStringLiteral("trace")).isEmpty());
+}
+
+TEST_F(FxScan, NamesThatBreakTheCatalogueAreNamed)
+{
+    addVst3("Fine", "");
+    addVST3File(m_folder.plugins(), QStringLiteral("Bad"), "class \"A < B\"\nvendor \"C & D\"\n");
+    const QJsonObject result = json(scan());
+    const QString problems = QString::fromUtf8(
+        QJsonDocument(result[QStringLiteral("problems")].toArray()).toJson(QJsonDocument::Compact));
+    EXPECT_TRUE(problems.contains(QLatin1String("the name of 'A < B'"))) << qPrintable(problems);
+    EXPECT_TRUE(problems.contains(QLatin1String("cannot be read by the next scan"))) << qPrintable(problems);
+    EXPECT_EQ(states(result).size(), 2u) << "shown all the same";
+}
+
+TEST_F(FxScan, InProcessScansAsWell)
+{
+    addVst3("Comp", "");
+    addVst2("Echo", "");
+    const QJsonObject result = json(scan({QStringLiteral("--in-process")}));
+    EXPECT_EQ(states(result).size(), 2u);
+    EXPECT_TRUE(result[QStringLiteral("scan")][QStringLiteral("finished")].toBool());
+}
+
+TEST_F(FxScan, WrongUsage)
+{
+    const QString nowhere = m_folder.path(QStringLiteral("nowhere"));
+    const struct {
+        QStringList options;
+        const char *message;
+    } rows[] = {
+        {{QStringLiteral("--no-such-option")}, "no-such-option"},
+        {{QStringLiteral("--format"), QStringLiteral("xml")}, "'xml' is no format"},
+        {{QStringLiteral("--timeout"), QStringLiteral("-1")}, "'-1' is no number of seconds"},
+        {{QStringLiteral("--list"), QStringLiteral("--retry-failed")}, "--list makes no scan"},
+        {{nowhere}, "there is no folder"},
+        {{m_folder.plugins(), QStringLiteral("--retry"), QStringLiteral("Nobody")}, "no plug-in 'Nobody'"},
+    };
+    for (const auto &row : rows) {
+        const ScannerOutcome outcome = run(row.options);
+        EXPECT_EQ(outcome.exitCode, 2) << row.message;
+        EXPECT_TRUE(outcome.standardError.contains(row.message)) << outcome.standardError.constData();
+        EXPECT_TRUE(outcome.standardOutput.isEmpty()) << outcome.standardOutput.constData();
+    }
+    EXPECT_TRUE(run({QStringLiteral("--help")}).standardOutput.contains("--retry-failed"));
+}

@@ -1,0 +1,52 @@
+#include "Workstation/SummaryOutput.h"
+#include "Workstation/Terminal.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+QString utf8(const char *text) { return QString::fromUtf8(text); }
+
+} // namespace
+
+TEST(Output, CellsHaveTheirWidthInColumns)
+{
+    const struct {
+        const char *text;
+        int columns;
+        const char *cell;
+    } rows[] = {
+        {"abc", 5, "abc  "},
+        {"abcdef", 5, "abcd…"},
+        {"日本語", 6, "日本語"},
+        {"日本語", 5, "日本…"},
+        {"日本語", 4, "日… "}, // half a character has no place
+        {"e\xCC\x81", 2, "e\xCC\x81 "},
+        {"🎹", 3, "🎹 "},
+    };
+    for (const auto &row : rows)
+        EXPECT_EQ(Terminal::cell(utf8(row.text), row.columns), utf8(row.cell)) << row.text;
+}
+
+TEST(Output, NothingInATextSteersTheTerminal)
+{
+    EXPECT_EQ(Terminal::harmless(utf8("a\x1b[2Jb\nc\xC2\x9B"
+                                      "d\xE2\x80\xAE"
+                                      "e\xE2\x81\xA6")),
+              utf8("a?[2Jb?c?d?e?"));
+    EXPECT_EQ(Terminal::harmless(utf8("Ünï 🎹 日本")), utf8("Ünï 🎹 日本"));
+}
+
+TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)
+{
+    CataloguedPlugin plugin{&pluginFormats().front(), {}};
+    plugin.record.name = QStringLiteral("A \"B\", C");
+    plugin.record.vendor = QStringLiteral("two\nlines");
+    plugin.record.inputs = 2;
+    plugin.record.path = QStringLiteral("/p/A.vst3");
+    ScanSummary summary;
+    summary.plugins.push_back(plugin);
+    const QByteArray csv = renderCsv(summary);
+    EXPECT_EQ(csv.mid(csv.indexOf("\r\n") + 2),
+              "vst3,\"A \"\"B\"\", C\",\"two\nlines\",,2 in,ok,,,/p/A.vst3\r\n");
+}

@@ -1,0 +1,128 @@
+#include "Workstation/CatalogueView.h"
+
+#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+
+#include <QFile>
+
+#include <algorithm>
+#include <array>
+#include <tuple>
+
+namespace {
+
+/// What a VST 2 plug-in's own category number says: VstPlugCategory of the VST 2.4 interface, from 0.
+constexpr std::array<const char *, 12> kVst2Categories = {
+    "",     "Effect",   "Synth",       "Analysis",        "Mastering", "Spatial",
+    "Room", "Surround", "Restoration", "Offline Process", "Shell",     "Generator"};
+
+QStringList namesOfSet(quint32 category)
+{
+    QStringList names;
+    for (const Category &each : CategoryTable::categories())
+        if (category & CategoryTable::instance().internalBit(each.index))
+            names.append(QString::fromLatin1(each.name));
+    return names;
+}
+
+/// The first text of a record that is no XML as it stands.
+QString badText(const EffectRecord &record)
+{
+    const struct {
+        const char *what;
+        const QString &text;
+    } texts[] = {
+        {"name", record.name},           {"vendor", record.vendor}, {"sub-categories", record.categories},
+        {"sub-plug-in", record.subName}, {"path", record.path},     {"identifier", record.id}};
+    for (const auto &[what, text] : texts)
+        for (const char bad : {'<', '&'})
+            if (text.contains(QLatin1Char(bad)))
+                return QStringLiteral("the %1 of '%2' (%3) holds \"%4\"")
+                    .arg(QLatin1String(what), record.name, record.path, QString(QLatin1Char(bad)));
+    return QString();
+}
+
+void readCatalogue(const PluginFormat &format, const QString &effectsFolder, CatalogueView &view)
+{
+    const QString path = effectsFolder + QLatin1String(format.catalogue.fileName);
+    if (!QFile::exists(path))
+        return;
+    CatalogueContents contents = readCatalogueFile(format.catalogue, path);
+    if (!contents) {
+        contents.records = salvageRecords(format.catalogue, path);
+        view.problems.append(QStringLiteral("%1 cannot be read by the next scan, which will probe everything "
+                                            "anew: %2")
+                                 .arg(path, contents.reason));
+    }
+    for (const EffectRecord &record : contents.records) {
+        view.plugins.push_back({&format, record});
+        if (const QString bad = badText(record); !bad.isEmpty())
+            view.problems.append(QStringLiteral("%1 is not well-formed XML: %2").arg(path, bad));
+    }
+}
+
+} // namespace
+
+const std::vector<PluginFormat> &pluginFormats()
+{
+    static const std::vector<PluginFormat> formats{{"vst3", "VST 3", vst3CatalogueFormat()},
+                                                   {"vst2", "VST 2", vstCatalogueFormat()}};
+    return formats;
+}
+
+const PluginFormat &pluginFormat(const QString &key)
+{
+    return key == QLatin1String(pluginFormats().front().key) ? pluginFormats().front()
+                                                             : pluginFormats().back();
+}
+
+const char *stateText(PluginState state)
+{
+    switch (state) {
+    case PluginState::Ok:
+        return "ok";
+    case PluginState::Failed:
+        return "failed";
+    case PluginState::Disabled:
+        return "disabled";
+    case PluginState::SwitchedOff:
+        return "switched off";
+    }
+    return "";
+}
+
+PluginState CataloguedPlugin::state() const
+{
+    if (record.isSwitchedOff())
+        return PluginState::SwitchedOff;
+    if (record.working)
+        return PluginState::Ok;
+    return record.enabled ? PluginState::Failed : PluginState::Disabled;
+}
+
+QStringList CataloguedPlugin::categories() const
+{
+    if (const QStringList names = namesOfSet(record.category); !names.isEmpty())
+        return names;
+    if (!record.categories.isEmpty())
+        return record.categories.split(QLatin1Char('|'), Qt::SkipEmptyParts);
+    const auto number = static_cast<std::size_t>(record.vstCategory);
+    const bool isNamed = record.vstCategory > 0 && number < kVst2Categories.size();
+    return isNamed ? QStringList(QString::fromLatin1(kVst2Categories[number])) : QStringList();
+}
+
+CatalogueView readCatalogues(const QString &effectsFolder)
+{
+    CatalogueView view;
+    for (const PluginFormat &format : pluginFormats())
+        readCatalogue(format, effectsFolder, view);
+    const auto sortKey = [](const CataloguedPlugin &plugin) {
+        return std::make_tuple(plugin.record.name.toCaseFolded(), plugin.record.path, plugin.record.id);
+    };
+    std::stable_sort(
+        view.plugins.begin(), view.plugins.end(),
+        [&](const CataloguedPlugin &a, const CataloguedPlugin &b) { return sortKey(a) < sortKey(b); });
+    return view;
+}

@@ -1,0 +1,6 @@
+#pragma once
+
+#include "Workstation/ScanOptions.h"
+
+/// fxscan, from its options to its exit code. Returns when everything is printed.
+int runFxScan(ScanOptions options);

@@ -1,0 +1,50 @@
+#include "Workstation/PluginFolders.h"
+
+#include <QDir>
+#include <QFileInfo>
+#include <QRegularExpression>
+#include <QStandardPaths>
+
+namespace {
+
+/// The list is written without escaping, one folder a line, and read as XML.
+bool canStandInScanList(const QString &folder)
+{
+    static const QRegularExpression bad(QStringLiteral("[<\\x00-\\x1f]|&[#a-zA-Z0-9]+;"));
+    return !bad.match(folder).hasMatch();
+}
+
+QStringList foldersOfVariable(const char *name)
+{
+    return qEnvironmentVariable(name).split(QDir::listSeparator(), Qt::SkipEmptyParts);
+}
+
+} // namespace
+
+QStringList usualPluginFolders()
+{
+    return foldersOfVariable("VST3_PATH") + foldersOfVariable("VST_PATH") + platformPluginFolders();
+}
+
+QString userDataFolder()
+{
+    return QStandardPaths::writableLocation(QStandardPaths::GenericDataLocation) + QStringLiteral("/FxProbe");
+}
+
+SettledFolders settleFolders(const QStringList &folders)
+{
+    SettledFolders settled;
+    for (const QString &given : folders) {
+        const QString folder = QDir::cleanPath(QDir(given).absolutePath());
+        if (given.isEmpty() || !QFileInfo(folder).isDir())
+            settled.leftOut.append(QStringLiteral("there is no folder '%1'").arg(given));
+        else if (!canStandInScanList(folder))
+            settled.leftOut.append(
+                QStringLiteral("the name of the folder '%1' cannot stand in a scan list").arg(given));
+        else if (!settled.folders.contains(folder))
+            settled.folders.append(folder);
+    }
+    return settled;
+}
+
+QStringList existingUsualFolders() { return settleFolders(usualPluginFolders()).folders; }

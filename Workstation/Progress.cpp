@@ -1,0 +1,80 @@
+#include "Workstation/Progress.h"
+
+#include "Main/AudioEngineController/Effects/EffectRecord.h"
+#include "Workstation/CatalogueView.h"
+#include "Workstation/ScanAccount.h"
+#include "Workstation/Terminal.h"
+
+namespace {
+
+constexpr qint64 kSlow = 2000; ///< ms after which the time of a probe is shown
+
+QString countOf(const ScanAccount &account)
+{
+    return QStringLiteral("[%1/%2]").arg(account.done()).arg(account.planned());
+}
+
+QString nameOf(const ScanAccount &account, const PluginKey &key)
+{
+    const ProbeAccount *probe = account.find(key);
+    const QString part =
+        probe && !probe->subName.isEmpty() ? QStringLiteral(", %1").arg(probe->subName) : QString();
+    return QStringLiteral("%1  %2%3")
+        .arg(QLatin1String(pluginFormat(key.format).title), fileNameOf(key.path), part);
+}
+
+} // namespace
+
+Progress::Progress(bool isQuiet)
+    : m_isQuiet(isQuiet)
+    , m_isTerminal(Terminal::errorIsTerminal())
+{}
+
+Progress::~Progress() { clearLine(); }
+
+void Progress::clearLine()
+{
+    if (!m_line.isEmpty())
+        Terminal::printError(QStringLiteral("\r\x1b[K"));
+    m_line.clear();
+}
+
+void Progress::say(const QString &text)
+{
+    if (m_isQuiet)
+        return;
+    clearLine();
+    Terminal::printError(Terminal::harmless(text) + QLatin1Char('\n'));
+}
+
+void Progress::show(ScanAccount &account)
+{
+    if (m_isQuiet)
+        return;
+    if (!m_isTerminal)
+        showLines(account);
+    else if (const PluginKey *key = account.current())
+        showLine(account, *key);
+}
+
+void Progress::showLines(ScanAccount &account)
+{
+    for (const PluginKey &key : account.takeBegun())
+        Terminal::printError(Terminal::harmless(nameOf(account, key)) + QLatin1Char('\n'));
+}
+
+void Progress::showLine(const ScanAccount &account, const PluginKey &key)
+{
+    if (!(key == m_shown))
+        m_since.start();
+    m_shown = key;
+    const QString time =
+        m_since.elapsed() < kSlow ? QString() : QStringLiteral("  (%1 s)").arg(m_since.elapsed() / 1000);
+    const QString text =
+        Terminal::harmless(countOf(account) + QLatin1Char(' ') + nameOf(account, key) + time);
+    const QString line = Terminal::cell(text, Terminal::errorWidth() - 1).trimmed();
+    if (line == m_line)
+        return;
+    Terminal::printError(QStringLiteral("\r\x1b[K") + line);
+    m_line = line;
+}

@@ -1,0 +1,33 @@
+#pragma once
+
+#include "Workstation/ScanAccount.h"
+
+#include <QElapsedTimer>
+#include <QString>
+
+/// Shows how a scan gets on, on the error output: on a terminal one line that lives, else a line per file.
+class Progress {
+public:
+    explicit Progress(bool isQuiet);
+    /// Takes the live line away.
+    ~Progress();
+    Progress(const Progress &) = delete;
+    Progress &operator=(const Progress &) = delete;
+
+    /// Shows what is being probed and how many files are done.
+    void show(ScanAccount &account);
+    /// A line that stays.
+    void say(const QString &text);
+
+private:
+    void clearLine();
+    void showLines(ScanAccount &account);
+    void showLine(const ScanAccount &account, const PluginKey &key);
+
+    bool m_isQuiet;
+    bool m_isTerminal;
+    bool m_hasLine = false;
+    QString m_line;    ///< as it stands on the terminal
+    PluginKey m_shown; ///< what it is about
+    QElapsedTimer m_since;
+};

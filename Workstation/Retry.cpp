@@ -1,0 +1,102 @@
+#include "Workstation/Retry.h"
+
+#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Workstation/CatalogueView.h"
+
+#include <QDir>
+#include <QFile>
+
+#include <algorithm>
+#include <set>
+
+namespace {
+
+bool isNamed(const EffectRecord &record, const QString &name)
+{
+    const auto equals = [&name](const QString &text) { return text.compare(name, Qt::CaseInsensitive) == 0; };
+    return equals(record.name) || equals(fileNameOf(record.path)) || equals(record.path) ||
+           record.path == QDir::cleanPath(QDir(name).absolutePath());
+}
+
+/// Gives the chosen records another chance; the number of them.
+class Chooser {
+public:
+    explicit Chooser(const QStringList &names)
+        : m_names(names)
+        , m_unknown(names)
+    {}
+
+    bool choose(const EffectRecord &record)
+    {
+        if (record.working)
+            return false;
+        bool isChosen = m_names.isEmpty();
+        for (const QString &name : m_names) {
+            if (!isNamed(record, name))
+                continue;
+            isChosen = true;
+            m_unknown.removeAll(name);
+        }
+        return isChosen;
+    }
+    const QStringList &unknown() const { return m_unknown; }
+
+private:
+    QStringList m_names;
+    QStringList m_unknown;
+};
+
+int reopen(std::vector<EffectRecord> &records, Chooser &chooser)
+{
+    int count = 0;
+    std::set<QString> files;
+    for (EffectRecord &record : records) {
+        if (!chooser.choose(record))
+            continue;
+        record.enabled = true;
+        files.insert(record.path);
+        ++count;
+    }
+    // Any of a file's records may be the one that speaks for it.
+    for (EffectRecord &record : records)
+        if (files.count(record.path) != 0)
+            record.fileTime.clear();
+    return count;
+}
+
+FileResult writeRecords(const CatalogueFormat &format, const QString &path,
+                        const std::vector<EffectRecord> &records)
+{
+    std::vector<QByteArray> texts;
+    std::vector<const QByteArray *> pointers;
+    texts.reserve(records.size());
+    for (const EffectRecord &record : records) {
+        texts.push_back(renderRecord(format, record));
+        pointers.push_back(&texts.back());
+    }
+    return replaceFile(path, renderCatalogue(format, pointers), Durability::Synced);
+}
+
+} // namespace
+
+RetryOutcome retryPlugins(const QString &effectsFolder, const QStringList &names)
+{
+    RetryOutcome outcome;
+    Chooser chooser(names);
+    for (const PluginFormat &format : pluginFormats()) {
+        const QString path = effectsFolder + QLatin1String(format.catalogue.fileName);
+        if (!QFile::exists(path))
+            continue;
+        CatalogueContents contents = readCatalogueFile(format.catalogue, path);
+        if (!contents) // nothing in it would be kept from the next scan, but for what crashed
+            contents.records = salvageRecords(format.catalogue, path);
+        const int count = reopen(contents.records, chooser);
+        outcome.plugins += count;
+        if (count == 0)
+            continue;
+        if (const FileResult written = writeRecords(format.catalogue, path, contents.records); !written)
+            outcome.written.reason = QStringLiteral("%1: %2").arg(path, written.reason);
+    }
+    outcome.unknown = chooser.unknown();
+    return outcome;
+}

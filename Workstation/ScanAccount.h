@@ -1,0 +1,88 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/ScannerLauncher.h"
+
+#include <QByteArray>
+#include <QString>
+#include <QStringList>
+
+#include <map>
+#include <tuple>
+#include <vector>
+
+class QJsonObject;
+
+/// Tells one plug-in, or sub-plug-in, of a file from all others.
+struct PluginKey {
+    QString format; ///< "vst3" or "vst2"
+    QString path;
+    quint32 subId = 0;
+
+    bool operator<(const PluginKey &other) const
+    {
+        return std::tie(format, path, subId) < std::tie(other.format, other.path, other.subId);
+    }
+    bool operator==(const PluginKey &other) const { return !(*this < other) && !(other < *this); }
+};
+
+/// What a scan said of one probe.
+struct ProbeAccount {
+    QString subName;
+    QString stage;            ///< the last one that it entered
+    QString reason;           ///< why it failed; empty: it did not
+    double milliseconds = -1; ///< -1: it did not come to its end
+    int records = 0;          ///< so many plug-ins of it work
+    bool noPlugin = false;    ///< no plug-in of its format
+    bool isLoaded = true;     ///< false: seen without loading it
+};
+
+/// Follows the report that scanners write while they work.
+class ScanAccount {
+public:
+    explicit ScanAccount(const QString &reportFile);
+
+    /// Reads what was written since the last call.
+    void update();
+    /// Takes in how a scanner ended: what it was busy with is to blame. The next one may be at work already.
+    void scannerEnded(const ScannerRunEnd &end);
+
+    /// The innermost probe under way; null when there is none.
+    const PluginKey *current() const { return m_open.empty() ? nullptr : &m_open.back(); }
+    /// The probes that began since the last call, in order.
+    std::vector<PluginKey> takeBegun();
+    /// Files dealt with in this run, and files planned, of all formats planned so far.
+    int done() const { return m_done; }
+    int planned() const { return m_planned; }
+
+    /// The last scanner wrote all its catalogues.
+    bool isFinished() const { return m_finished; }
+    /// The last scanner found another one at work.
+    bool isBusy() const { return m_busy; }
+    /// What kept a scanner from its work; one sentence each.
+    const QStringList &problems() const { return m_problems; }
+
+    const std::map<PluginKey, ProbeAccount> &probes() const { return m_probes; }
+    /// Why a culprit is one.
+    QString reasonOf(const ScanCulprit &culprit) const;
+    /// What became of a probe; null when there was none.
+    const ProbeAccount *find(const PluginKey &key) const;
+    /// Whether the file was probed in any way.
+    bool wasProbed(const QString &format, const QString &path) const;
+
+private:
+    void takeLine(const QByteArray &line);
+    void begin(const PluginKey &key, const QJsonObject &line);
+    void end(const PluginKey &key, const QJsonObject &line);
+
+    QString m_file;
+    qint64 m_read = 0; ///< bytes of the file
+    QByteArray m_rest; ///< of a line that is not complete yet
+    std::vector<PluginKey> m_open;
+    std::vector<PluginKey> m_begun;
+    std::map<PluginKey, ProbeAccount> m_probes;
+    QStringList m_problems;
+    int m_done = 0;
+    int m_planned = 0;
+    bool m_finished = false;
+    bool m_busy = false;
+};

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <QString>
+#include <QStringList>
+
+/// Exit codes of fxscan.
+namespace ScanExit {
+inline constexpr int kDone = 0;
+inline constexpr int kFailures = 1;    ///< done, but some plug-ins cannot be used; only with --strict
+inline constexpr int kUsage = 2;       ///< the command line makes no sense
+inline constexpr int kNotFinished = 3; ///< the scan did not come to its end
+} // namespace ScanExit
+
+enum class OutputFormat { Table, Json, Csv };
+
+/// What the command line asks for.
+struct ScanOptions {
+    QStringList folders; ///< as given; none: the usual ones
+    QString dataFolder;  ///< absolute, without a separator at its end
+    OutputFormat format = OutputFormat::Table;
+    QStringList retry;        ///< names or paths of plug-ins that get another chance
+    bool retryFailed = false; ///< all of them
+    int timeout = 60;         ///< seconds that one plug-in may take; 0: for ever
+    bool listOnly = false;
+    bool inProcess = false;
+    bool quiet = false;
+    bool showWindow = false;
+    bool strict = false;
+
+    bool isRetry() const { return retryFailed || !retry.isEmpty(); }
+};
+
+/// A command line, read.
+struct CommandLine {
+    ScanOptions options;
+    QString text;         ///< what is to be printed instead of a scan: help, version, or what is wrong
+    bool isError = false; ///< `text` says what is wrong
+    bool goesOn() const { return text.isEmpty(); }
+};
+
+/// Reads the command line, the program's name first.
+CommandLine readCommandLine(const QStringList &arguments);

@@ -1,0 +1,37 @@
+#pragma once
+
+#include "Workstation/Progress.h"
+#include "Workstation/ScanAccount.h"
+#include "Workstation/ScanOptions.h"
+
+class PluginHost;
+
+/// One scan as a user means it: scans through the registry until everything is probed, shows how it gets on,
+/// and ends it when somebody asks.
+class ScanSession {
+public:
+    /// `report` is the file that the scanner reports to.
+    ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report);
+
+    /// Scans. False when the scan did not come to its end; `reason` then says why.
+    bool run();
+    const QString &reason() const { return m_reason; }
+    const ScanAccount &account() const { return m_account; }
+
+private:
+    bool scanOnce();
+    void scanHere();
+    void waitForLauncher();
+    void takeEnds();
+    void watchForCancel();
+    bool isStuck() const;
+
+    const ScanOptions &m_options;
+    PluginHost &m_registry;
+    ScanAccount m_account;
+    Progress m_progress;
+    std::size_t m_ends = 0;     ///< of scanners, in the present launch
+    std::size_t m_culprits = 0; ///< blamed in the present launch
+    bool m_cancelled = false;
+    QString m_reason;
+};

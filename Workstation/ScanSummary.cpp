@@ -1,0 +1,142 @@
+#include "Workstation/ScanSummary.h"
+
+#include <algorithm>
+#include <set>
+
+namespace {
+
+constexpr std::size_t kSlowest = 5;
+
+PluginKey keyOf(const CataloguedPlugin &plugin)
+{
+    return {QString::fromLatin1(plugin.format->key), plugin.record.path, plugin.record.subId};
+}
+
+using PluginIdentity = std::tuple<QString, QString, QString, quint32>;
+
+/// What makes a plug-in the same in two catalogues; several classes share a file.
+PluginIdentity identityOf(const CataloguedPlugin &plugin)
+{
+    const QString id = plugin.isUsable() ? plugin.record.id : QString();
+    return {QString::fromLatin1(plugin.format->key), plugin.record.path, id, plugin.record.subId};
+}
+
+QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, const ReasonStore &reasons)
+{
+    const PluginKey key = keyOf(plugin);
+    const ProbeAccount *probe = account ? account->find(key) : nullptr;
+    if (probe && !probe->reason.isEmpty())
+        return probe->reason;
+    if (const QString known = reasons.find(key, plugin.record.fileTime); !known.isEmpty())
+        return known;
+    return plugin.state() == PluginState::Disabled ? QStringLiteral("it ended the scanner in an earlier scan")
+                                                   : QStringLiteral("it failed in an earlier scan");
+}
+
+void addFailures(ScanSummary &summary, const ScanAccount *account, const ReasonStore &reasons)
+{
+    for (const CataloguedPlugin &plugin : summary.plugins)
+        if (!plugin.isUsable())
+            summary.failures.push_back({plugin.format, plugin.state(), plugin.record.name, plugin.record.path,
+                                        plugin.record.subId, reasonOf(plugin, account, reasons)});
+}
+
+/// Format and path of a file.
+using FileIdentity = std::pair<QString, QString>;
+
+FileIdentity fileOf(const CataloguedPlugin &plugin)
+{
+    return {QString::fromLatin1(plugin.format->key), plugin.record.path};
+}
+
+/// Files that have no record in the catalogue: no plug-ins, or such that get none although they failed.
+void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
+{
+    std::set<FileIdentity> recorded;
+    for (const CataloguedPlugin &plugin : summary.plugins)
+        recorded.insert(fileOf(plugin));
+    for (const auto &[key, probe] : account.probes()) {
+        if (probe.reason.isEmpty() || recorded.count({key.format, key.path}) != 0)
+            continue;
+        // What lies in a bundle of the other format is no plug-in of this one, and nobody thinks so.
+        if (probe.noPlugin && key.path.contains(QLatin1String(".vst3/Contents/"), Qt::CaseInsensitive))
+            continue;
+        const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;
+        (probe.noPlugin ? summary.noPlugins : summary.failures)
+            .push_back(
+                {&pluginFormat(key.format), PluginState::Failed, name, key.path, key.subId, probe.reason});
+    }
+}
+
+void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount &account)
+{
+    std::map<PluginIdentity, QString> gone;
+    std::set<FileIdentity> failedBefore; // what stood for the file says nothing of what is in it
+    for (const CataloguedPlugin &plugin : before.plugins) {
+        if (plugin.isUsable() || plugin.record.subId != 0)
+            gone.emplace(identityOf(plugin), plugin.record.name);
+        else
+            failedBefore.insert(fileOf(plugin));
+    }
+    for (const CataloguedPlugin &plugin : summary.plugins) {
+        const FileIdentity file = fileOf(plugin);
+        const bool wasKnown = gone.erase(identityOf(plugin)) + failedBefore.count(file) != 0;
+        const bool wasProbed = account.wasProbed(file.first, file.second);
+        ++(!wasKnown ? summary.added : wasProbed ? summary.updated : summary.unchanged);
+    }
+    for (const auto &entry : gone)
+        summary.removed.append(entry.second);
+}
+
+void addSlowest(ScanSummary &summary, const ScanAccount &account)
+{
+    for (const auto &[key, probe] : account.probes())
+        if (key.subId == 0 && probe.isLoaded && probe.milliseconds >= 0)
+            summary.slowest.push_back({key.path, probe.milliseconds});
+    const auto isSlower = [](const ProbeTime &a, const ProbeTime &b) {
+        return a.milliseconds > b.milliseconds;
+    };
+    std::sort(summary.slowest.begin(), summary.slowest.end(), isSlower);
+    if (summary.slowest.size() > kSlowest)
+        summary.slowest.resize(kSlowest);
+}
+
+} // namespace
+
+ScanSummary summariseCatalogue(CatalogueView now, const ReasonStore &reasons)
+{
+    ScanSummary summary;
+    summary.plugins = std::move(now.plugins);
+    summary.problems = std::move(now.problems);
+    addFailures(summary, nullptr, reasons);
+    return summary;
+}
+
+ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const ScanAccount &account,
+                          const ReasonStore &reasons)
+{
+    ScanSummary summary;
+    summary.isScan = true;
+    summary.finished = account.isFinished();
+    summary.plugins = std::move(now.plugins);
+    summary.problems = account.problems() + now.problems;
+    addFailures(summary, &account, reasons);
+    addUnrecorded(summary, account);
+    count(summary, before, account);
+    addSlowest(summary, account);
+    return summary;
+}
+
+ReasonStore reasonsToRemember(const ScanSummary &summary)
+{
+    ReasonStore store;
+    std::map<PluginKey, QString> fileTimes;
+    for (const CataloguedPlugin &plugin : summary.plugins)
+        fileTimes[keyOf(plugin)] = plugin.record.fileTime;
+    for (const PluginFailure &failure : summary.failures) {
+        const PluginKey key{QString::fromLatin1(failure.format->key), failure.path, failure.subId};
+        if (const auto time = fileTimes.find(key); time != fileTimes.end())
+            store.set(key, time->second, failure.reason);
+    }
+    return store;
+}

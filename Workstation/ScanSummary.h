@@ -1,0 +1,44 @@
+#pragma once
+
+#include "Workstation/CatalogueView.h"
+#include "Workstation/ReasonStore.h"
+#include "Workstation/ScanAccount.h"
+
+/// A plug-in, or a file that was taken for one, that cannot be used.
+struct PluginFailure {
+    const PluginFormat *format;
+    PluginState state;
+    QString name;
+    QString path;
+    quint32 subId;
+    QString reason; ///< one phrase, without a full stop
+};
+
+/// A file and the time that its probe took.
+struct ProbeTime {
+    QString path;
+    double milliseconds;
+};
+
+/// What fxscan has to tell when a scan is over, or about a catalogue as it is.
+struct ScanSummary {
+    std::vector<CataloguedPlugin> plugins;
+    std::vector<PluginFailure> failures;
+    std::vector<PluginFailure> noPlugins; ///< files that look like plug-ins and are none
+    QStringList problems;                 ///< one sentence each
+    std::vector<ProbeTime> slowest;       ///< the slowest first
+    QStringList removed;                  ///< names of what is gone
+    int added = 0;
+    int updated = 0; ///< were known and probed again
+    int unchanged = 0;
+    bool isScan = false;   ///< false: nothing was scanned, the counts above mean nothing
+    bool finished = false; ///< the scan came to its end
+};
+
+/// What the catalogue says. `reasons` gives those of earlier scans.
+ScanSummary summariseCatalogue(CatalogueView now, const ReasonStore &reasons);
+/// The same after a scan: `before` is the catalogue as the scan found it.
+ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const ScanAccount &account,
+                          const ReasonStore &reasons);
+/// The reasons to remember for later scans.
+ReasonStore reasonsToRemember(const ScanSummary &summary);

@@ -1,0 +1,16 @@
+#pragma once
+
+#include "Workstation/ScanOptions.h"
+#include "Workstation/ScanSummary.h"
+
+/// The summary as text for people.
+QString renderTable(const ScanSummary &summary);
+/// The summary as JSON; docs/fxscan-json.md describes it.
+QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
+/// The plug-ins, one a line, as comma-separated values with a line of titles (RFC 4180).
+QByteArray renderCsv(const ScanSummary &summary);
+
+/// Channels of a plug-in as far as the catalogue tells: inputs in VST 3, outputs in VST 2.
+QString channelsText(const CataloguedPlugin &plugin);
+/// The failure of a plug-in of the summary; null for one that can be used.
+const PluginFailure *failureOf(const ScanSummary &summary, const CataloguedPlugin &plugin);

@@ -1,0 +1,75 @@
+#include "Workstation/Terminal.h"
+
+#include <QVector>
+
+#include <algorithm>
+
+namespace {
+
+struct Range {
+    uint first;
+    uint last;
+};
+
+/// Characters of two columns: the blocks that are wide as a whole in Unicode's EastAsianWidth.txt.
+constexpr Range kWide[] = {{0x1100, 0x115F},   {0x2E80, 0x303E},   {0x3041, 0xA4CF},  {0xAC00, 0xD7A3},
+                           {0xF900, 0xFAFF},   {0xFE30, 0xFE6F},   {0xFF00, 0xFF60},  {0xFFE0, 0xFFE6},
+                           {0x1F300, 0x1F64F}, {0x1F680, 0x1F9FF}, {0x20000, 0x3FFFD}};
+/// What sets the direction of text: Unicode Standard Annex 9, "Directional formatting characters".
+constexpr Range kDirections[] = {{0x200E, 0x200F}, {0x202A, 0x202E}, {0x2066, 0x2069}, {0x061C, 0x061C}};
+
+template <std::size_t Size>
+bool isIn(const Range (&ranges)[Size], uint character)
+{
+    return std::any_of(std::begin(ranges), std::end(ranges), [=](const Range &range) {
+        return character >= range.first && character <= range.last;
+    });
+}
+
+int columnsOf(uint character)
+{
+    const QChar::Category category = QChar::category(character);
+    if (category == QChar::Mark_NonSpacing || category == QChar::Mark_Enclosing)
+        return 0;
+    return isIn(kWide, character) ? 2 : 1;
+}
+
+} // namespace
+
+QString Terminal::harmless(const QString &text)
+{
+    QVector<uint> characters = text.toUcs4();
+    for (uint &character : characters) {
+        const QChar::Category category = QChar::category(character);
+        const bool isControl = category == QChar::Other_Control || category == QChar::Other_Surrogate ||
+                               category == QChar::Separator_Line || category == QChar::Separator_Paragraph;
+        if (isControl || isIn(kDirections, character))
+            character = '?';
+    }
+    return QString::fromUcs4(characters.constData(), characters.size());
+}
+
+int Terminal::width(const QString &text)
+{
+    int columns = 0;
+    for (const uint character : text.toUcs4())
+        columns += columnsOf(character);
+    return columns;
+}
+
+QString Terminal::cell(const QString &text, int columns)
+{
+    const int whole = width(text);
+    if (whole <= columns)
+        return text + QString(columns - whole, QLatin1Char(' '));
+    QVector<uint> kept;
+    int used = 1; // the "…"
+    for (const uint character : text.toUcs4()) {
+        if (used + columnsOf(character) > columns)
+            break;
+        used += columnsOf(character);
+        kept.append(character);
+    }
+    return QString::fromUcs4(kept.constData(), kept.size()) + QChar(0x2026) +
+           QString(std::max(0, columns - used), QLatin1Char(' '));
+}
