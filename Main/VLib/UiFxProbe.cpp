@@ -84,9 +84,11 @@ UiFxProbe::UiFxProbe(const QString &dataFolder, std::function<void(const QString
     m_screenLoss = std::make_unique<ScreenLoss>([status = m_status] { endWithoutScreen(*status); });
     setWindowFlags(Qt::Window | Qt::WindowMinimizeButtonHint | Qt::WindowStaysOnTopHint |
                    Qt::WindowCloseButtonHint);
+#if QT_CONFIG(accessibility) // a toolkit may be built without
     // Has the toolkit start the thread of its accessibility now, which it would start when the window is
     // first shown: while a plug-in is being probed, a new thread is taken for the plug-in's.
     QAccessible::isActive();
+#endif
     m_worker = std::thread([this, scan = std::move(scanRun)] { runScan(scan); });
 }
 
