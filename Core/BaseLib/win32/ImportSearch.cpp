@@ -10,8 +10,6 @@
 
 namespace {
 
-const wchar_t *wide(const QString &text) { return reinterpret_cast<const wchar_t *>(text.utf16()); }
-
 /// Whether Windows resolves the name by other means than a search for a file: by its table of API sets, or,
 /// for the run-time libraries of the compilers of 2005 and 2008, by the library's manifest.
 bool isResolvedElsewhere(const QString &name)
@@ -27,8 +25,8 @@ QString onSearchPath(const QString &name)
 {
     std::vector<wchar_t> path(MAX_PATH);
     DWORD length = 0;
-    while ((length = SearchPathW(nullptr, wide(name), L".dll", static_cast<DWORD>(path.size()), path.data(),
-                                 nullptr)) > path.size())
+    while ((length = SearchPathW(nullptr, name.toStdWString().c_str(), L".dll",
+                                 static_cast<DWORD>(path.size()), path.data(), nullptr)) > path.size())
         path.resize(length);
     return QString::fromWCharArray(path.data(), static_cast<int>(length));
 }
@@ -46,7 +44,7 @@ bool belongsToTheSystem(const QString &path)
 LibrarySearch importSearch(const QString &firstFolder)
 {
     return [firstFolder](const QString &name) -> std::optional<QString> {
-        if (isResolvedElsewhere(name) || GetModuleHandleW(wide(name)))
+        if (isResolvedElsewhere(name) || GetModuleHandleW(name.toStdWString().c_str()))
             return QString();
         const QString beside = firstFolder.isEmpty() ? QString() : QDir(firstFolder).filePath(name);
         if (!beside.isEmpty() && QFileInfo(beside).isFile())

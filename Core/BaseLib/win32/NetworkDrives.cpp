@@ -8,8 +8,6 @@
 
 namespace {
 
-const wchar_t *wide(const QString &text) { return reinterpret_cast<const wchar_t *>(text.utf16()); }
-
 class WindowsDrives : public NetworkDrives {
 public:
     List list() override
@@ -29,14 +27,14 @@ public:
     {
         wchar_t name[MAX_PATH] = {};
         DWORD length = MAX_PATH;
-        if (WNetGetConnectionW(wide(device), name, &length) != NO_ERROR)
+        if (WNetGetConnectionW(device.toStdWString().c_str(), name, &length) != NO_ERROR)
             return std::nullopt;
         return QString::fromWCharArray(name);
     }
 
     bool exists(const QString &path) override
     {
-        return GetFileAttributesW(wide(path)) != INVALID_FILE_ATTRIBUTES;
+        return GetFileAttributesW(path.toStdWString().c_str()) != INVALID_FILE_ATTRIBUTES;
     }
 };
 
