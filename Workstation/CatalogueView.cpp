@@ -3,12 +3,14 @@
 #include "Main/AudioEngineController/Effects/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 
 #include <QFile>
 
 #include <algorithm>
 #include <array>
+#include <set>
 #include <tuple>
 
 namespace {
@@ -56,8 +58,15 @@ void readCatalogue(const PluginFormat &format, const QString &effectsFolder, Cat
                                             "anew: %2")
                                  .arg(path, contents.reason));
     }
+    std::set<QString> crashed;
+    for (const EffectRecord &record : contents.records)
+        if (record.isCrashedFile())
+            crashed.insert(record.path);
+    const auto isOfCrashedFile = [&crashed](const EffectRecord &record) {
+        return crashed.count(record.path) != 0 && !record.isCrashedFile();
+    };
     for (const EffectRecord &record : contents.records) {
-        view.plugins.push_back({&format, record});
+        view.plugins.push_back({&format, record, isOfCrashedFile(record)});
         if (const QString bad = badText(record); !bad.isEmpty())
             view.problems.append(QStringLiteral("%1 is not well-formed XML: %2").arg(path, bad));
     }
@@ -67,8 +76,9 @@ void readCatalogue(const PluginFormat &format, const QString &effectsFolder, Cat
 
 const std::vector<PluginFormat> &pluginFormats()
 {
-    static const std::vector<PluginFormat> formats{{"vst3", "VST 3", vst3CatalogueFormat()},
-                                                   {"vst2", "VST 2", vstCatalogueFormat()}};
+    static const std::vector<PluginFormat> formats{
+        {"vst3", "VST 3", QStringLiteral(".vst3"), vst3CatalogueFormat()},
+        {"vst2", "VST 2", VSTModuleFile::ending(), vstCatalogueFormat()}};
     return formats;
 }
 
@@ -95,6 +105,8 @@ const char *stateText(PluginState state)
 
 PluginState CataloguedPlugin::state() const
 {
+    if (isOfCrashedFile)
+        return PluginState::Disabled;
     if (record.isSwitchedOff())
         return PluginState::SwitchedOff;
     if (record.working)

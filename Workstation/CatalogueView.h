@@ -11,6 +11,7 @@
 struct PluginFormat {
     const char *key;   ///< as in reports and in JSON
     const char *title; ///< for people
+    QString ending;    ///< of the files' names, with its dot
     const CatalogueFormat &catalogue;
 };
 
@@ -35,8 +36,11 @@ struct CataloguedPlugin {
     const PluginFormat *format;
     EffectRecord record;
 
+    bool isOfCrashedFile = false; ///< another record says that the whole file ended the scanner: it is not loaded any
+                          ///< more
+
     PluginState state() const;
-    bool isUsable() const { return record.working; }
+    bool isUsable() const { return record.working && !isOfCrashedFile; }
     /// The categories' names, else what the plug-in says of itself.
     QStringList categories() const;
 };

@@ -126,5 +126,15 @@ QByteArray renderCsv(const ScanSummary &summary)
                          QString::fromLatin1(stateText(plugin.state())),
                          failure ? failure->reason : QString(), plugin.record.id, plugin.record.path});
     }
+    for (const PluginFailure &failure : summary.failures) {
+        const bool isListed =
+            std::any_of(summary.plugins.begin(), summary.plugins.end(), [&](const CataloguedPlugin &plugin) {
+                return failureOf(summary, plugin) == &failure;
+            });
+        if (!isListed)
+            text += csvLine({QString::fromLatin1(failure.format->key), failure.name, QString(), QString(),
+                             QString(), QString::fromLatin1(stateText(failure.state)), failure.reason,
+                             QString(), failure.path});
+    }
     return text;
 }

@@ -13,8 +13,13 @@
 #include "Workstation/Terminal.h"
 #include "Workstation/WorkstationInterface.h"
 
+#include <QDeadlineTimer>
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
+#include <QThread>
+
+#include <memory>
 
 namespace {
 
@@ -38,18 +43,19 @@ void complain(const QString &text)
     Terminal::printError(QStringLiteral("fxscan: %1\n").arg(Terminal::harmless(text)));
 }
 
-/// Puts the variable into the environment, unless the user has set it, and empties the file it names.
+/// Puts the variable into the environment with a file of our own, begun anew, unless the user has set it:
+/// what that names is appended to.
 void useFile(const char *variable, const QString &file)
 {
-    if (qEnvironmentVariableIsEmpty(variable))
-        qputenv(variable, QFile::encodeName(file));
-    QFile::remove(qEnvironmentVariable(variable));
+    if (!qEnvironmentVariableIsEmpty(variable))
+        return;
+    qputenv(variable, QFile::encodeName(file));
+    QFile::remove(file);
 }
 
 void prepareEnvironment(const ScanOptions &options, const DataFiles &files)
 {
-    if (qEnvironmentVariableIsEmpty("FXPROBE_LOG")) // a log of the user's own goes on
-        useFile("FXPROBE_LOG", files.log);
+    useFile("FXPROBE_LOG", files.log);
     useFile("FXPROBE_REPORT", files.report);
     configureLogFromEnvironment();
     if (!options.showWindow)
@@ -73,23 +79,25 @@ QStringList foldersToScan(const ScanOptions &options, const DataFiles &files)
     return settled.folders;
 }
 
-void print(const ScanOptions &options, const ScanSummary &summary, const QStringList &folders)
+/// False when the result could not be written.
+bool print(const ScanOptions &options, const ScanSummary &summary, const QStringList &folders)
 {
-    switch (options.format) {
-    case OutputFormat::Table:
-        Terminal::print(renderTable(summary));
-        return;
-    case OutputFormat::Json:
-        Terminal::print(QString::fromUtf8(renderJson(summary, options.dataFolder, folders)));
-        return;
-    case OutputFormat::Csv:
-        Terminal::print(QString::fromUtf8(renderCsv(summary)));
-        return;
-    }
+    if (options.format == OutputFormat::Table)
+        return Terminal::print(renderTable(summary));
+    if (options.format == OutputFormat::Json)
+        return Terminal::printData(QString::fromUtf8(renderJson(summary, options.dataFolder, folders)));
+    for (const QString &problem : summary.problems)
+        complain(problem);
+    return Terminal::printData(QString::fromUtf8(renderCsv(summary)));
 }
 
-int exitCode(const ScanOptions &options, const ScanSummary &summary)
+/// Prints the result; the exit code that goes with it.
+int conclude(const ScanOptions &options, const ScanSummary &summary, const QStringList &folders)
 {
+    if (!print(options, summary, folders)) {
+        complain(QStringLiteral("the result could not be printed"));
+        return ScanExit::kNotFinished;
+    }
     if (summary.isScan && !summary.finished)
         return ScanExit::kNotFinished;
     return options.strict && !summary.failures.empty() ? ScanExit::kFailures : ScanExit::kDone;
@@ -97,21 +105,23 @@ int exitCode(const ScanOptions &options, const ScanSummary &summary)
 
 int listOnly(const ScanOptions &options, const DataFiles &files)
 {
-    const ScanSummary summary = summariseCatalogue(readCatalogues(files.effects), ReasonStore(files.reasons));
-    print(options, summary, {});
-    return exitCode(options, summary);
+    return conclude(options, summariseCatalogue(readCatalogues(files.effects), ReasonStore(files.reasons)),
+                    {});
 }
 
-/// Gives plug-ins another chance; false when the command makes no sense.
-bool retry(const ScanOptions &options, PluginHost &registry, const DataFiles &files)
+/// Gives plug-ins another chance; the exit code when that cannot be done.
+int retry(const ScanOptions &options, const QStringList &folders, PluginHost &registry,
+          const DataFiles &files)
 {
     registry.ReadCatalogue(); // absorbs the markers: the newest crash may be the one that is meant
-    const RetryOutcome outcome = retryPlugins(files.effects, options.retry);
+    const RetryOutcome outcome = retryPlugins(files.effects, options.retry, folders);
     for (const QString &name : outcome.unknown)
         complain(QStringLiteral("no plug-in '%1' is disabled or failed").arg(name));
     if (!outcome.written)
         complain(QStringLiteral("cannot write ") + outcome.written.reason);
-    return outcome.unknown.isEmpty() && outcome.written;
+    return !outcome.unknown.isEmpty() ? ScanExit::kUsage
+           : !outcome.written         ? ScanExit::kNotFinished
+                                      : ScanExit::kDone;
 }
 
 int scan(const ScanOptions &options, const DataFiles &files, const QStringList &folders)
@@ -122,8 +132,9 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
     registry.initialise(options.dataFolder, QString(), PluginHost::kDefaultSampleRate,
                         PluginHost::kDefaultBlockSize);
     const CatalogueView before = readCatalogues(files.effects);
-    if (options.isRetry() && !retry(options, registry, files))
-        return ScanExit::kUsage;
+    if (options.isRetry())
+        if (const int failed = retry(options, folders, registry, files); failed != ScanExit::kDone)
+            return failed;
     if (options.inProcess)
         ProbeReport::instance().openFromEnvironment();
     ScanSession session(options, registry, qEnvironmentVariable("FXPROBE_REPORT"));
@@ -133,10 +144,23 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
     summary.finished = isFinished;
     if (const FileResult kept = reasonsToRemember(summary).write(files.reasons); !kept)
         DebugLog(L"Cannot write %ls: %ls", files.reasons, kept.reason);
-    print(options, summary, folders);
     if (!isFinished)
         complain(session.reason());
-    return exitCode(options, summary);
+    return conclude(options, summary, folders);
+}
+
+/// A scanner whose fxscan was killed lives on for some seconds; its markers must not be taken for crashes.
+/// False when one goes on.
+bool waitForScanner(const QString &effectsFolder)
+{
+    constexpr int kPatience = 5000; // ms; a scanner's own patience with a plug-in is two seconds
+    const QDeadlineTimer deadline(kPatience);
+    while (ScanLock::isScannerAtWork(effectsFolder)) {
+        if (deadline.hasExpired())
+            return false;
+        QThread::msleep(50);
+    }
+    return true;
 }
 
 } // namespace
@@ -162,12 +186,19 @@ int runFxScan(ScanOptions options)
                      .arg(PluginHost::usualScannerPath()));
         options.inProcess = true;
     }
-    const ScanLock lock(files.effects,
-                        options.inProcess ? ScanLock::Role::Scanner : ScanLock::Role::Workstation);
-    if (lock.isHeldByOther()) {
-        complain(QStringLiteral("another scan is at work on %1").arg(files.effects));
+    const ScanLock lock(files.effects, ScanLock::Role::Workstation);
+    if (lock.isHeldByOther() || !waitForScanner(files.effects)) {
+        complain(QStringLiteral("another scan is at work on %1 (%2)")
+                     .arg(files.effects, ScanLock::holder(files.effects)));
         return ScanExit::kNotFinished;
     }
+    std::unique_ptr<ScanLock> ownScanner;
+    if (options.inProcess)
+        ownScanner = std::make_unique<ScanLock>(files.effects);
     prepareEnvironment(options, files);
+    if (const QFileInfo report(qEnvironmentVariable("FXPROBE_REPORT")); report.exists() && !report.isFile()) {
+        complain(QStringLiteral("the report %1 is no file").arg(report.filePath()));
+        return ScanExit::kUsage;
+    }
     return scan(options, files, folders);
 }

@@ -1,5 +1,6 @@
 #include "Workstation/Retry.h"
 
+#include "Core/BaseLib/FileFinder.h"
 #include "Main/AudioEngineController/Effects/CatalogueFile.h"
 #include "Workstation/CatalogueView.h"
 
@@ -77,12 +78,44 @@ FileResult writeRecords(const CatalogueFormat &format, const QString &path,
     return replaceFile(path, renderCatalogue(format, pointers), Durability::Synced);
 }
 
+/// A catalogue with what is to be written of it.
+struct Reopened {
+    const PluginFormat *format;
+    QString path;
+    std::vector<EffectRecord> records;
+    int count;
+};
+
+/// Names of files that lie in the folders and have no record.
+QStringList withoutUnrecorded(QStringList names, const QStringList &folders,
+                              const std::vector<Reopened> &catalogues)
+{
+    std::set<QString> recorded;
+    for (const Reopened &catalogue : catalogues)
+        for (const EffectRecord &record : catalogue.records)
+            recorded.insert(record.path);
+    const auto dropNamesOf = [&](const QString &path) {
+        EffectRecord file;
+        file.path = path;
+        NameFromPath(file);
+        const auto isThisFile = [&](const QString &name) { return isNamed(file, name); };
+        if (recorded.count(path) == 0)
+            names.erase(std::remove_if(names.begin(), names.end(), isThisFile), names.end());
+    };
+    for (const PluginFormat &format : pluginFormats())
+        for (const QString &folder : names.isEmpty() ? QStringList() : folders)
+            for (const QString &path : FileFinder(format.ending).find(folder))
+                dropNamesOf(path);
+    return names;
+}
+
 } // namespace
 
-RetryOutcome retryPlugins(const QString &effectsFolder, const QStringList &names)
+RetryOutcome retryPlugins(const QString &effectsFolder, const QStringList &names, const QStringList &folders)
 {
     RetryOutcome outcome;
     Chooser chooser(names);
+    std::vector<Reopened> catalogues;
     for (const PluginFormat &format : pluginFormats()) {
         const QString path = effectsFolder + QLatin1String(format.catalogue.fileName);
         if (!QFile::exists(path))
@@ -91,12 +124,19 @@ RetryOutcome retryPlugins(const QString &effectsFolder, const QStringList &names
         if (!contents) // nothing in it would be kept from the next scan, but for what crashed
             contents.records = salvageRecords(format.catalogue, path);
         const int count = reopen(contents.records, chooser);
-        outcome.plugins += count;
-        if (count == 0)
-            continue;
-        if (const FileResult written = writeRecords(format.catalogue, path, contents.records); !written)
-            outcome.written.reason = QStringLiteral("%1: %2").arg(path, written.reason);
+        catalogues.push_back({&format, path, std::move(contents.records), count});
     }
-    outcome.unknown = chooser.unknown();
+    outcome.unknown = withoutUnrecorded(chooser.unknown(), folders, catalogues);
+    if (!outcome.unknown.isEmpty())
+        return outcome;
+    for (const Reopened &catalogue : catalogues) {
+        outcome.plugins += catalogue.count;
+        if (catalogue.count == 0)
+            continue;
+        if (const FileResult written =
+                writeRecords(catalogue.format->catalogue, catalogue.path, catalogue.records);
+            !written)
+            outcome.written.reason = QStringLiteral("%1: %2").arg(catalogue.path, written.reason);
+    }
     return outcome;
 }

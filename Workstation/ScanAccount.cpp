@@ -1,6 +1,7 @@
 #include "Workstation/ScanAccount.h"
 
 #include <QFile>
+#include <QFileInfo>
 #include <QJsonDocument>
 #include <QJsonObject>
 
@@ -12,12 +13,6 @@ PluginKey keyOf(const QJsonObject &line)
 {
     return {line.value(QLatin1String("format")).toString(), line.value(QLatin1String("path")).toString(),
             static_cast<quint32>(line.value(QLatin1String("subId")).toDouble())};
-}
-
-PluginKey keyOf(const ScanCulprit &culprit)
-{
-    return {culprit.isVst3 ? QStringLiteral("vst3") : QStringLiteral("vst2"), culprit.plugin.path,
-            culprit.plugin.subId};
 }
 
 /// What a plug-in was doing in a stage of the report.
@@ -39,7 +34,7 @@ QString blame(const ScannerRunEnd &end, const QString &stage)
     case ScannerRunEnd::How::Crashed:
         return QStringLiteral("it crashed the scanner%1: %2").arg(when, end.text);
     case ScannerRunEnd::How::TimeLimit:
-        return QStringLiteral("it gave no answer for %1 seconds%2").arg(end.code).arg(when);
+        return QStringLiteral("it gave no answer for %1 s%2").arg(end.code).arg(when);
     default:
         return QStringLiteral("it ended the scanner with exit code %1%2").arg(end.code).arg(when);
     }
@@ -47,8 +42,15 @@ QString blame(const ScannerRunEnd &end, const QString &stage)
 
 } // namespace
 
+PluginKey pluginKey(const ScanCulprit &culprit)
+{
+    return {culprit.isVst3 ? QStringLiteral("vst3") : QStringLiteral("vst2"), culprit.plugin.path,
+            culprit.plugin.subId};
+}
+
 ScanAccount::ScanAccount(const QString &reportFile)
     : m_file(reportFile)
+    , m_read(QFileInfo(reportFile).size()) // what others reported before is none of this scan's
 {}
 
 void ScanAccount::update()
@@ -74,9 +76,10 @@ void ScanAccount::takeLine(const QByteArray &text)
     m_finished = event == QLatin1String("finished");
     m_busy = event == QLatin1String("busy");
     if (event == QLatin1String("start")) {
+        m_done += static_cast<int>(
+            std::count_if(m_open.begin(), m_open.end(), [](const PluginKey &key) { return key.subId == 0; }));
         m_open.clear();
-        m_done = 0;
-        m_planned = 0;
+        m_planned = m_done; // what is left of the plan is planned anew
     } else if (event == QLatin1String("plan")) {
         m_planned += line.value(QLatin1String("probes")).toInt();
     } else if (event == QLatin1String("begin")) {
@@ -87,9 +90,11 @@ void ScanAccount::takeLine(const QByteArray &text)
     } else if (event == QLatin1String("end") || event == QLatin1String("skipped")) {
         end(keyOf(line), line);
     } else if (event == QLatin1String("unwritten")) {
-        m_problems.append(QStringLiteral("%1 could not be written: %2")
-                              .arg(line.value(QLatin1String("path")).toString(),
-                                   line.value(QLatin1String("reason")).toString()));
+        const QString problem = QStringLiteral("%1 could not be written: %2")
+                                    .arg(line.value(QLatin1String("path")).toString(),
+                                         line.value(QLatin1String("reason")).toString());
+        if (!m_problems.contains(problem))
+            m_problems.append(problem);
     }
 }
 
@@ -121,7 +126,7 @@ void ScanAccount::scannerEnded(const ScannerRunEnd &end)
 {
     update();
     for (const ScanCulprit &culprit : end.culprits) {
-        ProbeAccount &account = m_probes[keyOf(culprit)];
+        ProbeAccount &account = m_probes[pluginKey(culprit)];
         account.reason = blame(end, account.stage);
         account.records = 0;
     }
@@ -136,7 +141,7 @@ std::vector<PluginKey> ScanAccount::takeBegun()
 
 QString ScanAccount::reasonOf(const ScanCulprit &culprit) const
 {
-    const ProbeAccount *account = find(keyOf(culprit));
+    const ProbeAccount *account = find(pluginKey(culprit));
     return account ? account->reason : QString();
 }
 

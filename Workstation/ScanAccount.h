@@ -25,6 +25,8 @@ struct PluginKey {
     bool operator==(const PluginKey &other) const { return !(*this < other) && !(other < *this); }
 };
 
+PluginKey pluginKey(const ScanCulprit &culprit);
+
 /// What a scan said of one probe.
 struct ProbeAccount {
     QString subName;
@@ -39,6 +41,7 @@ struct ProbeAccount {
 /// Follows the report that scanners write while they work.
 class ScanAccount {
 public:
+    /// Follows the file from its present end on.
     explicit ScanAccount(const QString &reportFile);
 
     /// Reads what was written since the last call.
@@ -50,7 +53,7 @@ public:
     const PluginKey *current() const { return m_open.empty() ? nullptr : &m_open.back(); }
     /// The probes that began since the last call, in order.
     std::vector<PluginKey> takeBegun();
-    /// Files dealt with in this run, and files planned, of all formats planned so far.
+    /// Files dealt with, and files planned, of all formats planned so far.
     int done() const { return m_done; }
     int planned() const { return m_planned; }
 
@@ -75,7 +78,7 @@ private:
     void end(const PluginKey &key, const QJsonObject &line);
 
     QString m_file;
-    qint64 m_read = 0; ///< bytes of the file
+    qint64 m_read;     ///< bytes of the file
     QByteArray m_rest; ///< of a line that is not complete yet
     std::vector<PluginKey> m_open;
     std::vector<PluginKey> m_begun;

@@ -68,10 +68,12 @@ QString readValues(const QCommandLineParser &parser, ScanOptions &options)
     return QString();
 }
 
-QString checkTogether(const ScanOptions &options)
+QString checkTogether(const ScanOptions &options, bool hasTimeout)
 {
     if (options.listOnly && (options.isRetry() || options.inProcess || !options.folders.isEmpty()))
         return QStringLiteral("--list makes no scan: it takes no folders, --retry or --in-process");
+    if (options.inProcess && hasTimeout)
+        return QStringLiteral("--timeout has no effect with --in-process: nobody could end a plug-in");
     if (options.inProcess && options.showWindow)
         return QStringLiteral("--in-process has no window to show");
     return QString();
@@ -116,7 +118,7 @@ CommandLine readCommandLine(const QStringList &arguments)
         options.dataFolder = userDataFolder();
     options.dataFolder = QDir::cleanPath(QDir(options.dataFolder).absolutePath());
     if (wrong.isEmpty())
-        wrong = checkTogether(options);
+        wrong = checkTogether(options, parser.isSet(option("timeout")));
     line.isError = !wrong.isEmpty();
     if (line.isError)
         line.text = QStringLiteral("fxscan: %1\nTry 'fxscan --help'.\n").arg(wrong);

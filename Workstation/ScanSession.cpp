@@ -1,17 +1,31 @@
 #include "Workstation/ScanSession.h"
 
+#include "Core/BaseLib/ProcessSetup.h"
 #include "Core/BaseLib/TerminationRequest.h"
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
-
-#include <QFile>
+#include "Workstation/Terminal.h"
 
 #include <atomic>
+#include <cstdlib>
 #include <thread>
 
 namespace {
+
 constexpr std::chrono::milliseconds kLook(50);
+constexpr qint64 kPatience = 2000; ///< ms that a plug-in in this process gets after a cancel
+
+std::atomic<bool> s_isScanningHere{false};
+
+/// A plug-in in this process may call exit(): that is no successful scan.
+void leaveUnfinished()
+{
+    if (s_isScanningHere)
+        leaveProcess(ScanExit::kNotFinished);
 }
+
+} // namespace
 
 ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report)
     : m_options(options)
@@ -25,9 +39,10 @@ ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const
 
 bool ScanSession::run()
 {
-    // A launch is over after so many runs; where each of them found another culprit, the next launch goes on.
+    // A launch is over after so many runs. Where it got on, the next one goes on; a plug-in that ends the
+    // scanner although it was blamed before would do so for ever.
     while (!scanOnce())
-        if (m_cancelled || isStuck())
+        if (m_cancelled || !m_hasNewCulprit)
             return false;
     return true;
 }
@@ -36,7 +51,7 @@ bool ScanSession::run()
 bool ScanSession::scanOnce()
 {
     m_ends = 0;
-    m_culprits = 0;
+    m_hasNewCulprit = false;
     m_reason.clear();
     if (m_options.inProcess) {
         scanHere();
@@ -47,67 +62,89 @@ bool ScanSession::scanOnce()
     m_account.update();
     if (m_account.isFinished() && !m_cancelled)
         return true;
-    if (m_cancelled)
+    if (m_cancelled && m_reason.isEmpty())
         m_reason = QStringLiteral("the scan was cancelled; what was found until then is kept");
     else if (m_account.isBusy())
         m_reason = QStringLiteral("another scanner is at work on the same folder");
     else if (m_reason.isEmpty())
-        m_reason = QStringLiteral("the scanner did not write its last catalogue");
+        m_reason = m_account.problems().value(
+            0, QStringLiteral("the scanner did not write its last catalogue; see its log"));
     return false;
 }
 
-bool ScanSession::isStuck() const { return m_culprits < static_cast<std::size_t>(ScannerLauncher::kMaxRuns); }
-
 void ScanSession::scanHere()
 {
+    Terminal::keepOutputForResult();
+    s_isScanningHere = true;
+    std::atexit(leaveUnfinished);
     std::atomic<bool> isDone{false};
     std::thread worker([&] {
         m_registry.Scan(true, true);
         ProbeReport::instance().finish();
         isDone = true;
     });
-    while (!isDone)
-        watchForCancel();
+    while (!isDone) {
+        look();
+        endOverdueProbe();
+    }
     worker.join();
+    s_isScanningHere = false;
+}
+
+/// Nobody else can end a plug-in that does not return.
+void ScanSession::endOverdueProbe() const
+{
+    if (m_cancelled && m_sinceCancel.hasExpired(kPatience))
+        ActiveMarkers::abandon([] { leaveProcess(ScanExit::kNotFinished); });
 }
 
 void ScanSession::waitForLauncher()
 {
     while (m_registry.isLauncherRunning()) {
-        watchForCancel();
+        look();
         takeEnds();
     }
     takeEnds();
 }
 
 /// Waits a moment, looks at the report, and passes on what asks us to end.
-void ScanSession::watchForCancel()
+void ScanSession::look()
 {
     if (TerminationSignal::wait(kLook)) {
-        if (!m_cancelled)
-            m_progress.say(QStringLiteral("Cancelling"));
-        m_cancelled = true;
-        m_registry.cancelScan();
+        m_progress.say(QStringLiteral("Cancelling"));
+        cancel();
     }
     m_account.update();
     m_progress.show(m_account);
 }
 
+void ScanSession::cancel()
+{
+    if (!m_cancelled)
+        m_sinceCancel.start();
+    m_cancelled = true;
+    m_registry.cancelScan();
+}
+
 void ScanSession::takeEnds()
 {
     const std::vector<ScannerRunEnd> ends = m_registry.scannerEnds();
-    for (; m_ends < ends.size(); ++m_ends) {
-        const ScannerRunEnd &end = ends[m_ends];
-        m_account.scannerEnded(end);
-        m_culprits += end.culprits.empty() ? 0 : 1;
-        for (const ScanCulprit &culprit : end.culprits)
-            m_progress.say(QStringLiteral("%1: %2").arg(culprit.plugin.path, m_account.reasonOf(culprit)));
-        if (end.how == ScannerRunEnd::How::NotStarted) {
-            m_registry.cancelScan(); // nothing else would end the launcher
-            m_reason = QStringLiteral("the scanner %1 could not be started: %2")
-                           .arg(m_registry.scannerPath(), end.text);
-        } else if (end.culprits.empty() && (end.how != ScannerRunEnd::How::Exited || end.code != 0)) {
-            m_reason = QStringLiteral("the scanner did not finish: ") + end.description();
-        }
+    for (; m_ends < ends.size(); ++m_ends)
+        takeEnd(ends[m_ends]);
+}
+
+void ScanSession::takeEnd(const ScannerRunEnd &end)
+{
+    m_account.scannerEnded(end);
+    for (const ScanCulprit &culprit : end.culprits) {
+        m_hasNewCulprit |= m_blamed.insert(pluginKey(culprit)).second;
+        m_progress.say(QStringLiteral("%1: %2").arg(culprit.plugin.path, m_account.reasonOf(culprit)));
+    }
+    if (end.how == ScannerRunEnd::How::NotStarted) {
+        m_reason =
+            QStringLiteral("the scanner %1 could not be started: %2").arg(m_registry.scannerPath(), end.text);
+        cancel(); // nothing else would end the launcher
+    } else if (end.culprits.empty() && (end.how != ScannerRunEnd::How::Exited || end.code != 0)) {
+        m_reason = QStringLiteral("the scanner did not finish: ") + end.description();
     }
 }

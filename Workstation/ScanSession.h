@@ -4,6 +4,10 @@
 #include "Workstation/ScanAccount.h"
 #include "Workstation/ScanOptions.h"
 
+#include <QElapsedTimer>
+
+#include <set>
+
 class PluginHost;
 
 /// One scan as a user means it: scans through the registry until everything is probed, shows how it gets on,
@@ -23,15 +27,19 @@ private:
     void scanHere();
     void waitForLauncher();
     void takeEnds();
-    void watchForCancel();
-    bool isStuck() const;
+    void takeEnd(const ScannerRunEnd &end);
+    void cancel();
+    void look();
+    void endOverdueProbe() const;
 
     const ScanOptions &m_options;
     PluginHost &m_registry;
     ScanAccount m_account;
     Progress m_progress;
-    std::size_t m_ends = 0;     ///< of scanners, in the present launch
-    std::size_t m_culprits = 0; ///< blamed in the present launch
+    std::size_t m_ends = 0;       ///< of scanners, in the present launch
+    std::set<PluginKey> m_blamed; ///< in the whole session
+    bool m_hasNewCulprit = false; ///< in the present launch
     bool m_cancelled = false;
+    QElapsedTimer m_sinceCancel;
     QString m_reason;
 };

@@ -27,6 +27,8 @@ QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, con
     const ProbeAccount *probe = account ? account->find(key) : nullptr;
     if (probe && !probe->reason.isEmpty())
         return probe->reason;
+    if (plugin.isOfCrashedFile)
+        return QStringLiteral("its file ended the scanner");
     if (const QString known = reasons.find(key, plugin.record.fileTime); !known.isEmpty())
         return known;
     return plugin.state() == PluginState::Disabled ? QStringLiteral("it ended the scanner in an earlier scan")
@@ -72,20 +74,28 @@ void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount 
 {
     std::map<PluginIdentity, QString> gone;
     std::set<FileIdentity> failedBefore; // what stood for the file says nothing of what is in it
+    std::set<FileIdentity> filesBefore;
     for (const CataloguedPlugin &plugin : before.plugins) {
+        filesBefore.insert(fileOf(plugin));
         if (plugin.isUsable() || plugin.record.subId != 0)
             gone.emplace(identityOf(plugin), plugin.record.name);
         else
             failedBefore.insert(fileOf(plugin));
     }
+    std::set<FileIdentity> failedNow;
     for (const CataloguedPlugin &plugin : summary.plugins) {
         const FileIdentity file = fileOf(plugin);
-        const bool wasKnown = gone.erase(identityOf(plugin)) + failedBefore.count(file) != 0;
+        const bool standsForFile = !plugin.isUsable() && plugin.record.subId == 0;
+        if (standsForFile)
+            failedNow.insert(file);
+        const bool wasKnown = gone.erase(identityOf(plugin)) + failedBefore.count(file) != 0 ||
+                              (standsForFile && filesBefore.count(file) != 0);
         const bool wasProbed = account.wasProbed(file.first, file.second);
         ++(!wasKnown ? summary.added : wasProbed ? summary.updated : summary.unchanged);
     }
-    for (const auto &entry : gone)
-        summary.removed.append(entry.second);
+    for (const auto &[identity, name] : gone)
+        if (failedNow.count({std::get<0>(identity), std::get<1>(identity)}) == 0)
+            summary.removed.append(name);
 }
 
 void addSlowest(ScanSummary &summary, const ScanAccount &account)

@@ -1,5 +1,6 @@
 #include "Workstation/Terminal.h"
 
+#include <QStringList>
 #include <QVector>
 
 #include <algorithm>
@@ -72,4 +73,14 @@ QString Terminal::cell(const QString &text, int columns)
     }
     return QString::fromUcs4(kept.constData(), kept.size()) + QChar(0x2026) +
            QString(std::max(0, columns - used), QLatin1Char(' '));
+}
+
+bool Terminal::printData(const QString &text)
+{
+    if (!outputIsTerminal())
+        return print(text);
+    QStringList lines = text.split(QLatin1Char('\n'));
+    for (QString &line : lines)
+        line = harmless(line.remove(QLatin1Char('\r')));
+    return print(lines.join(QLatin1Char('\n')));
 }

@@ -11,8 +11,9 @@
 
 namespace {
 
-// A text of nothing but blanks is a value too: plug-ins may be called " ".
-constexpr unsigned kParseOptions = pugi::parse_default | pugi::parse_ws_pcdata_single;
+// A text of nothing but blanks is a value too: plug-ins may be called " ". Line ends within a text stay what
+// they are: file names may hold them.
+constexpr unsigned kParseOptions = (pugi::parse_default | pugi::parse_ws_pcdata_single) & ~pugi::parse_eol;
 
 } // namespace
 

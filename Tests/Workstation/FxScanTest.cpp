@@ -3,7 +3,9 @@
 #include "Tests/Support/VST2Fixture.h"
 #include "Tests/Support/VST3Fixture.h"
 
+#include <QDateTime>
 #include <QFile>
+#include <QFileInfo>
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <QJsonObject>
@@ -95,7 +97,7 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
          "while it was being closed and unloaded"},
         {"Exit3", true, "fault module-entry _exit\n", "disabled", "exit code 0 while it was starting"},
         {"Hang2", false, "fault get-vendor-string hang\n", "disabled",
-         "no answer for 2 seconds while it was asked for its data"},
+         "no answer for 2 s while it was asked for its data"},
         {"Null2", false, "answer entry null\n", "failed", "its entry point gives no plug-in"},
         {"Throw2", false, "fault entry throw-std\n", "failed", "thrown by the fixture"},
         {"Refuse3", true, "answer initialize false\n", "failed", "could not be initialised (result 0x"},
@@ -121,6 +123,10 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
     }
     EXPECT_TRUE(reason(first, QStringLiteral("Text3")).startsWith(QLatin1String("it could not be loaded: ")));
     EXPECT_TRUE(first[QStringLiteral("scan")][QStringLiteral("finished")].toBool());
+
+    const QByteArray csv =
+        run({QStringLiteral("--list"), QStringLiteral("--format"), QStringLiteral("csv")}).standardOutput;
+    EXPECT_EQ(csv.count("\r\n"), 1 + static_cast<int>(states(first).size())) << csv.constData();
 
     // The same again: nothing to do but what has no record, and the reasons are still known.
     QFile::remove(m_folder.path(QStringLiteral("trace")));
@@ -158,13 +164,38 @@ TEST_F(FxScan, ARetryBringsOneBackWithItsMarks)
                                           {QStringLiteral("One"), QStringLiteral("ok")},
                                           {QStringLiteral("Two"), QStringLiteral("ok")}}));
     EXPECT_EQ(m_folder.catalogue().count("<Favourite>1<"), 2);
-    EXPECT_EQ(run({QStringLiteral("--retry"), QStringLiteral("One")}).exitCode, 2) << "it works";
+    const QByteArray before = m_folder.catalogue();
+    EXPECT_EQ(run({QStringLiteral("--retry"), QStringLiteral("Other"), QStringLiteral("--retry"),
+                   QStringLiteral("One")})
+                  .exitCode,
+              2)
+        << "One works";
+    EXPECT_EQ(m_folder.catalogue(), before) << "nothing is changed then";
     addVst3("Other", "");
     EXPECT_EQ(states(json(run({QStringLiteral("--format"), QStringLiteral("json"),
                                QStringLiteral("--retry-failed")})))
                   .at(QStringLiteral("Other")),
               QStringLiteral("ok"))
         << "in the folders of the last scan";
+}
+
+TEST_F(FxScan, WhatFailsAfterAnUpdateIsNeitherNewNorGone)
+{
+    const QString path = addVST3File(m_folder.plugins(), QStringLiteral("Pair"), "class A\nclass B\n");
+    addVst3("Gone", "");
+    const QString gone = m_folder.path(QStringLiteral("Plugins/Gone.vst3"));
+    EXPECT_EQ(number(json(scan()), "new"), 3);
+    addVST3File(m_folder.plugins(), QStringLiteral("Pair"), "class A\nclass B\nfault initialize _exit\n");
+    m_folder.setModified(path, QDateTime(QDate(2030, 1, 1), QTime()));
+    QFile::remove(gone);
+    const QJsonObject result = json(scan());
+    EXPECT_EQ(number(result, "new"), 0);
+    EXPECT_EQ(number(result, "updated"), 2);
+    EXPECT_EQ(result[QStringLiteral("scan")][QStringLiteral("removed")].toArray(),
+              QJsonArray({QStringLiteral("Gone")}));
+    EXPECT_EQ(states(result), (std::map<QString, QString>{{QStringLiteral("A"), QStringLiteral("disabled")},
+                                                          {QStringLiteral("B"), QStringLiteral("disabled")}}))
+        << "no class of the file is loaded any more";
 }
 
 TEST_F(FxScan, MoreKillersThanOneLaunchHasRuns)
@@ -177,6 +208,40 @@ TEST_F(FxScan, MoreKillersThanOneLaunchHasRuns)
     EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
     EXPECT_EQ(states(json(outcome)).at(QStringLiteral("Last")), QStringLiteral("ok"));
     EXPECT_TRUE(m_folder.markers().isEmpty());
+}
+
+TEST_F(FxScan, KillersWhosePathsLookLikeMarkupAreDisabledAsWell)
+{
+    for (const char *name : {"Bad\r", "sub<br/Bad</Path>"}) // the latter in a folder of its own
+        addVST3File(m_folder.plugins(), QLatin1String(name), "class X\nfault initialize _exit\n");
+    const ScannerOutcome outcome = scan();
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
+    EXPECT_EQ(json(outcome)[QStringLiteral("failures")].toArray().size(), 2);
+}
+
+TEST_F(FxScan, ALiveScannersMarkerBlamesNobody)
+{
+    addVst3("Slow", "fault initialize hang\n");
+    m_folder.writeScanList();
+    ScannerRun other(QFileInfo(QStringLiteral(FXPROBE_FXSCAN)).path() + QStringLiteral("/FxProbe"), m_folder);
+    ASSERT_TRUE(other.start());
+    ASSERT_TRUE(other.waitUntil([this] { return !m_folder.markers().isEmpty(); }));
+    const ScannerOutcome outcome = scan({QStringLiteral("--retry-failed")});
+    EXPECT_EQ(outcome.exitCode, 3);
+    EXPECT_TRUE(outcome.standardError.contains("another scan is at work"))
+        << outcome.standardError.constData();
+    EXPECT_EQ(m_folder.markers(), QStringList(QStringLiteral("Slow.scan3")));
+    EXPECT_FALSE(m_folder.catalogue().contains("Slow"));
+}
+
+TEST_F(FxScan, TheLimitAndTheResultHoldWhateverAPluginPrints)
+{
+    addVst3("Noise", "effect initialize print 200000\nfault initialize hang\n");
+    const QJsonObject result = json(scan({QStringLiteral("--timeout"), QStringLiteral("1")}));
+    EXPECT_EQ(states(result).at(QStringLiteral("Noise")), QStringLiteral("disabled"));
+    addVst3("Chatty", "effect initialize print 1\n");
+    EXPECT_EQ(states(json(scan({QStringLiteral("--in-process")}))).at(QStringLiteral("Chatty")),
+              QStringLiteral("ok"));
 }
 
 TEST_F(FxScan, TerminationEndsItCleanly)

@@ -39,7 +39,7 @@ TEST(Output, NothingInATextSteersTheTerminal)
 
 TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)
 {
-    CataloguedPlugin plugin{&pluginFormats().front(), {}};
+    CataloguedPlugin plugin{&pluginFormats().front(), {}, false};
     plugin.record.name = QStringLiteral("A \"B\", C");
     plugin.record.vendor = QStringLiteral("two\nlines");
     plugin.record.inputs = 2;

@@ -2,30 +2,54 @@
 
 #include <cstdio>
 
+#include <io.h>
+
 #include <qt_windows.h>
 
 namespace {
 
-/// A console takes UTF-16 as it is, whatever its code page; a pipe or a file gets UTF-8.
-void write(DWORD which, std::FILE *stream, const QString &text)
+/// Where results go.
+std::FILE *s_result = stdout;
+
+HANDLE handleOf(std::FILE *stream) { return reinterpret_cast<HANDLE>(_get_osfhandle(_fileno(stream))); }
+
+bool isConsole(std::FILE *stream)
 {
-    HANDLE handle = GetStdHandle(which);
     DWORD mode = 0;
-    if (GetConsoleMode(handle, &mode)) {
+    return GetConsoleMode(handleOf(stream), &mode) != 0;
+}
+
+/// A console takes UTF-16 as it is, whatever its code page; a pipe or a file gets UTF-8.
+bool write(std::FILE *stream, const QString &text)
+{
+    if (isConsole(stream)) {
         DWORD written = 0;
-        WriteConsoleW(handle, text.utf16(), static_cast<DWORD>(text.size()), &written, nullptr);
-        return;
+        return WriteConsoleW(handleOf(stream), text.utf16(), static_cast<DWORD>(text.size()), &written,
+                             nullptr) != 0;
     }
     const QByteArray bytes = text.toUtf8();
-    std::fwrite(bytes.constData(), 1, static_cast<std::size_t>(bytes.size()), stream);
-    std::fflush(stream);
+    const auto size = static_cast<std::size_t>(bytes.size());
+    return std::fwrite(bytes.constData(), 1, size, stream) == size && std::fflush(stream) == 0;
 }
 
 } // namespace
 
-void Terminal::print(const QString &text) { write(STD_OUTPUT_HANDLE, stdout, text); }
+bool Terminal::print(const QString &text) { return write(s_result, text); }
 
-void Terminal::printError(const QString &text) { write(STD_ERROR_HANDLE, stderr, text); }
+bool Terminal::printError(const QString &text) { return write(stderr, text); }
+
+bool Terminal::outputIsTerminal() { return isConsole(s_result); }
+
+void Terminal::keepOutputForResult()
+{
+    const int copy = _dup(_fileno(stdout));
+    std::FILE *result = copy < 0 ? nullptr : _fdopen(copy, "w");
+    if (!result)
+        return;
+    s_result = result;
+    _dup2(_fileno(stderr), _fileno(stdout));
+    SetStdHandle(STD_OUTPUT_HANDLE, GetStdHandle(STD_ERROR_HANDLE));
+}
 
 bool Terminal::errorIsTerminal()
 {

@@ -1,21 +1,41 @@
 #include "Core/BaseLib/PluginLibrary.h"
 
+#include "Core/BaseLib/ElfFormat.h"
+
 #include <QFile>
 
-#include <cerrno>
-#include <cstring>
+#include <utility>
 
 #include <dlfcn.h>
 
 namespace {
 
-/// The loader passes over a library for another processor as if it were not there, and then says so.
-QString withTheFilesPresence(const QString &loaderText, const QString &path)
+/// What a file was built for, where its first bytes say that it is not for this machine; else empty.
+QString foreignKind(const QString &path)
 {
-    const QString missing = QString::fromLocal8Bit(std::strerror(ENOENT));
-    if (loaderText.startsWith(path) && loaderText.endsWith(missing) && QFile::exists(path))
-        return loaderText + QStringLiteral(" (the file is there, perhaps built for another machine)");
-    return loaderText;
+    QFile file(path);
+    // Up to the end of e_machine, which lies at the same place in files of 32 and 64 bits.
+    const QByteArray start = file.open(QIODevice::ReadOnly) ? file.read(20) : QByteArray();
+    if (start.startsWith("MZ"))
+        return QStringLiteral("a Windows library");
+    if (start.size() < 20 || !start.startsWith("\x7f"
+                                               "ELF"))
+        return QString();
+    // System V Application Binary Interface, chapter 4 "ELF header"; here of little-endian machines.
+    const int machine = static_cast<uchar>(start[18]) | static_cast<uchar>(start[19]) << 8;
+    for (const auto &[number, name] : {std::pair(3, "32-bit x86"), std::pair(40, "32-bit ARM"),
+                                       std::pair(183, "64-bit ARM"), std::pair(243, "RISC-V")})
+        if (machine == number)
+            return QStringLiteral("built for ") + QLatin1String(name);
+    return machine == kElfMachineX86_64 ? QString() : QStringLiteral("built for another machine");
+}
+
+/// The loader tells files for other machines by what in them surprised it; for another processor's it even
+/// says that they are not there.
+QString withForeignKind(const QString &loaderText, const QString &path)
+{
+    const QString kind = loaderText.startsWith(path) ? foreignKind(path) : QString();
+    return kind.isEmpty() ? loaderText : QStringLiteral("%1 (the file is %2)").arg(loaderText, kind);
 }
 
 } // namespace
@@ -30,7 +50,7 @@ void *PluginLibrary::loadUncached(const QString &path) noexcept
     // is a reason.
     void *handle = dlopen(QFile::encodeName(path).constData(), RTLD_NOW | RTLD_LOCAL);
     if (!handle)
-        m_errorText = withTheFilesPresence(QString::fromLocal8Bit(dlerror()), path);
+        m_errorText = withForeignKind(QString::fromLocal8Bit(dlerror()), path);
     return handle;
 }
 

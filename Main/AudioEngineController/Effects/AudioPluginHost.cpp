@@ -5,6 +5,7 @@
 #include "Main/AudioEngineController/Effects/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
+#include "Main/AudioEngineController/Effects/ScanLock.h"
 #include "Main/VLib/ApplicationContext.h"
 
 #include <QDir>
@@ -146,6 +147,11 @@ void AudioPluginHost::absorbMarkers()
         markers.push_back(ReadCrashMarker(path));
         if (markers.back().subId != 0)
             filesWithCrashedChild.insert(markers.back().path);
+    }
+    // While its scanner runs, a marker blames nobody.
+    if (!paths.isEmpty() && ScanLock::isScannerAtWork(m_catalogueFolder)) {
+        DebugLog(L"Another scanner is at work in %ls; its crash markers stay", m_catalogueFolder);
+        return;
     }
     QStringList absorbed;
     for (std::size_t index = 0; index < markers.size(); ++index) {

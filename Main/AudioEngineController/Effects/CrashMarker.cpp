@@ -49,7 +49,9 @@ QString rawElement(const QString &text, const char *name)
 {
     const QString start = QStringLiteral("\t<%1>").arg(QLatin1String(name));
     const int from = text.indexOf(start);
-    const int to = text.indexOf(QStringLiteral("</%1>").arg(QLatin1String(name)), from);
+    // At the end of its line: the content may look like an end itself.
+    const int to =
+        text.indexOf(QStringLiteral("</%1>").arg(QLatin1String(name)) + QString::fromLatin1(kLineEnd), from);
     return from < 0 || to < 0 ? QString() : text.mid(from + start.size(), to - from - start.size());
 }
 

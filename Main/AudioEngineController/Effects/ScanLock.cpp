@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/DebugLog.h"
 
+#include <QCoreApplication>
 #include <QCryptographicHash>
 #include <QDir>
 #include <QFileInfo>
@@ -33,4 +34,28 @@ ScanLock::ScanLock(const QString &effectsFolder, Role role)
     m_heldByOther = m_file.error() == QLockFile::LockFailedError;
     if (!m_heldByOther)
         DebugLog(L"Cannot make the lock %ls; scanning without it", lockPath(effectsFolder, role));
+}
+
+bool ScanLock::isScannerAtWork(const QString &effectsFolder)
+{
+    QLockFile file(lockPath(effectsFolder, Role::Scanner));
+    file.setStaleLockTime(kStaleAfter);
+    qint64 process = 0;
+    QString host;
+    QString application;
+    return file.getLockInfo(&process, &host, &application) && process != QCoreApplication::applicationPid() &&
+           !file.removeStaleLockFile();
+}
+
+QString ScanLock::holder(const QString &effectsFolder)
+{
+    for (const Role role : {Role::Scanner, Role::Workstation}) {
+        qint64 process = 0;
+        QString host;
+        QString application;
+        const QLockFile file(lockPath(effectsFolder, role));
+        if (file.getLockInfo(&process, &host, &application))
+            return QStringLiteral("%1, process %2").arg(application).arg(process);
+    }
+    return QString();
 }

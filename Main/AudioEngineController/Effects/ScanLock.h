@@ -13,6 +13,12 @@ public:
 
     explicit ScanLock(const QString &effectsFolder, Role role = Role::Scanner);
 
+    /// True when the scanner of another process is at work on the folder now.
+    static bool isScannerAtWork(const QString &effectsFolder);
+
+    /// The process that holds a lock on the folder, in words; empty where there is none, or nobody knows.
+    static QString holder(const QString &effectsFolder);
+
     /// True when another process of that role is at work on the folder. Where no lock can be made at all,
     /// nobody else is assumed.
     bool isHeldByOther() const { return m_heldByOther; }

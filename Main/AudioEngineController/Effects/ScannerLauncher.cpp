@@ -57,7 +57,7 @@ QString ScannerRunEnd::description() const
     case How::Crashed:
         return QStringLiteral("it was ended by ") + text;
     case How::TimeLimit:
-        return QStringLiteral("it was ended after %1 seconds without an answer").arg(code);
+        return QStringLiteral("it was ended after %1 s without an answer").arg(code);
     case How::Cancelled:
         return QStringLiteral("it was ended because the scan was cancelled");
     }

@@ -2,13 +2,17 @@
 
 #include "Main/AudioEngineController/Effects/ScannerChild.h"
 
+#include <QDeadlineTimer>
+
+#include <algorithm>
 #include <thread>
 
 namespace {
 
 /// What a scanner gets to end by itself: its own patience with a plug-in is two seconds.
-constexpr int kPatience = 4000;
-constexpr int kMaxOutput = 2000; ///< characters
+constexpr std::chrono::milliseconds kPatience(4000);
+constexpr qint64 kLook = 100;    ///< ms
+constexpr int kMaxOutput = 2000; ///< bytes
 
 } // namespace
 
@@ -36,22 +40,27 @@ bool ScannerProcess::waitForFinished(std::chrono::milliseconds timeout)
         std::this_thread::sleep_for(timeout);
         return false;
     }
-    return m_child->waitForFinished(static_cast<int>(timeout.count())) ||
-           m_child->state() == QProcess::NotRunning;
+    // NOTE: QProcess::waitForFinished does not see its time run out while the process prints without a pause.
+    const QDeadlineTimer deadline(timeout);
+    while (m_child->state() != QProcess::NotRunning && !deadline.hasExpired()) {
+        m_child->waitForReadyRead(static_cast<int>(std::min<qint64>(kLook, deadline.remainingTime())));
+        m_output = (m_output + m_child->readAll()).right(kMaxOutput);
+    }
+    return m_child->state() == QProcess::NotRunning;
 }
 
 void ScannerProcess::end()
 {
     if (m_child->state() == QProcess::NotRunning)
         return;
-    if (!m_child->requestEnd() || !m_child->waitForFinished(kPatience))
+    if (!m_child->requestEnd() || !waitForFinished(kPatience))
         kill();
 }
 
 void ScannerProcess::kill()
 {
     m_child->kill();
-    m_child->waitForFinished(kPatience);
+    waitForFinished(kPatience);
 }
 
 int ScannerProcess::errorCode() const { return m_child->error(); }
@@ -64,5 +73,7 @@ int ScannerProcess::exitCode() const { return m_child->exitCode(); }
 
 QString ScannerProcess::takeOutput()
 {
-    return QString::fromLocal8Bit(m_child->readAll().right(kMaxOutput)).trimmed();
+    QByteArray output;
+    output.swap(m_output);
+    return QString::fromLocal8Bit(output).trimmed();
 }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <QByteArray>
 #include <QString>
 #include <QStringList>
 
@@ -43,4 +44,5 @@ public:
 private:
     std::unique_ptr<ScannerChild> m_child;
     bool m_started = false;
+    QByteArray m_output; ///< the end of what it printed
 };

@@ -28,7 +28,5 @@ bool ScannerChild::requestEnd()
 // NOTE: Qt documents no exit code for a crashed process; on these platforms Qt 5 puts the signal there.
 QString ScannerChild::crashText(int code)
 {
-    return QStringLiteral("signal %1 (%2)")
-        .arg(code)
-        .arg(QString::fromLocal8Bit(strsignal(code)));
+    return QStringLiteral("signal %1 (%2)").arg(code).arg(QString::fromLocal8Bit(strsignal(code)));
 }

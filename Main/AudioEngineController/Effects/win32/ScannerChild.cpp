@@ -26,7 +26,12 @@ void ScannerChild::tieToThisProcess()
     JOBOBJECT_EXTENDED_LIMIT_INFORMATION limits = {};
     limits.BasicLimitInformation.LimitFlags = JOB_OBJECT_LIMIT_KILL_ON_JOB_CLOSE;
     SetInformationJobObject(m_job, JobObjectExtendedLimitInformation, &limits, sizeof limits);
-    AssignProcessToJobObject(m_job, pid()->hProcess);
+    HANDLE process =
+        OpenProcess(PROCESS_SET_QUOTA | PROCESS_TERMINATE, FALSE, static_cast<DWORD>(processId()));
+    if (!process)
+        return;
+    AssignProcessToJobObject(m_job, process);
+    CloseHandle(process);
 }
 
 bool ScannerChild::requestEnd()

@@ -42,9 +42,10 @@ TEST(PluginLibraryErrors, KeepTheLoadersOwnWords)
         {"a folder", folder.path(), "Is a directory"},
         {"lacks a function", QStringLiteral(MISSING_FUNCTION_LIBRARY),
          "undefined symbol: functionThatNobodyHas"},
-        {"32 bits", folder.write("old.vst3"_q, elfHeader(ELFCLASS32, EM_386)), "wrong ELF class: ELFCLASS32"},
+        {"32 bits", folder.write("old.vst3"_q, elfHeader(ELFCLASS32, EM_386)),
+         "wrong ELF class: ELFCLASS32 (the file is built for 32-bit x86)"},
         {"other machine", folder.write("arm.vst3"_q, elfHeader(ELFCLASS64, EM_AARCH64)),
-         "(the file is there, perhaps built for another machine)"},
+         "No such file or directory (the file is built for 64-bit ARM)"},
         {"no path", QString(), "no path given"},
     };
     for (const auto &row : rows) {

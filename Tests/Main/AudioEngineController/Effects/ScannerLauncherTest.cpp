@@ -117,7 +117,7 @@ TEST_F(Launcher, TheLogTellsTheEndsApart)
         const char *script;
         const char *line;
     } rows[] = {{"exit=7", "it ended by itself with exit code 7"},
-                {"marker=B.scan hang\nclear", "it was ended after 1 seconds without an answer"}};
+                {"marker=B.scan hang\nclear", "it was ended after 1 s without an answer"}};
     for (const auto &row : rows) {
         QFile::remove(m_folder.path(QStringLiteral("runs")));
         script(row.script);
