@@ -24,14 +24,18 @@ std::string arrangementText(const void *pointer)
 
 bool needsPointer(int opcode)
 {
-    const int opcodes[] = {effGetParamName,      effGetChunk,        effSetChunk,
-                           effGetEffectName,     effGetVendorString, VstPublished::effGetParameterProperties,
-                           effShellGetNextPlugin};
+    const int opcodes[] = {effGetParamName,       effGetChunk,
+                           effSetChunk,           effGetEffectName,
+                           effGetVendorString,    VstPublished::effGetParameterProperties,
+                           effShellGetNextPlugin, effEditGetRect,
+                           effGetProgramName,     effCanDo};
     return std::find(std::begin(opcodes), std::end(opcodes), opcode) != std::end(opcodes);
 }
 
-std::string callDetail(int opcode, int index, VstIntPtr value, const void *pointer)
+std::string callDetail(int opcode, int index, VstIntPtr value, const void *pointer, float opt)
 {
+    if (opcode == effSetSampleRate)
+        return floatText(opt);
     if (opcode == effSetSpeakerArrangement)
         return arrangementText(reinterpret_cast<const void *>(value)) + " -> " + arrangementText(pointer);
     if (index == 0 && value == 0)

@@ -96,7 +96,13 @@ bool takeEffectStatement(EffectScript &effect, const ScriptStatement &statement)
         effect.vendor = readText(statement, 0, kVendorBuffer);
     else if (statement.key == "parameter")
         effect.parameters.push_back(readParameter(statement));
-    else if (statement.key == "chunk") {
+    else if (statement.key == "editor") {
+        statement.allowWords(2);
+        effect.editor = {statement.number(0), statement.number(1)};
+    } else if (statement.key == "new-outputs") {
+        statement.allowWords(2);
+        effect.newOutputs = {statement.word(0), statement.number(1)};
+    } else if (statement.key == "chunk") {
         statement.allowWords(1);
         effect.chunk = statement.word(0);
     } else

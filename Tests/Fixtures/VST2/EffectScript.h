@@ -38,7 +38,17 @@ struct EffectScript {
     std::optional<std::int32_t> statedParameters; ///< the count that is claimed, where it is not the true one
     std::vector<ScriptedParameter> parameters;
     std::optional<std::string> chunk;
-    bool nullChunk = false; ///< gives a null pointer in place of the chunk
+    struct Editor {
+        std::int32_t width;
+        std::int32_t height;
+    };
+    std::optional<Editor> editor;
+    struct ChangedCount {
+        std::string stage;
+        std::int32_t count;
+    };
+    std::optional<ChangedCount> newOutputs; ///< what `numOutputs` becomes at a stage
+    bool nullChunk = false;                 ///< gives a null pointer in place of the chunk
     bool ownThread = false; ///< a thread that runs from the effect's making until it is closed
 };
 

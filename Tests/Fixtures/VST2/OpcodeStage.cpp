@@ -28,8 +28,9 @@ const struct {
 
 std::vector<FixtureStage> stagesOfVST2()
 {
-    std::vector<FixtureStage> stages = {
-        {"static-constructor"}, {"entry", true}, {"get-parameter"}, {"set-parameter"}, {"static-destructor"}};
+    std::vector<FixtureStage> stages = {{"static-constructor"}, {"entry", true},
+                                        {"get-parameter"},      {"process"},
+                                        {"set-parameter"},      {"static-destructor"}};
     for (int opcode = 0; opcode < kOpcodes; ++opcode)
         stages.push_back({stageOfOpcode(opcode), true});
     return stages;

@@ -20,13 +20,12 @@ const std::int32_t kSpoiled = static_cast<std::int32_t>(0xDDDDDDDD);
 thread_local const HostCall *nestedCall = nullptr;
 thread_local int nestedDepth = 0; ///< the calls that are still to be made
 
-void processNothing(AEffect *, float **, float **, int) {}
-
 void processNothingDouble(AEffect *, double **, double **, int) {}
 
 std::int32_t flagsOf(const EffectScript &script)
 {
-    return script.flags.value_or(effFlagsCanReplacing | (script.chunk ? effFlagsProgramChunks : 0));
+    return script.flags.value_or(effFlagsCanReplacing | (script.chunk ? effFlagsProgramChunks : 0) |
+                                 (script.editor ? effFlagsHasEditor : 0));
 }
 
 void fillField(char *field, std::size_t size, const std::string &text)
@@ -43,7 +42,7 @@ ScriptedEffect::ScriptedEffect(EffectScript script, FixtureSubject subject, audi
 {
     m_effect.magic = m_script.magic;
     m_effect.dispatcher = dispatchTo;
-    m_effect.process = processNothing;
+    m_effect.process = processBlock;
     m_effect.setParameter = setParameterOf;
     m_effect.getParameter = parameterOf;
     m_effect.numPrograms = 1;
@@ -56,7 +55,7 @@ ScriptedEffect::ScriptedEffect(EffectScript script, FixtureSubject subject, audi
     m_effect.object = this;
     m_effect.uniqueID = m_script.uniqueId;
     m_effect.version = 1;
-    m_effect.processReplacing = processNothing;
+    m_effect.processReplacing = processBlock;
     m_effect.processDoubleReplacing = processNothingDouble;
     if (m_script.ownThread)
         m_threads.push_back(std::make_unique<RepeatingThread>([] {}));
@@ -84,9 +83,9 @@ ScriptedEffect &ScriptedEffect::open(AEffect *effect)
 }
 
 VstIntPtr ScriptedEffect::dispatchTo(AEffect *effect, int opcode, int index, VstIntPtr value, void *pointer,
-                                     float)
+                                     float opt)
 {
-    return open(effect).dispatch(opcode, index, value, pointer);
+    return open(effect).dispatch(opcode, index, value, pointer, opt);
 }
 
 void ScriptedEffect::setParameterOf(AEffect *effect, int index, float value)
@@ -109,13 +108,26 @@ float ScriptedEffect::parameterOf(AEffect *effect, int index)
     return parameter->value;
 }
 
+/// Writes to every sample of every stated channel, so that a host without room for it is found out.
+void ScriptedEffect::processBlock(AEffect *effect, float **inputs, float **outputs, int frames)
+{
+    const int count = effect->numOutputs; // the stage may change it
+    open(effect).reach("process", std::to_string(frames));
+    for (int channel = 0; channel < count; ++channel) {
+        for (int frame = 0; frame < frames; ++frame)
+            outputs[channel][frame] += channel < effect->numInputs ? inputs[channel][frame] : 1.0f;
+    }
+}
+
 void ScriptedEffect::reach(const std::string &stage, const std::string &detail)
 {
     pluginScript().stages.reach(stage, m_subject, detail);
+    if (m_script.newOutputs && m_script.newOutputs->stage == stage)
+        m_effect.numOutputs = m_script.newOutputs->count;
     askHost(stage);
 }
 
-VstIntPtr ScriptedEffect::dispatch(int opcode, int index, VstIntPtr value, void *pointer)
+VstIntPtr ScriptedEffect::dispatch(int opcode, int index, VstIntPtr value, void *pointer, float opt)
 {
     const std::string stage = stageOfOpcode(opcode);
     const bool asksParameter = stage == "get-param-name" || stage == "get-param-properties";
@@ -129,7 +141,7 @@ VstIntPtr ScriptedEffect::dispatch(int opcode, int index, VstIntPtr value, void 
         return nextChild(pointer);
     if (opcode == VstPublished::effEditIdle)
         return answerIdle();
-    reach(stage, callDetail(opcode, index, value, pointer));
+    reach(stage, callDetail(opcode, index, value, pointer, opt));
     return pluginScript().result(stage, m_subject, handle(opcode, index, value, pointer));
 }
 
@@ -151,6 +163,8 @@ VstIntPtr ScriptedEffect::handle(int opcode, int index, VstIntPtr value, void *p
         return m_script.category.value_or(kPlugCategEffect);
     case effSetSpeakerArrangement:
         return 1;
+    case effEditGetRect:
+        return editorRect(pointer);
     case effGetEffectName:
         m_script.name.writeTo(pointer);
         return 1;
@@ -205,6 +219,16 @@ VstIntPtr ScriptedEffect::chunk(void *pointer) const
     const char *data = m_script.nullChunk ? nullptr : m_script.chunk->data();
     *static_cast<const void **>(pointer) = data;
     return static_cast<VstIntPtr>(m_script.chunk->size());
+}
+
+VstIntPtr ScriptedEffect::editorRect(void *pointer)
+{
+    if (!m_script.editor)
+        return 0;
+    m_editor = {0, 0, static_cast<short>(m_script.editor->height),
+                static_cast<short>(m_script.editor->width)};
+    *static_cast<ERect **>(pointer) = &m_editor;
+    return 1;
 }
 
 VstIntPtr ScriptedEffect::properties(const ScriptedParameter &parameter, void *pointer) const

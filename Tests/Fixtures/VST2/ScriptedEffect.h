@@ -22,15 +22,17 @@ private:
     static VstIntPtr dispatchTo(AEffect *effect, int opcode, int index, VstIntPtr value, void *pointer,
                                 float opt);
     static void setParameterOf(AEffect *effect, int index, float value);
+    static void processBlock(AEffect *effect, float **inputs, float **outputs, int frames);
     static float parameterOf(AEffect *effect, int index);
     static ScriptedEffect &open(AEffect *effect);
 
     void reach(const std::string &stage, const std::string &detail);
-    VstIntPtr dispatch(int opcode, int index, VstIntPtr value, void *pointer);
+    VstIntPtr dispatch(int opcode, int index, VstIntPtr value, void *pointer, float opt);
     VstIntPtr handle(int opcode, int index, VstIntPtr value, void *pointer);
     VstIntPtr nextChild(void *pointer);
     VstIntPtr listChild(const ScriptedChild &child, void *pointer);
     VstIntPtr chunk(void *pointer) const;
+    VstIntPtr editorRect(void *pointer);
     VstIntPtr properties(const ScriptedParameter &parameter, void *pointer) const;
     /// The parameter at an index, or null.
     ScriptedParameter *parameter(int index);
@@ -44,6 +46,7 @@ private:
     FixtureSubject m_subject;
     audioMasterCallback m_host;
     AEffect m_effect = {};
+    ERect m_editor = {};
     bool m_closed = false;
     std::size_t m_listed = 0; ///< children listed since the enumeration began
     std::vector<std::unique_ptr<RepeatingThread>> m_threads;

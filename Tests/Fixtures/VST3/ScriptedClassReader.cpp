@@ -64,6 +64,8 @@ std::string *textOf(ScriptedClass &described, const std::string &key)
         return &described.subCategories;
     if (key == "vendor")
         return &described.vendor;
+    if (key == "controller")
+        return &described.controller;
     return key == "version" ? &described.version : nullptr;
 }
 
@@ -73,6 +75,8 @@ bool takeSingleWord(ScriptedClass &described, const ScriptStatement &statement)
         *text = statement.word(0);
     else if (statement.key == "id")
         described.id = idFromDigits(statement);
+    else if (statement.key == "state")
+        described.state = statement.word(0);
     else if (statement.key == "stated-inputs")
         described.statedInputs = statement.number(0);
     else if (statement.key == "stated-outputs")

@@ -3,6 +3,8 @@
 #include "Tests/Fixtures/FixtureMisuse.h"
 #include "Tests/Fixtures/VST3/HostQuestions.h"
 
+#include <pluginterfaces/base/ibstream.h>
+
 #include <memory>
 
 using namespace Steinberg;
@@ -17,27 +19,53 @@ std::vector<std::unique_ptr<ScriptedComponent>> &components()
 
 const char *nameOf(Vst::BusDirection direction) { return direction == Vst::kInput ? "input" : "output"; }
 
+/// All that a stream holds from where it stands.
+std::string textOf(IBStream *stream)
+{
+    std::string text;
+    char bytes[4096];
+    int32 count = 0;
+    while (stream && stream->read(bytes, sizeof bytes, &count) == kResultOk && count > 0)
+        text.append(bytes, static_cast<std::size_t>(count));
+    return text;
+}
+
 } // namespace
 
-ScriptedComponent *ScriptedComponent::create(const ScriptedClass &described)
+tresult ScriptedComponent::create(const ScriptedClass &described, FIDString interfaceId, void **object)
 {
     components().push_back(std::make_unique<ScriptedComponent>(described));
-    return components().back().get();
+    ScriptedComponent &made = *components().back();
+    const tresult result = made.queryInterface(interfaceId, object);
+    --made.m_references; // the one that it was made with
+    return result;
 }
 
 ScriptedComponent::ScriptedComponent(const ScriptedClass &described)
     : m_class(described)
+    , m_data(described.state)
 {}
+
+bool ScriptedComponent::isController() const
+{
+    return m_class.controller == "self" || m_class.category == "Component Controller Class";
+}
 
 tresult ScriptedComponent::queryInterface(const TUID interfaceId, void **object)
 {
     expectAlive("queryInterface");
     *object = nullptr;
-    if (!FUnknownPrivate::iidEqual(interfaceId, FUnknown::iid) &&
-        !FUnknownPrivate::iidEqual(interfaceId, IPluginBase::iid) &&
-        !FUnknownPrivate::iidEqual(interfaceId, Vst::IComponent::iid))
+    if (FUnknownPrivate::iidEqual(interfaceId, FUnknown::iid) ||
+        FUnknownPrivate::iidEqual(interfaceId, IPluginBase::iid))
+        *object = static_cast<Vst::IComponent *>(this);
+    else if (FUnknownPrivate::iidEqual(interfaceId, Vst::IComponent::iid) && isComponent())
+        *object = static_cast<Vst::IComponent *>(this);
+    else if (FUnknownPrivate::iidEqual(interfaceId, Vst::IEditController::iid) && isController())
+        *object = static_cast<Vst::IEditController *>(this);
+    else if (FUnknownPrivate::iidEqual(interfaceId, Vst::IConnectionPoint::iid))
+        *object = static_cast<Vst::IConnectionPoint *>(this);
+    else
         return kNoInterface;
-    *object = static_cast<Vst::IComponent *>(this);
     addRef();
     return kResultOk;
 }
@@ -81,10 +109,14 @@ tresult ScriptedComponent::terminate()
     return scriptedModule().result("terminate", m_class.name);
 }
 
-tresult ScriptedComponent::getControllerClassId(TUID)
+tresult ScriptedComponent::getControllerClassId(TUID classId)
 {
-    expectAlive("getControllerClassId");
-    return kNotImplemented;
+    const tresult result = reach("controller-class-id");
+    if (result != kResultOk || m_class.controller.empty())
+        return result == kResultOk ? kNotImplemented : result;
+    if (const ScriptedClass *controller = scriptedModule().classWithName(m_class.controller))
+        controller->id.toTUID(classId);
+    return kResultOk;
 }
 
 tresult ScriptedComponent::setIoMode(Vst::IoMode mode)
@@ -133,9 +165,44 @@ tresult ScriptedComponent::activateBus(Vst::MediaType, Vst::BusDirection, int32,
 
 tresult ScriptedComponent::setActive(TBool) { return kResultOk; }
 
-tresult ScriptedComponent::setState(IBStream *) { return kNotImplemented; }
+tresult ScriptedComponent::setState(IBStream *state)
+{
+    const std::string bytes = textOf(state);
+    const tresult result = reach("set-state", bytes);
+    if (result == kResultOk)
+        m_data = bytes;
+    return result;
+}
 
-tresult ScriptedComponent::getState(IBStream *) { return kNotImplemented; }
+tresult ScriptedComponent::getState(IBStream *state)
+{
+    const tresult result = reach("get-state");
+    if (result != kResultOk || !m_data)
+        return result == kResultOk ? kNotImplemented : result;
+    std::string bytes = *m_data;
+    return state->write(bytes.data(), static_cast<int32>(bytes.size()), nullptr);
+}
+
+tresult ScriptedComponent::setComponentState(IBStream *state)
+{
+    return reach("set-component-state", textOf(state));
+}
+
+tresult ScriptedComponent::setComponentHandler(Vst::IComponentHandler *handler)
+{
+    return reach("set-component-handler", handler ? "" : "null");
+}
+
+tresult ScriptedComponent::connect(Vst::IConnectionPoint *) { return reach("connect"); }
+
+tresult ScriptedComponent::disconnect(Vst::IConnectionPoint *) { return reach("disconnect"); }
+
+tresult ScriptedComponent::reach(const char *stage, const std::string &detail)
+{
+    expectInitialized(stage);
+    scriptedModule().stages.reach(stage, m_class.name, detail);
+    return scriptedModule().result(stage, m_class.name);
+}
 
 void ScriptedComponent::expectAlive(const char *call) const
 {

@@ -180,9 +180,5 @@ tresult ScriptedFactory::createInstance(FIDString classId, FIDString interfaceId
     const tresult result = scriptedModule().result("create-instance", described->name);
     if (result != kResultOk || scriptedModule().answers("null", "create-instance", described->name))
         return result;
-    if (!FUnknownPrivate::iidEqual(interfaceId, Vst::IComponent::iid) &&
-        !FUnknownPrivate::iidEqual(interfaceId, FUnknown::iid))
-        return kNoInterface;
-    *object = ScriptedComponent::create(*described);
-    return kResultOk;
+    return ScriptedComponent::create(*described, interfaceId, object);
 }

@@ -23,6 +23,13 @@ std::vector<FixtureStage> stagesOfVST3()
             {"create-instance", true},
             {"set-io-mode", true},
             {"initialize", true},
+            {"controller-class-id", true},
+            {"set-component-handler", true},
+            {"connect", true},
+            {"get-state", true},
+            {"set-component-state", true},
+            {"set-state", true},
+            {"disconnect", true},
             {"bus-count"},
             {"bus-info", true},
             {"terminate", true},
@@ -83,6 +90,15 @@ ScriptedModule::ScriptedModule()
     }
     for (const ScriptStatement &statement : parseScript(script))
         takeStatement(*this, statement);
+}
+
+const ScriptedClass *ScriptedModule::classWithName(const std::string &name) const
+{
+    for (const ScriptedClass &described : classes) {
+        if (described.name == name)
+            return &described;
+    }
+    return nullptr;
 }
 
 tresult ScriptedModule::result(const std::string &stage, const std::string &className) const

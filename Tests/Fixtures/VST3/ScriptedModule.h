@@ -29,6 +29,8 @@ struct ScriptedClass {
     std::optional<std::int32_t>
         statedInputs; ///< the count of buses that is claimed, where it is not the true one
     std::optional<std::int32_t> statedOutputs;
+    std::string controller; ///< "self", or the name of the class that is the edit controller; empty: none
+    std::optional<std::string> state;   ///< what its instances give as their state, first
     std::vector<std::string> questions; ///< what the class asks the host when it is initialised
 };
 
@@ -43,6 +45,8 @@ struct ScriptedModule {
     std::vector<ScriptedClass> classes;
     FixtureStages stages;
 
+    /// The class of a name, or null.
+    const ScriptedClass *classWithName(const std::string &name) const;
     /// The result code that the script has for a stage, else kResultOk.
     Steinberg::tresult result(const std::string &stage, const std::string &className = {}) const;
     /// Whether the script has exactly this answer for a stage.
