@@ -14,7 +14,8 @@ class VUI;
 
 /// Codes that go with status texts and notifications.
 namespace MessageCode {
-inline constexpr int kScanning = 60000;            ///< "Scanning: %ls"
+inline constexpr int kScanning = 60000; ///< "Scanning: %ls"
+inline constexpr int kCompleted = 1000; ///< what a status text told of has ended; the text is empty
 inline constexpr quint32 kEntryAdded = 0x0FFFFFFF; ///< an entry came into a catalogue
 } // namespace MessageCode
 

@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/DebugLog.h"
 #include "Core/BaseLib/FileFinder.h"
+#include "Main/AudioEngineController/Effects/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
@@ -81,6 +82,14 @@ std::optional<EffectRecord> AudioPluginHost::findEffect(const QString &id) const
     const TAutoLockCS lock(&m_ks);
     const EffectRecord *listed = m_effects.find(id);
     return listed ? std::optional<EffectRecord>(*listed) : std::nullopt;
+}
+
+LoadedPlugin AudioPluginHost::loadPlugin(const QString &identifier)
+{
+    const bool isKnown = findEffect(identifier).has_value();
+    if (isKnown)
+        DebugLog(L"%ls is known, but this host loads no plug-ins", identifier);
+    return {isKnown, nullptr};
 }
 
 bool AudioPluginHost::isListed(const EffectRecord &record) const

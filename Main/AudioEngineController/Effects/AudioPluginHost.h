@@ -12,6 +12,8 @@
 #include <optional>
 #include <set>
 
+struct LoadedPlugin;
+
 /// Base of the per-format hosts. Holds one format's catalogue: what the previous run left (the known list)
 /// and what this run found (the effect list), and reads and writes the files that carry them.
 ///
@@ -67,6 +69,10 @@ public:
     /// the file (a sub-plug-in keeps its name), enabled, not working, so that it is shown and not probed
     /// again until it changes.
     void completeFailedRecord(EffectRecord &record) const;
+
+    /// Loads a plug-in of the effect list by its identifier without the prefix, for use. A host of a format
+    /// that is not there knows none.
+    virtual LoadedPlugin loadPlugin(const QString &identifier);
 
     /// A copy of the effect list's record of that identifier; nothing when there is none.
     std::optional<EffectRecord> findEffect(const QString &id) const;

@@ -1,20 +1,24 @@
 #pragma once
 
+#include "Main/AudioEngineController/Effects/ChannelBuffers.h"
 #include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
 
 #include <QByteArray>
+#include <QRect>
 
+#include <atomic>
 #include <optional>
 
 /// The checking wrapper around a plug-in's `AEffect`: it alone holds the pointer and calls the dispatcher.
-/// Every call is guarded: what the plug-in throws or faults ends in a log line and a neutral answer. Scan
-/// worker.
+/// Every call is guarded: what the plug-in throws or faults ends in a log line and a neutral answer. Copies
+/// stand for the same effect.
 class VSTEffect {
 public:
     /// The fields that are read, as they stood when asked.
     struct Fields {
         VstInt32 magic;
         VstInt32 flags; ///< 32 bits of what the header describes as more
+        VstInt32 numPrograms;
         VstInt32 numParams;
         VstInt32 numInputs;
         VstInt32 numOutputs;
@@ -41,6 +45,8 @@ public:
     VstIntPtr dispatch(VstInt32 opcode, void *pointer);
     VstIntPtr dispatchValue(VstInt32 opcode, VstIntPtr value);
     VstIntPtr dispatchFloat(VstInt32 opcode, float number);
+    /// Calls the dispatcher with an index and everything else; nothing when the call failed.
+    std::optional<VstIntPtr> dispatchAt(VstInt32 opcode, VstInt32 index, VstIntPtr value, void *pointer);
 
     /// Dispatches an opcode that has a text written, into a buffer of `size` bytes. The text is cut at the
     /// buffer.
@@ -49,18 +55,59 @@ public:
         QByteArray bytes;
     };
     Text dispatchText(VstInt32 opcode, int size);
+    /// The text of an opcode with an index, whatever the answer; empty when the call failed.
+    QByteArray textAt(VstInt32 opcode, VstInt32 index, int size);
+    /// The bytes of a `VstParameterProperties`; null when the plug-in gives none.
+    QByteArray parameterProperties(VstInt32 index);
+
+    /// A parameter's value; nothing when the plug-in has no such function or the call failed.
+    std::optional<float> parameter(VstInt32 index);
+    bool setParameter(VstInt32 index, float value);
+    /// Processes a block of at most the buffers' size. False when the plug-in has no function for it, states
+    /// more channels than the buffers have, or the call failed.
+    bool process(ChannelBuffers &buffers, VstInt32 frames);
+    /// The editor's place and size in pixels; nothing when the plug-in names none.
+    std::optional<QRect> editorRect();
+    /// The state of the current program as the plug-in keeps it, copied. The answer is the plug-in's: bytes,
+    /// or 0 when the call failed; the data is null when there is none or it cannot be read as far as the
+    /// answer says.
+    struct Chunk {
+        VstIntPtr answer = 0;
+        QByteArray data;
+    };
+    Chunk programChunk();
 
     /// True once a call committed a hardware fault: the plug-in's state is unknown then.
-    bool hasFaulted() const { return m_faulted; }
+    bool hasFaulted() const { return m_faulted.isSet(); }
 
     /// Calls a plug-in back from inside the host callback, where whoever called the plug-in is the guard.
     static VstIntPtr dispatchUnguarded(AEffect *effect, VstInt32 opcode);
 
 private:
-    VstIntPtr call(VstInt32 opcode, VstIntPtr value, void *pointer, float number);
+    /// Set by whatever thread the plug-in was called on.
+    class Mark {
+    public:
+        Mark() = default;
+        Mark(const Mark &other) { m_set = other.m_set.load(); }
+        Mark &operator=(const Mark &other)
+        {
+            m_set = other.m_set.load();
+            return *this;
+        }
+        void set() { m_set = true; }
+        bool isSet() const { return m_set; }
+
+    private:
+        std::atomic<bool> m_set{false};
+    };
+
+    template <typename Call>
+    bool guard(const char *what, int number, Call &&call);
+    std::optional<VstIntPtr> call(VstInt32 opcode, VstInt32 index, VstIntPtr value, void *pointer,
+                                  float number);
 
     AEffect *m_plugin = nullptr;
-    bool m_faulted = false;
+    Mark m_faulted;
 };
 
 /// Decides for guards that look at a fault before they handle it: logs the code and handles access violations

@@ -94,22 +94,36 @@ bool VSTHost::AddEffect(const EffectRecord &record)
     return AudioPluginHost::AddEffect(later);
 }
 
+std::optional<EffectRecord> VSTHost::findByKey(const QString &key) const
+{
+    std::optional<EffectRecord> record = findEffect(key);
+    if (record || !key.contains(QLatin1String(kOldKeyMark)))
+        return record;
+    DebugLog(L"Found an old Waves plug-in, retrying as:");
+    return findByKey(key.mid(static_cast<int>(sizeof kOldKeyMark - 1)));
+}
+
 std::unique_ptr<VSTPlugin> VSTHost::loadByKey(const QString &key)
 {
-    const std::optional<EffectRecord> record = findEffect(key);
-    if (!record) {
-        if (!key.contains(QLatin1String(kOldKeyMark)))
-            return nullptr;
-        DebugLog(L"Found an old Waves plug-in, retrying as:");
-        return loadByKey(key.mid(static_cast<int>(sizeof kOldKeyMark - 1)));
-    }
-    DebugLog(L"Found: %ls, trying to load", key);
-    if (record->vstCategory == kPlugCategOfflineProcess || !record->enabled)
+    const std::optional<EffectRecord> record = findByKey(key);
+    return record ? loadRecord(*record) : nullptr;
+}
+
+LoadedPlugin VSTHost::loadPlugin(const QString &identifier)
+{
+    const std::optional<EffectRecord> record = findByKey(identifier);
+    return {record.has_value(), record ? loadRecord(*record) : nullptr};
+}
+
+std::unique_ptr<VSTPlugin> VSTHost::loadRecord(const EffectRecord &record)
+{
+    DebugLog(L"Found: %ls, trying to load", record.id);
+    if (record.vstCategory == kPlugCategOfflineProcess || !record.enabled)
         return nullptr;
     auto plugin = std::make_unique<VSTPlugin>(*this);
-    if (plugin->load(*record, VSTHostCallback, 0))
+    if (plugin->load(record, VSTHostCallback, 0))
         return plugin;
-    DebugLog(L"%ls, Didn't manage it", key);
+    DebugLog(L"%ls, Didn't manage it", record.id);
     return nullptr;
 }
 
@@ -127,27 +141,46 @@ bool VSTHost::shellIdOfPluginBeingLoaded(VstInt32 &id) const
     return plugin != nullptr;
 }
 
-bool VSTHost::isRegistered(const VSTPlugin *plugin) const
+std::vector<VSTHost::Registered>::iterator VSTHost::registered(const VSTPlugin *plugin)
 {
-    return std::find(m_plugins.begin(), m_plugins.end(), plugin) != m_plugins.end();
+    return std::find_if(m_plugins.begin(), m_plugins.end(),
+                        [plugin](const Registered &entry) { return entry.plugin == plugin; });
 }
 
 void VSTHost::registerPlugin(VSTPlugin *plugin)
 {
     const std::lock_guard<std::mutex> lock(m_pluginsMutex);
-    m_plugins.push_back(plugin);
+    m_plugins.push_back({plugin, 0});
 }
 
 void VSTHost::unregisterPlugin(VSTPlugin *plugin)
 {
+    std::unique_lock<std::mutex> lock(m_pluginsMutex);
+    m_unpinned.wait(lock, [&] { return registered(plugin)->pins == 0; });
+    m_plugins.erase(registered(plugin));
+}
+
+bool VSTHost::pin(const VSTPlugin *claimed)
+{
     const std::lock_guard<std::mutex> lock(m_pluginsMutex);
-    m_plugins.erase(std::remove(m_plugins.begin(), m_plugins.end(), plugin), m_plugins.end());
+    const auto entry = registered(claimed);
+    if (entry == m_plugins.end())
+        return false;
+    ++entry->pins;
+    return true;
+}
+
+void VSTHost::unpin(const VSTPlugin *plugin)
+{
+    const std::lock_guard<std::mutex> lock(m_pluginsMutex);
+    if (--registered(plugin)->pins == 0)
+        m_unpinned.notify_all();
 }
 
 void VSTHost::logLoadedPlugins() const
 {
     const std::lock_guard<std::mutex> lock(m_pluginsMutex);
     DebugLog(L"VSTs ");
-    for (const VSTPlugin *plugin : m_plugins)
-        DebugLog(L"vst: %s: ", plugin->name());
+    for (const Registered &entry : m_plugins)
+        DebugLog(L"vst: %s: ", entry.plugin->name());
 }

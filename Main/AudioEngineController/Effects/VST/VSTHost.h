@@ -4,6 +4,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
 
 #include <atomic>
+#include <condition_variable>
 #include <memory>
 #include <mutex>
 #include <vector>
@@ -27,6 +28,7 @@ public:
     /// a kind that is not loaded, or fails to load. A key of an earlier naming ("Waves " and the name) is
     /// tried again without its start.
     std::unique_ptr<VSTPlugin> loadByKey(const QString &key);
+    LoadedPlugin loadPlugin(const QString &identifier) override;
 
     void setAudioSettings(int sampleRate, int blockSize) override;
     /// In Hz.
@@ -40,30 +42,63 @@ public:
     void setPluginBeingLoaded(VSTPlugin *plugin) { m_pluginBeingLoaded = plugin; }
     /// Its sub-plug-in identifier; false when no plug-in is being loaded.
     bool shellIdOfPluginBeingLoaded(VstInt32 &id) const;
-    /// Notifications from this plug-in are dropped; null: from none.
-    void setIgnoredPlugin(VSTPlugin *plugin) { m_ignoredPlugin = plugin; }
+    /// Notifications from this plug-in are dropped; null: from none. Gives the one before.
+    VSTPlugin *setIgnoredPlugin(VSTPlugin *plugin) { return m_ignoredPlugin.exchange(plugin); }
     bool isIgnored(const VSTPlugin *plugin) const { return plugin == m_ignoredPlugin; }
 
     void registerPlugin(VSTPlugin *plugin);
+    /// Waits until nobody works with the plug-in object any more; so not to be called from inside such work.
     void unregisterPlugin(VSTPlugin *plugin);
     /// Calls the operation with the plug-in object that an effect names as its owner; false, without a call,
-    /// for a null effect and for one whose owner is no plug-in of ours. The list lock is held meanwhile, so
-    /// that the object lives: the operation must not call plug-in code.
+    /// for a null effect and for one whose owner is no plug-in of ours. The object lives at least as long as
+    /// the operation, which may call plug-in code but must not throw.
     template <typename Operation>
     bool withCallingPlugin(const AEffect *effect, Operation &&operation)
     {
-        VSTPlugin *const claimed = effect ? reinterpret_cast<VSTPlugin *>(effect->resvd1) : nullptr;
-        const std::lock_guard<std::mutex> lock(m_pluginsMutex);
-        if (!isRegistered(claimed))
+        const Pin pin(*this, effect ? reinterpret_cast<VSTPlugin *>(effect->resvd1) : nullptr);
+        if (!pin.plugin())
             return false;
-        operation(*claimed);
+        operation(*pin.plugin());
         return true;
     }
     /// Logs the names of all plug-in objects.
     void logLoadedPlugins() const;
 
 private:
-    bool isRegistered(const VSTPlugin *plugin) const;
+    /// A plug-in object, and how many calls work with it.
+    struct Registered {
+        VSTPlugin *plugin; ///< not owned
+        int pins;
+    };
+
+    /// Keeps a plug-in object alive for a scope, also when the thread is ended in it.
+    class Pin {
+    public:
+        Pin(VSTHost &host, VSTPlugin *claimed)
+            : m_host(host)
+            , m_plugin(host.pin(claimed) ? claimed : nullptr)
+        {}
+        ~Pin()
+        {
+            if (m_plugin)
+                m_host.unpin(m_plugin);
+        }
+        Pin(const Pin &) = delete;
+        Pin &operator=(const Pin &) = delete;
+
+        /// Null when it is none of ours.
+        VSTPlugin *plugin() const { return m_plugin; }
+
+    private:
+        VSTHost &m_host;
+        VSTPlugin *m_plugin;
+    };
+
+    std::vector<Registered>::iterator registered(const VSTPlugin *plugin);
+    bool pin(const VSTPlugin *claimed);
+    void unpin(const VSTPlugin *plugin);
+    std::optional<EffectRecord> findByKey(const QString &key) const;
+    std::unique_ptr<VSTPlugin> loadRecord(const EffectRecord &record);
     bool cleanUpNames();
 
     std::atomic<int> m_blockSize{256};
@@ -73,7 +108,8 @@ private:
     VstTimeInfo *m_timeInfo = nullptr; ///< not owned; the scanner has none
     VstInt32 m_processLevel = VstPublished::kVstProcessLevelUser;
     mutable std::mutex m_pluginsMutex;
-    std::vector<VSTPlugin *> m_plugins; ///< not owned
+    std::condition_variable m_unpinned;
+    std::vector<Registered> m_plugins;
 };
 
 /// The version in the file name of one of the special shells ("WaveShell1-VST 9.3_x64.dll" gives 9.3; the

@@ -54,11 +54,12 @@ VSTPlugin::VSTPlugin(VSTHost &host)
 
 VSTPlugin::~VSTPlugin()
 {
+    setTornDown(true);
     unload();
     m_host.unregisterPlugin(this);
 }
 
-QString VSTPlugin::identifierPrefix() { return QString::fromLatin1(PluginPrefix::kVst2); }
+QString VSTPlugin::identifierPrefix() const { return QString::fromLatin1(PluginPrefix::kVst2); }
 
 bool VSTPlugin::load(const QString &path, VSTHostCallbackFunction callback, bool &isPluginModule)
 {
@@ -73,8 +74,11 @@ bool VSTPlugin::load(const EffectRecord &record, VSTHostCallbackFunction callbac
 {
     if (reloadMode == 1)
         m_isProbe = false;
-    if (reloadMode == 0)
+    if (reloadMode == 0) {
+        setTornDown(true);
         unload();
+        setTornDown(false);
+    }
     m_shellId = static_cast<VstInt32>(record.subId);
     VSTEffect effect;
     {
@@ -148,7 +152,11 @@ AEffect *VSTPlugin::enter(void *entryPoint, VSTHostCallbackFunction callback)
 bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
 {
     m_faulted |= m_effect.hasFaulted();
-    m_effect = effect;
+    {
+        const TAutoLockCS lock(&processingLock()); // a thread of the plug-in may have its channels rebuilt
+        m_effect = effect;
+        m_effectOpened = false;
+    }
     ProbeReport::stage(ProbeStage::Ask);
     const auto isSame = [&](const HandedOut &other) { return other.effect.isSame(effect); };
     if (std::none_of(m_handedOut.begin(), m_handedOut.end(), isSame))
@@ -226,7 +234,10 @@ void VSTPlugin::closeEffects()
     std::vector<HandedOut> effects;
     effects.swap(m_handedOut);
     m_faulted |= m_effect.hasFaulted();
-    m_effect = VSTEffect();
+    {
+        const TAutoLockCS lock(&processingLock());
+        m_effect = VSTEffect();
+    }
     for (auto entry = effects.rbegin(); entry != effects.rend() && !m_faulted; ++entry) {
         const bool isBracketed = m_closeBracket && entry->shellId != 0;
         const std::shared_ptr<void> bracket = isBracketed ? m_closeBracket(entry->shellId) : nullptr;
@@ -240,6 +251,7 @@ void VSTPlugin::unload()
     if (!m_loaded)
         return;
     ProbeReport::stage(ProbeStage::Close);
+    VSTPlugin::close();
     closeEffects();
     if (m_faulted)
         m_library.leaveMapped(); // it may hold locks and own threads

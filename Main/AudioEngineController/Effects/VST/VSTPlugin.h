@@ -1,17 +1,21 @@
 #pragma once
 
 #include "Core/BaseLib/PluginLibrary.h"
+#include "Main/AudioEngineController/Effects/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
 
 #include <QString>
 
 #include <atomic>
+#include <deque>
 #include <functional>
+#include <map>
 #include <memory>
 #include <vector>
 
 class VSTHost;
+struct VSTStoredParameter;
 
 /// The function that a plug-in calls to talk to its host.
 using VSTHostCallbackFunction = VstIntPtr (*)(AEffect *, VstInt32, VstInt32, VstIntPtr, void *, float);
@@ -24,7 +28,9 @@ struct VSTSubPlugin {
 
 /// The host's side of one VST 2 plug-in: its module, and the effect that the module's entry point handed out.
 /// Loading, probing and destruction happen on one thread; what the host callback calls may come from any.
-class VSTPlugin {
+/// Every call of the plug-in is guarded. One that committed a hardware fault is called no more, but for what
+/// is left of a probe.
+class VSTPlugin : public AudioPlugin {
 public:
     /// More sub-plug-ins than any shell has: an enumeration that goes on beyond is cut.
     static constexpr int kMaxSubPlugins = 4096;
@@ -35,9 +41,7 @@ public:
 
     explicit VSTPlugin(VSTHost &host);
     /// Releases the plug-in (`effClose` to every effect that the module handed out) and unloads its module.
-    ~VSTPlugin();
-    VSTPlugin(const VSTPlugin &) = delete;
-    VSTPlugin &operator=(const VSTPlugin &) = delete;
+    ~VSTPlugin() override;
 
     /// Loads the plug-in for probing. False when the module does not load, its entry point fails or its
     /// effect is none; `isPluginModule` becomes false when the module has no entry point, true otherwise.
@@ -53,30 +57,69 @@ public:
 
     void setCloseBracket(CloseBracket bracket) { m_closeBracket = std::move(bracket); }
 
-    const QString &name() const { return m_name; }
+    QString name() const override { return m_name; }
     /// Name, colon and unique id: the identifier in the catalogue.
     const QString &key() const { return m_key; }
-    /// The prefix of its format's identifiers.
-    static QString identifierPrefix();
+    QString identifierPrefix() const override;
+    QString formatIdentifier() const override { return m_key; }
     /// Identifier of the sub-plug-in that this object stands for, as the plug-in sees it; 0: none.
     VstInt32 shellId() const { return m_shellId; }
     /// True when it was loaded to be probed only.
     bool isProbe() const { return m_isProbe; }
 
-    /// What the host callback reports. None of these calls the plug-in.
+    void close() override;
+    /// Hands MIDI events over; false when the plug-in does not take any.
+    bool processEvents(VstEvents &events);
+    /// Announces how many samples will be processed in all, where that is known.
+    void setTotalSamples(qint64 samples);
+
+    /// 0 when the plug-in states a negative number.
+    VstInt32 programCount() const;
+    /// False for a program that is not there.
+    bool setProgram(VstInt32 index);
+    /// Of the current program.
+    QString programName();
+
+    /// The editor's place and size in pixels; nothing when the plug-in has none.
+    std::optional<QRect> editorRect();
+    /// Opens the editor in a window of the system; the window stays the caller's.
+    bool openEditor(void *window);
+    void closeEditor();
+    /// To be called some ten times a second while the plug-in is in use.
+    void idle();
+
+    /// As stated, which may be any number.
+    VstInt32 statedParameterCount() const;
+    /// The name as the plug-in has it, else "Param" and the number counted from 1. One thread at a time.
+    QString parameterName(VstInt32 index);
+
+    bool StorePreset(PluginPreset &preset) override;
+    bool LoadPreset(const PluginPreset &preset) override;
+
+    /// What the host callback reports.
     void setNeedsIdle() { m_needsIdle = true; }
     bool needsIdle() const { return m_needsIdle; }
     void setWantsMidi() { m_wantsMidi = true; }
     bool wantsMidi() const { return m_wantsMidi; }
-    void setRealtime(bool realtime) { m_isRealtime = realtime; }
-    bool isRealtime() const { return m_isRealtime; }
-    void ioChanged() { m_ioChanged = true; }
+    void ioChanged();
     bool hasIoChanged() const { return m_ioChanged; }
-    /// A plug-in being probed has no editor, and nobody listens to its parameters.
-    bool resizeEditor(VstInt32 /*width*/, VstInt32 /*height*/) { return false; }
-    void parameterChanged(VstInt32 /*index*/, float /*value*/) {}
-    void parameterEdit(VstInt32 /*index*/, bool /*begins*/) {}
-    void refreshDisplay() {}
+    /// True when the editor is open and a listener gave it that size.
+    bool resizeEditor(VstInt32 width, VstInt32 height);
+    void parameterChanged(VstInt32 index, float value);
+    void parameterEdit(VstInt32 index, bool begins);
+    void refreshDisplay();
+
+protected:
+    bool openPlugin(const AudioSettings &settings) override;
+    bool applySettings(const AudioSettings &settings) override;
+    bool startProcessing() override;
+    void stopProcessing() override;
+    ChannelSetup readChannels() override;
+    bool processBlock(ChannelBuffers &buffers, int frames) override
+    {
+        return m_effect.process(buffers, frames);
+    }
+    bool bypassPlugin(bool bypassed) override;
 
 private:
     /// An effect of the module, and the sub-plug-in it was made for (0: none).
@@ -94,6 +137,21 @@ private:
     VstInt32 statedCategory();
     void closeEffects();
     void unload();
+    /// Whether the plug-in may still be called.
+    bool isCallable() const { return m_effect.isHeld() && !m_effect.hasFaulted(); }
+    /// Dispatches to a plug-in that may still be called; whether it may be called after that.
+    bool send(VstInt32 opcode);
+    bool sendValue(VstInt32 opcode, VstIntPtr value);
+    bool canDo(const char *capability);
+    bool storeState(PluginPreset &preset);
+    bool storeParameters(PluginPreset &preset);
+    bool isLoadable(const PluginPreset &preset) const;
+    bool loadState(const PluginPreset &preset);
+    bool loadParameters(const PluginPreset &preset);
+    bool setParameters(const std::vector<VSTStoredParameter> &stored,
+                       std::map<QByteArray, std::deque<VstInt32>> &indexes);
+    /// Nothing, with a log line, when the stated number cannot be.
+    std::optional<VstInt32> parameterCount() const;
 
     VSTHost &m_host;
     PluginLibrary m_library;
@@ -110,6 +168,9 @@ private:
     int m_behaviour = 0;
     std::atomic<bool> m_needsIdle{false};
     std::atomic<bool> m_wantsMidi{false};
-    std::atomic<bool> m_isRealtime{false};
     std::atomic<bool> m_ioChanged{false};
+    std::atomic<bool> m_editorOpen{false};
+    bool m_effectOpened = false; ///< `effOpen` was sent to the effect at hand
+    bool m_canBypass = false;
+    bool m_takesMidi = false;
 };

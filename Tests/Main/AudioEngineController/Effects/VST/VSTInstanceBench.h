@@ -1,0 +1,39 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/VST2Fixture.h"
+
+#include <gtest/gtest.h>
+
+/// Loads scripted plug-ins for use and notes what they are called.
+class VSTInstanceBench : public testing::Test {
+protected:
+    static constexpr AudioSettings kSettings = {48000, 64};
+
+    /// A plug-in of that script, loaded; the calls of loading are forgotten.
+    std::unique_ptr<VSTPlugin> loaded(const QByteArray &script, const char *file = "Comp")
+    {
+        const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n";
+        EffectRecord record;
+        record.path = addVST2File(m_folder.plugins(), QString::fromUtf8(file), traced + script);
+        auto plugin = std::make_unique<VSTPlugin>(m_host);
+        EXPECT_TRUE(plugin->load(record, VSTHostCallback, 0));
+        takeTrace();
+        return plugin;
+    }
+    /// The calls since the last time, without the plug-in's name where it is "Comp".
+    QString takeTrace() const
+    {
+        const QStringList lines = m_folder.lines(QStringLiteral("trace"));
+        m_folder.write(QStringLiteral("trace"), {});
+        return lines.join(QStringLiteral("; ")).remove(QStringLiteral(" Comp"));
+    }
+
+    TestFolder m_folder;
+    const CapturedLog m_log;
+    VSTHost m_host;
+};

@@ -1,0 +1,235 @@
+#include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
+
+#include <functional>
+
+namespace {
+
+/// The calls of an opening.
+const QString kOpened =
+    QStringLiteral("open; opcode-10: 48000; opcode-11: 0 64; opcode-61: 0 2; opcode-51; opcode-51");
+
+class VSTInstance : public VSTInstanceBench {};
+
+/// Notes what it hears; for a change of channels, what the plug-in was called before, and its state.
+class Listener : public IAudioPluginListener {
+public:
+    explicit Listener(std::function<QString()> trace = [] { return QString(); })
+        : m_trace(std::move(trace))
+    {}
+    void pluginChanged(AudioPlugin &plugin) noexcept override
+    {
+        heard << QStringLiteral("%1 | %2 outputs%3")
+                     .arg(m_trace())
+                     .arg(plugin.channels().outputs.span())
+                     .arg(plugin.isRunning() ? " running" : "");
+    }
+    void displayChanged(AudioPlugin &) noexcept override { heard << QStringLiteral("display"); }
+    void parameterChanged(AudioPlugin &, quint32 id, double value) noexcept override
+    {
+        heard << QStringLiteral("parameter %1 %2").arg(id).arg(value);
+    }
+    void parameterEdit(AudioPlugin &, quint32 id, bool begins) noexcept override
+    {
+        heard << QStringLiteral("edit %1 %2").arg(id).arg(begins);
+    }
+    bool resizeEditor(AudioPlugin &, int width, int height) noexcept override
+    {
+        heard << QStringLiteral("size %1 %2").arg(width).arg(height);
+        return true;
+    }
+
+    QStringList heard;
+
+private:
+    std::function<QString()> m_trace;
+};
+
+} // namespace
+
+TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
+{
+    // Every operation in the order of a life, and the calls that the plug-in sees.
+    auto plugin = loaded("inputs 1\neditor 300 200\nanswer opcode-51 1\nparameter Gain 0.5\n"
+                         "ask-host process 14\nanswer opcode-53 1\n");
+    VstEvents events = {};
+    int window = 0;
+    const struct {
+        const char *name;
+        std::function<bool()> operation;
+        bool result;
+        QString calls;
+    } steps[] = {
+        {"start unopened", [&] { return plugin->start(); }, false, ""},
+        {"open", [&] { return plugin->open(kSettings); }, true, kOpened},
+        {"process unstarted", [&] { return plugin->process(1); }, false, ""},
+        {"start", [&] { return plugin->start(); }, true, "mains-changed: 0 1; opcode-71"},
+        {"start again", [&] { return plugin->start(); }, true, ""},
+        {"too large a block", [&] { return plugin->process(65); }, false, ""},
+        {"block", [&] { return plugin->process(64); }, true, "process: 64; host-14: 1"},
+        {"idle asked for", [&] { return plugin->idle(), plugin->needsIdle(); }, true, "opcode-53"},
+        {"other settings",
+         [&] {
+             return plugin->setAudioSettings({44100, 32});
+         },
+         true, "opcode-72; mains-changed; opcode-10: 44100; opcode-11: 0 32; mains-changed: 0 1; opcode-71"},
+        {"no settings",
+         [&] {
+             return plugin->setAudioSettings({0, 32});
+         },
+         false, ""},
+        {"program", [&] { return plugin->setProgram(0); }, true, "opcode-67; opcode-2; opcode-68"},
+        {"no such program", [&] { return plugin->setProgram(1); }, false, ""},
+        {"its name", [&] { return plugin->programName().isEmpty(); }, true, "opcode-5"},
+        {"bypass", [&] { return plugin->setBypass(true); }, true, "opcode-44: 0 1"},
+        {"no bypass", [&] { return plugin->setBypass(false); }, true, "opcode-44"},
+        {"events", [&] { return plugin->processEvents(events); }, true, "opcode-25"},
+        {"total", [&] { return plugin->setTotalSamples(7), true; }, true, "opcode-73: 0 7"},
+        {"editor's size", [&] { return plugin->editorRect() == QRect(0, 0, 300, 200); }, true, "opcode-13"},
+        {"editor", [&] { return plugin->openEditor(&window); }, true, "opcode-13; opcode-14"},
+        {"idle", [&] { return plugin->idle(), true; }, true, "opcode-53; edit-idle"},
+        {"close", [&] { return plugin->close(), true; }, true, "opcode-15; opcode-72; mains-changed"},
+        {"open again", [&] { return plugin->open(kSettings) && plugin->start(); }, true,
+         "opcode-10: 48000; opcode-11: 0 64; opcode-61: 0 2; opcode-51; opcode-51; mains-changed: 0 1; "
+         "opcode-71"},
+        {"destroy", [&] { return plugin.reset(), true; }, true,
+         "opcode-72; mains-changed; close; static-destructor"}};
+    for (const auto &step : steps) {
+        EXPECT_EQ(step.operation(), step.result) << step.name;
+        EXPECT_EQ(takeTrace(), step.calls) << step.name;
+    }
+}
+
+TEST_F(VSTInstance, ABlockGoesThroughTheBuffers)
+{
+    for (const char *flags : {"flags 0x10", "flags 0"}) { // replaces; adds to the outputs
+        auto plugin = loaded(QByteArray("inputs 1\n") + flags);
+        ASSERT_TRUE(plugin->open(kSettings) && plugin->start());
+        for (int block = 0; block < 2; ++block) {
+            plugin->buffers().inputs()[0][63] = 0.25f;
+            ASSERT_TRUE(plugin->process(64)) << flags;
+            EXPECT_EQ(plugin->buffers().outputs()[0][63], 0.25f) << flags;
+            EXPECT_EQ(plugin->buffers().outputs()[1][63], 1.0f) << flags;
+        }
+    }
+}
+
+TEST_F(VSTInstance, ChannelsAreRebuiltWhenThePluginSaysSo)
+{
+    const struct {
+        const char *name;
+        const char *script;
+        bool inBlock;      // else when a program is set
+        const char *heard; // at each change: the calls before it, and the state
+        const char *rest;  // the calls after the last
+    } cases[] = {
+        {"in a block: after it", "new-outputs process 5\nask-host process 13", true,
+         "process: 1; host-13: 0; opcode-72; mains-changed | 5 outputs", "mains-changed: 0 1; opcode-71"},
+        {"on another thread", "new-outputs opcode-2 5\nask-host opcode-2 13 from-thread", false,
+         "opcode-67; opcode-2; opcode-72; mains-changed | 5 outputs",
+         "mains-changed: 0 1; opcode-71; host-13: 0; opcode-68"},
+        {"again while it is stopped for that",
+         "new-outputs opcode-2 5\nask-host opcode-2 13\nask-host opcode-72 13", false,
+         "opcode-67; opcode-2; opcode-72 | 5 outputs / host-13: 0; mains-changed | 5 outputs",
+         "mains-changed: 0 1; opcode-71; host-13: 0; opcode-68"},
+        {"to what nobody has", "new-outputs opcode-2 2147483647\nask-host opcode-2 13", false,
+         "opcode-67; opcode-2; opcode-72; mains-changed | 2147483647 outputs", "host-13: 0; opcode-68"}};
+    for (const auto &row : cases) {
+        SCOPED_TRACE(row.name);
+        auto plugin = loaded(row.script);
+        ASSERT_TRUE(plugin->open(kSettings) && plugin->start());
+        takeTrace();
+        Listener listener([this] { return takeTrace(); });
+        plugin->addListener(&listener);
+        EXPECT_TRUE(row.inBlock ? plugin->process(1) : plugin->setProgram(0));
+        EXPECT_EQ(takeTrace(), QString::fromUtf8(row.rest));
+        EXPECT_EQ(listener.heard.join(QStringLiteral(" / ")), QString::fromUtf8(row.heard));
+        plugin->removeListener(&listener);
+    }
+}
+
+TEST_F(VSTInstance, NothingIsRebuiltWhileItIsTornDown)
+{
+    auto plugin = loaded("ask-host close 13\nask-host opcode-72 13");
+    Listener listener([this] { return takeTrace(); });
+    plugin->addListener(&listener);
+    ASSERT_TRUE(plugin->open(kSettings) && plugin->start());
+    takeTrace();
+    plugin.reset();
+    EXPECT_EQ(listener.heard, QStringList());
+    EXPECT_EQ(takeTrace(), QStringLiteral("opcode-72; host-13: 0; mains-changed; close; host-13: 0; "
+                                          "static-destructor"));
+}
+
+TEST_F(VSTInstance, AThreadOfThePluginMayAskForTheRebuildAllTheTime)
+{
+    auto plugin = loaded("new-outputs opcode-71 5\nask-host open 13 until-close\nown-thread");
+    ASSERT_TRUE(plugin->open(kSettings));
+    for (int round = 0; round < 50; ++round) {
+        ASSERT_TRUE(plugin->start());
+        plugin->process(64);
+        plugin->channels();
+        plugin->stop();
+    }
+    plugin->start();
+    plugin.reset();
+    EXPECT_TRUE(takeTrace().endsWith(QStringLiteral("; close; static-destructor")));
+}
+
+TEST_F(VSTInstance, ListenersHearWhatThePluginTells)
+{
+    auto plugin = loaded("editor 300 200\nask-host opcode-5 0 index 3 opt 0.5\nask-host opcode-5 43 index 3\n"
+                         "ask-host opcode-5 44 index 3\nask-host opcode-5 42\n"
+                         "ask-host opcode-5 15 index 640 value 480\n");
+    Listener listener;
+    plugin->addListener(&listener);
+    plugin->addListener(&listener);
+    ASSERT_TRUE(plugin->open(kSettings));
+    plugin->programName();
+    const QStringList heard = {"parameter 3 0.5", "edit 3 1", "edit 3 0", "display"};
+    EXPECT_EQ(listener.heard, heard) << "each once, and no size without an editor";
+    EXPECT_TRUE(plugin->openEditor(&listener));
+    listener.heard.clear();
+    plugin->programName();
+    EXPECT_EQ(listener.heard, heard + QStringList("size 640 480"));
+    plugin->removeListener(&listener);
+    plugin->programName();
+    EXPECT_EQ(listener.heard.size(), 5);
+}
+
+TEST_F(VSTInstance, AFaultEndsTheUse)
+{
+    const struct {
+        const char *stage;
+        QString calls; // from the opening to the end of the object
+        const char *line;
+    } cases[] = {{"open", "open", "VST plug-in call 0: SE Exception: Access Violation"},
+                 {"opcode-51", "open; opcode-10: 48000; opcode-11: 0 64; opcode-61: 0 2; opcode-51", ""},
+                 {"opcode-71", kOpened + "; mains-changed: 0 1; opcode-71", ""},
+                 {"process", kOpened + "; mains-changed: 0 1; opcode-71; process: 64",
+                  "Exception Caught in VST Plugin"}};
+    for (const auto &row : cases) {
+        SCOPED_TRACE(row.stage);
+        auto plugin = loaded(QByteArray("name Comp\nfault ") + row.stage + " segv", row.stage);
+        EXPECT_FALSE(plugin->open(kSettings) && plugin->start() && plugin->process(64));
+        EXPECT_FALSE(plugin->isRunning());
+        EXPECT_FALSE(plugin->setProgram(0) || plugin->setBypass(true) || plugin->start());
+        plugin.reset();
+        EXPECT_EQ(takeTrace(), row.calls);
+        EXPECT_TRUE(m_log.contains(QLatin1String(row.line)));
+    }
+    auto thrower = loaded("fault process throw-std");
+    EXPECT_TRUE(thrower->open(kSettings) && thrower->start());
+    EXPECT_FALSE(thrower->process(64));
+    EXPECT_FALSE(thrower->isRunning());
+    EXPECT_TRUE(thrower->start()) << "what throws is as it was";
+}
+
+TEST_F(VSTInstance, CountsThatCannotBeAreNotUsed)
+{
+    for (const char *script : {"outputs -1", "inputs -2147483648", "outputs 1025", "inputs 2147483647"}) {
+        auto plugin = loaded(script);
+        EXPECT_TRUE(plugin->open(kSettings)) << script;
+        EXPECT_FALSE(plugin->start()) << script;
+        EXPECT_TRUE(m_log.contains(QStringLiteral("cannot be used for audio")));
+    }
+}
