@@ -1,7 +1,9 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
 
+#include "Core/BaseLib/DebugLog.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3FolderScan.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 
 VST3Host::VST3Host()
     : AudioPluginHost(&vst3CatalogueFormat())
@@ -10,6 +12,18 @@ VST3Host::VST3Host()
 bool VST3Host::Scan(bool scan, bool inProcess)
 {
     return scan ? VST3FolderScan(*this).run() : AudioPluginHost::Scan(scan, inProcess);
+}
+
+LoadedPlugin VST3Host::loadPlugin(const QString &identifier)
+{
+    const std::optional<EffectRecord> record = findEffect(identifier);
+    if (!record || !record->enabled)
+        return {record.has_value(), nullptr};
+    auto plugin = std::make_unique<VST3Plugin>();
+    if (plugin->openClass(*record))
+        return {true, std::move(plugin)};
+    DebugLog(L"%ls (%ls) could not be loaded", record->name, identifier);
+    return {true, nullptr};
 }
 
 bool VST3Host::isMarkerWithoutRecord(const EffectRecord &marker) const

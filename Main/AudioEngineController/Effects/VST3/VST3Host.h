@@ -8,6 +8,7 @@ public:
     VST3Host();
 
     bool Scan(bool scan, bool inProcess) override;
+    LoadedPlugin loadPlugin(const QString &identifier) override;
 
 protected:
     bool isMarkerWithoutRecord(const EffectRecord &marker) const override;

@@ -3,14 +3,13 @@
 #include "Core/BaseLib/DebugLog.h"
 #include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 #include "Main/VLib/SimpleGUI.h"
 
-#include <pluginterfaces/base/smartpointer.h>
-
 #include <algorithm>
 #include <cstring>
-#include <limits>
 #include <set>
 #include <stdexcept>
 
@@ -24,25 +23,6 @@ constexpr int32 kManyClasses = 6;
 /// More classes than any module has. A factory that states more is only asked for these: two thousand million
 /// calls for classes that do not exist take minutes.
 constexpr int32 kMaxClasses = 0x10000;
-/// More buses than any plug-in has; what a plug-in states beyond is not believed.
-constexpr int32 kMaxBuses = 1024;
-
-/// Text of a fixed-size field, which need not be terminated; invalid UTF-8 is replaced.
-template <std::size_t Size>
-QString fixedText(const char8 (&field)[Size])
-{
-    return QString::fromUtf8(field, static_cast<int>(strnlen(field, Size)));
-}
-
-/// Asks for an interface; null when the object lacks it, whatever it answered.
-template <typename Interface>
-IPtr<Interface> queryFor(FUnknown *object)
-{
-    void *found = nullptr;
-    if (object->queryInterface(Interface::iid, &found) != kResultOk)
-        return nullptr;
-    return owned(static_cast<Interface *>(found));
-}
 
 /// What the factory's newer interfaces tell about a class; zeroed where the factory lacks them.
 PClassInfo2 classDetails(IPluginFactory *factory, int32 index)
@@ -57,14 +37,6 @@ PClassInfo2 classDetails(IPluginFactory *factory, int32 index)
         factory3->getClassInfoUnicode(index, &unicode);
     }
     return details;
-}
-
-QString factoryVendor(IPluginFactory *factory)
-{
-    PFactoryInfo info;
-    std::memset(static_cast<void *>(&info), 0, sizeof info);
-    factory->getFactoryInfo(&info);
-    return fixedText(info.vendor);
 }
 
 QString classIdText(const FUID &classId)
@@ -87,7 +59,7 @@ VST3Plugin::VST3Plugin()
     : m_hostContext(VST3HostContext::createOwned(nullptr))
 {}
 
-VST3Plugin::~VST3Plugin() { m_module.close(); }
+VST3Plugin::~VST3Plugin() { unload(); }
 
 void VST3Plugin::listClasses(ClassListing &records, const QString &path, bool notifyEachClass,
                              bool &factoryFound)
@@ -107,31 +79,41 @@ void VST3Plugin::openAndList(ClassListing &records, const QString &path, bool no
                              bool &factoryFound)
 {
     records.clear();
-    if (!m_module.open(path))
-        throw std::runtime_error("VST3 Exception: Failed to get load module:" + path.toStdString());
+    openModule(path);
     factoryFound = false;
     ProbeReport::stage(ProbeStage::Ask);
-    IPluginFactory *module = m_module.factory();
     // Not around the loading as well: what passes the system's loader ends the process.
-    callTranslated([&] { listModule(records, module, notifyEachClass, factoryFound); });
+    callTranslated([&] { listModule(records, notifyEachClass, factoryFound); });
 }
 
-void VST3Plugin::listModule(ClassListing &records, IPluginFactory *module, bool notifyEachClass,
-                            bool &factoryFound)
+void VST3Plugin::listModule(ClassListing &records, bool notifyEachClass, bool &factoryFound)
 {
+    IPluginFactory *const factory = queryFactory();
+    factoryFound = true;
+    listFactory(records, factory, notifyEachClass);
+}
+
+void VST3Plugin::openModule(const QString &path)
+{
+    if (!m_module.open(path))
+        throw std::runtime_error("VST3 Exception: Failed to get load module:" + path.toStdString());
+}
+
+IPluginFactory *VST3Plugin::queryFactory()
+{
+    IPluginFactory *const module = m_module.factory();
     void *factory = nullptr;
     if (!module || module->queryInterface(IPluginFactory::iid, &factory) != kResultOk || !factory) {
         ProbeReport::reason(m_module.exportsFactory() ? QStringLiteral("it gives no plug-in factory")
                                                       : QStringLiteral("it exports no \"GetPluginFactory\""));
         throw std::runtime_error("VST3 Exception: Failed to get factory function");
     }
-    factoryFound = true;
-    listFactory(records, static_cast<IPluginFactory *>(factory), notifyEachClass);
+    return static_cast<IPluginFactory *>(factory);
 }
 
 void VST3Plugin::listFactory(ClassListing &records, IPluginFactory *factory, bool notifyEachClass)
 {
-    FactoryView view{factory, factoryVendor(factory), {}};
+    FactoryView view{factory, vendorOf(*factory), {}};
     const int32 count = factory->countClasses();
     const std::size_t before = records.size();
     for (int32 index = 0; index < std::min(count, kMaxClasses); ++index)
@@ -187,7 +169,6 @@ void VST3Plugin::instantiate(ClassListing &records, const FactoryView &view, con
             formatText(L"its class \"%ls\" could not be initialised (result 0x%08X)", name, initialised));
         return;
     }
-    m_instantiated = true;
     records.push_back(describe(view, name, details));
     m_component->terminate();
     m_component->release();
@@ -199,8 +180,8 @@ EffectRecord VST3Plugin::describe(const FactoryView &view, const QString &name,
 {
     EffectRecord record;
     record.name = name;
-    record.inputs = channelCount(Vst::kInput);
-    record.outputs = channelCount(Vst::kOutput);
+    record.inputs = usedChannels(audioBuses(*m_component, Vst::kInput));
+    record.outputs = usedChannels(audioBuses(*m_component, Vst::kOutput));
     record.id = classIdText(m_classId);
     record.categories = fixedText(details.subCategories);
     record.category = categoryFromSubCategories(record.categories);
@@ -212,25 +193,4 @@ EffectRecord VST3Plugin::describe(const FactoryView &view, const QString &name,
         record.inputs = isInstrumentCategory(record.category) ? 0 : 2;
     }
     return record;
-}
-
-int32 VST3Plugin::channelCount(Vst::BusDirection direction) const
-{
-    int64 ofAll = 0;
-    int64 ofMain = 0;
-    bool hasMain = false;
-    const int32 buses = std::min(m_component->getBusCount(Vst::kAudio, direction), kMaxBuses);
-    for (int32 index = 0; index < buses; ++index) {
-        Vst::BusInfo info = {};
-        if (m_component->getBusInfo(Vst::kAudio, direction, index, info) != kResultOk)
-            continue;
-        const int64 channels = std::max<int32>(info.channelCount, 0);
-        ofAll += channels;
-        if (info.busType == Vst::kMain) {
-            hasMain = true;
-            ofMain += channels;
-        }
-    }
-    const int64 channels = hasMain ? ofMain : ofAll;
-    return static_cast<int32>(std::min<int64>(channels, std::numeric_limits<int32>::max()));
 }
