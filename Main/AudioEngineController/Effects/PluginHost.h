@@ -10,6 +10,8 @@
 #include <memory>
 #include <thread>
 
+class AudioPlugin;
+
 /// The registry: owns one host per plug-in format and scans with all of them.
 class PluginHost : public AudioPluginHost, public IntParameterHandler {
 public:
@@ -53,6 +55,11 @@ public:
     void setAudioSettings(int sampleRate, int blockSize) override;
     void setIntParameter(IntParameter parameter, int value) override;
 
+    /// Loads a plug-in by its identifier, whose prefix decides the host. A placeholder's gives the stand-in
+    /// for the plug-in that it names. Null, with the reason in the log, when no host knows it or it cannot be
+    /// loaded. Does not wait for a scan.
+    std::unique_ptr<AudioPlugin> LoadPlugin(const QString &identifier);
+
     /// Writes the list of folders to scan. Only the workstation does; the scanner reads it.
     void WriteScanList() const;
 
@@ -78,6 +85,7 @@ public:
     AudioPluginHost &vst3Host() { return *m_hosts[1]; }
 
 private:
+    AudioPluginHost *hostOfPrefix(const QString &prefix);
     bool scanHosts(bool scan);
     void startLauncher();
     void launch();

@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Instance.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3State.h"
 
@@ -15,7 +16,7 @@ template <typename Step>
 void closeStep(Step step)
 {
     try {
-        step();
+        callTranslated(step);
     } catch (const std::exception &error) {
         DebugLog(L"Closing the instance, the plug-in threw: %s", error.what());
     } catch (...) {

@@ -75,6 +75,7 @@ private:
     /// A reference to the module's factory; throws std::runtime_error when there is none that is usable.
     Steinberg::IPluginFactory *queryFactory();
     bool openInstance(const EffectRecord &record);
+    bool instantiate(const EffectRecord &record);
     /// Ends the instance, then the module.
     void unload();
     template <typename Call>

@@ -1,4 +1,5 @@
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/PluginIdentifier.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
@@ -51,6 +52,12 @@ bool VST3Plugin::openInstance(const EffectRecord &record)
     m_classId = classIdOf(record.id);
     if (!m_classId.isValid())
         DebugLog(L"'%ls' is no class identifier", record.id);
+    // Not around the loading as well: what passes the system's loader ends the process.
+    return callTranslated([&] { return instantiate(record); });
+}
+
+bool VST3Plugin::instantiate(const EffectRecord &record)
+{
     IPluginFactory *const factory = queryFactory();
     const bool created = m_classId.isValid() && m_instance.create(factory, m_classId, *m_hostContext);
     if (created) {
@@ -79,7 +86,7 @@ template <typename Call>
 bool VST3Plugin::callPlugin(const char *what, Call &&call)
 {
     try {
-        return call();
+        return callTranslated(call);
     } catch (const std::exception &error) {
         DebugLog(L"%ls: to %s it, the plug-in threw: %s", m_record.name, what, error.what());
     } catch (...) {

@@ -1,0 +1,123 @@
+#include "Core/BaseLib/PluginLibrary.h"
+#include "Main/AudioEngineController/Effects/AudioPlugin.h"
+#include "Main/AudioEngineController/Effects/PluginHost.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/QtPrinters.h"
+
+#include <QDir>
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+
+// Takes every plug-in of this machine through its use: loaded by identifier, opened, run, its state stored
+// and loaded, closed. Plug-ins of other folders: FXPROBE_TOUR_VST3 and FXPROBE_TOUR_VST.
+
+namespace {
+
+class InstanceTour : public testing::Test {
+protected:
+    static QDir folder(const char *variable, const char *standard)
+    {
+        const QString given = qEnvironmentVariable(variable);
+        return QDir(given.isEmpty() ? QString::fromUtf8(standard) : given);
+    }
+
+    /// The files of a folder, in memory for the rest of the process if that is asked for.
+    static QFileInfoList modules(const QDir &folder, const QStringList &patterns)
+    {
+        const QFileInfoList files = folder.entryInfoList(patterns);
+        for (const QFileInfo &file : files) {
+            QString reason;
+            PluginLibrary library;
+            const QString binary =
+                file.isDir() ? VST3ModuleFile::binary(file.filePath(), reason) : file.filePath();
+            if (qEnvironmentVariableIsSet("FXPROBE_TOUR_KEEPS_MODULES") && library.load(binary))
+                library.leaveMapped();
+        }
+        return files;
+    }
+
+    void tour(AudioPluginHost &host, const QString &prefix)
+    {
+        const std::vector<EffectRecord> records = host.effects();
+        for (const EffectRecord &record : records) {
+            SCOPED_TRACE(record.path.toStdString());
+            const auto plugin = m_registry.LoadPlugin(prefix + record.id);
+            ASSERT_TRUE(plugin) << m_log.lines().join('\n').toStdString();
+            EXPECT_EQ(plugin->identifier(), prefix + record.id);
+            use(*plugin);
+        }
+        if (records.empty())
+            GTEST_SKIP() << "no plug-ins on this machine";
+    }
+
+    void use(AudioPlugin &plugin)
+    {
+        ASSERT_TRUE(plugin.open({48000, 256}) && plugin.start());
+        process(plugin);
+        PluginPreset stored;
+        ASSERT_TRUE(plugin.StorePreset(stored));
+        EXPECT_TRUE(plugin.LoadPreset(stored)) << m_log.lines().last().toStdString();
+        process(plugin);
+        PluginPreset again;
+        EXPECT_TRUE(plugin.StorePreset(again));
+        EXPECT_EQ(again.data, stored.data) << "the same bytes";
+        EXPECT_TRUE(plugin.setAudioSettings({96000, 64}));
+        process(plugin);
+        plugin.close();
+        EXPECT_FALSE(plugin.isRunning());
+    }
+
+    /// A block of one loud sample; what comes out must be numbers.
+    static void process(AudioPlugin &plugin)
+    {
+        ChannelBuffers &buffers = plugin.buffers();
+        for (std::size_t channel = 0; channel < buffers.inputCount(); ++channel)
+            buffers.inputs()[channel][0] = 0.9f;
+        ASSERT_TRUE(plugin.process(buffers.frames()));
+        for (std::size_t channel = 0; channel < buffers.outputCount(); ++channel)
+            EXPECT_TRUE(std::isfinite(buffers.outputs()[channel][buffers.frames() - 1]));
+    }
+
+    const CapturedLog m_log;
+    PluginHost m_registry;
+};
+
+} // namespace
+
+TEST_F(InstanceTour, OfTheVST3Plugins)
+{
+    const QDir plugins = folder("FXPROBE_TOUR_VST3", FXPROBE_REAL_PLUGIN_FOLDER "/vst3");
+    for (const QFileInfo &file : modules(plugins, {QStringLiteral("*.vst3")})) {
+        ClassListing listed;
+        bool factoryFound = true;
+        VST3Plugin().listClasses(listed, file.filePath(), false, factoryFound);
+        for (EffectRecord &record : listed) {
+            record.path = file.filePath();
+            m_registry.vst3Host().AddEffect(record);
+        }
+    }
+    tour(m_registry.vst3Host(), QStringLiteral("vst3:"));
+}
+
+TEST_F(InstanceTour, OfTheVST2Plugins)
+{
+    const QDir plugins = folder("FXPROBE_TOUR_VST", FXPROBE_REAL_PLUGIN_FOLDER "/vst");
+    for (const QFileInfo &file : modules(plugins, {QStringLiteral("*.so"), QStringLiteral("*.dll")})) {
+        VSTPlugin plugin(VSTHost::instance());
+        bool isPluginModule = false;
+        EffectRecord record;
+        record.path = file.filePath();
+        if (!plugin.load(record.path, VSTHostCallback, isPluginModule))
+            continue;
+        plugin.readInto(record);
+        m_registry.vst2Host().AddEffect(record);
+    }
+    tour(m_registry.vst2Host(), QStringLiteral("vst2:"));
+}

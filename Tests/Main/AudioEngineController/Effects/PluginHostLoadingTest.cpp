@@ -1,0 +1,84 @@
+#include "Main/AudioEngineController/Effects/AudioPlugin.h"
+#include "Main/AudioEngineController/Effects/PluginHost.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/VST2Fixture.h"
+#include "Tests/Support/VST3Fixture.h"
+
+#include <gtest/gtest.h>
+
+TEST(PluginHostLoading, ThePrefixDecidesTheHost)
+{
+    const TestFolder folder;
+    PluginHost registry;
+    const auto list = [](AudioPluginHost &host, const QString &path, const char *id, bool enabled = true) {
+        EffectRecord record;
+        record.path = path;
+        record.name = record.id = QString::fromUtf8(id);
+        record.enabled = enabled;
+        EXPECT_TRUE(host.AddEffect(record));
+    };
+    const char classId[] = "00112233445566778899AABBCCDDEEFF";
+    const QString vst3 =
+        addVST3File(folder.plugins(), QStringLiteral("C"), QByteArray("class C\nid ") + classId);
+    const QString vst2 = addVST2File(folder.plugins(), QStringLiteral("Q"), "name Q\nid 7\n");
+    list(registry.vst3Host(), vst3, classId);
+    list(registry.vst3Host(), vst3, "FF112233445566778899AABBCCDDEEFF");
+    list(registry.vst3Host(), vst3, "Off", false);
+    list(registry.vst2Host(), vst2, "Q:7");
+    const struct {
+        const char *identifier;
+        const char *loaded; // the identifier of what came; null: nothing
+        bool isKnown;
+    } cases[] = {{"vst3:00112233445566778899AABBCCDDEEFF", "vst3:00112233445566778899AABBCCDDEEFF", true},
+                 {"vst2:Q:7", "vst2:Q:7", true},
+                 {"vst2:Waves Q:7", "vst2:Q:7", true},
+                 {"placeholder:vst2:Gone:1", "placeholder:vst2:Gone:1", true},
+                 {"vst3:FF112233445566778899AABBCCDDEEFF", nullptr, true},
+                 {"vst3:Off", nullptr, true},
+                 {"vst3:Q:7", nullptr, false},
+                 {"vst2:00112233445566778899AABBCCDDEEFF", nullptr, false},
+                 {"VST2:Q:7", nullptr, false},
+                 {"Q:7", nullptr, false},
+                 {"au:Q:7", nullptr, false},
+                 {"mrl:Q:7", nullptr, false},
+                 {"placeholder:", nullptr, false},
+                 {"", nullptr, false}};
+    for (const auto &row : cases) {
+        SCOPED_TRACE(row.identifier);
+        const CapturedLog log;
+        const auto plugin = registry.LoadPlugin(QString::fromUtf8(row.identifier));
+        EXPECT_EQ(plugin ? plugin->identifier() : QString(), QString::fromUtf8(row.loaded));
+        EXPECT_EQ(log.lines().contains(QLatin1String("PluginHost::LoadPlugin - Failed to Find Effect: ") +
+                                       row.identifier),
+                  !row.isKnown);
+    }
+}
+
+TEST(PluginHostLoading, APlaceholderKeepsTheStateOfWhatIsMissing)
+{
+    PluginHost registry;
+    const auto plugin = registry.LoadPlugin(QStringLiteral("placeholder:vst2:Gone:1"));
+    ASSERT_TRUE(plugin);
+    PluginPreset preset;
+    EXPECT_FALSE(plugin->StorePreset(preset)) << "nothing was given to keep";
+    preset.identifier = QStringLiteral("vst2:Gone:2");
+    EXPECT_FALSE(plugin->LoadPreset(preset)) << "of another";
+    preset.identifier = QStringLiteral("vst2:Gone:1");
+    preset.data = QByteArray("a\0b", 3);
+    preset.name = "Gone";
+    preset.flags = 0x12C0007;
+    preset.firstChannels = {2, -5};
+    preset.channelSpans = {4, 2147483647};
+    EXPECT_TRUE(plugin->LoadPreset(preset));
+    PluginPreset kept;
+    EXPECT_TRUE(plugin->StorePreset(kept));
+    EXPECT_EQ(kept.data, preset.data);
+    EXPECT_EQ(kept.identifier, preset.identifier);
+    EXPECT_EQ(kept.flags, preset.flags);
+    EXPECT_EQ(kept.channelSpans, preset.channelSpans);
+    EXPECT_EQ(plugin->name(), QStringLiteral("Gone"));
+    EXPECT_EQ(plugin->channels().inputs.first, 2);
+    EXPECT_EQ(plugin->channels().inputs.span(), 4);
+    EXPECT_EQ(plugin->channels().outputs.span(), AudioPlugin::kMaxChannels) << "what a file says is checked";
+}
