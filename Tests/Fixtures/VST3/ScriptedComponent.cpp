@@ -56,9 +56,8 @@ tresult ScriptedComponent::queryInterface(const TUID interfaceId, void **object)
     expectAlive("queryInterface");
     *object = nullptr;
     if (FUnknownPrivate::iidEqual(interfaceId, FUnknown::iid) ||
-        FUnknownPrivate::iidEqual(interfaceId, IPluginBase::iid))
-        *object = static_cast<Vst::IComponent *>(this);
-    else if (FUnknownPrivate::iidEqual(interfaceId, Vst::IComponent::iid) && isComponent())
+        FUnknownPrivate::iidEqual(interfaceId, IPluginBase::iid) ||
+        (FUnknownPrivate::iidEqual(interfaceId, Vst::IComponent::iid) && isComponent()))
         *object = static_cast<Vst::IComponent *>(this);
     else if (FUnknownPrivate::iidEqual(interfaceId, Vst::IEditController::iid) && isController())
         *object = static_cast<Vst::IEditController *>(this);

@@ -51,7 +51,7 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
     // Every operation in the order of a life, and the calls that the plug-in sees.
     auto plugin = loaded("inputs 1\neditor 300 200\nanswer opcode-51 1\nparameter Gain 0.5\n"
                          "ask-host process 14\nanswer opcode-53 1\n");
-    VstEvents events = {};
+    const auto events = std::make_unique<VstEvents>();
     int window = 0;
     const struct {
         const char *name;
@@ -82,7 +82,7 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
         {"its name", [&] { return plugin->programName().isEmpty(); }, true, "opcode-5"},
         {"bypass", [&] { return plugin->setBypass(true); }, true, "opcode-44: 0 1"},
         {"no bypass", [&] { return plugin->setBypass(false); }, true, "opcode-44"},
-        {"events", [&] { return plugin->processEvents(events); }, true, "opcode-25"},
+        {"events", [&] { return plugin->processEvents(*events); }, true, "opcode-25"},
         {"total", [&] { return plugin->setTotalSamples(7), true; }, true, "opcode-73: 0 7"},
         {"editor's size", [&] { return plugin->editorRect() == QRect(0, 0, 300, 200); }, true, "opcode-13"},
         {"editor", [&] { return plugin->openEditor(&window); }, true, "opcode-13; opcode-14"},
