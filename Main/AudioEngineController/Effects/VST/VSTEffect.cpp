@@ -25,9 +25,10 @@ QByteArray textIn(const QByteArray &buffer, int size)
     return buffer.left(static_cast<int>(strnlen(buffer.constData(), static_cast<std::size_t>(size))));
 }
 
-/// Copies byte by byte. What a plug-in names as its own may lie anywhere in the process, so the sanitizer has
-/// no say in it; where nothing is mapped, the guard around catches the fault.
-__attribute__((no_sanitize_address)) void copyBytes(char *target, const volatile char *source, int size)
+/// Copies byte by byte. What a plug-in names as its own may lie anywhere in the process, so the sanitizers
+/// have no say in it; where nothing is mapped, the guard around catches the fault.
+__attribute__((no_sanitize_address, no_sanitize_thread)) void copyBytes(char *target,
+                                                                        const volatile char *source, int size)
 {
     for (int index = 0; index < size; ++index)
         target[index] = source[index];
