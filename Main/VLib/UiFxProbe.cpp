@@ -28,19 +28,26 @@ constexpr int kHeight = 80;
 constexpr int kTickMilliseconds = 50;
 constexpr std::chrono::milliseconds kPollInterval(10);
 
-/// Calls back when it goes out of scope, also while the stack is unwound.
-template <typename Callback>
-class AtScopeEnd {
+/// Calls back at the end of its thread. A plug-in may end the thread in the middle of the scan.
+class AtThreadEnd {
 public:
-    explicit AtScopeEnd(Callback callback)
+    explicit AtThreadEnd(std::function<void()> callback)
         : m_callback(std::move(callback))
     {}
-    ~AtScopeEnd() { m_callback(); }
-    AtScopeEnd(const AtScopeEnd &) = delete;
-    AtScopeEnd &operator=(const AtScopeEnd &) = delete;
+    ~AtThreadEnd()
+    {
+        if (!m_scanReturned)
+            DebugLog(L"The scan's thread was ended by a plug-in");
+        m_callback();
+    }
+    AtThreadEnd(const AtThreadEnd &) = delete;
+    AtThreadEnd &operator=(const AtThreadEnd &) = delete;
+
+    void noteReturn() { m_scanReturned = true; }
 
 private:
-    Callback m_callback;
+    std::function<void()> m_callback;
+    bool m_scanReturned = false;
 };
 
 /// With the screen the user's session is over: the scan ends as on any other request, and no plug-in is to
@@ -161,18 +168,18 @@ void UiFxProbe::setUpProgressBar()
 // The exception of a forced unwind has no object, so the reference to it is null; that is the compiler's way.
 [[gnu::no_sanitize("null")]] void UiFxProbe::runScan(const std::function<void(const QString &)> &scanRun)
 {
-    const AtScopeEnd finished([this] { markFinished(); });
+    // The thread's, not this scope's: the end of a thread on Windows unwinds no stack.
+    thread_local AtThreadEnd finished([this] { markFinished(); });
     try {
         scanRun(m_dataFolder);
     } catch (const abi::__forced_unwind &) {
-        // A plug-in ends the thread with pthread_exit; to swallow that would abort the process.
-        DebugLog(L"The scan's thread was ended by a plug-in");
-        throw;
+        throw; // to swallow the end of a POSIX thread would abort the process
     } catch (const std::exception &exception) {
         DebugLog(L"The scan ended with an exception: %s", exception.what());
     } catch (...) {
         DebugLog(L"The scan ended with an unknown exception");
     }
+    finished.noteReturn();
 }
 
 void UiFxProbe::markFinished()

@@ -11,6 +11,7 @@
 #include <string>
 
 #include <objbase.h>
+#include <xmmintrin.h>
 
 namespace {
 
@@ -62,6 +63,7 @@ struct ProcessState::Snapshot {
     LCID threadLocale = GetThreadLocale();
     bool apartment = hasApartment();
     std::fenv_t floatingPoint = {};
+    unsigned vectorControl = _mm_getcsr(); // which this platform's fesetenv leaves alone
 };
 
 ProcessState::ProcessState()
@@ -91,6 +93,7 @@ void ProcessState::restore() const
         std::setlocale(LC_ALL, m_snapshot->locale.c_str());
     SetThreadLocale(m_snapshot->threadLocale);
     std::fesetenv(&m_snapshot->floatingPoint);
+    _mm_setcsr(m_snapshot->vectorControl);
     SetDllDirectoryW(m_snapshot->libraries.empty() ? nullptr : m_snapshot->libraries.c_str());
     if (!SetCurrentDirectoryW(m_snapshot->folder.c_str()))
         DebugLog(L"Cannot return to the working folder: %ls", systemMessage(GetLastError()));
