@@ -1,3 +1,8 @@
+# fxprobe_screenless(TARGET): a program that is linked with a static toolkit brings the platform along that needs no screen.
+function(fxprobe_screenless target)
+    qt5_import_plugins(${target} INCLUDE Qt5::QOffscreenIntegrationPlugin)
+endfunction()
+
 # fxprobe_windows_program(TARGET DESCRIPTION): gives a program its version, icon and manifest. Does nothing on other
 # systems.
 function(fxprobe_windows_program target description)

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <thread>
+
 /// Makes the calling thread one that plug-ins can run on, for as long as the object lives: on Windows they
 /// rely on a COM apartment of a single thread.
 class PluginThread {
@@ -12,6 +14,10 @@ public:
     /// Delivers the messages of windows and COM objects that wait for the calling thread, which none of our
     /// own event loops does: left lying, those of one plug-in would be delivered by the next one.
     static void deliverMessages();
+
+    /// Whether a plug-in ended the thread in a way that runs nothing of ours: Windows unwinds no stack for
+    /// it.
+    static bool hasEndedAlone(std::thread &thread);
 
 private:
     bool m_prepared = false;

@@ -1,6 +1,7 @@
 #include "Main/VLib/UiFxProbe.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/PluginThread.h"
 #include "Core/BaseLib/ProcessSetup.h"
 #include "Core/BaseLib/TerminationRequest.h"
 #include "Main/VLib/FxProbeUI.h"
@@ -27,27 +28,21 @@ constexpr int kWidth = 333;
 constexpr int kHeight = 80;
 constexpr int kTickMilliseconds = 50;
 constexpr std::chrono::milliseconds kPollInterval(10);
+constexpr wchar_t kThreadEnded[] = L"The scan's thread was ended by a plug-in";
 
-/// Calls back at the end of its thread. A plug-in may end the thread in the middle of the scan.
-class AtThreadEnd {
+/// Calls back when it goes out of scope, also while the stack is unwound.
+template <typename Callback>
+class AtScopeEnd {
 public:
-    explicit AtThreadEnd(std::function<void()> callback)
+    explicit AtScopeEnd(Callback callback)
         : m_callback(std::move(callback))
     {}
-    ~AtThreadEnd()
-    {
-        if (!m_scanReturned)
-            DebugLog(L"The scan's thread was ended by a plug-in");
-        m_callback();
-    }
-    AtThreadEnd(const AtThreadEnd &) = delete;
-    AtThreadEnd &operator=(const AtThreadEnd &) = delete;
-
-    void noteReturn() { m_scanReturned = true; }
+    ~AtScopeEnd() { m_callback(); }
+    AtScopeEnd(const AtScopeEnd &) = delete;
+    AtScopeEnd &operator=(const AtScopeEnd &) = delete;
 
 private:
-    std::function<void()> m_callback;
-    bool m_scanReturned = false;
+    Callback m_callback;
 };
 
 /// With the screen the user's session is over: the scan ends as on any other request, and no plug-in is to
@@ -105,7 +100,7 @@ UiFxProbe::~UiFxProbe()
     m_status->setClosing();
     // A plug-in may be waiting for this thread to answer a message; without events the join would never end.
     // On the worker itself nothing is waited for: there the join reports the mistake.
-    while (!m_status->isFinished() && std::this_thread::get_id() != m_worker.get_id())
+    while (!isScanOver() && std::this_thread::get_id() != m_worker.get_id())
         QCoreApplication::processEvents(QEventLoop::WaitForMoreEvents);
     if (m_worker.joinable())
         m_worker.join();
@@ -168,18 +163,18 @@ void UiFxProbe::setUpProgressBar()
 // The exception of a forced unwind has no object, so the reference to it is null; that is the compiler's way.
 [[gnu::no_sanitize("null")]] void UiFxProbe::runScan(const std::function<void(const QString &)> &scanRun)
 {
-    // The thread's, not this scope's: the end of a thread on Windows unwinds no stack.
-    thread_local AtThreadEnd finished([this] { markFinished(); });
+    const AtScopeEnd finished([this] { markFinished(); });
     try {
         scanRun(m_dataFolder);
     } catch (const abi::__forced_unwind &) {
-        throw; // to swallow the end of a POSIX thread would abort the process
+        // A plug-in ends the thread with pthread_exit; to swallow that would abort the process.
+        DebugLog(kThreadEnded);
+        throw;
     } catch (const std::exception &exception) {
         DebugLog(L"The scan ended with an exception: %s", exception.what());
     } catch (...) {
         DebugLog(L"The scan ended with an unknown exception");
     }
-    finished.noteReturn();
 }
 
 void UiFxProbe::markFinished()
@@ -188,6 +183,16 @@ void UiFxProbe::markFinished()
     // The destructor may be asleep until the next event.
     if (auto *dispatcher = QAbstractEventDispatcher::instance(thread()))
         dispatcher->wakeUp();
+}
+
+bool UiFxProbe::isScanOver()
+{
+    // In this order: a scan that returns is finished before its thread has ended.
+    if (PluginThread::hasEndedAlone(m_worker) && !m_status->isFinished()) {
+        DebugLog(kThreadEnded);
+        m_status->setFinished();
+    }
+    return m_status->isFinished();
 }
 
 void UiFxProbe::run(QCoreApplication &application, bool defaultPath)
@@ -208,7 +213,7 @@ void UiFxProbe::OnTimer()
 {
     if (m_closed)
         return;
-    if (m_status->isFinished()) {
+    if (isScanOver()) {
         close();
         return;
     }

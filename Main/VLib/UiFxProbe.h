@@ -70,6 +70,8 @@ private:
     void setUpProgressBar();
     void runScan(const std::function<void(const QString &)> &scanRun);
     void markFinished();
+    /// Also notices that a plug-in ended the thread.
+    bool isScanOver();
     void showWindow();
     void showPendingStatus();
     void endEventLoop();

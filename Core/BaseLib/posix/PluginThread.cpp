@@ -2,4 +2,5 @@
 
 PluginThread::PluginThread() = default;
 PluginThread::~PluginThread() = default;
+bool PluginThread::hasEndedAlone(std::thread &) { return false; }
 void PluginThread::deliverMessages() {}

@@ -1,6 +1,7 @@
 #include "Core/BaseLib/PluginThread.h"
 
 #include <objbase.h>
+#include <pthread.h>
 
 namespace {
 /// A window that is never painted asks for it without end.
@@ -26,4 +27,12 @@ void PluginThread::deliverMessages()
         TranslateMessage(&message);
         DispatchMessageW(&message);
     }
+}
+
+bool PluginThread::hasEndedAlone(std::thread &thread)
+{
+    if (!thread.joinable())
+        return false;
+    auto *handle = static_cast<HANDLE>(pthread_gethandle(thread.native_handle()));
+    return WaitForSingleObject(handle, 0) == WAIT_OBJECT_0;
 }

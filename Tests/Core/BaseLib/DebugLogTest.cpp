@@ -30,6 +30,16 @@ struct ThrowingText {
     operator QString() const { throw std::runtime_error("no text"); }
 };
 
+/// As the system keeps it: qputenv takes what one code page of Windows can say.
+void setEnvironment(const char *name, const QString &value)
+{
+#ifdef _WIN32
+    _wputenv_s(QString::fromLatin1(name).toStdWString().c_str(), value.toStdWString().c_str());
+#else
+    qputenv(name, value.toUtf8());
+#endif
+}
+
 class FormatText : public testing::TestWithParam<const char *> {};
 
 } // namespace
@@ -132,7 +142,7 @@ TEST(DebugLog, LinesOfSeveralThreadsStayWholeInTheFileThatTheEnvironmentNames)
 {
     const CapturedLog log;
     const EmptyFolder folder;
-    qputenv("FXPROBE_LOG", folder.write("音.log"_q, QByteArray("earlier run") + kLineEnd).toUtf8());
+    setEnvironment("FXPROBE_LOG", folder.write("音.log"_q, QByteArray("earlier run") + kLineEnd));
     qputenv("FXPROBE_TRACE", "1");
     configureLogFromEnvironment();
     qunsetenv("FXPROBE_LOG");
