@@ -2,8 +2,8 @@
 # A Wine of its own for one run, with a screen of its own. Sourced after lib.sh, never run.
 
 export WINEDEBUG=-all
-# Neither the .NET nor the HTML engine is needed, nor entries in anybody's menu; without this, Wine asks about them.
-export WINEDLLOVERRIDES='mscoree=;mshtml=;winemenubuilder.exe='
+# Neither the .NET nor the HTML engine is needed, nor entries in anybody's menu, nor a debugger at a crash; without this, Wine
+export WINEDLLOVERRIDES='mscoree=;mshtml=;winemenubuilder.exe=;winedbg.exe='
 
 wine_folder=''
 screen=''
@@ -28,7 +28,8 @@ start_wine() {
 }
 
 prepare_wine() {
-    wine wineboot --init && wineserver --wait && wineserver --persistent
+    # The server outlives this step, so it must not hold on to its output.
+    wine wineboot --init && wineserver --wait && wineserver --persistent >/dev/null 2>&1
 }
 
 # shellcheck disable=SC2317 # called by the trap
