@@ -44,6 +44,8 @@ FileResult replaceFile(const QString &path, const QByteArray &content, Durabilit
     if (exists && !existing.isFile())
         return writeDirectly(target, content, durability);
     if (exists) {
+        if (!existing.isWritable())
+            return {QStringLiteral("it is write-protected")};
         QFile probe(target);
         if (!probe.open(QIODevice::WriteOnly | QIODevice::Append))
             return {probe.errorString()};

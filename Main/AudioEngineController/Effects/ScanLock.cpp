@@ -31,6 +31,10 @@ ScanLock::ScanLock(const QString &effectsFolder, Role role)
     m_file.setStaleLockTime(kStaleAfter);
     if (m_file.tryLock())
         return;
+    // A lock that no process holds open cannot be somebody's, also when a process has the number that it
+    // states: numbers are used again, and soon by the next scanner. One that is held open cannot be removed.
+    if (m_file.removeStaleLockFile() && m_file.tryLock())
+        return;
     m_heldByOther = m_file.error() == QLockFile::LockFailedError;
     if (!m_heldByOther)
         DebugLog(L"Cannot make the lock %ls; scanning without it", lockPath(effectsFolder, role));

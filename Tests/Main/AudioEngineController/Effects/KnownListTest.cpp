@@ -76,7 +76,9 @@ TEST(KnownList, WhichRecordSpeaksForAFile)
         {"another path's crash does not come before this path",
          {known(kThere, "crashed", false, false), known(kHere, "class")},
          {"class", "crashed"}},
-        {"file names are compared with their case", {known(QStringLiteral("/here/x.vst3"), "1")}, {}},
+        {"file names of another case are others where the file system tells them apart",
+         {known(QStringLiteral("/here/x.vst3"), "1")},
+         kPathCase == Qt::CaseSensitive ? QStringList() : QStringList("1")},
     };
     for (const auto &row : rows) {
         KnownList list;
