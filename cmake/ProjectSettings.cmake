@@ -28,7 +28,10 @@ endif()
 function(fxprobe_target target)
     target_compile_options(${target} PRIVATE -Wall -Wextra -Wconversion -Wshadow -Werror)
     # Messages name sources by their place in the tree, not by their place on the machine that built them.
-    target_compile_options(${target} PRIVATE "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=")
+    # The compiler cache hands paths over as seen from the build folder.
+    file(RELATIVE_PATH source_from_build "${PROJECT_BINARY_DIR}" "${PROJECT_SOURCE_DIR}/")
+    target_compile_options(${target} PRIVATE "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/="
+                           "-fmacro-prefix-map=${source_from_build}=")
     target_include_directories(${target} PUBLIC "${PROJECT_SOURCE_DIR}")
     if(FXPROBE_SANITIZE)
         target_compile_options(${target} PRIVATE -fsanitize=${FXPROBE_SANITIZE}

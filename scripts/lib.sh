@@ -8,6 +8,9 @@ export LC_ALL=C.UTF-8
 
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 
+# Clones share what was compiled.
+export CCACHE_BASEDIR=$root CCACHE_NOHASHDIR=1
+
 fail() {
     printf '%s: %s\n' "${0##*/}" "$*" >&2
     exit 1

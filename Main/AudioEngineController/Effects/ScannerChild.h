@@ -10,8 +10,6 @@ public:
 
     /// To be called when the process has started: from now on it ends with this process.
     void tieToThisProcess();
-    /// Asks the process to end; false when there is no way to ask.
-    bool requestEnd();
 
     /// In words, what ended a process that crashed; `code` is what `exitCode()` gave.
     static QString crashText(int code);

@@ -53,7 +53,8 @@ void ScannerProcess::end()
 {
     if (m_child->state() == QProcess::NotRunning)
         return;
-    if (!m_child->requestEnd() || !waitForFinished(kPatience))
+    m_child->terminate(); // SIGTERM, or WM_CLOSE to its windows, of which it has one for this
+    if (!waitForFinished(kPatience))
         kill();
 }
 

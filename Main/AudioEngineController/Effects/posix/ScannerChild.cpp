@@ -19,12 +19,6 @@ void ScannerChild::setupChildProcess()
 
 void ScannerChild::tieToThisProcess() {}
 
-bool ScannerChild::requestEnd()
-{
-    terminate();
-    return true;
-}
-
 // NOTE: Qt documents no exit code for a crashed process; on these platforms Qt 5 puts the signal there.
 QString ScannerChild::crashText(int code)
 {

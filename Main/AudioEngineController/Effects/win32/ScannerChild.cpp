@@ -34,12 +34,6 @@ void ScannerChild::tieToThisProcess()
     CloseHandle(process);
 }
 
-bool ScannerChild::requestEnd()
-{
-    // Reaches a scanner that shares our console; without one nobody can ask.
-    return GenerateConsoleCtrlEvent(CTRL_BREAK_EVENT, static_cast<DWORD>(processId())) != 0;
-}
-
 QString ScannerChild::crashText(int code)
 {
     const auto status = static_cast<quint32>(code);
