@@ -10,6 +10,7 @@
 #include <QRegularExpression>
 
 #include <algorithm>
+#include <cstdio>
 
 namespace {
 
@@ -131,6 +132,19 @@ void VSTHost::setAudioSettings(int sampleRate, int blockSize)
 {
     m_sampleRate = sampleRate;
     m_blockSize = blockSize;
+}
+
+const VSTSpeakerArrangement *VSTHost::findArrangement(int channels) const
+{
+    const auto found = m_arrangements.find(channels);
+    if (found == m_arrangements.end())
+        return nullptr;
+    const VSTSpeakerArrangement &arrangement = found->second;
+    std::printf("Found arrangement for:%d chs:%d type:%d\n", channels, arrangement.numChannels,
+                arrangement.type);
+    for (int index = 0; index < arrangement.numChannels; ++index)
+        std::printf("Speaker: %d%s\n", index, arrangement.speakers[index].name);
+    return &arrangement;
 }
 
 bool VSTHost::shellIdOfPluginBeingLoaded(VstInt32 &id) const

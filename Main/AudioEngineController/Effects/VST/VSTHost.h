@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/AudioPluginHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
+#include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
 
 #include <atomic>
 #include <condition_variable>
@@ -37,6 +37,11 @@ public:
     int blockSize() const { return m_blockSize; }
     VstInt32 processLevel() const { return m_processLevel; }
     VstTimeInfo *timeInfo() const { return m_timeInfo; }
+
+    /// The arrangement that is ready for exactly that many channels, also printed; null when there is none.
+    const VSTSpeakerArrangement *findArrangement(int channels) const;
+    /// The channels of the bus format of that many; 0 when there is none.
+    int busFormatChannels(int channels) const { return m_arrangements.count(channels) != 0 ? channels : 0; }
 
     /// The plug-in whose entry point is being called; a single slot, loads do not nest.
     void setPluginBeingLoaded(VSTPlugin *plugin) { m_pluginBeingLoaded = plugin; }
@@ -107,6 +112,7 @@ private:
     std::atomic<VSTPlugin *> m_ignoredPlugin{nullptr};
     VstTimeInfo *m_timeInfo = nullptr; ///< not owned; the scanner has none
     VstInt32 m_processLevel = VstPublished::kVstProcessLevelUser;
+    const VSTArrangementTable m_arrangements = vstArrangementTable();
     mutable std::mutex m_pluginsMutex;
     std::condition_variable m_unpinned;
     std::vector<Registered> m_plugins;

@@ -54,6 +54,17 @@ struct VstParameterProperties {
     char future[16];
 };
 
+/// A speaker of an arrangement. Its place in the room, which comes first, is left at zero: the type says it.
+struct VstSpeakerProperties {
+    float azimuth;
+    float elevation;
+    float radius;
+    float reserved;
+    char name[64];
+    std::int32_t type;
+    char future[28];
+};
+
 } // namespace VstPublished
 
 // The published layout on 64-bit systems, of what is read or written here.
@@ -68,3 +79,6 @@ static_assert(offsetof(VstPublished::VstParameterProperties, label) == 12);
 static_assert(offsetof(VstPublished::VstParameterProperties, shortLabel) == 96);
 static_assert(offsetof(VstPublished::VstParameterProperties, categoryLabel) == 112);
 static_assert(sizeof(VstPublished::VstParameterProperties) == 152);
+static_assert(offsetof(VstPublished::VstSpeakerProperties, name) == 16);
+static_assert(offsetof(VstPublished::VstSpeakerProperties, type) == 80);
+static_assert(sizeof(VstPublished::VstSpeakerProperties) == 112);

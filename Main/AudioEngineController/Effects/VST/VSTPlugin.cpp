@@ -156,6 +156,7 @@ bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
         const TAutoLockCS lock(&processingLock()); // a thread of the plug-in may have its channels rebuilt
         m_effect = effect;
         m_effectOpened = false;
+        m_speakersPending = true;
     }
     ProbeReport::stage(ProbeStage::Ask);
     const auto isSame = [&](const HandedOut &other) { return other.effect.isSame(effect); };

@@ -4,6 +4,7 @@
 #include "Main/AudioEngineController/Effects/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
+#include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
 
 #include <QString>
 
@@ -73,6 +74,12 @@ public:
     /// Announces how many samples will be processed in all, where that is known.
     void setTotalSamples(qint64 samples);
 
+    /// Tells an open plug-in the speakers of its channels: those of the bus formats of as many channels as
+    /// asked for, as far as they suit the channels that the plug-in states. Best before it is started.
+    /// Nothing is sent while the plug-in knows and still has the channels that it stated last, unless
+    /// `force` is set. True when the plug-in accepted; otherwise it keeps a layout of its own.
+    bool UpdateSpeakerArrangement(int inputs, int outputs, bool force);
+
     /// 0 when the plug-in states a negative number.
     VstInt32 programCount() const;
     /// False for a program that is not there.
@@ -128,6 +135,17 @@ private:
         VstInt32 shellId;
     };
 
+    /// Numbers of channels.
+    struct Counts {
+        VstInt32 inputs;
+        VstInt32 outputs;
+
+        bool operator!=(const Counts &other) const
+        {
+            return inputs != other.inputs || outputs != other.outputs;
+        }
+    };
+
     VSTEffect callEntryPoint(const QString &path, VSTHostCallbackFunction callback, bool &isPluginModule);
     AEffect *enter(void *entryPoint, VSTHostCallbackFunction callback);
     static bool isUsable(const VSTEffect &effect);
@@ -143,6 +161,11 @@ private:
     bool send(VstInt32 opcode);
     bool sendValue(VstInt32 opcode, VstIntPtr value);
     bool canDo(const char *capability);
+    Counts statedCounts() const;
+    /// The numbers of channels to tell the speakers of; nothing when the plug-in cannot be told any.
+    std::optional<Counts> countsToTell(Counts requested, Counts stated) const;
+    bool tellSpeakers(Counts counts);
+    std::optional<bool> offer(VSTArrangementPair speakers);
     bool storeState(PluginPreset &preset);
     bool storeParameters(PluginPreset &preset);
     bool isLoadable(const PluginPreset &preset) const;
@@ -169,6 +192,9 @@ private:
     std::atomic<bool> m_needsIdle{false};
     std::atomic<bool> m_wantsMidi{false};
     std::atomic<bool> m_ioChanged{false};
+    std::atomic<bool> m_speakersPending{true}; ///< the plug-in at hand knows none, or its channels changed
+    std::optional<Counts> m_toldCounts;        ///< what it stated when it was last told
+    bool m_speakersAccepted = false;
     std::atomic<bool> m_editorOpen{false};
     bool m_effectOpened = false; ///< `effOpen` was sent to the effect at hand
     bool m_canBypass = false;

@@ -156,6 +156,7 @@ void VSTPlugin::idle()
 void VSTPlugin::ioChanged()
 {
     m_ioChanged = true;
+    m_speakersPending = true;
     rebuildChannels();
 }
 

@@ -1,0 +1,175 @@
+#include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
+#include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
+#include "Tests/Support/QtPrinters.h"
+
+namespace {
+
+/// "TYPE(SPEAKERS)", as a trace shows it.
+std::string textOf(const VSTSpeakerArrangement &arrangement)
+{
+    std::string text;
+    for (int index = 0; index < arrangement.numChannels; ++index)
+        text += (index ? " " : "") + std::to_string(arrangement.speakers[index].type);
+    return std::to_string(arrangement.type) + '(' + text + ')';
+}
+
+class VSTSpeakers : public VSTInstanceBench {
+protected:
+    struct Step {
+        const char *name;
+        const char *script; ///< null: the plug-in of the step before
+        int inputs;
+        int outputs;
+        bool force;
+        bool accepted;
+        const char *calls;
+        const char *printed; ///< the first line
+    };
+
+    void take(const Step &step)
+    {
+        SCOPED_TRACE(step.name);
+        if (step.script) {
+            m_plugin.reset(); // the file is written anew
+            m_plugin = loaded(step.script);
+            ASSERT_TRUE(m_plugin->open(kSettings));
+            takeTrace();
+        }
+        testing::internal::CaptureStdout();
+        EXPECT_EQ(m_plugin->UpdateSpeakerArrangement(step.inputs, step.outputs, step.force), step.accepted);
+        const std::string printed = testing::internal::GetCapturedStdout();
+        EXPECT_EQ(printed.substr(0, printed.find('\n')), step.printed);
+        EXPECT_EQ(takeTrace().remove(QStringLiteral("set-speaker-arrangement: ")),
+                  QString::fromUtf8(step.calls));
+    }
+
+    std::unique_ptr<VSTPlugin> m_plugin;
+};
+
+} // namespace
+
+TEST_F(VSTSpeakers, OfEveryBusFormat)
+{
+    const struct {
+        int code;
+        const char *told;
+    } rows[] = {{1, "0(-2)"},
+                {2, "1(1 2)"},
+                {3, "6(1 2 3)"},
+                {4, "11(1 2 5 6)"},
+                {5, "14(1 2 3 5 6)"},
+                {6, "15(1 2 3 4 5 6)"},
+                {7, "18(1 2 3 4 5 6 -2)"},
+                {8, "20(1 2 3 5 6 -2 -2)"},
+                {9, "21(1 2 3 10 11 5 6)"},
+                {10, "22(1 2 3 4 5 6 -2 -2)"},
+                {50, "-2(1 2 3 4 10 11 5 6 13 15 16 18)"},
+                {51, "-2(1 2 3 4 10 11 5 6 13 15 16 18)"},
+                {52, "-2(1 2 3 10 11 5 6 13 15 16 18)"},
+                {53, "-2(1 2 3 10 11 5 6 13 15 13 15 16 18)"},
+                {54, "-2(1 2 3 4 5 6 13 15)"},
+                {55, "-2(1 2 3 5 6 13 15 16 18)"},
+                {56, "-2(1 2 3 10 11 5 6 -2 -2 13 15 16 18)"},
+                {57, "-2(1 2 3 10 11 5 6 -2 -2 13 15 13 15 16 18)"},
+                {58, "-2(1 2 3 4 5 6 13 15 16 18)"},
+                {59, "-2(1 2 3 10 11 5 6 13 15)"},
+                {60, "-2(1 2 3 4 10 11 5 6 13 15)"},
+                {61, "-2(1 2 3 4 10 11 5 6 13 15 13 15 16 18)"},
+                {62, "-2(1 2 3 4 10 11 5 6 -2 -2 13 15 16 18)"},
+                {63, "-2(1 2 3 4 10 11 5 6 -2 -2 13 15 13 15 16 18)"},
+                {64, "-2(1 2 3 4 5 6 -2 -2 -2 19 10 11 13 15 -2 12 16 18 13 15 -2 -2 -2 -2)"},
+                {65, "-2(-2 -2 -2 -2)"},
+                {66, "-2(-2 -2 -2 -2 -2 -2 -2 -2 -2)"},
+                {67, "-2(-2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2)"},
+                {70, "-2(1 2 3 4 5 6 13 15 16 18 12)"},
+                {71, "-2(1 2 3 4 5 6 13 -2 15 16 18 12)"},
+                {72, "-2(1 2 3 4 10 11 5 6 13 -2 15 16 18 12)"}};
+    EXPECT_EQ(std::size(rows), busFormats().size());
+    for (const auto &row : rows) {
+        const BusFormat *format = findBusFormat(row.code);
+        ASSERT_TRUE(format) << row.code;
+        EXPECT_EQ(textOf(vstArrangement(*format)), row.told) << format->name;
+        EXPECT_EQ(vstArrangement(*format).speakers[format->channels() - 1].name, format->labels.back());
+    }
+}
+
+TEST_F(VSTSpeakers, OfPositionsAndOfWhatIsNone)
+{
+    const std::pair<const char *, int> rows[] = {
+        {"M+30", 1},  {"M-30", 2},   {"M+0", 3},    {"M+110", 5}, {"M-110", 6}, {"M+90", 10},
+        {"M-90", 11}, {"M+135", 5},  {"M-135", 6},  {"U+45", 13}, {"U-45", 15}, {"U+90", 13},
+        {"U-90", 15}, {"U+135", 16}, {"U-135", 18}, {"U+0", 12},  {"l", -2},    {"", -2}};
+    for (const auto &[label, type] : rows)
+        EXPECT_EQ(vstSpeakerType(label), type) << label;
+}
+
+TEST_F(VSTSpeakers, AreReadyForTheChannelsOfAFormatOnly)
+{
+    QStringList types;
+    testing::internal::CaptureStdout();
+    for (int channels = -1; channels <= 37; ++channels)
+        if (const VSTSpeakerArrangement *ready = m_host.findArrangement(channels))
+            types << QStringLiteral("%1:%2").arg(ready->numChannels).arg(ready->type);
+    const std::string printed = testing::internal::GetCapturedStdout();
+    EXPECT_EQ(types.join(' '), QStringLiteral("1:0 2:1 3:6 4:11 5:14 6:15 7:18 8:22 9:-2 10:-2 11:-2 12:-2 "
+                                              "13:-2 14:-2 15:-2 16:-2 24:-2"));
+    EXPECT_NE(printed.find("Speaker: 0M\nFound arrangement for:2 chs:2 type:1\nSpeaker: 0L\nSpeaker: 1R\n"),
+              std::string::npos);
+}
+
+TEST_F(VSTSpeakers, AreToldOnceAndAgainWhenTheChannelsChange)
+{
+    const char *const stereo = "1(1 2) -> 1(1 2)";
+    const char *const refusedStereo = "1(1 2) -> 1(1 2); -2(-2 -2) -> -2(-2 -2)";
+    const Step steps[] = {
+        {"Stereo", "", 2, 2, false, true, stereo, "USA: 2,2 | 2,2 | (2,2"},
+        {"unchanged", nullptr, 2, 2, false, true, "", ""},
+        {"forced", nullptr, 2, 2, true, true, stereo, "USA: 2,2 | 2,2 | (2,2"},
+        {"Wider", "outputs 6", 2, 6, false, true, "1(1 2) -> 15(1 2 3 4 5 6)", "USA: 2,6 | 2,6 | (2,6"},
+        {"Inputs of the plug-in where it has its own outputs", "inputs 1\noutputs 2", 2, 2, false, true,
+         "0(-2) -> 1(1 2)", "USA: 2,2 | 2,2 | (1,2"},
+        {"Outputs likewise", "inputs 6\noutputs 2", 6, 6, false, true, "15(1 2 3 4 5 6) -> 1(1 2)",
+         "USA: 6,6 | 6,6 | (6,2"},
+        {"As asked where neither is", "inputs 1\noutputs 6", 2, 2, false, true, stereo,
+         "USA: 2,2 | 2,2 | (1,6"},
+        {"Instrument", "inputs 0\noutputs 2", 2, 2, false, true, "-1() -> 1(1 2)", "USA: 2,2 | 2,2 | (0,2"},
+        {"Own layout VisLM", "name \"Comp VisLM\"\ninputs 10\noutputs 2", 2, 2, false, true,
+         "set-speaker-arrangement VisLM: 22(1 2 3 4 5 6 -2 -2) -> 1(1 2)", "USA: 2,2 | 8,2 | (10,2"},
+        {"Other case", "name \"Comp Vislm\"\ninputs 10\noutputs 10", 1, 1, false, true,
+         "set-speaker-arrangement Vislm: 0(-2) -> 0(-2)", "USA: 1,1 | 1,1 | (10,10"},
+        {"No such format", "", 17, 2, false, false, "", "USA: 17,2 | 17,2 | (2,2"},
+        {"No such outputs", "", 2, 17, false, true,
+         "1(1 2) -> -2(-2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2 -2)", "USA: 2,17 | 2,17 | (2,2"},
+        {"No such channels", "", 2, -1, false, false, "", "USA: 2,-1 | 2,-1 | (2,2"},
+        {"More than there is room for", "", 2, 37, false, false, "", "USA: 2,37 | 2,37 | (2,2"},
+        {"Refuses", "answer set-speaker-arrangement 0", 2, 2, false, false, refusedStereo,
+         "USA: 2,2 | 2,2 | (2,2"},
+        {"Refuses and is not asked again", nullptr, 2, 2, false, false, "", ""},
+        {"Throws", "fault set-speaker-arrangement throw-std", 2, 2, false, false, stereo,
+         "USA: 2,2 | 2,2 | (2,2"},
+        {"Says that they changed", "ask-host set-speaker-arrangement 13", 2, 2, false, true,
+         "1(1 2) -> 1(1 2); host-13: 0", "USA: 2,2 | 2,2 | (2,2"},
+        {"told again", nullptr, 2, 2, false, true, "1(1 2) -> 1(1 2); host-13: 0", "USA: 2,2 | 2,2 | (2,2"},
+        {"Changes its channels", "new-outputs set-speaker-arrangement 4", 2, 2, false, true, stereo,
+         "USA: 2,2 | 2,2 | (2,2"},
+        {"Changed", nullptr, 2, 2, false, true, stereo, "USA: 2,2 | 2,2 | (2,4"}};
+    for (const Step &step : steps)
+        take(step);
+    EXPECT_EQ(m_plugin->channels().outputs.span(), 4);
+    EXPECT_EQ(m_log.count(QStringLiteral("Exception Caught in VST Plugin")), 1);
+}
+
+TEST_F(VSTSpeakers, ARefusalIsFollowedByTheOtherFormatsOfTheNumber)
+{
+    take({"Seven", "inputs 7\noutputs 7\nanswer set-speaker-arrangement 0", 7, 7, false, false,
+          "18(1 2 3 4 5 6 -2) -> 18(1 2 3 4 5 6 -2); 20(1 2 3 5 6 -2 -2) -> 20(1 2 3 5 6 -2 -2); "
+          "21(1 2 3 10 11 5 6) -> 21(1 2 3 10 11 5 6); "
+          "-2(-2 -2 -2 -2 -2 -2 -2) -> -2(-2 -2 -2 -2 -2 -2 -2)",
+          "USA: 7,7 | 7,7 | (7,7"});
+    testing::internal::CaptureStdout();
+    EXPECT_EQ(vstFallbackArrangements(24, 24).size(), 1u) << "large layouts have nothing else";
+    EXPECT_EQ(vstFallbackArrangements(36, 36).back().first.numChannels, 36);
+    VSTPlugin unopened(m_host);
+    EXPECT_FALSE(unopened.UpdateSpeakerArrangement(2, 2, true));
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
+}
