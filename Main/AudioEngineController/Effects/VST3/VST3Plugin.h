@@ -43,6 +43,12 @@ public:
     bool isInstantiated() const { return m_instance.component() != nullptr; }
     const VST3Instance &instance() const { return m_instance; }
 
+    /// Sets the bus formats (codes of `busFormats`, or discrete channels) of the main input and output of an
+    /// open plug-in, which is stopped meanwhile. False when it refused and keeps a layout of its own.
+    bool setBusFormats(int inputFormat, int outputFormat);
+    /// Takes effect with the next bus formats.
+    void setSettings(const VST3PluginSettings &settings) { m_settings = settings; }
+
     QString identifierPrefix() const override;
     /// The class id, as in the record.
     QString formatIdentifier() const override { return m_record.id; }
@@ -97,6 +103,7 @@ private:
     Steinberg::FUID m_classId;
     VST3Instance m_instance;
     VST3Processor m_processor;
+    VST3PluginSettings m_settings;
     EffectRecord m_record; ///< of the instance
     std::function<void()> m_classObserver;
 };

@@ -110,6 +110,20 @@ bool VST3Plugin::applySettings(const AudioSettings &settings)
     return callPlugin("set up", [&] { return m_processor.setUp(settings.sampleRate, settings.blockSize); });
 }
 
+bool VST3Plugin::setBusFormats(int inputFormat, int outputFormat)
+{
+    const TAutoLockCS lock(&processingLock());
+    if (!isOpen())
+        return false;
+    const bool wasRunning = isRunning();
+    stop();
+    const bool accepted = callPlugin("set the buses of", [&] {
+        return m_processor.setFormats({inputFormat, outputFormat}, m_settings);
+    });
+    rebuildChannels();
+    return (!wasRunning || start()) && accepted;
+}
+
 bool VST3Plugin::startProcessing()
 {
     return callPlugin("start", [this] { return m_processor.start(); });

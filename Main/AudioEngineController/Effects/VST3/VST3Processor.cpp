@@ -74,7 +74,8 @@ ChannelSetup VST3Processor::readChannels()
             {0, usedChannels(m_sides[Vst::kOutput].buses) - 1}};
 }
 
-/// Points each bus at its channels: the used ones in order, the others all at the spare one.
+/// Points each bus at its channels: the used ones in order, in the first of them that of its bus format, the
+/// others all at the spare one.
 void VST3Processor::Side::lay(float **used, std::size_t count, int32 frames)
 {
     spare.assign(static_cast<std::size_t>(frames), 0.0f);
@@ -82,11 +83,15 @@ void VST3Processor::Side::lay(float **used, std::size_t count, int32 frames)
     buffers.clear();
     std::size_t next = 0;
     for (const VST3Bus &bus : buses) {
-        const int32 width = std::min(bus.channels, int32(AudioPlugin::kMaxChannels));
-        for (int32 channel = 0; channel < width; ++channel)
-            channels.push_back(bus.isUsed && next < count ? used[next++] : spare.data());
+        const auto width = static_cast<std::size_t>(std::min(bus.channels, int32(AudioPlugin::kMaxChannels)));
+        const bool isOrdered = next == 0 && positions.size() == width;
+        for (std::size_t channel = 0; channel < width; ++channel) {
+            const std::size_t at = next + (isOrdered ? positions[channel] : channel);
+            channels.push_back(bus.isUsed && at < count ? used[at] : spare.data());
+        }
+        next += bus.isUsed ? width : 0;
         Vst::AudioBusBuffers &laid = buffers.emplace_back();
-        laid.numChannels = width;
+        laid.numChannels = static_cast<int32>(width);
     }
     float **first = channels.data();
     for (Vst::AudioBusBuffers &bus : buffers) {

@@ -3,6 +3,7 @@
 #include "Main/AudioEngineController/Effects/ChannelBuffers.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3NoParameterChanges.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Speakers.h"
 
 #include <pluginterfaces/base/smartpointer.h>
 #include <pluginterfaces/vst/ivstaudioprocessor.h>
@@ -21,6 +22,11 @@ public:
     void detach();
 
     bool setUp(double sampleRate, Steinberg::int32 blockSize);
+    /// Offers the plug-in, which is stopped, a bus format for the first used bus of each direction, by
+    /// direction; where it refuses them, those that may be discrete channels as such. True when it took them.
+    /// From then on the audio of such a bus is in the order of its format. The buses must have been read, and
+    /// are to be read again.
+    bool setFormats(const std::array<int, 2> &formatCodes, const VST3PluginSettings &settings);
     bool start();
     void stop();
     /// Reads the buses; the channels of the used ones in both directions. None while nothing is attached.
@@ -34,11 +40,17 @@ private:
         std::vector<Steinberg::Vst::AudioBusBuffers> buffers;
         std::vector<float *> channels; ///< of all buses
         std::vector<float> spare;      ///< what channels of unused buses share
+        /// The first used bus: for each of its channels the position in its bus format; empty: as they come.
+        std::vector<std::size_t> positions;
 
+        std::size_t firstUsed() const;
         void lay(float **used, std::size_t count, Steinberg::int32 frames);
     };
 
     void activateBuses(bool active);
+    std::vector<Steinberg::Vst::SpeakerArrangement> arrangements(Steinberg::Vst::BusDirection direction,
+                                                                 Steinberg::Vst::SpeakerArrangement first);
+    bool offer(const std::array<int, 2> &formatCodes, const VST3PluginSettings &settings);
 
     Steinberg::Vst::IComponent *m_component = nullptr; ///< not owned
     Steinberg::IPtr<Steinberg::Vst::IAudioProcessor> m_processor;

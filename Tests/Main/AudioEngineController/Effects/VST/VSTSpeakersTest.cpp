@@ -2,6 +2,8 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 #include "Tests/Support/QtPrinters.h"
 
+#include <sstream>
+
 namespace {
 
 /// "TYPE(SPEAKERS)", as a trace shows it.
@@ -95,11 +97,11 @@ TEST_F(VSTSpeakers, OfEveryBusFormat)
 
 TEST_F(VSTSpeakers, OfPositionsAndOfWhatIsNone)
 {
-    const std::pair<const char *, int> rows[] = {
-        {"M+30", 1},  {"M-30", 2},   {"M+0", 3},    {"M+110", 5}, {"M-110", 6}, {"M+90", 10},
-        {"M-90", 11}, {"M+135", 5},  {"M-135", 6},  {"U+45", 13}, {"U-45", 15}, {"U+90", 13},
-        {"U-90", 15}, {"U+135", 16}, {"U-135", 18}, {"U+0", 12},  {"l", -2},    {"", -2}};
-    for (const auto &[label, type] : rows)
+    std::istringstream rows(
+        "M+30 1 M-30 2 M+0 3 M+110 5 M-110 6 M+90 10 M-90 11 M+135 5 M-135 6 U+45 13 U-45 15 "
+        "U+90 13 U-90 15 U+135 16 U-135 18 U+0 12 l -2 LS -2 \"\" -2");
+    std::string label;
+    for (int type = 0; rows >> label >> type;)
         EXPECT_EQ(vstSpeakerType(label), type) << label;
 }
 

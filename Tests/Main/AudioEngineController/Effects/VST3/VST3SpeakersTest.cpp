@@ -1,0 +1,133 @@
+#include "Main/AudioEngineController/Effects/VST3/VST3Speakers.h"
+#include "Main/AudioEngineController/Effects/BusFormats/BusFormat.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/QtPrinters.h"
+
+#include <gtest/gtest.h>
+
+using namespace Steinberg::Vst;
+
+namespace {
+
+/// The plug-in's channels of the positions from 0 on.
+std::string textOf(const VST3ChannelMap &map)
+{
+    std::string text;
+    for (const auto &[position, channel] : map)
+        text += (text.empty() ? "" : " ") + std::to_string(channel);
+    return text;
+}
+
+} // namespace
+
+TEST(VST3Speakers, OfEveryBusFormat)
+{
+    using namespace SpeakerArr;
+    const struct {
+        int code;
+        SpeakerArrangement speakers;
+        const char *channels;
+    } rows[] = {
+        {1, kMono, "0"},
+        {2, kStereo, "0 1"},
+        {3, k30Cine, "0 1 2"},
+        {4, k40Music, "0 1 2 3"},
+        {5, k50, "0 1 2 3 4"},
+        {6, k51, "0 1 2 3 4 5"},
+        {7, k61Cine, "0 1 2 3 4 5 6"},
+        {8, k70Cine, "0 1 2 3 4 5 6"},
+        {9, k70Music, "0 1 2 5 6 3 4"},
+        {10, k71Cine, "0 1 2 3 4 5 6 7"},
+        {50, k71_4, "0 1 2 3 6 7 4 5 8 9 10 11"},
+        {51, k111MPEG3D, "0 1 2 3 6 7 4 5 8 9 10 11"},
+        {52, k70_4, "0 1 2 5 6 3 4 7 8 9 10"},
+        {53, k70_6, "0 1 2 5 6 3 4 7 8 11 12 9 10"},
+        {54, k71CineSideHigh, "0 1 2 3 4 5 6 7"},
+        {55, k50_4, "0 1 2 3 4 5 6 7 8"},
+        {56, k90_4, "0 1 2 7 8 3 4 5 6 9 10 11 12"},
+        {57, k90_6, "0 1 2 7 8 3 4 5 6 9 10 13 14 11 12"},
+        {58, k51_4, "0 1 2 3 4 5 6 7 8 9"},
+        {59, k70_2, "0 1 2 5 6 3 4 7 8"},
+        {60, k71_2, "0 1 2 3 6 7 4 5 8 9"},
+        {61, k71_6, "0 1 2 3 6 7 4 5 8 9 12 13 10 11"},
+        {62, k91_4, "0 1 2 3 8 9 4 5 6 7 10 11 12 13"},
+        {63, k91_6, "0 1 2 3 8 9 4 5 6 7 10 11 14 15 12 13"},
+        {64, k222, "0 1 2 3 4 5 6 7 8 18 9 10 12 14 13 11 15 17 19 20 16 22 21 23"},
+        {65, kAmbi1stOrderACN, "0 1 2 3"},
+        {66, kAmbi2cdOrderACN, "0 1 2 3 4 5 6 7 8"},
+        {67, kAmbi3rdOrderACN, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15"},
+        {70, k101, "0 1 2 3 4 5 7 8 9 10 6"},
+        {71, k111, "0 1 2 3 4 5 7 8 9 10 11 6"},
+        {72, k131, "0 1 2 3 6 7 4 5 9 10 11 12 13 8"},
+    };
+    EXPECT_EQ(std::size(rows), busFormats().size());
+    for (const auto &row : rows) {
+        VST3ChannelMap map = {{30, 30}};
+        EXPECT_EQ(arrangementFor(row.code, map, {}), row.speakers) << row.code;
+        EXPECT_EQ(textOf(map), row.channels) << row.code;
+    }
+}
+
+TEST(VST3Speakers, OfDiscreteChannelsAndOfNoFormat)
+{
+    const struct {
+        int code;
+        SpeakerArrangement speakers;
+        const char *channels; ///< where position 1 went to channel 7 before
+    } rows[] = {
+        {0x100, 0, "7"},
+        {0x101, 0x80000, "0 7"},
+        {0x104, 0x107, "0 1 2 3"},
+        {0x107, 0xF7, "0 1 2 3 4 5 6"},
+        {0x10B, 0x2F83F, "0 1 2 3 4 5 6 7 8 9 10"},
+        {0x115, 0x302D6FF, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20"},
+        {0x116, 0x7307FFFF, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20 21"},
+        {0x118, 0x7307FFFF, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20 21 22 23"},
+        {0x119, 3, "7"},
+        {0x7FFFFFFF, 3, "7"},
+        {-1, 3, "7"},
+        {0, 3, "7"},
+        {11, 3, "7"},
+        {0x200, 3, "7"},
+    };
+    for (const auto &row : rows) {
+        VST3ChannelMap map = {{1, 7}};
+        EXPECT_EQ(arrangementFor(row.code, map, {}), row.speakers) << row.code;
+        EXPECT_EQ(textOf(map), row.channels) << row.code;
+    }
+}
+
+TEST(VST3Speakers, AreLimitedForPluginsOfFewChannels)
+{
+    const struct {
+        int code;
+        int limit;
+        SpeakerArrangement speakers;
+        const char *line;
+    } rows[] = {
+        {50, 12, 0x2D63F, ""},
+        {50, 13, 0x2D63F, ""},
+        {50, 0, 0x2D63F, ""},
+        {50, 10, 0x300063F, "LIMIT SPEAKER ARRANGEMENT FOR 50 to 50333247"},
+        {64, 10, 0x300063F, "LIMIT SPEAKER ARRANGEMENT FOR 64 to 50333247"},
+        {51, 10, 0x2D63F, ""},
+        {67, 10, SpeakerArr::kAmbi3rdOrderACN, ""},
+        {72, 10, 0x2D03F, "LIMIT SPEAKER ARRANGEMENT FOR 72 to 184383"},
+        {57, 12, 0x2D63F, "LIMIT SPEAKER ARRANGEMENT FOR 57 to 185919"},
+        {60, 7, 0x63F, "LIMIT SPEAKER ARRANGEMENT FOR 60 to 1599"},
+        {60, -1, 0x63F, "LIMIT SPEAKER ARRANGEMENT FOR 60 to 1599"},
+        {10, 6, 0x3F, "LIMIT SPEAKER ARRANGEMENT FOR 10 to 63"},
+        {10, 5, 0x37, "LIMIT SPEAKER ARRANGEMENT FOR 10 to 55"},
+        {10, 4, 0x107, "LIMIT SPEAKER ARRANGEMENT FOR 10 to 263"},
+        {10, 3, 0x7, "LIMIT SPEAKER ARRANGEMENT FOR 10 to 7"},
+        {10, 2, 0x3, "LIMIT SPEAKER ARRANGEMENT FOR 10 to 3"},
+        {2, 1, 0x80000, "LIMIT SPEAKER ARRANGEMENT FOR 2 to 524288"},
+        {0x108, 2, 0xFF, ""},
+    };
+    for (const auto &row : rows) {
+        const CapturedLog log;
+        VST3ChannelMap map;
+        EXPECT_EQ(arrangementFor(row.code, map, {row.limit}), row.speakers) << row.code << ' ' << row.limit;
+        EXPECT_EQ(log.lines().join('/'), QString::fromUtf8(row.line));
+    }
+}
