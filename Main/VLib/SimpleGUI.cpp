@@ -67,6 +67,12 @@ int userMessageBox(const QString &text, int flags)
     return 0;
 }
 
+const wchar_t *workstationOnlyFolder(std::size_t index)
+{
+    reportAssertion("0", SourcePlace{"Main/VLib/SimpleGUI", kWorkstationOnlyFolders[index]});
+    return L"";
+}
+
 void requestShow()
 {
     if (const auto ui = installedVUI())

@@ -4,6 +4,7 @@
 
 #include <QString>
 
+#include <cstddef>
 #include <memory>
 
 class VProgressDisplay;
@@ -73,6 +74,12 @@ bool askUser(const wchar_t *format, const Arguments &...arguments)
 
 /// Shows a message box and gives the button pressed; 0 without a user interface.
 int userMessageBox(const QString &text, int flags);
+
+/// The folders that the workstation's own interface has beside the common ones. This program has none of
+/// them; they are told apart by the place at which asking for one is reported.
+inline constexpr int kWorkstationOnlyFolders[] = {483, 771, 949, 1011, 1092, 1184, 1239};
+/// Reports the asking and gives an empty text. `index` is a place in the list above.
+const wchar_t *workstationOnlyFolder(std::size_t index);
 
 /// Asks that the window come into sight.
 void requestShow();

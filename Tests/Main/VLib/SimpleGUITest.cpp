@@ -64,6 +64,18 @@ TEST_F(SimpleGUI, WithoutInterfaceMessageBoxIsAnAssertion)
                                         "Assertion failed: \"0\", Main/VLib/SimpleGUI, line 216"}));
 }
 
+TEST_F(SimpleGUI, FoldersOfTheWorkstationAloneAreAssertions)
+{
+    QString lines;
+    for (std::size_t index = 0; index < std::size(kWorkstationOnlyFolders); ++index) {
+        EXPECT_STREQ(workstationOnlyFolder(index), L"");
+        EXPECT_TRUE(
+            log.lines().last().startsWith(QStringLiteral("Assertion failed: \"0\", Main/VLib/SimpleGUI")));
+        lines += log.lines().last().section(QLatin1Char(' '), -1) + ' ';
+    }
+    EXPECT_EQ(lines, QStringLiteral("483 771 949 1011 1092 1184 1239 "));
+}
+
 TEST_F(SimpleGUI, MessageBoxAnswerIsTheInterfaces)
 {
     const auto ui = installUI();
