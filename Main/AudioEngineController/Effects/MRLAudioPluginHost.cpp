@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Main/VLib/ApplicationContext.h"
 
 #include <QFile>
 
@@ -22,19 +23,44 @@ void MRLAudioPluginHost::setBuiltInEffects(const std::vector<EffectRecord> &effe
     clearEffects();
     for (const EffectRecord &effect : effects)
         AddEffect(effect);
+    ReadCatalogue();
 }
 
 void MRLAudioPluginHost::ReadCatalogue()
 {
     const QString path = cataloguePath();
-    if (!QFile::exists(path))
+    if (catalogueFolder().isEmpty() || !QFile::exists(path))
         return;
     const CatalogueContents contents = readCatalogueFile(*format(), path);
     if (!contents)
         DebugLog(L"Cannot use the catalogue %ls: %ls", path, contents.reason);
     const TAutoLockCS lock(&m_ks);
-    for (const EffectRecord &marks : contents.records)
+    const bool hasEffects = effectList().size() != 0;
+    for (const EffectRecord &marks : contents.records) {
+        if (hasEffects && !effectList().find(marks.id))
+            DebugLog(
+                L"The mark on the built-in effect %ls is passed over: there is no such effect. It goes when "
+                L"the marks are written next.",
+                marks.id);
         effectList().setFavourite(marks.id, marks.favourite);
+    }
 }
 
 bool MRLAudioPluginHost::Scan(bool, bool) { return false; }
+
+bool MRLAudioPluginHost::setFavourite(const QString &id, bool favourite)
+{
+    {
+        const TAutoLockCS lock(&m_ks);
+        if (!effectList().find(id))
+            return false;
+        effectList().setFavourite(id, favourite);
+    }
+    return writeMarks();
+}
+
+bool MRLAudioPluginHost::writeMarks()
+{
+    const IQuillonInterface *application = ApplicationContext::instance().quillonInterface;
+    return !(application && application->isScanner()) && WriteCatalogue();
+}

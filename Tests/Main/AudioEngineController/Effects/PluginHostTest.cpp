@@ -131,22 +131,45 @@ TEST(PluginHost, MovingTheOldEffectsFolder)
     }
 }
 
-TEST(PluginHost, BuiltInEffectsTakeTheirMarks)
+TEST(PluginHost, MarksOnBuiltInEffectsAreReadAndWritten)
 {
     const QTemporaryDir folder;
-    write(folder.filePath(QStringLiteral("TesselFXConfiguration.xml")),
-          "<Effects "
-          "version=\"1.2\"><Effect><ID>mrl:a</ID><Favourite>5</Favourite><CategoryMask>2</CategoryMask>"
-          "</Effect><Effect><ID>mrl:gone</ID><Favourite>1</Favourite></Effect></Effects>");
+    const QString file = folder.filePath(QStringLiteral("TesselFXConfiguration.xml"));
+    const QByteArray start = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<Effects version=\"1.2\">\n";
+    const auto block = [](const char *id, const char *favourite, const char *mask) {
+        return QByteArray("\t<Effect>\n\t\t<ID>") + id + "</ID>\n\t\t<Favourite>" + favourite +
+               "</Favourite>\n\t\t<CategoryMask>" + mask + "</CategoryMask>\n\t</Effect>\n";
+    };
+    write(file, start + block("mrl:gone", "1", "0") + block("mrl:b", "-5", "2") + block("", "1", "0") +
+                    "</Effects>\n");
+    TestApplication application;
+    application.scanner = true;
     MRLAudioPluginHost host;
     host.setCatalogueFolder(folder.path());
-    EffectRecord effect;
-    effect.id = effect.name = QStringLiteral("mrl:a");
-    host.setBuiltInEffects({effect});
+    std::vector<EffectRecord> effects(2);
+    effects[0].id = effects[0].name = QStringLiteral("mrl:a");
+    effects[0].category = 0x40; // Delay
+    effects[1].id = effects[1].name = QStringLiteral("mrl:b");
+    const CapturedLog log;
     host.ReadCatalogue();
-    ASSERT_EQ(host.effects().size(), 1u);
-    EXPECT_TRUE(host.effects()[0].favourite);
-    EXPECT_EQ(host.effects()[0].category, 0u) << "the mask is written only";
+    EXPECT_EQ(log.lines(), QStringList()) << "nothing is lost where there are no effects";
+    host.setBuiltInEffects(effects);
+    EXPECT_TRUE(host.findEffect(QStringLiteral("mrl:b"))->favourite);
+    EXPECT_EQ(host.findEffect(QStringLiteral("mrl:b"))->category, 0u) << "the mask is written only";
+    EXPECT_EQ(log.count(QStringLiteral("is passed over")), 2);
+    EXPECT_TRUE(log.contains(QStringLiteral("mrl:gone is passed over")));
+
+    QByteArray text;
+    EXPECT_FALSE(host.setFavourite(QStringLiteral("mrl:a"), true));
+    EXPECT_TRUE(readWholeFile(file, text) && text.contains("mrl:gone")) << "not written by the scanner";
+    application.scanner = false;
+    EXPECT_FALSE(host.setFavourite(QStringLiteral("mrl:gone"), true));
+    EXPECT_TRUE(host.setFavourite(QStringLiteral("mrl:b"), false));
+    EXPECT_TRUE(readWholeFile(file, text));
+    EXPECT_EQ(text.replace("\r\n", "\n"),
+              start + block("mrl:a", "1", "4") + block("mrl:b", "0", "0") + "</Effects>\n");
+    host.setBuiltInEffects(effects);
+    EXPECT_TRUE(host.findEffect(QStringLiteral("mrl:a"))->favourite) << "the marks outlive new effects";
 }
 
 TEST(AudioPlugins, AskingForAnUnsetRegistryIsReported)
