@@ -1,5 +1,6 @@
 #include "Core/BaseLib/PluginLibrary.h"
 #include "Main/AudioEngineController/Effects/AudioPlugin.h"
+#include "Main/AudioEngineController/Effects/BusFormats/BusFormat.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
@@ -15,10 +16,12 @@
 
 #include <cmath>
 
-// Takes every plug-in of this machine through its use: loaded by identifier, opened, run, its state stored
-// and loaded, closed. Plug-ins of other folders: FXPROBE_TOUR_VST3 and FXPROBE_TOUR_VST.
+// Takes every plug-in of this machine through its use: loaded by identifier, opened, told its speakers, run,
+// its state stored and loaded, closed. Plug-ins of other folders: FXPROBE_TOUR_VST3 and FXPROBE_TOUR_VST.
 
 namespace {
+
+constexpr int kManyChannels = 12;
 
 class InstanceTour : public testing::Test {
 protected:
@@ -59,7 +62,9 @@ protected:
 
     void use(AudioPlugin &plugin)
     {
-        ASSERT_TRUE(plugin.open({48000, 256}) && plugin.start());
+        ASSERT_TRUE(plugin.open({48000, 256}));
+        setSpeakers(plugin);
+        ASSERT_TRUE(plugin.start());
         process(plugin);
         PluginPreset stored;
         ASSERT_TRUE(plugin.StorePreset(stored));
@@ -72,6 +77,33 @@ protected:
         process(plugin);
         plugin.close();
         EXPECT_FALSE(plugin.isRunning());
+    }
+
+    /// Tells a plug-in the speakers of more channels than most have, then those of its own.
+    static void setSpeakers(AudioPlugin &plugin)
+    {
+        const ChannelSetup before = plugin.channels();
+        testing::internal::CaptureStdout();
+        tellSpeakers(plugin, kManyChannels, kManyChannels);
+        const bool accepted = tellSpeakers(plugin, before.inputs.span(), before.outputs.span());
+        testing::internal::GetCapturedStdout();
+        EXPECT_TRUE(accepted || plugin.identifier().startsWith(QStringLiteral("vst2:")))
+            << "only plug-ins of the older format may know no speakers at all";
+        EXPECT_EQ(plugin.channels().inputs.span(), before.inputs.span());
+        EXPECT_EQ(plugin.channels().outputs.span(), before.outputs.span());
+    }
+
+    static bool tellSpeakers(AudioPlugin &plugin, int inputs, int outputs)
+    {
+        if (auto *vst2 = dynamic_cast<VSTPlugin *>(&plugin))
+            return vst2->UpdateSpeakerArrangement(inputs, outputs, true);
+        return dynamic_cast<VST3Plugin &>(plugin).setBusFormats(usualFormat(inputs), usualFormat(outputs));
+    }
+
+    static int usualFormat(int channels)
+    {
+        const std::vector<const BusFormat *> formats = busFormatsOfChannels(channels);
+        return formats.empty() ? kDiscreteChannels + channels : formats.front()->code;
     }
 
     /// A block of one loud sample; what comes out must be numbers.
