@@ -3,7 +3,8 @@
 #include <thread>
 
 /// Makes the calling thread one that plug-ins can run on, for as long as the object lives: on Windows they
-/// rely on a COM apartment of a single thread.
+/// rely on a COM apartment of a single thread. From then on the process there leaves its exit handlers out,
+/// whoever calls exit.
 class PluginThread {
 public:
     PluginThread();
