@@ -2,7 +2,8 @@
 # A Wine of its own for one run, with a screen of its own. Sourced after lib.sh, never run.
 
 export WINEDEBUG=-all
-# Neither the .NET nor the HTML engine is needed, nor entries in anybody's menu, nor a debugger at a crash; without this, Wine
+# Left out: the .NET and the HTML engine, which Wine would offer to install, entries in somebody's menu, and the debugger that
+# stops at a crash.
 export WINEDLLOVERRIDES='mscoree=;mshtml=;winemenubuilder.exe=;winedbg.exe='
 
 wine_folder=''

@@ -87,20 +87,6 @@ TEST_F(CatalogueState, LeftoversOfATemporaryFileDoNoHarm)
     EXPECT_EQ(listed(), QStringList({kComp, QStringLiteral("New")}));
 }
 
-TEST_F(CatalogueState, ACatalogueThatIsALinkStaysOne)
-{
-    addListedModules({kComp});
-    const QString target = m_folder.path(QStringLiteral("elsewhere.xml"));
-    ASSERT_TRUE(QFile::rename(cataloguePath(), target));
-    if (!QFile::link(target, cataloguePath()) || !QFileInfo(cataloguePath()).isSymLink())
-        GTEST_SKIP() << "no links here";
-    addModule(QStringLiteral("New"));
-    EXPECT_TRUE(run().succeeded());
-    EXPECT_EQ(QFileInfo(cataloguePath()).symLinkTarget(), target);
-    EXPECT_EQ(m_folder.read(target).count("<Effect>"), 2);
-    EXPECT_EQ(listed(), QStringList({kComp, QStringLiteral("New")}));
-}
-
 TEST_F(CatalogueState, EarlierVersionsAreBroughtUpToDateWithoutLoadingAnything)
 {
     for (const char *version : {"<Effects>", "<Effects version=\"1.0\">", "<Effects version=\"0.9\">"}) {

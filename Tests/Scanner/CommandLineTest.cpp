@@ -1,4 +1,5 @@
 #include "Tests/Scanner/ScannerTest.h"
+#include "Tests/Support/PlatformValues.h"
 
 #include <QDir>
 #include <QFile>
@@ -112,7 +113,8 @@ TEST_F(CommandLine, ThePathDecidesWhereTheCatalogueLands)
         {"relative path", "a/Effects/f", "a/Effects/f", "a/Effects/VST3Configuration.xml"},
         {"relative path with dots", "a/Effects/f", "./a/../a/Effects/f", "a/Effects/VST3Configuration.xml"},
         {"relative path without a data folder", "Effects/f", "Effects/f", {}},
-        {"both separators", "C\\x/Effects/f", there + "C\\x/Effects/f", "C\\x/Effects/VST3Configuration.xml"},
+        {"both separators", "C\\x/Effects/f", there + "C\\x/Effects/f",
+         QDir::fromNativeSeparators("C\\x/Effects/VST3Configuration.xml")},
         {"the slash wins over a later backslash", "a/Effects/b\\Effects\\f",
          there + "a/Effects/b\\Effects\\f", "a/Effects/VST3Configuration.xml"},
         {"Japanese and emoji", foreign + "/Effects/f", there + foreign + "/Effects/f",
@@ -123,6 +125,8 @@ TEST_F(CommandLine, ThePathDecidesWhereTheCatalogueLands)
     const QString module = addModule(foreign);
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
+        if (row.argument.isNull() && !kHomeFollowsEnvironment)
+            continue;
         m_folder.write(row.scanList, m_folder.read(m_folder.scanList()));
         forgetTrace();
         const ScannerOutcome outcome =

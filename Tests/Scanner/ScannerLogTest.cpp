@@ -95,6 +95,6 @@ TEST_F(ScannerLog, AnOutputThatNobodyReadsForAWhileHoldsNothingUp)
     }
     const ScannerOutcome outcome = scanner.wait();
     EXPECT_TRUE(outcome.succeeded());
-    EXPECT_EQ(outcome.standardOutput.size(), 300 * 1024);
+    EXPECT_EQ(outcome.standardOutput.size() - outcome.standardOutput.count('\r'), 300 * 1024);
     EXPECT_EQ(listed(), QStringList({QStringLiteral("Chatty"), QStringLiteral("Next")}));
 }

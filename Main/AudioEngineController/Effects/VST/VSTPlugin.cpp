@@ -259,4 +259,5 @@ void VSTPlugin::unload()
     else
         m_library.freeUnlessRunning();
     m_loaded = false;
+    m_faulted = false; // the next module is another
 }

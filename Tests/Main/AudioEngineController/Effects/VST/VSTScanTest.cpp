@@ -1,4 +1,5 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTScanBench.h"
+#include "Tests/Support/PlatformValues.h"
 
 #include <QDir>
 #include <QFile>
@@ -57,10 +58,10 @@ TEST_F(VSTScan, FilesThatFailAreRecordedAndFilesThatAreNoPluginsAreNot)
     EXPECT_EQ(records("Name ID Enabled Working"),
               texts({"Empty|Empty|1|0", "Healthy|Healthy:1000|1|1", "Magic|Magic|1|0", "Null|Null|1|0",
                      "Text|Text|1|0", "Thrown|Thrown|1|0", "Wild|Wild|1|0"}));
-    for (const char *reason :
-         {"Text.so: file too short", "Empty.so: file too short", "Magic.so, Didn't manage it"})
-        EXPECT_TRUE(outcome.log.contains(QString::fromLatin1(reason))) << reason << '\n'
-                                                                       << qPrintable(outcome.log);
+    for (const QString &reason :
+         {QString::fromLatin1(kTextFileReason), modulePath(QStringLiteral("Empty")) + QStringLiteral(": "),
+          modulePath(QStringLiteral("Magic")) + QStringLiteral(", Didn't manage it")})
+        EXPECT_TRUE(outcome.log.contains(reason)) << qPrintable(reason + QLatin1Char('\n') + outcome.log);
     expectSettled();
 }
 
@@ -104,10 +105,11 @@ TEST_F(VSTScan, FilesOfOneNameAreToldApartByTheirPaths)
 TEST_F(VSTScan, WhatAPluginChangesIsPutBack)
 {
     // The mask comes first: the catalogue keeps the permissions that it was made with.
-    const char *effects[] = {"umask 077",   "locale C.UTF-8", "chdir /", "rounding up",
-                             "signal segv", "signal term",    "alarm 1", "repair keep"};
+    const QByteArray locale = QByteArray("locale ") + kForeignLocale;
+    const QByteArray effects[] = {"umask 077",   locale,        "chdir /", "rounding up",
+                                  "signal segv", "signal term", "alarm 1", "repair keep"};
     int number = 0;
-    for (const char *effect : effects)
+    for (const QByteArray &effect : effects)
         for (const char *stage : {"entry", "get-vendor-string"}) {
             ++number;
             add(QStringLiteral("Spoiler %1").arg(number),

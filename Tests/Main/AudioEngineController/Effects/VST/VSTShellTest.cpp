@@ -16,7 +16,7 @@ TEST_F(VSTShell, EveryChildIsListedAndEveryEffectClosed)
     add(QStringLiteral("Shell"), kThree);
     scan();
     EXPECT_EQ(records("Name ID Working"), texts({"One|One:1|1", "Three|Three:-2147483645|1", "Two|Two:2|1"}));
-    const QByteArray text = m_folder.catalogue(QStringLiteral("FXConfiguration.xml"));
+    const QByteArray text = m_folder.catalogue(QStringLiteral("FXConfiguration.xml")).replace("\r\n", "\n");
     EXPECT_TRUE(text.contains(
         "\t\t<SubEffect>\n\t\t\t<Name>Three</Name>\n\t\t\t<ID>2147483651</ID>\n\t\t</SubEffect>\n"));
     const QStringList calls = traceOf(QStringLiteral("Shell"));

@@ -83,39 +83,10 @@ TEST_F(VST3Files, AModuleReachedOnSeveralWaysIsProbedOnce)
     const QString plugins = m_folder.plugins();
     m_folder.writeScanList({plugins, plugins, plugins + QLatin1Char('/'), plugins + QStringLiteral("/sub"),
                             plugins + QStringLiteral("/sub/../sub/.")});
-    ASSERT_TRUE(QFile::link(inPlugins("sub"), inPlugins("linked folder")));
-    ASSERT_TRUE(QFile::link(plugins, inPlugins("sub/circle")));
     scan();
     EXPECT_EQ(loaded(), texts({"Comp"}));
     EXPECT_EQ(records("Name Path"),
               QStringList{QStringLiteral("Comp|") + modulePath(QStringLiteral("sub/Comp"))});
-}
-
-TEST_F(VST3Files, LinkedModulesAndFoldersAreFollowedWhereTheyAreListed)
-{
-    const QString elsewhere = m_folder.path(QStringLiteral("Elsewhere"));
-    const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\" ";
-    m_folder.write(inPlugins("File.vst3.script"), traced + "File\nclass File\n"); // beside the link
-    const QString file = addVST3File(elsewhere, QStringLiteral("File"));
-    const QString bundle =
-        addVST3Bundle(elsewhere, QStringLiteral("Bundle"), traced + "Bundle\nclass Bundle\n");
-    ASSERT_TRUE(QFile::link(file, inPlugins("File.vst3")));
-    ASSERT_TRUE(QFile::link(bundle, inPlugins("Bundle.vst3")));
-    ASSERT_TRUE(QFile::link(inPlugins("gone.vst3"), inPlugins("Dangling.vst3")));
-    addVST3File(m_folder.path(QStringLiteral("Root")), QStringLiteral("Rooted"),
-                traced + "Rooted\nclass Rooted\n");
-    ASSERT_TRUE(
-        QFile::link(m_folder.path(QStringLiteral("Root")), m_folder.path(QStringLiteral("Linked root"))));
-    m_folder.writeScanList({m_folder.plugins(), m_folder.path(QStringLiteral("Linked root"))});
-    scan();
-    EXPECT_EQ(loaded(), texts({"Bundle", "File", "Rooted"}));
-    EXPECT_EQ(names(), texts({"Bundle", "File", "Rooted"}));
-    scan();
-    EXPECT_EQ(loaded(), QStringList());
-    // The time of a linked module is that of what it points to.
-    m_folder.setModified(file, QDateTime({2022, 3, 4}, {5, 6}));
-    scan();
-    EXPECT_EQ(loaded(), texts({"File"}));
 }
 
 TEST_F(VST3Files, OneModuleInTwoPlaces)

@@ -1,4 +1,5 @@
 #include "Tests/Main/AudioEngineController/Effects/VST3/VST3ScanBench.h"
+#include "Tests/Support/PlatformValues.h"
 
 #include <algorithm>
 
@@ -28,7 +29,7 @@ protected:
             EXPECT_TRUE(outcome.started);
             EXPECT_EQ(m_folder.markers(),
                       QStringList{QString::fromLatin1(killer) + QStringLiteral(".scan3")});
-            EXPECT_EQ(loaded().constLast(), QString::fromLatin1(killer));
+            EXPECT_EQ(loaded().value(loaded().size() - 1), QString::fromLatin1(killer));
         }
         scan();
     }
@@ -46,7 +47,7 @@ TEST_F(VST3Killers, EveryStageAndEveryKindCostsOneRun)
         expected.append(QString::fromLatin1(killers.back()) + QStringLiteral("|0|0"));
     };
     for (const char *stage : kStages)
-        for (const char *kind : {"segv", "_exit"})
+        for (const char *kind : {QByteArray(stage).startsWith("static") ? kLoaderKiller : "segv", "_exit"})
             addOne(stage, kind);
     for (const char *kind : kKinds)
         if (QByteArray(kind) != "segv" && QByteArray(kind) != "_exit")

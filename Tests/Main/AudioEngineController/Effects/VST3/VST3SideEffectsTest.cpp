@@ -1,4 +1,5 @@
 #include "Tests/Main/AudioEngineController/Effects/VST3/VST3ScanBench.h"
+#include "Tests/Support/PlatformValues.h"
 
 #include <QFile>
 
@@ -10,11 +11,12 @@ using VST3SideEffects = VST3ScanBench;
 
 TEST_F(VST3SideEffects, SpoiledStateSpoilsNoCatalogue)
 {
-    const char *effects[] = {"umask 0777",    "locale C.UTF-8", "chdir /", "rounding up",
-                             "rounding zero", "signal segv",    "alarm 1", "thread"};
+    const QByteArray locale = QByteArray("locale ") + kForeignLocale;
+    const QByteArray effects[] = {"umask 0777",    locale,        "chdir /", "rounding up",
+                                  "rounding zero", "signal segv", "alarm 1", "thread"};
     QStringList expected;
     char place = 'a';
-    for (const char *effect : effects) {
+    for (const QByteArray &effect : effects) {
         const QByteArray name = QByteArray(1, place++) + " spoiler";
         add(QString::fromLatin1(name),
             QByteArray("effect initialize ") + effect + "\nclass \"" + name + "\"\n");
