@@ -28,9 +28,12 @@ start_wine() {
     step "Starting Wine" prepare_wine
 }
 
+# Wine's own processes live from its first program to its last and keep the output of whoever started them: a pipe to a test
+# would never end. So they are started here, and a program with a window stays to keep them.
 prepare_wine() {
-    # The server outlives this step, so it must not hold on to its output.
-    wine wineboot --init && wineserver --wait && wineserver --persistent >/dev/null 2>&1
+    wine wineboot --init >/dev/null 2>&1 && wineserver --wait || return
+    wine notepad >/dev/null 2>&1 &
+    wine rundll32 user32.dll,MessageBeep >/dev/null 2>&1
 }
 
 # shellcheck disable=SC2317 # called by the trap
