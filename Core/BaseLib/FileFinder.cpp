@@ -9,7 +9,6 @@
 
 #include <algorithm>
 #include <mutex>
-#include <optional>
 #include <set>
 #include <vector>
 
@@ -19,7 +18,6 @@ struct FolderEntry {
     QString name;
     bool matches;
     bool isRealFolder;
-    bool isJunction;
 };
 
 std::vector<FolderEntry> listFolder(const QString &folder, const QString &ending)
@@ -34,7 +32,7 @@ std::vector<FolderEntry> listFolder(const QString &folder, const QString &ending
         // A link is told apart first: that needs no look at what it points to.
         const bool isRealFolder = !info.isSymLink() && info.isDir();
         if (matches || isRealFolder)
-            entries.push_back({name, matches, isRealFolder, info.isJunction()});
+            entries.push_back({name, matches, isRealFolder});
     }
     std::sort(entries.begin(), entries.end(), [](const FolderEntry &left, const FolderEntry &right) {
         const int order = QString::compare(left.name, right.name, Qt::CaseInsensitive);
@@ -53,18 +51,6 @@ QString reasonAgainst(const QFileInfo &folder)
     if (!folder.isReadable() || !folder.isExecutable())
         return QStringLiteral("it is not readable");
     return QString();
-}
-
-/// The route of real paths that goes on behind a junction; none when it leads back.
-std::optional<QStringList> routeThrough(const QString &junction, const QString &folder, QStringList route)
-{
-    const QString target = realPath(junction) + QLatin1Char('/');
-    route.append(realPath(folder));
-    for (const QString &place : route)
-        if ((place + QLatin1Char('/')).startsWith(target, kPathCase))
-            return std::nullopt;
-    route.append(target);
-    return route;
 }
 
 /// The folders that were reported as unsearchable already.
@@ -104,11 +90,11 @@ QStringList FileFinder::find(const QString &folder) const
     if (folder.isEmpty()) // made absolute, it would be the working folder
         logUnsearchable(folder, QStringLiteral("no folder is given"));
     else
-        searchFolder(QDir(folder).absolutePath(), {}, found);
+        searchFolder(QDir(folder).absolutePath(), found);
     return found;
 }
 
-void FileFinder::searchFolder(const QString &folder, const QStringList &route, QStringList &found) const
+void FileFinder::searchFolder(const QString &folder, QStringList &found) const
 {
     if (m_cancelled && m_cancelled())
         return;
@@ -123,13 +109,7 @@ void FileFinder::searchFolder(const QString &folder, const QStringList &route, Q
     for (const FolderEntry &entry : entries)
         if (entry.matches)
             found.append(prefix + entry.name);
-    for (const FolderEntry &entry : entries) {
-        const QString path = prefix + entry.name;
-        if (!entry.isRealFolder)
-            continue;
-        if (!entry.isJunction)
-            searchFolder(path, route, found);
-        else if (const auto further = routeThrough(path, folder, route))
-            searchFolder(path, *further, found);
-    }
+    for (const FolderEntry &entry : entries)
+        if (entry.isRealFolder && !leadsBack(prefix + entry.name))
+            searchFolder(prefix + entry.name, found);
 }

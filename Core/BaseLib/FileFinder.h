@@ -25,7 +25,7 @@ public:
     static void forgetReports();
 
 private:
-    void searchFolder(const QString &folder, const QStringList &route, QStringList &found) const;
+    void searchFolder(const QString &folder, QStringList &found) const;
 
     QString m_ending;
     std::function<bool()> m_cancelled;

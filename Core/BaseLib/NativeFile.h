@@ -36,9 +36,9 @@ FileResult renameOver(const QString &from, const QString &to);
 /// Waits until what was written to an open file has reached the disk; systems that cannot do so are not
 /// blamed.
 void syncToDisk(int fileDescriptor);
-/// The path of a file or folder with all links on the way resolved, in a form for comparing with its like;
-/// empty when it is not there.
-QString realPath(const QString &path);
+/// Whether a folder that is no link is one of those in which it lies, or may be: a junction of Windows leads
+/// anywhere, and a search that enters would not end.
+bool leadsBack(const QString &folder);
 /// Sets a file's modification time to now.
 void touchFile(const QString &path);
 /// A file's modification time in nanoseconds since 1970, as fine as the file system keeps it; -1 when there

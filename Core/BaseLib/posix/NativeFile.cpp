@@ -1,7 +1,6 @@
 #include "Core/BaseLib/NativeFile.h"
 
 #include <QFile>
-#include <QFileInfo>
 
 #include <algorithm>
 #include <cerrno>
@@ -24,7 +23,7 @@ FileResult renameOver(const QString &from, const QString &to)
     return {QString::fromLocal8Bit(std::strerror(errno))};
 }
 
-QString realPath(const QString &path) { return QFileInfo(path).canonicalFilePath(); }
+bool leadsBack(const QString &) { return false; } // only links lead elsewhere
 
 void syncToDisk(int fileDescriptor) { fsync(fileDescriptor); }
 

@@ -2,9 +2,11 @@
 
 #include "Core/BaseLib/win32/WindowsText.h"
 
-#include <QDir>
+#include <QFileInfo>
 
 #include <limits>
+#include <optional>
+#include <tuple>
 
 #include <io.h>
 
@@ -43,6 +45,26 @@ private:
 
 bool isHeldByOthers(DWORD error) { return error == ERROR_SHARING_VIOLATION || error == ERROR_ACCESS_DENIED; }
 
+/// Volume and number of a file, the same by whatever path it is reached.
+using FileIdentity = std::tuple<DWORD, DWORD, DWORD>;
+
+std::optional<FileIdentity> identityOf(const QString &path)
+{
+    const FileHandle file(path, FILE_READ_ATTRIBUTES);
+    BY_HANDLE_FILE_INFORMATION information = {};
+    if (!file.isOpen() || !GetFileInformationByHandle(file.get(), &information))
+        return std::nullopt;
+    return FileIdentity(information.dwVolumeSerialNumber, information.nFileIndexHigh,
+                        information.nFileIndexLow);
+}
+
+/// Empty for the top of a drive.
+QString outerFolder(const QString &folder)
+{
+    const QString outer = QFileInfo(folder).path();
+    return outer == folder ? QString() : outer;
+}
+
 qint64 unitsOf(const FILETIME &time)
 {
     return static_cast<qint64>(quint64(time.dwHighDateTime) << 32 | time.dwLowDateTime);
@@ -69,17 +91,16 @@ FileResult renameOver(const QString &from, const QString &to)
     }
 }
 
-QString realPath(const QString &path)
+bool leadsBack(const QString &folder)
 {
-    const FileHandle file(path, FILE_READ_ATTRIBUTES);
-    std::wstring text(32768, L'\0'); // longest path of the system
-    // Some drives have no letter.
-    for (const DWORD form : {VOLUME_NAME_DOS, VOLUME_NAME_GUID}) {
-        const DWORD length = GetFinalPathNameByHandleW(file.get(), text.data(), DWORD(text.size()), form);
-        if (length > 0 && length < text.size())
-            return QDir::fromNativeSeparators(QString::fromWCharArray(text.data(), static_cast<int>(length)));
-    }
-    return QString();
+    const DWORD attributes = GetFileAttributesW(nativePath(folder).c_str());
+    if (attributes == INVALID_FILE_ATTRIBUTES || (attributes & FILE_ATTRIBUTE_REPARSE_POINT) == 0)
+        return false;
+    const std::optional<FileIdentity> target = identityOf(folder);
+    for (QString outer = outerFolder(folder); target && !outer.isEmpty(); outer = outerFolder(outer))
+        if (identityOf(outer) == target)
+            return true;
+    return !target;
 }
 
 void syncToDisk(int fileDescriptor) { _commit(fileDescriptor); }

@@ -1,5 +1,8 @@
 #include "Core/BaseLib/ThreadCount.h"
 
+#include <algorithm>
+#include <iterator>
+
 #include <windows.h>
 
 #include <tlhelp32.h>
@@ -38,15 +41,20 @@ HMODULE moduleAt(const void *address)
     return module;
 }
 
-/// Whether a thread belongs to the system's own pool. The loader itself employs it to load libraries, and its
-/// threads wait for minutes for more work.
-bool isOfThreadPool(DWORD id)
+/// The libraries whose threads the system employs for itself: the loader has some load libraries, COM some
+/// wait for calls. They start when a plug-in first needs such, and wait for minutes for more work.
+constexpr const wchar_t *kEmployers[] = {L"ntdll.dll", L"rpcrt4.dll", L"combase.dll", L"ole32.dll"};
+
+bool isTheSystems(DWORD id)
 {
     const Handle thread(OpenThread(THREAD_QUERY_INFORMATION, FALSE, id));
     const void *start = nullptr;
-    return thread.isValid() &&
-           NtQueryInformationThread(thread.get(), kStartAddress, &start, sizeof start, nullptr) >= 0 &&
-           moduleAt(start) == GetModuleHandleW(L"ntdll.dll");
+    if (!thread.isValid() ||
+        NtQueryInformationThread(thread.get(), kStartAddress, &start, sizeof start, nullptr) < 0)
+        return false;
+    const HMODULE module = moduleAt(start);
+    return module && std::any_of(std::begin(kEmployers), std::end(kEmployers),
+                                 [&](const wchar_t *name) { return GetModuleHandleW(name) == module; });
 }
 
 } // namespace
@@ -61,7 +69,7 @@ std::set<int> runningThreads()
     if (!snapshot.isValid() || !Thread32First(snapshot.get(), &entry))
         return threads;
     do {
-        if (entry.th32OwnerProcessID == process && !isOfThreadPool(entry.th32ThreadID))
+        if (entry.th32OwnerProcessID == process && !isTheSystems(entry.th32ThreadID))
             threads.insert(static_cast<int>(entry.th32ThreadID));
     } while (Thread32Next(snapshot.get(), &entry));
     return threads;
