@@ -27,36 +27,15 @@ protected:
 
 TEST_F(WorkstationFoldersTest, EveryGetter)
 {
-    const struct {
-        Folder folder;
-        const char *path;
-        bool isScratch;
-    } rows[] = {{Folder::Debug, "W\\Debug", false},
-                {Folder::Undo, "W\\Undo", false},
-                {Folder::Media, "W\\Media", false},
-                {Folder::Meters, "W\\Meters", false},
-                {Folder::Temp, "W\\Temp", false},
-                {Folder::DeviceInfo, "W\\DeviceInfo", false},
-                {Folder::MXFIndexedFiles, "W\\MXF_Indexed_Files", true},
-                {Folder::TemplateRamps, "W\\Template Ramps", false},
-                {Folder::VideoStream, "W\\VideoStream", false},
-                {Folder::WorkRoot, "W", false},
-                {Folder::Macros, "P/\\Macros", false},
-                {Folder::Dissolves, "P/\\Dissolves", false},
-                {Folder::EQPresets, "P/\\EQ Presets", true},
-                {Folder::FXPresets, "P/\\FX Presets", true},
-                {Folder::FadePresets, "P/\\Fade Presets", true},
-                {Folder::UserMachines, "P/\\Machines", false},
-                {Folder::EdlConfig, "P/\\EdlConfig", true},
-                {Folder::CapturePreset, "P/\\CapturePreset", false},
-                {Folder::PresetRoot, "P/", false},
-                {Folder::Effects, "C:\\Data\\Effects", false},
-                {Folder::VSTPlugins, "C:\\Data\\Effects\\VSTPlugins", false},
-                {Folder::Pictures, "C:\\Data\\Pictures", false},
-                {Folder::FileFormatPlugins, "C:\\Data\\FileFormatPlugins", false},
-                {Folder::SystemMachines, "C:\\Data\\Machines", false},
-                {Folder::Shaders, "C:\\Data\\Shaders", true},
-                {Folder::SystemRoot, "C:\\Data", false}};
+    // In the order of the folders; a star: scratch.
+    const QStringList rows =
+        QString::fromUtf8(
+            "W\\Debug|W\\Undo|W\\Media|W\\Meters|W\\Temp|W\\DeviceInfo|*W\\MXF_Indexed_Files|"
+            "W\\Template Ramps|W\\VideoStream|W|P/\\Macros|P/\\Dissolves|*P/\\EQ Presets|"
+            "*P/\\FX Presets|*P/\\Fade Presets|P/\\Machines|*P/\\EdlConfig|P/\\CapturePreset|P/|"
+            "C:\\Data\\Effects|C:\\Data\\Effects\\VSTPlugins|C:\\Data\\Pictures|"
+            "C:\\Data\\FileFormatPlugins|C:\\Data\\Machines|*C:\\Data\\Shaders|C:\\Data")
+            .split('|');
     setSystemFolder(L"C:\\Data\\\\/");
     EXPECT_EQ(text(auxFolder()), QStringLiteral("C:\\Data"));
     EXPECT_EQ(setWorkFolder(L"W") + setPresetFolder(L"P/") + setAuxFolder(L"A"), 0);
@@ -65,14 +44,16 @@ TEST_F(WorkstationFoldersTest, EveryGetter)
     std::set<const wchar_t *> buffers;
     for (const bool isOverridden : {false, true}) {
         setShadersOverride(isOverridden);
-        for (const auto &row : rows) {
-            EXPECT_EQ(text(folderPath(row.folder, L"FX.xml")), QLatin1String(row.path) + "\\FX.xml");
-            const wchar_t *const result = folderPath(row.folder);
-            EXPECT_EQ(text(result), QLatin1String(row.path));
-            EXPECT_EQ(result != folderPath(row.folder), row.isScratch) << row.path;
-            EXPECT_EQ(text(folderPath(row.folder, folderPath(row.folder))),
-                      QLatin1String(row.path) + '\\' + row.path);
-            buffers.insert(row.isScratch ? nullptr : result);
+        for (int index = 0; index < rows.size(); ++index) {
+            const auto folder = static_cast<Folder>(index);
+            const bool isScratch = rows[index].startsWith('*');
+            const QString path = rows[index].mid(isScratch ? 1 : 0);
+            EXPECT_EQ(text(folderPath(folder, L"FX.xml")), path + "\\FX.xml");
+            const wchar_t *const result = folderPath(folder);
+            EXPECT_EQ(text(result), path);
+            EXPECT_EQ(result != folderPath(folder), isScratch) << qPrintable(path);
+            EXPECT_EQ(text(folderPath(folder, folderPath(folder))), path + '\\' + path);
+            buffers.insert(isScratch ? nullptr : result);
         }
     }
     EXPECT_EQ(buffers.size(), 21u) << "each its own, and the pool";
@@ -80,25 +61,23 @@ TEST_F(WorkstationFoldersTest, EveryGetter)
 
 TEST_F(WorkstationFoldersTest, RootsAreStrippedAndCut)
 {
-    const std::wstring longest(259, L'x');
+    const std::wstring most(258, L'x');
+    const std::wstring longest = most + L'x';
     const struct {
         const char *name;
         std::wstring system;
         std::wstring root;
-        std::wstring debug;
-    } rows[] = {{"unset", L"", L"", L"\\Debug"},
-                {"separators only", L"\\/\\", L"", L"\\Debug"},
-                {"as long as can be", longest, longest, longest},
-                {"longer", longest + L"yz", longest, longest},
-                {"separators where it is cut", std::wstring(258, L'x') + L"\\\\y", std::wstring(258, L'x'),
-                 std::wstring(258, L'x') + L"\\"},
-                {"half a character where it is cut",
-                 std::wstring(258, L'x') + wchar_t(0xD83D) + wchar_t(0xDE00), std::wstring(258, L'x'),
-                 std::wstring(258, L'x') + L"\\"}};
+    } rows[] = {{"unset", L"", L""},
+                {"separators only", L"\\/\\", L""},
+                {"as long as can be", longest, longest},
+                {"longer", longest + L"yz", longest},
+                {"separators where it is cut", most + L"\\\\y", most},
+                {"half a character where it is cut", most + wchar_t(0xD83D) + wchar_t(0xDE00), most}};
     for (const auto &row : rows) {
         setSystemFolder(row.system.c_str());
-        EXPECT_EQ(text(folderPath(Folder::SystemRoot)), QString::fromStdWString(row.root)) << row.name;
-        EXPECT_EQ(text(folderPath(Folder::Debug)), QString::fromStdWString(row.debug)) << row.name;
+        const QString root = QString::fromStdWString(row.root);
+        EXPECT_EQ(text(folderPath(Folder::SystemRoot)), root) << row.name;
+        EXPECT_EQ(text(folderPath(Folder::Debug)), (root + "\\Debug").left(259)) << row.name;
     }
     wchar_t unterminated[259];
     std::fill(std::begin(unterminated), std::end(unterminated), L'u');

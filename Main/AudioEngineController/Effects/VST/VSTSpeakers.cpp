@@ -1,6 +1,8 @@
 #include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
 
+#include <algorithm>
 #include <cstddef>
+#include <cstring>
 
 namespace {
 
@@ -62,6 +64,15 @@ std::vector<VSTSpeakerArrangement> candidates(int channels)
 }
 
 } // namespace
+
+bool VSTSpeakerArrangement::operator==(const VSTSpeakerArrangement &other) const
+{
+    const auto isSame = [](const auto &one, const auto &two) {
+        return one.type == two.type && std::strcmp(one.name, two.name) == 0;
+    };
+    return type == other.type && numChannels == other.numChannels &&
+           std::equal(speakers, speakers + numChannels, other.speakers, isSame);
+}
 
 VstInt32 vstSpeakerType(const std::string &label)
 {

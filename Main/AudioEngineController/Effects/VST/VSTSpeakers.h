@@ -3,7 +3,6 @@
 #include "Main/AudioEngineController/Effects/BusFormats/BusFormat.h"
 #include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
 
-#include <cstring>
 #include <map>
 #include <string>
 #include <utility>
@@ -17,10 +16,7 @@ struct VSTSpeakerArrangement {
     VstInt32 numChannels;
     VstPublished::VstSpeakerProperties speakers[kMaxSpeakers];
 
-    bool operator==(const VSTSpeakerArrangement &other) const
-    {
-        return std::memcmp(this, &other, sizeof other) == 0; // made of zeros and without gaps
-    }
+    bool operator==(const VSTSpeakerArrangement &other) const;
 };
 
 /// The speaker type of a channel label, in the exact spelling; -2 for a label that stands for no speaker of
