@@ -1,18 +1,9 @@
 #include "Tests/Support/VST2Fixture.h"
 
 #include "Tests/Support/FixtureFile.h"
+#include "Tests/Support/PlatformValues.h"
 
-namespace {
-
-#ifdef _WIN32
-const char kEnding[] = ".dll";
-#else
-const char kEnding[] = ".so";
-#endif
-
-} // namespace
-
-QString vst2Ending() { return QLatin1String(kEnding); }
+QString vst2Ending() { return QLatin1String(kVst2Ending); }
 
 QString vst2FixturePath(VST2Fixture fixture)
 {

@@ -1,18 +1,11 @@
 #include "Tests/Support/VST3Fixture.h"
 
 #include "Tests/Support/FixtureFile.h"
+#include "Tests/Support/PlatformValues.h"
 
 #include <QFileInfo>
 
 namespace {
-
-#ifdef _WIN32
-const char kBundleFolder[] = "x86_64-win";
-const char kBundleEnding[] = ".vst3";
-#else
-const char kBundleFolder[] = "x86_64-linux";
-const char kBundleEnding[] = ".so";
-#endif
 
 QString modulePathIn(const QString &folder, const QString &name)
 {
@@ -53,4 +46,9 @@ QString vst3BundleBinary(const QString &bundle)
 {
     return bundle + QStringLiteral("/Contents/") + QLatin1String(kBundleFolder) + QLatin1Char('/') +
            QFileInfo(bundle).completeBaseName() + QLatin1String(kBundleEnding);
+}
+
+QString vst3BundlePath(const QString &bundle)
+{
+    return kBundleIsThePlugin ? bundle : vst3BundleBinary(bundle);
 }

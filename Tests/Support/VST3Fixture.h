@@ -24,3 +24,5 @@ QString addVST3Bundle(const QString &folder, const QString &name, const QByteArr
                       VST3Fixture fixture = VST3Fixture::Scripted);
 /// The binary inside such a bundle.
 QString vst3BundleBinary(const QString &bundle);
+/// The path under which a scan records such a bundle.
+QString vst3BundlePath(const QString &bundle);

@@ -1,5 +1,10 @@
 #include "Tests/Support/PlatformValues.h"
 
+const char *const kVst2Ending = ".so";
+const char *const kBundleFolder = "x86_64-linux";
+const char *const kBundleEnding = ".so";
+const bool kBundleIsThePlugin = true;
+const char *const kForeignModule = "Contents/x86_64-win/Several.vst3";
 const char *const kForeignLocale = "C.UTF-8";
 const char *const kLoaderKiller = "segv";
 const bool kHomeFollowsEnvironment = true;

@@ -4,7 +4,7 @@
 
 namespace {
 
-class VST3Links : public VST3ScanBench {
+class VST3FileSystem : public VST3ScanBench {
 protected:
     QString inPlugins(const char *name) const
     {
@@ -14,7 +14,7 @@ protected:
 
 } // namespace
 
-TEST_F(VST3Links, ModulesAndFoldersAreFollowedWhereTheyAreListed)
+TEST_F(VST3FileSystem, LinkedModulesAndFoldersAreFollowedWhereTheyAreListed)
 {
     const QString elsewhere = m_folder.path(QStringLiteral("Elsewhere"));
     const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\" ";
@@ -41,7 +41,7 @@ TEST_F(VST3Links, ModulesAndFoldersAreFollowedWhereTheyAreListed)
     EXPECT_EQ(loaded(), texts({"File"}));
 }
 
-TEST_F(VST3Links, AModuleReachedOnSeveralWaysIsProbedOnce)
+TEST_F(VST3FileSystem, AModuleReachedOnSeveralWaysIsProbedOnce)
 {
     const QString path = add(QStringLiteral("sub/Comp"));
     ASSERT_TRUE(QFile::link(inPlugins("sub"), inPlugins("linked folder")));
@@ -49,4 +49,13 @@ TEST_F(VST3Links, AModuleReachedOnSeveralWaysIsProbedOnce)
     scan();
     EXPECT_EQ(loaded(), texts({"Comp"}));
     EXPECT_EQ(records("Name Path"), QStringList{QStringLiteral("Comp|") + path});
+}
+
+TEST_F(VST3FileSystem, WhatIsHiddenIsNotSearched)
+{
+    add(QStringLiteral(".Hidden"));
+    add(QStringLiteral(".hidden folder/Unseen"));
+    add(QStringLiteral("<odd> & /Comp"));
+    scan();
+    EXPECT_EQ(loaded(), texts({"Comp"}));
 }
