@@ -36,8 +36,8 @@ struct CataloguedPlugin {
     const PluginFormat *format;
     EffectRecord record;
 
-    bool isOfCrashedFile = false; ///< another record says that the whole file ended the scanner: it is not loaded any
-                          ///< more
+    bool isOfCrashedFile = false; ///< another record says that the whole file ended the scanner: it is not
+                                  ///< loaded any more
 
     PluginState state() const;
     bool isUsable() const { return record.working && !isOfCrashedFile; }
