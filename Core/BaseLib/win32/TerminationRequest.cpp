@@ -1,6 +1,8 @@
 #include "Core/BaseLib/TerminationRequest.h"
 
 #include <climits>
+#include <cwchar>
+#include <iterator>
 
 #include <windows.h>
 
@@ -62,12 +64,28 @@ DWORD WINAPI runWindow(void *created)
     return 0;
 }
 
+void CALLBACK onParentsEnd(void *, BOOLEAN) { TerminationSignal::raise(); }
+
+/// Whoever started this process as its helper says so; it is not to outlive that one.
+void watchParent()
+{
+    wchar_t text[16] = {};
+    if (GetEnvironmentVariableW(L"FXPROBE_PARENT", text, static_cast<DWORD>(std::size(text))) == 0)
+        return;
+    const HANDLE parent =
+        OpenProcess(SYNCHRONIZE, FALSE, static_cast<DWORD>(std::wcstoul(text, nullptr, 10)));
+    HANDLE wait = nullptr; // lives as long as the process, as the handle does
+    if (parent)
+        RegisterWaitForSingleObject(&wait, parent, onParentsEnd, nullptr, INFINITE, WT_EXECUTEONLYONCE);
+}
+
 } // namespace
 
 void TerminationSignal::install()
 {
     requests(); // made before anybody asks
     SetConsoleCtrlHandler(onConsoleEvent, TRUE);
+    watchParent();
     // The window lives as long as the process.
     static const HANDLE created = [] {
         const HANDLE event = CreateEventW(nullptr, TRUE, FALSE, nullptr);

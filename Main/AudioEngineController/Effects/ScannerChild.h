@@ -2,21 +2,14 @@
 
 #include <QProcess>
 
-/// The scanner as a child process, as far as systems differ.
+/// The scanner as a child process, as far as systems differ: it is asked to end when this process ends.
 class ScannerChild : public QProcess {
 public:
     ScannerChild();
-    ~ScannerChild() override;
-
-    /// To be called when the process has started: from now on it ends with this process.
-    void tieToThisProcess();
 
     /// In words, what ended a process that crashed; `code` is what `exitCode()` gave.
     static QString crashText(int code);
 
 protected:
     void setupChildProcess() override;
-
-private:
-    void *m_job = nullptr; ///< Windows: the job object that holds the process
 };

@@ -29,8 +29,6 @@ bool ScannerProcess::start(const QString &program, const QStringList &arguments,
 {
     m_child->start(program, arguments, QIODevice::ReadWrite);
     m_started = m_child->waitForStarted(static_cast<int>(timeout.count()));
-    if (m_started)
-        m_child->tieToThisProcess();
     return m_started;
 }
 
@@ -76,5 +74,5 @@ QString ScannerProcess::takeOutput()
 {
     QByteArray output;
     output.swap(m_output);
-    return QString::fromLocal8Bit(output).trimmed();
+    return QString::fromUtf8(output).trimmed();
 }

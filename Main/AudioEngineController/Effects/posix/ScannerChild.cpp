@@ -8,16 +8,12 @@
 
 ScannerChild::ScannerChild() = default;
 
-ScannerChild::~ScannerChild() = default;
-
 void ScannerChild::setupChildProcess()
 {
     setpgid(0, 0);
     // Sent when the thread that started the scanner ends, be it with the whole process.
     prctl(PR_SET_PDEATHSIG, SIGTERM);
 }
-
-void ScannerChild::tieToThisProcess() {}
 
 // NOTE: Qt documents no exit code for a crashed process; on these platforms Qt 5 puts the signal there.
 QString ScannerChild::crashText(int code)

@@ -2,37 +2,23 @@
 
 #include "Core/BaseLib/FormatText.h"
 
+#include <QProcessEnvironment>
+
 #include <qt_windows.h>
 
 ScannerChild::ScannerChild()
 {
     setCreateProcessArgumentsModifier(
         [](QProcess::CreateProcessArguments *arguments) { arguments->flags |= CREATE_NEW_PROCESS_GROUP; });
-}
-
-ScannerChild::~ScannerChild()
-{
-    if (m_job)
-        CloseHandle(m_job);
+    // The scanner waits for the end of that process. A job object would do it as well, but would end the
+    // scanner in the middle of a probe, whose plug-in would be blamed, and with it whatever plug-ins have
+    // started.
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(QStringLiteral("FXPROBE_PARENT"), QString::number(GetCurrentProcessId()));
+    setProcessEnvironment(environment);
 }
 
 void ScannerChild::setupChildProcess() {}
-
-void ScannerChild::tieToThisProcess()
-{
-    m_job = CreateJobObjectW(nullptr, nullptr);
-    if (!m_job)
-        return;
-    JOBOBJECT_EXTENDED_LIMIT_INFORMATION limits = {};
-    limits.BasicLimitInformation.LimitFlags = JOB_OBJECT_LIMIT_KILL_ON_JOB_CLOSE;
-    SetInformationJobObject(m_job, JobObjectExtendedLimitInformation, &limits, sizeof limits);
-    HANDLE process =
-        OpenProcess(PROCESS_SET_QUOTA | PROCESS_TERMINATE, FALSE, static_cast<DWORD>(processId()));
-    if (!process)
-        return;
-    AssignProcessToJobObject(m_job, process);
-    CloseHandle(process);
-}
 
 QString ScannerChild::crashText(int code)
 {
