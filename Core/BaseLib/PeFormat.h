@@ -18,8 +18,10 @@ inline constexpr quint16 kPeOptionalMagic32 = 0x010b; // PE32
 inline constexpr quint16 kPeOptionalMagic64 = 0x020b; // PE32+
 inline constexpr quint16 kPeFlagDll = 0x2000;         // IMAGE_FILE_DLL
 inline constexpr quint64 kPePage = 4096;              // memory is filled from the file in such units
-inline constexpr quint64 kPeSector = 512;             // the loader takes sections from such an offset on
-inline constexpr quint32 kPeDelayByAddress = 1;       // dlattrRva: the entry holds relative addresses
+/// More sections than this the loader takes from no file (PE format, "Number of sections").
+inline constexpr quint16 kMostPeSections = 96;
+inline constexpr quint64 kPeSector = 512;       // the loader takes sections from such an offset on
+inline constexpr quint32 kPeDelayByAddress = 1; // dlattrRva: the entry holds relative addresses
 
 inline constexpr quint16 kPeMachineX86 = 0x014c;     // IMAGE_FILE_MACHINE_I386
 inline constexpr quint16 kPeMachineArm = 0x01c4;     // IMAGE_FILE_MACHINE_ARMNT

@@ -78,6 +78,8 @@ bool PeImage::addParts(ByteView file, const PeOptionalHeader &header, ByteView s
 {
     if (header.sectionAlignment < kPePage) // drivers and the like, which the loader maps in another way
         return false;
+    if (sectionCount > kMostPeSections) // looking anything up would take long
+        return false;
     const std::optional<ByteView> headers = file.part(0, header.headersSize);
     bool isAdded = headers && m_parts.add(0, header.headersSize, *headers);
     for (quint64 index = 0; isAdded && index < sectionCount; ++index) {
