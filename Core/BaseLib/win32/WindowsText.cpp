@@ -29,7 +29,9 @@ QString systemMessage(DWORD error, const QString &subject)
     wchar_t text[512] = {};
     const DWORD length = FormatMessageW(FORMAT_MESSAGE_FROM_SYSTEM | FORMAT_MESSAGE_IGNORE_INSERTS, nullptr,
                                         error, 0, text, static_cast<DWORD>(std::size(text)), nullptr);
-    const QString message = QString::fromWCharArray(text, static_cast<int>(length)).simplified();
+    QString message = QString::fromWCharArray(text, static_cast<int>(length)).simplified();
+    if (message.endsWith(QLatin1Char('.'))) // it becomes a part of a sentence
+        message.chop(1);
     if (message.isEmpty())
         return formatText(L"error %lu", error);
     return QString(message).replace(QLatin1String("%1"), subject);
