@@ -35,7 +35,7 @@ SettledFolders settleFolders(const QStringList &folders)
 {
     SettledFolders settled;
     for (const QString &given : folders) {
-        const QString folder = QDir::cleanPath(QDir(given).absolutePath());
+        const QString folder = QDir::cleanPath(QFileInfo(given).absoluteFilePath());
         if (given.isEmpty() || !QFileInfo(folder).isDir())
             settled.leftOut.append(QStringLiteral("there is no folder '%1'").arg(given));
         else if (!canStandInScanList(folder))

@@ -6,6 +6,7 @@
 
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
 
 #include <algorithm>
 #include <set>
@@ -16,7 +17,7 @@ bool isNamed(const EffectRecord &record, const QString &name)
 {
     const auto equals = [&name](const QString &text) { return text.compare(name, Qt::CaseInsensitive) == 0; };
     return equals(record.name) || equals(fileNameOf(record.path)) || equals(record.path) ||
-           record.path == QDir::cleanPath(QDir(name).absolutePath());
+           record.path == QDir::cleanPath(QFileInfo(name).absoluteFilePath());
 }
 
 /// Gives the chosen records another chance; the number of them.

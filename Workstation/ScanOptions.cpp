@@ -4,6 +4,7 @@
 
 #include <QCommandLineParser>
 #include <QDir>
+#include <QFileInfo>
 
 namespace {
 
@@ -116,7 +117,7 @@ CommandLine readCommandLine(const QStringList &arguments)
     options.strict = parser.isSet(option("strict"));
     if (options.dataFolder.isEmpty())
         options.dataFolder = userDataFolder();
-    options.dataFolder = QDir::cleanPath(QDir(options.dataFolder).absolutePath());
+    options.dataFolder = QDir::cleanPath(QFileInfo(options.dataFolder).absoluteFilePath());
     if (wrong.isEmpty())
         wrong = checkTogether(options, parser.isSet(option("timeout")));
     line.isError = !wrong.isEmpty();

@@ -90,7 +90,7 @@ QStringList FileFinder::find(const QString &folder) const
     if (folder.isEmpty()) // made absolute, it would be the working folder
         logUnsearchable(folder, QStringLiteral("no folder is given"));
     else
-        searchFolder(QDir(folder).absolutePath(), found);
+        searchFolder(QDir::cleanPath(QFileInfo(folder).absoluteFilePath()), found);
     return found;
 }
 

@@ -163,7 +163,7 @@ const wchar_t *WorkstationFolders::installRootPath(const wchar_t *fileName)
 
 const wchar_t *WorkstationFolders::profilesPath(const wchar_t *fileName)
 {
-    const std::wstring temporary = QString::fromLocal8Bit(qgetenv("TMP")).toStdWString();
+    const std::wstring temporary = qEnvironmentVariable("TMP").toStdWString();
     return PathText().add(temporary.c_str()).add(L"\\tesselprofiles\\").add(fileName).into(s_profiles);
 }
 
