@@ -11,8 +11,8 @@
 #include <pluginterfaces/vst/ivstmessage.h>
 
 /// One instance of a class: its component and its edit controller, which may be the same object. Used on one
-/// thread. Exceptions of the plug-in leave `create` and the operations on state; an object that threw before
-/// it was initialised is not called again.
+/// thread. Exceptions of the plug-in leave `create`, after which the instance is to be closed, and the
+/// operations on state; an object that threw before it was initialised is not called again.
 class VST3Instance {
 public:
     VST3Instance() = default;

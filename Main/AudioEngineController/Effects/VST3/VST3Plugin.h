@@ -82,6 +82,8 @@ private:
     Steinberg::IPluginFactory *queryFactory();
     bool openInstance(const EffectRecord &record);
     bool instantiate(const EffectRecord &record);
+    /// Whatever became of the start or of the call that ends the processing.
+    void deactivate();
     /// Ends the instance, then the module.
     void unload();
     template <typename Call>

@@ -39,7 +39,11 @@ bool VST3Plugin::openClass(const EffectRecord &record)
         return openInstance(record);
     } catch (const std::runtime_error &error) {
         DebugLog(L"%s", error.what());
+    } catch (...) {
+        m_instance.close();
+        throw;
     }
+    m_instance.close(); // what threw on the way is no instance
     return false;
 }
 
@@ -65,7 +69,7 @@ bool VST3Plugin::instantiate(const EffectRecord &record)
         if (m_record.vendor.isEmpty())
             m_record.vendor = vendorOf(*factory);
     }
-    factory->release();
+    factory->release(); // not when the plug-in threw, as for a listing
     return created;
 }
 
@@ -126,13 +130,25 @@ bool VST3Plugin::setBusFormats(int inputFormat, int outputFormat)
 
 bool VST3Plugin::startProcessing()
 {
-    return callPlugin("start", [this] { return m_processor.start(); });
+    const bool started = callPlugin("start", [this] { return m_processor.start(); });
+    if (!started)
+        deactivate();
+    return started;
 }
 
 void VST3Plugin::stopProcessing()
 {
     callPlugin("stop", [this] {
         m_processor.stop();
+        return true;
+    });
+    deactivate();
+}
+
+void VST3Plugin::deactivate()
+{
+    callPlugin("deactivate", [this] {
+        m_processor.deactivate();
         return true;
     });
 }

@@ -15,7 +15,6 @@ constexpr Vst::BusDirection kDirections[] = {Vst::kInput, Vst::kOutput};
 
 bool VST3Processor::attach(Vst::IComponent *component)
 {
-    detach();
     m_component = component;
     m_processor = queryFor<Vst::IAudioProcessor>(component);
     return m_processor && m_processor->canProcessSampleSize(Vst::kSample32) == kResultOk;
@@ -24,6 +23,8 @@ bool VST3Processor::attach(Vst::IComponent *component)
 void VST3Processor::detach()
 {
     m_component = nullptr;
+    for (Side &side : m_sides)
+        side.positions.clear(); // those of the next component are its own
     if (Vst::IAudioProcessor *processor = m_processor.take())
         processor->release();
 }
@@ -47,9 +48,10 @@ bool VST3Processor::start()
     return true;
 }
 
-void VST3Processor::stop()
+void VST3Processor::stop() { m_processor->setProcessing(false); }
+
+void VST3Processor::deactivate()
 {
-    m_processor->setProcessing(false);
     m_component->setActive(false);
     activateBuses(false);
 }

@@ -16,7 +16,7 @@
 class VST3Processor {
 public:
     /// Takes the audio side of a component that is initialised; false when it has none that takes 32-bit
-    /// samples.
+    /// samples. The same component again keeps its bus formats; before another one, detach.
     bool attach(Steinberg::Vst::IComponent *component);
     /// Lets go of the component, which must still be there.
     void detach();
@@ -27,8 +27,11 @@ public:
     /// From then on the audio of such a bus is in the order of its format. The buses must have been read, and
     /// are to be read again.
     bool setFormats(const std::array<int, 2> &formatCodes, const VST3PluginSettings &settings);
+    /// Activates the component and switches processing on. After a false or an exception, deactivate.
     bool start();
+    /// Switches processing off; the component stays active.
     void stop();
+    void deactivate();
     /// Reads the buses; the channels of the used ones in both directions. None while nothing is attached.
     ChannelSetup readChannels();
     bool process(ChannelBuffers &buffers, Steinberg::int32 frames);

@@ -88,7 +88,7 @@ TEST_F(VST3InstanceTest, FailuresHaveTheirLinesAndLeaveTheObjectUsable)
 {
     const struct {
         const char *name;
-        const char *script;
+        QByteArray script;
         VST3Fixture fixture;
         const char *id;
         const char *line;
@@ -109,7 +109,9 @@ TEST_F(VST3InstanceTest, FailuresHaveTheirLinesAndLeaveTheObjectUsable)
          "The component could not be created: 0x00000000"},
         {"does not initialise", "controller self\nanswer initialize false", VST3Fixture::Scripted, kId,
          "The component could not be initialised: 0x00000001"},
-        {"throws", "fault initialize throw-std", VST3Fixture::Scripted, kId, "thrown by the fixture"}};
+        {"throws", "fault initialize throw-std", VST3Fixture::Scripted, kId, "thrown by the fixture"},
+        {"throws when it is there", kPanel + "fault connect throw-std Panel", VST3Fixture::Scripted, kId,
+         "thrown by the fixture"}};
     for (const auto &row : cases) {
         SCOPED_TRACE(row.name);
         EffectRecord record = add(row.script, row.name, row.fixture);
@@ -135,6 +137,7 @@ TEST_F(VST3InstanceTest, OtherExceptionsReachTheCaller)
     {
         VST3Plugin plugin;
         EXPECT_THROW(plugin.openClass(record), int);
+        EXPECT_FALSE(plugin.isInstantiated());
     }
     EXPECT_TRUE(
         takeTrace().contains(QStringLiteral("terminate Panel; release Panel; terminate Comp; release Comp")));

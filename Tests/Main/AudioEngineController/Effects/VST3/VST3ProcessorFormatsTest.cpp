@@ -151,3 +151,18 @@ TEST(VST3ProcessorFormats, AreOfferedAndOrderTheAudio)
         processor.detach();
     }
 }
+
+TEST(VST3ProcessorFormats, StayWithTheComponent)
+{
+    Reverberator component;
+    component.known = SpeakerArr::k101;
+    VST3Processor processor;
+    ASSERT_TRUE(processor.attach(&component));
+    processor.readChannels();
+    ASSERT_TRUE(processor.setFormats({70, 70}, {0}));
+    ASSERT_TRUE(processor.attach(&component));
+    EXPECT_EQ(blockThrough(processor), "0 11 22 33 44 55 67 78 89 100 106 ") << "opened again";
+    processor.detach();
+    ASSERT_TRUE(processor.attach(&component));
+    EXPECT_EQ(blockThrough(processor), "0 11 22 33 44 55 66 77 88 99 110 ") << "in its own order";
+}
