@@ -24,7 +24,7 @@ bool AudioPlugin::open(const AudioSettings &settings)
         return false;
     m_open = true;
     m_settings = settings;
-    m_channels = readChannels();
+    setChannels(readChannels());
     if (m_bypassed)
         bypassPlugin(true);
     return true;
@@ -55,11 +55,11 @@ bool AudioPlugin::start()
     const TAutoLockCS lock(&m_processing);
     if (m_running || !m_open)
         return m_running;
-    if (!isUsable(m_channels) || !startProcessing())
+    if (!isUsable(channels()) || !startProcessing())
         return false;
     // After the call, in which the plug-in may have changed its channels; it does not run for a rebuild
     // until here.
-    m_running = isUsable(m_channels) && makeBuffers();
+    m_running = isUsable(channels()) && makeBuffers();
     if (!m_running)
         stopProcessing();
     return m_running;
@@ -68,7 +68,7 @@ bool AudioPlugin::start()
 bool AudioPlugin::makeBuffers()
 {
     try {
-        m_buffers.allocate(m_channels, m_settings.blockSize);
+        m_buffers.allocate(channels(), m_settings.blockSize);
         return true;
     } catch (const std::bad_alloc &) {
         DebugLog(L"%ls: no memory for its audio", name());
@@ -122,8 +122,14 @@ bool AudioPlugin::isUsable(const ChannelSetup &channels) const
 
 ChannelSetup AudioPlugin::channels() const
 {
-    const TAutoLockCS lock(&m_processing);
+    const std::lock_guard<std::mutex> lock(m_channelsMutex);
     return m_channels;
+}
+
+void AudioPlugin::setChannels(const ChannelSetup &channels)
+{
+    const std::lock_guard<std::mutex> lock(m_channelsMutex);
+    m_channels = channels;
 }
 
 void AudioPlugin::rebuildChannels()
@@ -137,7 +143,7 @@ void AudioPlugin::rebuildChannels()
     const bool wasRunning = m_running;
     stop();
     m_buffers.free();
-    m_channels = readChannels();
+    setChannels(readChannels());
     tellListeners([this](IAudioPluginListener &listener) { listener.pluginChanged(*this); });
     if (wasRunning)
         start();

@@ -8,6 +8,7 @@
 
 #include <atomic>
 #include <memory>
+#include <mutex>
 #include <optional>
 #include <vector>
 
@@ -44,7 +45,8 @@ protected:
 ///
 /// Life: made and loaded by its host, `open`, `start` and `stop` any number of times, `close`. One thread
 /// does that; what a plug-in reports may come from any. The processing lock is held while the audio's state
-/// changes or a block is processed; the listener lock is taken after it, never before.
+/// changes or a block is processed; the listener lock is taken after it, never before: a listener must not
+/// wait for a block.
 class AudioPlugin {
 public:
     /// More channels than any plug-in has in one direction. One that states more cannot be used for audio:
@@ -82,7 +84,7 @@ public:
     bool isOpen() const { return m_open; }
     bool isRunning() const { return m_running; }
 
-    /// The channels as last read from the plug-in.
+    /// The channels as last read from the plug-in. Waits for no block, so a listener may ask.
     ChannelSetup channels() const;
     /// Reads the channels anew because the plug-in says that they changed: stops it if it runs, frees the
     /// buffers, reads, tells the listeners, starts it again. Nothing while it is being torn down. Any thread,
@@ -146,12 +148,14 @@ private:
     bool isUsable(const AudioSettings &settings) const;
     bool isUsable(const ChannelSetup &channels) const;
     bool makeBuffers();
+    void setChannels(const ChannelSetup &channels);
 
     mutable KriticalSection m_processing;
     KriticalSection m_listening;
     std::vector<IAudioPluginListener *> m_listeners; ///< not owned
     AudioSettings m_settings = {0, 0};
     ChannelSetup m_channels;
+    mutable std::mutex m_channelsMutex; ///< nothing is called under it
     ChannelBuffers m_buffers;
     bool m_inBlock = false;        ///< the plug-in works on the buffers
     bool m_rebuildPending = false; ///< asked for meanwhile

@@ -107,23 +107,31 @@ std::optional<EffectRecord> VSTHost::findByKey(const QString &key) const
 std::unique_ptr<VSTPlugin> VSTHost::loadByKey(const QString &key)
 {
     const std::optional<EffectRecord> record = findByKey(key);
-    return record ? loadRecord(*record) : nullptr;
+    return record ? loadRecord(*record, key) : nullptr;
 }
 
 LoadedPlugin VSTHost::loadPlugin(const QString &identifier)
 {
     const std::optional<EffectRecord> record = findByKey(identifier);
-    return {record.has_value(), record ? loadRecord(*record) : nullptr};
+    return {record.has_value(), record ? loadRecord(*record, identifier) : nullptr};
 }
 
-std::unique_ptr<VSTPlugin> VSTHost::loadRecord(const EffectRecord &record)
+std::unique_ptr<VSTPlugin> VSTHost::loadRecord(const EffectRecord &record, const QString &requestedKey)
 {
     DebugLog(L"Found: %ls, trying to load", record.id);
-    if (record.vstCategory == kPlugCategOfflineProcess || !record.enabled)
+    const bool isOffline = record.vstCategory == kPlugCategOfflineProcess;
+    if (isOffline || !record.enabled) {
+        DebugLog(isOffline ? L"%ls processes whole files and is not loaded"
+                           : L"%ls is switched off and not loaded",
+                 record.id);
         return nullptr;
+    }
     auto plugin = std::make_unique<VSTPlugin>(*this);
-    if (plugin->load(record, VSTHostCallback, 0))
+    if (plugin->load(record, VSTHostCallback, 0)) {
+        if (requestedKey != record.id)
+            plugin->setRequestedKey(requestedKey);
         return plugin;
+    }
     DebugLog(L"%ls, Didn't manage it", record.id);
     return nullptr;
 }

@@ -47,8 +47,10 @@ public:
     void setPluginBeingLoaded(VSTPlugin *plugin) { m_pluginBeingLoaded = plugin; }
     /// Its sub-plug-in identifier; false when no plug-in is being loaded.
     bool shellIdOfPluginBeingLoaded(VstInt32 &id) const;
-    /// Notifications from this plug-in are dropped; null: from none. Gives the one before.
-    VSTPlugin *setIgnoredPlugin(VSTPlugin *plugin) { return m_ignoredPlugin.exchange(plugin); }
+    /// Notifications from this plug-in are dropped; null: from none.
+    void setIgnoredPlugin(VSTPlugin *plugin) { m_ignoredPlugin = plugin; }
+    /// Drops them no more, unless another plug-in took its place meanwhile.
+    void stopIgnoring(VSTPlugin *plugin) { m_ignoredPlugin.compare_exchange_strong(plugin, nullptr); }
     bool isIgnored(const VSTPlugin *plugin) const { return plugin == m_ignoredPlugin; }
 
     void registerPlugin(VSTPlugin *plugin);
@@ -103,7 +105,7 @@ private:
     bool pin(const VSTPlugin *claimed);
     void unpin(const VSTPlugin *plugin);
     std::optional<EffectRecord> findByKey(const QString &key) const;
-    std::unique_ptr<VSTPlugin> loadRecord(const EffectRecord &record);
+    std::unique_ptr<VSTPlugin> loadRecord(const EffectRecord &record, const QString &requestedKey);
     bool cleanUpNames();
 
     std::atomic<int> m_blockSize{256};

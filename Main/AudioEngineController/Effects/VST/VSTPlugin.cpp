@@ -56,6 +56,7 @@ VSTPlugin::~VSTPlugin()
 {
     setTornDown(true);
     unload();
+    m_host.stopIgnoring(this); // another object may get this address
     m_host.unregisterPlugin(this);
 }
 
@@ -155,7 +156,8 @@ bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
     {
         const TAutoLockCS lock(&processingLock()); // a thread of the plug-in may have its channels rebuilt
         m_effect = effect;
-        m_effectOpened = false;
+        m_effectOpened = m_canBypass = m_takesMidi = false;
+        m_needsIdle = m_wantsMidi = m_ioChanged = false; // of the effect before
         m_speakersPending = true;
     }
     ProbeReport::stage(ProbeStage::Ask);

@@ -63,6 +63,8 @@ public:
     const QString &key() const { return m_key; }
     QString identifierPrefix() const override;
     QString formatIdentifier() const override { return m_key; }
+    /// The key under which it was asked for, where that is an earlier one; presets may still carry it.
+    void setRequestedKey(const QString &key) { m_requestedKey = key; }
     /// Identifier of the sub-plug-in that this object stands for, as the plug-in sees it; 0: none.
     VstInt32 shellId() const { return m_shellId; }
     /// True when it was loaded to be probed only.
@@ -124,7 +126,7 @@ protected:
     ChannelSetup readChannels() override;
     bool processBlock(ChannelBuffers &buffers, int frames) override
     {
-        return m_effect.process(buffers, frames);
+        return isCallable() && m_effect.process(buffers, frames);
     }
     bool bypassPlugin(bool bypassed) override;
 
@@ -188,6 +190,7 @@ private:
     bool m_isProbe = false;
     QString m_name;
     QString m_key;
+    QString m_requestedKey; ///< empty: its own
     int m_behaviour = 0;
     std::atomic<bool> m_needsIdle{false};
     std::atomic<bool> m_wantsMidi{false};

@@ -21,15 +21,17 @@ class Ignoring {
 public:
     Ignoring(VSTHost &host, VSTPlugin *plugin)
         : m_host(host)
-        , m_before(host.setIgnoredPlugin(plugin))
-    {}
-    ~Ignoring() { m_host.setIgnoredPlugin(m_before); }
+        , m_plugin(plugin)
+    {
+        m_host.setIgnoredPlugin(plugin);
+    }
+    ~Ignoring() { m_host.stopIgnoring(m_plugin); }
     Ignoring(const Ignoring &) = delete;
     Ignoring &operator=(const Ignoring &) = delete;
 
 private:
     VSTHost &m_host;
-    VSTPlugin *m_before;
+    VSTPlugin *m_plugin;
 };
 
 /// The reason why a preset cannot be loaded.
@@ -143,7 +145,8 @@ bool VSTPlugin::isLoadable(const PluginPreset &preset) const
 {
     if (!isCallable())
         return refuse(m_name, QStringLiteral("the plug-in cannot be called any more"));
-    if (preset.identifier != identifier())
+    const QString requested = identifierPrefix() + m_requestedKey;
+    if (preset.identifier != identifier() && (m_requestedKey.isEmpty() || preset.identifier != requested))
         return refuse(m_name, QStringLiteral("it is of ") + preset.identifier);
     if (preset.data.isEmpty())
         return refuse(m_name, QStringLiteral("it holds no data"));

@@ -28,6 +28,7 @@ bool VSTPlugin::UpdateSpeakerArrangement(int inputs, int outputs, bool force)
     m_toldCounts = stated;
     const std::optional<Counts> counts = countsToTell({inputs, outputs}, stated);
     m_speakersAccepted = counts && tellSpeakers(*counts);
+    m_speakersPending = false; // some report changed channels only because they were told
     const ChannelSetup known = channels();
     const ChannelSetup now = readChannels();
     if (now.inputs.span() != known.inputs.span() || now.outputs.span() != known.outputs.span())

@@ -128,8 +128,10 @@ TEST_F(VSTHostTest, LoadsByKey)
         const char *loaded; // name, or null
         QStringList lines;
     } cases[] = {{"Comp", "Comp", {"Found: Comp, trying to load"}},
-                 {"Off", nullptr, {"Found: Off, trying to load"}},
-                 {"Offline", nullptr, {"Found: Offline, trying to load"}},
+                 {"Off", nullptr, {"Found: Off, trying to load", "Off is switched off and not loaded"}},
+                 {"Offline",
+                  nullptr,
+                  {"Found: Offline, trying to load", "Offline processes whole files and is not loaded"}},
                  {"Broken",
                   nullptr,
                   {"Found: Broken, trying to load",

@@ -1,6 +1,7 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 
 #include <functional>
+#include <future>
 
 namespace {
 
@@ -196,6 +197,24 @@ TEST_F(VSTInstance, ListenersHearWhatThePluginTells)
     EXPECT_EQ(listener.heard.size(), 5);
 }
 
+TEST_F(VSTInstance, AListenerNeedNotWaitForABlock)
+{
+    struct Asking final : IAudioPluginListener {
+        void pluginChanged(AudioPlugin &) noexcept override {}
+        void parameterChanged(AudioPlugin &plugin, quint32, double) noexcept override
+        {
+            span = std::async(std::launch::async, [&] { return plugin.channels().outputs.span(); });
+            isKnown = span.wait_for(std::chrono::seconds(5)) == std::future_status::ready;
+        }
+        std::future<int> span;
+        bool isKnown = false;
+    } listener;
+    auto plugin = loaded("ask-host process 0");
+    plugin->addListener(&listener);
+    EXPECT_TRUE(plugin->open(kSettings) && plugin->start() && plugin->process(64));
+    EXPECT_TRUE(listener.isKnown);
+}
+
 TEST_F(VSTInstance, AFaultEndsTheUse)
 {
     const struct {
@@ -217,6 +236,9 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
         EXPECT_EQ(takeTrace(), row.calls);
         EXPECT_TRUE(m_log.contains(QLatin1String(row.line)));
     }
+    auto faulty = loaded("fault opcode-2 segv", "between blocks");
+    EXPECT_TRUE(faulty->open(kSettings) && faulty->start());
+    EXPECT_FALSE(faulty->setProgram(0) || faulty->process(64) || faulty->isRunning());
     auto thrower = loaded("fault process throw-std");
     EXPECT_TRUE(thrower->open(kSettings) && thrower->start());
     EXPECT_FALSE(thrower->process(64));

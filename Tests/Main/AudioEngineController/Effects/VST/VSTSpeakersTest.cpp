@@ -153,7 +153,7 @@ TEST_F(VSTSpeakers, AreToldOnceAndAgainWhenTheChannelsChange)
          "USA: 2,2 | 2,2 | (2,2"},
         {"Says that they changed", "ask-host set-speaker-arrangement 13", 2, 2, false, true,
          "1(1 2) -> 1(1 2); host-13: 0", "USA: 2,2 | 2,2 | (2,2"},
-        {"told again", nullptr, 2, 2, false, true, "1(1 2) -> 1(1 2); host-13: 0", "USA: 2,2 | 2,2 | (2,2"},
+        {"Said so only because it was told", nullptr, 2, 2, false, true, "", ""},
         {"Changes its channels", "new-outputs set-speaker-arrangement 4", 2, 2, false, true, stereo,
          "USA: 2,2 | 2,2 | (2,2"},
         {"Changed", nullptr, 2, 2, false, true, stereo, "USA: 2,2 | 2,2 | (2,4"}};
