@@ -62,5 +62,11 @@ bool MRLAudioPluginHost::setFavourite(const QString &id, bool favourite)
 bool MRLAudioPluginHost::writeMarks()
 {
     const IQuillonInterface *application = ApplicationContext::instance().quillonInterface;
-    return !(application && application->isScanner()) && WriteCatalogue();
+    if (application && application->isScanner())
+        return false;
+    if (effects().empty()) {
+        DebugLog(L"The marks on built-in effects are not written: there are no effects to mark");
+        return false;
+    }
+    return WriteCatalogue();
 }

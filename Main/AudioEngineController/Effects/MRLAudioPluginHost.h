@@ -9,7 +9,8 @@ class MRLAudioPluginHost : public AudioPluginHost {
 public:
     MRLAudioPluginHost();
 
-    /// The built-in effects of this application, by identifier. They take their marks from the file.
+    /// The built-in effects of this application, by identifier (without the prefix of the format, as in every
+    /// catalogue). They take their marks from the file.
     void setBuiltInEffects(const std::vector<EffectRecord> &effects);
 
     /// Reads the marks and sets them on the effects. Each mark on an effect that this application does not
@@ -21,7 +22,8 @@ public:
     /// Sets the user's mark on an effect and writes the file. False when there is no such effect or the file
     /// was not written.
     bool setFavourite(const QString &id, bool favourite);
-    /// Writes the marks of all effects; false in the scanner, and where that fails, which is logged.
+    /// Writes the marks of all effects; false in the scanner and, which is logged, where that fails or there
+    /// are no effects, for an empty file would lose the marks.
     bool writeMarks();
 };
 

@@ -83,6 +83,7 @@ public:
 
     AudioPluginHost &vst2Host() { return *m_hosts[0]; }
     AudioPluginHost &vst3Host() { return *m_hosts[1]; }
+    AudioPluginHost &builtInHost() { return *m_hosts[3]; }
 
 private:
     AudioPluginHost *hostOfPrefix(const QString &prefix);

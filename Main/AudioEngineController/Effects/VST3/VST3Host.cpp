@@ -5,6 +5,8 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3FolderScan.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 
+#include <exception>
+
 VST3Host::VST3Host()
     : AudioPluginHost(&vst3CatalogueFormat())
 {}
@@ -17,11 +19,21 @@ bool VST3Host::Scan(bool scan, bool inProcess)
 LoadedPlugin VST3Host::loadPlugin(const QString &identifier)
 {
     const std::optional<EffectRecord> record = findEffect(identifier);
-    if (!record || !record->enabled)
-        return {record.has_value(), nullptr};
-    auto plugin = std::make_unique<VST3Plugin>();
-    if (plugin->openClass(*record))
-        return {true, std::move(plugin)};
+    if (!record)
+        return {};
+    if (!record->enabled) {
+        DebugLog(L"%ls is switched off and not loaded", record->name);
+        return {true, nullptr};
+    }
+    try {
+        auto plugin = std::make_unique<VST3Plugin>();
+        if (plugin->openClass(*record))
+            return {true, std::move(plugin)};
+    } catch (const std::exception &error) {
+        DebugLog(L"%ls: the plug-in threw: %s", record->name, error.what());
+    } catch (...) {
+        DebugLog(L"%ls: the plug-in threw something that is no standard exception", record->name);
+    }
     DebugLog(L"%ls (%ls) could not be loaded", record->name, identifier);
     return {true, nullptr};
 }

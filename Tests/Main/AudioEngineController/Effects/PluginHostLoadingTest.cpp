@@ -25,6 +25,12 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHost)
     list(registry.vst3Host(), vst3, classId);
     list(registry.vst3Host(), vst3, "FF112233445566778899AABBCCDDEEFF");
     list(registry.vst3Host(), vst3, "Off", false);
+    const char thrower[] = "EE112233445566778899AABBCCDDEEFF";
+    list(registry.vst3Host(),
+         addVST3File(folder.plugins(), QStringLiteral("T"),
+                     QByteArray("class T\nid ") + thrower + "\nfault initialize throw-int"),
+         thrower);
+    list(registry.builtInHost(), QString(), "a");
     list(registry.vst2Host(), vst2, "Q:7");
     const struct {
         const char *identifier;
@@ -36,6 +42,8 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHost)
                  {"placeholder:vst2:Gone:1", "placeholder:vst2:Gone:1", true},
                  {"vst3:FF112233445566778899AABBCCDDEEFF", nullptr, true},
                  {"vst3:Off", nullptr, true},
+                 {"vst3:EE112233445566778899AABBCCDDEEFF", nullptr, true},
+                 {"mrl:a", nullptr, true},
                  {"vst3:Q:7", nullptr, false},
                  {"vst2:00112233445566778899AABBCCDDEEFF", nullptr, false},
                  {"VST2:Q:7", nullptr, false},
@@ -52,6 +60,12 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHost)
         EXPECT_EQ(log.lines().contains(QLatin1String("PluginHost::LoadPlugin - Failed to Find Effect: ") +
                                        row.identifier),
                   !row.isKnown);
+        EXPECT_TRUE(plugin || !log.lines().isEmpty()) << "the log says why";
+        PluginPreset preset;
+        if (plugin && plugin->StorePreset(preset)) {
+            preset.identifier = QString::fromUtf8(row.identifier);
+            EXPECT_TRUE(plugin->LoadPreset(preset)) << "one of the name asked for goes in";
+        }
     }
 }
 

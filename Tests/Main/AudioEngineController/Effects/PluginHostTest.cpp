@@ -140,36 +140,40 @@ TEST(PluginHost, MarksOnBuiltInEffectsAreReadAndWritten)
         return QByteArray("\t<Effect>\n\t\t<ID>") + id + "</ID>\n\t\t<Favourite>" + favourite +
                "</Favourite>\n\t\t<CategoryMask>" + mask + "</CategoryMask>\n\t</Effect>\n";
     };
-    write(file, start + block("mrl:gone", "1", "0") + block("mrl:b", "-5", "2") + block("", "1", "0") +
-                    "</Effects>\n");
+    write(file,
+          start + block("gone", "1", "0") + block("b", "-5", "2") + block("", "1", "0") + "</Effects>\n");
     TestApplication application;
     application.scanner = true;
     MRLAudioPluginHost host;
     host.setCatalogueFolder(folder.path());
     std::vector<EffectRecord> effects(2);
-    effects[0].id = effects[0].name = QStringLiteral("mrl:a");
+    effects[0].id = effects[0].name = QStringLiteral("a");
     effects[0].category = 0x40; // Delay
-    effects[1].id = effects[1].name = QStringLiteral("mrl:b");
+    effects[1].id = effects[1].name = QStringLiteral("b");
     const CapturedLog log;
     host.ReadCatalogue();
     EXPECT_EQ(log.lines(), QStringList()) << "nothing is lost where there are no effects";
     host.setBuiltInEffects(effects);
-    EXPECT_TRUE(host.findEffect(QStringLiteral("mrl:b"))->favourite);
-    EXPECT_EQ(host.findEffect(QStringLiteral("mrl:b"))->category, 0u) << "the mask is written only";
+    EXPECT_TRUE(host.findEffect(QStringLiteral("b"))->favourite);
+    EXPECT_EQ(host.findEffect(QStringLiteral("b"))->category, 0u) << "the mask is written only";
     EXPECT_EQ(log.count(QStringLiteral("is passed over")), 2);
-    EXPECT_TRUE(log.contains(QStringLiteral("mrl:gone is passed over")));
+    EXPECT_TRUE(log.contains(QStringLiteral("gone is passed over")));
 
     QByteArray text;
-    EXPECT_FALSE(host.setFavourite(QStringLiteral("mrl:a"), true));
-    EXPECT_TRUE(readWholeFile(file, text) && text.contains("mrl:gone")) << "not written by the scanner";
+    EXPECT_FALSE(host.setFavourite(QStringLiteral("a"), true));
+    EXPECT_TRUE(readWholeFile(file, text) && text.contains("gone")) << "not written by the scanner";
     application.scanner = false;
-    EXPECT_FALSE(host.setFavourite(QStringLiteral("mrl:gone"), true));
-    EXPECT_TRUE(host.setFavourite(QStringLiteral("mrl:b"), false));
+    EXPECT_FALSE(host.setFavourite(QStringLiteral("gone"), true));
+    MRLAudioPluginHost without;
+    without.setCatalogueFolder(folder.path());
+    EXPECT_FALSE(without.writeMarks());
+    EXPECT_TRUE(readWholeFile(file, text) && text.contains("gone")) << "no effects take no marks away";
+    EXPECT_TRUE(host.setFavourite(QStringLiteral("b"), false));
     EXPECT_TRUE(readWholeFile(file, text));
     EXPECT_EQ(text.replace("\r\n", "\n"),
-              start + block("mrl:a", "1", "4") + block("mrl:b", "0", "0") + "</Effects>\n");
+              start + block("a", "1", "4") + block("b", "0", "0") + "</Effects>\n");
     host.setBuiltInEffects(effects);
-    EXPECT_TRUE(host.findEffect(QStringLiteral("mrl:a"))->favourite) << "the marks outlive new effects";
+    EXPECT_TRUE(host.findEffect(QStringLiteral("a"))->favourite) << "the marks outlive new effects";
 }
 
 TEST(AudioPlugins, AskingForAnUnsetRegistryIsReported)
