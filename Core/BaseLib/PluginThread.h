@@ -3,8 +3,7 @@
 #include <thread>
 
 /// Makes the calling thread one that plug-ins can run on, for as long as the object lives: on Windows they
-/// rely on a COM apartment of a single thread. From then on the process there leaves its exit handlers out,
-/// whoever calls exit.
+/// rely on a COM apartment of a single thread.
 class PluginThread {
 public:
     PluginThread();

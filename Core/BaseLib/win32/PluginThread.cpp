@@ -1,26 +1,16 @@
 #include "Core/BaseLib/PluginThread.h"
 
-#include "Core/BaseLib/ProcessSetup.h"
-
-#include <cstdlib>
-
 #include <objbase.h>
 #include <pthread.h>
 
 namespace {
 /// A window that is never painted asks for it without end.
 constexpr int kMostMessages = 1000;
-
-/// For a plug-in that calls exit: it would have our objects destroyed under our other threads, and then wait
-/// for modules that wait for those.
-void endWithoutExitHandlers() { leaveProcess(EXIT_FAILURE); }
 } // namespace
 
 PluginThread::PluginThread()
     : m_prepared(SUCCEEDED(CoInitializeEx(nullptr, COINIT_APARTMENTTHREADED)))
-{
-    std::atexit(endWithoutExitHandlers);
-}
+{}
 
 PluginThread::~PluginThread()
 {
