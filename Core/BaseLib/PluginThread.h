@@ -21,4 +21,5 @@ public:
 
 private:
     bool m_prepared = false;
+    unsigned m_timer = 0; ///< the system's number of a timer that keeps its thread running
 };
