@@ -25,8 +25,9 @@ LoadedPlugin VST3Host::loadPlugin(const QString &identifier)
         DebugLog(L"%ls is switched off and not loaded", record->name);
         return {true, nullptr};
     }
+    // Outlives what is thrown, whose code the module holds.
+    auto plugin = std::make_unique<VST3Plugin>();
     try {
-        auto plugin = std::make_unique<VST3Plugin>();
         if (plugin->openClass(*record))
             return {true, std::move(plugin)};
     } catch (const std::exception &error) {
