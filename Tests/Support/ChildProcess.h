@@ -2,6 +2,9 @@
 
 #include <QProcess>
 
+#include <ostream>
+#include <vector>
+
 /// A process that does not outlive the test program, also when that is killed for taking too long.
 class ChildProcess : public QProcess {
 public:
@@ -11,7 +14,15 @@ protected:
     void setupChildProcess() override;
 };
 
-/// Asks a process to end, as the end of the user's session does.
-void requestTermination(QProcess &process);
+/// A way in which a process is asked to end.
+struct TerminationWay {
+    const char *name;
+    int number; ///< the system's own
+
+    friend void PrintTo(const TerminationWay &way, std::ostream *out) { *out << way.name; }
+};
+/// The system's ways to ask a process to end; the first one as the end of the user's session does.
+const std::vector<TerminationWay> &terminationWays();
+void requestTermination(QProcess &process, const TerminationWay &way = terminationWays().front());
 /// The number of the signal that ended a crashed process; 0 where there is no such thing.
 int endingSignal(const QProcess &process);

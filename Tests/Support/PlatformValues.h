@@ -1,5 +1,7 @@
 #pragma once
 
+#include <array>
+
 // What tests of both systems expect, where the systems differ.
 
 /// What the names of VST 2 modules end in.
@@ -22,3 +24,6 @@ extern const char *const kLoaderKiller;
 extern const bool kHomeFollowsEnvironment;
 /// What the log says of a module file that is a text.
 extern const char *const kTextFileReason;
+/// Names of modules, as far as the system allows them, that upset a reader of markup; one lies in a
+/// subfolder.
+extern const std::array<const char *, 2> kNamesLikeMarkup;

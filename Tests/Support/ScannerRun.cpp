@@ -82,7 +82,7 @@ bool ScannerRun::waitUntil(const std::function<bool()> &condition)
     return true;
 }
 
-void ScannerRun::requestTermination() { ::requestTermination(m_process); }
+void ScannerRun::requestTermination(const TerminationWay &way) { ::requestTermination(m_process, way); }
 
 const ScannerOutcome &ScannerRun::wait()
 {

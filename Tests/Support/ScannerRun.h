@@ -49,7 +49,7 @@ public:
     /// Waits in a started run until the condition holds; false when the run or its time limit ended before.
     bool waitUntil(const std::function<bool()> &condition);
     /// Asks the program to end (SIGTERM).
-    void requestTermination();
+    void requestTermination(const TerminationWay &way = terminationWays().front());
     /// Ends the program by force (SIGKILL).
     void kill() { m_process.kill(); }
     qint64 processId() const { return m_process.processId(); }

@@ -1,3 +1,4 @@
+#include "Tests/Support/PlatformValues.h"
 #include "Tests/Support/ScannerRun.h"
 #include "Tests/Support/TestFolder.h"
 #include "Tests/Support/VST2Fixture.h"
@@ -212,7 +213,7 @@ TEST_F(FxScan, MoreKillersThanOneLaunchHasRuns)
 
 TEST_F(FxScan, KillersWhosePathsLookLikeMarkupAreDisabledAsWell)
 {
-    for (const char *name : {"Bad\r", "sub<br/Bad</Path>"}) // the latter in a folder of its own
+    for (const char *name : kNamesLikeMarkup)
         addVST3File(m_folder.plugins(), QLatin1String(name), "class X\nfault initialize _exit\n");
     const ScannerOutcome outcome = scan();
     EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();

@@ -8,7 +8,17 @@ ChildProcess::ChildProcess() = default;
 
 void ChildProcess::setupChildProcess() { prctl(PR_SET_PDEATHSIG, SIGKILL); }
 
-void requestTermination(QProcess &process) { process.terminate(); }
+const std::vector<TerminationWay> &terminationWays()
+{
+    static const std::vector<TerminationWay> ways = {
+        {"SIGTERM", SIGTERM}, {"SIGINT", SIGINT}, {"SIGHUP", SIGHUP}};
+    return ways;
+}
+
+void requestTermination(QProcess &process, const TerminationWay &way)
+{
+    ::kill(static_cast<pid_t>(process.processId()), way.number);
+}
 
 // NOTE: Qt documents no value for a crashed process; on these platforms Qt 5 puts the signal there.
 int endingSignal(const QProcess &process)

@@ -9,3 +9,4 @@ const char *const kForeignLocale = "C.UTF-8";
 const char *const kLoaderKiller = "segv";
 const bool kHomeFollowsEnvironment = true;
 const char *const kTextFileReason = "file too short";
+const std::array<const char *, 2> kNamesLikeMarkup = {"Bad\r", "sub<br/Bad</Path>"};

@@ -16,15 +16,23 @@ bool enterJob()
            AssignProcessToJobObject(job, GetCurrentProcess());
 }
 
-/// Tells a window what it hears when the user's session ends.
-BOOL CALLBACK endSession(HWND window, LPARAM wanted)
+struct Request {
+    DWORD process;
+    UINT message;
+};
+
+/// Tells a window what it hears when the user's session ends, or when somebody asks the program to close.
+BOOL CALLBACK tellWindow(HWND window, LPARAM given)
 {
+    const auto &request = *reinterpret_cast<const Request *>(given);
     DWORD process = 0;
     GetWindowThreadProcessId(window, &process);
-    if (process != static_cast<DWORD>(wanted))
+    if (process != request.process)
         return TRUE;
     DWORD_PTR agreed = 0;
-    if (SendMessageTimeoutW(window, WM_QUERYENDSESSION, 0, 0, SMTO_NORMAL, 1000, &agreed))
+    if (request.message != WM_ENDSESSION)
+        PostMessageW(window, request.message, 0, 0);
+    else if (SendMessageTimeoutW(window, WM_QUERYENDSESSION, 0, 0, SMTO_NORMAL, 1000, &agreed))
         PostMessageW(window, WM_ENDSESSION, static_cast<WPARAM>(agreed), 0);
     return TRUE;
 }
@@ -39,9 +47,16 @@ ChildProcess::ChildProcess()
 
 void ChildProcess::setupChildProcess() {}
 
-void requestTermination(QProcess &process)
+const std::vector<TerminationWay> &terminationWays()
 {
-    EnumWindows(endSession, static_cast<LPARAM>(process.processId()));
+    static const std::vector<TerminationWay> ways = {{"EndOfSession", WM_ENDSESSION}, {"Close", WM_CLOSE}};
+    return ways;
+}
+
+void requestTermination(QProcess &process, const TerminationWay &way)
+{
+    Request request = {static_cast<DWORD>(process.processId()), static_cast<UINT>(way.number)};
+    EnumWindows(tellWindow, reinterpret_cast<LPARAM>(&request));
 }
 
 int endingSignal(const QProcess &) { return 0; }

@@ -82,10 +82,10 @@ TEST_F(Launcher, RunsAgainWhileMarkersSurvive)
     } rows[] = {
         {"no marker: one run", "exit=0", 1, How::Exited, 0, nullptr},
         {"a failing exit code alone is no reason to run again", "exit=3", 1, How::Exited, 3, nullptr},
-        {"a crash without a marker neither", "abort", 1, How::Crashed, -1, nullptr},
-        {"a marker: again", "marker=A.scan abort\nclear", 2, How::Exited, 0, "/p/A.scan"},
+        {"a crash without a marker neither", "fault", 1, How::Crashed, -1, nullptr},
+        {"a marker: again", "marker=A.scan fault\nclear", 2, How::Exited, 0, "/p/A.scan"},
         {"a VST 3 marker too", "marker=A.scan3 exit=0\nclear", 2, How::Exited, 0, "/p/A.scan3"},
-        {"a new marker in every run: ten runs", "clear marker=A.scan abort", 10, How::Crashed, -1,
+        {"a new marker in every run: ten runs", "clear marker=A.scan fault", 10, How::Crashed, -1,
          "/p/A.scan"},
     };
     for (const auto &row : rows) {

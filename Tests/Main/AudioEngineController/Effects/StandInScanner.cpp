@@ -4,7 +4,7 @@
 //   marker=NAME   writes a crash marker of VST 2 (NAME has its ending)
 //   clear         deletes all markers first
 //   catalogue     changes the VST 2 catalogue
-//   hang, abort, exit=N   how it ends (exit=0 without any)
+//   hang, fault, exit=N   how it ends (exit=0 without any)
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
@@ -44,8 +44,8 @@ void carryOut(const std::string &word, const fs::path &effects)
         clearMarkers(effects);
     else if (word == "catalogue")
         std::ofstream(effects / "FXConfiguration.xml", std::ios::app) << "<!-- -->";
-    else if (word == "abort")
-        std::abort();
+    else if (word == "fault")
+        __builtin_trap(); // abort is no crash on Windows
     else if (word == "hang")
         std::this_thread::sleep_for(std::chrono::hours(1));
     else if (word.rfind("marker=", 0) == 0)

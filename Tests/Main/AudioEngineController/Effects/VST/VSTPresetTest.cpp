@@ -105,8 +105,8 @@ TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
 
 TEST_F(VSTPreset, CarriesTheSettingsOfTheObject)
 {
-    auto plugin = loaded("inputs 1\noutputs 6\nanswer opcode-51 1");
-    auto other = loaded("inputs 1\noutputs 6\nanswer opcode-51 1");
+    auto plugin = loaded("inputs 1\noutputs 6\nanswer opcode-51 1\nname Comp");
+    auto other = loaded("inputs 1\noutputs 6\nanswer opcode-51 1\nname Comp", "Other");
     ASSERT_TRUE(plugin->open(kSettings) && other->open(kSettings));
     plugin->setBypass(true);
     plugin->setRealtime(true);
