@@ -17,7 +17,7 @@ ReasonStore::ReasonStore(const QString &file)
     QByteArray content;
     if (!readWholeFile(file, content))
         return;
-    for (const QJsonValue &value : QJsonDocument::fromJson(content).array()) {
+    for (const QJsonValue value : QJsonDocument::fromJson(content).array()) {
         const QJsonObject entry = value.toObject();
         set({entry[kFormat].toString(), entry[kPath].toString(),
              static_cast<quint32>(entry[kSubId].toDouble())},

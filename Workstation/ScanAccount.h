@@ -73,7 +73,7 @@ public:
     bool wasProbed(const QString &format, const QString &path) const;
 
 private:
-    void takeLine(const QByteArray &line);
+    void takeLine(const QByteArray &text);
     void begin(const PluginKey &key, const QJsonObject &line);
     void end(const PluginKey &key, const QJsonObject &line);
 

@@ -7,7 +7,7 @@
 class PluginThread {
 public:
     PluginThread();
-    ~PluginThread();
+    ~PluginThread(); // NOLINT(performance-trivially-destructible): Windows has something to do there
     PluginThread(const PluginThread &) = delete;
     PluginThread &operator=(const PluginThread &) = delete;
 

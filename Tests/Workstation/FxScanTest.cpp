@@ -47,13 +47,13 @@ protected:
     static std::map<QString, QString> states(const QJsonObject &result)
     {
         std::map<QString, QString> states;
-        for (const QJsonValue &plugin : result[QStringLiteral("plugins")].toArray())
+        for (const QJsonValue plugin : result[QStringLiteral("plugins")].toArray())
             states[plugin[QStringLiteral("name")].toString()] = plugin[QStringLiteral("state")].toString();
         return states;
     }
     static QString reason(const QJsonObject &result, const QString &name)
     {
-        for (const QJsonValue &failure : result[QStringLiteral("failures")].toArray())
+        for (const QJsonValue failure : result[QStringLiteral("failures")].toArray())
             if (failure[QStringLiteral("name")].toString() == name)
                 return failure[QStringLiteral("reason")].toString();
         return QStringLiteral("(none)");
