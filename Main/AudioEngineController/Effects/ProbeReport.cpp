@@ -110,7 +110,8 @@ ProbeEntry::~ProbeEntry()
     if (!report.isOpen())
         return;
     QJsonObject line = identity(m_format, m_path, m_subId);
-    line.insert(QStringLiteral("milliseconds"), std::round(static_cast<double>(m_timer.nsecsElapsed()) / 1000.0) / 1000.0);
+    line.insert(QStringLiteral("milliseconds"),
+                std::round(static_cast<double>(m_timer.nsecsElapsed()) / 1000.0) / 1000.0);
     line.insert(QStringLiteral("records"), static_cast<qint64>(m_records));
     if (m_noPlugin)
         line.insert(QStringLiteral("noPlugin"), true);
