@@ -24,6 +24,8 @@ extern const char *const kLoaderKiller;
 extern const bool kHomeFollowsEnvironment;
 /// What the log says of a module file that is a text.
 extern const char *const kTextFileReason;
+/// Which of two values "Linux/Windows" in a table counts.
+extern const int kSystemsPlace;
 /// Names of modules, as far as the system allows them, that upset a reader of markup; one lies in a
 /// subfolder.
 extern const std::array<const char *, 2> kNamesLikeMarkup;

@@ -10,3 +10,4 @@ const char *const kLoaderKiller = "segv";
 const bool kHomeFollowsEnvironment = true;
 const char *const kTextFileReason = "file too short";
 const std::array<const char *, 2> kNamesLikeMarkup = {"Bad\r", "sub<br/Bad</Path>"};
+const int kSystemsPlace = 0;

@@ -10,3 +10,4 @@ const char *const kLoaderKiller = "abort";
 const bool kHomeFollowsEnvironment = false;
 const char *const kTextFileReason = "the file is no Windows library";
 const std::array<const char *, 2> kNamesLikeMarkup = {"Bad & worse", "sub&#13;/Bad&lt;/Path&gt;"};
+const int kSystemsPlace = 1;

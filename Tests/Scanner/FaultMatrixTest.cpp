@@ -1,0 +1,169 @@
+#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+#include "Tests/Scanner/ScannerTest.h"
+#include "Tests/Support/PlatformValues.h"
+#include "Tests/Support/VST2Fixture.h"
+
+#include <QFileInfo>
+#include <QRegularExpression>
+
+namespace {
+
+/// What becomes of a module that commits a fault at a stage. "M" is the module's own record, letters before
+/// it those of its plug-ins A, B and C, of which B commits the fault where the stage is one plug-in's. "!":
+/// it ended the scanner and is disabled; "?": it is recorded as not working; "-": nothing is recorded, and it
+/// is tried again. Where systems differ: Linux/Windows.
+const char kMatrix[] = R"(
+format stage              segv   abort exit _exit divide illegal stack-overflow throw-std throw-int terminate kill pthread-exit hang
+vst3   static-constructor M!/M?  M!    M!   M!    M!/M?  M!/M?   M!/M?          M!        M!        M!        M!   M!           M!
+vst3   module-entry       M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
+vst3   get-factory        M!     M!    M!   M!    M!     M!      M!             -         -         M!        M!   M!           M!
+vst3   factory-info       M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
+vst3   count-classes      M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
+vst3   class-info         M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3   class-info2        M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3   class-info-unicode M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3   create-instance    M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3   initialize         M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3   bus-count          M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3   bus-info           M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3   terminate          M!     M!    M!   M!    M!     M!      M!             AB        AB        M!        M!   M!           M!
+vst3   release            M!     M!    M!   M!    M!     M!      M!             AB        AB        M!        M!   M!           M!
+vst3   factory-release    M!     M!    M!   M!    M!     M!      M!             ABC       ABC       M!        M!   M!           M!
+vst3   module-exit        M!     M!    M!   M!    M!     M!      M!             ABC       ABC       M!        M!   M!           M!
+vst3   static-destructor  M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
+vst2   static-constructor M!/M?  M!    M!   M!    M!/M?  M!/M?   M!/M?          M!        M!        M!        M!   M!           M!
+vst2   entry              M?     M!    M!   M!    M?     M?      M?             M?        M?        M!        M!   M!           M!
+vst2   get-plug-category  M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2   get-effect-name    M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2   get-vendor-string  M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2   close              M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2   static-destructor  M!/M   M!    M!   M!    M!/M   M!/M    M!/M           M!        M!        M!        M!   M!           M!
+shell  shell-next         A      M!    M!   M!    A      A       A              A         A         M!        M!   M!           M!
+shell  entry              AB?C   AB!C  AB!C AB!C  AB?C   AB?C    AB?C           AB?C      AB?C      AB!C      AB!C AB!C         AB!C
+shell  get-plug-category  ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
+shell  get-effect-name    ACM    AB!C  AB!C AB!C  ACM    ACM     ACM            ACM       ACM       AB!C      AB!C AB!C         AB!C
+shell  get-vendor-string  ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
+shell  close              ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
+shell  static-destructor  M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
+)";
+
+const QStringList kFormats{QStringLiteral("vst3"), QStringLiteral("vst2"), QStringLiteral("shell")};
+
+QStringList words(const QString &line) { return line.split(QLatin1Char(' '), Qt::SkipEmptyParts); }
+
+QStringList matrixLines()
+{
+    return QString::fromLatin1(kMatrix).split(QLatin1Char('\n'), Qt::SkipEmptyParts);
+}
+
+/// A line of the matrix: the format and the stage, then what becomes of each kind of fault.
+class FaultMatrix : public ScannerTest, public testing::WithParamInterface<QString> {
+protected:
+    FaultMatrix()
+        : m_kinds(words(matrixLines().first()).mid(2))
+        , m_cells(words(GetParam()).mid(2))
+        , m_format(words(GetParam()).value(0))
+        , m_stage(words(GetParam()).value(1))
+    {}
+    bool isOfOnePlugin() const
+    {
+        static const QRegularExpression whole(QStringLiteral("^(static|module|factory|get-factory|count)"));
+        return m_format == QLatin1String("shell")
+                   ? m_stage != QLatin1String("static-destructor")
+                   : m_format == QLatin1String("vst3") && !whole.match(m_stage).hasMatch();
+    }
+    /// What the module's trace holds once the fault is being committed.
+    QString faultLine(const QString &kind) const
+    {
+        return kind + QLatin1Char(' ') + m_stage +
+               (isOfOnePlugin() ? QLatin1Char(' ') + kind + QStringLiteral(" B") : QString());
+    }
+    bool hasReached(const QString &kind) const
+    {
+        const QString line = faultLine(kind);
+        const QStringList lines = trace();
+        return std::any_of(lines.begin(), lines.end(),
+                           [&line](const QString &text) { return text.startsWith(line); });
+    }
+    void add(const QString &kind) const
+    {
+        const QByteArray name = kind.toUtf8();
+        QByteArray script = "trace \"" + tracePath().toUtf8() + "\" " + name + '\n';
+        if (m_format != QLatin1String("vst2"))
+            for (const char *letter : {"A", "B", "C"})
+                script +=
+                    (m_format == QLatin1String("vst3") ? "class \""
+                                                       : "child " + QByteArray::number(*letter) + " \"") +
+                    name + ' ' + letter + "\"\n";
+        script +=
+            "fault " + m_stage.toUtf8() + ' ' + name + (isOfOnePlugin() ? " \"" + name + " B\"\n" : "\n");
+        if (m_format == QLatin1String("vst3"))
+            addVST3File(m_folder.plugins(), kind, script);
+        else
+            addVST2File(m_folder.plugins(), kind, script);
+    }
+    /// Runs the scanner until no marker survives; what hangs is ended from outside. The number of runs.
+    int runs() const
+    {
+        const int most = 2 * m_kinds.size();
+        for (int run = 1; run <= most; ++run) {
+            forgetTrace();
+            ScannerRun scanner(scannerProgram(), m_folder);
+            EXPECT_TRUE(scanner.start());
+            if (scanner.waitUntil([this] { return hasReached(QStringLiteral("hang")); }))
+                scanner.kill();
+            scanner.wait();
+            if (m_folder.markers().isEmpty())
+                return run;
+        }
+        return most;
+    }
+    /// The cell that the catalogue says.
+    QString found(const QString &kind) const;
+
+    QStringList m_kinds, m_cells;
+    QString m_format, m_stage;
+};
+
+QString FaultMatrix::found(const QString &kind) const
+{
+    const bool isVst3 = m_format == QLatin1String("vst3");
+    QStringList found;
+    const CatalogueContents contents =
+        isVst3 ? readCatalogueFile(vst3CatalogueFormat(), cataloguePath())
+               : readCatalogueFile(vstCatalogueFormat(),
+                                   m_folder.effects() + QStringLiteral("/FXConfiguration.xml"));
+    for (const EffectRecord &record : contents.records) {
+        if (QFileInfo(record.path).completeBaseName() != kind)
+            continue;
+        found.append((record.name == kind ? QStringLiteral("M") : record.name.right(1)) +
+                     QLatin1String(record.working   ? ""
+                                   : record.enabled ? "?"
+                                                    : "!"));
+    }
+    found.sort();
+    return found.isEmpty() ? QStringLiteral("-") : found.join(QString());
+}
+
+} // namespace
+
+TEST_P(FaultMatrix, EndsAsItSays)
+{
+    for (const QString &kind : m_kinds)
+        add(kind);
+    const int needed = runs();
+    QStringList cells, expected;
+    for (const QString &kind : m_kinds)
+        cells.append(found(kind));
+    for (const QString &cell : m_cells)
+        expected.append(cell.contains(QLatin1Char('/')) ? cell.split(QLatin1Char('/')).value(kSystemsPlace)
+                                                        : cell);
+    EXPECT_EQ(cells.join(QLatin1Char(' ')), expected.join(QLatin1Char(' ')));
+    EXPECT_EQ(needed, cells.join(QString()).count(QLatin1Char('!')) + 1) << "one run each, and the last one";
+}
+
+INSTANTIATE_TEST_SUITE_P(Of, FaultMatrix, testing::ValuesIn(matrixLines().mid(1)), [](const auto &row) {
+    return words(row.param).mid(0, 2).join(QLatin1Char('_')).remove(QLatin1Char('-')).toStdString();
+});
