@@ -49,7 +49,7 @@ TEST_F(CatalogueState, AFolderInThePlaceOfTheCatalogueStays)
     m_folder.write(QStringLiteral("Effects/VST3Configuration.xml/kept"), "old");
     const ScannerOutcome outcome = run();
     EXPECT_TRUE(outcome.succeeded());
-    EXPECT_EQ(loaded(), QStringList(kComp));
+    EXPECT_EQ(loaded(), QStringList()) << "nothing would come of it";
     EXPECT_FALSE(logLines(outcome).filter(QStringLiteral("Cannot write the catalogue")).isEmpty())
         << qPrintable(outcome.log);
     EXPECT_EQ(QDir(cataloguePath()).entryList(QDir::Files), QStringList(QStringLiteral("kept")));

@@ -125,17 +125,26 @@ void AudioPluginHost::ReadCatalogue()
     m_lastSeen = fileStamp(cataloguePath());
 }
 
+CatalogueContents AudioPluginHost::readContents()
+{
+    const QString path = cataloguePath();
+    m_unread.clear();
+    if (!QFile::exists(path))
+        return {};
+    CatalogueContents contents = readCatalogueFile(*m_format, path);
+    if (!contents)
+        DebugLog(L"Cannot use the catalogue %ls: %ls", path, contents.reason);
+    if (contents.isUnread)
+        m_unread = contents.reason;
+    return contents;
+}
+
 void AudioPluginHost::readKnownRecords()
 {
-    m_catalogueOutdated = false;
-    const QString path = cataloguePath();
-    if (!QFile::exists(path))
-        return;
-    const CatalogueContents contents = readCatalogueFile(*m_format, path);
-    if (!contents) {
-        DebugLog(L"Cannot use the catalogue %ls: %ls", path, contents.reason);
+    const CatalogueContents contents = readContents();
+    if (!contents && !contents.isUnread) {
         // What crashed must not be loaded again only because of another plug-in's name.
-        for (const EffectRecord &record : salvageRecords(*m_format, path))
+        for (const EffectRecord &record : salvageRecords(*m_format, cataloguePath()))
             if (!record.enabled && !record.working)
                 m_known.file(record);
     }
@@ -274,7 +283,10 @@ bool AudioPluginHost::WriteCatalogue(const WaitingRecords &waiting, Durability d
 bool AudioPluginHost::writeRecords(const std::vector<const QByteArray *> &records, Durability durability)
 {
     const QString path = cataloguePath();
-    const FileResult written = replaceFile(path, renderCatalogue(*m_format, records), durability);
+    // What could not be read is not lost, and may hold marks of the user.
+    const FileResult written = isCatalogueUnread()
+                                   ? FileResult{QStringLiteral("the one there cannot be read: ") + m_unread}
+                                   : replaceFile(path, renderCatalogue(*m_format, records), durability);
     if (!written) {
         DebugLog(L"Cannot write the catalogue %ls: %ls", path, written.reason);
         ProbeReport::instance().unwritten(path, written.reason);

@@ -87,6 +87,8 @@ public:
     bool isListed(const EffectRecord &record) const;
     /// True when the catalogue file holds something else than the known list, being of an earlier version.
     bool isCatalogueOutdated() const { return m_catalogueOutdated; }
+    /// Whether there is a catalogue that the system did not let us read. It is not replaced.
+    bool isCatalogueUnread() const { return !m_unread.isEmpty(); }
 
     /// Asks a running scan to stop after the current file; any thread. The request stands until it is
     /// cleared.
@@ -107,6 +109,8 @@ protected:
     {}
 
     const CatalogueFormat *format() const { return m_format; }
+    /// The catalogue file's content; what cannot be used is logged.
+    CatalogueContents readContents();
     QString cataloguePath() const;
     EffectList &effectList() { return m_effects; }
 
@@ -131,5 +135,6 @@ private:
     std::set<QString, PathLess> m_leftAlone;
     QStringList m_heldMarkers; ///< of the files left alone
     bool m_catalogueOutdated = false;
+    QString m_unread; ///< why the catalogue that is there could not be read
     std::atomic<bool> m_cancelled{false};
 };

@@ -40,8 +40,14 @@ QByteArray escapedLine(const QByteArray &line)
 CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path)
 {
     CatalogueContents contents;
+    QByteArray text;
+    if (const FileResult read = readWholeFile(path, text); !read) {
+        contents.isUnread = true;
+        contents.reason = read.reason;
+        return contents;
+    }
     XMLDocument document(XMLDocument::Entities::Literal);
-    if (!document.load(path)) {
+    if (!document.parse(text)) {
         contents.reason = document.error();
         return contents;
     }

@@ -9,6 +9,7 @@
 struct CatalogueContents {
     QString reason;                    ///< why the file could not be used; empty when it was
     std::vector<EffectRecord> records; ///< in the order of the file
+    bool isUnread = false;             ///< the file is there, but the system did not let it be read
     bool upgraded = false;             ///< an earlier version, whose records were changed while reading
 
     explicit operator bool() const { return reason.isEmpty(); }

@@ -32,6 +32,10 @@ bool FolderScan::run()
 void FolderScan::scan()
 {
     m_host.clearEffects();
+    if (m_host.isCatalogueUnread()) {
+        write(Durability::Synced); // says why it cannot: nothing would come of the probes, and known crashes
+        return;                    // would happen again
+    }
     m_progress = createProgressDisplay();
     m_knownAtStart = m_host.known().size();
     const QStringList paths = findFiles();

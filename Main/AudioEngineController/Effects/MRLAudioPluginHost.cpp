@@ -28,12 +28,9 @@ void MRLAudioPluginHost::setBuiltInEffects(const std::vector<EffectRecord> &effe
 
 void MRLAudioPluginHost::ReadCatalogue()
 {
-    const QString path = cataloguePath();
-    if (catalogueFolder().isEmpty() || !QFile::exists(path))
+    if (catalogueFolder().isEmpty())
         return;
-    const CatalogueContents contents = readCatalogueFile(*format(), path);
-    if (!contents)
-        DebugLog(L"Cannot use the catalogue %ls: %ls", path, contents.reason);
+    const CatalogueContents contents = readContents();
     const TAutoLockCS lock(&m_ks);
     const bool hasEffects = effectList().size() != 0;
     for (const EffectRecord &marks : contents.records) {
