@@ -17,7 +17,8 @@ const std::vector<TerminationWay> &terminationWays()
 
 void requestTermination(QProcess &process, const TerminationWay &way)
 {
-    ::kill(static_cast<pid_t>(process.processId()), way.number);
+    if (process.processId() > 0) // 0, of one that has ended, stands for our own group
+        ::kill(static_cast<pid_t>(process.processId()), way.number);
 }
 
 // NOTE: Qt documents no value for a crashed process; on these platforms Qt 5 puts the signal there.
