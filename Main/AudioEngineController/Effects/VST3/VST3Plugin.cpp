@@ -4,6 +4,7 @@
 #include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3ClassId.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 #include "Main/VLib/SimpleGUI.h"
@@ -37,13 +38,6 @@ PClassInfo2 classDetails(IPluginFactory *factory, int32 index)
         factory3->getClassInfoUnicode(index, &unicode);
     }
     return details;
-}
-
-QString classIdText(const FUID &classId)
-{
-    char8 text[33] = {}; // 32 digits, see FUID::toString
-    classId.toString(text);
-    return QString::fromLatin1(text);
 }
 
 } // namespace

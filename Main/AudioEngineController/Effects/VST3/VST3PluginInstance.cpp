@@ -1,11 +1,10 @@
 #include "Core/BaseLib/DebugLog.h"
 #include "Core/BaseLib/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3ClassId.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/VLib/SimpleGUI.h"
-
-#include <QRegularExpression>
 
 #include <stdexcept>
 
@@ -18,16 +17,6 @@ namespace {
 /// What a plug-in may change with a call to its handler, by how it is followed.
 constexpr int32 kRebuilding = Vst::kReloadComponent | Vst::kIoChanged | Vst::kLatencyChanged;
 constexpr int32 kShowing = Vst::kParamValuesChanged | Vst::kParamTitlesChanged;
-
-/// The class id that a record's identifier spells; an invalid one when it is none.
-FUID classIdOf(const QString &identifier)
-{
-    static const QRegularExpression digits(QStringLiteral("\\A[0-9A-Fa-f]{32}\\z"));
-    FUID classId;
-    if (digits.match(identifier).hasMatch())
-        classId.fromString(identifier.toLatin1().constData());
-    return classId;
-}
 
 } // namespace
 

@@ -1,0 +1,12 @@
+#pragma once
+
+#include <QString>
+
+#include <pluginterfaces/base/funknown.h>
+
+// How a record's identifier spells the id of a class: 32 hexadecimal digits.
+
+QString classIdText(const Steinberg::FUID &classId);
+
+/// The class id that an identifier spells, in capitals or not; an invalid one when it is none.
+Steinberg::FUID classIdOf(const QString &identifier);

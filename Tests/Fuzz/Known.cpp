@@ -1,0 +1,103 @@
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
+#include "Tests/Fuzz/FuzzTarget.h"
+
+#include <QDir>
+#include <QFile>
+
+#include <algorithm>
+
+// What an earlier run left: a catalogue of any version, of files that are there, gone or moved; and behind a
+// line "--- marker" a crash marker. A host reads both, as at the start of a scan, and another one reads what
+// the first one left.
+
+namespace {
+
+const QString kCatalogues = QStringLiteral("Effects");
+const QByteArray kSeparator = "\n--- marker\n";
+
+void checkVersion(const CatalogueFormat &format, const QString &catalogue)
+{
+    const CatalogueContents contents = readCatalogueFile(format, catalogue);
+    for (const EffectRecord &record : contents.records)
+        require(!contents.upgraded || record.fileTime == format.fileTime(record.path),
+                "an earlier version's records have their file's own time");
+}
+
+void checkLookUp(const KnownList &known, const QString &path)
+{
+    const KnownList::Knowledge found = known.lookUp(path);
+    require(found.records.empty() == (found.how == KnownAs::Unknown), "what is known has records");
+    for (const EffectRecord *record : found.records) {
+        require(isSamePath(fileNameOf(record->path), fileNameOf(path)),
+                "a record belongs to the file's name");
+        require((found.how == KnownAs::Own) == isSamePath(record->path, path),
+                "a file's own records are those of its path");
+        require(found.how != KnownAs::Moved || !QFile::exists(record->path), "what moved is gone");
+    }
+    require(found.how != KnownAs::Namesake || !found.records.front()->isCrashedFile(),
+            "a crash says nothing of a namesake");
+}
+
+void checkKnown(const KnownList &known)
+{
+    for (const EffectRecord *record : known.all()) {
+        require(known.lookUp(record->path).how == KnownAs::Own, "each record is its own file's");
+        checkLookUp(known, record->path);
+        checkLookUp(known, QStringLiteral("here/") + fileNameOf(record->path));
+        checkLookUp(known, QStringLiteral("gone/") + fileNameOf(record->path));
+    }
+}
+
+/// What a host absorbed from a marker is in the catalogue, where the next one finds it.
+void checkKept(const AudioPluginHost &first, AudioPluginHost &second, const EffectRecord &crashed)
+{
+    for (const EffectRecord *record : first.known().all())
+        if (anyHolds({record->path, record->name, record->id, record->vendor, record->categories,
+                      record->subName, record->fileTime},
+                     "<\n"))
+            return; // nothing is escaped
+    second.setCatalogueFolder(first.catalogueFolder());
+    second.ReadCatalogue();
+    const KnownList::Records kept = second.known().recordsOfPath(crashed.path);
+    require(crashed.path.isEmpty() ||
+                std::any_of(kept.begin(), kept.end(),
+                            [](const EffectRecord *record) { return !record->enabled && !record->working; }),
+            "what crashed stays disabled");
+}
+
+template <typename Host>
+void readLeftovers(const CatalogueFormat &format, const QByteArray &catalogue, const QByteArray &marker)
+{
+    const QString cataloguePath = kCatalogues + QLatin1String(format.fileName);
+    const QString markerPath = kCatalogues + QLatin1String("/Marker") + QLatin1String(format.marker.ending);
+    writeFuzzFile(cataloguePath, catalogue);
+    checkVersion(format, cataloguePath);
+    if (!marker.isNull())
+        writeFuzzFile(markerPath, marker);
+    const EffectRecord crashed = readMarkerFile(format.marker, markerPath);
+
+    Host host;
+    host.setCatalogueFolder(kCatalogues);
+    host.ReadCatalogue();
+    checkKnown(host.known());
+    Host next;
+    if (!QFile::exists(markerPath))
+        checkKept(host, next, crashed);
+    QFile::remove(markerPath);
+}
+
+} // namespace
+
+void fuzzKnown(const QByteArray &input)
+{
+    require(QDir().mkpath(kCatalogues), "there is a folder for catalogues");
+    const int at = input.indexOf(kSeparator);
+    const QByteArray catalogue = input.left(at);
+    const QByteArray marker = at < 0 ? QByteArray() : input.mid(at + kSeparator.size());
+    readLeftovers<VST3Host>(vst3CatalogueFormat(), catalogue, marker);
+    readLeftovers<VSTHost>(vstCatalogueFormat(), catalogue, marker);
+}

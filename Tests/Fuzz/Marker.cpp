@@ -1,0 +1,29 @@
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+#include "Tests/Fuzz/FuzzTarget.h"
+
+namespace {
+
+void readAndWrite(const MarkerFormat &format, const QByteArray &input)
+{
+    const QString name = QStringLiteral("Marker");
+    writeFuzzFile(name, input);
+    const EffectRecord read = readMarkerFile(format, name);
+    require(!read.enabled && (format.hasSubId || read.subId == 0), "a marker names what is not enabled");
+    if (anyHolds({read.path, read.fileTime, read.name}, "\r\n"))
+        return; // markers are read by their lines where their texts make them no XML
+    require(bool(writeMarkerFile(format, name, read)), "a marker can be written");
+    const EffectRecord again = readMarkerFile(format, name);
+    require(again.path == read.path && again.fileTime == read.fileTime && again.name == read.name &&
+                again.subId == read.subId,
+            "what was read is written and read again the same");
+}
+
+} // namespace
+
+void fuzzMarker(const QByteArray &input)
+{
+    readAndWrite(vst3CatalogueFormat().marker, input);
+    readAndWrite(vstCatalogueFormat().marker, input);
+}

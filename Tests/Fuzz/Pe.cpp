@@ -1,0 +1,35 @@
+#include "Core/BaseLib/LoadFailure.h"
+#include "Core/BaseLib/PeImage.h"
+#include "Tests/Fuzz/FuzzTarget.h"
+
+namespace {
+
+void readTables(const PeImage &image, const QByteArray &input)
+{
+    for (const QByteArray &name : {QByteArray("VSTPluginMain"), QByteArray("main")})
+        if (image.findExports({name}) == ExportAnswer::Exported)
+            require(input.contains(name + '\0'), "what is exported stands in the file");
+    for (const auto &libraries : {image.imports(), image.delayImports()})
+        for (const QString &library : libraries.value_or(QStringList()))
+            require(library.size() <= 260, "no library has a longer name than the system takes");
+}
+
+} // namespace
+
+void fuzzPe(const QByteArray &input)
+{
+    // Without the zero that a QByteArray has behind its content.
+    const std::vector<uchar> bytes(input.begin(), input.end());
+    if (const std::optional<PeImage> image = PeImage::read(ByteView(bytes.data(), bytes.size())))
+        readTables(*image, input);
+
+    const QString file = QStringLiteral("library.dll");
+    writeFuzzFile(file, input);
+    // Of the libraries that it needs, some are missing, some load, and the others are this one again.
+    const auto search = [&](const QString &name) -> std::optional<QString> {
+        if (name.startsWith(QLatin1Char('m')))
+            return std::nullopt;
+        return name.startsWith(QLatin1Char('k')) ? QString() : file;
+    };
+    whyNotLoadable(file, search);
+}
