@@ -43,7 +43,9 @@ ExportAnswer findByHash(const ElfTables &tables, const QByteArray &name)
     const ByteView buckets = tables.hash.from(sizeof(ElfHashHeader));
     const ByteView chains = buckets.from(quint64(header->bucketCount) * sizeof(quint32));
     auto index = buckets.item<quint32>(hashOf(name) % header->bucketCount);
-    for (quint64 step = 0; index && *index < header->symbolCount && step < kMostElfSteps; ++step) {
+    // A chain that leads to more symbols than the table holds goes in circles.
+    const quint64 most = std::min<quint64>(chains.size() / sizeof(quint32), kMostElfSteps);
+    for (quint64 step = 0; index && *index < header->symbolCount && step < most; ++step) {
         if (*index == 0)
             return ExportAnswer::NotExported;
         const ExportAnswer answer = answerAt(tables, *index, name);
@@ -51,7 +53,7 @@ ExportAnswer findByHash(const ElfTables &tables, const QByteArray &name)
             return answer;
         index = chains.item<quint32>(*index);
     }
-    return ExportAnswer::Unknown; // leads out of the table, or in circles
+    return ExportAnswer::Unknown; // or it leads out of the table
 }
 
 quint32 gnuHashOf(const QByteArray &name)
