@@ -47,7 +47,7 @@ Markers &activeMarkers()
 /// The raw content of one of our own lines; empty where there is none.
 QString rawElement(const QString &text, const char *name)
 {
-    const QString start = QStringLiteral("\t<%1>").arg(QLatin1String(name));
+    const QString start = QStringLiteral("\n\t<%1>").arg(QLatin1String(name));
     const int from = text.indexOf(start);
     // At the end of its line: the content may look like an end itself.
     const int to =
@@ -55,20 +55,34 @@ QString rawElement(const QString &text, const char *name)
     return from < 0 || to < 0 ? QString() : text.mid(from + start.size(), to - from - start.size());
 }
 
-/// Markers are not escaped, so one of a path with "<" is no XML. A complete one is read by its lines instead:
-/// its plug-in would crash every run otherwise.
-void readRawMarker(const QString &marker, EffectRecord &record)
+/// Reads a marker by its lines.
+EffectRecord rawRecord(const MarkerFormat &format, const QByteArray &content)
 {
-    QByteArray content;
-    if (!readWholeFile(marker, content) || !content.trimmed().endsWith("</CrashedPlugin>"))
-        return;
     const QString text = QString::fromUtf8(content);
+    EffectRecord record;
+    record.enabled = false;
     record.path = rawElement(text, "Path");
     record.fileTime = rawElement(text, "Created");
     record.name = rawElement(text, "Name");
-    record.subId = static_cast<quint32>(parseInteger(rawElement(text, "SubID")));
+    if (format.hasSubId)
+        record.subId = static_cast<quint32>(parseInteger(rawElement(text, "SubID")));
     if (record.subId != 0)
         record.subName = record.name;
+    return record;
+}
+
+QByteArray markerText(const MarkerFormat &format, const EffectRecord &record)
+{
+    QByteArray text = xmlHeaderLine() + "<CrashedPlugin>" + kLineEnd;
+    if (!format.leavesOutEmpty || !record.path.isEmpty())
+        text += elementLine(1, "Path", record.path.toUtf8());
+    if (!format.leavesOutEmpty || !record.fileTime.isEmpty())
+        text += elementLine(1, "Created", record.fileTime.toUtf8());
+    text += elementLine(1, "Name", record.name.toUtf8());
+    // Signed, unlike the catalogue's: markers of earlier versions carry it so.
+    if (format.hasSubId && record.subId != 0)
+        text += elementLine(1, "SubID", QByteArray::number(static_cast<qint32>(record.subId)));
+    return text + "</CrashedPlugin>" + kLineEnd;
 }
 
 } // namespace
@@ -88,17 +102,7 @@ QString markerPath(const MarkerFormat &format, const QString &folder, const QStr
 
 FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, const EffectRecord &record)
 {
-    QByteArray text = xmlHeaderLine() + "<CrashedPlugin>" + kLineEnd;
-    if (!format.leavesOutEmpty || !record.path.isEmpty())
-        text += elementLine(1, "Path", record.path.toUtf8());
-    if (!format.leavesOutEmpty || !record.fileTime.isEmpty())
-        text += elementLine(1, "Created", record.fileTime.toUtf8());
-    text += elementLine(1, "Name", record.name.toUtf8());
-    // Signed, unlike the catalogue's: markers of earlier versions carry it so.
-    if (format.hasSubId && record.subId != 0)
-        text += elementLine(1, "SubID", QByteArray::number(static_cast<qint32>(record.subId)));
-    text += QByteArray("</CrashedPlugin>") + kLineEnd;
-
+    const QByteArray text = markerText(format, record);
     QFile file(marker);
     if (file.open(QIODevice::WriteOnly | QIODevice::Truncate) && file.write(text) == text.size() &&
         file.flush())
@@ -110,11 +114,20 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
 {
     EffectRecord record;
     record.enabled = false;
-    XMLDocument document(XMLDocument::Entities::Literal);
-    if (!document.load(marker)) {
-        DebugLog(L"Cannot read the crash marker %ls: %ls", marker, document.error());
-        readRawMarker(marker, record);
+    QByteArray content;
+    if (const FileResult read = readWholeFile(marker, content); !read) {
+        DebugLog(L"Cannot read the crash marker %ls: %ls", marker, read.reason);
         return record;
+    }
+    // Markers are not escaped: a path with "<" makes one no XML, or XML that says something else. What we
+    // wrote is read by its lines; its plug-in would crash every run otherwise.
+    const EffectRecord raw = rawRecord(format, content);
+    if (markerText(format, raw) == content)
+        return raw;
+    XMLDocument document(XMLDocument::Entities::Literal);
+    if (!document.parse(content)) {
+        DebugLog(L"Cannot read the crash marker %ls: %ls", marker, document.error());
+        return content.trimmed().endsWith("</CrashedPlugin>") ? raw : record;
     }
     const XMLElement crashed = document.root("CrashedPlugin");
     record.path = crashed.child("Path").text();
