@@ -95,13 +95,15 @@ bool VSTHost::AddEffect(const EffectRecord &record)
     return AudioPluginHost::AddEffect(later);
 }
 
-std::optional<EffectRecord> VSTHost::findByKey(const QString &key) const
+std::optional<EffectRecord> VSTHost::findByKey(QString key) const
 {
     std::optional<EffectRecord> record = findEffect(key);
-    if (record || !key.contains(QLatin1String(kOldKeyMark)))
-        return record;
-    DebugLog(L"Found an old Waves plug-in, retrying as:");
-    return findByKey(key.mid(static_cast<int>(sizeof kOldKeyMark - 1)));
+    while (!record && key.contains(QLatin1String(kOldKeyMark))) {
+        DebugLog(L"Found an old Waves plug-in, retrying as:");
+        key.remove(0, static_cast<int>(sizeof kOldKeyMark - 1)); // wherever the mark is
+        record = findEffect(key);
+    }
+    return record;
 }
 
 std::unique_ptr<VSTPlugin> VSTHost::loadByKey(const QString &key)

@@ -104,7 +104,7 @@ private:
     std::vector<Registered>::iterator registered(const VSTPlugin *plugin);
     bool pin(const VSTPlugin *claimed);
     void unpin(const VSTPlugin *plugin);
-    std::optional<EffectRecord> findByKey(const QString &key) const;
+    std::optional<EffectRecord> findByKey(QString key) const;
     std::unique_ptr<VSTPlugin> loadRecord(const EffectRecord &record, const QString &requestedKey);
     bool cleanUpNames();
 
