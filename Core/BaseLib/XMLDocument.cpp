@@ -15,6 +15,16 @@ namespace {
 // they are: file names may hold them.
 constexpr unsigned kParseOptions = (pugi::parse_default | pugi::parse_ws_pcdata_single) & ~pugi::parse_eol;
 
+constexpr char kByteOrderMark[] = "\xef\xbb\xbf";
+
+/// A text as it stands: at its start, Qt takes a byte order mark for none of its characters.
+QString wholeText(const char *utf8)
+{
+    return qstrncmp(utf8, kByteOrderMark, sizeof kByteOrderMark - 1) == 0
+               ? QString::fromUtf8(QByteArray(kByteOrderMark) + utf8)
+               : QString::fromUtf8(utf8);
+}
+
 } // namespace
 
 XMLElement XMLElement::child(const char *name) const
@@ -30,7 +40,7 @@ std::vector<XMLElement> XMLElement::children(const char *name) const
     return found;
 }
 
-QString XMLElement::text() const { return QString::fromUtf8(pugi::xml_node(m_node).text().get()); }
+QString XMLElement::text() const { return wholeText(pugi::xml_node(m_node).text().get()); }
 
 std::optional<QString> XMLElement::attribute(const char *name) const
 {

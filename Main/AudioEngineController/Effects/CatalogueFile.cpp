@@ -31,7 +31,8 @@ QByteArray escapedLine(const QByteArray &line)
     const int end = line.lastIndexOf("</");
     if (start <= 0 || end < start)
         return line;
-    const QByteArray content = QString::fromUtf8(line.mid(start, end - start)).toHtmlEscaped().toUtf8();
+    QByteArray content = line.mid(start, end - start);
+    content.replace('&', "&amp;").replace('<', "&lt;").replace('>', "&gt;");
     return line.left(start) + content + line.mid(end);
 }
 
