@@ -1,0 +1,231 @@
+#!/usr/bin/env python3
+"""Measures whole processes against each other and prints a table. scripts/bench builds what it runs.
+
+The processes of a row run in turn, so that a change of the machine's mood meets all of them alike. A ratio is made of each
+turn; shown are the medians, and of the ratios also the quartiles.
+"""
+
+import argparse
+import hashlib
+import os
+import re
+import shutil
+import statistics
+import subprocess
+import sys
+import tempfile
+import time
+from pathlib import Path
+
+LIBRARIES = {"vst3": Path("/usr/lib/vst3"), "vst2": Path("/usr/lib/vst")}
+BINARY_FOLDER = "Contents/x86_64-linux"
+
+
+class Process:
+    """A command line, run again and again; `prepare` is called before each run, which does not count."""
+
+    def __init__(self, *command, environment=None, prepare=lambda: None):
+        self.command = [str(word) for word in command]
+        self.environment = environment or {}
+        self.prepare = prepare
+
+    def run(self, output=subprocess.DEVNULL):
+        """Gives the run's seconds and its peak memory in KiB."""
+        self.prepare()
+        started = time.perf_counter()
+        process = subprocess.Popen(self.command, stdin=subprocess.DEVNULL, stdout=output, stderr=subprocess.DEVNULL,
+                                   env={**os.environ, **self.environment})
+        _, status, usage = os.wait4(process.pid, 0)
+        seconds = time.perf_counter() - started
+        process.returncode = os.waitstatus_to_exitcode(status)
+        if process.returncode != 0:
+            sys.exit(f"{' '.join(self.command)[:200]} ended with {process.returncode}")
+        return seconds, usage.ru_maxrss
+
+
+class Case:
+    """A folder for one scan: the scan list and what the scan leaves."""
+
+    def __init__(self, bench, name, folders):
+        self.effects = bench.work / name / "Effects"
+        self.effects.mkdir(parents=True)
+        self.list = self.effects / "FXScan.xml"
+        paths = "".join(f"\t<Path>{folder}</Path>\n" for folder in folders)
+        self.list.write_text(f'<?xml version="1.0" encoding="UTF-8"?>\n<Scan>\n{paths}</Scan>\n')
+        self.program = bench.programs / "FxProbe"
+
+    def forget(self):
+        for catalogue in self.effects.glob("*Configuration.xml"):
+            catalogue.unlink()
+
+    def first_scan(self):
+        return Process(self.program, self.list, prepare=self.forget)
+
+    def next_scan(self):
+        return Process(self.program, self.list)
+
+    def check(self, files, probes):
+        """Runs a scan and makes sure that it does what is to be measured."""
+        report = self.effects / "report"
+        Process(self.program, self.list, environment={"FXPROBE_REPORT": str(report)}).run()
+        text = report.read_text()
+        report.unlink()
+        found = [sum(int(number) for number in re.findall(f'"{what}":([0-9]+)', text)) for what in ("files", "probes")]
+        if '"event":"finished"' not in text or found != [files, probes]:
+            sys.exit(f"{self.list}: {found} files and probes in place of {[files, probes]}\n{text[:1000]}")
+
+
+def module_file(path):
+    """The binary of a VST 3 bundle, which is what is loaded."""
+    return path / BINARY_FOLDER / f"{path.stem}.so" if path.is_dir() else path
+
+
+def load_arguments(folders):
+    arguments = []
+    for kind, folder in folders.items():
+        pattern = "*.vst3" if kind == "vst3" else "*.so"
+        arguments += [kind, *sorted(module_file(path) for path in folder.rglob(pattern))]
+    return arguments
+
+
+class Bench:
+    def __init__(self, programs, work, runs):
+        self.programs = programs
+        self.work = work
+        self.runs = runs
+        still = self.fixtures("still", 1)
+        self.start = self.unchanged("start", still, 1)
+        print("| measured | FxProbe | its start | against | ratio | aim |")
+        print("|---|---:|---:|---:|---:|---:|")
+
+    def floor(self, folders):
+        return Process(self.programs / "load_floor", *load_arguments(folders))
+
+    def row(self, name, ours, other, aim, without_start=True, share=1):
+        """Prints a line. The ratio is that of our process, without its start where that is said, to the other. A share of
+        the runs is enough for what takes long."""
+        turns = []
+        for _ in range(max(3, self.runs // share)):
+            turns.append([process.run()[0] for process in (ours, self.start, other)])
+        net = [(mine - start if without_start else mine) for mine, start, _ in turns]
+        ratios = [mine / theirs for mine, (_, _, theirs) in zip(net, turns)]
+        low, middle, high = statistics.quantiles(ratios, n=4)
+        mine, start, theirs = (f"{statistics.median(times) * 1000:.1f} ms" for times in zip(*turns))
+        print(f"| {name} | {mine} | {start if without_start else ''} | {theirs} | {middle:.2f} ({low:.2f}–{high:.2f}) | {aim} |",
+              flush=True)
+        return statistics.median(net), statistics.median(times[2] for times in turns)
+
+    def fixtures(self, name, count):
+        """Folders with so many plug-ins of each format: links to the scripted ones, without a script."""
+        folders = {kind: self.work / name / kind for kind in LIBRARIES}
+        for kind, folder in folders.items():
+            folder.mkdir(parents=True)
+            source = self.work / f"{kind}.so"
+            if not source.exists():
+                shutil.copy(self.programs.parent / "fixtures" / f"scripted_{kind}.so", source)
+            for number in range(count):
+                path = folder / f"Fixture {number:05}.so"
+                if kind == "vst3":
+                    binaries = path.with_suffix(".vst3") / BINARY_FOLDER
+                    binaries.mkdir(parents=True)
+                    path = binaries / path.name
+                os.link(source, path)
+        return folders
+
+    def unchanged(self, name, folders, count):
+        """A scan of such folders that finds everything in its catalogue. The catalogues are that of one plug-in, repeated:
+        a first scan of many thousands takes minutes."""
+        case = Case(self, f"{name} case", folders.values())
+        seed = self.fixtures(f"{name} seed plug-ins", 1)
+        one = Case(self, f"{name} seed case", seed.values())
+        one.first_scan().run()
+        for catalogue in one.effects.glob("*Configuration.xml"):
+            text = catalogue.read_text()
+            for kind in folders:
+                text = text.replace(str(seed[kind]), str(folders[kind]))
+            head, block, tail = re.fullmatch("(.*?)(\t<Effect>.*</Effect>\n)(.*)", text, re.DOTALL).groups()
+            records = [self.renumbered(block, number) for number in range(count)]
+            (case.effects / catalogue.name).write_text(head + "".join(sorted(records, key=self.identifier)) + tail)
+        case.check(files=3 * count, probes=count)  # the binaries in the bundles are looked at as VST 2 modules
+        return case.next_scan()
+
+    @staticmethod
+    def identifier(record):
+        return re.search("<ID>(.*)</ID>", record).group(1)
+
+    @staticmethod
+    def renumbered(record, number):
+        digits = hashlib.md5(str(number).encode()).hexdigest().upper()
+        return re.sub("<ID>[0-9A-F]{32}</ID>", f"<ID>{digits}</ID>", record.replace("Fixture 00000", f"Fixture {number:05}"))
+
+    def start_and_end(self):
+        self.row("start and end, nothing to do", self.start, Process(self.programs / "start_floor"), "", without_start=False)
+
+    def real(self):
+        for kinds in (["vst3"], ["vst2"], ["vst3", "vst2"]):
+            folders = {kind: LIBRARIES[kind] for kind in kinds}
+            case = Case(self, f"real {kinds}", folders.values())
+            self.row(f"first scan, real {' and '.join(kinds)}, against the floor", case.first_scan(), self.floor(folders),
+                     "1.05")
+
+    def peers(self):
+        libraries = next(iter(Path("/usr/lib").glob("ardour*/")), None)
+        for kind, program in {"vst3": "ardour-vst3-scanner", "vst2": "ardour-vst-scanner"}.items():
+            if not libraries or not (libraries / program).exists():
+                print(f"| {program} is not installed | | | | | |")
+                continue
+            folder = LIBRARIES[kind]
+            home = self.work / f"{program} home"
+            home.mkdir()
+            files = sorted(folder.rglob("*.vst3" if kind == "vst3" else "*.so"))
+            settings = {"environment": {"LD_LIBRARY_PATH": str(libraries), "HOME": str(home), "XDG_CACHE_HOME": str(home)},
+                        "prepare": lambda home=home: shutil.rmtree(home)}
+            ours = Case(self, f"beside {program}", [folder]).first_scan()
+            at_once = Process(libraries / program, "-f", "-q", *files, **settings)
+            one_each = Process("/bin/sh", "-c", 'program=$1; shift; for file; do "$program" -f -q "$file"; done', "sh",
+                               libraries / program, *files, **settings)
+            self.row(f"first scan, real {kind}, against {program}, all at once", ours, at_once, "<1", without_start=False)
+            self.row(f"… and a process for each file", ours, one_each, "<1", without_start=False, share=2)
+
+    def unchanged_scans(self):
+        for count in (100, 1000, 10000, 20000):
+            name = f"unchanged {count}"
+            folders = self.fixtures(name, count // 2)
+            walk = Process(self.programs / "walk_floor", *folders.values())
+            net, _ = self.row(f"nothing changed, {count:,} plug-ins, against a walk",
+                              self.unchanged(name, folders, count // 2), walk, "2", share=1 + count // 5000)
+            print(f"| … for each plug-in | {net / count * 1e6:.1f} µs | | | | the same |")
+
+    def first_scans(self):
+        for kind in LIBRARIES:
+            for count in (100, 300, 1000):
+                folders = {kind: self.fixtures(f"first {kind} {count}", count)[kind]}
+                scan, floor = Case(self, f"first {kind} {count} case", folders.values()).first_scan(), self.floor(folders)
+                net, least = self.row(f"first scan, {count:,} fixtures, {kind}, against the floor", scan, floor, "",
+                                      share=1 + count // 300)
+                print(f"| … our own for each file | {(net - least) / count * 1e6:.0f} µs | | | | hardly grows |")
+            output = tempfile.TemporaryFile()
+            floor.run(output)
+            output.seek(0)
+            peak = int(re.search(rb"(\d+) KiB", output.read()).group(1))
+            print(f"| … peak memory | {scan.run()[1] / 1024:.1f} MiB | {self.start.run()[1] / 1024:.1f} MiB "
+                  f"| {peak / 1024:.1f} MiB | | |")
+
+
+def main():
+    rows = {"start": Bench.start_and_end, "real": Bench.real, "peers": Bench.peers, "unchanged": Bench.unchanged_scans,
+            "first": Bench.first_scans}
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("programs", type=Path, help="the folder of the built programs")
+    parser.add_argument("--runs", type=int, default=20, help="turns of a row; long ones have fewer")
+    parser.add_argument("--only", choices=rows, action="append", help="these rows, not all")
+    arguments = parser.parse_args()
+    os.environ.update({"LC_ALL": "C.UTF-8", "QT_QPA_PLATFORM": "offscreen"})
+    with tempfile.TemporaryDirectory(dir=arguments.programs.parent) as work:
+        bench = Bench(arguments.programs, Path(work), arguments.runs)
+        for name in arguments.only or rows:
+            rows[name](bench)
+
+
+if __name__ == "__main__":
+    main()
