@@ -21,7 +21,10 @@ TerminationWatcher::TerminationWatcher(std::function<void()> requested, std::fun
 TerminationWatcher::~TerminationWatcher()
 {
     m_stop = true;
+    TerminationSignal::raise(); // wakes the thread
     m_thread.join();
+    if (!m_sawWakeUp)
+        TerminationSignal::wait(std::chrono::milliseconds(0)); // not left lying for another watcher
 }
 
 void TerminationWatcher::watch()
@@ -29,6 +32,9 @@ void TerminationWatcher::watch()
     while (!TerminationSignal::wait(kStep))
         if (m_stop)
             return;
+    m_sawWakeUp = m_stop;
+    if (m_sawWakeUp)
+        return;
     m_requested();
     for (auto patience = m_grace; sleepUnlessStopped(patience); patience = kReminder)
         m_overdue();

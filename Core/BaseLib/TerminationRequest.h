@@ -38,5 +38,6 @@ private:
     std::function<void()> m_overdue;
     std::chrono::milliseconds m_grace;
     std::atomic<bool> m_stop{false};
+    bool m_sawWakeUp = false; ///< the thread's, until it has ended
     std::thread m_thread;
 };

@@ -9,7 +9,6 @@
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/StatusHandover.h"
 
-#include <QAbstractEventDispatcher>
 #include <QAccessible>
 #include <QCloseEvent>
 #include <QCoreApplication>
@@ -180,9 +179,9 @@ void UiFxProbe::setUpProgressBar()
 void UiFxProbe::markFinished()
 {
     m_status->setFinished();
-    // The destructor may be asleep until the next event.
-    if (auto *dispatcher = QAbstractEventDispatcher::instance(thread()))
-        dispatcher->wakeUp();
+    // A tick at once: most scans find nothing new, and their end need not wait for the timer. It also wakes
+    // the destructor, which may be asleep until the next event.
+    QMetaObject::invokeMethod(this, &UiFxProbe::OnTimer, Qt::QueuedConnection);
 }
 
 bool UiFxProbe::isScanOver()
