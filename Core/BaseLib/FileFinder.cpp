@@ -4,42 +4,12 @@
 #include "Core/BaseLib/NativeFile.h"
 
 #include <QDir>
-#include <QDirIterator>
 #include <QFileInfo>
 
-#include <algorithm>
 #include <mutex>
 #include <set>
-#include <vector>
 
 namespace {
-
-struct FolderEntry {
-    QString name;
-    bool matches;
-    bool isRealFolder;
-};
-
-std::vector<FolderEntry> listFolder(const QString &folder, const QString &ending)
-{
-    std::vector<FolderEntry> entries;
-    QDirIterator iterator(folder, QDir::AllEntries | QDir::NoDotAndDotDot);
-    while (iterator.hasNext()) {
-        iterator.next();
-        const QString name = iterator.fileName();
-        const bool matches = name.endsWith(ending, Qt::CaseInsensitive);
-        const QFileInfo info = iterator.fileInfo();
-        // A link is told apart first: that needs no look at what it points to.
-        const bool isRealFolder = !info.isSymLink() && info.isDir();
-        if (matches || isRealFolder)
-            entries.push_back({name, matches, isRealFolder});
-    }
-    std::sort(entries.begin(), entries.end(), [](const FolderEntry &left, const FolderEntry &right) {
-        const int order = QString::compare(left.name, right.name, Qt::CaseInsensitive);
-        return order != 0 ? order < 0 : left.name < right.name;
-    });
-    return entries;
-}
 
 /// Why a folder cannot be searched; empty when it can.
 QString reasonAgainst(const QFileInfo &folder)
@@ -98,7 +68,7 @@ void FileFinder::searchFolder(const QString &folder, QStringList &found) const
 {
     if (m_cancelled && m_cancelled())
         return;
-    const std::vector<FolderEntry> entries = listFolder(folder, m_ending);
+    const std::vector<FolderEntry> entries = m_listings ? m_listings->list(folder) : listFolder(folder);
     if (entries.empty()) {
         const QString reason = reasonAgainst(QFileInfo(folder));
         if (!reason.isEmpty())
@@ -107,7 +77,7 @@ void FileFinder::searchFolder(const QString &folder, QStringList &found) const
     }
     const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
     for (const FolderEntry &entry : entries)
-        if (entry.matches)
+        if (entry.name.endsWith(m_ending, Qt::CaseInsensitive))
             found.append(prefix + entry.name);
     for (const FolderEntry &entry : entries)
         if (entry.isRealFolder && !leadsBack(prefix + entry.name))

@@ -1,9 +1,12 @@
 #pragma once
 
+#include "Core/BaseLib/FolderListing.h"
+
 #include <QString>
 #include <QStringList>
 
 #include <functional>
+#include <memory>
 
 /// Finds files and folders by the end of their name, in a folder and all folders below it.
 class FileFinder {
@@ -13,6 +16,9 @@ public:
 
     /// Asked before each folder; the search ends early when it answers true.
     void setCancelled(std::function<bool()> cancelled) { m_cancelled = std::move(cancelled); }
+
+    /// Searches share what they see; null, as at first: each sees for itself.
+    void setListings(std::shared_ptr<FolderListings> listings) { m_listings = std::move(listings); }
 
     /// The full paths found, "/" as separator: those of a folder in the order of their names, followed by
     /// what lies in its sub-folders. A folder that matches is listed and searched. Hidden entries are passed
@@ -29,4 +35,5 @@ private:
 
     QString m_ending;
     std::function<bool()> m_cancelled;
+    std::shared_ptr<FolderListings> m_listings;
 };

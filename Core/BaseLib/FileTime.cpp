@@ -2,20 +2,32 @@
 
 #include "Core/BaseLib/NativeFile.h"
 
-#include <QDateTime>
 #include <QFileInfo>
+
+#include <cstdio>
+
+namespace {
+
+QString textOf(const CalendarTime &time)
+{
+    char text[64];
+    std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d", time.year, time.month, time.day, time.hour,
+                  time.minute);
+    return QString::fromLatin1(text);
+}
+
+} // namespace
 
 QString fileTimeText(const QString &path)
 {
-    const QFileInfo file(path);
-    if (!file.exists())
-        return QString();
-    QDateTime modified = file.lastModified();
-    // Qt takes the first second of 1970 for no time at all; files from package systems that keep no dates
-    // carry it.
-    if (!modified.isValid())
-        modified = QDateTime::fromMSecsSinceEpoch(0);
-    return modified.toString(QStringLiteral("yyyy-MM-dd hh:mm"));
+    const std::optional<FileStatus> status = fileStatus(path);
+    return status ? textOf(status->modified) : QString();
+}
+
+QString regularFileTimeText(const QString &path)
+{
+    const std::optional<FileStatus> status = fileStatus(path);
+    return status && status->isRegular ? textOf(status->modified) : QString();
 }
 
 FileStamp fileStamp(const QString &path)

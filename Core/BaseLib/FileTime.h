@@ -4,6 +4,8 @@
 
 /// A file's last-modified local time as text "yyyy-MM-dd hh:mm"; empty when the file does not exist.
 QString fileTimeText(const QString &path);
+/// The same; empty also for a folder and for what is special.
+QString regularFileTimeText(const QString &path);
 
 /// What tells one version of a file from another: its modification time in full resolution, and its size.
 struct FileStamp {

@@ -5,6 +5,7 @@
 #include <QString>
 
 #include <cstdio>
+#include <optional>
 
 /// Whether file names that differ in nothing but case are two.
 #ifdef _WIN32
@@ -41,6 +42,19 @@ void syncToDisk(int fileDescriptor);
 bool leadsBack(const QString &folder);
 /// Sets a file's modification time to now.
 void touchFile(const QString &path);
+/// What a moment is called in the local time zone.
+struct CalendarTime {
+    int year, month, day, hour, minute;
+};
+
+struct FileStatus {
+    bool isRegular; ///< neither a folder nor special
+    CalendarTime modified;
+};
+
+/// Nothing when the file does not exist. Links are followed.
+std::optional<FileStatus> fileStatus(const QString &path);
+
 /// A file's modification time in nanoseconds since 1970, as fine as the file system keeps it; -1 when there
 /// is none.
 qint64 modifiedNanoseconds(const QString &path);

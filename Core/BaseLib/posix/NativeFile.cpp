@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <ctime>
 #include <limits>
 
 #include <fcntl.h>
@@ -28,6 +29,18 @@ bool leadsBack(const QString &) { return false; } // only links lead elsewhere
 void syncToDisk(int fileDescriptor) { fsync(fileDescriptor); }
 
 void touchFile(const QString &path) { utimensat(AT_FDCWD, QFile::encodeName(path).constData(), nullptr, 0); }
+
+std::optional<FileStatus> fileStatus(const QString &path)
+{
+    struct stat status = {};
+    if (stat(QFile::encodeName(path).constData(), &status) != 0)
+        return std::nullopt;
+    // The toolkit reads the rules of the time zone again for each file.
+    tm local = {};
+    localtime_r(&status.st_mtim.tv_sec, &local);
+    return FileStatus{S_ISREG(status.st_mode),
+                      {local.tm_year + 1900, local.tm_mon + 1, local.tm_mday, local.tm_hour, local.tm_min}};
+}
 
 qint64 modifiedNanoseconds(const QString &path)
 {

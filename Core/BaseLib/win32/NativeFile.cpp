@@ -2,10 +2,10 @@
 
 #include "Core/BaseLib/win32/WindowsText.h"
 
+#include <QDateTime>
 #include <QFileInfo>
 
 #include <limits>
-#include <optional>
 #include <tuple>
 
 #include <io.h>
@@ -112,6 +112,21 @@ void touchFile(const QString &path)
     GetSystemTimeAsFileTime(&now);
     if (file.isOpen())
         SetFileTime(file.get(), nullptr, nullptr, &now);
+}
+
+std::optional<FileStatus> fileStatus(const QString &path)
+{
+    const QFileInfo file(path);
+    if (!file.exists())
+        return std::nullopt;
+    QDateTime modified = file.lastModified();
+    // Qt takes the first second of 1970 for no time at all; files from package systems that keep no dates
+    // carry it.
+    if (!modified.isValid())
+        modified = QDateTime::fromMSecsSinceEpoch(0);
+    const QDate day = modified.date();
+    const QTime time = modified.time();
+    return FileStatus{file.isFile(), {day.year(), day.month(), day.day(), time.hour(), time.minute()}};
 }
 
 qint64 modifiedNanoseconds(const QString &path)

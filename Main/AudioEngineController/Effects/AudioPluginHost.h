@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Core/BaseLib/FileTime.h"
+#include "Core/BaseLib/FolderListing.h"
 #include "Core/BaseLib/KriticalSection.h"
 #include "Main/AudioEngineController/Effects/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/EffectList.h"
@@ -9,6 +10,7 @@
 #include <QStringList>
 
 #include <atomic>
+#include <memory>
 #include <optional>
 #include <set>
 
@@ -40,6 +42,9 @@ public:
     /// Scans the folders (true) or only refreshes the effect list from the known list (false). `inProcess`
     /// matters to the registry only. True when the catalogue was written.
     virtual bool Scan(bool scan, bool inProcess);
+    /// Has scans of several formats walk through the folders once; null, as at first: each walks for itself.
+    void setFolderListings(std::shared_ptr<FolderListings> listings) { m_listings = std::move(listings); }
+    const std::shared_ptr<FolderListings> &folderListings() const { return m_listings; }
     /// Sets what plug-ins are told about the audio they will be used for.
     virtual void setAudioSettings(int /*sampleRate*/, int /*blockSize*/) {}
     /// Category set of a file to the form used in memory, and back.
@@ -129,6 +134,7 @@ private:
 
     const CatalogueFormat *m_format;
     QString m_catalogueFolder;
+    std::shared_ptr<FolderListings> m_listings;
     FileStamp m_lastSeen;
     KnownList m_known;
     EffectList m_effects;

@@ -168,6 +168,7 @@ bool PluginHost::Scan(bool scan, bool inProcess)
 bool PluginHost::scanHosts(bool scan)
 {
     bool written = false;
+    shareFolderListings(std::make_shared<FolderListings>());
     for (const std::size_t index : kScanOrder) {
         if (scan && m_launcher.isCancelled()) { // what the host knows stays in its catalogue
             ProbeReport::instance().cancelled();
@@ -175,7 +176,14 @@ bool PluginHost::scanHosts(bool scan)
         }
         written |= m_hosts[index]->Scan(scan, true);
     }
+    shareFolderListings(nullptr);
     return written;
+}
+
+void PluginHost::shareFolderListings(const std::shared_ptr<FolderListings> &listings) const
+{
+    for (const auto &host : m_hosts)
+        host->setFolderListings(listings);
 }
 
 void PluginHost::cancelScan()

@@ -88,6 +88,7 @@ public:
 private:
     AudioPluginHost *hostOfPrefix(const QString &prefix);
     bool scanHosts(bool scan);
+    void shareFolderListings(const std::shared_ptr<FolderListings> &listings) const;
     void startLauncher();
     void launch();
     void reloadChanged();

@@ -11,8 +11,6 @@
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
-#include <QFileInfo>
-
 #include <algorithm>
 
 namespace {
@@ -67,10 +65,11 @@ std::vector<ScanItem> VSTFolderScan::arrange(const QStringList &paths)
     std::vector<ScanItem> items;
     items.reserve(sorted.size());
     for (const QString &path : sorted) {
-        if (!QFileInfo(path).isFile()) // a folder of that name; or a pipe, which would be waited for
+        const QString fileTime = regularFileTimeText(path);
+        if (fileTime.isEmpty()) // a folder of that name; or a pipe, which would be waited for
             continue;
         const KnownList::Knowledge known = host().known().lookUp(path);
-        ScanItem item{path, fileTimeText(path), true, {}};
+        ScanItem item{path, fileTime, true, {}};
         item.probe = known.how != KnownAs::Own || isOutdated(*known.records.front(), item.fileTime);
         if (known.how != KnownAs::Namesake) // files of one name are told apart by their paths
             for (const EffectRecord *record : known.records)

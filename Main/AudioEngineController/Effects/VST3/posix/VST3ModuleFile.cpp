@@ -15,6 +15,13 @@ constexpr char kBinaryFolder[] = "/Contents/x86_64-linux";
 using EntryFunction = bool (*)(void *libraryHandle);
 using ExitFunction = bool (*)();
 
+/// The module in a bundle that is as it should be.
+QString usualBinary(const QString &bundle)
+{
+    return bundle + QLatin1String(kBinaryFolder) + QLatin1Char('/') + QFileInfo(bundle).completeBaseName() +
+           QLatin1String(".so");
+}
+
 } // namespace
 
 bool VST3ModuleFile::isModule(const QString &path)
@@ -33,8 +40,7 @@ QString VST3ModuleFile::binary(const QString &path, QString &reason)
     if (!module.isDir())
         return path;
     const QString folder = path + QLatin1String(kBinaryFolder);
-    const QString usual =
-        folder + QLatin1Char('/') + QFileInfo(path).completeBaseName() + QLatin1String(".so");
+    const QString usual = usualBinary(path);
     if (QFileInfo::exists(usual))
         return usual;
     const QStringList found = QDir(folder).entryList({QStringLiteral("*.so")}, QDir::Files);
@@ -47,6 +53,10 @@ QString VST3ModuleFile::binary(const QString &path, QString &reason)
 
 QString VST3ModuleFile::fileTime(const QString &path)
 {
+    // One look is enough for a bundle as it should be; with many files it shows.
+    const QString usual = fileTimeText(usualBinary(path));
+    if (!usual.isEmpty())
+        return usual;
     QString reason;
     const QString file = binary(path, reason);
     return fileTimeText(file.isEmpty() ? path : file);
