@@ -2,7 +2,9 @@
 
 #include "Core/BaseLib/ByteView.h"
 
-#include <QFile>
+#include <QString>
+
+#include <memory>
 
 /// The content of a regular file in memory, read-only, while the object lives. Empty when the file is
 /// missing, special or cannot be read. Should the file shrink meanwhile, touching what it lost is a fault.
@@ -13,6 +15,6 @@ public:
     ByteView content() const { return m_content; }
 
 private:
-    QFile m_file;
+    std::shared_ptr<void> m_mapping;
     ByteView m_content;
 };

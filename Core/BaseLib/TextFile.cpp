@@ -39,7 +39,7 @@ FileResult replaceFile(const QString &path, const QByteArray &content, Durabilit
     const QFileInfo existing(path);
     const bool exists = existing.exists();
     // A file reached through a link is replaced where it lies; the link stays.
-    const QString target = exists ? existing.canonicalFilePath() : path;
+    const QString target = exists && existing.isSymLink() ? existing.canonicalFilePath() : path;
     // A device or a pipe is written to; renaming a file over it would take it away.
     if (exists && !existing.isFile())
         return writeDirectly(target, content, durability);

@@ -1,0 +1,199 @@
+// The parts of a scan one by one. "N" is a number of records or plug-ins; "big O" at the end of a row says
+// how the time grows.
+
+#include "Core/BaseLib/BinaryExports.h"
+#include "Core/BaseLib/FileFinder.h"
+#include "Core/BaseLib/FileTime.h"
+#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/KnownList.h"
+#include "Main/AudioEngineController/Effects/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+#include "Tests/Core/BaseLib/PeBuilder.h"
+
+#include <QDir>
+#include <QFile>
+#include <QTemporaryDir>
+
+#include <benchmark/benchmark.h>
+
+namespace {
+
+constexpr int kFew = 10;
+constexpr int kMost = 20000;
+
+EffectRecord recordOf(int number)
+{
+    EffectRecord record;
+    record.path = QStringLiteral("/usr/lib/vst3/Some Vendor Plug-in %1.vst3").arg(number);
+    record.fileTime = QStringLiteral("2024-03-09 07:05");
+    record.name = QStringLiteral("Some Vendor Plug-in %1").arg(number);
+    record.id = QStringLiteral("%1").arg(number, 32, 16, QLatin1Char('0'));
+    record.vendor = QStringLiteral("Some Vendor");
+    record.categories = QStringLiteral("Fx|Reverb");
+    record.inputs = record.outputs = 2;
+    return record;
+}
+
+std::vector<EffectRecord> recordsOf(benchmark::State &state)
+{
+    std::vector<EffectRecord> records;
+    for (int number = 0; number < state.range(0); ++number)
+        records.push_back(recordOf(number));
+    state.SetComplexityN(state.range(0));
+    return records;
+}
+
+/// The text of a catalogue of as many records as the benchmark asks for.
+QByteArray catalogueOf(benchmark::State &state)
+{
+    std::vector<QByteArray> texts;
+    for (const EffectRecord &record : recordsOf(state))
+        texts.push_back(renderRecord(vst3CatalogueFormat(), record));
+    std::vector<const QByteArray *> places;
+    for (const QByteArray &text : texts)
+        places.push_back(&text);
+    return renderCatalogue(vst3CatalogueFormat(), places);
+}
+
+void write(const QString &path, const QByteArray &content)
+{
+    QFile file(path);
+    if (!file.open(QIODevice::WriteOnly) || file.write(content) != content.size())
+        qFatal("cannot write a file for the benchmark");
+}
+
+void catalogueRead(benchmark::State &state)
+{
+    const QTemporaryDir folder;
+    const QString path = folder.filePath(QStringLiteral("catalogue.xml"));
+    write(path, catalogueOf(state));
+    for (auto _ : state)
+        benchmark::DoNotOptimize(readCatalogueFile(vst3CatalogueFormat(), path));
+}
+BENCHMARK(catalogueRead)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oN);
+
+/// What each interim write costs when all records were rendered before.
+void catalogueWrite(benchmark::State &state)
+{
+    std::vector<QByteArray> texts;
+    for (const EffectRecord &record : recordsOf(state))
+        texts.push_back(renderRecord(vst3CatalogueFormat(), record));
+    std::vector<const QByteArray *> places;
+    for (const QByteArray &text : texts)
+        places.push_back(&text);
+    const QTemporaryDir folder;
+    const QString path = folder.filePath(QStringLiteral("catalogue.xml"));
+    for (auto _ : state)
+        benchmark::DoNotOptimize(
+            replaceFile(path, renderCatalogue(vst3CatalogueFormat(), places), Durability::Buffered));
+}
+BENCHMARK(catalogueWrite)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oN);
+
+void recordRender(benchmark::State &state)
+{
+    const EffectRecord record = recordOf(1);
+    for (auto _ : state)
+        benchmark::DoNotOptimize(renderRecord(vst3CatalogueFormat(), record));
+}
+BENCHMARK(recordRender);
+
+/// A file replaced as a whole, with as many bytes.
+void fileReplace(benchmark::State &state)
+{
+    const QByteArray content(static_cast<int>(state.range(0)), 'x');
+    const QTemporaryDir folder;
+    const QString path = folder.filePath(QStringLiteral("catalogue.xml"));
+    for (auto _ : state)
+        benchmark::DoNotOptimize(replaceFile(path, content, Durability::Buffered));
+}
+BENCHMARK(fileReplace)->Arg(1)->Arg(1000000);
+
+/// The marker's part of the bracket around a probe.
+void markerBracket(benchmark::State &state)
+{
+    const QTemporaryDir folder;
+    const MarkerFormat &format = vst3CatalogueFormat().marker;
+    const EffectRecord record = recordOf(1);
+    for (auto _ : state) {
+        const QString marker = markerPath(format, folder.path(), record.path, QString());
+        ActiveMarkers::add(marker);
+        benchmark::DoNotOptimize(writeMarkerFile(format, marker, record));
+        ActiveMarkers::remove(marker);
+    }
+}
+BENCHMARK(markerBracket);
+
+/// A folder of as many bundles, each of three folders and a file.
+void fileFinder(benchmark::State &state)
+{
+    const QTemporaryDir folder;
+    for (int number = 0; number < state.range(0); ++number) {
+        const QString inside = folder.filePath(QStringLiteral("%1.vst3/Contents/x86_64-linux").arg(number));
+        QDir().mkpath(inside);
+        write(inside + QStringLiteral("/%1.so").arg(number), QByteArray("x"));
+    }
+    for (auto _ : state)
+        benchmark::DoNotOptimize(FileFinder(QStringLiteral(".vst3")).find(folder.path()));
+    state.SetComplexityN(state.range(0));
+}
+BENCHMARK(fileFinder)->RangeMultiplier(10)->Range(kFew, 1000)->Complexity(benchmark::oNLogN);
+
+void fileTime(benchmark::State &state)
+{
+    for (auto _ : state)
+        benchmark::DoNotOptimize(fileTimeText(QStringLiteral(FXPROBE_BENCH_MODULE)));
+}
+BENCHMARK(fileTime);
+
+void elfExports(benchmark::State &state)
+{
+    for (auto _ : state)
+        benchmark::DoNotOptimize(
+            findExports(QStringLiteral(FXPROBE_BENCH_MODULE), {"VSTPluginMain", "main"}));
+}
+BENCHMARK(elfExports);
+
+void peExports(benchmark::State &state)
+{
+    PeContent content;
+    content.exports = {"GetPluginFactory", "InitDll", "ExitDll"};
+    const QTemporaryDir folder;
+    const QString path = folder.filePath(QStringLiteral("plugin.dll"));
+    write(path, PeBuilder(content).build());
+    for (auto _ : state)
+        benchmark::DoNotOptimize(findExports(path, {"VSTPluginMain", "main"}));
+}
+BENCHMARK(peExports);
+
+/// Finding a file in a catalogue of as many records.
+void knownLookUp(benchmark::State &state)
+{
+    KnownList known;
+    for (const EffectRecord &record : recordsOf(state))
+        known.file(record);
+    const QString path = recordOf(static_cast<int>(state.range(0)) / 2).path;
+    for (auto _ : state)
+        benchmark::DoNotOptimize(known.lookUp(path));
+}
+BENCHMARK(knownLookUp)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oLogN);
+
+void nameFromPath(benchmark::State &state)
+{
+    EffectRecord record = recordOf(1);
+    for (auto _ : state)
+        benchmark::DoNotOptimize(NameFromPath(record));
+}
+BENCHMARK(nameFromPath);
+
+void identifierParse(benchmark::State &state)
+{
+    const QString identifier = QStringLiteral("vst3:00112233445566778899AABBCCDDEEFF");
+    for (auto _ : state)
+        benchmark::DoNotOptimize(formatOfPrefix(prefixOf(identifier)));
+}
+BENCHMARK(identifierParse);
+
+} // namespace
+
+BENCHMARK_MAIN();
