@@ -124,7 +124,7 @@ class Bench:
             if not source.exists():
                 shutil.copy(self.programs.parent / "fixtures" / f"scripted_{kind}.so", source)
             for number in range(count):
-                path = folder / f"Fixture {number:05}.so"
+                path = folder / f"Fixture {kind} {number:05}.so"
                 if kind == "vst3":
                     binaries = path.with_suffix(".vst3") / BINARY_FOLDER
                     binaries.mkdir(parents=True)
@@ -156,7 +156,7 @@ class Bench:
     @staticmethod
     def renumbered(record, number):
         digits = hashlib.md5(str(number).encode()).hexdigest().upper()
-        return re.sub("<ID>[0-9A-F]{32}</ID>", f"<ID>{digits}</ID>", record.replace("Fixture 00000", f"Fixture {number:05}"))
+        return re.sub("<ID>[0-9A-F]{32}</ID>", f"<ID>{digits}</ID>", record.replace(" 00000", f" {number:05}"))
 
     def start_and_end(self):
         self.row("start and end, nothing to do", self.start, Process(self.programs / "start_floor"), "", without_start=False)

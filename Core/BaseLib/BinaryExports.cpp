@@ -1,10 +1,10 @@
 #include "Core/BaseLib/BinaryExports.h"
 
-#include "Core/BaseLib/MappedFile.h"
+#include "Core/BaseLib/PagedFile.h"
 
 ExportAnswer findExports(const QString &path, const std::vector<QByteArray> &names)
 {
-    const MappedFile file(path);
+    PagedFile file(path);
     const ExportAnswer answer = findElfExports(file.content(), names);
     return answer != ExportAnswer::Unknown ? answer : findPeExports(file.content(), names);
 }

@@ -16,7 +16,7 @@ enum class ExportAnswer {
 /// Tells from its file, without running any of its code, whether a shared library exports one of these
 /// symbols. Libraries that it depends on do not count. Reads x86-64 ELF libraries and PE libraries for any
 /// machine; all other files, and those that are missing, special or damaged, give Unknown. Any thread may
-/// ask. The file is mapped: should it shrink during the call, the fault is that of touching lost memory.
+/// ask.
 ExportAnswer findExports(const QString &path, const std::vector<QByteArray> &names);
 
 /// The same for the content of an ELF file, of any alignment, that need not be trustworthy.

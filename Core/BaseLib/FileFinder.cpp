@@ -68,7 +68,8 @@ void FileFinder::searchFolder(const QString &folder, QStringList &found) const
 {
     if (m_cancelled && m_cancelled())
         return;
-    const std::vector<FolderEntry> entries = m_listings ? m_listings->list(folder) : listFolder(folder);
+    const FolderListings::Listing listing = m_listings->list(folder);
+    const std::vector<FolderEntry> &entries = *listing;
     if (entries.empty()) {
         const QString reason = reasonAgainst(QFileInfo(folder));
         if (!reason.isEmpty())

@@ -8,7 +8,8 @@
 #include <functional>
 #include <memory>
 
-/// Finds files and folders by the end of their name, in a folder and all folders below it.
+/// Finds files and folders by the end of their name, in a folder and all folders below it. Looks into each
+/// folder once in its life.
 class FileFinder {
 public:
     /// `ending` is the end of the names looked for, with its dot (".vst3"), compared without regard to case.
@@ -17,7 +18,7 @@ public:
     /// Asked before each folder; the search ends early when it answers true.
     void setCancelled(std::function<bool()> cancelled) { m_cancelled = std::move(cancelled); }
 
-    /// Searches share what they see; null, as at first: each sees for itself.
+    /// Has it share with others what they saw in the folders; not null.
     void setListings(std::shared_ptr<FolderListings> listings) { m_listings = std::move(listings); }
 
     /// The full paths found, "/" as separator: those of a folder in the order of their names, followed by
@@ -35,5 +36,5 @@ private:
 
     QString m_ending;
     std::function<bool()> m_cancelled;
-    std::shared_ptr<FolderListings> m_listings;
+    std::shared_ptr<FolderListings> m_listings = std::make_shared<FolderListings>();
 };

@@ -12,8 +12,10 @@ std::vector<FolderEntry> listFolder(const QString &folder)
     return entries;
 }
 
-std::vector<FolderEntry> FolderListings::list(const QString &folder)
+FolderListings::Listing FolderListings::list(const QString &folder)
 {
-    const auto known = m_listings.constFind(folder);
-    return known != m_listings.constEnd() ? *known : *m_listings.insert(folder, listFolder(folder));
+    Listing &listing = m_listings[folder];
+    if (!listing)
+        listing = std::make_shared<const std::vector<FolderEntry>>(listFolder(folder));
+    return listing;
 }

@@ -3,6 +3,7 @@
 #include <QHash>
 #include <QString>
 
+#include <memory>
 #include <vector>
 
 /// An entry of a folder.
@@ -22,9 +23,11 @@ std::vector<FolderEntry> readFolder(const QString &folder);
 /// thread.
 class FolderListings {
 public:
+    using Listing = std::shared_ptr<const std::vector<FolderEntry>>;
+
     /// As `listFolder` saw it first.
-    std::vector<FolderEntry> list(const QString &folder);
+    Listing list(const QString &folder);
 
 private:
-    QHash<QString, std::vector<FolderEntry>> m_listings;
+    QHash<QString, Listing> m_listings;
 };

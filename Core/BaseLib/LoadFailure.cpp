@@ -1,7 +1,7 @@
 #include "Core/BaseLib/LoadFailure.h"
 
 #include "Core/BaseLib/FormatText.h"
-#include "Core/BaseLib/MappedFile.h"
+#include "Core/BaseLib/PagedFile.h"
 #include "Core/BaseLib/PeImage.h"
 
 #include <QSet>
@@ -20,7 +20,7 @@ public:
 
     QString of(const QString &path)
     {
-        const MappedFile file(path);
+        PagedFile file(path);
         if (file.content().isEmpty())
             return {}; // the loader's words say it all
         const std::optional<PeImage> image = PeImage::read(file.content());

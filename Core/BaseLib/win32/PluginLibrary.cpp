@@ -1,6 +1,5 @@
 #include "Core/BaseLib/PluginLibrary.h"
 
-#include "Core/BaseLib/FaultGuard.h"
 #include "Core/BaseLib/win32/ImportSearch.h"
 #include "Core/BaseLib/win32/WindowsText.h"
 
@@ -23,14 +22,11 @@ private:
 /// What the file itself tells beyond the system's words, which name neither machine nor missing library.
 QString foundInFile(const QString &path, const QString &firstFolder)
 {
-    QString reason;
     try {
-        const LibrarySearch search = importSearch(firstFolder);
-        callGuarded([&] { reason = whyNotLoadable(path, search); });
+        return whyNotLoadable(path, importSearch(firstFolder));
     } catch (const std::exception &) {
-        // The file shrank while it was read.
+        return {}; // no memory for it
     }
-    return reason;
 }
 
 } // namespace

@@ -59,7 +59,8 @@ QStringList FolderScan::findFiles() const
     QStringList paths;
     std::set<QString, PathLess> seen;
     FileFinder finder(m_ending);
-    finder.setListings(m_host.folderListings());
+    if (m_host.folderListings())
+        finder.setListings(m_host.folderListings());
     finder.setCancelled([this] { return isCancelled(); });
     for (const QString &folder : m_host.folders())
         for (const QString &path : finder.find(folder))

@@ -1,7 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
 
 #include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/FaultGuard.h"
 #include "Core/BaseLib/FileTime.h"
 #include "Main/AudioEngineController/Effects/ProbeBracket.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
@@ -17,12 +16,7 @@ namespace {
 
 bool hasNoEntryPoint(const QString &path)
 {
-    try {
-        const auto ask = [&] { return findExports(path, {"VSTPluginMain", "main"}); };
-        return callGuarded(ask) == ExportAnswer::NotExported;
-    } catch (const SEException &) {
-        return false; // the file shrank while it was read; loading decides
-    }
+    return findExports(path, {"VSTPluginMain", "main"}) == ExportAnswer::NotExported;
 }
 
 /// Whether the record that speaks for a file does not fit it any more.
