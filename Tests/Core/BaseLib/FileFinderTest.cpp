@@ -71,3 +71,19 @@ TEST(FileFinder, CancelIsAskedBeforeEachFolder)
     finder.setCancelled([&asked] { return ++asked > 2; });
     EXPECT_EQ(finder.find(folder.path()), pathsIn(folder, {"a.vst3"_q, "b/b.vst3"_q}));
 }
+
+TEST(FileFinder, SharesWhatItSawOnlyWithThoseWhoAsk)
+{
+    const EmptyFolder folder;
+    folder.write("a/a.vst3"_q);
+    folder.write("a/a.so"_q);
+    const auto listings = std::make_shared<FolderListings>();
+    FileFinder first = moduleFinder();
+    FileFinder second(".so"_q);
+    first.setListings(listings);
+    second.setListings(listings);
+    EXPECT_EQ(first.find(folder.path()), pathsIn(folder, {"a/a.vst3"_q}));
+    folder.write("a/later.so"_q);
+    EXPECT_EQ(second.find(folder.path()), pathsIn(folder, {"a/a.so"_q}));
+    EXPECT_EQ(FileFinder(".so"_q).find(folder.path()), pathsIn(folder, {"a/a.so"_q, "a/later.so"_q}));
+}

@@ -43,7 +43,10 @@ TEST(FileTime, IsLocalTimeInMinutes)
         EXPECT_EQ(fileTimeText(path), row.text) << row.name;
         EXPECT_EQ(fileStamp(path).modifiedNanoseconds, row.time.toMSecsSinceEpoch() * 1000000) << row.name;
     }
+    EXPECT_EQ(regularFileTimeText(path), fileTimeText(path));
     EXPECT_EQ(fileTimeText(folder.path("none"_q)), QString());
+    EXPECT_NE(fileTimeText(folder.path()), QString());
+    EXPECT_EQ(regularFileTimeText(folder.path()), QString());
 }
 
 TEST(FileStamp, SeesWhatTheTextCannot)

@@ -24,3 +24,13 @@ TEST(TerminationSignal, ToldOnceForEachSignalAndNeverForAnIgnoredOne)
         EXPECT_EQ(std::signal(number, before), SIG_IGN) << strsignal(number);
     }
 }
+
+TEST(TerminationWatcher, LeavesNoRequestBehindForAnother)
+{
+    int requests = 0;
+    const auto count = [&requests] { ++requests; };
+    for (int round = 0; round < 100; ++round)
+        const TerminationWatcher watcher(count, count, std::chrono::seconds(20));
+    EXPECT_FALSE(TerminationSignal::wait(std::chrono::milliseconds(0)));
+    EXPECT_EQ(requests, 0);
+}
