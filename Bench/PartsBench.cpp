@@ -68,7 +68,7 @@ void catalogueRead(benchmark::State &state)
     const QTemporaryDir folder;
     const QString path = folder.filePath(QStringLiteral("catalogue.xml"));
     write(path, catalogueOf(state));
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(readCatalogueFile(vst3CatalogueFormat(), path));
 }
 BENCHMARK(catalogueRead)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oN);
@@ -84,7 +84,7 @@ void catalogueWrite(benchmark::State &state)
         places.push_back(&text);
     const QTemporaryDir folder;
     const QString path = folder.filePath(QStringLiteral("catalogue.xml"));
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(
             replaceFile(path, renderCatalogue(vst3CatalogueFormat(), places), Durability::Buffered));
 }
@@ -93,7 +93,7 @@ BENCHMARK(catalogueWrite)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(b
 void recordRender(benchmark::State &state)
 {
     const EffectRecord record = recordOf(1);
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(renderRecord(vst3CatalogueFormat(), record));
 }
 BENCHMARK(recordRender);
@@ -104,7 +104,7 @@ void fileReplace(benchmark::State &state)
     const QByteArray content(static_cast<int>(state.range(0)), 'x');
     const QTemporaryDir folder;
     const QString path = folder.filePath(QStringLiteral("catalogue.xml"));
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(replaceFile(path, content, Durability::Buffered));
 }
 BENCHMARK(fileReplace)->Arg(1)->Arg(1000000);
@@ -115,7 +115,7 @@ void markerBracket(benchmark::State &state)
     const QTemporaryDir folder;
     const MarkerFormat &format = vst3CatalogueFormat().marker;
     const EffectRecord record = recordOf(1);
-    for (auto _ : state) {
+    while (state.KeepRunning()) {
         const QString marker = markerPath(format, folder.path(), record.path, QString());
         ActiveMarkers::add(marker);
         benchmark::DoNotOptimize(writeMarkerFile(format, marker, record));
@@ -133,7 +133,7 @@ void fileFinder(benchmark::State &state)
         QDir().mkpath(inside);
         write(inside + QStringLiteral("/%1.so").arg(number), QByteArray("x"));
     }
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(FileFinder(QStringLiteral(".vst3")).find(folder.path()));
     state.SetComplexityN(state.range(0));
 }
@@ -141,14 +141,14 @@ BENCHMARK(fileFinder)->RangeMultiplier(10)->Range(kFew, 1000)->Complexity(benchm
 
 void fileTime(benchmark::State &state)
 {
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(fileTimeText(QStringLiteral(FXPROBE_BENCH_MODULE)));
 }
 BENCHMARK(fileTime);
 
 void elfExports(benchmark::State &state)
 {
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(
             findExports(QStringLiteral(FXPROBE_BENCH_MODULE), {"VSTPluginMain", "main"}));
 }
@@ -161,7 +161,7 @@ void peExports(benchmark::State &state)
     const QTemporaryDir folder;
     const QString path = folder.filePath(QStringLiteral("plugin.dll"));
     write(path, PeBuilder(content).build());
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(findExports(path, {"VSTPluginMain", "main"}));
 }
 BENCHMARK(peExports);
@@ -173,7 +173,7 @@ void knownLookUp(benchmark::State &state)
     for (const EffectRecord &record : recordsOf(state))
         known.file(record);
     const QString path = recordOf(static_cast<int>(state.range(0)) / 2).path;
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(known.lookUp(path));
 }
 BENCHMARK(knownLookUp)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oLogN);
@@ -181,7 +181,7 @@ BENCHMARK(knownLookUp)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benc
 void nameFromPath(benchmark::State &state)
 {
     EffectRecord record = recordOf(1);
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(NameFromPath(record));
 }
 BENCHMARK(nameFromPath);
@@ -189,7 +189,7 @@ BENCHMARK(nameFromPath);
 void identifierParse(benchmark::State &state)
 {
     const QString identifier = QStringLiteral("vst3:00112233445566778899AABBCCDDEEFF");
-    for (auto _ : state)
+    while (state.KeepRunning())
         benchmark::DoNotOptimize(formatOfPrefix(prefixOf(identifier)));
 }
 BENCHMARK(identifierParse);

@@ -109,7 +109,7 @@ class Bench:
             turns.append([process.run()[0] for process in (ours, self.start, other)])
         net = [(mine - start if without_start else mine) for mine, start, _ in turns]
         ratios = [mine / theirs for mine, (_, _, theirs) in zip(net, turns)]
-        low, middle, high = statistics.quantiles(ratios, n=4)
+        low, middle, high = statistics.quantiles(ratios, n=4, method="inclusive")
         mine, start, theirs = (f"{statistics.median(times) * 1000:.1f} ms" for times in zip(*turns))
         print(f"| {name} | {mine} | {start if without_start else ''} | {theirs} | {middle:.2f} ({low:.2f}–{high:.2f}) | {aim} |",
               flush=True)
