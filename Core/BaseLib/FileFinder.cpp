@@ -11,15 +11,13 @@
 
 namespace {
 
-/// Why a folder cannot be searched; empty when it can.
+/// Why there is nothing to search; empty for a folder.
 QString reasonAgainst(const QFileInfo &folder)
 {
     if (!folder.exists())
         return QStringLiteral("it does not exist");
     if (!folder.isDir())
         return QStringLiteral("it is not a folder");
-    if (!folder.isReadable() || !folder.isExecutable())
-        return QStringLiteral("it is not readable");
     return QString();
 }
 
@@ -37,6 +35,8 @@ Reports &reports()
 
 void logUnsearchable(const QString &folder, const QString &reason)
 {
+    if (reason.isEmpty())
+        return;
     const std::lock_guard<std::mutex> lock(reports().mutex);
     if (reports().folders.insert(folder).second)
         DebugLog(L"Cannot search the folder \"%ls\": %ls", folder, reason);
@@ -69,13 +69,11 @@ void FileFinder::searchFolder(const QString &folder, QStringList &found) const
     if (m_cancelled && m_cancelled())
         return;
     const FolderListings::Listing listing = m_listings->list(folder);
-    const std::vector<FolderEntry> &entries = *listing;
-    if (entries.empty()) {
-        const QString reason = reasonAgainst(QFileInfo(folder));
-        if (!reason.isEmpty())
-            logUnsearchable(folder, reason);
-        return;
-    }
+    const std::vector<FolderEntry> &entries = listing->entries;
+    if (!listing->problem.isEmpty())
+        logUnsearchable(folder, listing->problem);
+    else if (entries.empty())
+        logUnsearchable(folder, reasonAgainst(QFileInfo(folder)));
     const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
     for (const FolderEntry &entry : entries)
         if (entry.name.endsWith(m_ending, Qt::CaseInsensitive))

@@ -2,20 +2,24 @@
 
 #include <algorithm>
 
-std::vector<FolderEntry> listFolder(const QString &folder)
+FolderContent listFolder(const QString &folder)
 {
-    std::vector<FolderEntry> entries = readFolder(folder);
-    std::sort(entries.begin(), entries.end(), [](const FolderEntry &left, const FolderEntry &right) {
-        const int order = QString::compare(left.name, right.name, Qt::CaseInsensitive);
-        return order != 0 ? order < 0 : left.name < right.name;
-    });
-    return entries;
+    FolderContent content = readFolder(folder);
+    std::sort(content.entries.begin(), content.entries.end(),
+              [](const FolderEntry &left, const FolderEntry &right) {
+                  const int order = QString::compare(left.name, right.name, Qt::CaseInsensitive);
+                  return order != 0 ? order < 0 : left.name < right.name;
+              });
+    return content;
 }
 
 FolderListings::Listing FolderListings::list(const QString &folder)
 {
     Listing &listing = m_listings[folder];
-    if (!listing)
-        listing = std::make_shared<const std::vector<FolderEntry>>(listFolder(folder));
+    if (!listing) {
+        listing = std::make_shared<const FolderContent>(listFolder(folder));
+        if (!listing->problem.isEmpty())
+            m_unread.append(folder);
+    }
     return listing;
 }

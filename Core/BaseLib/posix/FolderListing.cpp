@@ -2,6 +2,8 @@
 
 #include <QFile>
 
+#include <cerrno>
+
 #include <dirent.h>
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -48,21 +50,26 @@ void add(std::vector<FolderEntry> &entries, int folder, const dirent64 &entry)
 
 } // namespace
 
-std::vector<FolderEntry> readFolder(const QString &folder)
+FolderContent readFolder(const QString &folder)
 {
-    std::vector<FolderEntry> entries;
+    FolderContent content;
     const int descriptor = open(QFile::encodeName(folder).constData(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
-    if (descriptor < 0)
-        return entries;
+    if (descriptor < 0) {
+        if (errno != ENOENT && errno != ENOTDIR)
+            content.problem = qt_error_string(errno);
+        return content;
+    }
     // Without a stream, which would be made and thrown away for every folder.
     alignas(dirent64) char buffer[kBufferSize];
     ssize_t filled = 0;
     while ((filled = getdents64(descriptor, buffer, sizeof buffer)) > 0)
         for (ssize_t place = 0; place < filled;) {
             const auto *entry = reinterpret_cast<const dirent64 *>(buffer + place);
-            add(entries, descriptor, *entry);
+            add(content.entries, descriptor, *entry);
             place += entry->d_reclen;
         }
+    if (filled < 0)
+        content.problem = qt_error_string(errno);
     close(descriptor);
-    return entries;
+    return content;
 }

@@ -1,17 +1,40 @@
 #include "Core/BaseLib/FolderListing.h"
 
+#include "Core/BaseLib/win32/WindowsText.h"
+
 #include <QDirIterator>
 #include <QFileInfo>
 
-std::vector<FolderEntry> readFolder(const QString &folder)
+namespace {
+
+/// Why a folder that is there tells nothing; empty where it is just empty.
+QString problemOf(const QString &folder)
 {
-    std::vector<FolderEntry> entries;
+    WIN32_FIND_DATAW first = {};
+    const HANDLE search = FindFirstFileW(nativePath(folder + QStringLiteral("/*")).c_str(), &first);
+    if (search != INVALID_HANDLE_VALUE) {
+        FindClose(search);
+        return QString();
+    }
+    const DWORD error = GetLastError();
+    const bool isGone =
+        error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND || error == ERROR_DIRECTORY;
+    return isGone ? QString() : systemMessage(error, folder);
+}
+
+} // namespace
+
+FolderContent readFolder(const QString &folder)
+{
+    FolderContent content;
     QDirIterator iterator(folder, QDir::AllEntries | QDir::NoDotAndDotDot);
     while (iterator.hasNext()) {
         iterator.next();
         const QFileInfo info = iterator.fileInfo();
         // A link is told apart first: that needs no look at what it points to.
-        entries.push_back({iterator.fileName(), !info.isSymLink() && info.isDir()});
+        content.entries.push_back({iterator.fileName(), !info.isSymLink() && info.isDir()});
     }
-    return entries;
+    if (content.entries.empty() && QFileInfo(folder).isDir()) // the toolkit keeps the reason to itself
+        content.problem = problemOf(folder);
+    return content;
 }

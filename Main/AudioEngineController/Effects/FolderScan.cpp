@@ -13,6 +13,7 @@ FolderScan::FolderScan(AudioPluginHost &host, const char *format, const QString 
     : m_host(host)
     , m_format(format)
     , m_ending(ending)
+    , m_listings(host.folderListings() ? host.folderListings() : std::make_shared<FolderListings>())
 {}
 
 FolderScan::~FolderScan() = default;
@@ -39,6 +40,7 @@ void FolderScan::scan()
     m_progress = createProgressDisplay();
     m_knownAtStart = m_host.known().size();
     const QStringList paths = findFiles();
+    keepUnread();
     m_items = arrange(paths);
     reportPlan(static_cast<std::size_t>(paths.size()));
     collectWaiting();
@@ -59,14 +61,21 @@ QStringList FolderScan::findFiles() const
     QStringList paths;
     std::set<QString, PathLess> seen;
     FileFinder finder(m_ending);
-    if (m_host.folderListings())
-        finder.setListings(m_host.folderListings());
+    finder.setListings(m_listings);
     finder.setCancelled([this] { return isCancelled(); });
     for (const QString &folder : m_host.folders())
         for (const QString &path : finder.find(folder))
             if (seen.insert(path).second)
                 paths.append(path);
     return paths;
+}
+
+void FolderScan::keepUnread()
+{
+    for (const QString &folder : m_listings->unread())
+        for (const EffectRecord *record : m_host.known().all())
+            if (record->path.startsWith(folder + QLatin1Char('/'), kPathCase))
+                m_host.AddEffect(*record);
 }
 
 void FolderScan::showItemProgress()

@@ -58,6 +58,8 @@ protected:
 private:
     void scan();
     QStringList findFiles() const;
+    /// Keeps what is known of the files in folders that could not be read: they are neither found nor gone.
+    void keepUnread();
     void collectWaiting();
     void reportPlan(std::size_t files) const;
     bool processItems();
@@ -70,6 +72,7 @@ private:
     AudioPluginHost &m_host;
     const char *m_format;
     QString m_ending;
+    std::shared_ptr<FolderListings> m_listings;
     ProcessState m_processState;
     std::shared_ptr<VProgressDisplay> m_progress;
     std::vector<ScanItem> m_items;

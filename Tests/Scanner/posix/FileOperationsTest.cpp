@@ -96,5 +96,19 @@ TEST_F(TracedScan, ACatalogueThatCannotBeReadIsNotReplaced)
     expectSettled({});
 }
 
+TEST_F(TracedScan, PluginsInAFolderThatCannotBeReadAreKept)
+{
+    const QByteArray before = m_folder.catalogue();
+    const ScannerOutcome outcome = trace({QStringLiteral("-P"), m_folder.plugins(), QStringLiteral("-e"),
+                                          QStringLiteral("inject=openat:error=EIO:when=1")});
+    EXPECT_TRUE(outcome.succeeded());
+    EXPECT_EQ(
+        logLines(outcome),
+        QStringList(
+            QStringLiteral("Cannot search the folder \"%1\": Input/output error").arg(m_folder.plugins())));
+    EXPECT_EQ(m_folder.catalogue(), before);
+    expectSettled({});
+}
+
 INSTANTIATE_TEST_SUITE_P(By, FileOperations, testing::ValuesIn(kDisturbances),
                          [](const auto &row) { return std::string(row.param.name); });
