@@ -65,7 +65,7 @@ TEST_F(ScanFolders, AFolderThatCannotBeSearchedCostsOneLogLine)
         {"does not exist, foreign letters", m_folder.path(QString::fromUtf8("無い 🎛")),
          "it does not exist"},
         {"is a file", m_folder.path(QStringLiteral("File")), "it is not a folder"},
-        {"is not readable", shut, "it is not readable"},
+        {"is not readable", shut, "Permission denied"},
     };
     addModule(QStringLiteral("Comp"));
     QFile::setPermissions(shut, QFile::Permissions());
