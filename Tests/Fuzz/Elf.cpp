@@ -5,7 +5,14 @@ void fuzzElf(const QByteArray &input)
 {
     // Without the zero that a QByteArray has behind its content.
     const std::vector<uchar> bytes(input.begin(), input.end());
-    for (const QByteArray &name : {QByteArray("VSTPluginMain"), QByteArray("main")})
-        if (findElfExports(ByteView(bytes.data(), bytes.size()), {name}) == ExportAnswer::Exported)
+    const ByteView view(bytes.data(), bytes.size());
+    const QString file = QStringLiteral("module.so");
+    writeFuzzFile(file, input);
+    for (const QByteArray &name : {QByteArray("VSTPluginMain"), QByteArray("main")}) {
+        const ExportAnswer answer = findElfExports(view, {name});
+        if (answer == ExportAnswer::Exported)
             require(input.contains(name + '\0'), "what is exported stands in the file");
+        if (answer != ExportAnswer::Unknown)
+            require(findExports(file, {name}) == answer, "a file read by its pages says the same");
+    }
 }
