@@ -1,0 +1,90 @@
+#include "Tests/Scanner/ScannerTest.h"
+#include "Tests/Support/VST2Fixture.h"
+
+#include <QFile>
+
+namespace {
+
+const QDateTime kUsual({2021, 3, 4}, {5, 6});
+
+/// So many characters that a module in it has a path of more than 500.
+QString deepFolder() { return (QString(120, QLatin1Char('d')) + QLatin1Char('/')).repeated(4); }
+
+class OddPlugins : public ScannerTest {
+protected:
+    QString vst2CataloguePath() const { return m_folder.effects() + QStringLiteral("/FXConfiguration.xml"); }
+    QByteArray catalogues() const
+    {
+        return m_folder.read(cataloguePath()) + m_folder.read(vst2CataloguePath());
+    }
+};
+
+} // namespace
+
+// Each in both formats, all in one scan.
+TEST_F(OddPlugins, AreListedOrBlamedAsOthersAre)
+{
+    const struct {
+        QString file;
+        QDateTime date;
+        bool kills;
+    } rows[] = {
+        {QStringLiteral("a/Comp"), kUsual, false},
+        {QStringLiteral("b/comp"), kUsual, false}, // differs in nothing but case
+        {QStringLiteral("c/Start of 1970"), QDateTime::fromMSecsSinceEpoch(0), false},
+        {QStringLiteral("c/Future"), QDateTime({2099, 12, 31}, {23, 59}), false},
+        {deepFolder() + QStringLiteral("Deep"), kUsual, false},
+        {deepFolder() + QStringLiteral("Deadly"), kUsual, true},
+        {QString::fromUtf8("日本 🎛/音 🎛"), kUsual, false},
+        {QString::fromUtf8("日本 🎛/致命的 💥"), kUsual, true},
+    };
+    int killers = 0;
+    for (const auto &row : rows) {
+        const QByteArray number = QByteArray::number(static_cast<int>(&row - rows));
+        const QByteArray trace = "trace \"" + tracePath().toUtf8() + "\" " + number + '\n';
+        const QByteArray vst3 =
+            trace + "class Three" + number + (row.kills ? "\nfault initialize kill\n" : "\n");
+        const QByteArray vst2 =
+            trace + "name Two" + number + (row.kills ? "\nfault get-vendor-string kill\n" : "\n");
+        m_folder.setModified(addVST3File(m_folder.plugins(), row.file, vst3), row.date);
+        m_folder.setModified(addVST2File(m_folder.plugins(), row.file, vst2), row.date);
+        killers += row.kills ? 2 : 0;
+    }
+    EXPECT_EQ(static_cast<int>(runUntilSettled(scannerProgram(), m_folder).size()), killers + 1);
+    const QByteArray settled = catalogues();
+    for (const auto &row : rows) {
+        SCOPED_TRACE(qPrintable(row.file));
+        const QByteArray number = QByteArray::number(static_cast<int>(&row - rows));
+        for (const QByteArray name : {"<Name>Three", "<Name>Two"})
+            EXPECT_EQ(settled.contains(name + number + "</Name>"), !row.kills);
+    }
+    EXPECT_EQ(settled.count("<Enabled>0<"), killers);
+    EXPECT_EQ(settled.count("<Working>0<"), killers);
+    forgetTrace();
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(trace(), QStringList());
+    EXPECT_EQ(catalogues(), settled);
+}
+
+TEST_F(OddPlugins, AFolderThatChangesDuringTheScan)
+{
+    addModule(QStringLiteral("A"), "delay initialize 500\n");
+    for (const char *name : {"B", "C", "D"})
+        addModule(QString::fromLatin1(name));
+    ScannerRun scanner(scannerProgram(), m_folder);
+    ASSERT_TRUE(scanner.start());
+    ASSERT_TRUE(waitForStage(scanner, QStringLiteral("A"), QStringLiteral("initialize")));
+    EXPECT_TRUE(QFile::remove(m_folder.path(QStringLiteral("Plugins/B.vst3"))));
+    m_folder.write(QStringLiteral("Plugins/C.vst3"), "no module");
+    addModule(QStringLiteral("E"));
+    EXPECT_TRUE(scanner.wait().succeeded());
+    EXPECT_EQ(m_folder.markers(), QStringList());
+    const auto first = records();
+    EXPECT_TRUE(first.at(QStringLiteral("A")).working && first.at(QStringLiteral("D")).working);
+    EXPECT_FALSE(first.at(QStringLiteral("C")).working);
+    EXPECT_EQ(first.count(QStringLiteral("E")), 0u) << "came after the folder was read";
+
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(listed(), QStringList({QStringLiteral("A"), QStringLiteral("C"), QStringLiteral("D"),
+                                     QStringLiteral("E")}));
+}
