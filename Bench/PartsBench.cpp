@@ -47,13 +47,7 @@ std::vector<EffectRecord> recordsOf(benchmark::State &state)
 /// The text of a catalogue of as many records as the benchmark asks for.
 QByteArray catalogueOf(benchmark::State &state)
 {
-    std::vector<QByteArray> texts;
-    for (const EffectRecord &record : recordsOf(state))
-        texts.push_back(renderRecord(vst3CatalogueFormat(), record));
-    std::vector<const QByteArray *> places;
-    for (const QByteArray &text : texts)
-        places.push_back(&text);
-    return renderCatalogue(vst3CatalogueFormat(), places);
+    return renderCatalogue(vst3CatalogueFormat(), recordsOf(state));
 }
 
 void write(const QString &path, const QByteArray &content)

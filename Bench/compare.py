@@ -143,13 +143,13 @@ class Bench:
         """A scan of such folders that finds everything in its catalogue. The catalogues are that of one plug-in, repeated:
         a first scan of many thousands takes minutes."""
         case = Case(self, f"{name} case", folders.values())
-        seed = self.fixtures(f"{name} seed plug-ins", 1)
-        one = Case(self, f"{name} seed case", seed.values())
+        model = self.fixtures(f"{name} model plug-ins", 1)
+        one = Case(self, f"{name} model case", model.values())
         one.first_scan().run()
         for catalogue in one.effects.glob("*Configuration.xml"):
             text = catalogue.read_text()
             for kind in folders:
-                text = text.replace(str(seed[kind]), str(folders[kind]))
+                text = text.replace(str(model[kind]), str(folders[kind]))
             head, block, tail = re.fullmatch("(.*?)(\t<Effect>.*</Effect>\n)(.*)", text, re.DOTALL).groups()
             records = [self.renumbered(block, number) for number in range(count)]
             (case.effects / catalogue.name).write_text(head + "".join(sorted(records, key=self.identifier)) + tail)

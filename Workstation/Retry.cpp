@@ -66,19 +66,6 @@ int reopen(std::vector<EffectRecord> &records, Chooser &chooser)
     return count;
 }
 
-FileResult writeRecords(const CatalogueFormat &format, const QString &path,
-                        const std::vector<EffectRecord> &records)
-{
-    std::vector<QByteArray> texts;
-    std::vector<const QByteArray *> pointers;
-    texts.reserve(records.size());
-    for (const EffectRecord &record : records) {
-        texts.push_back(renderRecord(format, record));
-        pointers.push_back(&texts.back());
-    }
-    return replaceFile(path, renderCatalogue(format, pointers), Durability::Synced);
-}
-
 /// A catalogue with what is to be written of it.
 struct Reopened {
     const PluginFormat *format;
@@ -135,7 +122,8 @@ RetryOutcome retryPlugins(const QString &effectsFolder, const QStringList &names
         if (catalogue.count == 0)
             continue;
         if (const FileResult written =
-                writeRecords(catalogue.format->catalogue, catalogue.path, catalogue.records);
+                replaceFile(catalogue.path, renderCatalogue(catalogue.format->catalogue, catalogue.records),
+                            Durability::Synced);
             !written)
             outcome.written.reason = QStringLiteral("%1: %2").arg(catalogue.path, written.reason);
     }

@@ -6,7 +6,7 @@
 
 /// The structures of PE files (the Windows format of programs and libraries) that lead to what a library
 /// exports and imports. Written out here, because only some of the systems that this builds on have a header
-/// for them. Source: Microsoft's "PE Format" specification. Addresses are relative to where the file is
+/// for them. Source: Microsoft's "PE Format" reference. Addresses are relative to where the file is
 /// loaded (RVA) unless said otherwise.
 
 static_assert(Q_BYTE_ORDER == Q_LITTLE_ENDIAN, "fields are copied as they stand in the file");

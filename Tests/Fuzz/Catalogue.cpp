@@ -10,18 +10,6 @@ namespace {
 
 const QString kFile = QStringLiteral("Catalogue.xml");
 
-QByteArray render(const CatalogueFormat &format, const std::vector<EffectRecord> &records)
-{
-    std::vector<QByteArray> texts;
-    std::vector<const QByteArray *> pointers;
-    texts.reserve(records.size());
-    for (const EffectRecord &record : records) {
-        texts.push_back(renderRecord(format, record));
-        pointers.push_back(&texts.back());
-    }
-    return renderCatalogue(format, pointers);
-}
-
 bool anyTextHolds(const std::vector<EffectRecord> &records, const char *characters)
 {
     return std::any_of(records.begin(), records.end(), [&](const EffectRecord &record) {
@@ -37,14 +25,14 @@ void readAndWrite(const CatalogueFormat &format, const QByteArray &input)
     const CatalogueContents contents = readCatalogueFile(format, kFile);
     require(contents || contents.records.empty(), "a file that cannot be used gives no records");
     const std::vector<EffectRecord> records = contents ? contents.records : salvageRecords(format, kFile);
-    const QByteArray written = render(format, records);
+    const QByteArray written = renderCatalogue(format, records);
     writeFuzzFile(kFile, written);
     // Nothing is escaped.
     if (!anyTextHolds(records, "<"))
-        require(render(format, readCatalogueFile(format, kFile).records) == written,
+        require(renderCatalogue(format, readCatalogueFile(format, kFile).records) == written,
                 "what was read is written and read again the same");
     if (!anyTextHolds(records, "\n"))
-        require(render(format, salvageRecords(format, kFile)) == written,
+        require(renderCatalogue(format, salvageRecords(format, kFile)) == written,
                 "what was written is salvaged whole, whatever the texts are");
 }
 

@@ -124,3 +124,15 @@ QByteArray renderCatalogue(const CatalogueFormat &format, const std::vector<cons
         text += *record;
     return text + end;
 }
+
+QByteArray renderCatalogue(const CatalogueFormat &format, const std::vector<EffectRecord> &records)
+{
+    std::vector<QByteArray> texts;
+    std::vector<const QByteArray *> pointers;
+    texts.reserve(records.size());
+    for (const EffectRecord &record : records) {
+        texts.push_back(renderRecord(format, record));
+        pointers.push_back(&texts.back());
+    }
+    return renderCatalogue(format, pointers);
+}

@@ -28,6 +28,8 @@ QByteArray renderRecord(const CatalogueFormat &format, const EffectRecord &recor
 
 /// A whole catalogue file made of rendered records.
 QByteArray renderCatalogue(const CatalogueFormat &format, const std::vector<const QByteArray *> &records);
+/// The same of records that are rendered for it.
+QByteArray renderCatalogue(const CatalogueFormat &format, const std::vector<EffectRecord> &records);
 
 /// The line every file of ours starts with, its end included.
 QByteArray xmlHeaderLine();
