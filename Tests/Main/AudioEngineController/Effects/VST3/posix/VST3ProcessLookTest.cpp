@@ -90,3 +90,10 @@ TEST_F(VST3ProcessLook, AModuleThatLeavesAThreadStaysMapped)
     EXPECT_TRUE(m_log.contains(modulePath(QStringLiteral("a Spoiler")) + sign));
     EXPECT_EQ(m_log.count(sign), 1);
 }
+
+TEST_F(VST3ProcessLook, APluginThatCallsExitRunsNobodysExitHandlers)
+{
+    add(QStringLiteral("Comp"), "class Comp\nfault initialize exit\n");
+    EXPECT_EQ(scanOnce().exitCode, 0);
+    EXPECT_EQ(traceOf(QStringLiteral("Comp")).last(), QStringLiteral("initialize Comp"));
+}
