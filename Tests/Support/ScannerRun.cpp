@@ -25,6 +25,11 @@ void settleSanitizers(QProcessEnvironment &environment)
         const QString given = environment.value(name);
         environment.insert(name, given.isEmpty() ? settings : settings + QLatin1Char(':') + given);
     }
+    // Who leaves by leaveProcess leaves threads that have ended unjoined.
+    const QString tsan = QStringLiteral("TSAN_OPTIONS");
+    environment.insert(tsan,
+                       QStringLiteral("report_thread_leaks=0:suppressions=" FXPROBE_RACE_SUPPRESSIONS ":") +
+                           environment.value(tsan));
     environment.insert(QStringLiteral("LSAN_OPTIONS"),
                        QStringLiteral("print_suppressions=0:suppressions=" FXPROBE_LEAK_SUPPRESSIONS));
 }
