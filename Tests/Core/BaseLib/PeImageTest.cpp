@@ -6,7 +6,6 @@
 
 #include <gtest/gtest.h>
 
-#include <map>
 #include <memory>
 
 namespace {
@@ -60,45 +59,25 @@ constexpr int kDelayImports = kImports + 3 * 20 + 13 + 10; // behind two imports
 const Damage kDamages[] = {
     {"nothing", 0, 1, 'M', Answer::Exported, kAllLibraries},
     {"no library", kFlags, 2, 2, Answer::Exported, kAllLibraries},
-    {"without the DOS magic", 0, 1, 'N'},
     {"without the PE magic", 0x40, 1, 'N'},
-    {"header far behind the file", kNewHeader, 4, ~0U},
-    {"header at the end of the file", kNewHeader, 4, 0x3fe},
     {"neither 32-bit nor 64-bit", kOptionalHeader, 2, 0x107},
-    {"optional header too short", kOptionalHeaderSize, 2, 71},
     {"optional header up to the directories", kOptionalHeaderSize, 2, 112},
-    {"optional header beyond the file", kOptionalHeaderSize, 2, 0xffff},
     {"laid out as a driver", kSectionAlignment, 4, 512},
-    {"headers beyond the file", kHeadersSize, 4, ~0U},
-    {"headers over the section", kHeadersSize, 4, 0x1001},
     {"no directories", kDirectoryCount, 4, 0, Answer::NotExported, "|"_q},
     {"directories up to the imports", kDirectoryCount, 4, 2, Answer::Exported, "KERNEL32.dll drums.dll|"_q},
-    {"more directories than there is room for", kDirectoryCount, 4, ~0U, Answer::Exported, kAllLibraries},
-    {"no section", kSectionCount, 2, 0, Answer::Unknown, "?|?"_q},
-    {"more sections than there are", kSectionCount, 2, 2},
-    {"section in memory nowhere", kSection + 12, 4, 0xfffff000},
     {"section of no size in memory", kSection + 8, 4, 0, Answer::Exported, kAllLibraries},
     {"section ends with its page", kSection + 8, 4, 1, Answer::Exported, kAllLibraries},
-    {"section of no size in the file", kSection + 16, 4, 0},
-    {"section longer than the file", kSection + 16, 4, 0x1000},
     {"section wraps around", kSection + 16, 4, ~0U},
-    {"section behind the file", kSection + 20, 4, 0x10000},
     {"exports nowhere", kDirectories, 4, ~0U, Answer::Unknown, kAllLibraries},
-    {"exports at the end of the section", kDirectories, 4, 0x11f0, Answer::Unknown, kAllLibraries},
     {"no functions", kFunctionCount, 4, 0, Answer::Unknown, kAllLibraries},
     {"names up to the one before", kNameCount, 4, 1, Answer::NotExported, kAllLibraries},
     {"all names there can be", kNameCount, 4, ~0U, Answer::Unknown, kAllLibraries},
-    {"functions nowhere", kFunctionTable, 4, 0x8000, Answer::Unknown, kAllLibraries},
     {"functions at zeros", kFunctionTable, 4, 0x1000, Answer::NotExported, kAllLibraries},
     {"names nowhere", kNameTable, 4, 0x8000, Answer::Unknown, kAllLibraries},
-    {"ordinals nowhere", kOrdinalTable, 4, 0x8000, Answer::Unknown, kAllLibraries},
     {"imports nowhere", kDirectories + 8, 4, ~0U, Answer::Exported, "?|late.dll"_q},
-    {"imports at the end of the section", kDirectories + 8, 4, 0x11f0, Answer::Exported, "?|late.dll"_q},
     {"no imports", kDirectories + 8, 4, 0, Answer::Exported, "|late.dll"_q},
     {"imports end with a missing name", kImports + 12, 4, 0, Answer::Exported, "|late.dll"_q},
-    {"imports end with a missing table", kImports + 36, 4, 0, Answer::Exported, "KERNEL32.dll|late.dll"_q},
     {"late imports of the last century", kDelayImports, 4, 0, Answer::Exported, "KERNEL32.dll drums.dll|?"_q},
-    {"late imports nowhere", kDirectories + 104, 4, ~0U, Answer::Exported, "KERNEL32.dll drums.dll|?"_q},
     {"late imports by the names of the others", kDirectories + 104, 4, 0x1000, Answer::Exported,
      "KERNEL32.dll drums.dll|"_q},
 };
@@ -125,24 +104,6 @@ TEST(PeImage, AnImageCutShortIsLeftToTheLoader)
         ASSERT_EQ(reading.exports(), Answer::Unknown) << size << " bytes";
         ASSERT_EQ(reading.libraries(), "?|?"_q) << size << " bytes";
     }
-}
-
-TEST(PeImage, DamageInventsNothing)
-{
-    QByteArray content = PeBuilder(kPlugin).build();
-    std::map<Answer, int> seen;
-    for (int position = 0; position < content.size(); ++position) {
-        const char original = content.at(position);
-        for (const char value : {'\0', '\x01', '\xff', char(~original)}) {
-            content[position] = value;
-            const Reading reading(content);
-            ASSERT_NE(reading.exports({"GetPluginFactory"}), Answer::Exported) << "byte " << position;
-            ASSERT_LE(reading.libraries().size(), 2 * kAllLibraries.size()) << "byte " << position;
-            ++seen[reading.exports()];
-        }
-        content[position] = original;
-    }
-    EXPECT_EQ(seen.size(), 3U) << "the damage did not reach what is read";
 }
 
 TEST(PeImage, AnyMachinesExportsCount)
