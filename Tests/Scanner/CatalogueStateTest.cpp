@@ -57,22 +57,6 @@ TEST_F(CatalogueState, AFolderInThePlaceOfTheCatalogueStays)
     EXPECT_FALSE(QFileInfo::exists(temporaryPath()));
 }
 
-TEST_F(CatalogueState, AWriteProtectedCatalogueKeepsItsContent)
-{
-    addListedModules({kComp});
-    const QByteArray before = m_folder.catalogue();
-    QFile::setPermissions(cataloguePath(), QFile::ReadOwner);
-    if (QFileInfo(cataloguePath()).isWritable())
-        GTEST_SKIP() << "the superuser writes everything";
-    addModule(QStringLiteral("New"));
-    const ScannerOutcome outcome = run();
-    EXPECT_TRUE(outcome.succeeded());
-    EXPECT_TRUE(outcome.log.contains(QStringLiteral("Cannot write the catalogue")))
-        << qPrintable(outcome.log);
-    EXPECT_EQ(m_folder.catalogue(), before);
-    EXPECT_FALSE(QFileInfo::exists(temporaryPath()));
-}
-
 TEST_F(CatalogueState, LeftoversOfATemporaryFileDoNoHarm)
 {
     addModule(kComp);
@@ -113,13 +97,4 @@ TEST_F(CatalogueState, NothingNewLoadsNothingAndWritesNothing)
     EXPECT_EQ(modified(), listedTime());
     EXPECT_EQ(effectsFolder(), before);
     EXPECT_EQ(logLines(outcome), QStringList());
-}
-
-TEST_F(CatalogueState, ARemovedPluginLeavesTheCatalogue)
-{
-    addListedModules({kComp, QStringLiteral("Delay")});
-    QFile::remove(m_folder.path(QStringLiteral("Plugins/Comp.vst3")));
-    EXPECT_TRUE(run().succeeded());
-    EXPECT_EQ(listed(), QStringList(QStringLiteral("Delay")));
-    EXPECT_EQ(loaded(), QStringList());
 }

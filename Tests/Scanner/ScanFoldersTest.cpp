@@ -65,6 +65,7 @@ TEST_F(ScanFolders, AFolderThatCannotBeSearchedCostsOneLogLine)
         {"does not exist, foreign letters", m_folder.path(QString::fromUtf8("無い 🎛")),
          "it does not exist"},
         {"is a file", m_folder.path(QStringLiteral("File")), "it is not a folder"},
+        {"is an empty path, not the working folder", QString(""), "no folder is given"},
         {"is not readable", shut, "Permission denied"},
     };
     addModule(QStringLiteral("Comp"));

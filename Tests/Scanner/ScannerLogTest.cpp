@@ -82,19 +82,3 @@ TEST_F(ScannerLog, TraceLinesAreThereOnlyOnRequest)
         EXPECT_EQ(lines.isEmpty(), *value != '1') << qPrintable(lines.join(QLatin1Char('\n')));
     }
 }
-
-TEST_F(ScannerLog, AnOutputThatNobodyReadsForAWhileHoldsNothingUp)
-{
-    addModule(QStringLiteral("Chatty"), "effect module-entry print 300\nclass C\n");
-    addModule(QStringLiteral("Next"));
-    ScannerRun scanner(scannerProgram(), m_folder);
-    ASSERT_TRUE(scanner.start());
-    // Nothing is read before the plug-in is in the middle of its output.
-    const QDeadlineTimer patience(20000);
-    while (!trace().contains(QStringLiteral("Chatty module-entry")) && !patience.hasExpired()) {
-    }
-    const ScannerOutcome outcome = scanner.wait();
-    EXPECT_TRUE(outcome.succeeded());
-    EXPECT_EQ(outcome.standardOutput.size() - outcome.standardOutput.count('\r'), 300 * 1024);
-    EXPECT_EQ(listed(), QStringList({QStringLiteral("Chatty"), QStringLiteral("Next")}));
-}

@@ -47,19 +47,6 @@ TEST_F(SecondScanner, LeavesABusyFolderAlone)
     }
 }
 
-TEST_F(SecondScanner, TheLockOfAKilledScannerCountsForNothing)
-{
-    ASSERT_TRUE(startFirst());
-    m_first.kill();
-    EXPECT_TRUE(m_first.wait().crashed);
-    EXPECT_TRUE(m_folder.markers().contains(QStringLiteral("Slow.scan3")));
-    forgetTrace();
-    EXPECT_TRUE(run().succeeded());
-    EXPECT_EQ(loaded(), QStringList());
-    EXPECT_EQ(listed(), QStringList({QStringLiteral("After"), QStringLiteral("Slow")}));
-    EXPECT_FALSE(records()[QStringLiteral("Slow")].working);
-}
-
 TEST_F(SecondScanner, AnotherFolderIsAnotherMatter)
 {
     ASSERT_TRUE(startFirst());

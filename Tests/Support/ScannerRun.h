@@ -52,7 +52,6 @@ public:
     void requestTermination(const TerminationWay &way = terminationWays().front());
     /// Ends the program by force (SIGKILL).
     void kill() { m_process.kill(); }
-    qint64 processId() const { return m_process.processId(); }
     /// Waits for the end of a started run.
     const ScannerOutcome &wait();
     /// start() and wait() in one.

@@ -287,15 +287,6 @@ TEST_F(FxScan, NamesThatBreakTheCatalogueAreNamed)
     EXPECT_EQ(states(result).size(), 2u) << "shown all the same";
 }
 
-TEST_F(FxScan, InProcessScansAsWell)
-{
-    addVst3("Comp", "");
-    addVst2("Echo", "");
-    const QJsonObject result = json(scan({QStringLiteral("--in-process")}));
-    EXPECT_EQ(states(result).size(), 2u);
-    EXPECT_TRUE(result[QStringLiteral("scan")][QStringLiteral("finished")].toBool());
-}
-
 TEST_F(FxScan, WrongUsage)
 {
     const QString nowhere = m_folder.path(QStringLiteral("nowhere"));

@@ -38,28 +38,6 @@ TEST(FileFinder, ListsAFolderByNameAndThenWhatLiesBelow)
     EXPECT_EQ(log.lines(), QStringList()) << "folders that merely hold nothing are no fault";
 }
 
-TEST(FileFinder, AFolderThatCannotBeSearchedIsOneLogLine)
-{
-    const EmptyFolder folder;
-    const struct {
-        const char *name;
-        QString path;
-        QString reason;
-    } rows[] = {
-        {"missing", folder.path("残響"_q), "it does not exist"_q},
-        {"a file", folder.write("x.vst3"_q), "it is not a folder"_q},
-        {"an empty path, which is not the working folder", QString(), "no folder is given"_q},
-    };
-    ASSERT_TRUE(QDir::setCurrent(folder.path()));
-    for (const auto &row : rows) {
-        const CapturedLog log;
-        EXPECT_EQ(moduleFinder().find(row.path), QStringList()) << row.name;
-        EXPECT_EQ(log.lines(), QStringList("Cannot search the folder \"%1\": %2"_q.arg(row.path, row.reason)))
-            << row.name;
-    }
-    QDir::setCurrent("/"_q);
-}
-
 TEST(FileFinder, CancelIsAskedBeforeEachFolder)
 {
     const EmptyFolder folder;

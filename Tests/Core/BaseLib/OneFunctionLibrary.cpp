@@ -1,4 +1,4 @@
-// A library that counts its own unloading; built a second time with a function that nobody has.
+// A library that counts its own unloading.
 
 #ifdef _WIN32
 #define EXPORTED extern "C" __declspec(dllexport)
@@ -20,14 +20,4 @@ Farewell s_farewell;
 
 } // namespace
 
-#ifdef NEEDS_A_MISSING_FUNCTION
-extern "C" void functionThatNobodyHas();
-#endif
-
-EXPORTED void countUnloading(int *counter)
-{
-#ifdef NEEDS_A_MISSING_FUNCTION
-    functionThatNobodyHas();
-#endif
-    s_farewell.counter = counter;
-}
+EXPORTED void countUnloading(int *counter) { s_farewell.counter = counter; }

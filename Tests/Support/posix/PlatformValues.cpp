@@ -6,7 +6,6 @@ const char *const kBundleEnding = ".so";
 const bool kBundleIsThePlugin = true;
 const char *const kForeignModule = "Contents/x86_64-win/Several.vst3";
 const char *const kForeignLocale = "C.UTF-8";
-const char *const kLoaderKiller = "segv";
 const bool kHomeFollowsEnvironment = true;
 const char *const kTextFileReason = "file too short";
 const std::array<const char *, 2> kNamesLikeMarkup = {"Bad\r", "sub<br/Bad</Path>"};

@@ -6,7 +6,6 @@ const char *const kBundleEnding = ".vst3";
 const bool kBundleIsThePlugin = false;
 const char *const kForeignModule = "Contents/x86_64-linux/Several.so";
 const char *const kForeignLocale = "German_Germany.1252";
-const char *const kLoaderKiller = "abort";
 const bool kHomeFollowsEnvironment = false;
 const char *const kTextFileReason = "the file is no Windows library";
 const std::array<const char *, 2> kNamesLikeMarkup = {"Bad & worse", "sub&#13;/Bad&lt;/Path&gt;"};

@@ -3,17 +3,11 @@
 #include "Tests/Core/BaseLib/Fixtures.h"
 #include "Tests/Core/BaseLib/posix/OrdinaryUser.h"
 
-#include <csignal>
-#include <cstring>
-
-#include <sys/resource.h>
 #include <sys/stat.h>
 
 #include <gtest/gtest.h>
 
 namespace {
-
-QString reasonOf(int error) { return QString::fromLocal8Bit(std::strerror(error)); }
 
 mode_t modeOf(const QByteArray &path)
 {
@@ -39,39 +33,6 @@ TEST(ReplaceFile, LinksPermissionsAndReadersStay)
         EXPECT_EQ(reader.readAll(), "old") << "who has it open sees the old content whole";
         EXPECT_EQ(here.names() + there.names(), QStringList({"link.xml"_q, "a.xml"_q}));
     }
-}
-
-TEST(ReplaceFile, AFullDeviceIsReportedAndStaysADevice)
-{
-    const EmptyFolder folder;
-    const QString link = folder.path("full.xml"_q);
-    ASSERT_TRUE(QFile::link("/dev/full"_q, link));
-    chmod(folder.nativePath("").constData(), 0755);
-    // Not as root: a fault here must not cost this machine its device.
-    EXPECT_TRUE(trueForOrdinaryUser(
-        [&link] { return replaceFile(link, "new", Durability::Buffered).reason == reasonOf(ENOSPC); }));
-    const QByteArray ownDevice = folder.nativePath("null");
-    if (mknod(ownDevice.constData(), S_IFCHR | 0666, 0x103) != 0)
-        GTEST_SKIP() << "only root can make a device of its own";
-    replaceFile(folder.path("null"_q), "new", Durability::Buffered);
-    EXPECT_TRUE(S_ISCHR(modeOf(ownDevice)));
-}
-
-TEST(ReplaceFile, AFailedWriteKeepsTheOldContentAndLeavesNoTemporary)
-{
-    const EmptyFolder folder;
-    const QString path = folder.write("a.xml"_q, "old");
-    rlimit before = {};
-    getrlimit(RLIMIT_FSIZE, &before);
-    const rlimit small = {1 << 20, before.rlim_max};
-    const auto handler = std::signal(SIGXFSZ, SIG_IGN);
-    setrlimit(RLIMIT_FSIZE, &small);
-    const FileResult result = replaceFile(path, QByteArray(2 << 20, 'x'), Durability::Buffered);
-    setrlimit(RLIMIT_FSIZE, &before);
-    std::signal(SIGXFSZ, handler);
-    EXPECT_EQ(result.reason, reasonOf(EFBIG));
-    EXPECT_EQ(contentOf(path), "old");
-    EXPECT_EQ(folder.names(), QStringList("a.xml"_q));
 }
 
 TEST(ReplaceFile, ObeysPermissions)

@@ -95,19 +95,3 @@ TEST(VSTAddEffect, OfTwoSpecialShellsTheNewerStays)
         EXPECT_EQ(listed(host), QStringList(stays + QStringLiteral("|Q10:1234|Q10")));
     }
 }
-
-TEST(VSTAddEffect, IdentifiersAndNamesOccurOnce)
-{
-    VSTHost host;
-    EXPECT_FALSE(host.AddEffect(recordOf("None", "", "None")));
-    EXPECT_TRUE(host.AddEffect(recordOf("Comp", "Comp:1", "Comp")));
-    EXPECT_FALSE(host.AddEffect(recordOf("Same", "Comp:1", "Other"))) << "the identifier is taken";
-    EXPECT_TRUE(host.AddEffect(recordOf("Second_64", "Comp:2", "Comp")));
-    EXPECT_TRUE(host.AddEffect(recordOf("Third x64", "Comp:3", "Comp")));
-    EXPECT_TRUE(host.AddEffect(recordOf("Fourth x64_64 64bit", "Comp:4", "Comp")));
-    EXPECT_TRUE(host.AddEffect(recordOf("Fifth", "Second:5", "Second"))) << "made names are not used names";
-    EXPECT_TRUE(host.AddEffect(recordOf("Sixth", "comp:6", "comp"))) << "case matters";
-    EXPECT_EQ(listed(host), QStringList({"Comp|Comp:1|Comp", "Second_64|Comp:2|Second",
-                                         "Third x64|Comp:3|Third ", "Fourth x64_64 64bit|Comp:4|Fourth ",
-                                         "Fifth|Second:5|Second", "Sixth|comp:6|comp"}));
-}

@@ -128,3 +128,12 @@ TEST_F(VSTScan, WhatAPluginChangesIsPutBack)
     EXPECT_TRUE(QFile::permissions(catalogue) & QFile::ReadOther);
     expectSettled();
 }
+
+TEST_F(VSTScan, AfterAFaultNothingIsClosedOrUnloaded)
+{
+    add(QStringLiteral("Fault"), "fault get-vendor-string segv\n");
+    add(QStringLiteral("Throw"), "fault get-vendor-string throw-std\n");
+    scan();
+    EXPECT_EQ(traceOf(QStringLiteral("Fault")).last(), QStringLiteral("get-vendor-string Fault"));
+    EXPECT_EQ(traceOf(QStringLiteral("Throw")).last(), QStringLiteral("static-destructor"));
+}

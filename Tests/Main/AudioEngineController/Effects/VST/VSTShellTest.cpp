@@ -1,8 +1,5 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTScanBench.h"
 
-#include <QDir>
-#include <QFile>
-
 namespace {
 
 class VSTShell : public VSTScanBench {};
@@ -105,21 +102,4 @@ TEST_F(VSTShell, NamesThatAreNoFileNames)
     }
     EXPECT_EQ(scanUntilSettled(), 4);
     EXPECT_EQ(m_folder.markers(), QStringList());
-}
-
-TEST_F(VSTShell, OfTwoSpecialShellsTheLaterVersionStays)
-{
-    for (const bool laterFirst : {true, false}) {
-        const QByteArray child = "child 1234 Q10\n";
-        add(QStringLiteral("%1/WaveShell1-VST 9.3_x64").arg(laterFirst ? "a" : "d"), child);
-        add(QStringLiteral("%1/WaveShell2-VST 9.2_x64").arg(laterFirst ? "b" : "c"), child);
-        scan();
-        ASSERT_EQ(records("Name").size(), 1);
-        EXPECT_TRUE(
-            records("Path").first().endsWith(QStringLiteral("WaveShell1-VST 9.3_x64") + vst2Ending()));
-        for (const char *folder : {"a", "b"})
-            EXPECT_TRUE(
-                QDir(m_folder.plugins() + QLatin1Char('/') + QLatin1String(folder)).removeRecursively());
-        QFile::remove(m_folder.path(QStringLiteral("Effects/FXConfiguration.xml")));
-    }
 }

@@ -115,35 +115,3 @@ TEST_F(VST3Failures, WaveShellsWithoutClassesAreTriedAgain)
         EXPECT_EQ(loaded().contains(QStringLiteral("Full WaveShell")), run == 0);
     }
 }
-
-// Each stage in a module of its own, all in one run. What was listed before the exception stays.
-TEST_F(VST3Failures, ExceptionsEndTheListingAndNothingElse)
-{
-    const struct {
-        const char *stage;
-        const char *ofClass;
-        const char *listed; // "-": the file is recorded as not working
-    } cases[] = {{"module-entry", "", "-"}, {"initialize", "B", "A"}, {"module-exit", "", "ABC"}};
-    QStringList expected{QStringLiteral("z healthy|1")};
-    for (const QByteArray kind : {"throw-std", "throw-int"}) {
-        for (const auto &row : cases) {
-            const QByteArray name = row.stage + (' ' + kind);
-            QByteArray script = QByteArray("fault ") + row.stage + ' ' + kind;
-            if (*row.ofClass)
-                script += " \"" + name + ' ' + row.ofClass + '"';
-            for (const char *letter : {"A", "B", "C"})
-                script += "\nclass \"" + name + ' ' + letter + '"';
-            add(QString::fromLatin1(name), script + '\n');
-            for (const char letter : QByteArray(row.listed))
-                expected.append(
-                    QString::fromLatin1(letter == '-' ? name + "|0" : name + ' ' + letter + "|1"));
-        }
-    }
-    add(QStringLiteral("z healthy"));
-    const ScannerOutcome outcome = scan();
-    expected.sort();
-    EXPECT_EQ(sortedRecords("Name Working"), expected);
-    EXPECT_EQ(outcome.log.count(QStringLiteral("thrown by the fixture")), static_cast<int>(std::size(cases)));
-    EXPECT_EQ(loaded().size(), 2 * static_cast<int>(std::size(cases)) + 1);
-    EXPECT_EQ(trace().filter(QStringLiteral(" static-destructor")).size(), loaded().size());
-}

@@ -62,32 +62,6 @@ TEST_F(VST3Files, BundlesInTheWild)
     EXPECT_EQ(loaded(), QStringList());
 }
 
-TEST_F(VST3Files, WhatTheSearchFinds)
-{
-    add(QStringLiteral("deep/er/and/Deeper"));
-    add(QStringLiteral("ünï cödé & 'b'/Tëst"));
-    add(QStringLiteral("A.folder.vst3/Contents2/Inside"));
-    add(QStringLiteral("Not one.vst3.bak"));
-    m_folder.write(inPlugins("Not one.vst3.txt"), "text");
-    ASSERT_TRUE(QFile::rename(modulePath(QStringLiteral("Not one.vst3.bak")), inPlugins("Not one.vst3.bak")));
-    scan();
-    EXPECT_EQ(loaded(), texts({"Inside", "Deeper", "Tëst"}));
-    QStringList found = sortedRecords("Name Working");
-    EXPECT_EQ(found, texts({"A.folder|0", "Deeper|1", "Inside|1", "Tëst|1"}));
-}
-
-TEST_F(VST3Files, AModuleReachedOnSeveralWaysIsProbedOnce)
-{
-    add(QStringLiteral("sub/Comp"));
-    const QString plugins = m_folder.plugins();
-    m_folder.writeScanList({plugins, plugins, plugins + QLatin1Char('/'), plugins + QStringLiteral("/sub"),
-                            plugins + QStringLiteral("/sub/../sub/.")});
-    scan();
-    EXPECT_EQ(loaded(), texts({"Comp"}));
-    EXPECT_EQ(records("Name Path"),
-              QStringList{QStringLiteral("Comp|") + modulePath(QStringLiteral("sub/Comp"))});
-}
-
 TEST_F(VST3Files, OneModuleInTwoPlaces)
 {
     const QByteArray script = "class Comp\nid 0000000000000000000000000000000A\n";

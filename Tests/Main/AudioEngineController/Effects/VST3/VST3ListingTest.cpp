@@ -33,15 +33,6 @@ TEST_F(VST3ScanBench, AHealthyModuleGivesThisCatalogue)
     EXPECT_EQ(m_folder.catalogue().replace("\r\n", "\n"), expected);
 }
 
-TEST_F(VST3ScanBench, NoModulesGiveAnEmptyCatalogue)
-{
-    m_folder.writeScanList({m_folder.path(QStringLiteral("nowhere")), m_folder.plugins()});
-    scan();
-    EXPECT_EQ(
-        m_folder.lines(QStringLiteral("Effects/VST3Configuration.xml")),
-        texts({"<?xml version=\"1.0\" encoding=\"UTF-8\"?>", "<Effects version=\"1.1\">", "</Effects>"}));
-}
-
 TEST_F(VST3ScanBench, TextsComeAsTheFactoryGivesThem)
 {
     const QByteArray longName(64, 'n');
@@ -85,39 +76,6 @@ TEST_F(VST3ScanBench, TextsComeAsTheFactoryGivesThem)
     scan();
     EXPECT_EQ(loaded(), QStringList());
     EXPECT_EQ(m_folder.catalogue(), catalogue);
-}
-
-TEST_F(VST3ScanBench, SubCategoriesBecomeACategoryMask)
-{
-    const struct {
-        const char *subCategories;
-        quint32 mask;
-    } cases[] = {{"Fx", 0},
-                 {"", 0},
-                 {"Fx|Reverb", 0x4000},
-                 {"Fx|EQ|Dynamics", 0x18},
-                 {"Instrument|Synth", 0x80},
-                 {"Instrument|Drum", 0x400080},
-                 {"Fx|Filter", 0x10},
-                 {"Fx|Analyzer", 0x1000000},
-                 {"Fx|Channel Strip", 0x2},
-                 {"Fx|Up-Downmix", 0x8000},
-                 {"Fx|Pitch Shift", 0x2000},
-                 {"Fx|Ambisonics", 0x4000000},
-                 {"Fx|reverb", 0},
-                 {"Fx|Reverberation", 0},
-                 {"|Delay||Nonsense|", 0x4}};
-    QStringList expected;
-    for (const auto &row : cases) {
-        const QByteArray name = QByteArray("of ") + row.subCategories;
-        add(QStringLiteral("Module %1").arg(expected.size()),
-            "class \"" + name + "\"\nsubcategories \"" + row.subCategories + "\"\n");
-        expected.append(QStringLiteral("%1|%2").arg(QLatin1String(row.subCategories)).arg(row.mask));
-    }
-    scan();
-    QStringList found = sortedRecords("Categories CategoryMask");
-    expected.sort();
-    EXPECT_EQ(found, expected);
 }
 
 TEST_F(VST3ScanBench, ClassesThatShareANameOrAnIdentifier)
@@ -173,18 +131,6 @@ TEST_F(VST3ScanBench, ClassesThatFailAreLeftOut)
         EXPECT_TRUE(outcome.log.contains(QLatin1String("The class ") + QLatin1String(answer) +
                                          QLatin1String(" could not be ")))
             << answer;
-}
-
-TEST_F(VST3ScanBench, AModuleOfHundredsOfClasses)
-{
-    QByteArray script;
-    for (int index = 0; index < 300; ++index)
-        script += "class \"Class " + QByteArray::number(index) + "\"\n";
-    add(QStringLiteral("Many"), script);
-    scan();
-    QStringList names = records("Name");
-    EXPECT_EQ(names.size(), 300);
-    EXPECT_EQ(names.removeDuplicates(), 0);
 }
 
 TEST_F(VST3ScanBench, StatedClassCountsAreNotBelieved)

@@ -137,21 +137,3 @@ TEST_F(VST3ScanBench, RemovedModulesLeaveTheCatalogue)
     found = sortedRecords("Name");
     EXPECT_EQ(found, texts({"Reverb", "Tuner"}));
 }
-
-TEST_F(VST3ScanBench, CataloguesOfEarlierVersionsKeepWhatTheyKnow)
-{
-    add(QStringLiteral("Comp"), classText("Comp", kIdA));
-    scan();
-    mark(QStringLiteral("Comp"), "Favourite", "1");
-    mark(QStringLiteral("Comp"), "FileTime", "04.03.21 05:06");
-    for (const char *version : {" version=\"1.0\"", ""}) {
-        SCOPED_TRACE(version);
-        QByteArray catalogue = m_folder.catalogue();
-        m_folder.write(QStringLiteral("Effects/VST3Configuration.xml"),
-                       catalogue.replace(" version=\"1.1\"", version));
-        scan();
-        EXPECT_EQ(loaded(), QStringList());
-        EXPECT_TRUE(m_folder.catalogue().contains("version=\"1.1\""));
-        EXPECT_EQ(records("Name FileTime Favourite"), texts({"Comp|2021-03-04 05:06|1"}));
-    }
-}

@@ -40,22 +40,3 @@ TEST_F(VST3FileSystem, LinkedModulesAndFoldersAreFollowedWhereTheyAreListed)
     scan();
     EXPECT_EQ(loaded(), texts({"File"}));
 }
-
-TEST_F(VST3FileSystem, AModuleReachedOnSeveralWaysIsProbedOnce)
-{
-    const QString path = add(QStringLiteral("sub/Comp"));
-    ASSERT_TRUE(QFile::link(inPlugins("sub"), inPlugins("linked folder")));
-    ASSERT_TRUE(QFile::link(m_folder.plugins(), inPlugins("sub/circle")));
-    scan();
-    EXPECT_EQ(loaded(), texts({"Comp"}));
-    EXPECT_EQ(records("Name Path"), QStringList{QStringLiteral("Comp|") + path});
-}
-
-TEST_F(VST3FileSystem, WhatIsHiddenIsNotSearched)
-{
-    add(QStringLiteral(".Hidden"));
-    add(QStringLiteral(".hidden folder/Unseen"));
-    add(QStringLiteral("<odd> & /Comp"));
-    scan();
-    EXPECT_EQ(loaded(), texts({"Comp"}));
-}
