@@ -26,8 +26,9 @@ QStringList texts(std::initializer_list<const char *> utf8)
     return result;
 }
 
-ScanBench::ScanBench(const char *catalogue)
+ScanBench::ScanBench(const char *catalogue, const QString &ending)
     : m_catalogue(QString::fromLatin1(catalogue))
+    , m_ending(ending)
 {
     m_folder.writeScanList();
 }
@@ -38,7 +39,22 @@ QByteArray ScanBench::traceStatement(const QString &name) const
            QFileInfo(name).fileName().toUtf8() + "\"\n";
 }
 
-void ScanBench::dateFirst(const QString &path) const { m_folder.setModified(path, kFirstDate); }
+QString ScanBench::dateFirst(const QString &path) const
+{
+    m_folder.setModified(path, kFirstDate);
+    return path;
+}
+
+QString ScanBench::modulePath(const QString &name) const
+{
+    return m_folder.plugins() + QLatin1Char('/') + name + m_ending;
+}
+
+QString ScanBench::addRaw(const QString &name, const QByteArray &content) const
+{
+    m_folder.write(modulePath(name), content);
+    return dateFirst(modulePath(name));
+}
 
 void ScanBench::dateLater(const QString &path) const { m_folder.setModified(path, kLaterDate); }
 

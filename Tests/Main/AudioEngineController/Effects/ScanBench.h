@@ -15,14 +15,18 @@ QStringList texts(std::initializer_list<const char *> utf8);
 /// depends on the minute in which it runs, and write their calls to one trace.
 class ScanBench : public testing::Test {
 protected:
-    /// `catalogue` is the file that `records` and `mark` look at.
-    explicit ScanBench(const char *catalogue);
+    /// `catalogue` is the file that `records` and `mark` look at, `ending` that of a module's name.
+    ScanBench(const char *catalogue, const QString &ending);
 
     /// The script's first statement: where a module's calls go, under its name.
     QByteArray traceStatement(const QString &name) const;
-    /// Dates a file as plug-ins of the first scan are, or as their updates.
-    void dateFirst(const QString &path) const;
+    /// Dates a file as plug-ins of the first scan are, and gives its path back.
+    QString dateFirst(const QString &path) const;
+    /// Dates it as their updates are.
     void dateLater(const QString &path) const;
+    QString modulePath(const QString &name) const;
+    /// Puts something that is no module of ours under a module's name; returns its path.
+    QString addRaw(const QString &name, const QByteArray &content) const;
 
     /// One run, which must end by itself with 0 and leave no marker.
     ScannerOutcome scan() const;
@@ -53,5 +57,5 @@ protected:
     TestFolder m_folder;
 
 private:
-    QString m_catalogue;
+    QString m_catalogue, m_ending;
 };

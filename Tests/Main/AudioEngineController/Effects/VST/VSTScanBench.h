@@ -3,22 +3,20 @@
 #include "Tests/Main/AudioEngineController/Effects/ScanBench.h"
 #include "Tests/Support/VST2Fixture.h"
 
-/// The bench with VST 2 modules on it, and VST 3 ones beside them where a test needs both.
+/// The bench with VST 2 modules on it.
 class VSTScanBench : public ScanBench {
 protected:
     VSTScanBench()
-        : ScanBench("FXConfiguration.xml")
+        : ScanBench("FXConfiguration.xml", vst2Ending())
     {}
 
     /// Puts a module into "Plugins", or into a folder below it when the name has one ("sub/Comp"). Returns
     /// its full path.
     QString add(const QString &name, const QByteArray &script = {},
-                VST2Fixture fixture = VST2Fixture::Scripted) const;
+                VST2Fixture fixture = VST2Fixture::Scripted) const
+    {
+        return dateFirst(addVST2File(m_folder.plugins(), name, traceStatement(name) + script, fixture));
+    }
     /// Replaces a module by one of a later date.
-    void update(const QString &name, const QByteArray &script = {}) const;
-    /// Puts something that is no module of ours under a module's name.
-    QString addRaw(const QString &name, const QByteArray &content) const;
-    QString modulePath(const QString &name) const;
-    /// Puts a VST 3 module with one class of its name beside them.
-    void addVST3(const QString &name, const QByteArray &script) const;
+    void update(const QString &name, const QByteArray &script = {}) const { dateLater(add(name, script)); }
 };
