@@ -1,30 +1,11 @@
 #include "Main/VLib/SimpleGUI.h"
 
-#include "Main/VLib/VProgressDisplay.h"
-#include "Main/VLib/VUI.h"
 #include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/NotingUI.h"
 
 #include <gtest/gtest.h>
 
 namespace {
-
-/// Notes what reaches the user interface, one line for each message.
-class NotingUI : public VUI {
-public:
-    void showStatus(const QString &text) override { heard << text; }
-    void showStatus(int level, const QString &text) override { heard << QString::number(level) + ' ' + text; }
-    void notify(quint32 value) override { heard << "notified " + QString::number(value, 16); }
-    void warn(const QString &text) override { heard << "warned " + text; }
-    std::shared_ptr<VProgressDisplay> createProgressDisplay() override { return nullptr; }
-    void requestShow() override { heard << QStringLiteral("show"); }
-    int messageBox(const QString &text, int flags) override
-    {
-        heard << "box " + text;
-        return flags + 1;
-    }
-
-    QStringList heard;
-};
 
 class SimpleGUI : public ::testing::Test {
 protected:

@@ -1,11 +1,10 @@
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 
-#include "Core/BaseLib/AudioPlugins.h"
 #include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
-#include "Main/VLib/ApplicationContext.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/QtPrinters.h"
+#include "Tests/Support/TestApplication.h"
 
 #include <QDir>
 #include <QFile>
@@ -14,20 +13,6 @@
 #include <gtest/gtest.h>
 
 namespace {
-
-class TestApplication : public IQuillonInterface {
-public:
-    TestApplication() { ApplicationContext::instance().quillonInterface = this; }
-    ~TestApplication() override { ApplicationContext::instance().quillonInterface = nullptr; }
-    QString dataFolder() const override { return QString(); }
-    QStringList scanFolders() const override { return folders; }
-    bool isScanner() const override { return scanner; }
-    void pluginListsChanged() override { ++changes; }
-
-    QStringList folders;
-    bool scanner = false;
-    int changes = 0;
-};
 
 void write(const QString &path, const QByteArray &text)
 {
@@ -40,8 +25,7 @@ TEST(PluginHost, AScanWritesItsFilesAndSaysSo)
 {
     const QTemporaryDir data;
     ASSERT_TRUE(QDir(data.path()).mkdir(QStringLiteral("Effects")));
-    TestApplication application;
-    application.folders = QStringList(data.path());
+    const TestApplication application({data.path()});
     PluginHost registry;
     registry.initialise(data.path(), QString(), 96000, 512);
     EXPECT_EQ(registry.completionEvent(), nullptr);
@@ -60,8 +44,7 @@ TEST(PluginHost, TheScannerLeavesTheScanListAlone)
 {
     const QTemporaryDir data;
     ASSERT_TRUE(QDir(data.path()).mkdir(QStringLiteral("Effects")));
-    TestApplication application;
-    application.scanner = true;
+    const TestApplication application({}, true);
     PluginHost registry;
     registry.initialise(data.path(), QString(), 48000, 1024);
     registry.Scan(true, true);
@@ -72,7 +55,7 @@ TEST(PluginHost, TheScannerLeavesTheScanListAlone)
 TEST(PluginHost, RefreshingDoesNotNotify)
 {
     const QTemporaryDir data;
-    TestApplication application;
+    const TestApplication application;
     PluginHost registry;
     registry.initialise(data.path(), QString(), 48000, 1024);
     registry.Scan(false, true);
@@ -142,8 +125,7 @@ TEST(PluginHost, MarksOnBuiltInEffectsAreReadAndWritten)
     };
     write(file,
           start + block("gone", "1", "0") + block("b", "-5", "2") + block("", "1", "0") + "</Effects>\n");
-    TestApplication application;
-    application.scanner = true;
+    TestApplication application({}, true);
     MRLAudioPluginHost host;
     host.setCatalogueFolder(folder.path());
     std::vector<EffectRecord> effects(2);
@@ -174,17 +156,4 @@ TEST(PluginHost, MarksOnBuiltInEffectsAreReadAndWritten)
               start + block("a", "1", "4") + block("b", "0", "0") + "</Effects>\n");
     host.setBuiltInEffects(effects);
     EXPECT_TRUE(host.findEffect(QStringLiteral("a"))->favourite) << "the marks outlive new effects";
-}
-
-TEST(AudioPlugins, AskingForAnUnsetRegistryIsReported)
-{
-    const CapturedLog log;
-    EXPECT_EQ(AudioPlugins::registry(), nullptr);
-    ASSERT_EQ(log.lines().size(), 1);
-    EXPECT_TRUE(log.contains(QStringLiteral("0 != _this")));
-    EXPECT_TRUE(log.contains(QStringLiteral("Core/BaseLib/AudioPlugins, line 24")));
-    PluginHost registry;
-    AudioPlugins::setRegistry(&registry);
-    EXPECT_EQ(AudioPlugins::registry(), &registry);
-    AudioPlugins::setRegistry(nullptr);
 }

@@ -1,8 +1,8 @@
 #include "Main/AudioEngineController/Effects/ScannerLauncher.h"
 
 #include "Main/AudioEngineController/Effects/PluginHost.h"
-#include "Main/VLib/ApplicationContext.h"
 #include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestApplication.h"
 #include "Tests/Support/TestFolder.h"
 #include "Tests/Support/VST2Fixture.h"
 #include "Tests/Support/VST3Fixture.h"
@@ -40,26 +40,6 @@ protected:
     TestFolder m_folder;
     ScannerLauncher m_launcher;
     int m_listsWritten = 0;
-};
-
-/// Counts what the registry tells the workstation.
-class Workstation : public IQuillonInterface {
-public:
-    explicit Workstation(const TestFolder &folder)
-        : m_folder(folder)
-    {
-        ApplicationContext::instance().quillonInterface = this;
-    }
-    ~Workstation() override { ApplicationContext::instance().quillonInterface = nullptr; }
-    QString dataFolder() const override { return m_folder.dataFolder(); }
-    QStringList scanFolders() const override { return QStringList(m_folder.plugins()); }
-    bool isScanner() const override { return false; }
-    void pluginListsChanged() override { ++changes; }
-
-    std::atomic<int> changes{0};
-
-private:
-    const TestFolder &m_folder;
 };
 
 void waitForLauncher(const PluginHost &registry)
@@ -158,7 +138,7 @@ TEST_F(Launcher, AScannerThatCannotStartIsWaitedForUntilTheCancel)
 
 TEST_F(Launcher, TheRegistryScansOutOfProcessAndReloadsWhatChanged)
 {
-    const Workstation workstation(m_folder);
+    const TestApplication workstation({m_folder.plugins()});
     addVST3File(m_folder.plugins(), QStringLiteral("Comp"));
     addVST2File(m_folder.plugins(), QStringLiteral("Echo")); // a catalogue of nothing is written every time
     PluginHost registry;
@@ -181,7 +161,7 @@ TEST_F(Launcher, TheRegistryScansOutOfProcessAndReloadsWhatChanged)
 
 TEST_F(Launcher, TheRegistryEndsItsLauncherWhenItGoes)
 {
-    const Workstation workstation(m_folder);
+    const TestApplication workstation({m_folder.plugins()});
     addVST3File(m_folder.plugins(), QStringLiteral("Hang"), "class Hang\nfault initialize hang\n");
     QElapsedTimer time;
     {

@@ -3,7 +3,6 @@
 // line:
 //   marker=NAME   writes a crash marker of VST 2 (NAME has its ending)
 //   clear         deletes all markers first
-//   catalogue     changes the VST 2 catalogue
 //   hang, fault, exit=N   how it ends (exit=0 without any)
 #include <chrono>
 #include <cstdlib>
@@ -42,8 +41,6 @@ void carryOut(const std::string &word, const fs::path &effects)
     const std::string value = word.substr(word.find('=') + 1);
     if (word == "clear")
         clearMarkers(effects);
-    else if (word == "catalogue")
-        std::ofstream(effects / "FXConfiguration.xml", std::ios::app) << "<!-- -->";
     else if (word == "fault")
         __builtin_trap(); // abort is no crash on Windows
     else if (word == "hang")

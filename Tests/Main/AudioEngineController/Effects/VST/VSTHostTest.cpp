@@ -2,11 +2,10 @@
 
 #include "Core/BaseLib/DebugLog.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
-#include "Main/VLib/ApplicationContext.h"
 #include "Main/VLib/SimpleGUI.h"
-#include "Main/VLib/VProgressDisplay.h"
-#include "Main/VLib/VUI.h"
 #include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/NotingUI.h"
+#include "Tests/Support/TestApplication.h"
 #include "Tests/Support/TestFolder.h"
 #include "Tests/Support/VST2Fixture.h"
 
@@ -15,60 +14,6 @@
 #include <gtest/gtest.h>
 
 namespace {
-
-class TestApplication : public IQuillonInterface {
-public:
-    explicit TestApplication(const QString &folder)
-        : m_folder(folder)
-    {
-        ApplicationContext::instance().quillonInterface = this;
-    }
-    ~TestApplication() override { ApplicationContext::instance().quillonInterface = nullptr; }
-    QString dataFolder() const override { return QString(); }
-    QStringList scanFolders() const override { return {m_folder}; }
-    bool isScanner() const override { return true; }
-    void pluginListsChanged() override {}
-
-private:
-    QString m_folder;
-};
-
-/// Notes what a user gets to see of a scan, one line for each change.
-class NotingUI : public VUI {
-public:
-    void showStatus(const QString &text) override { seen << text; }
-    void showStatus(int level, const QString &text) override { seen << QString::number(level) + ' ' + text; }
-    void notify(quint32 value) override { seen << "notified " + QString::number(value, 16); }
-    void requestShow() override {}
-    std::shared_ptr<VProgressDisplay> createProgressDisplay() override
-    {
-        return std::make_shared<Display>(*this);
-    }
-
-    QStringList seen;
-
-private:
-    class Display : public VProgressDisplay {
-    public:
-        explicit Display(NotingUI &ui)
-            : VProgressDisplay(0)
-            , m_ui(ui)
-        {}
-        void begin(const QString &, int) override {}
-        void finish() override {}
-        void setValue(int value) override { m_ui.seen << "value " + QString::number(value); }
-        void step(int) override {}
-        void setRange(int total, const QString &text) override
-        {
-            m_ui.seen << "range " + QString::number(total) + ' ' + text;
-        }
-        void setText(const QString &) override {}
-        bool isCancelled() const override { return false; }
-
-    private:
-        NotingUI &m_ui;
-    };
-};
 
 class VSTHostTest : public testing::Test {
 protected:
@@ -91,16 +36,6 @@ protected:
 };
 
 } // namespace
-
-TEST_F(VSTHostTest, DefaultsHoldUntilSomethingIsSet)
-{
-    EXPECT_EQ(m_host.sampleRate(), 44100);
-    EXPECT_EQ(m_host.blockSize(), 256);
-    EXPECT_EQ(m_host.processLevel(), 1);
-    EXPECT_EQ(m_host.timeInfo(), nullptr);
-    EXPECT_FALSE(m_host.isIgnored(std::make_unique<VSTPlugin>(m_host).get()));
-    EXPECT_EQ(&VSTHost::instance(), &m_host);
-}
 
 TEST_F(VSTHostTest, LoadedPluginsAreLogged)
 {
@@ -189,15 +124,29 @@ TEST_F(VSTHostTest, AShellLeavesTheProgressToTheFilesAgain)
     addVST2File(m_folder.plugins(), QStringLiteral("a Shell"),
                 "child 11 A\nchild 12 B\nanswer entry null B\n");
     addVST2File(m_folder.plugins(), QStringLiteral("b Comp"));
-    const TestApplication application(m_folder.plugins());
+    const TestApplication application({m_folder.plugins()}, true);
     const auto ui = std::make_shared<NotingUI>();
     installVUI(ui);
     EXPECT_TRUE(m_host.Scan(true, true));
     installVUI(nullptr);
-    EXPECT_EQ(
-        ui->seen,
-        QStringList({"range 2 ", "value 0", "60000 Scanning: a Shell" + vst2Ending(),
-                     "range 2 Scanning WaveShell", "60000 Scanning: A", "notified fffffff", "value 1",
-                     "60000 Scanning: B", "notified fffffff", "value 2", "range 2 ", "value 0", "value 1",
-                     "60000 Scanning: b Comp" + vst2Ending(), "notified fffffff", "value 2"}));
+    EXPECT_EQ(ui->heard, QStringList({"range 2 ",
+                                      "value 0",
+                                      "60000 Scanning: a Shell" + vst2Ending(),
+                                      "show",
+                                      "range 2 Scanning WaveShell",
+                                      "60000 Scanning: A",
+                                      "show",
+                                      "notified fffffff",
+                                      "value 1",
+                                      "60000 Scanning: B",
+                                      "show",
+                                      "notified fffffff",
+                                      "value 2",
+                                      "range 2 ",
+                                      "value 0",
+                                      "value 1",
+                                      "60000 Scanning: b Comp" + vst2Ending(),
+                                      "show",
+                                      "notified fffffff",
+                                      "value 2"}));
 }

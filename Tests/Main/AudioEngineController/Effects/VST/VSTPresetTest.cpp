@@ -2,7 +2,7 @@
 
 #include "Core/BaseLib/DebugLog.h"
 #include "Main/VLib/SimpleGUI.h"
-#include "Main/VLib/VUI.h"
+#include "Tests/Support/NotingUI.h"
 
 #include <QtEndian>
 
@@ -36,17 +36,6 @@ QByteArray changed(QByteArray bytes, int at, char byte)
     bytes[at] = byte;
     return bytes;
 }
-
-class StatusUI : public VUI {
-public:
-    void showStatus(const QString &text) override { seen << text; }
-    void showStatus(int level, const QString &text) override { seen << QString::number(level) + ' ' + text; }
-    void notify(quint32) override {}
-    void requestShow() override {}
-    std::shared_ptr<VProgressDisplay> createProgressDisplay() override { return nullptr; }
-
-    QStringList seen;
-};
 
 } // namespace
 
@@ -177,7 +166,7 @@ TEST_F(VSTPreset, WhatDoesNotBelongIsRefusedWithAReason)
 
 TEST_F(VSTPreset, TheUserIsToldAndSoIsTheLogOfAFailure)
 {
-    const auto ui = std::make_shared<StatusUI>();
+    const auto ui = std::make_shared<NotingUI>();
     installVUI(ui);
     const struct {
         const char *name;
@@ -192,9 +181,9 @@ TEST_F(VSTPreset, TheUserIsToldAndSoIsTheLogOfAFailure)
         EXPECT_TRUE(plugin->StorePreset(preset));
         EXPECT_FALSE(plugin->LoadPreset(preset)) << row.name;
         EXPECT_TRUE(m_log.contains(QStringLiteral("VST Plugin exception in ") + name));
-        EXPECT_EQ(ui->seen, QStringList({"60000 Storing " + name + " Preset", "1000 ",
-                                         "60000 Loading " + name + " Preset", "1000 "}));
-        ui->seen.clear();
+        EXPECT_EQ(ui->heard, QStringList({"60000 Storing " + name + " Preset", "1000 ",
+                                          "60000 Loading " + name + " Preset", "1000 "}));
+        ui->heard.clear();
     }
     installVUI(nullptr);
 }

@@ -1,0 +1,25 @@
+#pragma once
+
+#include "Main/VLib/ApplicationContext.h"
+
+#include <atomic>
+
+/// Plays the application that the registry and its hosts ask, and counts what it is told.
+class TestApplication : public IQuillonInterface {
+public:
+    explicit TestApplication(const QStringList &scanFolders = {}, bool isScanner = false)
+        : folders(scanFolders)
+        , scanner(isScanner)
+    {
+        ApplicationContext::instance().quillonInterface = this;
+    }
+    ~TestApplication() override { ApplicationContext::instance().quillonInterface = nullptr; }
+    QString dataFolder() const override { return QString(); }
+    QStringList scanFolders() const override { return folders; }
+    bool isScanner() const override { return scanner; }
+    void pluginListsChanged() override { ++changes; }
+
+    QStringList folders;
+    bool scanner;
+    std::atomic<int> changes{0};
+};
