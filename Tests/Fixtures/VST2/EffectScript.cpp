@@ -113,13 +113,10 @@ bool takeEffectStatement(EffectScript &effect, const ScriptStatement &statement)
 ScriptedText readText(const ScriptStatement &statement, std::size_t index, std::size_t size)
 {
     ScriptedText text = {statement.word(index)};
-    const std::string manner = statement.optionalWord(index + 1);
-    if (!manner.empty() && manner != "unterminated")
-        statement.fail("not 'unterminated': '" + manner + "'");
     if (text.bytes.size() > size)
         statement.fail("longer than the host's buffer of " + std::to_string(size));
-    text.terminated = manner.empty() && text.bytes.size() < size;
-    statement.allowWords(index + 2);
+    text.terminated = text.bytes.size() < size;
+    statement.allowWords(index + 1);
     return text;
 }
 

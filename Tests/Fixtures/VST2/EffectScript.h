@@ -55,8 +55,8 @@ struct EffectScript {
 /// Takes a statement that describes an effect; false when its key is not one of those. Throws ScriptError.
 bool takeEffectStatement(EffectScript &effect, const ScriptStatement &statement);
 
-/// The text in a statement's word, and whether "unterminated" follows. A text that fills a buffer of `size`
-/// bytes has no terminator; a longer one is an error. Throws ScriptError.
+/// The text in a statement's word. One that fills a buffer of `size` bytes has no terminator; a longer one is
+/// an error. Throws ScriptError.
 ScriptedText readText(const ScriptStatement &statement, std::size_t index, std::size_t size);
 /// A decimal number of any size, also "inf" and "nan". Throws ScriptError.
 float readFloat(const ScriptStatement &statement, std::size_t index);

@@ -1,6 +1,5 @@
 #pragma once
 
-#include "Tests/Fixtures/FixtureSubject.h"
 #include "Tests/Fixtures/VST2/EffectScript.h"
 
 /// One call of the host's callback that a script asks for.
@@ -8,25 +7,18 @@ struct HostCall {
     enum class Caller {
         SameThread,
         OtherThread, ///< one that is joined before the plug-in goes on
-        UntilClose,  ///< one that calls again and again until the effect is closed
-        UntilUnload  ///< one that calls again and again until the module is unloaded
+        UntilClose   ///< one that calls again and again until the effect is closed
     };
 
     std::string stage;
-    FixtureSubjectFilter subject;
     std::int32_t opcode = 0;
     std::int32_t index = 0;
     std::int32_t value = 0;
     float opt = 0;
-    std::optional<std::string> text; ///< handed over as a string
-    bool givesBuffer = false;        ///< hands over room for a text
-    bool withEffect = true;
     Caller caller = Caller::SameThread;
     int depth = 1; ///< how many of this thread's calls the host has active then, this one counted
 
-    /// Whether a thread makes the call again and again.
-    bool isKeptUp() const { return caller == Caller::UntilClose || caller == Caller::UntilUnload; }
-    /// Calls once; the result as one line of text, with what the host wrote into the buffer.
+    /// Calls once; the result as one line of text.
     std::string answer(audioMasterCallback host, AEffect *effect) const;
     /// How the trace names the call.
     std::string traceName() const { return "host-" + std::to_string(opcode); }

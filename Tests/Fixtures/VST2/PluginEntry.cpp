@@ -4,55 +4,30 @@
 #include "Tests/Fixtures/VST2/ScriptedEffect.h"
 
 #include <algorithm>
-#include <thread>
+#include <memory>
+#include <vector>
 
 namespace {
 
-/// What the module handed out and whom it belongs to, for the module's life.
-struct HandedOut {
-    std::vector<std::unique_ptr<ScriptedEffect>> effects;
-    audioMasterCallback host = nullptr;
-};
-
-HandedOut &handedOut()
+/// What the module handed out, for the module's life.
+std::vector<std::unique_ptr<ScriptedEffect>> &handedOut()
 {
-    static HandedOut all;
-    return all;
-}
-
-void askHostAtEnd(audioMasterCallback host)
-{
-    for (const HostCall &call : pluginScript().hostCalls) {
-        if (call.stage != "static-destructor")
-            continue;
-        const auto ask = [&call, host] {
-            pluginScript().stages.note(call.traceName(), {}, call.answer(host, nullptr));
-        };
-        if (call.caller == HostCall::Caller::OtherThread)
-            std::thread(ask).join();
-        else
-            ask();
-    }
+    static std::vector<std::unique_ptr<ScriptedEffect>> effects;
+    return effects;
 }
 
 /// Runs the script's first and last stage with the library's own start-up and shutdown code.
 struct ModuleLife {
     ModuleLife()
     {
-        // Made first, so that they are still there at the end.
-        handedOut();
-        unloadThreads();
+        handedOut(); // made first, so that they are still there at the end
         pluginScript().stages.reach("static-constructor");
     }
     ~ModuleLife()
     {
-        const auto open = std::count_if(handedOut().effects.begin(), handedOut().effects.end(),
+        const auto open = std::count_if(handedOut().begin(), handedOut().end(),
                                         [](const auto &effect) { return !effect->isClosed(); });
         pluginScript().stages.reach("static-destructor", {}, open ? std::to_string(open) + " open" : "");
-        if (handedOut().host)
-            askHostAtEnd(handedOut().host);
-        for (const auto &thread : unloadThreads())
-            thread->stop();
     }
 } moduleLife;
 
@@ -110,14 +85,13 @@ AEffect *enterPlugin(audioMasterCallback host, EntryPoint entryPoint)
 {
     if (!host)
         reportMisuse("the entry is called without a callback");
-    handedOut().host = host;
     std::optional<Request> request = readRequest(host);
     if (!request)
         return nullptr;
     pluginScript().stages.reach("entry", request->subject, request->detail);
     if (entryPoint == EntryPoint::SecondMain)
         renameForSecondMain(request->effect);
-    auto &effects = handedOut().effects;
+    auto &effects = handedOut();
     effects.push_back(std::make_unique<ScriptedEffect>(request->effect, request->subject, host));
     ScriptedEffect &made = *effects.back();
     made.askHost("entry");

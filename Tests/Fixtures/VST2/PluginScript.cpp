@@ -22,11 +22,8 @@ PluginScript::AfterChildren readAfterChildren(const ScriptStatement &statement)
 HostCall readKnownHostCall(const ScriptStatement &statement, const FixtureStages &stages)
 {
     HostCall call = readHostCall(statement);
-    // There is no callback before the entry point was called.
-    if (!stages.knows(call.stage) || call.stage == "static-constructor")
-        statement.fail("no host to call at '" + call.stage + "'");
-    if (call.stage == "static-destructor" && (call.depth > 1 || call.isKeptUp()))
-        statement.fail("no effect is left then");
+    if (!stages.knows(call.stage) || call.stage.rfind("static-", 0) == 0)
+        statement.fail("no effect to call from at '" + call.stage + "'");
     return call;
 }
 

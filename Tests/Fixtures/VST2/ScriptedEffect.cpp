@@ -251,7 +251,7 @@ ScriptedParameter *ScriptedEffect::parameter(int index)
 void ScriptedEffect::askHost(const std::string &stage)
 {
     for (const HostCall &call : pluginScript().hostCalls) {
-        if (call.stage == stage && call.subject.admits(m_subject))
+        if (call.stage == stage)
             carryOut(call);
     }
 }
@@ -267,10 +267,6 @@ void ScriptedEffect::carryOut(const HostCall &call)
     case HostCall::Caller::UntilClose:
         askFrom(call);
         m_threads.push_back(std::make_unique<RepeatingThread>(callOnce));
-        return;
-    case HostCall::Caller::UntilUnload:
-        askFrom(call);
-        unloadThreads().push_back(std::make_unique<RepeatingThread>(callOnce));
         return;
     }
 }
@@ -302,10 +298,4 @@ VstIntPtr ScriptedEffect::answerIdle()
     if (call)
         askAtDepth(*call, depth);
     return pluginScript().result("edit-idle", m_subject, 0);
-}
-
-std::vector<std::unique_ptr<RepeatingThread>> &unloadThreads()
-{
-    static std::vector<std::unique_ptr<RepeatingThread>> threads;
-    return threads;
 }

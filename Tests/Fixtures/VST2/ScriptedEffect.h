@@ -51,6 +51,3 @@ private:
     std::size_t m_listed = 0; ///< children listed since the enumeration began
     std::vector<std::unique_ptr<RepeatingThread>> m_threads;
 };
-
-/// The threads that call the host until the module is unloaded.
-std::vector<std::unique_ptr<RepeatingThread>> &unloadThreads();

@@ -1,7 +1,5 @@
 #include "Tests/Fixtures/VST3/ScriptedClassReader.h"
 
-#include "Tests/Fixtures/VST3/HostQuestions.h"
-
 using namespace Steinberg;
 
 namespace {
@@ -105,8 +103,8 @@ bool takeClassStatement(ScriptedClass &described, const ScriptStatement &stateme
         described.inputs = readBuses(statement);
     else if (statement.key == "outputs")
         described.outputs = readBuses(statement);
-    else if (statement.key == "ask-host" && isHostQuestion(statement.word(0)))
-        described.questions = statement.words;
+    else if (statement.key == "ask-host-name")
+        described.asksHostName = true;
     else
         return false;
     return true;

@@ -1,7 +1,7 @@
 #include "Tests/Fixtures/VST3/ScriptedComponent.h"
 
 #include "Tests/Fixtures/FixtureMisuse.h"
-#include "Tests/Fixtures/VST3/HostQuestions.h"
+#include "Tests/Fixtures/VST3/HostName.h"
 
 #include <pluginterfaces/base/ibstream.h>
 
@@ -93,8 +93,8 @@ tresult ScriptedComponent::initialize(FUnknown *context)
     if (m_state == State::Initialized)
         reportMisuse("'" + m_class.name + "' was initialised twice");
     scriptedModule().stages.reach("initialize", m_class.name);
-    for (const std::string &question : m_class.questions)
-        scriptedModule().stages.note("host-" + question, m_class.name, askHost(question, context));
+    if (m_class.asksHostName)
+        scriptedModule().stages.note("host-name", m_class.name, hostName(context));
     const tresult result = scriptedModule().result("initialize", m_class.name);
     m_state = result == kResultOk ? State::Initialized : State::Refused;
     return result;

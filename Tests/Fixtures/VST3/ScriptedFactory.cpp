@@ -122,8 +122,8 @@ tresult ScriptedFactory::getFactoryInfo(PFactoryInfo *info)
     if (result != kResultOk)
         return result;
     fill(info->vendor, module.vendor);
-    fill(info->url, module.url);
-    fill(info->email, module.email);
+    fill(info->url, {});
+    fill(info->email, {});
     info->flags = PFactoryInfo::kUnicode;
     return kResultOk;
 }

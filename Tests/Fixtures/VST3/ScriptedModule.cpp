@@ -47,10 +47,6 @@ bool takeFactoryStatement(ScriptedModule &module, const ScriptStatement &stateme
             statement.fail("a generation is 0 to 3");
     } else if (statement.key == "factory-vendor")
         module.vendor = statement.word(0);
-    else if (statement.key == "factory-url")
-        module.url = statement.word(0);
-    else if (statement.key == "factory-email")
-        module.email = statement.word(0);
     else
         return false;
     statement.allowWords(1);

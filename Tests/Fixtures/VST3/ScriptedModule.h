@@ -30,8 +30,8 @@ struct ScriptedClass {
         statedInputs; ///< the count of buses that is claimed, where it is not the true one
     std::optional<std::int32_t> statedOutputs;
     std::string controller; ///< "self", or the name of the class that is the edit controller; empty: none
-    std::optional<std::string> state;   ///< what its instances give as their state, first
-    std::vector<std::string> questions; ///< what the class asks the host when it is initialised
+    std::optional<std::string> state; ///< what its instances give as their state, first
+    bool asksHostName = false;        ///< when it is initialised
 };
 
 /// All that the script beside the module says.
@@ -39,8 +39,6 @@ struct ScriptedModule {
     ScriptedModule();
 
     std::string vendor = "Fixture Works";
-    std::string url;
-    std::string email;
     int generation = 3; ///< the highest IPluginFactory interface that is answered; 0: none
     std::vector<ScriptedClass> classes;
     FixtureStages stages;
