@@ -69,11 +69,6 @@ TEST(FaultGuard, ATranslatedCallLetsFaultsOutToTheGuardAround)
     EXPECT_EQ(callTranslated([] { return 17; }), 17);
 }
 
-TEST(FaultGuard, ResultsComeBack)
-{
-    EXPECT_EQ(callGuarded([] { return 17; }), 17);
-}
-
 TEST(FaultGuardDeathTest, OutsideAGuardTheProcessDies)
 {
     const auto die = [] {

@@ -60,21 +60,6 @@ TEST(XMLDocument, RefusesWhatIsNotWellFormed)
     }
 }
 
-TEST(XMLDocument, LoadSaysWhyAFileCannotBeRead)
-{
-    const EmptyFolder folder;
-    const QString good = folder.write("音.xml"_q, effectNamed("Fuzz"));
-    XMLDocument document;
-    for (const QString &path : {folder.path("none.xml"_q), folder.path(), QString()}) {
-        ASSERT_TRUE(document.load(good));
-        EXPECT_EQ(document.error(), QString());
-        EXPECT_EQ(nameIn(document), "Fuzz"_q);
-        EXPECT_FALSE(document.load(path)) << path.toStdString();
-        EXPECT_FALSE(document.error().isEmpty()) << path.toStdString();
-        EXPECT_FALSE(document.root("Effects")) << path.toStdString();
-    }
-}
-
 TEST(XMLDocument, FindsElementsInOrderAndAttributes)
 {
     XMLDocument document;

@@ -25,16 +25,6 @@ QString logAfterScan(std::function<void(const QString &)> scanRun)
 
 } // namespace
 
-TEST(UiFxProbeScan, GetsTheDataFolder)
-{
-    QString folder;
-    {
-        const UiFxProbe dialog(QString::fromUtf8("C:/Daten/ü"),
-                               [&folder](const QString &given) { folder = given; });
-    }
-    EXPECT_EQ(folder, QString::fromUtf8("C:/Daten/ü"));
-}
-
 TEST(UiFxProbeScan, IsCancelledWhenTheWindowGoes)
 {
     bool over = false;
@@ -87,15 +77,6 @@ TEST(UiFxProbeScan, NobodyReachesAWindowThatIsGone)
     ui->requestShow();
     progress->setRange(5, "hello?");
     EXPECT_TRUE(progress->isCancelled());
-}
-
-TEST(UiFxProbeScan, LaterInterfaceSurvivesTheWindow)
-{
-    auto first = std::make_unique<HeldScan>();
-    const HeldScan second;
-    const auto installed = installedVUI();
-    first.reset();
-    EXPECT_EQ(installedVUI(), installed);
 }
 
 // Meant for the thread sanitizer above all.

@@ -69,6 +69,9 @@ TEST(VST3SubCategories, WholeWordsBetweenBars)
         {"EQualizer|SubDelay", 0},
         {"Fx|Ambisonics|Network", 0x4010000},
         {"||EQ|", 0x10},
+        {"Fx|EQ|Dynamics", 0x18},
+        {"Fx|Analyzer", 0x1000000},
+        {"Fx|Reverberation", 0},
     };
     for (const auto &row : rows)
         EXPECT_EQ(CategoryTable::instance().categoryToMask(

@@ -109,22 +109,6 @@ TEST(CrashMarker, TextThatIsNoXmlIsReadByItsLines)
     EXPECT_EQ(back.subId, record.subId);
 }
 
-TEST(CrashMarker, EveryTruncationIsRead)
-{
-    const QTemporaryDir folder;
-    const QString path = folder.filePath(QStringLiteral("marker"));
-    ASSERT_TRUE(writeMarkerFile(vst2(), path, crashed("/s.dll", "t", "C", 5)));
-    QByteArray whole;
-    ASSERT_TRUE(readWholeFile(path, whole));
-    const CapturedLog log;
-    const QByteArray end = QByteArray("</CrashedPlugin>") + kLineEnd;
-    for (int length = 0; length < whole.size() - end.size(); ++length) {
-        ASSERT_TRUE(replaceFile(path, whole.left(length), Durability::Buffered));
-        EXPECT_EQ(readMarkerFile(vst2(), path).path, QString()) << length;
-    }
-    EXPECT_EQ(log.count(path), whole.size() - end.size());
-}
-
 TEST(CrashMarker, AbandoningDeletesWhatIsActiveAndOnlyThen)
 {
     const QTemporaryDir folder;

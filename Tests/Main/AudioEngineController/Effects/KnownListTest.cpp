@@ -45,16 +45,6 @@ const QString kThere = QStringLiteral("/there/X.vst3");
 
 } // namespace
 
-TEST(KnownList, FirstOfTheSameFileNameAndIdentifierWins)
-{
-    KnownList list;
-    EXPECT_TRUE(list.file(known(kHere, "1")));
-    EXPECT_FALSE(list.file(known(kThere, "1")));
-    EXPECT_TRUE(list.file(known(kHere, "2")));
-    EXPECT_TRUE(list.file(known(QStringLiteral("/here/Y.vst3"), "1")));
-    EXPECT_EQ(list.size(), 3u);
-}
-
 TEST(KnownList, WhichRecordSpeaksForAFile)
 {
     const struct {
@@ -86,15 +76,6 @@ TEST(KnownList, WhichRecordSpeaksForAFile)
             list.file(record);
         EXPECT_EQ(idsOf(list.recordsOfFileName(kHere)), row.order) << row.name;
     }
-}
-
-TEST(KnownList, RecordsOfAPathLeaveOutOtherPaths)
-{
-    KnownList list;
-    list.file(known(kThere, "1"));
-    list.file(known(kHere, "2"));
-    EXPECT_EQ(idsOf(list.recordsOfPath(kHere)), QStringList("2"));
-    EXPECT_TRUE(list.recordsOfPath(QStringLiteral("/else/X.vst3")).empty());
 }
 
 TEST(KnownList, WhatACrashMarkerAppliesTo)
@@ -150,16 +131,6 @@ TEST(KnownList, WhatACrashMarkerAppliesTo)
         }
         EXPECT_EQ(disabled, row.disabled) << row.name;
     }
-}
-
-TEST(KnownList, ALaterMarkerOfTheSameFileOverridesTheEarlier)
-{
-    KnownList list;
-    list.file(known(kHere, "a"));
-    list.file(known(kHere, "b"));
-    list.applyCrash(marker(kHere, "One")).id = QStringLiteral("One");
-    list.applyCrash(marker(kHere, "Two")).id = QStringLiteral("Two");
-    EXPECT_EQ(idsOf(list.recordsOfPath(kHere)), QStringList({"Two", "b"}));
 }
 
 TEST(KnownList, IdentifierHeldByAnother)

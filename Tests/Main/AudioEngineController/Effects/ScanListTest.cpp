@@ -46,18 +46,3 @@ TEST(ScanList, WrittenAndReadBack)
                                                        "</Scan>\n"));
     EXPECT_EQ(ReadScanList(path), folders);
 }
-
-TEST(ScanList, UnusableFilesGiveAnEmptyListAndALogLine)
-{
-    const QTemporaryDir folder;
-    for (const char *text : {"", "no xml", "<Scan><Path>/a</Path>"}) {
-        const QString path = folder.filePath(QStringLiteral("FXScan.xml"));
-        ASSERT_TRUE(replaceFile(path, text, Durability::Buffered));
-        const CapturedLog log;
-        EXPECT_TRUE(ReadScanList(path).isEmpty()) << text;
-        EXPECT_TRUE(log.contains(path)) << text;
-    }
-    ASSERT_TRUE(
-        replaceFile(folder.filePath(QStringLiteral("Other.xml")), "<Effects/>", Durability::Buffered));
-    EXPECT_TRUE(ReadScanList(folder.filePath(QStringLiteral("Other.xml"))).isEmpty());
-}
