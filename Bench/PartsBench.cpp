@@ -7,7 +7,6 @@
 #include "Main/AudioEngineController/Effects/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/KnownList.h"
-#include "Main/AudioEngineController/Effects/PluginIdentifier.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Tests/Core/BaseLib/PeBuilder.h"
 
@@ -83,14 +82,6 @@ void catalogueWrite(benchmark::State &state)
             replaceFile(path, renderCatalogue(vst3CatalogueFormat(), places), Durability::Buffered));
 }
 BENCHMARK(catalogueWrite)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oN);
-
-void recordRender(benchmark::State &state)
-{
-    const EffectRecord record = recordOf(1);
-    while (state.KeepRunning())
-        benchmark::DoNotOptimize(renderRecord(vst3CatalogueFormat(), record));
-}
-BENCHMARK(recordRender);
 
 /// A file replaced as a whole, with as many bytes.
 void fileReplace(benchmark::State &state)
@@ -171,22 +162,6 @@ void knownLookUp(benchmark::State &state)
         benchmark::DoNotOptimize(known.lookUp(path));
 }
 BENCHMARK(knownLookUp)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oLogN);
-
-void nameFromPath(benchmark::State &state)
-{
-    EffectRecord record = recordOf(1);
-    while (state.KeepRunning())
-        benchmark::DoNotOptimize(NameFromPath(record));
-}
-BENCHMARK(nameFromPath);
-
-void identifierParse(benchmark::State &state)
-{
-    const QString identifier = QStringLiteral("vst3:00112233445566778899AABBCCDDEEFF");
-    while (state.KeepRunning())
-        benchmark::DoNotOptimize(formatOfPrefix(prefixOf(identifier)));
-}
-BENCHMARK(identifierParse);
 
 } // namespace
 
