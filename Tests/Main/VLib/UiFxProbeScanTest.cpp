@@ -1,6 +1,7 @@
 #include "Tests/Main/VLib/HeldScan.h"
 
 #include "Main/VLib/VUI.h"
+#include "Tests/Fixtures/FixturePlatform.h"
 #include "Tests/Support/CapturedLog.h"
 
 #include <gtest/gtest.h>
@@ -60,6 +61,11 @@ TEST(UiFxProbeScan, EndsWhateverItThrows)
               "The scan ended with an exception: 100* broken");
     EXPECT_EQ(logAfterScan([](const QString &) { throw 5; }), "The scan ended with an unknown exception");
     EXPECT_EQ(logAfterScan(nullptr), "The scan ended with an exception: bad_function_call");
+}
+
+TEST(UiFxProbeScan, EndsWithItsThreadThatAPluginEnds)
+{
+    EXPECT_EQ(logAfterScan([](const QString &) { endThread(); }), "The scan's thread was ended by a plug-in");
 }
 
 TEST(UiFxProbeScan, NobodyReachesAWindowThatIsGone)
