@@ -164,6 +164,8 @@ TEST(BinaryExports, WhatIsDamagedIsLeftToTheLoader)
          "both"},
         {"no look-up table", [](Library &l) { l.dropEntry(DT_GNU_HASH); }, kUnknown},
         {"no buckets", [](Library &l) { l.at<quint32>(l.dynamic(DT_GNU_HASH).d_un.d_val) = 0; }, kUnknown},
+        {"no buckets in the older table",
+         [](Library &l) { l.at<quint32>(l.dynamic(DT_HASH).d_un.d_val) = 0; }, kUnknown, "sysv"},
         {"all buckets there can be", [](Library &l) { l.at<quint32>(l.dynamic(DT_HASH).d_un.d_val) = ~0U; },
          kUnknown, "sysv"},
         {"name outside of the names", [](Library &l) { l.symbol().st_name = ~0U; }, kUnknown},

@@ -113,6 +113,17 @@ TEST(CatalogueText, NoElementIsLeftOutForAnEmptyValue)
         EXPECT_TRUE(text.contains(element)) << element;
 }
 
+TEST_F(CatalogueReading, WhatWasWrittenComesBack)
+{
+    EffectRecord record = sampleRecord();
+    record.subName = QStringLiteral(" ");
+    record.subId = 0x80000001u;
+    for (const CatalogueFormat *format : {&vst3CatalogueFormat(), &vstCatalogueFormat()}) {
+        const QByteArray written = wholeFile(*format, {record});
+        EXPECT_EQ(wholeFile(*format, read(*format, written).records), written);
+    }
+}
+
 TEST_F(CatalogueReading, AbsentElementsKeepTheirDefaults)
 {
     const CatalogueContents contents = read(

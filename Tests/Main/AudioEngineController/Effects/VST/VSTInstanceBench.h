@@ -14,12 +14,16 @@ class VSTInstanceBench : public testing::Test {
 protected:
     static constexpr AudioSettings kSettings = {48000, 64};
 
+    /// The script's first statement.
+    QByteArray tracing() const
+    {
+        return "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n";
+    }
     /// A plug-in of that script, loaded; the calls of loading are forgotten.
     std::unique_ptr<VSTPlugin> loaded(const QByteArray &script, const char *file = "Comp")
     {
-        const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n";
         EffectRecord record;
-        record.path = addVST2File(m_folder.plugins(), QString::fromUtf8(file), traced + script);
+        record.path = addVST2File(m_folder.plugins(), QString::fromUtf8(file), tracing() + script);
         auto plugin = std::make_unique<VSTPlugin>(m_host);
         EXPECT_TRUE(plugin->load(record, VSTHostCallback, 0));
         takeTrace();

@@ -1,26 +1,18 @@
-#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 
 #include "Core/BaseLib/DebugLog.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
-#include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/TestFolder.h"
-#include "Tests/Support/VST2Fixture.h"
-
-#include <gtest/gtest.h>
 
 namespace {
 
 const char kInvalid[] = "VSTPlugin::Load - Invalid VST Plugin";
 const char kFailed[] = "VSTPlugin::Load - Failed to Load DLL: ";
 
-class VSTPluginTest : public testing::Test {
+class VSTPluginTest : public VSTInstanceBench {
 protected:
     QString add(const QByteArray &script = {}, const char *name = "Comp",
                 VST2Fixture fixture = VST2Fixture::Scripted) const
     {
-        const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n";
-        return addVST2File(m_folder.plugins(), QString::fromUtf8(name), traced + script, fixture);
+        return addVST2File(m_folder.plugins(), QString::fromUtf8(name), tracing() + script, fixture);
     }
     static bool load(VSTPlugin &plugin, const QString &path)
     {
@@ -42,17 +34,6 @@ protected:
         plugin.readInto(result);
         return result;
     }
-    /// The calls so far; they are forgotten then.
-    QStringList takeTrace() const
-    {
-        const QStringList lines = m_folder.lines(QStringLiteral("trace"));
-        m_folder.write(QStringLiteral("trace"), {});
-        return lines;
-    }
-
-    TestFolder m_folder;
-    const CapturedLog m_log;
-    VSTHost m_host;
 };
 
 /// What does not load, and what the log says of it.
@@ -137,19 +118,6 @@ TEST_F(VSTPluginTest, APathWithoutASlashGivesNoName)
     EXPECT_EQ(plugin.key(), QStringLiteral(":1000"));
 }
 
-TEST_F(VSTPluginTest, ReadsWhatTheCatalogueHolds)
-{
-    const EffectRecord read = probe("name Told\nvendor V\xFC\nid -2147483648\ninputs -2147483648\n"
-                                    "outputs 2147483647\nlatency -5\ncategory 77\n");
-    EXPECT_EQ(read.id, QStringLiteral("Told:-2147483648"));
-    EXPECT_EQ(read.vendor, QString::fromUtf8("V\xC3\xBC"));
-    EXPECT_EQ(read.width, 2147483647);
-    EXPECT_EQ(read.latency, -5);
-    EXPECT_EQ(read.vstCategory, 77);
-    EXPECT_EQ(probe("inputs 0\ncategory 10").vstCategory, 2) << "no inputs: an instrument, whatever it says";
-    EXPECT_EQ(probe("vendor \"\"").vendor, QString());
-}
-
 TEST_F(VSTPluginTest, TextsEndAtTheBuffer)
 {
     const QByteArray name(1024, 'n');
@@ -175,10 +143,10 @@ TEST_F(VSTPluginTest, Mode0ClosesAndUnloadsWhatWasHeld)
         takeTrace();
         EXPECT_TRUE(plugin.load(record(path, 12), VSTHostCallback, 0));
         EXPECT_EQ(takeTrace(),
-                  QStringList({"close A", "close Shell", "static-destructor", "static-constructor",
-                               "entry B: 12", "get-plug-category B", "get-effect-name B"}));
+                  QStringLiteral("close A; close Shell; static-destructor; static-constructor; entry B: 12; "
+                                 "get-plug-category B; get-effect-name B"));
     }
-    EXPECT_EQ(takeTrace(), QStringList({"close B", "static-destructor"}));
+    EXPECT_EQ(takeTrace(), QStringLiteral("close B; static-destructor"));
 }
 
 TEST_F(VSTPluginTest, AThrowingEntryClosesAndUnloadsToo)
@@ -189,7 +157,7 @@ TEST_F(VSTPluginTest, AThrowingEntryClosesAndUnloadsToo)
     EXPECT_TRUE(plugin.load(record(path, 11), VSTHostCallback, 1));
     takeTrace();
     EXPECT_FALSE(plugin.load(record(path, 12), VSTHostCallback, 1));
-    EXPECT_EQ(takeTrace(), QStringList({"entry B: 12", "close A", "close Shell", "static-destructor"}));
+    EXPECT_EQ(takeTrace(), QStringLiteral("entry B: 12; close A; close Shell; static-destructor"));
     EXPECT_TRUE(plugin.load(record(path, 11), VSTHostCallback, 1)) << "the module is loaded anew";
 }
 
