@@ -33,17 +33,6 @@ EffectRecord sampleRecord()
 /// Line ends as the platform's text files have them.
 QByteArray lines(QByteArray text) { return text.replace('\n', kLineEnd); }
 
-QByteArray wholeFile(const CatalogueFormat &format, const std::vector<EffectRecord> &records)
-{
-    std::vector<QByteArray> rendered;
-    for (const EffectRecord &record : records)
-        rendered.push_back(renderRecord(format, record));
-    std::vector<const QByteArray *> pointers;
-    for (const QByteArray &text : rendered)
-        pointers.push_back(&text);
-    return renderCatalogue(format, pointers);
-}
-
 class CatalogueReading : public ::testing::Test {
 protected:
     CatalogueContents read(const CatalogueFormat &format, const QByteArray &text)
@@ -64,7 +53,7 @@ TEST(CatalogueText, Vst2WithSubEffect)
     record.subId = 4294967295u;
     record.enabled = false;
     record.working = false;
-    EXPECT_EQ(wholeFile(vstCatalogueFormat(), {record}),
+    EXPECT_EQ(renderCatalogue(vstCatalogueFormat(), std::vector{record}),
               lines("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
                     "<Effects version=\"1.4\">\n"
                     "\t<Effect>\n"
@@ -94,7 +83,7 @@ TEST(CatalogueText, Vst2WithoutSubEffectHasNoBlockForIt)
 
 TEST(CatalogueText, BuiltInEffects)
 {
-    EXPECT_EQ(wholeFile(builtInEffectsFormat(), {sampleRecord()}),
+    EXPECT_EQ(renderCatalogue(builtInEffectsFormat(), std::vector{sampleRecord()}),
               lines("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
                     "<Effects version=\"1.2\">\n"
                     "\t<Effect>\n"
@@ -119,8 +108,8 @@ TEST_F(CatalogueReading, WhatWasWrittenComesBack)
     record.subName = QStringLiteral(" ");
     record.subId = 0x80000001u;
     for (const CatalogueFormat *format : {&vst3CatalogueFormat(), &vstCatalogueFormat()}) {
-        const QByteArray written = wholeFile(*format, {record});
-        EXPECT_EQ(wholeFile(*format, read(*format, written).records), written);
+        const QByteArray written = renderCatalogue(*format, std::vector{record});
+        EXPECT_EQ(renderCatalogue(*format, read(*format, written).records), written);
     }
 }
 
