@@ -1,4 +1,6 @@
-#include "Tests/Scanner/ScannerTest.h"
+#include "Tests/Scanner/DisturbedScan.h"
+
+#include <QElapsedTimer>
 
 namespace {
 
@@ -23,6 +25,26 @@ protected:
         EXPECT_EQ(listed(), kThree);
     }
 };
+
+/// Kills the scanner at moments spread over the scan. The number is the first moment's.
+class KillSweep : public DisturbedScan, public testing::WithParamInterface<int> {
+protected:
+    KillSweep()
+        : DisturbedScan("delay initialize 4\n")
+    {}
+    void killAt(qint64 milliseconds) const;
+};
+
+void KillSweep::killAt(qint64 milliseconds) const
+{
+    ScannerRun scanner(scannerProgram(), m_folder);
+    ASSERT_TRUE(scanner.start());
+    QElapsedTimer clock;
+    clock.start();
+    scanner.waitUntil([&] { return clock.elapsed() >= milliseconds; });
+    scanner.kill();
+    scanner.wait();
+}
 
 } // namespace
 
@@ -55,3 +77,23 @@ TEST_P(InterruptedRescan, AKilledScannerCostsNoMarks)
 
 INSTANTIATE_TEST_SUITE_P(At, InterruptedRescan, testing::Values(0, 1, 2),
                          [](const auto &row) { return kThree[row.param].toStdString(); });
+
+TEST_P(KillSweep, EveryMomentLeavesAWholeCatalogue)
+{
+    const QByteArray before = m_folder.catalogue();
+    QElapsedTimer clock;
+    clock.start();
+    EXPECT_TRUE(run().succeeded());
+    const qint64 whole = clock.elapsed();
+    for (int moment = GetParam(); moment < 40; moment += 4) {
+        m_folder.write(cataloguePath(), before);
+        killAt(whole * moment / 40);
+        SCOPED_TRACE(moment);
+        EXPECT_EQ(listed(), m_names);
+        const std::set<QString> named = namedByMarkers();
+        EXPECT_LE(named.size(), 1u);
+        expectSettled(named);
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(From, KillSweep, testing::Range(0, 4));

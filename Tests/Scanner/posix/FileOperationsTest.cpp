@@ -1,8 +1,6 @@
-#include "Tests/Scanner/ScannerTest.h"
+#include "Tests/Scanner/DisturbedScan.h"
 
 #include <QFileInfo>
-
-#include <set>
 
 namespace {
 
@@ -28,21 +26,14 @@ const Disturbance kDisturbances[] = {
 /// Every moment takes minutes; a part of them shows the kind of each.
 int stepOfSweep() { return qEnvironmentVariableIsSet("FXPROBE_WHOLE_SWEEP") ? 1 : 17; }
 
-/// Scans of a dozen listed favourites that changed since, one of them switched off.
-class TracedScan : public ScannerTest {
+class TracedScan : public DisturbedScan {
 protected:
-    TracedScan();
-    /// The modules that surviving markers name.
-    std::set<QString> namedByMarkers() const
+    TracedScan()
     {
-        std::set<QString> named;
-        for (const QString &marker : m_folder.markers())
-            named.insert(marker.section(QLatin1Char('.'), 0, 0));
-        return named;
+        for (const QString &name : m_names) // their own file operations are not to fail
+            addVST3File(m_folder.plugins(), name);
+        touchModules(m_names);
     }
-    /// Runs until no marker survives. Everything must be listed then, with the user's marks, and whatever was
-    /// not `named` must be as it was.
-    void expectSettled(const std::set<QString> &named) const;
     /// A scan under strace, which writes down the calls to `operations`.
     ScannerOutcome trace(const QStringList &options) const
     {
@@ -54,37 +45,7 @@ protected:
                                QStringLiteral("detect_leaks=0")); // not when traced
         return scanner.run();
     }
-
-    QStringList m_names;
 };
-
-TracedScan::TracedScan()
-{
-    for (int i = 0; i < 12; ++i)
-        m_names.append(QStringLiteral("M%1").arg(i, 2, 10, QLatin1Char('0')));
-    addListedModules(m_names);
-    editCatalogue("<Favourite>0<", "<Favourite>1<");
-    QByteArray text = m_folder.catalogue();
-    const int enabled = text.indexOf("<Enabled>1<", text.indexOf("/M03.vst3<"));
-    m_folder.write(cataloguePath(), text.replace(enabled, 11, "<Enabled>0<"));
-    for (const QString &name : m_names) // without a trace: their own file operations are not to fail
-        addVST3File(m_folder.plugins(), name);
-    touchModules(m_names);
-}
-
-void TracedScan::expectSettled(const std::set<QString> &named) const
-{
-    EXPECT_LE(runUntilSettled(scannerProgram(), m_folder).size(), 1 + named.size());
-    EXPECT_EQ(listed(), m_names);
-    for (const auto &[name, record] : records()) {
-        const bool isSwitchedOff = name == QStringLiteral("M03");
-        const bool mayBeOff = named.count(name) == 1;
-        EXPECT_TRUE(record.favourite) << qPrintable(name);
-        EXPECT_TRUE(record.working || mayBeOff) << qPrintable(name);
-        EXPECT_TRUE(record.enabled || mayBeOff || isSwitchedOff) << qPrintable(name);
-        EXPECT_FALSE(record.enabled && isSwitchedOff);
-    }
-}
 
 class FileOperations : public TracedScan, public testing::WithParamInterface<Disturbance> {
 protected:
