@@ -49,7 +49,6 @@ protected:
 };
 
 constexpr char kVst3File[] = "VST3Configuration.xml";
-constexpr char kVst2File[] = "FXConfiguration.xml";
 
 } // namespace
 
