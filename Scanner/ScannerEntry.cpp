@@ -61,6 +61,8 @@ void runDialog(QApplication &application, const QString &dataFolder, bool isDefa
         [](QSessionManager &) { TerminationSignal::raise(); }, Qt::DirectConnection);
     UiFxProbe dialog(dataFolder, scanEverything);
     dialog.run(application, isDefaultPath);
+    if (dialog.hasLostThread())
+        leaveProcess(0);
 }
 
 } // namespace

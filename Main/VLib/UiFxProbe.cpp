@@ -189,6 +189,7 @@ bool UiFxProbe::isScanOver()
     // In this order: a scan that returns is finished before its thread has ended.
     if (PluginThread::hasEndedAlone(m_worker) && !m_status->isFinished()) {
         DebugLog(kThreadEnded);
+        m_lostThread = true;
         m_status->setFinished();
     }
     return m_status->isFinished();

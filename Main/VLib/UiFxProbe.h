@@ -42,6 +42,9 @@ public:
     void requestClose();
     /// True once the scan is over. Any thread.
     bool isFinished() const;
+    /// True when a plug-in ended the scan's thread. On Windows it may hold the loader's lock for ever then,
+    /// and whoever starts or ends a thread waits for it. The dialog's thread only.
+    bool hasLostThread() const { return m_lostThread; }
 
     void done(int result) override;
 
@@ -81,6 +84,7 @@ private:
     QProgressBar *m_progressBar = nullptr;
     QString m_dataFolder;
     std::shared_ptr<StatusHandover> m_status;
+    bool m_lostThread = false;
     /// The window was closed or is going: it must not come back into sight.
     bool m_closed = false;
     std::unique_ptr<Installation> m_installation;
