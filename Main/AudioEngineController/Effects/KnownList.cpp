@@ -15,6 +15,16 @@ int rankOf(const EffectRecord &record)
     return record.subId != 0 && !record.enabled ? 2 : 1;
 }
 
+/// Of the records of a file name, those of the full path, which come first.
+KnownList::Records firstOfPath(KnownList::Records records, const QString &path)
+{
+    const auto others = std::find_if(records.begin(), records.end(), [&](const EffectRecord *record) {
+        return !isSamePath(record->path, path);
+    });
+    records.erase(others, records.end());
+    return records;
+}
+
 } // namespace
 
 bool KnownList::file(const EffectRecord &record)
@@ -24,7 +34,7 @@ bool KnownList::file(const EffectRecord &record)
     const bool isThere =
         std::any_of(first, last, [&](const auto &entry) { return entry.second.id == record.id; });
     if (!isThere)
-        m_records.emplace(fileName, record);
+        m_records.emplace_hint(last, fileName, record);
     return !isThere;
 }
 
@@ -62,20 +72,16 @@ KnownList::Records KnownList::recordsOfFileName(const QString &path) const
     const auto place = [&](const EffectRecord *record) {
         return std::make_tuple(!isSamePath(record->path, path), rankOf(*record));
     };
-    std::stable_sort(
-        records.begin(), records.end(),
-        [&](const EffectRecord *left, const EffectRecord *right) { return place(left) < place(right); });
+    if (records.size() > 1) // most have one, and sorting allocates
+        std::stable_sort(
+            records.begin(), records.end(),
+            [&](const EffectRecord *left, const EffectRecord *right) { return place(left) < place(right); });
     return records;
 }
 
 KnownList::Records KnownList::recordsOfPath(const QString &path) const
 {
-    Records records = recordsOfFileName(path);
-    const auto others = std::find_if(records.begin(), records.end(), [&](const EffectRecord *record) {
-        return !isSamePath(record->path, path);
-    });
-    records.erase(others, records.end());
-    return records;
+    return firstOfPath(recordsOfFileName(path), path);
 }
 
 KnownList::Knowledge KnownList::lookUp(const QString &path) const
@@ -84,7 +90,7 @@ KnownList::Knowledge KnownList::lookUp(const QString &path) const
     if (ofName.empty())
         return {KnownAs::Unknown, {}};
     if (isSamePath(ofName.front()->path, path))
-        return {KnownAs::Own, recordsOfPath(path)};
+        return {KnownAs::Own, firstOfPath(std::move(ofName), path)};
     Records moved;
     std::copy_if(ofName.begin(), ofName.end(), std::back_inserter(moved),
                  [](const EffectRecord *record) { return !QFile::exists(record->path); });
