@@ -1,11 +1,25 @@
 #include "Workstation/Terminal.h"
 
+#include "Workstation/TerminalStream.h"
+
 #include <QStringList>
 #include <QVector>
 
 #include <algorithm>
 
 namespace {
+
+/// Where results go.
+std::FILE *s_result = stdout;
+
+bool write(std::FILE *stream, const QString &text)
+{
+    if (const std::optional<bool> isWritten = TerminalStream::writeAsText(stream, text))
+        return *isWritten;
+    const QByteArray bytes = text.toUtf8();
+    const auto size = static_cast<std::size_t>(bytes.size());
+    return std::fwrite(bytes.constData(), 1, size, stream) == size && std::fflush(stream) == 0;
+}
 
 struct Range {
     uint first;
@@ -36,6 +50,18 @@ int columnsOf(uint character)
 }
 
 } // namespace
+
+bool Terminal::print(const QString &text) { return write(s_result, text); }
+
+bool Terminal::printError(const QString &text) { return write(stderr, text); }
+
+bool Terminal::outputIsTerminal() { return TerminalStream::isTerminal(s_result); }
+
+void Terminal::keepOutputForResult()
+{
+    if (std::FILE *stream = TerminalStream::takeOutput())
+        s_result = stream;
+}
 
 QString Terminal::harmless(const QString &text)
 {

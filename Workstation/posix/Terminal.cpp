@@ -1,39 +1,21 @@
 #include "Workstation/Terminal.h"
-
-#include <cstdio>
+#include "Workstation/TerminalStream.h"
 
 #include <fcntl.h>
 #include <sys/ioctl.h>
 #include <unistd.h>
 
-namespace {
+bool TerminalStream::isTerminal(std::FILE *stream) { return isatty(fileno(stream)) != 0; }
 
-/// Where results go.
-std::FILE *s_result = stdout;
+std::optional<bool> TerminalStream::writeAsText(std::FILE *, const QString &) { return std::nullopt; }
 
-bool write(std::FILE *stream, const QString &text)
-{
-    const QByteArray bytes = text.toUtf8();
-    const auto size = static_cast<std::size_t>(bytes.size());
-    return std::fwrite(bytes.constData(), 1, size, stream) == size && std::fflush(stream) == 0;
-}
-
-} // namespace
-
-bool Terminal::print(const QString &text) { return write(s_result, text); }
-
-bool Terminal::printError(const QString &text) { return write(stderr, text); }
-
-bool Terminal::outputIsTerminal() { return isatty(fileno(s_result)) != 0; }
-
-void Terminal::keepOutputForResult()
+std::FILE *TerminalStream::takeOutput()
 {
     const int copy = fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
-    std::FILE *result = copy < 0 ? nullptr : fdopen(copy, "w");
-    if (!result)
-        return;
-    s_result = result;
-    dup2(STDERR_FILENO, STDOUT_FILENO);
+    std::FILE *stream = copy < 0 ? nullptr : fdopen(copy, "w");
+    if (stream)
+        dup2(STDERR_FILENO, STDOUT_FILENO);
+    return stream;
 }
 
 bool Terminal::errorIsTerminal() { return isatty(STDERR_FILENO) != 0 && qgetenv("TERM") != "dumb"; }

@@ -1,6 +1,5 @@
 #include "Workstation/Terminal.h"
-
-#include <cstdio>
+#include "Workstation/TerminalStream.h"
 
 #include <io.h>
 
@@ -8,47 +7,35 @@
 
 namespace {
 
-/// Where results go.
-std::FILE *s_result = stdout;
-
 HANDLE handleOf(std::FILE *stream) { return reinterpret_cast<HANDLE>(_get_osfhandle(_fileno(stream))); }
 
-bool isConsole(std::FILE *stream)
+} // namespace
+
+bool TerminalStream::isTerminal(std::FILE *stream)
 {
     DWORD mode = 0;
     return GetConsoleMode(handleOf(stream), &mode) != 0;
 }
 
-/// A console takes UTF-16 as it is, whatever its code page; a pipe or a file gets UTF-8.
-bool write(std::FILE *stream, const QString &text)
+// As UTF-16, whatever the console's code page is.
+std::optional<bool> TerminalStream::writeAsText(std::FILE *stream, const QString &text)
 {
-    if (isConsole(stream)) {
-        DWORD written = 0;
-        return WriteConsoleW(handleOf(stream), text.utf16(), static_cast<DWORD>(text.size()), &written,
-                             nullptr) != 0;
-    }
-    const QByteArray bytes = text.toUtf8();
-    const auto size = static_cast<std::size_t>(bytes.size());
-    return std::fwrite(bytes.constData(), 1, size, stream) == size && std::fflush(stream) == 0;
+    if (!isTerminal(stream))
+        return std::nullopt;
+    DWORD written = 0;
+    return WriteConsoleW(handleOf(stream), text.utf16(), static_cast<DWORD>(text.size()), &written,
+                         nullptr) != 0;
 }
 
-} // namespace
-
-bool Terminal::print(const QString &text) { return write(s_result, text); }
-
-bool Terminal::printError(const QString &text) { return write(stderr, text); }
-
-bool Terminal::outputIsTerminal() { return isConsole(s_result); }
-
-void Terminal::keepOutputForResult()
+std::FILE *TerminalStream::takeOutput()
 {
     const int copy = _dup(_fileno(stdout));
-    std::FILE *result = copy < 0 ? nullptr : _fdopen(copy, "w");
-    if (!result)
-        return;
-    s_result = result;
-    _dup2(_fileno(stderr), _fileno(stdout));
-    SetStdHandle(STD_OUTPUT_HANDLE, GetStdHandle(STD_ERROR_HANDLE));
+    std::FILE *stream = copy < 0 ? nullptr : _fdopen(copy, "w");
+    if (stream) {
+        _dup2(_fileno(stderr), _fileno(stdout));
+        SetStdHandle(STD_OUTPUT_HANDLE, GetStdHandle(STD_ERROR_HANDLE));
+    }
+    return stream;
 }
 
 bool Terminal::errorIsTerminal()
