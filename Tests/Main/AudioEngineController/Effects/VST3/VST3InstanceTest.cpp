@@ -7,7 +7,7 @@
 
 namespace {
 
-const char kId[] = "00112233445566778899AABBCCDDEEFF";
+const QString kId = "00112233445566778899AABBCCDDEEFF";
 /// What follows the class of that identifier.
 const QByteArray kOwnState = "state \"a\\x00b\"\n";
 const QByteArray kPanel = "controller Panel\nclass Panel\ncategory \"Component Controller Class\"\n";
@@ -15,24 +15,24 @@ const QByteArray kPanel = "controller Panel\nclass Panel\ncategory \"Component C
 class VST3InstanceTest : public testing::Test {
 protected:
     /// The record of a class of the known identifier, of which the script tells the rest.
-    EffectRecord add(const QByteArray &script, const char *file = "Comp",
+    EffectRecord add(const QByteArray &script, const QString &file = "Comp",
                      VST3Fixture fixture = VST3Fixture::Scripted)
     {
         const QByteArray start =
-            "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\nclass Comp\nid " + kId + '\n';
+            "trace \"" + m_folder.path("trace").toUtf8() + "\"\nclass Comp\nid " + kId.toUtf8() + '\n';
         EffectRecord record;
-        record.path = addVST3File(m_folder.plugins(), QString::fromUtf8(file), start + script, fixture);
-        record.vendor = QStringLiteral("Own");
-        record.id = QString::fromLatin1(kId);
-        record.name = QStringLiteral("Listed");
+        record.path = addVST3File(m_folder.plugins(), file, start + script, fixture);
+        record.vendor = "Own";
+        record.id = kId;
+        record.name = "Listed";
         return record;
     }
     /// The calls since the last time.
     QString takeTrace() const
     {
-        const QStringList lines = m_folder.lines(QStringLiteral("trace"));
-        m_folder.write(QStringLiteral("trace"), {});
-        return lines.join(QStringLiteral("; "));
+        const QStringList lines = m_folder.lines("trace");
+        m_folder.write("trace", {});
+        return lines.join("; ");
     }
 
     TestFolder m_folder;
@@ -43,16 +43,15 @@ protected:
 
 TEST_F(VST3InstanceTest, IsOpenedAndClosedInOrder)
 {
-    const QString head = QStringLiteral("static-constructor; module-entry; get-factory; ");
-    const QString tail = QStringLiteral("; factory-release; module-exit; static-destructor");
-    const QString start = QStringLiteral("create-instance Comp; set-io-mode Comp: 1; initialize Comp; ");
+    const QString head = "static-constructor; module-entry; get-factory; ";
+    const QString tail = "; factory-release; module-exit; static-destructor";
+    const QString start = "create-instance Comp; set-io-mode Comp: 1; initialize Comp; ";
     const QString asked = "set-host-context; " + start + "controller-class-id Comp";
-    const QString end = QStringLiteral("terminate Comp; release Comp");
+    const QString end = "terminate Comp; release Comp";
     const struct {
         const char *name;
         QByteArray script;
-        QString opening;
-        QString closing;
+        QString opening, closing;
     } cases[] = {
         {"no controller", "", asked, end},
         {"older factory", "generation 2", start + "controller-class-id Comp", end},
@@ -87,46 +86,37 @@ TEST_F(VST3InstanceTest, IsOpenedAndClosedInOrder)
 TEST_F(VST3InstanceTest, FailuresHaveTheirLinesAndLeaveTheObjectUsable)
 {
     const struct {
-        const char *name;
         QByteArray script;
-        VST3Fixture fixture;
-        const char *id;
-        const char *line;
+        QString line;
+        QString id = kId;
+        VST3Fixture fixture = VST3Fixture::Scripted;
     } cases[] = {
-        {"no entry point", "", VST3Fixture::NoEntry, kId, "VST3 Exception: Failed to get factory function"},
-        {"does not start", "answer module-entry false", VST3Fixture::Scripted, kId,
-         "VST3 Exception: Failed to get load module:"},
-        {"null factory", "answer get-factory null", VST3Fixture::Scripted, kId,
-         "VST3 Exception: Failed to get factory function"},
-        {"factory without its interface", "generation 0", VST3Fixture::Scripted, kId,
-         "VST3 Exception: Failed to get factory function"},
-        {"class that is not there", "", VST3Fixture::Scripted, "FF112233445566778899AABBCCDDEEFF",
-         "The component could not be created"},
-        {"no identifier", "", VST3Fixture::Scripted, "Comp", "'Comp' is no class identifier"},
-        {"digits that are none", "", VST3Fixture::Scripted, "0x112233445566778899AABBCCDDEEFF",
-         "is no class identifier"},
-        {"success without an object", "answer create-instance null", VST3Fixture::Scripted, kId,
-         "The component could not be created: 0x00000000"},
-        {"does not initialise", "controller self\nanswer initialize false", VST3Fixture::Scripted, kId,
-         "The component could not be initialised: 0x00000001"},
-        {"throws", "fault initialize throw-std", VST3Fixture::Scripted, kId, "thrown by the fixture"},
-        {"throws when it is there", kPanel + "fault connect throw-std Panel", VST3Fixture::Scripted, kId,
-         "thrown by the fixture"}};
+        {"", "VST3 Exception: Failed to get factory function", kId, VST3Fixture::NoEntry},
+        {"answer module-entry false", "VST3 Exception: Failed to get load module:"},
+        {"answer get-factory null", "VST3 Exception: Failed to get factory function"},
+        {"generation 0", "VST3 Exception: Failed to get factory function"},
+        {"", "The component could not be created", "FF112233445566778899AABBCCDDEEFF"},
+        {"", "'Comp' is no class identifier", "Comp"},
+        {"", "is no class identifier", "0x112233445566778899AABBCCDDEEFF"},
+        {"answer create-instance null", "The component could not be created: 0x00000000"},
+        {"controller self\nanswer initialize false", "The component could not be initialised: 0x00000001"},
+        {"fault initialize throw-std", "thrown by the fixture"},
+        {kPanel + "fault connect throw-std Panel", "thrown by the fixture"}};
     for (const auto &row : cases) {
-        SCOPED_TRACE(row.name);
-        EffectRecord record = add(row.script, row.name, row.fixture);
-        record.id = QString::fromLatin1(row.id);
+        SCOPED_TRACE((row.script + ", " + row.line.toUtf8()).constData());
+        EffectRecord record = add(row.script, QString::number(&row - cases), row.fixture);
+        record.id = row.id;
         VST3Plugin plugin;
         EXPECT_FALSE(plugin.openClass(record));
-        EXPECT_TRUE(m_log.lines().last().contains(QLatin1String(row.line)));
+        EXPECT_TRUE(m_log.lines().last().contains(row.line));
         EXPECT_FALSE(plugin.isInstantiated() || plugin.open({48000, 64}));
         takeTrace();
         EXPECT_TRUE(plugin.openClass(add({})));
-        EXPECT_FALSE(takeTrace().contains(QStringLiteral("terminate"))) << "what failed is not called again";
+        EXPECT_FALSE(takeTrace().contains("terminate")) << "what failed is not called again";
     }
     VST3Plugin missing;
     EffectRecord gone = add({});
-    gone.path = m_folder.path(QStringLiteral("gone.vst3"));
+    gone.path = m_folder.path("gone.vst3");
     EXPECT_FALSE(missing.openClass(gone));
     EXPECT_TRUE(m_log.contains("VST3 Exception: Failed to get load module:" + gone.path));
 }
@@ -139,8 +129,7 @@ TEST_F(VST3InstanceTest, OtherExceptionsReachTheCaller)
         EXPECT_THROW(plugin.openClass(record), int);
         EXPECT_FALSE(plugin.isInstantiated());
     }
-    EXPECT_TRUE(
-        takeTrace().contains(QStringLiteral("terminate Panel; release Panel; terminate Comp; release Comp")));
+    EXPECT_TRUE(takeTrace().contains("terminate Panel; release Panel; terminate Comp; release Comp"));
 }
 
 TEST_F(VST3InstanceTest, TheRecordDescribesTheInstance)
@@ -150,14 +139,14 @@ TEST_F(VST3InstanceTest, TheRecordDescribesTheInstance)
     record.category = 8;
     VST3Plugin plugin;
     EXPECT_TRUE(plugin.openClass(record));
-    EXPECT_EQ(plugin.vendor(), QStringLiteral("Own"));
+    EXPECT_EQ(plugin.vendor(), "Own");
     EXPECT_EQ(plugin.record().inputs, 3);
     EXPECT_EQ(plugin.record().category, 8u);
-    EXPECT_EQ(plugin.identifier(), QStringLiteral("vst3:") + kId);
-    EXPECT_EQ(plugin.name(), QStringLiteral("Listed"));
+    EXPECT_EQ(plugin.identifier(), "vst3:" + kId);
+    EXPECT_EQ(plugin.name(), "Listed");
     record.vendor.clear();
     EXPECT_TRUE(plugin.openClass(record)) << "in place of the one before";
-    EXPECT_EQ(plugin.vendor(), QStringLiteral("Factory"));
+    EXPECT_EQ(plugin.vendor(), "Factory");
 }
 
 TEST_F(VST3InstanceTest, StateIsStoredAndLoaded)
@@ -168,12 +157,12 @@ TEST_F(VST3InstanceTest, StateIsStoredAndLoaded)
     ASSERT_TRUE(plugin.StorePreset(preset));
     const QByteArray stored = QByteArray("\1\0\0\0\3\0\0\0a\0b\5\0\0\0panel", 20);
     EXPECT_EQ(preset.data, stored);
-    EXPECT_EQ(preset.identifier, QStringLiteral("vst3:") + kId);
+    EXPECT_EQ(preset.identifier, "vst3:" + kId);
     preset.data[8] = 'c';
     takeTrace();
     EXPECT_TRUE(plugin.LoadPreset(preset));
-    EXPECT_EQ(takeTrace(), QStringLiteral("set-state Comp: c\\x00b; set-component-state Panel: c\\x00b; "
-                                          "set-state Panel: panel"));
+    EXPECT_EQ(takeTrace(), "set-state Comp: c\\x00b; set-component-state Panel: c\\x00b; "
+                           "set-state Panel: panel");
     PluginPreset again;
     EXPECT_TRUE(plugin.StorePreset(again));
     EXPECT_EQ(again.data, preset.data);
@@ -186,7 +175,7 @@ TEST_F(VST3InstanceTest, StateIsStoredAndLoaded)
     preset.data = stored + '\0';
     EXPECT_FALSE(plugin.LoadPreset(preset)) << "one byte more";
     preset.data = stored;
-    preset.identifier.replace(QLatin1Char('0'), QLatin1Char('1'));
+    preset.identifier.replace('0', '1');
     EXPECT_FALSE(plugin.LoadPreset(preset)) << "of another";
     EXPECT_EQ(takeTrace(), QString()) << "the plug-in heard of none";
 }

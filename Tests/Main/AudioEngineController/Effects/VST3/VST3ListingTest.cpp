@@ -2,13 +2,19 @@
 
 #include <QElapsedTimer>
 
-TEST_F(VST3ScanBench, AHealthyModuleGivesThisCatalogue)
+namespace {
+
+using VST3Listing = VST3ScanBench;
+
+} // namespace
+
+TEST_F(VST3Listing, AHealthyModuleGivesThisCatalogue)
 {
-    const QByteArray path = add(QStringLiteral("Comp x64"), "factory-vendor \"Fixture & Co\"\n"
-                                                            "class \"Comp, große\"\n"
-                                                            "id 00112233445566778899AABBCCDDEEFF\n"
-                                                            "subcategories Fx|Dynamics|Mastering\n"
-                                                            "inputs 2 1:aux\noutputs 6\n")
+    const QByteArray path = add("Comp x64", "factory-vendor \"Fixture & Co\"\n"
+                                            "class \"Comp, große\"\n"
+                                            "id 00112233445566778899AABBCCDDEEFF\n"
+                                            "subcategories Fx|Dynamics|Mastering\n"
+                                            "inputs 2 1:aux\noutputs 6\n")
                                 .toUtf8();
     scan();
     const QByteArray expected = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
@@ -33,7 +39,7 @@ TEST_F(VST3ScanBench, AHealthyModuleGivesThisCatalogue)
     EXPECT_EQ(m_folder.catalogue().replace("\r\n", "\n"), expected);
 }
 
-TEST_F(VST3ScanBench, TextsComeAsTheFactoryGivesThem)
+TEST_F(VST3Listing, TextsComeAsTheFactoryGivesThem)
 {
     const QByteArray longName(64, 'n');
     const struct {
@@ -42,7 +48,6 @@ TEST_F(VST3ScanBench, TextsComeAsTheFactoryGivesThem)
         QByteArray expected; // Name|Vendor|Categories
     } cases[] = {
         {"class vendor", "class cv\nvendor \"Class Maker\"\n", "cv|Class Maker|Fx"},
-        {"factory vendor", "factory-vendor FV\nclass fv\n", "fv|FV|Fx"},
         {"no vendor at all", "factory-vendor \"\"\nclass nv\n", "nv||Fx"},
         {"old factory", "generation 1\nclass old\nvendor Unasked\n", "old|Fixture Works|"},
         {"newer information refused", "class nir\nvendor V\nanswer class-info2 false\n",
@@ -56,67 +61,60 @@ TEST_F(VST3ScanBench, TextsComeAsTheFactoryGivesThem)
         {"invalid UTF-8", "class \"a\\xFF\\xC3(b\"\nvendor \"\\x80\"\n", "a\uFFFD\uFFFD(b|\uFFFD|Fx"},
         {"a character cut by the field", "class \"" + longName.left(63) + "é\"\n",
          longName.left(63) + "\uFFFD|Fixture Works|Fx"},
-        {"Japanese", "class リバーブ\nvendor 株式会社\n", "リバーブ|株式会社|Fx"},
-        {"emoji", "class \"🎛 Comp\"\n", "🎛 Comp|Fixture Works|Fx"},
+        {"beyond 16 bits", "class \"🎛 リバーブ\"\n", "🎛 リバーブ|Fixture Works|Fx"},
         {"blanks", "class \" a  b \"\n", " a  b |Fixture Works|Fx"},
         {"nothing but a blank", "class \" \"\n", " |Fixture Works|Fx"},
         {"empty name", "class \"\"\n", "|Fixture Works|Fx"},
-        {"ampersand", "class \"A & B\"\n", "A & B|Fixture Works|Fx"},
-        {"percent sign", "class \"%s%n 100%\"\n", "%s%n 100%|Fixture Works|Fx"},
+        {"signs", "class \"%s%n A & B\"\n", "%s%n A & B|Fixture Works|Fx"},
     };
     for (const auto &row : cases)
-        add(QString::fromLatin1(row.row), row.script);
+        add(row.row, row.script);
     scan();
     const QStringList found = records("Name Vendor Categories");
     EXPECT_EQ(found.size(), static_cast<int>(std::size(cases)));
     for (const auto &row : cases)
-        EXPECT_TRUE(found.contains(QString::fromUtf8(row.expected))) << row.row;
-    // What was written is also understood: nothing is loaded, nothing changes.
-    const QByteArray catalogue = m_folder.catalogue();
-    scan();
-    EXPECT_EQ(loaded(), QStringList());
-    EXPECT_EQ(m_folder.catalogue(), catalogue);
+        EXPECT_TRUE(found.contains(row.expected)) << row.row;
+    expectSettled();
 }
 
-TEST_F(VST3ScanBench, ClassesThatShareANameOrAnIdentifier)
+TEST_F(VST3Listing, ClassesThatShareANameOrAnIdentifier)
 {
-    add(QStringLiteral("A twice"),
+    add("A twice",
         "class A\nid 0000000000000000000000000000000A\n"
         "class A\nid 0000000000000000000000000000000B\nclass After\nid 0000000000000000000000000000000C\n");
-    add(QStringLiteral("B one id twice"), "class B1\nid 000000000000000000000000000000B1\n"
-                                          "class B2\nid 000000000000000000000000000000B1\n");
-    add(QStringLiteral("C name x64"), "class Shared\nid 000000000000000000000000000000C1\n");
-    add(QStringLiteral("D name x64"), "class Shared\nid 000000000000000000000000000000D1\n");
-    add(QStringLiteral("E id"), "class \"Held first\"\nid 000000000000000000000000000000E1\n");
-    add(QStringLiteral("F id"), "class \"Held second\"\nid 000000000000000000000000000000E1\n");
-    add(QStringLiteral("G zero id"), "class Zero\nid 00000000000000000000000000000000\n");
+    add("B one id twice", "class B1\nid 000000000000000000000000000000B1\n"
+                          "class B2\nid 000000000000000000000000000000B1\n");
+    add("C name x64", "class Shared\nid 000000000000000000000000000000C1\n");
+    add("D name x64", "class Shared\nid 000000000000000000000000000000D1\n");
+    add("E id", "class \"Held first\"\nid 000000000000000000000000000000E1\n");
+    add("F id", "class \"Held second\"\nid 000000000000000000000000000000E1\n");
+    add("G zero id", "class Zero\nid 00000000000000000000000000000000\n");
     scan();
     EXPECT_EQ(records("Name ID"),
               texts({"Zero|00000000000000000000000000000000", "A|0000000000000000000000000000000A",
                      "After|0000000000000000000000000000000C", "B1|000000000000000000000000000000B1",
                      "Shared|000000000000000000000000000000C1", "D name |000000000000000000000000000000D1",
                      "Held first|000000000000000000000000000000E1"}));
-    EXPECT_EQ(traceOf(QStringLiteral("A twice")).filter(QStringLiteral("create-instance")),
+    EXPECT_EQ(traceOf("A twice").filter("create-instance"),
               texts({"create-instance A", "create-instance After"}));
 }
 
-TEST_F(VST3ScanBench, OnlyAudioClassesAreAskedFurther)
+TEST_F(VST3Listing, OnlyAudioClassesAreAskedFurther)
 {
-    add(QStringLiteral("Mixed"), "class Controller\ncategory \"Component Controller Class\"\n"
-                                 "class Audio\n"
-                                 "class Longer\ncategory \"Audio Module Class 2\"\n"
-                                 "class Shorter\ncategory \"Audio Module\"\n"
-                                 "class Lower\ncategory \"audio module class\"\n"
-                                 "class Unterminated\ncategory \"Audio Module Class and 32 bytes!!\"\n"
-                                 "class Unnamed\ncategory \"\"\n"
-                                 "class Refusing\nanswer class-info false Refusing\n");
+    add("Mixed", "class Controller\ncategory \"Component Controller Class\"\n"
+                 "class Audio\n"
+                 "class Longer\ncategory \"Audio Module Class 2\"\n"
+                 "class Shorter\ncategory \"Audio Module\"\n"
+                 "class Lower\ncategory \"audio module class\"\n"
+                 "class Unterminated\ncategory \"Audio Module Class and 32 bytes!!\"\n"
+                 "class Unnamed\ncategory \"\"\n"
+                 "class Refusing\nanswer class-info false Refusing\n");
     scan();
     EXPECT_EQ(records("Name"), texts({"Audio"}));
-    EXPECT_EQ(traceOf(QStringLiteral("Mixed")).filter(QStringLiteral("class-info2")),
-              texts({"class-info2 Audio"}));
+    EXPECT_EQ(traceOf("Mixed").filter("class-info2"), texts({"class-info2 Audio"}));
 }
 
-TEST_F(VST3ScanBench, ClassesThatFailAreLeftOut)
+TEST_F(VST3Listing, ClassesThatFailAreLeftOut)
 {
     const char *answers[] = {"create-instance false",     "create-instance no-interface",
                              "create-instance null",      "create-instance 0x80004005",
@@ -124,7 +122,7 @@ TEST_F(VST3ScanBench, ClassesThatFailAreLeftOut)
     QByteArray script;
     for (const char *answer : answers)
         script += QByteArray("class \"") + answer + "\"\nanswer " + answer + " \"" + answer + "\"\n";
-    add(QStringLiteral("Some"), script + "class Last\nanswer terminate internal-error Last\n");
+    add("Some", script + "class Last\nanswer terminate internal-error Last\n");
     const ScannerOutcome outcome = scan();
     EXPECT_EQ(records("Name Working"), texts({"Last|1"}));
     for (const char *answer : answers)
@@ -133,49 +131,31 @@ TEST_F(VST3ScanBench, ClassesThatFailAreLeftOut)
             << answer;
 }
 
-TEST_F(VST3ScanBench, StatedClassCountsAreNotBelieved)
+TEST_F(VST3Listing, StatedClassCountsAreNotBelieved)
 {
     const QByteArray classes = "class \"%1 A\"\nclass \"%1 B\"\n";
-    const struct {
-        const char *name;
-        const char *count;
-        bool listsAll;
-    } cases[] = {{"Largest", "2147483647", true},
-                 {"Some more", "1000", true},
-                 {"Negative", "-1", false},
-                 {"Smallest", "-2147483648", false},
-                 {"None", "0", false}};
-    for (const auto &row : cases)
-        add(QString::fromLatin1(row.name), QByteArray("answer count-classes ") + row.count + "\n" +
-                                               QByteArray(classes).replace("%1", row.name));
+    for (const char *count : {"2147483647", "1000", "-1", "-2147483648", "0"})
+        add(count, QByteArray("answer count-classes ") + count + "\nclass \"" + count + " A\"\nclass \"" +
+                       count + " B\"\n");
     QElapsedTimer clock;
     clock.start();
     scan();
     EXPECT_LT(clock.elapsed(), 10000) << "counted what is not there";
-    QStringList found = sortedRecords("Name Working");
-    EXPECT_EQ(found, texts({"Largest A|1", "Largest B|1", "Negative|0", "None|0", "Smallest|0",
-                            "Some more A|1", "Some more B|1"}));
+    EXPECT_EQ(sortedRecords("Name Working"), texts({"-1|0", "-2147483648|0", "0|0", "1000 A|1", "1000 B|1",
+                                                    "2147483647 A|1", "2147483647 B|1"}));
 }
 
 // What the writer does not escape is kept as it is; of such a file the next run understands what crashed.
-TEST_F(VST3ScanBench, ANameThatBreaksTheCatalogueCausesANewProbe)
+TEST_F(VST3Listing, ANameThatBreaksTheCatalogueCausesANewProbe)
 {
-    add(QStringLiteral("Broken"), "class \"a < b\"\n");
-    add(QStringLiteral("Comp"));
-    add(QStringLiteral("Killer"), "class K\nfault initialize kill\n");
+    add("Broken", "class \"a < b\"\n");
+    add("Comp");
+    add("Killer", "class K\nfault initialize kill\n");
     scanUntilSettled();
     for (int run = 0; run < 2; ++run) {
         SCOPED_TRACE(run);
-        EXPECT_TRUE(scan().log.contains(QStringLiteral("Cannot use the catalogue")));
+        EXPECT_TRUE(scan().log.contains("Cannot use the catalogue"));
         EXPECT_EQ(loaded(), texts({"Broken", "Comp"}));
         EXPECT_EQ(sortedRecords("Name Working"), texts({"Comp|1", "Killer|0", "a < b|1"}));
     }
-}
-
-TEST_F(VST3ScanBench, TheHostHasItsName)
-{
-    add(QStringLiteral("Asking"), "class A\nask-host-name\n");
-    scan();
-    EXPECT_EQ(traceOf(QStringLiteral("Asking")).filter(QStringLiteral("host-")),
-              texts({"host-name A: Quillon"}));
 }

@@ -9,7 +9,7 @@
 class VST3ScanBench : public ScanBench {
 protected:
     VST3ScanBench()
-        : ScanBench("VST3Configuration.xml", QStringLiteral(".vst3"))
+        : ScanBench("VST3Configuration.xml", ".vst3")
     {}
 
     /// Puts a module into "Plugins", or into a folder below it when the name has one ("sub/Comp"). Without a

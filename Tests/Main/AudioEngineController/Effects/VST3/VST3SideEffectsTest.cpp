@@ -11,15 +11,13 @@ using VST3SideEffects = VST3ScanBench;
 
 TEST_F(VST3SideEffects, SpoiledStateSpoilsNoCatalogue)
 {
-    const QByteArray locale = QByteArray("initialize locale ") + kForeignLocale;
     const QByteArray effects[] = {"static-constructor umask 0777",
                                   "bus-info umask 0777",
                                   "factory-release umask 0777",
                                   "static-destructor umask 0777",
-                                  locale,
+                                  QByteArray("initialize locale ") + kForeignLocale,
                                   "initialize chdir /",
                                   "initialize rounding up",
-                                  "initialize rounding zero",
                                   "initialize signal segv",
                                   "initialize alarm 1",
                                   "initialize thread"};
@@ -27,17 +25,16 @@ TEST_F(VST3SideEffects, SpoiledStateSpoilsNoCatalogue)
     char place = 'a';
     for (const QByteArray &effect : effects) {
         const QByteArray name = QByteArray(1, place++) + " spoiler";
-        add(QString::fromLatin1(name), "effect " + effect + "\nclass \"" + name + "\"\n");
-        expected.append(QString::fromLatin1(name) + QStringLiteral("|2|1|1"));
+        add(name, "effect " + effect + "\nclass \"" + name + "\"\n");
+        expected.append(name + "|2|1|1");
     }
-    // Outlasts the alarm.
-    add(QStringLiteral("z healthy"), "class \"z healthy\"\ninputs 1234567\ndelay initialize 1100\n");
-    expected.append(QStringLiteral("z healthy|1234567|1|1"));
+    add("z", "class z\ninputs 1234567\ndelay initialize 1100\n"); // outlasts the alarm
+    expected.append("z|1234567|1|1");
     const ScannerOutcome outcome = scan();
     EXPECT_EQ(sortedRecords("Name Inputs Enabled Working"), expected);
-    EXPECT_EQ(QFile::permissions(m_folder.path(QStringLiteral("Effects/VST3Configuration.xml"))),
+    EXPECT_EQ(QFile::permissions(m_folder.path("Effects/VST3Configuration.xml")),
               QFile::permissions(m_folder.scanList()));
-    const QString sign = QStringLiteral(" left threads running and stays in memory");
-    EXPECT_TRUE(outcome.log.contains(modulePath(QLatin1Char(--place) + QStringLiteral(" spoiler")) + sign));
+    const QString sign = " left threads running and stays in memory";
+    EXPECT_TRUE(outcome.log.contains(modulePath("j spoiler") + sign));
     EXPECT_EQ(outcome.log.count(sign), 1);
 }

@@ -8,7 +8,7 @@ using VST3Exit = VST3ScanBench;
 
 TEST_F(VST3Exit, OfAPluginRunsNobodysExitHandlers)
 {
-    add(QStringLiteral("Comp"), "class Comp\nfault initialize exit\n");
+    add("Comp", "class Comp\nfault initialize exit\n");
     EXPECT_EQ(scanOnce().exitCode, 0);
-    EXPECT_EQ(traceOf(QStringLiteral("Comp")).last(), QStringLiteral("initialize Comp"));
+    EXPECT_EQ(traceOf("Comp").last(), "initialize Comp");
 }

@@ -4,39 +4,28 @@
 
 namespace {
 
-class VST3FileSystem : public VST3ScanBench {
-protected:
-    QString inPlugins(const char *name) const
-    {
-        return m_folder.plugins() + QLatin1Char('/') + QLatin1String(name);
-    }
-};
+using VST3FileSystem = VST3ScanBench;
 
 } // namespace
 
 TEST_F(VST3FileSystem, LinkedModulesAndFoldersAreFollowedWhereTheyAreListed)
 {
-    const QString elsewhere = m_folder.path(QStringLiteral("Elsewhere"));
-    const QByteArray traced = "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\" ";
-    m_folder.write(inPlugins("File.vst3.script"), traced + "File\nclass File\n"); // beside the link
-    const QString file = addVST3File(elsewhere, QStringLiteral("File"));
-    const QString bundle =
-        addVST3Bundle(elsewhere, QStringLiteral("Bundle"), traced + "Bundle\nclass Bundle\n");
-    ASSERT_TRUE(QFile::link(file, inPlugins("File.vst3")));
-    ASSERT_TRUE(QFile::link(bundle, inPlugins("Bundle.vst3")));
-    ASSERT_TRUE(QFile::link(inPlugins("gone.vst3"), inPlugins("Dangling.vst3")));
-    addVST3File(m_folder.path(QStringLiteral("Root")), QStringLiteral("Rooted"),
-                traced + "Rooted\nclass Rooted\n");
-    ASSERT_TRUE(
-        QFile::link(m_folder.path(QStringLiteral("Root")), m_folder.path(QStringLiteral("Linked root"))));
-    m_folder.writeScanList({m_folder.plugins(), m_folder.path(QStringLiteral("Linked root"))});
+    const QString elsewhere = m_folder.path("Elsewhere"), root = m_folder.path("Root");
+    m_folder.write(modulePath("File") + ".script",
+                   traceStatement("File") + "class File\n"); // beside the link
+    const QString file = addVST3File(elsewhere, "File");
+    ASSERT_TRUE(QFile::link(file, modulePath("File")));
+    ASSERT_TRUE(QFile::link(addVST3Bundle(elsewhere, "Bundle", traceStatement("Bundle") + "class Bundle\n"),
+                            modulePath("Bundle")));
+    ASSERT_TRUE(QFile::link(modulePath("gone"), modulePath("Dangling")));
+    addVST3File(root, "Rooted", traceStatement("Rooted") + "class Rooted\n");
+    ASSERT_TRUE(QFile::link(root, m_folder.path("Linked root")));
+    m_folder.writeScanList({m_folder.plugins(), m_folder.path("Linked root")});
     scan();
     EXPECT_EQ(loaded(), texts({"Bundle", "File", "Rooted"}));
     EXPECT_EQ(sortedRecords("Name"), texts({"Bundle", "File", "Rooted"}));
-    scan();
-    EXPECT_EQ(loaded(), QStringList());
-    // The time of a linked module is that of what it points to.
-    m_folder.setModified(file, QDateTime({2022, 3, 4}, {5, 6}));
+    expectSettled();
+    dateLater(file); // the time of a linked module is that of what it points to
     scan();
     EXPECT_EQ(loaded(), texts({"File"}));
 }
