@@ -23,7 +23,7 @@ protected:
     void list(const char *id, const QByteArray &script = {}, qint32 category = 1, bool enabled = true)
     {
         EffectRecord record;
-        record.name = record.id = QString::fromUtf8(id);
+        record.name = record.id = id;
         record.path = addVST2File(m_folder.plugins(), record.id, script);
         record.vstCategory = category;
         record.enabled = enabled;
@@ -37,18 +37,6 @@ protected:
 
 } // namespace
 
-TEST_F(VSTHostTest, LoadedPluginsAreLogged)
-{
-    list("First");
-    list("Second");
-    const auto first = m_host.loadByKey(QStringLiteral("First"));
-    const auto second = m_host.loadByKey(QStringLiteral("Second"));
-    ASSERT_TRUE(first && second);
-    const int before = m_log.lines().size();
-    m_host.logLoadedPlugins();
-    EXPECT_EQ(m_log.lines().mid(before), QStringList({"VSTs ", "vst: First: ", "vst: Second: "}));
-}
-
 TEST_F(VSTHostTest, LoadsByKey)
 {
     list("Comp");
@@ -57,7 +45,7 @@ TEST_F(VSTHostTest, LoadsByKey)
     list("Q10");
     list("ves Q10", "name \"Cut at the front\"");
     list("Broken", "answer entry null");
-    const QString retrying = QStringLiteral("Found an old Waves plug-in, retrying as:");
+    const QString retrying = "Found an old Waves plug-in, retrying as:";
     const struct {
         const char *key;
         const char *loaded; // name, or null
@@ -70,13 +58,10 @@ TEST_F(VSTHostTest, LoadsByKey)
                  {"Broken",
                   nullptr,
                   {"Found: Broken, trying to load",
-                   "VSTPlugin::Load - Failed to Load DLL: " +
-                       addVST2File(m_folder.plugins(), "Broken", "answer entry null"),
+                   "VSTPlugin::Load - Failed to Load DLL: " + m_folder.plugins() + "/Broken" + vst2Ending(),
                    "Broken, Didn't manage it"}},
-                 {"Waves Q10", "Q10", {retrying, "Found: Q10, trying to load"}},
                  {"Waves Waves Q10", "Q10", {retrying, retrying, "Found: Q10, trying to load"}},
                  {"Old Waves Q10", "Cut at the front", {retrying, "Found: ves Q10, trying to load"}},
-                 {"Waves Gone", nullptr, {retrying}},
                  {"Waves ", nullptr, {retrying}},
                  {"Waves", nullptr, {}},
                  {"waves Q10", nullptr, {}},
@@ -85,13 +70,15 @@ TEST_F(VSTHostTest, LoadsByKey)
     for (const auto &row : cases) {
         SCOPED_TRACE(row.key);
         const CapturedLog log;
-        const auto plugin = m_host.loadByKey(QString::fromUtf8(row.key));
+        const auto plugin = m_host.loadByKey(row.key);
         EXPECT_EQ(log.lines(), row.lines);
-        ASSERT_EQ(bool(plugin), row.loaded != nullptr);
-        if (plugin) {
-            EXPECT_EQ(plugin->name(), QString::fromUtf8(row.loaded));
-        }
+        EXPECT_EQ(plugin ? plugin->name() : QString(), QString(row.loaded));
     }
+    const auto first = m_host.loadByKey("Comp");
+    const auto second = m_host.loadByKey("Q10");
+    const CapturedLog log;
+    m_host.logLoadedPlugins();
+    EXPECT_EQ(log.lines(), QStringList({"VSTs ", "vst: Comp: ", "vst: Q10: "}));
 }
 
 TEST_F(VSTHostTest, ARefreshCleansNamesUp)
@@ -100,53 +87,38 @@ TEST_F(VSTHostTest, ARefreshCleansNamesUp)
         return QByteArray("<Effect><Path>/fx/") + file + ".so</Path><FileTime>t</FileTime><Name>" + name +
                "</Name><ID>" + file + "</ID></Effect>";
     };
-    m_folder.write(QStringLiteral("Effects/FXConfiguration.xml"),
-                   "<Effects version=\"1.4\">" + effect("A", "Comp [2.4]") +
-                       effect("B", "EQ [2.4] old [2.4]") + effect("C", "Gate[2.4]") + effect("D", "Comp") +
-                       "</Effects>");
-    const QByteArray before = m_folder.catalogue(QStringLiteral("FXConfiguration.xml"));
+    m_folder.write("Effects/FXConfiguration.xml", "<Effects version=\"1.4\">" + effect("A", "Comp [2.4]") +
+                                                      effect("B", "EQ [2.4] old [2.4]") +
+                                                      effect("C", "Gate[2.4]") + effect("D", "Comp") +
+                                                      "</Effects>");
+    const QByteArray before = m_folder.catalogue("FXConfiguration.xml");
     m_host.ReadCatalogue();
     EXPECT_TRUE(m_host.Scan(false, true));
     QStringList names;
     for (const EffectRecord &record : m_host.effects())
         names.append(record.name);
     EXPECT_EQ(names, QStringList({"Comp", "EQ", "Gate[2.4]", "D"})) << "no name twice";
-    const QByteArray written = m_folder.catalogue(QStringLiteral("FXConfiguration.xml"));
+    const QByteArray written = m_folder.catalogue("FXConfiguration.xml");
     EXPECT_NE(written, before);
     EXPECT_TRUE(written.contains("<Name>EQ</Name>"));
     m_host.ReadCatalogue();
     EXPECT_FALSE(m_host.Scan(false, true)) << "clean now";
-    EXPECT_EQ(m_folder.catalogue(QStringLiteral("FXConfiguration.xml")), written);
+    EXPECT_EQ(m_folder.catalogue("FXConfiguration.xml"), written);
 }
 
 TEST_F(VSTHostTest, AShellLeavesTheProgressToTheFilesAgain)
 {
-    addVST2File(m_folder.plugins(), QStringLiteral("a Shell"),
-                "child 11 A\nchild 12 B\nanswer entry null B\n");
-    addVST2File(m_folder.plugins(), QStringLiteral("b Comp"));
+    addVST2File(m_folder.plugins(), "a Shell", "child 11 A\nchild 12 B\nanswer entry null B\n");
+    addVST2File(m_folder.plugins(), "b Comp");
     const TestApplication application({m_folder.plugins()}, true);
     const auto ui = std::make_shared<NotingUI>();
     installVUI(ui);
     EXPECT_TRUE(m_host.Scan(true, true));
     installVUI(nullptr);
-    EXPECT_EQ(ui->heard, QStringList({"range 2 ",
-                                      "value 0",
-                                      "60000 Scanning: a Shell" + vst2Ending(),
-                                      "show",
-                                      "range 2 Scanning WaveShell",
-                                      "60000 Scanning: A",
-                                      "show",
-                                      "notified fffffff",
-                                      "value 1",
-                                      "60000 Scanning: B",
-                                      "show",
-                                      "notified fffffff",
-                                      "value 2",
-                                      "range 2 ",
-                                      "value 0",
-                                      "value 1",
-                                      "60000 Scanning: b Comp" + vst2Ending(),
-                                      "show",
-                                      "notified fffffff",
-                                      "value 2"}));
+    const QString ending = vst2Ending();
+    const QString child = "; show; notified fffffff; value ";
+    EXPECT_EQ(ui->heard.join("; "),
+              "range 2 ; value 0; 60000 Scanning: a Shell" + ending +
+                  "; show; range 2 Scanning WaveShell; 60000 Scanning: A" + child + "1; 60000 Scanning: B" +
+                  child + "2; range 2 ; value 0; value 1; 60000 Scanning: b Comp" + ending + child + '2');
 }

@@ -15,15 +15,12 @@ protected:
     static constexpr AudioSettings kSettings = {48000, 64};
 
     /// The script's first statement.
-    QByteArray tracing() const
-    {
-        return "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n";
-    }
+    QByteArray tracing() const { return "trace \"" + m_folder.path("trace").toUtf8() + "\"\n"; }
     /// A plug-in of that script, loaded; the calls of loading are forgotten.
     std::unique_ptr<VSTPlugin> loaded(const QByteArray &script, const char *file = "Comp")
     {
         EffectRecord record;
-        record.path = addVST2File(m_folder.plugins(), QString::fromUtf8(file), tracing() + script);
+        record.path = addVST2File(m_folder.plugins(), file, tracing() + script);
         auto plugin = std::make_unique<VSTPlugin>(m_host);
         EXPECT_TRUE(plugin->load(record, VSTHostCallback, 0));
         takeTrace();
@@ -32,9 +29,9 @@ protected:
     /// The calls since the last time, without the plug-in's name where it is "Comp".
     QString takeTrace() const
     {
-        const QStringList lines = m_folder.lines(QStringLiteral("trace"));
-        m_folder.write(QStringLiteral("trace"), {});
-        return lines.join(QStringLiteral("; ")).remove(QStringLiteral(" Comp"));
+        const QStringList lines = m_folder.lines("trace");
+        m_folder.write("trace", {});
+        return lines.join("; ").remove(" Comp");
     }
 
     TestFolder m_folder;

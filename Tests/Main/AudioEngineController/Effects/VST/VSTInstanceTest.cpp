@@ -6,10 +6,9 @@
 namespace {
 
 /// The calls of an opening.
-const QString kOpened =
-    QStringLiteral("open; opcode-10: 48000; opcode-11: 0 64; opcode-61: 0 2; opcode-51; opcode-51");
+const QString kOpened = "open; opcode-10: 48000; opcode-11: 0 64; opcode-61: 0 2; opcode-51; opcode-51";
 
-class VSTInstance : public VSTInstanceBench {};
+using VSTInstance = VSTInstanceBench;
 
 /// Notes what it hears; for a change of channels, what the plug-in was called before, and its state.
 class Listener : public IAudioPluginListener {
@@ -24,7 +23,7 @@ public:
                      .arg(plugin.channels().outputs.span())
                      .arg(plugin.isRunning() ? " running" : "");
     }
-    void displayChanged(AudioPlugin &) noexcept override { heard << QStringLiteral("display"); }
+    void displayChanged(AudioPlugin &) noexcept override { heard << "display"; }
     void parameterChanged(AudioPlugin &, quint32 id, double value) noexcept override
     {
         heard << QStringLiteral("parameter %1 %2").arg(id).arg(value);
@@ -70,12 +69,12 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
         {"idle asked for", [&] { return plugin->idle(), plugin->needsIdle(); }, true, "opcode-53"},
         {"other settings",
          [&] {
-             return plugin->setAudioSettings({44100, 32});
+             return plugin->setAudioSettings(AudioSettings{44100, 32});
          },
          true, "opcode-72; mains-changed; opcode-10: 44100; opcode-11: 0 32; mains-changed: 0 1; opcode-71"},
         {"no settings",
          [&] {
-             return plugin->setAudioSettings({0, 32});
+             return plugin->setAudioSettings(AudioSettings{0, 32});
          },
          false, ""},
         {"program", [&] { return plugin->setProgram(0); }, true, "opcode-67; opcode-2; opcode-68"},
@@ -90,8 +89,7 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
         {"idle", [&] { return plugin->idle(), true; }, true, "opcode-53; edit-idle"},
         {"close", [&] { return plugin->close(), true; }, true, "opcode-15; opcode-72; mains-changed"},
         {"open again", [&] { return plugin->open(kSettings) && plugin->start(); }, true,
-         "opcode-10: 48000; opcode-11: 0 64; opcode-61: 0 2; opcode-51; opcode-51; mains-changed: 0 1; "
-         "opcode-71"},
+         QString(kOpened).remove("open; ") + "; mains-changed: 0 1; opcode-71"},
         {"destroy", [&] { return plugin.reset(), true; }, true,
          "opcode-72; mains-changed; close; static-destructor"}};
     for (const auto &step : steps) {
@@ -142,8 +140,8 @@ TEST_F(VSTInstance, ChannelsAreRebuiltWhenThePluginSaysSo)
         Listener listener([this] { return takeTrace(); });
         plugin->addListener(&listener);
         EXPECT_TRUE(row.inBlock ? plugin->process(1) : plugin->setProgram(0));
-        EXPECT_EQ(takeTrace(), QString::fromUtf8(row.rest));
-        EXPECT_EQ(listener.heard.join(QStringLiteral(" / ")), QString::fromUtf8(row.heard));
+        EXPECT_EQ(takeTrace(), row.rest);
+        EXPECT_EQ(listener.heard.join(" / "), row.heard);
         plugin->removeListener(&listener);
     }
 }
@@ -157,8 +155,8 @@ TEST_F(VSTInstance, NothingIsRebuiltWhileItIsTornDown)
     takeTrace();
     plugin.reset();
     EXPECT_EQ(listener.heard, QStringList());
-    EXPECT_EQ(takeTrace(), QStringLiteral("opcode-72; host-13: 0; mains-changed; close; host-13: 0; "
-                                          "static-destructor"));
+    EXPECT_EQ(takeTrace(), "opcode-72; host-13: 0; mains-changed; close; host-13: 0; "
+                           "static-destructor");
 }
 
 TEST_F(VSTInstance, AThreadOfThePluginMayAskForTheRebuildAllTheTime)
@@ -173,7 +171,7 @@ TEST_F(VSTInstance, AThreadOfThePluginMayAskForTheRebuildAllTheTime)
     }
     plugin->start();
     plugin.reset();
-    EXPECT_TRUE(takeTrace().endsWith(QStringLiteral("; close; static-destructor")));
+    EXPECT_TRUE(takeTrace().endsWith("; close; static-destructor"));
 }
 
 TEST_F(VSTInstance, ListenersHearWhatThePluginTells)
@@ -211,8 +209,7 @@ TEST_F(VSTInstance, AListenerNeedNotWaitForABlock)
     } listener;
     auto plugin = loaded("ask-host process 0");
     plugin->addListener(&listener);
-    EXPECT_TRUE(plugin->open(kSettings) && plugin->start() && plugin->process(64));
-    EXPECT_TRUE(listener.isKnown);
+    EXPECT_TRUE(plugin->open(kSettings) && plugin->start() && plugin->process(64) && listener.isKnown);
 }
 
 TEST_F(VSTInstance, AFaultEndsTheUse)
@@ -234,7 +231,7 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
         EXPECT_FALSE(plugin->setProgram(0) || plugin->setBypass(true) || plugin->start());
         plugin.reset();
         EXPECT_EQ(takeTrace(), row.calls);
-        EXPECT_TRUE(m_log.contains(QLatin1String(row.line)));
+        EXPECT_TRUE(m_log.contains(row.line));
     }
     auto faulty = loaded("fault opcode-2 segv", "between blocks");
     EXPECT_TRUE(faulty->open(kSettings) && faulty->start());
@@ -252,6 +249,6 @@ TEST_F(VSTInstance, CountsThatCannotBeAreNotUsed)
         auto plugin = loaded(script);
         EXPECT_TRUE(plugin->open(kSettings)) << script;
         EXPECT_FALSE(plugin->start()) << script;
-        EXPECT_TRUE(m_log.contains(QStringLiteral("cannot be used for audio")));
+        EXPECT_TRUE(m_log.contains("cannot be used for audio"));
     }
 }

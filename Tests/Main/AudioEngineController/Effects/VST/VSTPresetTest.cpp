@@ -11,10 +11,7 @@
 
 namespace {
 
-class VSTPreset : public VSTInstanceBench {
-protected:
-    VSTPreset() { debugLogSettings().trace = true; }
-};
+using VSTPreset = VSTInstanceBench;
 
 /// The bytes of a list of one-letter parameters and their values, made by hand.
 QByteArray list(const QByteArray &names, const std::vector<float> &values)
@@ -51,25 +48,21 @@ TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
         const char *trace; // its last line
     } cases[] = {
         {"chunk", "chunk \"ab\\x00c\"", true, 1, QByteArray("ab\0c", 4), "EFFECT SUPPORTS CHUNKS"},
-        {"no chunk", "flags 0x30\nparameter A", false, 0, {}, "FAILED"},
+        {"no chunk", "flags 0x30\nparameter A", false, 0, "kept", "FAILED"},
         {"one byte is none", "chunk a", false, 0, {}, "FAILED"},
-        {"negative size", "chunk abc\nanswer get-chunk -5", false, 0, {}, "FAILED"},
-        {"huge size", "chunk abc\nanswer get-chunk 2147483647", false, 0, {}, "FAILED"},
-        {"null pointer", "chunk abc\nnull-chunk", false, 0, {}, "FAILED"},
-        {"exception", "chunk abc\nfault get-chunk throw-int", false, 0, {}, "FAILED"},
-        {"fault", "chunk abc\nfault get-chunk segv", false, 0, {}, "FAILED"},
+        {"negative size", "chunk abc\nanswer get-chunk -5", false, 0, "kept", "FAILED"},
+        {"huge size", "chunk abc\nanswer get-chunk 2147483647", false, 0, "kept", "FAILED"},
+        {"null pointer", "chunk abc\nnull-chunk", false, 0, "kept", "FAILED"},
+        {"exception", "chunk abc\nfault get-chunk throw-int", false, 0, "kept", "FAILED"},
+        {"fault", "chunk abc\nfault get-chunk segv", false, 0, "kept", "FAILED"},
         {"no parameters", "", true, 0, list({}, {}), "Storing 0 Parameters"},
         {"parameters", "parameter A -1.5\nparameter B nan", true, 0,
          list("AB", {-1.5f, std::numeric_limits<float>::quiet_NaN()}), "Storing 2 Parameters"},
         {"long name", "parameter " + longName + "x 1", true, 0, list("A", {1.0f}).replace(8, 63, longName),
          "Storing 1 Parameters"},
-        {"negative count", "stated-parameters -1", false, 0, {}, "EFFECT DOES NOT SUPPORTS CHUNKS"},
-        {"huge count", "stated-parameters 2147483647", false, 0, {}, "EFFECT DOES NOT SUPPORTS CHUNKS"},
-        {"fault in a parameter",
-         "parameter A\nparameter B\nfault get-parameter segv",
-         false,
-         0,
-         {},
+        {"negative count", "stated-parameters -1", false, 0, "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
+        {"huge count", "stated-parameters 2147483647", false, 0, "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
+        {"fault in a parameter", "parameter A\nparameter B\nfault get-parameter segv", false, 0, "kept",
          "Storing 2 Parameters"}};
     for (const auto &row : cases) {
         SCOPED_TRACE(row.name);
@@ -79,13 +72,11 @@ TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
         PluginPreset preset;
         preset.data = "kept";
         EXPECT_EQ(plugin->StorePreset(preset), row.stored);
-        EXPECT_EQ(log.lines().filter(QStringLiteral("StorePreset")).last().section('-', 1).trimmed(),
-                  QString::fromUtf8(row.trace));
-        const bool isKept = !row.stored && qstrcmp(row.name, "one byte is none") != 0;
-        EXPECT_EQ(preset.data, isKept ? QByteArray("kept") : row.data);
+        EXPECT_EQ(log.lines().filter("StorePreset").last().section('-', 1).trimmed(), row.trace);
+        EXPECT_EQ(preset.data, row.data);
         EXPECT_EQ(preset.isChunk, row.isChunk);
         if (row.stored) {
-            EXPECT_EQ(preset.identifier, QStringLiteral("vst2:Comp:7"));
+            EXPECT_EQ(preset.identifier, "vst2:Comp:7");
             EXPECT_EQ(preset.name, "Comp");
             EXPECT_TRUE(plugin->LoadPreset(preset)) << "and it is taken back";
         }
@@ -107,7 +98,7 @@ TEST_F(VSTPreset, CarriesTheSettingsOfTheObject)
     EXPECT_EQ(preset.channelSpans, (std::array<qint32, 2>{1, 6}));
     takeTrace();
     EXPECT_TRUE(other->LoadPreset(preset));
-    EXPECT_TRUE(takeTrace().endsWith(QStringLiteral("opcode-44: 0 1")));
+    EXPECT_TRUE(takeTrace().endsWith("opcode-44: 0 1"));
     EXPECT_TRUE(other->isBypassed() && other->isRealtime() && other->ownLatency() == 300);
 }
 
@@ -121,38 +112,38 @@ TEST_F(VSTPreset, ParametersAreRestoredByName)
     takeTrace();
     EXPECT_TRUE(plugin->LoadPreset(preset));
     EXPECT_EQ(takeTrace().section("opcode-67; ", 1).remove("host-0: 0; "),
-              QStringLiteral("set-parameter: 1 1; set-parameter: 3 3; set-parameter: 0 4; "
-                             "set-parameter: 2 5; opcode-68"));
-    EXPECT_TRUE(m_log.contains(QStringLiteral("Comp does not take the parameter Z")));
+              "set-parameter: 1 1; set-parameter: 3 3; set-parameter: 0 4; "
+              "set-parameter: 2 5; opcode-68");
+    EXPECT_TRUE(m_log.contains("Comp does not take the parameter Z"));
     EXPECT_FALSE(m_host.isIgnored(plugin.get()));
 }
 
 TEST_F(VSTPreset, WhatDoesNotBelongIsRefusedWithAReason)
 {
     const QByteArray good = list("AB", {0, 1});
+    const QString own = "vst2:Comp:1000";
     const struct {
-        const char *name;
         QByteArray data;
         int isChunk;
-        const char *identifier;
+        QString identifier;
         const char *reason;
-    } cases[] = {{"of another", good, 0, "vst2:Comp:1001", "it is of vst2:Comp:1001"},
-                 {"of another format", good, 0, "vst3:Comp:1000", "it is of vst3:"},
-                 {"empty", {}, 0, "vst2:Comp:1000", "it holds no data"},
-                 {"state for one that keeps none", good, 1, "vst2:Comp:1000", "no state of its own"},
-                 {"of no kind", good, 2, "vst2:Comp:1000", "a kind that nobody knows"},
-                 {"format 3", changed(good, 0, 3), 0, "vst2:Comp:1000", "no parameter list"},
-                 {"huge count", changed(good, 7, '\x7F'), 0, "vst2:Comp:1000", "144 bytes for 2130706434"},
-                 {"endless name", good.left(8) + QByteArray(64, 'A') + good.mid(72), 0, "vst2:Comp:1000",
-                  "name of parameter 0 does not end"}};
+    } cases[] = {
+        {good, 0, "vst2:Comp:1001", "it is of vst2:Comp:1001"},
+        {good, 0, "vst3:Comp:1000", "it is of vst3:"},
+        {{}, 0, own, "it holds no data"},
+        {good, 1, own, "no state of its own"},
+        {good, 2, own, "a kind that nobody knows"},
+        {changed(good, 0, 3), 0, own, "no parameter list"},
+        {changed(good, 7, '\x7F'), 0, own, "144 bytes for 2130706434"},
+        {good.left(8) + QByteArray(64, 'A') + good.mid(72), 0, own, "name of parameter 0 does not end"}};
     auto plugin = loaded("parameter A\nparameter B");
     PluginPreset preset;
     for (const auto &row : cases) {
         preset.data = row.data;
         preset.isChunk = row.isChunk;
-        preset.identifier = QString::fromUtf8(row.identifier);
-        EXPECT_FALSE(plugin->LoadPreset(preset)) << row.name;
-        EXPECT_TRUE(m_log.lines().last().contains(QLatin1String(row.reason))) << row.name;
+        preset.identifier = row.identifier;
+        EXPECT_FALSE(plugin->LoadPreset(preset)) << row.reason;
+        EXPECT_TRUE(m_log.lines().last().contains(row.reason)) << row.reason;
     }
     preset.isChunk = 0;
     for (int size = 0; size < good.size(); ++size) {
@@ -168,19 +159,15 @@ TEST_F(VSTPreset, TheUserIsToldAndSoIsTheLogOfAFailure)
 {
     const auto ui = std::make_shared<NotingUI>();
     installVUI(ui);
-    const struct {
-        const char *name;
-        const char *script;
-    } cases[] = {{"State", "chunk abc\nfault set-chunk throw-std"},
-                 {"Faulty", "chunk abc\nfault set-chunk segv"},
-                 {"List", "parameter A\nfault set-parameter segv"}};
-    for (const auto &row : cases) {
-        const QString name = QString::fromUtf8(row.name);
-        auto plugin = loaded(row.script, row.name);
+    const std::pair<QString, const char *> rows[] = {{"State", "chunk abc\nfault set-chunk throw-std"},
+                                                     {"Faulty", "chunk abc\nfault set-chunk segv"},
+                                                     {"List", "parameter A\nfault set-parameter segv"}};
+    for (const auto &[name, script] : rows) {
+        auto plugin = loaded(script, qPrintable(name));
         PluginPreset preset;
         EXPECT_TRUE(plugin->StorePreset(preset));
-        EXPECT_FALSE(plugin->LoadPreset(preset)) << row.name;
-        EXPECT_TRUE(m_log.contains(QStringLiteral("VST Plugin exception in ") + name));
+        EXPECT_FALSE(plugin->LoadPreset(preset)) << script;
+        EXPECT_TRUE(m_log.contains("VST Plugin exception in " + name));
         EXPECT_EQ(ui->heard, QStringList({"60000 Storing " + name + " Preset", "1000 ",
                                           "60000 Loading " + name + " Preset", "1000 "}));
         ui->heard.clear();
