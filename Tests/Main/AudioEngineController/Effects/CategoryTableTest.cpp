@@ -17,19 +17,12 @@ TEST(CategoryTable, InternalBitsOfEveryCategory)
         EXPECT_EQ(table.maskToCategory(1u << index), internal) << "index " << index;
         EXPECT_EQ(table.categoryToMask(internal), 1u << index) << "index " << index;
     }
-    EXPECT_EQ(table.sortedNames().first(), QStringLiteral("-"));
-    EXPECT_EQ(table.sortedNames().at(table.instrumentPosition()), QStringLiteral("Instrument"));
-    EXPECT_EQ(table.sortedNames().at(table.ambisonicsPosition()), QStringLiteral("Ambisonics"));
-}
-
-TEST(CategoryTable, Sets)
-{
-    const CategoryTable &table = CategoryTable::instance();
     EXPECT_EQ(table.maskToCategory(0x4000080u), 0x2002u);
     EXPECT_EQ(table.categoryToMask(0x2002u), 0x4000080u);
-    EXPECT_EQ(table.maskToCategory(0x1u), 0u);
-    EXPECT_EQ(table.maskToCategory(0xF0000000u), 0u);
-    EXPECT_EQ(table.maskToCategory(0u), 0u);
+    EXPECT_EQ(table.maskToCategory(0xF0000001u), 0u);
+    EXPECT_EQ(table.sortedNames().first(), "-");
+    EXPECT_EQ(table.sortedNames().at(table.instrumentPosition()), "Instrument");
+    EXPECT_EQ(table.sortedNames().at(table.ambisonicsPosition()), "Ambisonics");
 }
 
 TEST(PluginIdentifier, PrefixesAndNames)
@@ -44,11 +37,11 @@ TEST(PluginIdentifier, PrefixesAndNames)
         {"no prefix at all", 0, "Unknown"},
     };
     for (const auto &row : rows) {
-        const QString prefix = prefixOf(QString::fromLatin1(row.identifier));
+        const QString prefix = prefixOf(row.identifier);
         EXPECT_EQ(static_cast<int>(formatOfPrefix(prefix)), row.format) << row.identifier;
-        EXPECT_EQ(formatName(prefix), QString::fromLatin1(row.name)) << row.identifier;
+        EXPECT_EQ(formatName(prefix), row.name) << row.identifier;
     }
-    EXPECT_EQ(formatOfPrefix(QStringLiteral("vst3:more")), PluginFormat::Unknown) << "compared whole";
+    EXPECT_EQ(formatOfPrefix("vst3:more"), PluginFormat::Unknown) << "compared whole";
 }
 
 TEST(VST3SubCategories, WholeWordsBetweenBars)
@@ -56,28 +49,20 @@ TEST(VST3SubCategories, WholeWordsBetweenBars)
     const struct {
         const char *text;
         quint32 mask; // file form
-    } rows[] = {
-        {"", 0},
-        {"Fx", 0},
-        {"Fx|EQ", 0x10},
-        {"Fx|Filter|Reverb", 0x4010},
-        {"Instrument|Synth", 0x80},
-        {"Instrument|Drum", 0x400080},
-        {"Fx|Pitch Shift", 0x2000},
-        {"Fx|Channel Strip|Up-Downmix", 0x8002},
-        {"fx|eq", 0},
-        {"EQualizer|SubDelay", 0},
-        {"Fx|Ambisonics|Network", 0x4010000},
-        {"||EQ|", 0x10},
-        {"Fx|EQ|Dynamics", 0x18},
-        {"Fx|Analyzer", 0x1000000},
-        {"Fx|Reverberation", 0},
-    };
+    } rows[] = {{"Fx", 0},
+                {"Fx|Filter|Reverb", 0x4010},
+                {"Instrument|Drum", 0x400080},
+                {"Fx|Pitch Shift", 0x2000},
+                {"Fx|Channel Strip|Up-Downmix", 0x8002},
+                {"fx|eq", 0},
+                {"EQualizer|SubDelay|Reverberation", 0},
+                {"Fx|Ambisonics|Network", 0x4010000},
+                {"||EQ|", 0x10},
+                {"Fx|EQ|Dynamics", 0x18},
+                {"Fx|Analyzer", 0x1000000}};
     for (const auto &row : rows)
-        EXPECT_EQ(CategoryTable::instance().categoryToMask(
-                      categoryFromSubCategories(QString::fromLatin1(row.text))),
-                  row.mask)
+        EXPECT_EQ(CategoryTable::instance().categoryToMask(categoryFromSubCategories(row.text)), row.mask)
             << row.text;
-    EXPECT_TRUE(isInstrumentCategory(categoryFromSubCategories(QStringLiteral("Fx|Piano"))));
-    EXPECT_FALSE(isInstrumentCategory(categoryFromSubCategories(QStringLiteral("Fx|Delay"))));
+    EXPECT_TRUE(isInstrumentCategory(categoryFromSubCategories("Fx|Piano")));
+    EXPECT_FALSE(isInstrumentCategory(categoryFromSubCategories("Fx|Delay")));
 }

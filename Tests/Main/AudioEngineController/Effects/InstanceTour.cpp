@@ -87,7 +87,7 @@ protected:
         tellSpeakers(plugin, kManyChannels, kManyChannels);
         const bool accepted = tellSpeakers(plugin, before.inputs.span(), before.outputs.span());
         testing::internal::GetCapturedStdout();
-        EXPECT_TRUE(accepted || plugin.identifier().startsWith(QStringLiteral("vst2:")))
+        EXPECT_TRUE(accepted || plugin.identifier().startsWith("vst2:"))
             << "only plug-ins of the older format may know no speakers at all";
         EXPECT_EQ(plugin.channels().inputs.span(), before.inputs.span());
         EXPECT_EQ(plugin.channels().outputs.span(), before.outputs.span());
@@ -126,7 +126,7 @@ protected:
 TEST_F(InstanceTour, OfTheVST3Plugins)
 {
     const QDir plugins = folder("FXPROBE_TOUR_VST3", FXPROBE_REAL_PLUGIN_FOLDER "/vst3");
-    for (const QFileInfo &file : modules(plugins, {QStringLiteral("*.vst3")})) {
+    for (const QFileInfo &file : modules(plugins, {"*.vst3"})) {
         ClassListing listed;
         bool factoryFound = true;
         VST3Plugin().listClasses(listed, file.filePath(), false, factoryFound);
@@ -135,13 +135,13 @@ TEST_F(InstanceTour, OfTheVST3Plugins)
             m_registry.vst3Host().AddEffect(record);
         }
     }
-    tour(m_registry.vst3Host(), QStringLiteral("vst3:"));
+    tour(m_registry.vst3Host(), "vst3:");
 }
 
 TEST_F(InstanceTour, OfTheVST2Plugins)
 {
     const QDir plugins = folder("FXPROBE_TOUR_VST", FXPROBE_REAL_PLUGIN_FOLDER "/vst");
-    for (const QFileInfo &file : modules(plugins, {QStringLiteral("*.so"), QStringLiteral("*.dll")})) {
+    for (const QFileInfo &file : modules(plugins, {"*.so", "*.dll"})) {
         VSTPlugin plugin(VSTHost::instance());
         bool isPluginModule = false;
         EffectRecord record;
@@ -151,5 +151,5 @@ TEST_F(InstanceTour, OfTheVST2Plugins)
         plugin.readInto(record);
         m_registry.vst2Host().AddEffect(record);
     }
-    tour(m_registry.vst2Host(), QStringLiteral("vst2:"));
+    tour(m_registry.vst2Host(), "vst2:");
 }

@@ -14,20 +14,19 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHost)
     const auto list = [](AudioPluginHost &host, const QString &path, const char *id, bool enabled = true) {
         EffectRecord record;
         record.path = path;
-        record.name = record.id = QString::fromUtf8(id);
+        record.name = record.id = id;
         record.enabled = enabled;
         EXPECT_TRUE(host.AddEffect(record));
     };
     const char classId[] = "00112233445566778899AABBCCDDEEFF";
-    const QString vst3 =
-        addVST3File(folder.plugins(), QStringLiteral("C"), QByteArray("class C\nid ") + classId);
-    const QString vst2 = addVST2File(folder.plugins(), QStringLiteral("Q"), "name Q\nid 7\n");
+    const QString vst3 = addVST3File(folder.plugins(), "C", QByteArray("class C\nid ") + classId);
+    const QString vst2 = addVST2File(folder.plugins(), "Q", "name Q\nid 7\n");
     list(registry.vst3Host(), vst3, classId);
     list(registry.vst3Host(), vst3, "FF112233445566778899AABBCCDDEEFF");
     list(registry.vst3Host(), vst3, "Off", false);
     const char thrower[] = "EE112233445566778899AABBCCDDEEFF";
     list(registry.vst3Host(),
-         addVST3File(folder.plugins(), QStringLiteral("T"),
+         addVST3File(folder.plugins(), "T",
                      QByteArray("class T\nid ") + thrower + "\nfault initialize throw-int"),
          thrower);
     list(registry.builtInHost(), QString(), "a");
@@ -55,15 +54,15 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHost)
     for (const auto &row : cases) {
         SCOPED_TRACE(row.identifier);
         const CapturedLog log;
-        const auto plugin = registry.LoadPlugin(QString::fromUtf8(row.identifier));
-        EXPECT_EQ(plugin ? plugin->identifier() : QString(), QString::fromUtf8(row.loaded));
+        const auto plugin = registry.LoadPlugin(row.identifier);
+        EXPECT_EQ(plugin ? plugin->identifier() : QString(), row.loaded);
         EXPECT_EQ(log.lines().contains(QLatin1String("PluginHost::LoadPlugin - Failed to Find Effect: ") +
                                        row.identifier),
                   !row.isKnown);
         EXPECT_TRUE(plugin || !log.lines().isEmpty()) << "the log says why";
         PluginPreset preset;
         if (plugin && plugin->StorePreset(preset)) {
-            preset.identifier = QString::fromUtf8(row.identifier);
+            preset.identifier = row.identifier;
             EXPECT_TRUE(plugin->LoadPreset(preset)) << "one of the name asked for goes in";
         }
     }
@@ -72,13 +71,13 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHost)
 TEST(PluginHostLoading, APlaceholderKeepsTheStateOfWhatIsMissing)
 {
     PluginHost registry;
-    const auto plugin = registry.LoadPlugin(QStringLiteral("placeholder:vst2:Gone:1"));
+    const auto plugin = registry.LoadPlugin("placeholder:vst2:Gone:1");
     ASSERT_TRUE(plugin);
     PluginPreset preset;
     EXPECT_FALSE(plugin->StorePreset(preset)) << "nothing was given to keep";
-    preset.identifier = QStringLiteral("vst2:Gone:2");
+    preset.identifier = "vst2:Gone:2";
     EXPECT_FALSE(plugin->LoadPreset(preset)) << "of another";
-    preset.identifier = QStringLiteral("vst2:Gone:1");
+    preset.identifier = "vst2:Gone:1";
     preset.data = QByteArray("a\0b", 3);
     preset.name = "Gone";
     preset.flags = 0x12C0007;
@@ -91,7 +90,7 @@ TEST(PluginHostLoading, APlaceholderKeepsTheStateOfWhatIsMissing)
     EXPECT_EQ(kept.identifier, preset.identifier);
     EXPECT_EQ(kept.flags, preset.flags);
     EXPECT_EQ(kept.channelSpans, preset.channelSpans);
-    EXPECT_EQ(plugin->name(), QStringLiteral("Gone"));
+    EXPECT_EQ(plugin->name(), "Gone");
     EXPECT_EQ(plugin->channels().inputs.first, 2);
     EXPECT_EQ(plugin->channels().inputs.span(), 4);
     EXPECT_EQ(plugin->channels().outputs.span(), AudioPlugin::kMaxChannels) << "what a file says is checked";

@@ -35,8 +35,8 @@ ScanBench::ScanBench(const char *catalogue, const QString &ending)
 
 QByteArray ScanBench::traceStatement(const QString &name) const
 {
-    return "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\" \"" +
-           QFileInfo(name).fileName().toUtf8() + "\"\n";
+    return "trace \"" + m_folder.path("trace").toUtf8() + "\" \"" + QFileInfo(name).fileName().toUtf8() +
+           "\"\n";
 }
 
 QString ScanBench::dateFirst(const QString &path) const
@@ -47,7 +47,7 @@ QString ScanBench::dateFirst(const QString &path) const
 
 QString ScanBench::modulePath(const QString &name) const
 {
-    return m_folder.plugins() + QLatin1Char('/') + name + m_ending;
+    return m_folder.plugins() + '/' + name + m_ending;
 }
 
 QString ScanBench::addRaw(const QString &name, const QByteArray &content) const
@@ -60,7 +60,7 @@ void ScanBench::dateLater(const QString &path) const { m_folder.setModified(path
 
 ScannerOutcome ScanBench::scanOnce() const
 {
-    m_folder.write(QStringLiteral("trace"), {});
+    m_folder.write("trace", {});
     ScannerRun run(QStringLiteral(FXPROBE), m_folder);
     return run.run();
 }
@@ -93,14 +93,14 @@ QStringList ScanBench::traceOf(const QString &name) const
 {
     QStringList calls;
     for (const QString &line : trace())
-        if (line.startsWith(name + QLatin1Char(' ')))
+        if (line.startsWith(name + ' '))
             calls.append(line.mid(name.size() + 1));
     return calls;
 }
 
 QStringList ScanBench::loaded() const
 {
-    const QString call = QStringLiteral(" static-constructor");
+    const QString call = " static-constructor";
     QStringList names;
     for (const QString &line : trace())
         if (line.endsWith(call))
@@ -138,5 +138,5 @@ void ScanBench::mark(const QString &name, const char *element, const QByteArray 
     const QByteArray tag = QByteArray("<") + element + '>';
     const int content = catalogue.indexOf(tag, record) + tag.size();
     catalogue.replace(content, catalogue.indexOf('<', content) - content, value);
-    m_folder.write(QStringLiteral("Effects/") + m_catalogue, catalogue);
+    m_folder.write("Effects/" + m_catalogue, catalogue);
 }

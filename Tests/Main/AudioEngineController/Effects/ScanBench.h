@@ -38,7 +38,7 @@ protected:
     void expectSettled() const;
 
     /// The calls of the last run, "NAME CALL" with the module's name.
-    QStringList trace() const { return m_folder.lines(QStringLiteral("trace")); }
+    QStringList trace() const { return m_folder.lines("trace"); }
     /// The calls of one module in the last run.
     QStringList traceOf(const QString &name) const;
     /// The modules that the last run loaded, in order.
