@@ -2,13 +2,12 @@
 #include "Main/AudioEngineController/Effects/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/BusFormats/BusFormat.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 #include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/QtPrinters.h"
+#include "Tests/Support/TestApplication.h"
+#include "Tests/Support/TestFolder.h"
 
 #include <QDir>
 
@@ -25,25 +24,21 @@ constexpr int kManyChannels = 12;
 
 class InstanceTour : public testing::Test {
 protected:
-    static QDir folder(const char *variable, const char *standard)
+    /// Lists what is in a folder, and keeps the modules in memory for the rest of the process if that is
+    /// asked for.
+    void list(const QString &folder, const QStringList &patterns)
     {
-        const QString given = qEnvironmentVariable(variable);
-        return QDir(given.isEmpty() ? QString::fromUtf8(standard) : given);
-    }
-
-    /// The files of a folder, in memory for the rest of the process if that is asked for.
-    static QFileInfoList modules(const QDir &folder, const QStringList &patterns)
-    {
-        const QFileInfoList files = folder.entryInfoList(patterns);
-        for (const QFileInfo &file : files) {
-            QString reason;
-            PluginLibrary library;
-            const QString binary =
-                file.isDir() ? VST3ModuleFile::binary(file.filePath(), reason) : file.filePath();
-            if (qEnvironmentVariableIsSet("FXPROBE_TOUR_KEEPS_MODULES") && library.load(binary))
-                library.leaveMapped();
-        }
-        return files;
+        if (qEnvironmentVariableIsSet("FXPROBE_TOUR_KEEPS_MODULES"))
+            for (const QFileInfo &file : QDir(folder).entryInfoList(patterns)) {
+                QString reason;
+                PluginLibrary library;
+                const QString path = file.filePath();
+                if (library.load(file.isDir() ? VST3ModuleFile::binary(path, reason) : path))
+                    library.leaveMapped();
+            }
+        const TestApplication application({folder}, true);
+        m_registry.initialise(m_folder.dataFolder(), QString(), 48000, 256);
+        m_registry.Scan(true, true);
     }
 
     void tour(AudioPluginHost &host, const QString &prefix)
@@ -118,6 +113,7 @@ protected:
     }
 
     const CapturedLog m_log;
+    TestFolder m_folder;
     PluginHost m_registry;
 };
 
@@ -125,31 +121,12 @@ protected:
 
 TEST_F(InstanceTour, OfTheVST3Plugins)
 {
-    const QDir plugins = folder("FXPROBE_TOUR_VST3", FXPROBE_REAL_PLUGIN_FOLDER "/vst3");
-    for (const QFileInfo &file : modules(plugins, {"*.vst3"})) {
-        ClassListing listed;
-        bool factoryFound = true;
-        VST3Plugin().listClasses(listed, file.filePath(), false, factoryFound);
-        for (EffectRecord &record : listed) {
-            record.path = file.filePath();
-            m_registry.vst3Host().AddEffect(record);
-        }
-    }
+    list(qEnvironmentVariable("FXPROBE_TOUR_VST3", FXPROBE_REAL_PLUGIN_FOLDER "/vst3"), {"*.vst3"});
     tour(m_registry.vst3Host(), "vst3:");
 }
 
 TEST_F(InstanceTour, OfTheVST2Plugins)
 {
-    const QDir plugins = folder("FXPROBE_TOUR_VST", FXPROBE_REAL_PLUGIN_FOLDER "/vst");
-    for (const QFileInfo &file : modules(plugins, {"*.so", "*.dll"})) {
-        VSTPlugin plugin(VSTHost::instance());
-        bool isPluginModule = false;
-        EffectRecord record;
-        record.path = file.filePath();
-        if (!plugin.load(record.path, VSTHostCallback, isPluginModule))
-            continue;
-        plugin.readInto(record);
-        m_registry.vst2Host().AddEffect(record);
-    }
+    list(qEnvironmentVariable("FXPROBE_TOUR_VST", FXPROBE_REAL_PLUGIN_FOLDER "/vst"), {"*.so", "*.dll"});
     tour(m_registry.vst2Host(), "vst2:");
 }
