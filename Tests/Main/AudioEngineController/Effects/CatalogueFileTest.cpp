@@ -72,14 +72,6 @@ TEST(CatalogueText, OfVst2)
     EXPECT_FALSE(renderRecord(vstCatalogueFormat(), sampleRecord()).contains("SubEffect"));
 }
 
-TEST(CatalogueText, NoElementIsLeftOutForAnEmptyValue)
-{
-    const QByteArray text = renderRecord(vst3CatalogueFormat(), EffectRecord());
-    for (const char *element : {"Path", "FileTime", "Name", "ID", "Categories", "Vendor"})
-        EXPECT_TRUE(text.contains(QByteArray("<") + element + "></" + element + '>')) << element;
-    EXPECT_TRUE(text.contains("<Inputs>-1</Inputs>"));
-}
-
 TEST_F(CatalogueReading, WhatWasWrittenComesBack)
 {
     EffectRecord record = sampleRecord();

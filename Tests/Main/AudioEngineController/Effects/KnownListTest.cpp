@@ -99,13 +99,3 @@ TEST(KnownList, WhatACrashMarkerAppliesTo)
         }
     }
 }
-
-TEST(KnownList, IdentifierHeldByAnother)
-{
-    KnownList list;
-    list.file(known(kHere, "X"));
-    EXPECT_FALSE(list.isIdHeldByOther("X", known(kHere, "")));
-    EXPECT_TRUE(list.isIdHeldByOther("X", known(kThere, "")));
-    EXPECT_TRUE(list.isIdHeldByOther("X", known(kHere, "", 5)));
-    EXPECT_FALSE(list.isIdHeldByOther("Y", known(kThere, "")));
-}

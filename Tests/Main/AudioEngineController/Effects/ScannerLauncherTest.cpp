@@ -12,6 +12,7 @@
 
 #include <gtest/gtest.h>
 
+#include <functional>
 #include <thread>
 
 namespace {
@@ -26,13 +27,17 @@ protected:
                 [this] { ++m_listsWritten; }};
     }
     void script(const char *lines) const { m_folder.write("stand-in", lines); }
-    int runs() const { return static_cast<int>(m_folder.lines("runs").size()); }
+    int runs() const { return m_folder.read("runs").count('\n'); }
+    static void waitFor(const std::function<bool()> &condition)
+    {
+        while (!condition())
+            std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    }
     /// Cancels a launch as soon as its first run is there.
     std::thread cancelWhenRunning()
     {
         return std::thread([this] {
-            while (runs() == 0 && m_launcher.ends().empty())
-                std::this_thread::sleep_for(std::chrono::milliseconds(5));
+            waitFor([this] { return runs() > 0 || !m_launcher.ends().empty(); });
             m_launcher.cancel();
         });
     }
@@ -41,12 +46,6 @@ protected:
     ScannerLauncher m_launcher;
     int m_listsWritten = 0;
 };
-
-void waitForLauncher(const PluginHost &registry)
-{
-    while (registry.isLauncherRunning())
-        std::this_thread::sleep_for(std::chrono::milliseconds(5));
-}
 
 } // namespace
 
@@ -127,37 +126,27 @@ TEST_F(Launcher, TheRegistryScansOutOfProcessAndReloadsWhatChanged)
     const TestApplication workstation({m_folder.plugins()});
     addVST3File(m_folder.plugins(), "Comp");
     addVST2File(m_folder.plugins(), "Echo"); // a catalogue of nothing is written every time
-    PluginHost registry;
-    registry.initialise(m_folder.dataFolder(), QString(), 48000, 1024);
-    registry.Scan(true, false);
-    EXPECT_TRUE(registry.completionEvent()->isSet());
+    auto registry = std::make_unique<PluginHost>();
+    registry->initialise(m_folder.dataFolder(), QString(), 48000, 1024);
+    registry->Scan(true, false);
+    EXPECT_TRUE(registry->completionEvent()->isSet());
+    EXPECT_FALSE(registry->Scan(true, false)) << "one launcher at a time";
     EXPECT_EQ(workstation.changes, 1) << "the lists as they were";
-    EXPECT_FALSE(registry.Scan(true, false)) << "one launcher at a time";
-    EXPECT_EQ(workstation.changes, 1);
-    waitForLauncher(registry);
-    ASSERT_EQ(registry.vst3Host().effects().size(), 1u);
-    EXPECT_EQ(registry.vst3Host().effects()[0].name, "Comp");
+    waitFor([&] { return !registry->isLauncherRunning(); });
+    ASSERT_EQ(registry->vst3Host().effects().size(), 1u);
+    EXPECT_EQ(registry->vst3Host().effects()[0].name, "Comp");
     EXPECT_EQ(workstation.changes, 2);
-
-    registry.Scan(true, false);
-    waitForLauncher(registry);
+    registry->Scan(true, false);
+    waitFor([&] { return !registry->isLauncherRunning(); });
     EXPECT_EQ(workstation.changes, 3) << "nothing changed, nothing reloaded";
-    EXPECT_EQ(registry.vst3Host().effects().size(), 1u);
-}
+    EXPECT_EQ(registry->vst3Host().effects().size(), 1u);
 
-TEST_F(Launcher, TheRegistryEndsItsLauncherWhenItGoes)
-{
-    const TestApplication workstation({m_folder.plugins()});
     addVST3File(m_folder.plugins(), "Hang", "class Hang\nfault initialize hang\n");
+    registry->Scan(true, false);
+    waitFor([&] { return !m_folder.markers().isEmpty(); });
     QElapsedTimer time;
-    {
-        PluginHost registry;
-        registry.initialise(m_folder.dataFolder(), QString(), 48000, 1024);
-        registry.Scan(true, false);
-        while (m_folder.markers().isEmpty())
-            std::this_thread::sleep_for(std::chrono::milliseconds(5));
-        time.start();
-    }
-    EXPECT_LT(time.elapsed(), 20000);
+    time.start();
+    registry.reset();
+    EXPECT_LT(time.elapsed(), 20000) << "it ends its launcher";
     EXPECT_TRUE(m_folder.markers().isEmpty()) << "a cancel blames nobody";
 }

@@ -2,7 +2,7 @@
 // one line of the file "stand-in" in the data folder for each run, the last one again and again. Words of a
 // line:
 //   marker=NAME   writes a crash marker of VST 2 (NAME has its ending)
-//   clear         deletes all markers first
+//   clear         deletes the markers A.scan and A.scan3 first
 //   hang, fault, exit=N   how it ends (exit=0 without any)
 #include <chrono>
 #include <cstdlib>
@@ -19,28 +19,20 @@ namespace fs = std::filesystem;
 /// The line of this run; runs are counted in the file "runs".
 std::string lineOfRun(const fs::path &data)
 {
-    std::ofstream(data / "runs", std::ios::app) << "run\n";
-    const auto runs = fs::file_size(data / "runs") / std::string("run\n").size();
-    std::ifstream script(data / "stand-in");
-    std::string line;
-    std::string last;
-    for (std::uintmax_t run = 0; run < runs && std::getline(script, line); ++run)
+    std::ofstream(data / "runs", std::ios::app) << '\n';
+    std::ifstream script(data / "stand-in"), runs(data / "runs");
+    std::string line, last, run;
+    while (std::getline(runs, run) && std::getline(script, line))
         last = line;
     return last;
-}
-
-void clearMarkers(const fs::path &effects)
-{
-    for (const auto &entry : fs::directory_iterator(effects))
-        if (entry.path().extension() == ".scan" || entry.path().extension() == ".scan3")
-            fs::remove(entry.path());
 }
 
 void carryOut(const std::string &word, const fs::path &effects)
 {
     const std::string value = word.substr(word.find('=') + 1);
     if (word == "clear")
-        clearMarkers(effects);
+        for (const char *marker : {"A.scan", "A.scan3"})
+            fs::remove(effects / marker);
     else if (word == "fault")
         __builtin_trap(); // abort is no crash on Windows
     else if (word == "hang")

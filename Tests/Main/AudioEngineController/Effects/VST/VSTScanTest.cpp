@@ -45,18 +45,15 @@ TEST_F(VSTScan, FilesThatFailAreRecordedAndFilesThatAreNoPluginsAreNot)
     add("Healthy");
     add("Null", "answer entry null\n");
     add("Wild", "answer entry no-memory\n");
-    add("Magic", "magic 7\n");
-    add("Thrown", "fault entry throw-int\n");
     add("NoEntry", {}, VST2Fixture::NoEntry);
     addRaw("Text", "hello\n");
     addRaw("Empty", "");
-    const ScannerOutcome outcome = scan();
-    EXPECT_EQ(records("Name ID Enabled Working"),
-              texts({"Empty|Empty|1|0", "Healthy|Healthy:1000|1|1", "Magic|Magic|1|0", "Null|Null|1|0",
-                     "Text|Text|1|0", "Thrown|Thrown|1|0", "Wild|Wild|1|0"}));
-    EXPECT_TRUE(outcome.log.contains(kTextFileReason)) << qPrintable(outcome.log);
-    EXPECT_TRUE(outcome.log.contains(modulePath("Empty") + ": ")) << qPrintable(outcome.log);
-    EXPECT_TRUE(outcome.log.contains(modulePath("Magic") + ", Didn't manage it"));
+    const QString log = scan().log;
+    EXPECT_EQ(records("Name ID Enabled Working"), texts({"Empty|Empty|1|0", "Healthy|Healthy:1000|1|1",
+                                                         "Null|Null|1|0", "Text|Text|1|0", "Wild|Wild|1|0"}));
+    for (const QString &reason :
+         {QString(kTextFileReason), modulePath("Empty") + ": ", modulePath("Wild") + ", Didn't manage it"})
+        EXPECT_TRUE(log.contains(reason)) << qPrintable(log);
     expectSettled();
 }
 
@@ -116,13 +113,4 @@ TEST_F(VSTScan, WhatAPluginChangesIsPutBack)
     EXPECT_TRUE(outcome.log.contains("Thread" + vst2Ending() + " left threads running and stays in memory"));
     EXPECT_TRUE(QFile::permissions(m_folder.path("Effects/FXConfiguration.xml")) & QFile::ReadOther);
     expectSettled();
-}
-
-TEST_F(VSTScan, AfterAFaultNothingIsClosedOrUnloaded)
-{
-    add("Fault", "fault get-vendor-string segv\n");
-    add("Throw", "fault get-vendor-string throw-std\n");
-    scan();
-    EXPECT_EQ(traceOf("Fault").last(), "get-vendor-string Fault");
-    EXPECT_EQ(traceOf("Throw").last(), "static-destructor");
 }

@@ -6,31 +6,6 @@ using VST3Killers = VST3ScanBench;
 
 } // namespace
 
-TEST_F(VST3Killers, CrashesOfKnownPluginsKeepTheUsersMarks)
-{
-    add("Comp", "class First\nid 0000000000000000000000000000000A\n"
-                "class Second\nid 0000000000000000000000000000000B\n");
-    add("Other", "class Other\nid 0000000000000000000000000000000C\n");
-    scan();
-    for (const char *name : {"First", "Second"}) {
-        mark(name, "Favourite", "1");
-        mark(name, "CategoryMask", "16384");
-    }
-    update("Comp", "class First\nfault initialize segv\n");
-    scanOnce();
-    EXPECT_EQ(m_folder.markers(), texts({"Comp.scan3"}));
-    const QStringList expected =
-        texts({"Second|0000000000000000000000000000000B|2021-03-04 05:06|16384|1|1|1",
-               "Other|0000000000000000000000000000000C|2021-03-04 05:06|0|0|1|1",
-               "First|Comp|2022-03-04 05:06|16384|1|0|0"});
-    for (int run = 0; run < 2; ++run) {
-        scan();
-        m_folder.setModified(modulePath("Comp"), QDateTime({2023, 4, 5}, {6, 7}));
-        EXPECT_EQ(records("Name ID FileTime CategoryMask Favourite Enabled Working"), expected);
-        EXPECT_EQ(loaded(), QStringList());
-    }
-}
-
 TEST_F(VST3Killers, ACulpritWhoseNameAFailedFileHoldsIsKnownByItsPath)
 {
     addRaw("a/Same", "no module");
