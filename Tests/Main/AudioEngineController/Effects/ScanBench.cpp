@@ -1,11 +1,9 @@
 #include "Tests/Main/AudioEngineController/Effects/ScanBench.h"
 
 #include <QFileInfo>
+#include <QRegularExpression>
 
 namespace {
-
-const QDateTime kFirstDate({2021, 3, 4}, {5, 6, 7});
-const QDateTime kLaterDate({2022, 3, 4}, {5, 6, 7});
 
 /// The text of an element in a record's block; "-" where there is none.
 QByteArray elementOf(const QByteArray &block, const QByteArray &name)
@@ -41,13 +39,8 @@ QByteArray ScanBench::traceStatement(const QString &name) const
 
 QString ScanBench::dateFirst(const QString &path) const
 {
-    m_folder.setModified(path, kFirstDate);
+    m_folder.setModified(path, QDateTime({2021, 3, 4}, {5, 6, 7}));
     return path;
-}
-
-QString ScanBench::modulePath(const QString &name) const
-{
-    return m_folder.plugins() + '/' + name + m_ending;
 }
 
 QString ScanBench::addRaw(const QString &name, const QByteArray &content) const
@@ -56,29 +49,23 @@ QString ScanBench::addRaw(const QString &name, const QByteArray &content) const
     return dateFirst(modulePath(name));
 }
 
-void ScanBench::dateLater(const QString &path) const { m_folder.setModified(path, kLaterDate); }
-
 ScannerOutcome ScanBench::scanOnce() const
 {
     m_folder.write("trace", {});
-    ScannerRun run(QStringLiteral(FXPROBE), m_folder);
-    return run.run();
+    return ScannerRun(FXPROBE, m_folder).run();
 }
 
 ScannerOutcome ScanBench::scan() const
 {
     const ScannerOutcome outcome = scanOnce();
-    EXPECT_TRUE(outcome.succeeded()) << "exit code " << outcome.exitCode << ", signal " << outcome.signal
-                                     << ", log:\n"
-                                     << qPrintable(outcome.log);
+    EXPECT_TRUE(outcome.succeeded()) << outcome.exitCode << ", log:\n" << qPrintable(outcome.log);
     EXPECT_EQ(m_folder.markers(), QStringList());
     return outcome;
 }
 
 int ScanBench::scanUntilSettled() const
 {
-    const int mostRuns = 60;
-    return static_cast<int>(runUntilSettled(QStringLiteral(FXPROBE), m_folder, mostRuns).size());
+    return static_cast<int>(runUntilSettled(FXPROBE, m_folder).size());
 }
 
 void ScanBench::expectSettled() const
@@ -91,21 +78,13 @@ void ScanBench::expectSettled() const
 
 QStringList ScanBench::traceOf(const QString &name) const
 {
-    QStringList calls;
-    for (const QString &line : trace())
-        if (line.startsWith(name + ' '))
-            calls.append(line.mid(name.size() + 1));
-    return calls;
+    QStringList calls = trace().filter(QRegularExpression('^' + QRegularExpression::escape(name) + ' '));
+    return calls.replaceInStrings(QRegularExpression("^.{" + QString::number(name.size() + 1) + '}'), "");
 }
 
 QStringList ScanBench::loaded() const
 {
-    const QString call = " static-constructor";
-    QStringList names;
-    for (const QString &line : trace())
-        if (line.endsWith(call))
-            names.append(line.chopped(call.size()));
-    return names;
+    return trace().filter(" static-constructor").replaceInStrings(" static-constructor", "");
 }
 
 QStringList ScanBench::recordsOf(const QString &file, const char *elements) const

@@ -72,13 +72,10 @@ TEST_F(VST3InstanceTest, IsOpenedAndClosedInOrder)
         {"a component that answers anything to the mode", "answer set-io-mode internal-error", asked, end}};
     for (const auto &row : cases) {
         SCOPED_TRACE(row.name);
-        const EffectRecord record = add(row.script);
-        {
-            VST3Plugin plugin;
-            EXPECT_TRUE(plugin.openClass(record));
-            EXPECT_EQ(takeTrace(), head + row.opening);
-            EXPECT_TRUE(plugin.isInstantiated());
-        }
+        auto plugin = std::make_unique<VST3Plugin>();
+        EXPECT_TRUE(plugin->openClass(add(row.script)) && plugin->isInstantiated());
+        EXPECT_EQ(takeTrace(), head + row.opening);
+        plugin.reset();
         EXPECT_EQ(takeTrace(), row.closing + tail);
     }
 }
@@ -114,21 +111,19 @@ TEST_F(VST3InstanceTest, FailuresHaveTheirLinesAndLeaveTheObjectUsable)
         EXPECT_TRUE(plugin.openClass(add({})));
         EXPECT_FALSE(takeTrace().contains("terminate")) << "what failed is not called again";
     }
-    VST3Plugin missing;
     EffectRecord gone = add({});
     gone.path = m_folder.path("gone.vst3");
-    EXPECT_FALSE(missing.openClass(gone));
+    EXPECT_FALSE(VST3Plugin().openClass(gone));
     EXPECT_TRUE(m_log.contains("VST3 Exception: Failed to get load module:" + gone.path));
 }
 
 TEST_F(VST3InstanceTest, OtherExceptionsReachTheCaller)
 {
-    const EffectRecord record = add(kPanel + "fault connect throw-int Panel\nfault disconnect throw-int\n");
-    {
-        VST3Plugin plugin;
-        EXPECT_THROW(plugin.openClass(record), int);
-        EXPECT_FALSE(plugin.isInstantiated());
-    }
+    auto plugin = std::make_unique<VST3Plugin>();
+    EXPECT_THROW(
+        plugin->openClass(add(kPanel + "fault connect throw-int Panel\nfault disconnect throw-int\n")), int);
+    EXPECT_FALSE(plugin->isInstantiated());
+    plugin.reset();
     EXPECT_TRUE(takeTrace().contains("terminate Panel; release Panel; terminate Comp; release Comp"));
 }
 
@@ -182,22 +177,24 @@ TEST_F(VST3InstanceTest, StateIsStoredAndLoaded)
 
 TEST_F(VST3InstanceTest, AStateThatCannotBeHadOrSetIsAFailure)
 {
-    for (const char *script : {"", "state x\nanswer get-state false", "state x\nfault get-state throw-int"}) {
+    const struct {
+        const char *script;
+        bool stored, loaded;
+    } rows[] = {{"", false, false},
+                {"state x\nanswer get-state false", false, false},
+                {"state x\nfault get-state throw-int", false, false},
+                {"state x\nanswer set-state false", true, true}, // it has that state, whatever it answers
+                {"state x\nfault set-state throw-std", true, false}};
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.script);
         VST3Plugin plugin;
-        ASSERT_TRUE(plugin.openClass(add(script)));
+        ASSERT_TRUE(plugin.openClass(add(row.script)));
         PluginPreset preset;
         preset.data = "kept";
-        EXPECT_FALSE(plugin.StorePreset(preset)) << script;
-        EXPECT_EQ(preset.data, "kept");
-    }
-    for (const char *script : {"state x\nanswer set-state false", "state x\nfault set-state throw-std"}) {
-        VST3Plugin plugin;
-        ASSERT_TRUE(plugin.openClass(add(script)));
-        PluginPreset preset;
-        EXPECT_TRUE(plugin.StorePreset(preset));
-        EXPECT_EQ(plugin.LoadPreset(preset), QByteArray(script).contains("answer"))
-            << "it has that state, whatever it answers";
-        preset.data[8] = 'y';
-        EXPECT_FALSE(plugin.LoadPreset(preset)) << script;
+        EXPECT_EQ(plugin.StorePreset(preset), row.stored);
+        EXPECT_EQ(preset.data == "kept", !row.stored);
+        EXPECT_EQ(plugin.LoadPreset(preset), row.loaded);
+        preset.data.replace('x', 'y');
+        EXPECT_FALSE(plugin.LoadPreset(preset));
     }
 }
