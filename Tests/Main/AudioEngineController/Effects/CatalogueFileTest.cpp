@@ -29,7 +29,7 @@ EffectRecord sampleRecord()
     return record;
 }
 
-class CatalogueReading : public ::testing::Test {
+class CatalogueReading : public testing::Test {
 protected:
     CatalogueContents read(const CatalogueFormat &format, const QByteArray &text)
     {
@@ -85,15 +85,14 @@ TEST_F(CatalogueReading, WhatWasWrittenComesBack)
 
 TEST_F(CatalogueReading, ValuesThatAreAbsentOrNoNumbers)
 {
-    const auto records =
-        read(vst3CatalogueFormat(),
-             "<Effects version=\"1.1\"><Effect></Effect><Effect><Inputs> +7 junk</Inputs>"
-             "<Outputs>x</Outputs><Enabled>2</Enabled><Working>no</Working></Effect></Effects>")
-            .records;
+    const auto records = read(vst3CatalogueFormat(), R"(<Effects version="1.1"><Effect></Effect>
+        <Effect><Inputs> +7 junk</Inputs><Outputs>x</Outputs><Enabled>2</Enabled><Working>no</Working></Effect>
+        </Effects>)")
+                             .records;
     ASSERT_EQ(records.size(), 2u);
     EXPECT_EQ(records[0].inputs, -1);
-    EXPECT_TRUE(records[0].enabled && records[0].working && !records[0].favourite);
     EXPECT_EQ(records[0].category, 0u);
+    EXPECT_TRUE(records[0].enabled && records[0].working && !records[0].favourite);
     EXPECT_EQ(records[1].inputs, 7);
     EXPECT_EQ(records[1].outputs, 0);
     EXPECT_TRUE(records[1].enabled && !records[1].working);
@@ -101,11 +100,10 @@ TEST_F(CatalogueReading, ValuesThatAreAbsentOrNoNumbers)
 
 TEST_F(CatalogueReading, Unusable)
 {
-    for (const char *text : {"<Effects version=\"1.4\"><Effect><Name>a<b</Name></Effect></Effects>",
-                             "<Effects><Effect><Path>/a.so</Path></Effect></Effects>"}) {
-        const CatalogueContents contents = read(vstCatalogueFormat(), text);
-        EXPECT_TRUE(!contents.reason.isEmpty() && contents.records.empty()) << text;
-    }
+    const CatalogueContents contents =
+        read(vstCatalogueFormat(), "<Effects><Effect><Path>/a.so</Path></Effect></Effects>");
+    EXPECT_FALSE(contents.reason.isEmpty()) << "of a version before the first";
+    EXPECT_TRUE(contents.records.empty());
     EXPECT_FALSE(readCatalogueFile(vstCatalogueFormat(), m_folder.path()).reason.isEmpty()) << "a folder";
 }
 

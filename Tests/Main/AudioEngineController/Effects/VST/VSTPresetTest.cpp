@@ -40,42 +40,39 @@ TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
 {
     const QByteArray longName(63, 'n');
     const struct {
-        const char *name;
         QByteArray script;
-        bool stored;
-        int isChunk;
-        QByteArray data;
+        QByteArray data;   // "kept": nothing was stored
         const char *trace; // its last line
-    } cases[] = {
-        {"chunk", "chunk \"ab\\x00c\"", true, 1, QByteArray("ab\0c", 4), "EFFECT SUPPORTS CHUNKS"},
-        {"no chunk", "flags 0x30\nparameter A", false, 0, "kept", "FAILED"},
-        {"one byte is none", "chunk a", false, 0, {}, "FAILED"},
-        {"negative size", "chunk abc\nanswer get-chunk -5", false, 0, "kept", "FAILED"},
-        {"huge size", "chunk abc\nanswer get-chunk 2147483647", false, 0, "kept", "FAILED"},
-        {"null pointer", "chunk abc\nnull-chunk", false, 0, "kept", "FAILED"},
-        {"exception", "chunk abc\nfault get-chunk throw-int", false, 0, "kept", "FAILED"},
-        {"fault", "chunk abc\nfault get-chunk segv", false, 0, "kept", "FAILED"},
-        {"no parameters", "", true, 0, list({}, {}), "Storing 0 Parameters"},
-        {"parameters", "parameter A -1.5\nparameter B nan", true, 0,
-         list("AB", {-1.5f, std::numeric_limits<float>::quiet_NaN()}), "Storing 2 Parameters"},
-        {"long name", "parameter " + longName + "x 1", true, 0, list("A", {1.0f}).replace(8, 63, longName),
-         "Storing 1 Parameters"},
-        {"negative count", "stated-parameters -1", false, 0, "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
-        {"huge count", "stated-parameters 2147483647", false, 0, "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
-        {"fault in a parameter", "parameter A\nparameter B\nfault get-parameter segv", false, 0, "kept",
-         "Storing 2 Parameters"}};
+        bool isStored = false;
+        int isChunk = 0;
+    } cases[] = {{"chunk \"ab\\x00c\"", QByteArray("ab\0c", 4), "EFFECT SUPPORTS CHUNKS", true, 1},
+                 {"flags 0x30\nparameter A", "kept", "FAILED"}, // no chunk
+                 {"chunk a", {}, "FAILED"},                     // one byte is none
+                 {"chunk abc\nanswer get-chunk -5", "kept", "FAILED"},
+                 {"chunk abc\nanswer get-chunk 2147483647", "kept", "FAILED"},
+                 {"chunk abc\nnull-chunk", "kept", "FAILED"},
+                 {"chunk abc\nfault get-chunk throw-int", "kept", "FAILED"},
+                 {"chunk abc\nfault get-chunk segv", "kept", "FAILED"},
+                 {"", list({}, {}), "Storing 0 Parameters", true},
+                 {"parameter A -1.5\nparameter B nan",
+                  list("AB", {-1.5f, std::numeric_limits<float>::quiet_NaN()}), "Storing 2 Parameters", true},
+                 {"parameter " + longName + "x 1", list("A", {1.0f}).replace(8, 63, longName),
+                  "Storing 1 Parameters", true},
+                 {"stated-parameters -1", "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
+                 {"stated-parameters 2147483647", "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
+                 {"parameter A\nparameter B\nfault get-parameter segv", "kept", "Storing 2 Parameters"}};
     for (const auto &row : cases) {
-        SCOPED_TRACE(row.name);
+        SCOPED_TRACE(row.script.constData());
         const CapturedLog log;
         debugLogSettings().trace = true;
-        auto plugin = loaded(row.script + "\nname Comp\nid 7", row.name);
+        auto plugin = loaded(row.script + "\nname Comp\nid 7", qPrintable(QString::number(&row - cases)));
         PluginPreset preset;
         preset.data = "kept";
-        EXPECT_EQ(plugin->StorePreset(preset), row.stored);
+        EXPECT_EQ(plugin->StorePreset(preset), row.isStored);
         EXPECT_EQ(log.lines().filter("StorePreset").last().section('-', 1).trimmed(), row.trace);
         EXPECT_EQ(preset.data, row.data);
         EXPECT_EQ(preset.isChunk, row.isChunk);
-        if (row.stored) {
+        if (row.isStored) {
             EXPECT_EQ(preset.identifier, "vst2:Comp:7");
             EXPECT_EQ(preset.name, "Comp");
             EXPECT_TRUE(plugin->LoadPreset(preset)) << "and it is taken back";
