@@ -1,5 +1,7 @@
 #include "Tests/Main/AudioEngineController/Effects/VST3/VST3ScanBench.h"
 
+#include <QFile>
+
 namespace {
 
 using VST3Merge = VST3ScanBench;
@@ -79,4 +81,16 @@ TEST_F(VST3Merge, AModuleThatFailsForAWhileKeepsItsMarks)
     scan();
     EXPECT_EQ(sortedRecords(elements),
               texts({"Liked|16384|1|1|1|2021-03-04 05:06", "Off|0|0|0|1|2021-03-04 05:06"}));
+}
+
+TEST_F(VST3Merge, AModuleThatMovesIsProbedAgainWithItsMarks)
+{
+    add("old/Comp", "class Comp\n" + kIdA);
+    scan();
+    mark("Comp", "Favourite", "1");
+    ASSERT_TRUE(QFile::remove(modulePath("old/Comp")));
+    const QString moved = add("new/Comp", "class Comp\n" + kIdA);
+    scan();
+    EXPECT_EQ(records("Name Path Favourite"), QStringList("Comp|" + moved + "|1"));
+    expectSettled();
 }
