@@ -19,6 +19,7 @@ TEST(PluginHost, AScanWritesItsFilesAndSaysSoAndARefreshDoesNot)
     EXPECT_EQ(registry.completionEvent(), nullptr);
     const CapturedLog log;
     registry.Scan(false, true);
+    EXPECT_TRUE(registry.completionEvent()->isSet());
     EXPECT_EQ(application.changes, 0);
     EXPECT_TRUE(registry.Scan(true, true));
     EXPECT_TRUE(registry.completionEvent()->isSet());

@@ -155,13 +155,11 @@ TEST_F(VSTHostCallbackTest, CapabilitiesAreComparedExactly)
 
 TEST_F(VSTHostCallbackTest, TextsAreWrittenWithTheirZeroAndNothingMore)
 {
-    const std::pair<VstInt32, std::string> rows[] = {
-        {audioMasterGetVendorString, std::string("Tessel") + '\0'},
-        {audioMasterGetProductString, std::string("Vantage II") + '\0'}};
-    for (const auto &[opcode, written] : rows) {
+    for (const auto &[opcode, text] : {std::pair(audioMasterGetVendorString, std::string("Tessel")),
+                                       {audioMasterGetProductString, "Vantage II"}}) {
         std::string buffer(64, '\x5A');
         EXPECT_EQ(call(nullptr, opcode, 0, 0, buffer.data()), 1);
-        EXPECT_EQ(buffer, written + std::string(64 - written.size(), '\x5A'));
+        EXPECT_EQ(buffer, text + '\0' + std::string(63 - text.size(), '\x5A'));
         EXPECT_EQ(call(nullptr, opcode, 0, 0, nullptr), 0) << "nowhere to write";
     }
 }
@@ -218,19 +216,18 @@ TEST_F(VSTHostCallbackTest, CurrentIdIsThatOfThePluginBeingLoadedElseOfTheCallin
     EXPECT_FALSE(loading.load(record, VSTHostCallback, 0));
     debugLogSettings().trace = true;
     const struct {
-        const char *name;
         VSTPlugin *loading;
         AEffect *effect;
         VstIntPtr answer;
-    } cases[] = {{"no effect", nullptr, nullptr, 0},
-                 {"effect of no plug-in", nullptr, &m_strange, 0},
-                 {"effect of a plug-in, sign-extended", nullptr, &m_owned, -0x7FFFFFFF},
-                 {"no effect while one is loaded", &loading, nullptr, 11},
-                 {"effect of another while one is loaded", &loading, &m_owned, 11},
-                 {"while one without an identifier is loaded", &m_ignored, &m_owned, 0}};
+    } cases[] = {{nullptr, nullptr, 0},
+                 {nullptr, &m_strange, 0},
+                 {nullptr, &m_owned, -0x7FFFFFFF}, // sign-extended
+                 {&loading, nullptr, 11},
+                 {&loading, &m_owned, 11},
+                 {&m_ignored, &m_owned, 0}}; // one without an identifier is loaded
     for (const auto &row : cases) {
         m_host.setPluginBeingLoaded(row.loading);
-        EXPECT_EQ(call(row.effect, audioMasterCurrentId), row.answer) << row.name;
+        EXPECT_EQ(call(row.effect, audioMasterCurrentId), row.answer) << &row - cases;
     }
     EXPECT_EQ(m_log.count("returned"), 0) << "it has no such line";
 }
@@ -254,17 +251,14 @@ TEST_F(VSTHostCallbackTest, TheEleventhNestedCallOfAThreadIsRefused)
 TEST_F(VSTHostCallbackTest, ACounterThatRanAwayIsSetBack)
 {
     const struct {
-        const char *name;
         std::int32_t before;
         VstIntPtr answer;
         std::int32_t after;
-    } cases[] = {{"tenth", 9, 2400, 9},           {"eleventh", 10, 0, 10},
-                 {"last refused", 4094, 0, 4094}, {"first set back", 4095, 2400, -1},
-                 {"far away", 1000000, 2400, -1}, {"below zero", -1, 2400, -1},
-                 {"far below zero", -3, 0, -3}};
+    } cases[] = {{9, 2400, 9},        {10, 0, 10},    {4094, 0, 4094}, {4095, 2400, -1},
+                 {1000000, 2400, -1}, {-1, 2400, -1}, {-3, 0, -3}};
     for (const auto &row : cases) {
         VSTCallbackNesting::setActive(row.before);
-        EXPECT_EQ(call(nullptr, audioMasterVersion), row.answer) << row.name;
-        EXPECT_EQ(VSTCallbackNesting::active(), row.after) << row.name;
+        EXPECT_EQ(call(nullptr, audioMasterVersion), row.answer) << row.before;
+        EXPECT_EQ(VSTCallbackNesting::active(), row.after) << row.before;
     }
 }

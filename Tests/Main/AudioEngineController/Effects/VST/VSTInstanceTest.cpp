@@ -101,13 +101,14 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
 TEST_F(VSTInstance, ABlockGoesThroughTheBuffers)
 {
     for (const char *flags : {"flags 0x10", "flags 0"}) { // replaces; adds to the outputs
+        SCOPED_TRACE(flags);
         auto plugin = loaded(QByteArray("inputs 1\n") + flags);
         ASSERT_TRUE(plugin->open(kSettings) && plugin->start());
         for (int block = 0; block < 2; ++block) {
             plugin->buffers().inputs()[0][63] = 0.25f;
-            ASSERT_TRUE(plugin->process(64)) << flags;
-            EXPECT_EQ(plugin->buffers().outputs()[0][63], 0.25f) << flags;
-            EXPECT_EQ(plugin->buffers().outputs()[1][63], 1.0f) << flags;
+            ASSERT_TRUE(plugin->process(64));
+            EXPECT_EQ(plugin->buffers().outputs()[0][63], 0.25f);
+            EXPECT_EQ(plugin->buffers().outputs()[1][63], 1.0f);
         }
     }
 }
@@ -149,14 +150,13 @@ TEST_F(VSTInstance, ChannelsAreRebuiltWhenThePluginSaysSo)
 TEST_F(VSTInstance, NothingIsRebuiltWhileItIsTornDown)
 {
     auto plugin = loaded("ask-host close 13\nask-host opcode-72 13");
-    Listener listener([this] { return takeTrace(); });
+    Listener listener;
     plugin->addListener(&listener);
     ASSERT_TRUE(plugin->open(kSettings) && plugin->start());
     takeTrace();
     plugin.reset();
     EXPECT_EQ(listener.heard, QStringList());
-    EXPECT_EQ(takeTrace(), "opcode-72; host-13: 0; mains-changed; close; host-13: 0; "
-                           "static-destructor");
+    EXPECT_EQ(takeTrace(), "opcode-72; host-13: 0; mains-changed; close; host-13: 0; static-destructor");
 }
 
 TEST_F(VSTInstance, AThreadOfThePluginMayAskForTheRebuildAllTheTime)
@@ -238,8 +238,7 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
     EXPECT_FALSE(faulty->setProgram(0) || faulty->process(64) || faulty->isRunning());
     auto thrower = loaded("fault process throw-std");
     EXPECT_TRUE(thrower->open(kSettings) && thrower->start());
-    EXPECT_FALSE(thrower->process(64));
-    EXPECT_FALSE(thrower->isRunning());
+    EXPECT_FALSE(thrower->process(64) || thrower->isRunning());
     EXPECT_TRUE(thrower->start()) << "what throws is as it was";
 }
 

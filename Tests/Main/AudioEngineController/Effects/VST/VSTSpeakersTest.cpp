@@ -2,6 +2,7 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 #include "Tests/Support/QtPrinters.h"
 
+#include <map>
 #include <sstream>
 
 namespace {
