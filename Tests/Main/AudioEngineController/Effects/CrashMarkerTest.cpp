@@ -3,7 +3,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/QtPrinters.h"
+#include "Tests/Support/TestFolder.h"
 
 #include <QDir>
 #include <QFile>
@@ -76,15 +76,13 @@ TEST(CrashMarker, TextAndWhatIsReadBack)
          "\t<Path>/s.dll</Path>\n\t<Created>t</Created>\n\t<Name>C</Name>\n\t<SubID>-2147483648</SubID>\n",
          2147483648u},
     };
-    const QTemporaryDir folder;
-    const QString path = folder.filePath("marker");
+    const TestFolder folder;
+    const QString path = folder.path("marker");
     for (const auto &row : rows) {
         SCOPED_TRACE(row.body);
         EffectRecord record = row.record;
         ASSERT_TRUE(writeMarkerFile(row.format, path, record));
-        QByteArray text;
-        ASSERT_TRUE(readWholeFile(path, text));
-        EXPECT_EQ(text.replace(kLineEnd, "\n"),
+        EXPECT_EQ(folder.read(path).replace(kLineEnd, "\n"),
                   QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<CrashedPlugin>\n") + row.body +
                       "</CrashedPlugin>\n");
         record.subId = row.subIdBack;

@@ -2,17 +2,9 @@
 #include "Tests/Main/AudioEngineController/Effects/VST3/VST3ScanBench.h"
 
 #include <QDir>
-#include <QFile>
 #include <QFileInfo>
 
 namespace {
-
-QByteArray moduleBytes()
-{
-    QFile module(vst3FixturePath());
-    EXPECT_TRUE(module.open(QIODevice::ReadOnly));
-    return module.readAll();
-}
 
 class VST3Failures : public VST3ScanBench {
 protected:
@@ -25,7 +17,7 @@ protected:
         const QString folder = QFileInfo(vst3BundleBinary(modulePath(broken.name))).path();
         EXPECT_TRUE(QDir().mkpath(folder));
         for (const QString &binary : broken.binaries)
-            EXPECT_TRUE(QFile::copy(vst3FixturePath(), folder + '/' + binary));
+            m_folder.write(folder + '/' + binary, m_folder.read(vst3FixturePath()));
     }
 };
 
@@ -47,7 +39,7 @@ TEST_F(VST3Failures, FilesThatFailAreRecordedOnceWithTheirReasonInTheLog)
         expected.append(row.name);
         reasons.append(row.reason);
     }
-    for (const BrokenModule &broken : brokenModules(moduleBytes())) {
+    for (const BrokenModule &broken : brokenModules(m_folder.read(vst3FixturePath()))) {
         addBroken(broken);
         expected.append(broken.name);
         reasons.append(broken.reason);

@@ -9,13 +9,17 @@ using namespace Steinberg::Vst;
 
 namespace {
 
-/// The plug-in's channels of the positions from 0 on.
-std::string textOf(const VST3ChannelMap &map)
+/// The speakers that a code gives, and the plug-in's channels of the positions from 0 on where position 1
+/// went to channel 7 before.
+void expectSpeakers(int code, SpeakerArrangement speakers, const char *channels)
 {
+    SCOPED_TRACE(code);
+    VST3ChannelMap map = {{1, 7}};
+    EXPECT_EQ(arrangementFor(code, map, {}), speakers);
     std::string text;
     for (const auto &[position, channel] : map)
         text += (text.empty() ? "" : " ") + std::to_string(channel);
-    return text;
+    EXPECT_EQ(text, channels);
 }
 
 } // namespace
@@ -61,35 +65,20 @@ TEST(VST3Speakers, OfEveryBusFormat)
         {72, k131, "0 1 2 3 6 7 4 5 9 10 11 12 13 8"},
     };
     EXPECT_EQ(std::size(rows), busFormats().size());
-    for (const auto &row : rows) {
-        VST3ChannelMap map = {{30, 30}};
-        EXPECT_EQ(arrangementFor(row.code, map, {}), row.speakers) << row.code;
-        EXPECT_EQ(textOf(map), row.channels) << row.code;
-    }
+    for (const auto &row : rows)
+        expectSpeakers(row.code, row.speakers, row.channels);
 }
 
 TEST(VST3Speakers, OfDiscreteChannelsAndOfNoFormat)
 {
-    const struct {
-        int code;
-        SpeakerArrangement speakers;
-        const char *channels; ///< where position 1 went to channel 7 before
-    } rows[] = {{0x100, 0, "7"},
-                {0x101, 0x80000, "0 7"},
-                {0x104, 0x107, "0 1 2 3"},
-                {0x10B, 0x2F83F, "0 1 2 3 4 5 6 7 8 9 10"},
-                {0x115, 0x302D6FF, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20"},
-                {0x118, 0x7307FFFF, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20 21 22 23"},
-                {0x119, 3, "7"},
-                {0x7FFFFFFF, 3, "7"},
-                {-1, 3, "7"},
-                {11, 3, "7"},
-                {0x200, 3, "7"}};
-    for (const auto &row : rows) {
-        VST3ChannelMap map = {{1, 7}};
-        EXPECT_EQ(arrangementFor(row.code, map, {}), row.speakers) << row.code;
-        EXPECT_EQ(textOf(map), row.channels) << row.code;
-    }
+    expectSpeakers(0x100, 0, "7");
+    expectSpeakers(0x101, 0x80000, "0 7");
+    expectSpeakers(0x104, 0x107, "0 1 2 3");
+    expectSpeakers(0x10B, 0x2F83F, "0 1 2 3 4 5 6 7 8 9 10");
+    expectSpeakers(0x115, 0x302D6FF, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20");
+    expectSpeakers(0x118, 0x7307FFFF, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15 16 17 18 19 20 21 22 23");
+    for (const int none : {-1, 11, 0x119, 0x200, 0x7FFFFFFF})
+        expectSpeakers(none, 3, "7");
 }
 
 TEST(VST3Speakers, AreLimitedForPluginsOfFewChannels)
