@@ -240,6 +240,8 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
     EXPECT_TRUE(thrower->open(kSettings) && thrower->start());
     EXPECT_FALSE(thrower->process(64) || thrower->isRunning());
     EXPECT_TRUE(thrower->start()) << "what throws is as it was";
+    thrower.reset();
+    EXPECT_TRUE(takeTrace().endsWith("; close; static-destructor"));
 }
 
 TEST_F(VSTInstance, CountsThatCannotBeAreNotUsed)
