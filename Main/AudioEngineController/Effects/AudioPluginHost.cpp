@@ -226,15 +226,21 @@ QString AudioPluginHost::freeIdentifier(const EffectRecord &plugin, const QStrin
 {
     if (plugin.path.isEmpty())
         return name; // of an unreadable marker: nothing to tell apart
-    const QString candidates[] = {name, plugin.path,
-                                  plugin.path + QLatin1Char(':') + QString::number(plugin.subId)};
-    for (const QString &candidate : candidates) {
+    const auto isFree = [&](const QString &candidate) {
         const EffectRecord *listed = m_effects.find(candidate);
-        if (!candidate.isEmpty() && !(listed && !listed->isSamePlugin(plugin)) &&
-            !m_known.isIdHeldByOther(candidate, plugin))
+        return !candidate.isEmpty() && !(listed && !listed->isSamePlugin(plugin)) &&
+               !m_known.isIdHeldByOther(candidate, plugin);
+    };
+    const QString ofSubPlugin = plugin.path + QLatin1Char(':') + QString::number(plugin.subId);
+    for (const QString &candidate : {name, plugin.path, ofSubPlugin})
+        if (isFree(candidate))
             return candidate;
-    }
-    return candidates[2];
+    int number = 2;
+    QString numbered;
+    do
+        numbered = ofSubPlugin + QLatin1Char(':') + QString::number(number++);
+    while (!isFree(numbered));
+    return numbered;
 }
 
 void AudioPluginHost::completeFailedRecord(EffectRecord &record) const

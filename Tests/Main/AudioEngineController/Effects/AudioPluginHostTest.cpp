@@ -83,6 +83,22 @@ TEST_F(HostFolder, WhatAMarkerSaysLittleOf)
     EXPECT_FALSE(m_folder.catalogue().contains("<Effect>"));
 }
 
+TEST_F(HostFolder, ACulpritWhoseEveryIdentifierIsHeldGetsANumberedOne)
+{
+    m_folder.write("other/A.vst3", "a namesake that is there, with the identifiers of a liar");
+    QByteArray records;
+    for (const char *id : {"A", "/fx/A.vst3", "/fx/A.vst3:0", "/fx/A.vst3:0:2"})
+        records += "<Effect><Path>" + m_folder.path("other/A.vst3").toUtf8() + "</Path><ID>" + id +
+                   "</ID><Name>" + id + "</Name></Effect>";
+    m_folder.write("Effects/VST3Configuration.xml", "<Effects version=\"1.1\">" + records + "</Effects>");
+    writeMarker("A.scan3", "/fx/A.vst3", "A");
+    readingHost<VST3Host>();
+    const auto host = readingHost<VST3Host>(); // knows what the catalogue says now
+    const auto culprit = host->known().recordsOfPath("/fx/A.vst3");
+    ASSERT_EQ(culprit.size(), 1u);
+    EXPECT_EQ(culprit[0]->id, "/fx/A.vst3:0:3");
+}
+
 TEST_F(HostFolder, WaitingRecordsStandBetweenTheOthersInOrder)
 {
     const auto host = readingHost<VST3Host>();
