@@ -4,10 +4,12 @@
 
 #include <cfenv>
 #include <clocale>
+#include <csignal>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <exception>
+#include <filesystem>
 #include <stdexcept>
 #include <thread>
 
@@ -36,18 +38,6 @@ int consumeStack(volatile int depth)
     return depth < 0 ? 0 : consumeStack(depth + 1) + frame[0];
 }
 
-void overflowStack() { consumeStack(0); }
-
-void runIllegalInstruction() { __builtin_trap(); }
-
-void exitInOrder() { std::exit(0); }
-
-void exitAtOnce() { endProcess(0); }
-
-void throwStandardException() { throw std::runtime_error("thrown by the fixture"); }
-
-void throwInteger() { throw 42; }
-
 void hang()
 {
     for (;;)
@@ -56,16 +46,16 @@ void hang()
 
 const struct {
     const char *kind;
-    void (*commit)();
+    FixtureFault commit;
 } kFaults[] = {{"segv", writeToInvalidAddress},
                {"abort", [] { std::abort(); }},
-               {"exit", exitInOrder},
-               {"_exit", exitAtOnce},
+               {"exit", [] { std::exit(0); }},
+               {"_exit", [] { endProcess(0); }},
                {"divide", divideByZero},
-               {"illegal", runIllegalInstruction},
-               {"stack-overflow", overflowStack},
-               {"throw-std", throwStandardException},
-               {"throw-int", throwInteger},
+               {"illegal", [] { __builtin_trap(); }},
+               {"stack-overflow", [] { consumeStack(0); }},
+               {"throw-std", [] { throw std::runtime_error("thrown by the fixture"); }},
+               {"throw-int", [] { throw 42; }},
                {"terminate", [] { std::terminate(); }},
                {"kill", killProcess},
                {"hang", hang},
@@ -73,17 +63,33 @@ const struct {
 
 bool changeLocale(const std::string &name) { return std::setlocale(LC_ALL, name.c_str()) != nullptr; }
 
+bool changeFileMask(const std::string &octal)
+{
+    char *end = nullptr;
+    setFileMask(static_cast<int>(std::strtol(octal.c_str(), &end, 8)));
+    return !octal.empty() && *end == '\0';
+}
+
+bool changeWorkingFolder(const std::string &path)
+{
+    std::error_code error;
+    std::filesystem::current_path(std::filesystem::u8path(path), error);
+    return !error;
+}
+
 bool changeRounding(const std::string &direction)
 {
-    const struct {
-        const char *name;
-        int mode;
-    } modes[] = {{"up", FE_UPWARD}, {"down", FE_DOWNWARD}, {"zero", FE_TOWARDZERO}};
-    for (const auto &entry : modes) {
-        if (direction == entry.name)
-            return std::fesetround(entry.mode) == 0;
-    }
-    return false;
+    if (direction == "up")
+        return std::fesetround(FE_UPWARD) == 0;
+    return direction == "zero" && std::fesetround(FE_TOWARDZERO) == 0;
+}
+
+/// Installs a handler that does nothing.
+bool installSignalHandler(const std::string &name)
+{
+    if (name != "segv" && name != "term")
+        return false;
+    return std::signal(name == "segv" ? SIGSEGV : SIGTERM, [](int) {}) != SIG_ERR;
 }
 
 /// The thread keeps returning to this module's code: it dies when the module is unmapped under it.
@@ -107,54 +113,27 @@ bool printMuch(const std::string &kibibytes)
     return count > 0;
 }
 
-const struct SideEffect {
-    const char *kind;
-    bool takesValue;
-    bool (*cause)(const std::string &value);
-} kSideEffects[] = {{"locale", true, changeLocale},         {"umask", true, changeFileMask},
-                    {"chdir", true, changeWorkingFolder},   {"rounding", true, changeRounding},
-                    {"signal", true, installSignalHandler}, {"alarm", true, startAlarm},
-                    {"repair", true, repairOwnViolation},   {"print", true, printMuch},
-                    {"thread", false, leaveThreadRunning}};
-
-const SideEffect *findSideEffect(const std::string &kind)
-{
-    for (const SideEffect &entry : kSideEffects) {
-        if (kind == entry.kind)
-            return &entry;
-    }
-    return nullptr;
-}
+const FixtureSideEffect kSideEffects[] = {
+    {"locale", true, changeLocale},         {"umask", true, changeFileMask},
+    {"chdir", true, changeWorkingFolder},   {"rounding", true, changeRounding},
+    {"signal", true, installSignalHandler}, {"alarm", true, startAlarm},
+    {"repair", true, repairOwnViolation},   {"print", true, printMuch},
+    {"thread", false, leaveThreadRunning}};
 
 } // namespace
 
-bool isFault(const std::string &kind)
+FixtureFault findFault(const std::string &kind)
 {
-    for (const auto &entry : kFaults) {
+    for (const auto &entry : kFaults)
         if (kind == entry.kind)
-            return true;
-    }
-    return false;
+            return entry.commit;
+    return nullptr;
 }
 
-void commitFault(const std::string &kind)
+const FixtureSideEffect *findSideEffect(const std::string &kind)
 {
-    for (const auto &entry : kFaults) {
+    for (const FixtureSideEffect &entry : kSideEffects)
         if (kind == entry.kind)
-            entry.commit();
-    }
-}
-
-bool isSideEffect(const std::string &kind) { return findSideEffect(kind) != nullptr; }
-
-bool sideEffectTakesValue(const std::string &kind)
-{
-    const SideEffect *entry = findSideEffect(kind);
-    return entry && entry->takesValue;
-}
-
-bool causeSideEffect(const std::string &kind, const std::string &value)
-{
-    const SideEffect *entry = findSideEffect(kind);
-    return entry && entry->cause(value);
+            return &entry;
+    return nullptr;
 }

@@ -2,14 +2,16 @@
 
 #include <string>
 
-/// Whether a kind of fault is known.
-bool isFault(const std::string &kind);
-/// Commits a fault as a broken plug-in would; most kinds do not return.
-void commitFault(const std::string &kind);
+/// Commits a fault as a broken plug-in would; most do not return.
+using FixtureFault = void (*)();
+/// The fault of a kind; null where no such kind is known.
+FixtureFault findFault(const std::string &kind);
 
-/// Whether a kind of side effect is known.
-bool isSideEffect(const std::string &kind);
-/// Whether a kind of side effect takes a value.
-bool sideEffectTakesValue(const std::string &kind);
-/// Changes the state of the process; false when the value does not suit.
-bool causeSideEffect(const std::string &kind, const std::string &value);
+/// A change of the process's state that plug-ins leave behind.
+struct FixtureSideEffect {
+    const char *kind;
+    bool takesValue;
+    bool (*cause)(const std::string &value); ///< false when the value does not suit
+};
+/// The side effect of a kind, or null.
+const FixtureSideEffect *findSideEffect(const std::string &kind);

@@ -20,17 +20,9 @@ void killProcess();
 /// Ends the calling thread only.
 void endThread();
 
-// Side effects that real plug-ins leave behind. Each answers false for a value it does not know, and does
-// nothing where the system has no such thing.
-
-/// Sets the mask of file permissions, given in octal.
-bool changeFileMask(const std::string &octal);
-bool changeWorkingFolder(const std::string &path);
-/// Installs a handler that does nothing, for "segv", "fpe", "ill", "abrt", "term", "int" or "alrm".
-bool installSignalHandler(const std::string &signalName);
-/// Touches memory that is not there and repairs that in a handler of its own, as copy protection does. "keep"
-/// leaves a handler behind, which ends the process at any other violation; "restore" puts the one before
-/// back.
+void setFileMask(int mask);
+/// Touches memory that is not there and repairs that in a handler of its own, as copy protection does, and
+/// leaves a handler behind, which ends the process at any other violation. False for any value but "keep".
 bool repairOwnViolation(const std::string &afterwards);
-/// Lets an alarm signal arrive after so many seconds.
+/// Lets an alarm signal arrive after so many seconds, where the system has one; false for none.
 bool startAlarm(const std::string &seconds);

@@ -1,5 +1,7 @@
 #include "Tests/Fixtures/FixtureScript.h"
 
+#include "Tests/Fixtures/FixturePlatform.h"
+
 #include <cerrno>
 #include <cstdlib>
 #include <limits>
@@ -135,6 +137,13 @@ std::vector<ScriptStatement> parseScript(const std::string &script)
     return statements;
 }
 
+std::optional<std::vector<ScriptStatement>> moduleStatements()
+{
+    std::string script;
+    return readFile(modulePath() + ".script", script) ? std::make_optional(parseScript(script))
+                                                      : std::nullopt;
+}
+
 std::int32_t parseNumber(const std::string &text)
 {
     const bool hexadecimal = text.rfind("0x", 0) == 0;
@@ -147,6 +156,15 @@ std::int32_t parseNumber(const std::string &text)
         value < std::numeric_limits<std::int32_t>::min())
         throw ScriptError("'" + text + "' is no 32-bit number");
     return static_cast<std::int32_t>(static_cast<std::uint32_t>(value));
+}
+
+std::int32_t numberOfAnswer(const std::string &answer)
+{
+    try {
+        return parseNumber(answer);
+    } catch (const ScriptError &error) {
+        reportMisuse(error.what());
+    }
 }
 
 std::string baseName(const std::string &path)

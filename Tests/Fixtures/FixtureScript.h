@@ -1,6 +1,9 @@
 #pragma once
 
+#include "Tests/Fixtures/FixtureMisuse.h"
+
 #include <cstdint>
+#include <optional>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -34,8 +37,28 @@ struct ScriptStatement {
 /// ScriptError.
 std::vector<ScriptStatement> parseScript(const std::string &script);
 
+/// The statements of the script beside this module; none without a script. Throws ScriptError.
+std::optional<std::vector<ScriptStatement>> moduleStatements();
+
 /// A text as a 32-bit number as ScriptStatement::number reads it; throws ScriptError.
 std::int32_t parseNumber(const std::string &text);
+/// The same of an answer. It is read when it is due, in the middle of a call, and must not throw into the
+/// host: one that is no number ends the process.
+std::int32_t numberOfAnswer(const std::string &answer);
 
 /// The file name of a path without its ending: what a plug-in without a script is called.
 std::string baseName(const std::string &path);
+
+/// What the script says of the module, read on first use. One that cannot be understood ends the process.
+template <typename Script>
+const Script &moduleScript()
+{
+    static const Script script = [] {
+        try {
+            return Script();
+        } catch (const ScriptError &error) {
+            reportMisuse(error.what());
+        }
+    }();
+    return script;
+}

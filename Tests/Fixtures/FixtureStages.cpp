@@ -1,11 +1,36 @@
 #include "Tests/Fixtures/FixtureStages.h"
 
-#include "Tests/Fixtures/FixtureFaults.h"
 #include "Tests/Fixtures/FixtureMisuse.h"
 #include "Tests/Fixtures/FixturePlatform.h"
 
 #include <algorithm>
-#include <utility>
+#include <cstdio>
+
+namespace {
+
+std::string printable(const std::string &text)
+{
+    std::string result;
+    for (const char character : text) {
+        const auto byte = static_cast<unsigned char>(character);
+        char escape[8] = {character};
+        if (byte < 0x20 || byte == 0x7F)
+            std::snprintf(escape, sizeof escape, "\\x%02X", byte);
+        result += escape;
+    }
+    return result;
+}
+
+std::optional<std::int32_t> numberOf(const std::string &word)
+{
+    try {
+        return parseNumber(word);
+    } catch (const ScriptError &) {
+        return std::nullopt; // a name
+    }
+}
+
+} // namespace
 
 FixtureStages::FixtureStages(std::vector<FixtureStage> known)
     : m_known(std::move(known))
@@ -25,18 +50,20 @@ bool FixtureStages::take(const ScriptStatement &statement)
     }
     if (statement.key != "trace")
         return false;
-    takeTrace(statement);
+    statement.allowWords(2);
+    m_tracePath = statement.word(0);
+    m_tracePrefix = statement.words.size() > 1 ? statement.words[1] + " " : "";
     return true;
 }
 
 void FixtureStages::reach(const std::string &stage, const FixtureSubject &subject,
                           const std::string &detail) const
 {
-    m_trace.write(stage, subject.name, detail);
+    note(stage, subject, detail);
     for (const Kind kind : {Kind::SideEffect, Kind::Delay, Kind::Fault}) {
         for (const Order &order : m_orders) {
             if (order.kind == kind && order.concerns(stage, subject))
-                carryOut(order);
+                order.carryOut();
         }
     }
 }
@@ -44,7 +71,15 @@ void FixtureStages::reach(const std::string &stage, const FixtureSubject &subjec
 void FixtureStages::note(const std::string &stage, const FixtureSubject &subject,
                          const std::string &detail) const
 {
-    m_trace.write(stage, subject.name, detail);
+    if (m_tracePath.empty())
+        return;
+    std::string line = m_tracePrefix + stage;
+    if (!subject.name.empty())
+        line += " " + subject.name;
+    if (!detail.empty())
+        line += ": " + detail;
+    if (!appendToFile(m_tracePath, printable(line) + "\n"))
+        reportMisuse("cannot write the trace file '" + m_tracePath + "'");
 }
 
 const std::string *FixtureStages::answer(const std::string &stage, const FixtureSubject &subject) const
@@ -56,27 +91,11 @@ const std::string *FixtureStages::answer(const std::string &stage, const Fixture
     return nullptr;
 }
 
-bool FixtureStages::Order::concerns(const std::string &atStage, const FixtureSubject &atSubject) const
-{
-    return stage == atStage && subject.admits(atSubject);
-}
-
-bool FixtureStages::knows(const std::string &stage) const { return findStage(stage) != nullptr; }
-
 const FixtureStage *FixtureStages::findStage(const std::string &name) const
 {
     const auto stage = std::find_if(m_known.begin(), m_known.end(),
                                     [&name](const FixtureStage &entry) { return entry.name == name; });
     return stage == m_known.end() ? nullptr : &*stage;
-}
-
-void FixtureStages::checkStage(const ScriptStatement &statement, Kind kind) const
-{
-    const FixtureStage *stage = findStage(statement.word(0));
-    if (!stage)
-        statement.fail("no stage '" + statement.word(0) + "'");
-    if (kind == Kind::Answer && !stage->takesAnswer)
-        statement.fail("stage '" + stage->name + "' takes no answer");
 }
 
 FixtureStages::Order FixtureStages::readOrder(const ScriptStatement &statement, Kind kind) const
@@ -86,32 +105,33 @@ FixtureStages::Order FixtureStages::readOrder(const ScriptStatement &statement, 
     order.stage = statement.word(0);
     order.what = statement.word(1);
     std::size_t read = 2;
-    checkStage(statement, kind);
-    if (kind == Kind::Fault && !isFault(order.what))
+    const FixtureStage *stage = findStage(order.stage);
+    if (!stage || (kind == Kind::Answer && !stage->takesAnswer))
+        statement.fail("no stage '" + order.stage + "', or none that takes this");
+    if (kind == Kind::Fault && !(order.fault = findFault(order.what)))
         statement.fail("no fault '" + order.what + "'");
-    if (kind == Kind::SideEffect && !isSideEffect(order.what))
+    if (kind == Kind::SideEffect && !(order.sideEffect = findSideEffect(order.what)))
         statement.fail("no side effect '" + order.what + "'");
-    if (kind == Kind::SideEffect && sideEffectTakesValue(order.what))
+    if (order.sideEffect && order.sideEffect->takesValue)
         order.value = statement.word(read++);
     if (kind == Kind::Delay)
         order.milliseconds = statement.number(1);
-    order.subject = FixtureSubjectFilter(statement.optionalWord(read++));
-    statement.allowWords(read);
+    order.subject = {statement.optionalWord(read), numberOf(statement.optionalWord(read))};
+    statement.allowWords(read + 1);
     return order;
 }
 
-void FixtureStages::takeTrace(const ScriptStatement &statement)
+bool FixtureStages::Order::concerns(const std::string &atStage, const FixtureSubject &atSubject) const
 {
-    statement.allowWords(2);
-    m_trace = FixtureTrace(statement.word(0), statement.optionalWord(1));
+    return stage == atStage && (subject.name.empty() || subject.name == atSubject.name ||
+                                (subject.number && subject.number == atSubject.number));
 }
 
-void FixtureStages::carryOut(const Order &order) const
+void FixtureStages::Order::carryOut() const
 {
-    if (order.kind == Kind::SideEffect && !causeSideEffect(order.what, order.value))
-        reportMisuse("side effect '" + order.what + "' with '" + order.value + "' cannot be had here");
-    if (order.kind == Kind::Delay)
-        sleepMilliseconds(order.milliseconds);
-    if (order.kind == Kind::Fault)
-        commitFault(order.what);
+    if (sideEffect && !sideEffect->cause(value))
+        reportMisuse("side effect '" + what + "' with '" + value + "' cannot be had here");
+    sleepMilliseconds(milliseconds);
+    if (fault)
+        fault();
 }

@@ -10,44 +10,27 @@ const std::size_t kNameBuffer = 1024;
 const std::size_t kVendorBuffer = 256;
 const std::size_t kParameterBuffer = 128;
 
-/// The number that a key describes, or null.
-std::int32_t *numberOf(EffectScript &effect, const std::string &key)
-{
-    const struct {
-        const char *key;
-        std::int32_t *number;
-    } numbers[] = {{"id", &effect.uniqueId},
-                   {"magic", &effect.magic},
-                   {"inputs", &effect.inputs},
-                   {"outputs", &effect.outputs},
-                   {"latency", &effect.latency}};
-    for (const auto &entry : numbers) {
-        if (key == entry.key)
-            return entry.number;
-    }
-    return nullptr;
-}
-
-/// The number that a key describes and that has a computed default, or null.
-std::optional<std::int32_t> *optionalNumberOf(EffectScript &effect, const std::string &key)
-{
-    if (key == "category")
-        return &effect.category;
-    if (key == "flags")
-        return &effect.flags;
-    return key == "stated-parameters" ? &effect.statedParameters : nullptr;
-}
-
 bool takeNumber(EffectScript &effect, const ScriptStatement &statement)
 {
-    if (std::int32_t *number = numberOf(effect, statement.key))
-        *number = statement.number(0);
-    else if (std::optional<std::int32_t> *optional = optionalNumberOf(effect, statement.key))
-        *optional = statement.number(0);
-    else
+    const std::pair<const char *, std::int32_t *> numbers[] = {{"id", &effect.uniqueId},
+                                                               {"magic", &effect.magic},
+                                                               {"inputs", &effect.inputs},
+                                                               {"outputs", &effect.outputs}};
+    const std::pair<const char *, std::optional<std::int32_t> *> optionalNumbers[] = {
+        {"category", &effect.category},
+        {"flags", &effect.flags},
+        {"stated-parameters", &effect.statedParameters}};
+    const auto takeOneOf = [&statement](const auto &known) {
+        for (const auto &[key, number] : known) {
+            if (statement.key != key)
+                continue;
+            *number = statement.number(0);
+            statement.allowWords(1);
+            return true;
+        }
         return false;
-    statement.allowWords(1);
-    return true;
+    };
+    return takeOneOf(numbers) || takeOneOf(optionalNumbers);
 }
 
 bool takeFlag(EffectScript &effect, const ScriptStatement &statement)

@@ -32,7 +32,6 @@ struct EffectScript {
     std::int32_t magic = kEffectMagic;
     std::int32_t inputs = 2;
     std::int32_t outputs = 2;
-    std::int32_t latency = 0;
     std::optional<std::int32_t> category;
     std::optional<std::int32_t> flags;
     std::optional<std::int32_t> statedParameters; ///< the count that is claimed, where it is not the true one

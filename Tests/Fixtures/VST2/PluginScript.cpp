@@ -1,8 +1,7 @@
 #include "Tests/Fixtures/VST2/PluginScript.h"
 
-#include "Tests/Fixtures/FixtureMisuse.h"
 #include "Tests/Fixtures/FixturePlatform.h"
-#include "Tests/Fixtures/VST2/OpcodeStage.h"
+#include "Tests/Fixtures/VST2/Opcodes.h"
 
 namespace {
 
@@ -22,7 +21,7 @@ PluginScript::AfterChildren readAfterChildren(const ScriptStatement &statement)
 HostCall readKnownHostCall(const ScriptStatement &statement, const FixtureStages &stages)
 {
     HostCall call = readHostCall(statement);
-    if (!stages.knows(call.stage) || call.stage.rfind("static-", 0) == 0)
+    if (!stages.findStage(call.stage) || call.stage.rfind("static-", 0) == 0)
         statement.fail("no effect to call from at '" + call.stage + "'");
     return call;
 }
@@ -47,12 +46,8 @@ void takeStatement(PluginScript &plugin, const ScriptStatement &statement)
 PluginScript::PluginScript()
     : stages(stagesOfVST2())
 {
-    const std::string path = modulePath();
-    std::string script;
-    effect.name.bytes = baseName(path);
-    if (!readFile(path + ".script", script))
-        return;
-    for (const ScriptStatement &statement : parseScript(script))
+    effect.name.bytes = baseName(modulePath());
+    for (const ScriptStatement &statement : moduleStatements().value_or(std::vector<ScriptStatement>()))
         takeStatement(*this, statement);
 }
 
@@ -70,11 +65,7 @@ std::optional<ScriptedChild> PluginScript::childWithId(std::int32_t id) const
 VstIntPtr PluginScript::result(const std::string &stage, const FixtureSubject &subject, VstIntPtr usual) const
 {
     const std::string *answer = stages.answer(stage, subject);
-    try {
-        return answer ? parseNumber(*answer) : usual;
-    } catch (const ScriptError &error) {
-        reportMisuse(error.what()); // in the middle of a call: it must not throw into the host
-    }
+    return answer ? numberOfAnswer(*answer) : usual;
 }
 
 ScriptedChild makeChild(std::int32_t id, const ScriptedText &name)
@@ -87,14 +78,4 @@ ScriptedChild makeChild(std::int32_t id, const ScriptedText &name)
     return child;
 }
 
-const PluginScript &pluginScript()
-{
-    static const PluginScript script = [] {
-        try {
-            return PluginScript();
-        } catch (const ScriptError &error) {
-            reportMisuse(error.what());
-        }
-    }();
-    return script;
-}
+const PluginScript &pluginScript() { return moduleScript<PluginScript>(); }

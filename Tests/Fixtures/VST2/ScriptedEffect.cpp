@@ -1,8 +1,7 @@
 #include "Tests/Fixtures/VST2/ScriptedEffect.h"
 
 #include "Tests/Fixtures/FixtureMisuse.h"
-#include "Tests/Fixtures/VST2/CallDetail.h"
-#include "Tests/Fixtures/VST2/OpcodeStage.h"
+#include "Tests/Fixtures/VST2/Opcodes.h"
 
 #include <algorithm>
 #include <cstring>
@@ -51,7 +50,6 @@ ScriptedEffect::ScriptedEffect(EffectScript script, FixtureSubject subject, audi
     m_effect.numInputs = m_script.inputs;
     m_effect.numOutputs = m_script.outputs;
     m_effect.flags = static_cast<VstIntPtr>(kFlagsPadding | static_cast<std::uint32_t>(flagsOf(m_script)));
-    m_effect.initialDelay = m_script.latency;
     m_effect.object = this;
     m_effect.uniqueID = m_script.uniqueId;
     m_effect.version = 1;

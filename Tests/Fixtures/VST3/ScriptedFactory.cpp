@@ -1,7 +1,8 @@
-#include "Tests/Fixtures/VST3/ScriptedFactory.h"
-
 #include "Tests/Fixtures/FixtureMisuse.h"
 #include "Tests/Fixtures/VST3/ScriptedComponent.h"
+#include "Tests/Fixtures/VST3/ScriptedModule.h"
+
+#include <pluginterfaces/base/ipluginbase.h>
 
 #include <algorithm>
 #include <cstring>
@@ -80,105 +81,130 @@ const ScriptedClass *announce(const char *stage, int32 index, tresult &result)
     return result == kResultOk ? described : nullptr;
 }
 
+/// The factory of the scripted module: one object for the module's life.
+class ScriptedFactory final : public IPluginFactory3 {
+public:
+    virtual ~ScriptedFactory() = default;
+
+    tresult PLUGIN_API queryInterface(const TUID interfaceId, void **object) override
+    {
+        *object = nullptr;
+        if (!offers(interfaceId))
+            return kNoInterface;
+        *object = static_cast<IPluginFactory3 *>(this);
+        addRef();
+        return kResultOk;
+    }
+
+    uint32 PLUGIN_API addRef() override { return ++m_references; }
+
+    uint32 PLUGIN_API release() override
+    {
+        if (m_references == 0)
+            reportMisuse("the factory was released once too often");
+        if (--m_references == 0)
+            scriptedModule().stages.reach("factory-release");
+        return m_references;
+    }
+
+    tresult PLUGIN_API getFactoryInfo(PFactoryInfo *info) override
+    {
+        const ScriptedModule &module = scriptedModule();
+        module.stages.reach("factory-info");
+        const tresult result = module.result("factory-info");
+        if (result != kResultOk)
+            return result;
+        fill(info->vendor, module.vendor);
+        fill(info->url, {});
+        fill(info->email, {});
+        info->flags = PFactoryInfo::kUnicode;
+        return kResultOk;
+    }
+
+    int32 PLUGIN_API countClasses() override
+    {
+        const ScriptedModule &module = scriptedModule();
+        module.stages.reach("count-classes");
+        return module.stages.answer("count-classes") ? module.result("count-classes")
+                                                     : static_cast<int32>(module.classes.size());
+    }
+
+    tresult PLUGIN_API getClassInfo(int32 index, PClassInfo *info) override
+    {
+        tresult result = kResultOk;
+        if (const ScriptedClass *described = announce("class-info", index, result))
+            fillCommon(*info, *described);
+        return result;
+    }
+
+    tresult PLUGIN_API getClassInfo2(int32 index, PClassInfo2 *info) override
+    {
+        tresult result = kResultOk;
+        if (const ScriptedClass *described = announce("class-info2", index, result)) {
+            fillCommon(*info, *described);
+            fillNewer(*info, *described);
+        }
+        return result;
+    }
+
+    tresult PLUGIN_API getClassInfoUnicode(int32 index, PClassInfoW *info) override
+    {
+        tresult result = kResultOk;
+        if (const ScriptedClass *described = announce("class-info-unicode", index, result)) {
+            fillCommon(*info, *described);
+            fillNewer(*info, *described);
+        }
+        return result;
+    }
+
+    tresult PLUGIN_API setHostContext(FUnknown *) override
+    {
+        scriptedModule().stages.reach("set-host-context");
+        return scriptedModule().result("set-host-context");
+    }
+
+    tresult PLUGIN_API createInstance(FIDString classId, FIDString interfaceId, void **object) override
+    {
+        const ScriptedClass *described = classWithId(classId);
+        *object = nullptr;
+        if (!described)
+            return kInvalidArgument;
+        scriptedModule().stages.reach("create-instance", described->name);
+        const tresult result = scriptedModule().result("create-instance", described->name);
+        if (result != kResultOk || scriptedModule().answers("null", "create-instance", described->name))
+            return result;
+        return createComponent(*described, interfaceId, object);
+    }
+
+private:
+    bool offers(const TUID interfaceId) const
+    {
+        const FUID generations[] = {FUnknown::iid, IPluginFactory::iid, IPluginFactory2::iid,
+                                    IPluginFactory3::iid};
+        for (int generation = 0; generation <= scriptedModule().generation; ++generation) {
+            if (FUnknownPrivate::iidEqual(interfaceId, generations[generation].toTUID()))
+                return true;
+        }
+        return false;
+    }
+
+    uint32 m_references = 0;
+};
+
+/// Runs the script's first and last stage with the library's own start-up and shutdown code.
+struct ModuleLife {
+    ModuleLife() { scriptedModule().stages.reach("static-constructor"); }
+    ~ModuleLife() { scriptedModule().stages.reach("static-destructor"); }
+} moduleLife;
+
 } // namespace
 
-bool ScriptedFactory::offers(const TUID interfaceId) const
+extern "C" SMTG_EXPORT_SYMBOL IPluginFactory *PLUGIN_API GetPluginFactory()
 {
-    const FUID generations[] = {FUnknown::iid, IPluginFactory::iid, IPluginFactory2::iid,
-                                IPluginFactory3::iid};
-    for (int generation = 0; generation <= scriptedModule().generation; ++generation) {
-        if (FUnknownPrivate::iidEqual(interfaceId, generations[generation].toTUID()))
-            return true;
-    }
-    return false;
-}
-
-tresult ScriptedFactory::queryInterface(const TUID interfaceId, void **object)
-{
-    *object = nullptr;
-    if (!offers(interfaceId))
-        return kNoInterface;
-    *object = static_cast<IPluginFactory3 *>(this);
-    addRef();
-    return kResultOk;
-}
-
-uint32 ScriptedFactory::addRef() { return ++m_references; }
-
-uint32 ScriptedFactory::release()
-{
-    if (m_references == 0)
-        reportMisuse("the factory was released once too often");
-    if (--m_references == 0)
-        scriptedModule().stages.reach("factory-release");
-    return m_references;
-}
-
-tresult ScriptedFactory::getFactoryInfo(PFactoryInfo *info)
-{
-    const ScriptedModule &module = scriptedModule();
-    module.stages.reach("factory-info");
-    const tresult result = module.result("factory-info");
-    if (result != kResultOk)
-        return result;
-    fill(info->vendor, module.vendor);
-    fill(info->url, {});
-    fill(info->email, {});
-    info->flags = PFactoryInfo::kUnicode;
-    return kResultOk;
-}
-
-int32 ScriptedFactory::countClasses()
-{
-    const ScriptedModule &module = scriptedModule();
-    module.stages.reach("count-classes");
-    return module.stages.answer("count-classes") ? module.result("count-classes")
-                                                 : static_cast<int32>(module.classes.size());
-}
-
-tresult ScriptedFactory::getClassInfo(int32 index, PClassInfo *info)
-{
-    tresult result = kResultOk;
-    if (const ScriptedClass *described = announce("class-info", index, result))
-        fillCommon(*info, *described);
-    return result;
-}
-
-tresult ScriptedFactory::getClassInfo2(int32 index, PClassInfo2 *info)
-{
-    tresult result = kResultOk;
-    if (const ScriptedClass *described = announce("class-info2", index, result)) {
-        fillCommon(*info, *described);
-        fillNewer(*info, *described);
-    }
-    return result;
-}
-
-tresult ScriptedFactory::getClassInfoUnicode(int32 index, PClassInfoW *info)
-{
-    tresult result = kResultOk;
-    if (const ScriptedClass *described = announce("class-info-unicode", index, result)) {
-        fillCommon(*info, *described);
-        fillNewer(*info, *described);
-    }
-    return result;
-}
-
-tresult ScriptedFactory::setHostContext(FUnknown *)
-{
-    scriptedModule().stages.reach("set-host-context");
-    return scriptedModule().result("set-host-context");
-}
-
-tresult ScriptedFactory::createInstance(FIDString classId, FIDString interfaceId, void **object)
-{
-    const ScriptedClass *described = classWithId(classId);
-    *object = nullptr;
-    if (!described)
-        return kInvalidArgument;
-    scriptedModule().stages.reach("create-instance", described->name);
-    const tresult result = scriptedModule().result("create-instance", described->name);
-    if (result != kResultOk || scriptedModule().answers("null", "create-instance", described->name))
-        return result;
-    return ScriptedComponent::create(*described, interfaceId, object);
+    static ScriptedFactory factory;
+    scriptedModule().stages.reach("get-factory");
+    if (scriptedModule().answers("null", "get-factory"))
+        return nullptr;
+    factory.addRef();
+    return &factory;
 }

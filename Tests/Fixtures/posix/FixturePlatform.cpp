@@ -16,14 +16,6 @@
 
 namespace {
 
-const struct {
-    const char *name;
-    int number;
-} kSignals[] = {{"segv", SIGSEGV}, {"fpe", SIGFPE}, {"ill", SIGILL},  {"abrt", SIGABRT},
-                {"term", SIGTERM}, {"int", SIGINT}, {"alrm", SIGALRM}};
-
-void ignoreSignal(int) {}
-
 char *volatile repairedPage = nullptr;
 const std::size_t kPageSize = 4096;
 
@@ -74,39 +66,19 @@ void killProcess() { kill(getpid(), SIGKILL); }
 
 void endThread() { pthread_exit(nullptr); }
 
-bool changeFileMask(const std::string &octal)
-{
-    char *end = nullptr;
-    const unsigned long mask = std::strtoul(octal.c_str(), &end, 8);
-    umask(static_cast<mode_t>(mask));
-    return !octal.empty() && *end == '\0';
-}
-
-bool changeWorkingFolder(const std::string &path) { return chdir(path.c_str()) == 0; }
-
-bool installSignalHandler(const std::string &signalName)
-{
-    for (const auto &entry : kSignals) {
-        if (signalName == entry.name)
-            return std::signal(entry.number, ignoreSignal) != SIG_ERR;
-    }
-    return false;
-}
+void setFileMask(int mask) { umask(static_cast<mode_t>(mask)); }
 
 bool repairOwnViolation(const std::string &afterwards)
 {
     void *page = mmap(nullptr, kPageSize, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-    if (page == MAP_FAILED || (afterwards != "keep" && afterwards != "restore"))
+    if (page == MAP_FAILED || afterwards != "keep")
         return false;
     struct sigaction own = {};
-    struct sigaction previous = {};
     own.sa_sigaction = repairPage;
     own.sa_flags = SA_SIGINFO;
     repairedPage = static_cast<char *>(page);
-    sigaction(SIGSEGV, &own, &previous);
+    sigaction(SIGSEGV, &own, nullptr);
     *static_cast<volatile char *>(page) = 1;
-    if (afterwards == "restore")
-        sigaction(SIGSEGV, &previous, nullptr);
     return munmap(page, kPageSize) == 0;
 }
 

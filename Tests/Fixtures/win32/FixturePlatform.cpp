@@ -1,46 +1,19 @@
 #include "Tests/Fixtures/FixturePlatform.h"
 
-#include <csignal>
 #include <cstdlib>
+#include <filesystem>
 
 #include <io.h>
 #include <windows.h>
 
 namespace {
 
-const int kNoSuchSignal = 0;
-
-const struct {
-    const char *name;
-    int number;
-} kSignals[] = {{"segv", SIGSEGV}, {"fpe", SIGFPE}, {"ill", SIGILL},        {"abrt", SIGABRT},
-                {"term", SIGTERM}, {"int", SIGINT}, {"alrm", kNoSuchSignal}};
-
-void ignoreSignal(int) {}
-
-std::wstring widened(const std::string &text)
-{
-    const int length = MultiByteToWideChar(CP_UTF8, 0, text.c_str(), -1, nullptr, 0);
-    std::wstring wide(static_cast<std::size_t>(length), L'\0');
-    MultiByteToWideChar(CP_UTF8, 0, text.c_str(), -1, wide.data(), length);
-    wide.resize(wide.size() - 1);
-    return wide;
-}
-
-std::string narrowed(const std::wstring &text)
-{
-    const int length = WideCharToMultiByte(CP_UTF8, 0, text.c_str(), -1, nullptr, 0, nullptr, nullptr);
-    std::string narrow(static_cast<std::size_t>(length), '\0');
-    WideCharToMultiByte(CP_UTF8, 0, text.c_str(), -1, narrow.data(), length, nullptr, nullptr);
-    narrow.resize(narrow.size() - 1);
-    return narrow;
-}
-
 /// Whoever opens a file of ours must be able to read, append to and remove it meanwhile, as elsewhere.
 HANDLE openFile(const std::string &path, DWORD access, DWORD disposition)
 {
-    return CreateFileW(widened(path).c_str(), access, FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE,
-                       nullptr, disposition, FILE_ATTRIBUTE_NORMAL, nullptr);
+    return CreateFileW(std::filesystem::u8path(path).c_str(), access,
+                       FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr, disposition,
+                       FILE_ATTRIBUTE_NORMAL, nullptr);
 }
 
 const std::size_t kPageSize = 4096;
@@ -95,10 +68,7 @@ std::string modulePath()
                        reinterpret_cast<const wchar_t *>(&modulePath), &module);
     std::wstring path(32768, L'\0');
     path.resize(GetModuleFileNameW(module, path.data(), static_cast<DWORD>(path.size())));
-    std::string text = narrowed(path);
-    for (char &letter : text)
-        letter = letter == '\\' ? '/' : letter;
-    return text;
+    return std::filesystem::path(path).generic_u8string();
 }
 
 bool readFile(const std::string &path, std::string &content)
@@ -138,36 +108,15 @@ void killProcess() { TerminateProcess(GetCurrentProcess(), 1); }
 
 void endThread() { ExitThread(0); }
 
-bool changeFileMask(const std::string &octal)
-{
-    char *end = nullptr;
-    const unsigned long mask = std::strtoul(octal.c_str(), &end, 8);
-    _umask(static_cast<int>(mask));
-    return !octal.empty() && *end == '\0';
-}
-
-bool changeWorkingFolder(const std::string &path)
-{
-    return SetCurrentDirectoryW(widened(path).c_str()) != FALSE;
-}
-
-bool installSignalHandler(const std::string &signalName)
-{
-    for (const auto &entry : kSignals) {
-        if (signalName == entry.name)
-            return entry.number == kNoSuchSignal || std::signal(entry.number, ignoreSignal) != SIG_ERR;
-    }
-    return false;
-}
+void setFileMask(int mask) { _umask(mask); }
 
 bool repairOwnViolation(const std::string &afterwards)
 {
     void *page = VirtualAlloc(nullptr, kPageSize, MEM_RESERVE | MEM_COMMIT, PAGE_NOACCESS);
-    if (!page || (afterwards != "keep" && afterwards != "restore"))
+    if (!page || afterwards != "keep")
         return false;
     writeIntoRepairedPage(page);
-    if (afterwards == "keep")
-        SetUnhandledExceptionFilter(endAtViolation);
+    SetUnhandledExceptionFilter(endAtViolation);
     return VirtualFree(page, 0, MEM_RELEASE) != FALSE;
 }
 
