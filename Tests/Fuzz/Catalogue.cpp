@@ -8,7 +8,7 @@
 
 namespace {
 
-const QString kFile = QStringLiteral("Catalogue.xml");
+const QString kFile = "Catalogue.xml";
 
 bool anyTextHolds(const std::vector<EffectRecord> &records, const char *characters)
 {

@@ -6,7 +6,7 @@ void fuzzElf(const QByteArray &input)
     // Without the zero that a QByteArray has behind its content.
     const std::vector<uchar> bytes(input.begin(), input.end());
     const ByteView view(bytes.data(), bytes.size());
-    const QString file = QStringLiteral("module.so");
+    const QString file = "module.so";
     writeFuzzFile(file, input);
     for (const QByteArray &name : {QByteArray("VSTPluginMain"), QByteArray("main")}) {
         const ExportAnswer answer = findElfExports(view, {name});

@@ -19,10 +19,10 @@ FuzzFolder::FuzzFolder()
     : m_outside(QDir::currentPath())
 {
     debugLogSettings().off = true;
-    require(m_folder.isValid() && QDir::setCurrent(m_folder.path()) && QDir().mkdir(QStringLiteral("here")),
+    require(m_folder.isValid() && QDir::setCurrent(m_folder.path()) && QDir().mkdir("here"),
             "there is a folder for the files");
-    writeFuzzFile(QStringLiteral("here/Comp.so"), "module");
-    writeFuzzFile(QStringLiteral("here/Comp.vst3"), "module");
+    writeFuzzFile("here/Comp.so", "module");
+    writeFuzzFile("here/Comp.vst3", "module");
 }
 
 FuzzFolder::~FuzzFolder() { QDir::setCurrent(m_outside); }

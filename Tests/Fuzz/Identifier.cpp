@@ -10,7 +10,7 @@ void fuzzIdentifier(const QByteArray &input)
     const QString prefix = prefixOf(identifier);
     require(identifier.startsWith(prefix), "the prefix is the identifier's start");
     require(!formatName(prefix).isEmpty(), "each prefix has a name to show");
-    require(formatOfPrefix(prefix) == PluginFormat::Unknown || prefix.endsWith(QLatin1Char(':')),
+    require(formatOfPrefix(prefix) == PluginFormat::Unknown || prefix.endsWith(':'),
             "what names a format ends with a colon");
 
     const QString id = identifier.mid(prefix.size());
@@ -25,6 +25,6 @@ void fuzzIdentifier(const QByteArray &input)
     record.enabled = false; // so that nothing is loaded
     const bool isAdded = host.AddEffect(record);
     require(isAdded != id.isEmpty(), "every identifier but the empty one can be listed");
-    for (const QString &key : {id, QStringLiteral("Waves ") + id})
+    for (const QString &key : {id, "Waves " + id})
         require(host.loadPlugin(key).isKnown == isAdded, "a plug-in is found by its key, and by its old one");
 }

@@ -16,7 +16,7 @@
 
 namespace {
 
-const QString kCatalogues = QStringLiteral("Effects");
+const QString kCatalogues = "Effects";
 const QByteArray kSeparator = "\n--- marker\n";
 
 void checkVersion(const CatalogueFormat &format, const QString &catalogue)
@@ -47,8 +47,8 @@ void checkKnown(const KnownList &known)
     for (const EffectRecord *record : known.all()) {
         require(known.lookUp(record->path).how == KnownAs::Own, "each record is its own file's");
         checkLookUp(known, record->path);
-        checkLookUp(known, QStringLiteral("here/") + fileNameOf(record->path));
-        checkLookUp(known, QStringLiteral("gone/") + fileNameOf(record->path));
+        checkLookUp(known, "here/" + fileNameOf(record->path));
+        checkLookUp(known, "gone/" + fileNameOf(record->path));
     }
 }
 
@@ -73,7 +73,7 @@ template <typename Host>
 void readLeftovers(const CatalogueFormat &format, const QByteArray &catalogue, const QByteArray &marker)
 {
     const QString cataloguePath = kCatalogues + QLatin1String(format.fileName);
-    const QString markerPath = kCatalogues + QLatin1String("/Marker") + QLatin1String(format.marker.ending);
+    const QString markerPath = kCatalogues + "/Marker" + QLatin1String(format.marker.ending);
     writeFuzzFile(cataloguePath, catalogue);
     checkVersion(format, cataloguePath);
     if (!marker.isNull())

@@ -7,7 +7,7 @@ namespace {
 
 void readAndWrite(const MarkerFormat &format, const QByteArray &input)
 {
-    const QString name = QStringLiteral("Marker");
+    const QString name = "Marker";
     writeFuzzFile(name, input);
     const EffectRecord read = readMarkerFile(format, name);
     require(!read.enabled && (format.hasSubId || read.subId == 0), "a marker names what is not enabled");

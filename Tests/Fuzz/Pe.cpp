@@ -23,13 +23,13 @@ void fuzzPe(const QByteArray &input)
     if (const std::optional<PeImage> image = PeImage::read(ByteView(bytes.data(), bytes.size())))
         readTables(*image, input);
 
-    const QString file = QStringLiteral("library.dll");
+    const QString file = "library.dll";
     writeFuzzFile(file, input);
     // Of the libraries that it needs, some are missing, some load, and the others are this one again.
     const auto search = [&](const QString &name) -> std::optional<QString> {
-        if (name.startsWith(QLatin1Char('m')))
+        if (name.startsWith('m'))
             return std::nullopt;
-        return name.startsWith(QLatin1Char('k')) ? QString() : file;
+        return name.startsWith('k') ? QString() : file;
     };
     whyNotLoadable(file, search);
 }

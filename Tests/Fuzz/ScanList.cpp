@@ -7,7 +7,7 @@ void fuzzScanList(const QByteArray &input)
     const QString path = QString::fromUtf8(input);
     require(path.startsWith(dataFolderOf(path)), "the data folder is the start of the list's path");
 
-    const QString list = QStringLiteral("FXScan.xml");
+    const QString list = "FXScan.xml";
     writeFuzzFile(list, input);
     const QStringList folders = ReadScanList(list);
     if (anyHolds({folders.join(QString())}, "<&"))

@@ -6,11 +6,11 @@
 
 namespace {
 
-const QString kComp = QStringLiteral("Comp");
+const QString kComp = "Comp";
 
 class CatalogueState : public ScannerTest {
 protected:
-    QString temporaryPath() const { return cataloguePath() + QStringLiteral(".tmp"); }
+    QString temporaryPath() const { return cataloguePath() + ".tmp"; }
     QDateTime modified() const { return QFileInfo(cataloguePath()).lastModified(); }
 };
 
@@ -37,8 +37,7 @@ TEST_F(CatalogueState, AnUnusableCatalogueIsReplaced)
         const ScannerOutcome outcome = run();
         EXPECT_TRUE(outcome.succeeded());
         EXPECT_EQ(m_folder.catalogue(), good);
-        EXPECT_EQ(
-            logLines(outcome).filter(QStringLiteral("Cannot use the catalogue ") + cataloguePath()).size(), 1)
+        EXPECT_EQ(logLines(outcome).filter("Cannot use the catalogue " + cataloguePath()).size(), 1)
             << qPrintable(outcome.log);
     }
 }
@@ -46,13 +45,12 @@ TEST_F(CatalogueState, AnUnusableCatalogueIsReplaced)
 TEST_F(CatalogueState, AFolderInThePlaceOfTheCatalogueStays)
 {
     addModule(kComp);
-    m_folder.write(QStringLiteral("Effects/VST3Configuration.xml/kept"), "old");
+    m_folder.write("Effects/VST3Configuration.xml/kept", "old");
     const ScannerOutcome outcome = run();
     EXPECT_TRUE(outcome.succeeded());
     EXPECT_EQ(loaded(), QStringList()) << "nothing would come of it";
-    EXPECT_FALSE(logLines(outcome).filter(QStringLiteral("Cannot write the catalogue")).isEmpty())
-        << qPrintable(outcome.log);
-    EXPECT_EQ(QDir(cataloguePath()).entryList(QDir::Files), QStringList(QStringLiteral("kept")));
+    EXPECT_FALSE(logLines(outcome).filter("Cannot write the catalogue").isEmpty()) << qPrintable(outcome.log);
+    EXPECT_EQ(QDir(cataloguePath()).entryList(QDir::Files), QStringList("kept"));
     EXPECT_EQ(m_folder.markers(), QStringList());
     EXPECT_FALSE(QFileInfo::exists(temporaryPath()));
 }
@@ -65,10 +63,10 @@ TEST_F(CatalogueState, LeftoversOfATemporaryFileDoNoHarm)
     EXPECT_EQ(listed(), QStringList(kComp));
     EXPECT_FALSE(QFileInfo::exists(temporaryPath()));
 
-    m_folder.write(temporaryPath() + QStringLiteral("/x"), "a folder in its place");
-    addModule(QStringLiteral("New"));
+    m_folder.write(temporaryPath() + "/x", "a folder in its place");
+    addModule("New");
     EXPECT_TRUE(run().succeeded());
-    EXPECT_EQ(listed(), QStringList({kComp, QStringLiteral("New")}));
+    EXPECT_EQ(listed(), QStringList({kComp, "New"}));
 }
 
 TEST_F(CatalogueState, EarlierVersionsAreBroughtUpToDateWithoutLoadingAnything)
@@ -88,7 +86,7 @@ TEST_F(CatalogueState, EarlierVersionsAreBroughtUpToDateWithoutLoadingAnything)
 
 TEST_F(CatalogueState, NothingNewLoadsNothingAndWritesNothing)
 {
-    addListedModules({kComp, QStringLiteral("Delay")});
+    addListedModules({kComp, "Delay"});
     m_folder.setModified(cataloguePath(), listedTime());
     const auto before = effectsFolder();
     const ScannerOutcome outcome = run();

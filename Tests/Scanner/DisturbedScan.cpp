@@ -19,7 +19,7 @@ std::set<QString> DisturbedScan::namedByMarkers() const
 {
     std::set<QString> named;
     for (const QString &marker : m_folder.markers())
-        named.insert(marker.section(QLatin1Char('.'), 0, 0));
+        named.insert(marker.section('.', 0, 0));
     return named;
 }
 

@@ -14,6 +14,6 @@ protected:
     /// not `named` must be as it was.
     void expectSettled(const std::set<QString> &named) const;
 
-    static QString switchedOff() { return QStringLiteral("M03"); }
+    static QString switchedOff() { return "M03"; }
     QStringList m_names;
 };

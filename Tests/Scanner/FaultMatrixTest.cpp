@@ -49,14 +49,11 @@ shell  close              ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            
 shell  static-destructor  M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
 )";
 
-const QStringList kFormats{QStringLiteral("vst3"), QStringLiteral("vst2"), QStringLiteral("shell")};
+const QStringList kFormats{"vst3", "vst2", "shell"};
 
-QStringList words(const QString &line) { return line.split(QLatin1Char(' '), Qt::SkipEmptyParts); }
+QStringList words(const QString &line) { return line.split(' ', Qt::SkipEmptyParts); }
 
-QStringList matrixLines()
-{
-    return QString::fromLatin1(kMatrix).split(QLatin1Char('\n'), Qt::SkipEmptyParts);
-}
+QStringList matrixLines() { return QString::fromLatin1(kMatrix).split('\n', Qt::SkipEmptyParts); }
 
 /// A line of the matrix: the format and the stage, then what becomes of each kind of fault.
 class FaultMatrix : public ScannerTest, public testing::WithParamInterface<int> {
@@ -69,16 +66,14 @@ protected:
     {}
     bool isOfOnePlugin() const
     {
-        static const QRegularExpression whole(QStringLiteral("^(static|module|factory|get-factory|count)"));
-        return m_format == QLatin1String("shell")
-                   ? m_stage != QLatin1String("static-destructor")
-                   : m_format == QLatin1String("vst3") && !whole.match(m_stage).hasMatch();
+        static const QRegularExpression whole("^(static|module|factory|get-factory|count)");
+        return m_format == "shell" ? m_stage != "static-destructor"
+                                   : m_format == "vst3" && !whole.match(m_stage).hasMatch();
     }
     /// What the module's trace holds once the fault is being committed.
     QString faultLine(const QString &kind) const
     {
-        return kind + QLatin1Char(' ') + m_stage +
-               (isOfOnePlugin() ? QLatin1Char(' ') + kind + QStringLiteral(" B") : QString());
+        return kind + ' ' + m_stage + (isOfOnePlugin() ? ' ' + kind + " B" : QString());
     }
     bool hasReached(const QString &kind) const
     {
@@ -91,15 +86,13 @@ protected:
     {
         const QByteArray name = kind.toUtf8();
         QByteArray script = "trace \"" + tracePath().toUtf8() + "\" " + name + '\n';
-        if (m_format != QLatin1String("vst2"))
+        if (m_format != "vst2")
             for (const char *letter : {"A", "B", "C"})
-                script +=
-                    (m_format == QLatin1String("vst3") ? "class \""
-                                                       : "child " + QByteArray::number(*letter) + " \"") +
-                    name + ' ' + letter + "\"\n";
+                script += (m_format == "vst3" ? "class \"" : "child " + QByteArray::number(*letter) + " \"") +
+                          name + ' ' + letter + "\"\n";
         script +=
             "fault " + m_stage.toUtf8() + ' ' + name + (isOfOnePlugin() ? " \"" + name + " B\"\n" : "\n");
-        if (m_format == QLatin1String("vst3"))
+        if (m_format == "vst3")
             addVST3File(m_folder.plugins(), kind, script);
         else
             addVST2File(m_folder.plugins(), kind, script);
@@ -112,7 +105,7 @@ protected:
             forgetTrace();
             ScannerRun scanner(scannerProgram(), m_folder);
             EXPECT_TRUE(scanner.start());
-            if (scanner.waitUntil([this] { return hasReached(QStringLiteral("hang")); }))
+            if (scanner.waitUntil([this] { return hasReached("hang"); }))
                 scanner.kill();
             scanner.wait();
             if (m_folder.markers().isEmpty())
@@ -129,22 +122,19 @@ protected:
 
 QString FaultMatrix::found(const QString &kind) const
 {
-    const bool isVst3 = m_format == QLatin1String("vst3");
+    const bool isVst3 = m_format == "vst3";
     QStringList found;
     const CatalogueContents contents =
         isVst3 ? readCatalogueFile(vst3CatalogueFormat(), cataloguePath())
-               : readCatalogueFile(vstCatalogueFormat(),
-                                   m_folder.effects() + QStringLiteral("/FXConfiguration.xml"));
+               : readCatalogueFile(vstCatalogueFormat(), m_folder.effects() + "/FXConfiguration.xml");
     for (const EffectRecord &record : contents.records) {
         if (QFileInfo(record.path).completeBaseName() != kind)
             continue;
-        found.append((record.name == kind ? QStringLiteral("M") : record.name.right(1)) +
-                     QLatin1String(record.working   ? ""
-                                   : record.enabled ? "?"
-                                                    : "!"));
+        const char *state = record.working ? "" : record.enabled ? "?" : "!";
+        found.append((record.name == kind ? "M" : record.name.right(1)) + state);
     }
     found.sort();
-    return found.isEmpty() ? QStringLiteral("-") : found.join(QString());
+    return found.isEmpty() ? "-" : found.join(QString());
 }
 
 } // namespace
@@ -158,14 +148,13 @@ TEST_P(FaultMatrix, EndsAsItSays)
     for (const QString &kind : m_kinds)
         cells.append(found(kind));
     for (const QString &cell : m_cells)
-        expected.append(cell.contains(QLatin1Char('/')) ? cell.split(QLatin1Char('/')).value(kSystemsPlace)
-                                                        : cell);
-    EXPECT_EQ(cells.join(QLatin1Char(' ')), expected.join(QLatin1Char(' ')));
-    EXPECT_EQ(needed, cells.join(QString()).count(QLatin1Char('!')) + 1) << "one run each, and the last one";
+        expected.append(cell.contains('/') ? cell.split('/').value(kSystemsPlace) : cell);
+    EXPECT_EQ(cells.join(' '), expected.join(' '));
+    EXPECT_EQ(needed, cells.join(QString()).count('!') + 1) << "one run each, and the last one";
 }
 
 INSTANTIATE_TEST_SUITE_P(Of, FaultMatrix, testing::Range(1, static_cast<int>(matrixLines().size())),
                          [](const auto &row) {
                              const QStringList line = words(matrixLines().at(row.param)).mid(0, 2);
-                             return line.join(QLatin1Char('_')).remove(QLatin1Char('-')).toStdString();
+                             return line.join('_').remove('-').toStdString();
                          });

@@ -8,11 +8,11 @@ namespace {
 const QDateTime kUsual({2021, 3, 4}, {5, 6});
 
 /// So many characters that a module in it has a path of more than 500.
-QString deepFolder() { return (QString(120, QLatin1Char('d')) + QLatin1Char('/')).repeated(4); }
+QString deepFolder() { return (QString(120, 'd') + '/').repeated(4); }
 
 class OddPlugins : public ScannerTest {
 protected:
-    QString vst2CataloguePath() const { return m_folder.effects() + QStringLiteral("/FXConfiguration.xml"); }
+    QString vst2CataloguePath() const { return m_folder.effects() + "/FXConfiguration.xml"; }
     QByteArray catalogues() const
     {
         return m_folder.read(cataloguePath()) + m_folder.read(vst2CataloguePath());
@@ -29,14 +29,14 @@ TEST_F(OddPlugins, AreListedOrBlamedAsOthersAre)
         QDateTime date;
         bool kills;
     } rows[] = {
-        {QStringLiteral("a/Comp"), kUsual, false},
-        {QStringLiteral("b/comp"), kUsual, false}, // differs in nothing but case
-        {QStringLiteral("c/Start of 1970"), QDateTime::fromMSecsSinceEpoch(0), false},
-        {QStringLiteral("c/Future"), QDateTime({2099, 12, 31}, {23, 59}), false},
-        {deepFolder() + QStringLiteral("Deep"), kUsual, false},
-        {deepFolder() + QStringLiteral("Deadly"), kUsual, true},
-        {QString::fromUtf8("日本 🎛/音 🎛"), kUsual, false},
-        {QString::fromUtf8("日本 🎛/致命的 💥"), kUsual, true},
+        {"a/Comp", kUsual, false},
+        {"b/comp", kUsual, false}, // differs in nothing but case
+        {"c/Start of 1970", QDateTime::fromMSecsSinceEpoch(0), false},
+        {"c/Future", QDateTime({2099, 12, 31}, {23, 59}), false},
+        {deepFolder() + "Deep", kUsual, false},
+        {deepFolder() + "Deadly", kUsual, true},
+        {"日本 🎛/音 🎛", kUsual, false},
+        {"日本 🎛/致命的 💥", kUsual, true},
     };
     int killers = 0;
     for (const auto &row : rows) {
@@ -68,23 +68,22 @@ TEST_F(OddPlugins, AreListedOrBlamedAsOthersAre)
 
 TEST_F(OddPlugins, AFolderThatChangesDuringTheScan)
 {
-    addModule(QStringLiteral("A"), "delay initialize 500\n");
+    addModule("A", "delay initialize 500\n");
     for (const char *name : {"B", "C", "D"})
         addModule(QString::fromLatin1(name));
     ScannerRun scanner(scannerProgram(), m_folder);
     ASSERT_TRUE(scanner.start());
-    ASSERT_TRUE(waitForStage(scanner, QStringLiteral("A"), QStringLiteral("initialize")));
-    EXPECT_TRUE(QFile::remove(m_folder.path(QStringLiteral("Plugins/B.vst3"))));
-    m_folder.write(QStringLiteral("Plugins/C.vst3"), "no module");
-    addModule(QStringLiteral("E"));
+    ASSERT_TRUE(waitForStage(scanner, "A", "initialize"));
+    EXPECT_TRUE(QFile::remove(m_folder.path("Plugins/B.vst3")));
+    m_folder.write("Plugins/C.vst3", "no module");
+    addModule("E");
     EXPECT_TRUE(scanner.wait().succeeded());
     EXPECT_EQ(m_folder.markers(), QStringList());
     const auto first = records();
-    EXPECT_TRUE(first.at(QStringLiteral("A")).working && first.at(QStringLiteral("D")).working);
-    EXPECT_FALSE(first.at(QStringLiteral("C")).working);
-    EXPECT_EQ(first.count(QStringLiteral("E")), 0u) << "came after the folder was read";
+    EXPECT_TRUE(first.at("A").working && first.at("D").working);
+    EXPECT_FALSE(first.at("C").working);
+    EXPECT_EQ(first.count("E"), 0u) << "came after the folder was read";
 
     EXPECT_TRUE(run().succeeded());
-    EXPECT_EQ(listed(), QStringList({QStringLiteral("A"), QStringLiteral("C"), QStringLiteral("D"),
-                                     QStringLiteral("E")}));
+    EXPECT_EQ(listed(), QStringList({"A", "C", "D", "E"}));
 }

@@ -23,7 +23,7 @@ protected:
 
 TEST_F(ScanFolders, ScanListsThatNameNothing)
 {
-    addModule(QStringLiteral("Comp"));
+    addModule("Comp");
     const struct {
         const char *name;
         QByteArray scanList;
@@ -53,22 +53,21 @@ TEST_F(ScanFolders, ScanListsThatNameNothing)
 
 TEST_F(ScanFolders, AFolderThatCannotBeSearchedCostsOneLogLine)
 {
-    const QString shut = m_folder.path(QStringLiteral("Shut"));
-    m_folder.write(QStringLiteral("File"), "x");
-    m_folder.write(QStringLiteral("Shut/x"), "x");
+    const QString shut = m_folder.path("Shut");
+    m_folder.write("File", "x");
+    m_folder.write("Shut/x", "x");
     const struct {
         const char *name;
         QString folder;
         const char *reason;
     } rows[] = {
-        {"does not exist", m_folder.path(QStringLiteral("Missing")), "it does not exist"},
-        {"does not exist, foreign letters", m_folder.path(QString::fromUtf8("無い 🎛")),
-         "it does not exist"},
-        {"is a file", m_folder.path(QStringLiteral("File")), "it is not a folder"},
+        {"does not exist", m_folder.path("Missing"), "it does not exist"},
+        {"does not exist, foreign letters", m_folder.path("無い 🎛"), "it does not exist"},
+        {"is a file", m_folder.path("File"), "it is not a folder"},
         {"is an empty path, not the working folder", QString(""), "no folder is given"},
         {"is not readable", shut, "Permission denied"},
     };
-    addModule(QStringLiteral("Comp"));
+    addModule("Comp");
     QFile::setPermissions(shut, QFile::Permissions());
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
@@ -78,7 +77,7 @@ TEST_F(ScanFolders, AFolderThatCannotBeSearchedCostsOneLogLine)
         EXPECT_TRUE(outcome.succeeded());
         EXPECT_EQ(logLines(outcome), QStringList(QStringLiteral("Cannot search the folder \"%1\": %2")
                                                      .arg(row.folder, QLatin1String(row.reason))));
-        EXPECT_EQ(listed(), QStringList(QStringLiteral("Comp")));
+        EXPECT_EQ(listed(), QStringList("Comp"));
     }
     QFile::setPermissions(shut, QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
 }
@@ -86,27 +85,19 @@ TEST_F(ScanFolders, AFolderThatCannotBeSearchedCostsOneLogLine)
 TEST_F(ScanFolders, AModuleReachedInSeveralWaysIsProbedOnce)
 {
     const QString folder = m_folder.plugins();
-    const QString inner = folder + QStringLiteral("/Inner");
-    addVST3File(inner, QStringLiteral("Deep"), "trace \"" + tracePath().toUtf8() + "\" Deep\nclass Deep\n");
-    addModule(QStringLiteral("Comp"));
+    const QString inner = folder + "/Inner";
+    addVST3File(inner, "Deep", "trace \"" + tracePath().toUtf8() + "\" Deep\nclass Deep\n");
+    addModule("Comp");
     const struct {
         const char *name;
         QStringList folders;
         QStringList order;
     } rows[] = {
-        {"the same folder twice", {folder, folder}, {QStringLiteral("Comp"), QStringLiteral("Deep")}},
-        {"with and without a slash behind it",
-         {folder, folder + QLatin1Char('/')},
-         {QStringLiteral("Comp"), QStringLiteral("Deep")}},
-        {"a folder inside another, listed later",
-         {folder, inner},
-         {QStringLiteral("Comp"), QStringLiteral("Deep")}},
-        {"a folder inside another, listed first",
-         {inner, folder},
-         {QStringLiteral("Deep"), QStringLiteral("Comp")}},
-        {"a detour",
-         {inner + QStringLiteral("/.."), folder},
-         {QStringLiteral("Comp"), QStringLiteral("Deep")}},
+        {"the same folder twice", {folder, folder}, {"Comp", "Deep"}},
+        {"with and without a slash behind it", {folder, folder + '/'}, {"Comp", "Deep"}},
+        {"a folder inside another, listed later", {folder, inner}, {"Comp", "Deep"}},
+        {"a folder inside another, listed first", {inner, folder}, {"Deep", "Comp"}},
+        {"a detour", {inner + "/..", folder}, {"Comp", "Deep"}},
     };
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
@@ -116,6 +107,6 @@ TEST_F(ScanFolders, AModuleReachedInSeveralWaysIsProbedOnce)
         EXPECT_TRUE(outcome.succeeded());
         EXPECT_EQ(loaded(), row.order);
         EXPECT_EQ(logLines(outcome), QStringList());
-        EXPECT_EQ(listed(), QStringList({QStringLiteral("Comp"), QStringLiteral("Deep")}));
+        EXPECT_EQ(listed(), QStringList({"Comp", "Deep"}));
     }
 }

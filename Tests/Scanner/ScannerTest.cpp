@@ -14,11 +14,11 @@ QByteArray textLines(QByteArray text) { return text.replace("\n", kLineEnd); }
 
 QStringList logLines(const ScannerOutcome &outcome)
 {
-    static const QRegularExpression timeStamp(QStringLiteral("^ *\\d+\\.\\d{3}: "));
-    QStringList lines = outcome.log.split(QRegularExpression(QStringLiteral("\r?\n")), Qt::SkipEmptyParts);
+    static const QRegularExpression timeStamp("^ *\\d+\\.\\d{3}: ");
+    QStringList lines = outcome.log.split(QRegularExpression("\r?\n"), Qt::SkipEmptyParts);
     for (QString &line : lines)
         line.remove(timeStamp);
-    EXPECT_EQ(lines.removeAll(QStringLiteral("Plugin Scan Complete")), 1) << qPrintable(outcome.log);
+    EXPECT_EQ(lines.removeAll("Plugin Scan Complete"), 1) << qPrintable(outcome.log);
     return lines;
 }
 
@@ -55,9 +55,17 @@ void ScannerTest::editCatalogue(const char *from, const char *to) const
     m_folder.write(cataloguePath(), text.replace(from, to));
 }
 
+ScannerOutcome ScannerTest::run(const std::map<QString, QString> &environment) const
+{
+    ScannerRun scanner(scannerProgram(), m_folder);
+    for (const auto &[name, value] : environment)
+        value.isNull() ? scanner.removeEnvironment(name) : scanner.setEnvironment(name, value);
+    return scanner.run();
+}
+
 QStringList ScannerTest::loaded() const
 {
-    const QString ending = QStringLiteral(" static-constructor");
+    const QString ending = " static-constructor";
     QStringList names;
     for (const QString &line : trace())
         if (line.endsWith(ending))
@@ -67,7 +75,7 @@ QStringList ScannerTest::loaded() const
 
 bool ScannerTest::waitForStage(ScannerRun &scanner, const QString &module, const QString &stage) const
 {
-    const QString start = module + QLatin1Char(' ') + stage;
+    const QString start = module + ' ' + stage;
     return scanner.waitUntil([&] {
         for (const QString &line : trace())
             if (line.startsWith(start))

@@ -32,8 +32,9 @@ protected:
     static QDateTime listedTime() { return {QDate(2020, 1, 2), QTime(3, 4)}; }
     static QDateTime touchedTime() { return {QDate(2021, 5, 6), QTime(7, 8)}; }
 
-    ScannerOutcome run() const { return ScannerRun(scannerProgram(), m_folder).run(); }
-    QString tracePath() const { return m_folder.path(QStringLiteral("trace")); }
+    /// A whole run, with these variables in its environment, or without those that are null.
+    ScannerOutcome run(const std::map<QString, QString> &environment = {}) const;
+    QString tracePath() const { return m_folder.path("trace"); }
     QStringList trace() const { return m_folder.lines(tracePath()); }
     void forgetTrace() const { m_folder.write(tracePath(), {}); }
     /// The names of the modules that were loaded, in the order of loading.
@@ -41,7 +42,7 @@ protected:
     /// Waits until a module has got as far as a stage of its trace.
     bool waitForStage(ScannerRun &scanner, const QString &module, const QString &stage) const;
 
-    QString cataloguePath() const { return m_folder.effects() + QStringLiteral("/VST3Configuration.xml"); }
+    QString cataloguePath() const { return m_folder.effects() + "/VST3Configuration.xml"; }
     /// The catalogue's records by module name; the test fails when the file is not complete.
     std::map<QString, EffectRecord> records() const;
     /// The names of the listed modules, sorted.

@@ -8,15 +8,12 @@ class SecondScanner : public ScannerTest {
 protected:
     SecondScanner()
     {
-        addModule(QStringLiteral("Slow"), "class Slow\nfault initialize hang\n");
-        addModule(QStringLiteral("After"));
-        m_folder.write(QStringLiteral("Effects/Earlier.scan"), "<CrashedPlugin>");
+        addModule("Slow", "class Slow\nfault initialize hang\n");
+        addModule("After");
+        m_folder.write("Effects/Earlier.scan", "<CrashedPlugin>");
     }
     /// Starts a scanner that stops in the middle of its second module.
-    bool startFirst()
-    {
-        return m_first.start() && waitForStage(m_first, QStringLiteral("Slow"), "initialize");
-    }
+    bool startFirst() { return m_first.start() && waitForStage(m_first, "Slow", "initialize"); }
 
     ScannerRun m_first{scannerProgram(), m_folder};
 };
@@ -25,14 +22,13 @@ protected:
 
 TEST_F(SecondScanner, LeavesABusyFolderAlone)
 {
-    const QString link = m_folder.path(QStringLiteral("Link"));
+    const QString link = m_folder.path("Link");
     const bool linked = QFile::link(m_folder.dataFolder(), link);
     ASSERT_TRUE(startFirst());
     const auto before = effectsFolder();
     const QStringList traceBefore = trace();
-    for (const QString &scanList :
-         {m_folder.scanList(), m_folder.path(QStringLiteral("Effects/../Effects/FXScan.xml")),
-          link + QStringLiteral("/Effects/FXScan.xml")}) {
+    for (const QString &scanList : {m_folder.scanList(), m_folder.path("Effects/../Effects/FXScan.xml"),
+                                    link + "/Effects/FXScan.xml"}) {
         SCOPED_TRACE(qPrintable(scanList));
         if (!linked && scanList.startsWith(link))
             continue;
@@ -40,8 +36,7 @@ TEST_F(SecondScanner, LeavesABusyFolderAlone)
         second.setArguments({scanList});
         const ScannerOutcome outcome = second.run();
         EXPECT_TRUE(outcome.succeeded());
-        EXPECT_TRUE(outcome.log.contains(QStringLiteral("Another scanner is at work")))
-            << qPrintable(outcome.log);
+        EXPECT_TRUE(outcome.log.contains("Another scanner is at work")) << qPrintable(outcome.log);
         EXPECT_EQ(effectsFolder(), before);
         EXPECT_EQ(trace(), traceBefore);
     }
@@ -51,9 +46,9 @@ TEST_F(SecondScanner, AnotherFolderIsAnotherMatter)
 {
     ASSERT_TRUE(startFirst());
     const TestFolder other;
-    addVST3File(other.plugins(), QStringLiteral("Comp"));
+    addVST3File(other.plugins(), "Comp");
     other.writeScanList();
     EXPECT_TRUE(ScannerRun(scannerProgram(), other).run().succeeded());
     EXPECT_TRUE(other.catalogue().contains("<Name>Comp</Name>")) << other.catalogue().constData();
-    EXPECT_TRUE(m_folder.markers().contains(QStringLiteral("Slow.scan3")));
+    EXPECT_TRUE(m_folder.markers().contains("Slow.scan3"));
 }

@@ -19,12 +19,12 @@ TEST_P(Termination, ASlowPluginIsWaitedForAndKept)
 {
     slowDown("delay initialize 500\n");
     EXPECT_TRUE(interrupt({GetParam()}).succeeded());
-    EXPECT_EQ(renewed(), QStringList({QStringLiteral("A"), QStringLiteral("B")}));
+    EXPECT_EQ(renewed(), QStringList({"A", "B"}));
     EXPECT_EQ(m_folder.markers(), QStringList());
 
     forgetTrace();
     EXPECT_TRUE(run().succeeded());
-    EXPECT_EQ(loaded(), QStringList(QStringLiteral("C")));
+    EXPECT_EQ(loaded(), QStringList("C"));
     EXPECT_EQ(renewed(), kThree);
 }
 
@@ -37,11 +37,11 @@ TEST_P(Termination, APluginThatHangsIsLeftAndNotBlamed)
     EXPECT_GE(clock.elapsed(), 2000);
     EXPECT_LT(clock.elapsed(), 10000);
     EXPECT_EQ(m_folder.markers(), QStringList());
-    EXPECT_EQ(renewed(), QStringList(QStringLiteral("A")));
+    EXPECT_EQ(renewed(), QStringList("A"));
 
     slowDown({});
     EXPECT_TRUE(run().succeeded());
-    EXPECT_EQ(loaded(), QStringList({QStringLiteral("B"), QStringLiteral("C")}));
+    EXPECT_EQ(loaded(), QStringList({"B", "C"}));
     EXPECT_EQ(renewed(), kThree);
 }
 

@@ -8,7 +8,7 @@
 
 void putFixture(const QString &source, const QString &path, const QByteArray &script)
 {
-    QFile scriptFile(path + QStringLiteral(".script"));
+    QFile scriptFile(path + ".script");
     QDir().mkpath(QFileInfo(path).path());
     QFile::remove(path);
     scriptFile.remove();

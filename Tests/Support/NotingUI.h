@@ -12,7 +12,7 @@ public:
     void showStatus(int level, const QString &text) override { heard << QString::number(level) + ' ' + text; }
     void notify(quint32 value) override { heard << "notified " + QString::number(value, 16); }
     void warn(const QString &text) override { heard << "warned " + text; }
-    void requestShow() override { heard << QStringLiteral("show"); }
+    void requestShow() override { heard << "show"; }
     int messageBox(const QString &text, int flags) override
     {
         heard << "box " + text;

@@ -20,18 +20,14 @@ void settleSanitizers(QProcessEnvironment &environment)
         QStringLiteral(
             "exitcode=%1:handle_segv=0:handle_sigbus=0:handle_sigfpe=0:handle_sigill=0:handle_abort=0")
             .arg(kSanitizerExit);
-    for (const QString &name :
-         {QStringLiteral("ASAN_OPTIONS"), QStringLiteral("UBSAN_OPTIONS"), QStringLiteral("TSAN_OPTIONS")}) {
+    for (const char *name : {"ASAN_OPTIONS", "UBSAN_OPTIONS", "TSAN_OPTIONS"}) {
         const QString given = environment.value(name);
-        environment.insert(name, given.isEmpty() ? settings : settings + QLatin1Char(':') + given);
+        environment.insert(name, given.isEmpty() ? settings : settings + ':' + given);
     }
     // Who leaves by leaveProcess leaves threads that have ended unjoined.
-    const QString tsan = QStringLiteral("TSAN_OPTIONS");
-    environment.insert(tsan,
-                       QStringLiteral("report_thread_leaks=0:suppressions=" FXPROBE_RACE_SUPPRESSIONS ":") +
-                           environment.value(tsan));
-    environment.insert(QStringLiteral("LSAN_OPTIONS"),
-                       QStringLiteral("print_suppressions=0:suppressions=" FXPROBE_LEAK_SUPPRESSIONS));
+    environment.insert("TSAN_OPTIONS", "report_thread_leaks=0:suppressions=" FXPROBE_RACE_SUPPRESSIONS ":" +
+                                           environment.value("TSAN_OPTIONS"));
+    environment.insert("LSAN_OPTIONS", "print_suppressions=0:suppressions=" FXPROBE_LEAK_SUPPRESSIONS);
 }
 
 bool holdsSanitizerReport(const QByteArray &text)
@@ -52,8 +48,8 @@ ScannerRun::ScannerRun(const QString &program, const TestFolder &folder)
     , m_arguments(folder.scanList())
     , m_environment(QProcessEnvironment::systemEnvironment())
 {
-    m_environment.insert(QStringLiteral("QT_QPA_PLATFORM"), QStringLiteral("offscreen"));
-    m_environment.insert(QStringLiteral("FXPROBE_LOG"), folder.path(QLatin1String(kLogFile)));
+    m_environment.insert("QT_QPA_PLATFORM", "offscreen");
+    m_environment.insert("FXPROBE_LOG", folder.path(QLatin1String(kLogFile)));
     settleSanitizers(m_environment);
 }
 
@@ -137,6 +133,6 @@ std::vector<ScannerOutcome> runUntilSettled(const QString &program, const TestFo
         outcomes.push_back(run.run());
     } while (!folder.markers().isEmpty() && static_cast<int>(outcomes.size()) < mostRuns &&
              outcomes.back().started);
-    EXPECT_TRUE(folder.markers().isEmpty()) << qPrintable(folder.markers().join(QStringLiteral(", ")));
+    EXPECT_TRUE(folder.markers().isEmpty()) << qPrintable(folder.markers().join(", "));
     return outcomes;
 }

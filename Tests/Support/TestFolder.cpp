@@ -9,7 +9,7 @@
 #include <gtest/gtest.h>
 
 TestFolder::TestFolder()
-    : m_folder(QDir::temp().filePath(QStringLiteral("fxprobe-test-XXXXXX")))
+    : m_folder(QDir::temp().filePath("fxprobe-test-XXXXXX"))
 {
     const bool made =
         m_folder.isValid() && QDir(dataFolder()).mkpath(effects()) && QDir(dataFolder()).mkpath(plugins());
@@ -36,10 +36,10 @@ QByteArray TestFolder::read(const QString &file) const
 
 QStringList TestFolder::lines(const QString &file) const
 {
-    QString text = QString::fromUtf8(read(file)).remove(QLatin1Char('\r'));
-    if (text.endsWith(QLatin1Char('\n')))
+    QString text = QString::fromUtf8(read(file)).remove('\r');
+    if (text.endsWith('\n'))
         text.chop(1);
-    return text.isEmpty() ? QStringList() : text.split(QLatin1Char('\n'));
+    return text.isEmpty() ? QStringList() : text.split('\n');
 }
 
 void TestFolder::writeScanList(QStringList folders) const
@@ -52,15 +52,11 @@ void TestFolder::writeScanList(QStringList folders) const
     write(scanList(), content.replace("\n", kLineEnd) + "</Scan>" + kLineEnd);
 }
 
-QByteArray TestFolder::catalogue(const QString &name) const
-{
-    return read(effects() + QLatin1Char('/') + name);
-}
+QByteArray TestFolder::catalogue(const QString &name) const { return read(effects() + '/' + name); }
 
 QStringList TestFolder::markers() const
 {
-    return QDir(effects()).entryList({QStringLiteral("*.scan"), QStringLiteral("*.scan3")},
-                                     QDir::Files | QDir::Hidden, QDir::Name);
+    return QDir(effects()).entryList({"*.scan", "*.scan3"}, QDir::Files | QDir::Hidden, QDir::Name);
 }
 
 void TestFolder::setModified(const QString &file, const QDateTime &time) const

@@ -20,9 +20,9 @@ public:
     /// The full path of something in the data folder.
     QString path(const QString &name) const;
     QString dataFolder() const { return m_folder.path(); }
-    QString effects() const { return path(QStringLiteral("Effects")); }
-    QString plugins() const { return path(QStringLiteral("Plugins")); }
-    QString scanList() const { return path(QStringLiteral("Effects/FXScan.xml")); }
+    QString effects() const { return path("Effects"); }
+    QString plugins() const { return path("Plugins"); }
+    QString scanList() const { return path("Effects/FXScan.xml"); }
 
     /// Writes a file, with the folders that it needs.
     void write(const QString &file, const QByteArray &content) const;
@@ -34,7 +34,7 @@ public:
     /// Writes the scan list of these folders; without any, of "Plugins".
     void writeScanList(QStringList folders = {}) const;
     /// The text of a catalogue file in "Effects".
-    QByteArray catalogue(const QString &name = QStringLiteral("VST3Configuration.xml")) const;
+    QByteArray catalogue(const QString &name = "VST3Configuration.xml") const;
     /// The file names of the crash markers in "Effects", of both formats, sorted.
     QStringList markers() const;
 

@@ -22,7 +22,7 @@ QString vst2FixturePath(VST2Fixture fixture)
 
 QString addVST2File(const QString &folder, const QString &name, const QByteArray &script, VST2Fixture fixture)
 {
-    const QString path = folder + QLatin1Char('/') + name + vst2Ending();
+    const QString path = folder + '/' + name + vst2Ending();
     putFixture(vst2FixturePath(fixture), path, script);
     return path;
 }

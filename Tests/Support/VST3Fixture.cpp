@@ -7,10 +7,7 @@
 
 namespace {
 
-QString modulePathIn(const QString &folder, const QString &name)
-{
-    return folder + QLatin1Char('/') + name + QStringLiteral(".vst3");
-}
+QString modulePathIn(const QString &folder, const QString &name) { return folder + '/' + name + ".vst3"; }
 
 } // namespace
 
@@ -44,8 +41,8 @@ QString addVST3Bundle(const QString &folder, const QString &name, const QByteArr
 
 QString vst3BundleBinary(const QString &bundle)
 {
-    return bundle + QStringLiteral("/Contents/") + QLatin1String(kBundleFolder) + QLatin1Char('/') +
-           QFileInfo(bundle).completeBaseName() + QLatin1String(kBundleEnding);
+    return bundle + "/Contents/" + QLatin1String(kBundleFolder) + '/' + QFileInfo(bundle).completeBaseName() +
+           QLatin1String(kBundleEnding);
 }
 
 QString vst3BundlePath(const QString &bundle)

@@ -28,13 +28,12 @@ protected:
     }
     void prepare(ScannerRun &fxscan, const QStringList &options) const
     {
-        fxscan.removeEnvironment(QStringLiteral("FXPROBE_LOG"));
-        fxscan.setArguments(QStringList({QStringLiteral("--data-folder"), m_folder.dataFolder()}) + options);
+        fxscan.removeEnvironment("FXPROBE_LOG");
+        fxscan.setArguments(QStringList({"--data-folder", m_folder.dataFolder()}) + options);
     }
     ScannerOutcome scan(const QStringList &options = {}) const
     {
-        return run(QStringList({QStringLiteral("--format"), QStringLiteral("json"), m_folder.plugins()}) +
-                   options);
+        return run(QStringList({"--format", "json", m_folder.plugins()}) + options);
     }
     static QJsonObject json(const ScannerOutcome &outcome)
     {
@@ -47,24 +46,24 @@ protected:
     static std::map<QString, QString> states(const QJsonObject &result)
     {
         std::map<QString, QString> states;
-        for (const QJsonValue plugin : result[QStringLiteral("plugins")].toArray())
-            states[plugin[QStringLiteral("name")].toString()] = plugin[QStringLiteral("state")].toString();
+        for (const QJsonValue plugin : result["plugins"].toArray())
+            states[plugin["name"].toString()] = plugin["state"].toString();
         return states;
     }
     static QString reason(const QJsonObject &result, const QString &name)
     {
-        for (const QJsonValue failure : result[QStringLiteral("failures")].toArray())
-            if (failure[QStringLiteral("name")].toString() == name)
-                return failure[QStringLiteral("reason")].toString();
-        return QStringLiteral("(none)");
+        for (const QJsonValue failure : result["failures"].toArray())
+            if (failure["name"].toString() == name)
+                return failure["reason"].toString();
+        return "(none)";
     }
     static int number(const QJsonObject &result, const char *key)
     {
-        return result[QStringLiteral("scan")].toObject()[QLatin1String(key)].toInt(-1);
+        return result["scan"].toObject()[QLatin1String(key)].toInt(-1);
     }
     QByteArray tracing(const char *script) const
     {
-        return "trace \"" + m_folder.path(QStringLiteral("trace")).toUtf8() + "\"\n" + script;
+        return "trace \"" + m_folder.path("trace").toUtf8() + "\"\n" + script;
     }
     void addVst3(const char *name, const char *script) const
     {
@@ -107,31 +106,30 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
     };
     for (const auto &row : rows)
         row.isVst3 ? addVst3(row.name, row.script) : addVst2(row.name, row.script);
-    m_folder.write(QStringLiteral("Plugins/Text3.vst3"), "no library at all");
-    const ScannerOutcome outcome = scan({QStringLiteral("--timeout"), QStringLiteral("2")});
+    m_folder.write("Plugins/Text3.vst3", "no library at all");
+    const ScannerOutcome outcome = scan({"--timeout", "2"});
     EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
     const QJsonObject first = json(outcome);
     for (const auto &row : rows) {
         const auto states = FxScan::states(first);
         const auto state = states.find(QLatin1String(row.name));
         EXPECT_EQ(state == states.end() ? QString() : state->second, QLatin1String(row.state)) << row.name;
-        const QString name = QLatin1String(row.name) +
-                             (row.state ? QString() : QStringLiteral(".vst3")); // no record: the file's
+        const QString name =
+            QLatin1String(row.name) + (row.state ? QString() : ".vst3"); // no record: the file's
         if (row.reason) {
             EXPECT_TRUE(reason(first, name).contains(QLatin1String(row.reason)))
                 << row.name << ": " << qPrintable(reason(first, name));
         }
     }
-    EXPECT_TRUE(reason(first, QStringLiteral("Text3")).startsWith(QLatin1String("it could not be loaded: ")));
-    EXPECT_TRUE(first[QStringLiteral("scan")][QStringLiteral("finished")].toBool());
+    EXPECT_TRUE(reason(first, "Text3").startsWith("it could not be loaded: "));
+    EXPECT_TRUE(first["scan"]["finished"].toBool());
 
-    const QByteArray csv =
-        run({QStringLiteral("--list"), QStringLiteral("--format"), QStringLiteral("csv")}).standardOutput;
+    const QByteArray csv = run({"--list", "--format", "csv"}).standardOutput;
     EXPECT_EQ(csv.count("\r\n"), 1 + static_cast<int>(states(first).size())) << csv.constData();
 
     // The same again: nothing to do but what has no record, and the reasons are still known.
-    QFile::remove(m_folder.path(QStringLiteral("trace")));
-    const ScannerOutcome strict = scan({QStringLiteral("--strict")});
+    QFile::remove(m_folder.path("trace"));
+    const ScannerOutcome strict = scan({"--strict"});
     EXPECT_EQ(strict.exitCode, 1);
     const QJsonObject second = json(strict);
     EXPECT_EQ(number(second, "unchanged"), number(first, "new"));
@@ -142,8 +140,8 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
                 << row.name;
         }
     }
-    for (const QString &call : m_folder.lines(QStringLiteral("trace")))
-        EXPECT_FALSE(call.contains(QLatin1String("initialize"))) << qPrintable(call);
+    for (const QString &call : m_folder.lines("trace"))
+        EXPECT_FALSE(call.contains("initialize")) << qPrintable(call);
 }
 
 TEST_F(FxScan, ARetryBringsOneBackWithItsMarks)
@@ -153,49 +151,35 @@ TEST_F(FxScan, ARetryBringsOneBackWithItsMarks)
     addVst2("Shell", "child 1 One\nchild 2 Two\nfault entry abort Two\n");
     EXPECT_EQ(scan().exitCode, 0);
     QByteArray catalogue = m_folder.catalogue();
-    m_folder.write(QStringLiteral("Effects/VST3Configuration.xml"),
-                   catalogue.replace("<Favourite>0<", "<Favourite>1<"));
+    m_folder.write("Effects/VST3Configuration.xml", catalogue.replace("<Favourite>0<", "<Favourite>1<"));
     addVst3("Crash", "");
     addVst2("Shell", "child 1 One\nchild 2 Two\n");
-    const QJsonObject result = json(scan({QStringLiteral("--retry"), QStringLiteral("crash"),
-                                          QStringLiteral("--retry"), QStringLiteral("Two")}));
-    EXPECT_EQ(states(result),
-              (std::map<QString, QString>{{QStringLiteral("Crash"), QStringLiteral("ok")},
-                                          {QStringLiteral("Other"), QStringLiteral("disabled")},
-                                          {QStringLiteral("One"), QStringLiteral("ok")},
-                                          {QStringLiteral("Two"), QStringLiteral("ok")}}));
+    const QJsonObject result = json(scan({"--retry", "crash", "--retry", "Two"}));
+    EXPECT_EQ(states(result), (std::map<QString, QString>{
+                                  {"Crash", "ok"}, {"Other", "disabled"}, {"One", "ok"}, {"Two", "ok"}}));
     EXPECT_EQ(m_folder.catalogue().count("<Favourite>1<"), 2);
     const QByteArray before = m_folder.catalogue();
-    EXPECT_EQ(run({QStringLiteral("--retry"), QStringLiteral("Other"), QStringLiteral("--retry"),
-                   QStringLiteral("One")})
-                  .exitCode,
-              2)
-        << "One works";
+    EXPECT_EQ(run({"--retry", "Other", "--retry", "One"}).exitCode, 2) << "One works";
     EXPECT_EQ(m_folder.catalogue(), before) << "nothing is changed then";
     addVst3("Other", "");
-    EXPECT_EQ(states(json(run({QStringLiteral("--format"), QStringLiteral("json"),
-                               QStringLiteral("--retry-failed")})))
-                  .at(QStringLiteral("Other")),
-              QStringLiteral("ok"))
+    EXPECT_EQ(states(json(run({"--format", "json", "--retry-failed"}))).at("Other"), "ok")
         << "in the folders of the last scan";
 }
 
 TEST_F(FxScan, WhatFailsAfterAnUpdateIsNeitherNewNorGone)
 {
-    const QString path = addVST3File(m_folder.plugins(), QStringLiteral("Pair"), "class A\nclass B\n");
+    const QString path = addVST3File(m_folder.plugins(), "Pair", "class A\nclass B\n");
     addVst3("Gone", "");
-    const QString gone = m_folder.path(QStringLiteral("Plugins/Gone.vst3"));
+    const QString gone = m_folder.path("Plugins/Gone.vst3");
     EXPECT_EQ(number(json(scan()), "new"), 3);
-    addVST3File(m_folder.plugins(), QStringLiteral("Pair"), "class A\nclass B\nfault initialize _exit\n");
+    addVST3File(m_folder.plugins(), "Pair", "class A\nclass B\nfault initialize _exit\n");
     m_folder.setModified(path, QDateTime(QDate(2030, 1, 1), QTime()));
     QFile::remove(gone);
     const QJsonObject result = json(scan());
     EXPECT_EQ(number(result, "new"), 0);
     EXPECT_EQ(number(result, "updated"), 2);
-    EXPECT_EQ(result[QStringLiteral("scan")][QStringLiteral("removed")].toArray(),
-              QJsonArray({QStringLiteral("Gone")}));
-    EXPECT_EQ(states(result), (std::map<QString, QString>{{QStringLiteral("A"), QStringLiteral("disabled")},
-                                                          {QStringLiteral("B"), QStringLiteral("disabled")}}))
+    EXPECT_EQ(result["scan"]["removed"].toArray(), QJsonArray({"Gone"}));
+    EXPECT_EQ(states(result), (std::map<QString, QString>{{"A", "disabled"}, {"B", "disabled"}}))
         << "no class of the file is loaded any more";
 }
 
@@ -207,7 +191,7 @@ TEST_F(FxScan, MoreKillersThanOneLaunchHasRuns)
     addVst3("Last", "");
     const ScannerOutcome outcome = scan();
     EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
-    EXPECT_EQ(states(json(outcome)).at(QStringLiteral("Last")), QStringLiteral("ok"));
+    EXPECT_EQ(states(json(outcome)).at("Last"), "ok");
     EXPECT_TRUE(m_folder.markers().isEmpty());
 }
 
@@ -217,32 +201,31 @@ TEST_F(FxScan, KillersWhosePathsLookLikeMarkupAreDisabledAsWell)
         addVST3File(m_folder.plugins(), QLatin1String(name), "class X\nfault initialize _exit\n");
     const ScannerOutcome outcome = scan();
     EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
-    EXPECT_EQ(json(outcome)[QStringLiteral("failures")].toArray().size(), 2);
+    EXPECT_EQ(json(outcome)["failures"].toArray().size(), 2);
 }
 
 TEST_F(FxScan, ALiveScannersMarkerBlamesNobody)
 {
     addVst3("Slow", "fault initialize hang\n");
     m_folder.writeScanList();
-    ScannerRun other(QFileInfo(QStringLiteral(FXPROBE_FXSCAN)).path() + QStringLiteral("/FxProbe"), m_folder);
+    ScannerRun other(QFileInfo(QStringLiteral(FXPROBE_FXSCAN)).path() + "/FxProbe", m_folder);
     ASSERT_TRUE(other.start());
     ASSERT_TRUE(other.waitUntil([this] { return !m_folder.markers().isEmpty(); }));
-    const ScannerOutcome outcome = scan({QStringLiteral("--retry-failed")});
+    const ScannerOutcome outcome = scan({"--retry-failed"});
     EXPECT_EQ(outcome.exitCode, 3);
     EXPECT_TRUE(outcome.standardError.contains("another scan is at work"))
         << outcome.standardError.constData();
-    EXPECT_EQ(m_folder.markers(), QStringList(QStringLiteral("Slow.scan3")));
+    EXPECT_EQ(m_folder.markers(), QStringList("Slow.scan3"));
     EXPECT_FALSE(m_folder.catalogue().contains("Slow"));
 }
 
 TEST_F(FxScan, TheLimitAndTheResultHoldWhateverAPluginPrints)
 {
     addVst3("Noise", "effect initialize print 200000\nfault initialize hang\n");
-    const QJsonObject result = json(scan({QStringLiteral("--timeout"), QStringLiteral("1")}));
-    EXPECT_EQ(states(result).at(QStringLiteral("Noise")), QStringLiteral("disabled"));
+    const QJsonObject result = json(scan({"--timeout", "1"}));
+    EXPECT_EQ(states(result).at("Noise"), "disabled");
     addVst3("Chatty", "effect initialize print 1\n");
-    EXPECT_EQ(states(json(scan({QStringLiteral("--in-process")}))).at(QStringLiteral("Chatty")),
-              QStringLiteral("ok"));
+    EXPECT_EQ(states(json(scan({"--in-process"}))).at("Chatty"), "ok");
 }
 
 TEST_F(FxScan, TerminationEndsItCleanly)
@@ -250,13 +233,12 @@ TEST_F(FxScan, TerminationEndsItCleanly)
     addVst3("Earlier", "");
     addVst3("Hang", "fault initialize hang\n");
     ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
-    prepare(fxscan, {QStringLiteral("--timeout"), QStringLiteral("0"), m_folder.plugins()});
+    prepare(fxscan, {"--timeout", "0", m_folder.plugins()});
     ASSERT_TRUE(fxscan.start());
-    ASSERT_TRUE(
-        fxscan.waitUntil([this] { return m_folder.markers().contains(QStringLiteral("Hang.scan3")); }));
+    ASSERT_TRUE(fxscan.waitUntil([this] { return m_folder.markers().contains("Hang.scan3"); }));
     fxscan.requestTermination();
     EXPECT_EQ(fxscan.wait().exitCode, 3);
-    EXPECT_TRUE(m_folder.markers().isEmpty()) << qPrintable(m_folder.markers().join(QLatin1Char(' ')));
+    EXPECT_TRUE(m_folder.markers().isEmpty()) << qPrintable(m_folder.markers().join(' '));
     EXPECT_TRUE(m_folder.catalogue().contains("<Name>Earlier<"));
     EXPECT_FALSE(m_folder.catalogue().contains("<Name>Hang<"));
 }
@@ -265,41 +247,41 @@ TEST_F(FxScan, ListingTouchesNothing)
 {
     addVst3("Comp", "");
     EXPECT_EQ(scan().exitCode, 0);
-    m_folder.write(QStringLiteral("Effects/Comp.scan3"), "<CrashedPlugin>");
-    QFile::remove(m_folder.path(QStringLiteral("trace")));
-    const ScannerOutcome listed = run({QStringLiteral("--list")});
+    m_folder.write("Effects/Comp.scan3", "<CrashedPlugin>");
+    QFile::remove(m_folder.path("trace"));
+    const ScannerOutcome listed = run({"--list"});
     EXPECT_TRUE(listed.succeeded());
     EXPECT_TRUE(listed.standardOutput.contains("VST 3   Comp  Fixture Works"))
         << listed.standardOutput.constData();
-    EXPECT_EQ(m_folder.markers(), QStringList(QStringLiteral("Comp.scan3")));
-    EXPECT_TRUE(m_folder.lines(QStringLiteral("trace")).isEmpty());
+    EXPECT_EQ(m_folder.markers(), QStringList("Comp.scan3"));
+    EXPECT_TRUE(m_folder.lines("trace").isEmpty());
 }
 
 TEST_F(FxScan, NamesThatBreakTheCatalogueAreNamed)
 {
     addVst3("Fine", "");
-    addVST3File(m_folder.plugins(), QStringLiteral("Bad"), "class \"A < B\"\nvendor \"C & D\"\n");
+    addVST3File(m_folder.plugins(), "Bad", "class \"A < B\"\nvendor \"C & D\"\n");
     const QJsonObject result = json(scan());
-    const QString problems = QString::fromUtf8(
-        QJsonDocument(result[QStringLiteral("problems")].toArray()).toJson(QJsonDocument::Compact));
-    EXPECT_TRUE(problems.contains(QLatin1String("the name of 'A < B'"))) << qPrintable(problems);
-    EXPECT_TRUE(problems.contains(QLatin1String("cannot be read by the next scan"))) << qPrintable(problems);
+    const QString problems =
+        QString::fromUtf8(QJsonDocument(result["problems"].toArray()).toJson(QJsonDocument::Compact));
+    EXPECT_TRUE(problems.contains("the name of 'A < B'")) << qPrintable(problems);
+    EXPECT_TRUE(problems.contains("cannot be read by the next scan")) << qPrintable(problems);
     EXPECT_EQ(states(result).size(), 2u) << "shown all the same";
 }
 
 TEST_F(FxScan, WrongUsage)
 {
-    const QString nowhere = m_folder.path(QStringLiteral("nowhere"));
+    const QString nowhere = m_folder.path("nowhere");
     const struct {
         QStringList options;
         const char *message;
     } rows[] = {
-        {{QStringLiteral("--no-such-option")}, "no-such-option"},
-        {{QStringLiteral("--format"), QStringLiteral("xml")}, "'xml' is no format"},
-        {{QStringLiteral("--timeout"), QStringLiteral("-1")}, "'-1' is no number of seconds"},
-        {{QStringLiteral("--list"), QStringLiteral("--retry-failed")}, "--list makes no scan"},
+        {{"--no-such-option"}, "no-such-option"},
+        {{"--format", "xml"}, "'xml' is no format"},
+        {{"--timeout", "-1"}, "'-1' is no number of seconds"},
+        {{"--list", "--retry-failed"}, "--list makes no scan"},
         {{nowhere}, "there is no folder"},
-        {{m_folder.plugins(), QStringLiteral("--retry"), QStringLiteral("Nobody")}, "no plug-in 'Nobody'"},
+        {{m_folder.plugins(), "--retry", "Nobody"}, "no plug-in 'Nobody'"},
     };
     for (const auto &row : rows) {
         const ScannerOutcome outcome = run(row.options);
@@ -307,5 +289,5 @@ TEST_F(FxScan, WrongUsage)
         EXPECT_TRUE(outcome.standardError.contains(row.message)) << outcome.standardError.constData();
         EXPECT_TRUE(outcome.standardOutput.isEmpty()) << outcome.standardOutput.constData();
     }
-    EXPECT_TRUE(run({QStringLiteral("--help")}).standardOutput.contains("--retry-failed"));
+    EXPECT_TRUE(run({"--help"}).standardOutput.contains("--retry-failed"));
 }

@@ -40,10 +40,10 @@ TEST(Output, NothingInATextSteersTheTerminal)
 TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)
 {
     CataloguedPlugin plugin{&pluginFormats().front(), {}, false};
-    plugin.record.name = QStringLiteral("A \"B\", C");
-    plugin.record.vendor = QStringLiteral("two\nlines");
+    plugin.record.name = "A \"B\", C";
+    plugin.record.vendor = "two\nlines";
     plugin.record.inputs = 2;
-    plugin.record.path = QStringLiteral("/p/A.vst3");
+    plugin.record.path = "/p/A.vst3";
     ScanSummary summary;
     summary.plugins.push_back(plugin);
     const QByteArray csv = renderCsv(summary);

@@ -31,7 +31,7 @@ class ScriptedSystem : public ReWireSystem {
 public:
     bool recentEnough = true;
     std::optional<std::string> folder = "C:\\Common";
-    QStringList libraries = {QStringLiteral("ReWire.dll")}; ///< those that load
+    QStringList libraries = {"ReWire.dll"}; ///< those that load
     std::optional<std::string> path = "C:\\there.dll";
     std::optional<quint32> version = 0x10008;
     std::string missingFunction;
@@ -45,7 +45,7 @@ public:
     void *load(const std::string &file) override
     {
         lastPath = file;
-        tried.append(QString::fromStdString(file).section(QLatin1Char('\\'), -1));
+        tried.append(QString::fromStdString(file).section('\\', -1));
         if (!libraries.contains(tried.last()))
             return nullptr;
         ++loaded;
@@ -78,8 +78,7 @@ ScriptedSystem ofVersion(std::optional<quint32> version)
     return with([&](ScriptedSystem &system) { system.version = version; });
 }
 
-const QStringList kAllNames = {QStringLiteral("ReWireDebug.dll"), QStringLiteral("ReWireBeta.dll"),
-                               QStringLiteral("ReWire.dll")};
+const QStringList kAllNames = {"ReWireDebug.dll", "ReWireBeta.dll", "ReWire.dll"};
 
 ScriptedSystem inFolder(size_t length)
 {

@@ -25,23 +25,16 @@ QString repeated(const char *utf8, int count) { return QString::fromUtf8(utf8).r
 
 } // namespace
 
-TEST_F(SimpleGUI, WithoutInterfaceQuestionsAreAnsweredYes)
+TEST_F(SimpleGUI, WithoutInterfaceQuestionsAreAnsweredYesAndMessagesVanish)
 {
-    EXPECT_TRUE(askUser(L"Load %ls?", QStringLiteral("Fuzz")));
-    EXPECT_EQ(log.lines(), QStringList({"Asking user \"Load Fuzz?\"", "User answered yes"}));
-}
-
-TEST_F(SimpleGUI, InterfaceThatCannotAskAnswersNo)
-{
-    installUI();
-    EXPECT_FALSE(askUser(L"Load?"));
-    EXPECT_EQ(log.lines(), QStringList({"Asking user \"Load?\"", "User answered no"}));
-}
-
-TEST_F(SimpleGUI, WithoutInterfaceMessageBoxIsAnAssertion)
-{
-    EXPECT_EQ(userMessageBox(QStringLiteral("Hello"), 4), 0);
-    EXPECT_EQ(log.lines(), QStringList({"UserMessageBox", ": No globalUi - using AfxMessageBox",
+    EXPECT_TRUE(askUser(L"Load %ls?", "Fuzz"));
+    showStatus(L"one");
+    showScanning("two");
+    notifyUI(MessageCode::kEntryAdded);
+    EXPECT_EQ(createProgressDisplay(), nullptr);
+    EXPECT_EQ(userMessageBox("Hello", 4), 0);
+    EXPECT_EQ(log.lines(), QStringList({"Asking user \"Load Fuzz?\"", "User answered yes", "UserMessageBox",
+                                        ": No globalUi - using AfxMessageBox",
                                         "Assertion failed: \"0\", Main/VLib/SimpleGUI, line 216"}));
 }
 
@@ -50,45 +43,33 @@ TEST_F(SimpleGUI, FoldersOfTheWorkstationAloneAreAssertions)
     QString lines;
     for (std::size_t index = 0; index < std::size(kWorkstationOnlyFolders); ++index) {
         EXPECT_STREQ(workstationOnlyFolder(index), L"");
-        EXPECT_TRUE(
-            log.lines().last().startsWith(QStringLiteral("Assertion failed: \"0\", Main/VLib/SimpleGUI")));
-        lines += log.lines().last().section(QLatin1Char(' '), -1) + ' ';
+        EXPECT_TRUE(log.lines().last().startsWith("Assertion failed: \"0\", Main/VLib/SimpleGUI"));
+        lines += log.lines().last().section(' ', -1) + ' ';
     }
-    EXPECT_EQ(lines, QStringLiteral("483 771 949 1011 1092 1184 1239 "));
-}
-
-TEST_F(SimpleGUI, MessageBoxAnswerIsTheInterfaces)
-{
-    const auto ui = installUI();
-    EXPECT_EQ(userMessageBox(QStringLiteral("50% done"), 4), 5);
-    EXPECT_EQ(ui->heard, QStringList(QStringLiteral("box 50% done")));
-    EXPECT_TRUE(log.lines().isEmpty());
-}
-
-TEST_F(SimpleGUI, WithoutInterfaceMessagesVanish)
-{
-    showStatus(L"one");
-    showScanning(QStringLiteral("two"));
-    notifyUI(MessageCode::kEntryAdded);
-    EXPECT_EQ(createProgressDisplay(), nullptr);
-    EXPECT_TRUE(log.lines().isEmpty());
+    EXPECT_EQ(lines, "483 771 949 1011 1092 1184 1239 ");
 }
 
 TEST_F(SimpleGUI, EachMessageReachesTheInterface)
 {
     const auto ui = installUI();
+    const wchar_t *none = nullptr;
+    EXPECT_FALSE(askUser(L"Load?")) << "it cannot ask";
+    EXPECT_EQ(userMessageBox("50% done", 4), 5) << "its own answer";
     showStatus(L"%d of %d", 1, 2);
-    showScanning(QStringLiteral("Fuzz"));
+    showStatus(none);
+    showScanning("Fuzz");
     notifyUI(MessageCode::kEntryAdded);
-    userWarning(L"No %ls", QStringLiteral("entry"));
-    EXPECT_EQ(ui->heard,
-              QStringList({"1 of 2", "60000 Scanning: Fuzz", "show", "notified fffffff", "warned No entry"}));
-    EXPECT_EQ(log.lines(), QStringList(QStringLiteral("User Warning - No entry")));
+    userWarning(L"No %ls", "entry");
+    userWarning(none);
+    EXPECT_EQ(ui->heard, QStringList({"box 50% done", "1 of 2", "", "60000 Scanning: Fuzz", "show",
+                                      "notified fffffff", "warned No entry", "warned "}));
+    EXPECT_EQ(log.lines(), QStringList({"Asking user \"Load?\"", "User answered no",
+                                        "User Warning - No entry", "User Warning - "}));
 }
 
 TEST_F(SimpleGUI, TextsArriveWholeUpToTheLimit)
 {
-    const QString japanese = QString::fromUtf8("日本語プラグイン");
+    const QString japanese = "日本語プラグイン";
     const struct {
         const char *name;
         QString text;
@@ -101,22 +82,13 @@ TEST_F(SimpleGUI, TextsArriveWholeUpToTheLimit)
         {"emoji across the limit", "x" + repeated("🎛", 300), "x" + repeated("🎛", 274)},
         {"emoji up to the limit", repeated("🎛", 300), repeated("🎛", 275)},
         {"Japanese", japanese, japanese},
-        {"percent signs are no format", QStringLiteral("100%s %n %ls"), QStringLiteral("100%s %n %ls")},
+        {"percent signs are no format", "100%s %n %ls", "100%s %n %ls"},
     };
     for (const auto &row : rows) {
         const auto ui = installUI();
         showStatus(L"%ls", row.text);
         EXPECT_EQ(ui->heard, QStringList(row.shown)) << row.name;
     }
-}
-
-TEST_F(SimpleGUI, NullFormatIsAnEmptyText)
-{
-    const auto ui = installUI();
-    const wchar_t *none = nullptr;
-    showStatus(none);
-    userWarning(none);
-    EXPECT_EQ(ui->heard, QStringList({"", "warned "}));
 }
 
 TEST_F(SimpleGUI, OnlyTheInstalledInterfaceIsRemoved)

@@ -17,6 +17,11 @@ void pressEscape(UiFxProbe &dialog)
     QCoreApplication::sendEvent(&dialog, &press);
 }
 
+void requestFromAnotherThread(HeldScan &scan)
+{
+    std::thread([&scan] { scan.dialog.requestClose(); }).join();
+}
+
 struct CloseRow {
     const char *name;
     bool defaultPath; ///< the window is shown at the first tick
@@ -24,25 +29,16 @@ struct CloseRow {
 };
 
 const CloseRow kCloseRows[] = {
-    {"scan over, never shown", false, [](HeldScan &scan) { scan.finish(); }},
-    {"scan over, in sight", true, [](HeldScan &scan) { scan.finish(); }},
-    {"scan over, minimised by the user", true,
-     [](HeldScan &scan) {
-         scan.dialog.showMinimized();
-         scan.finish();
-     }},
-    {"close button", true, [](HeldScan &scan) { pressCloseButton(scan.dialog); }},
+    {"scan over, never shown", false, [](HeldScan &s) { s.finish(); }},
+    {"scan over, in sight", true, [](HeldScan &s) { s.finish(); }},
+    {"scan over, minimised", true, [](HeldScan &s) { s.dialog.showMinimized(), s.finish(); }},
+    {"close button", true, [](HeldScan &s) { pressCloseButton(s.dialog); }},
     {"close button while minimised", true,
-     [](HeldScan &scan) {
-         scan.dialog.showMinimized();
-         pressCloseButton(scan.dialog);
-     }},
-    {"Escape key", true, [](HeldScan &scan) { pressEscape(scan.dialog); }},
-    {"closed, never shown", false, [](HeldScan &scan) { scan.dialog.close(); }},
-    {"close requested by another thread, never shown", false,
-     [](HeldScan &scan) { std::thread([&scan] { scan.dialog.requestClose(); }).join(); }},
-    {"close requested by another thread, in sight", true,
-     [](HeldScan &scan) { std::thread([&scan] { scan.dialog.requestClose(); }).join(); }},
+     [](HeldScan &s) { s.dialog.showMinimized(), pressCloseButton(s.dialog); }},
+    {"Escape key", true, [](HeldScan &s) { pressEscape(s.dialog); }},
+    {"closed, never shown", false, [](HeldScan &s) { s.dialog.close(); }},
+    {"close requested by another thread, never shown", false, requestFromAnotherThread},
+    {"close requested by another thread, in sight", true, requestFromAnotherThread},
 };
 
 /// Calls the row's action once the window is as the row wants it.

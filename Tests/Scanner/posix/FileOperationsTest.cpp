@@ -37,12 +37,10 @@ protected:
     /// A scan under strace, which writes down the calls to `operations`.
     ScannerOutcome trace(const QStringList &options) const
     {
-        ScannerRun scanner(QStringLiteral("strace"), m_folder);
-        scanner.setArguments(QStringList{QStringLiteral("-f"), QStringLiteral("-o"),
-                                         m_folder.path(QStringLiteral("operations"))} +
-                             options + QStringList{scannerProgram(), m_folder.scanList()});
-        scanner.setEnvironment(QStringLiteral("ASAN_OPTIONS"),
-                               QStringLiteral("detect_leaks=0")); // not when traced
+        ScannerRun scanner("strace", m_folder);
+        scanner.setArguments(QStringList{"-f", "-o", m_folder.path("operations")} + options +
+                             QStringList{scannerProgram(), m_folder.scanList()});
+        scanner.setEnvironment("ASAN_OPTIONS", "detect_leaks=0"); // not when traced
         return scanner.run();
     }
 };
@@ -51,8 +49,8 @@ class FileOperations : public TracedScan, public testing::WithParamInterface<Dis
 protected:
     int countCalls(const QString &calls) const
     {
-        EXPECT_TRUE(trace({QStringLiteral("-e"), QStringLiteral("trace=") + calls}).succeeded());
-        return m_folder.lines(QStringLiteral("operations")).size();
+        EXPECT_TRUE(trace({"-e", "trace=" + calls}).succeeded());
+        return m_folder.lines("operations").size();
     }
 };
 
@@ -68,12 +66,11 @@ TEST_P(FileOperations, DisturbedAtAnyMomentLoseNothing)
     for (int moment = 1; moment <= count; moment += stepOfSweep(), ++moments) {
         SCOPED_TRACE(moment);
         m_folder.write(cataloguePath(), before);
-        const ScannerOutcome outcome =
-            trace({QStringLiteral("-e"), QStringLiteral("trace=") + calls, QStringLiteral("-e"),
-                   QStringLiteral("inject=%1:%2:when=%3%4")
-                       .arg(calls, QLatin1String(GetParam().what))
-                       .arg(moment)
-                       .arg(QLatin1String(GetParam().lasts ? "+" : ""))});
+        const ScannerOutcome outcome = trace({"-e", "trace=" + calls, "-e",
+                                              QStringLiteral("inject=%1:%2:when=%3%4")
+                                                  .arg(calls, QLatin1String(GetParam().what))
+                                                  .arg(moment)
+                                                  .arg(QLatin1String(GetParam().lasts ? "+" : ""))});
         if (outcome.log.contains(m_folder.scanList()))
             continue; // one that cannot be read names no folders, and everything counts as gone
         EXPECT_EQ(listed(), m_names);
@@ -86,8 +83,7 @@ TEST_P(FileOperations, DisturbedAtAnyMomentLoseNothing)
 TEST_F(TracedScan, ACatalogueThatCannotBeReadIsNotReplaced)
 {
     const QByteArray before = m_folder.catalogue();
-    const ScannerOutcome outcome = trace({QStringLiteral("-P"), cataloguePath(), QStringLiteral("-e"),
-                                          QStringLiteral("inject=openat:error=EIO:when=1")});
+    const ScannerOutcome outcome = trace({"-P", cataloguePath(), "-e", "inject=openat:error=EIO:when=1"});
     EXPECT_TRUE(outcome.succeeded());
     EXPECT_EQ(
         logLines(outcome),
@@ -102,8 +98,7 @@ TEST_F(TracedScan, ACatalogueThatCannotBeReadIsNotReplaced)
 TEST_F(TracedScan, PluginsInAFolderThatCannotBeReadAreKept)
 {
     const QByteArray before = m_folder.catalogue();
-    const ScannerOutcome outcome = trace({QStringLiteral("-P"), m_folder.plugins(), QStringLiteral("-e"),
-                                          QStringLiteral("inject=openat:error=EIO:when=1")});
+    const ScannerOutcome outcome = trace({"-P", m_folder.plugins(), "-e", "inject=openat:error=EIO:when=1"});
     EXPECT_TRUE(outcome.succeeded());
     EXPECT_EQ(
         logLines(outcome),

@@ -24,7 +24,7 @@ VirtualScreen::VirtualScreen()
         return;
     m_connection = xcb_connect(m_name.toLatin1().constData(), nullptr);
     if (xcb_connection_has_error(m_connection)) {
-        m_reason = QStringLiteral("cannot connect to Xvfb at ") + m_name;
+        m_reason = "cannot connect to Xvfb at " + m_name;
         return;
     }
     m_root = xcb_setup_roots_iterator(xcb_get_setup(m_connection)).data->root;
@@ -42,14 +42,11 @@ VirtualScreen::~VirtualScreen()
 
 bool VirtualScreen::startServer()
 {
-    m_server.start(QStringLiteral("Xvfb"),
-                   {QStringLiteral("-displayfd"), QStringLiteral("1"), QStringLiteral("-nolisten"),
-                    QStringLiteral("tcp"), QStringLiteral("-screen"), QStringLiteral("0"),
-                    QStringLiteral("800x600x24")});
+    m_server.start("Xvfb", {"-displayfd", "1", "-nolisten", "tcp", "-screen", "0", "800x600x24"});
     QByteArray number;
     while (!number.endsWith('\n') && m_server.waitForReadyRead(20000))
         number += m_server.readAllStandardOutput();
-    m_name = QLatin1Char(':') + QString::fromLatin1(number.trimmed());
+    m_name = ':' + QString::fromLatin1(number.trimmed());
     if (number.endsWith('\n'))
         return true;
     m_reason = QStringLiteral("Xvfb did not start: %1\n%2")
@@ -96,30 +93,15 @@ bool VirtualScreen::isVisible(xcb_window_t window) const
     return answer && answer->map_state == XCB_MAP_STATE_VIEWABLE;
 }
 
-std::vector<xcb_window_t> VirtualScreen::visibleWindows() const
+xcb_window_t VirtualScreen::windowTitled(const QString &title) const
 {
     const auto tree =
         owned(xcb_query_tree_reply(m_connection, xcb_query_tree(m_connection, m_root), nullptr));
-    std::vector<xcb_window_t> windows;
-    for (int i = 0; tree && i < xcb_query_tree_children_length(tree.get()); ++i)
-        if (isVisible(xcb_query_tree_children(tree.get())[i]))
-            windows.push_back(xcb_query_tree_children(tree.get())[i]);
-    return windows;
-}
-
-QStringList VirtualScreen::visibleTitles() const
-{
-    QStringList titles;
-    for (const xcb_window_t window : visibleWindows())
-        titles.append(titleOf(window));
-    return titles;
-}
-
-xcb_window_t VirtualScreen::windowTitled(const QString &title) const
-{
-    for (const xcb_window_t window : visibleWindows())
-        if (titleOf(window) == title)
+    for (int i = 0; tree && i < xcb_query_tree_children_length(tree.get()); ++i) {
+        const xcb_window_t window = xcb_query_tree_children(tree.get())[i];
+        if (isVisible(window) && titleOf(window) == title)
             return window;
+    }
     return 0;
 }
 

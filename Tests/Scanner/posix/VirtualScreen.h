@@ -3,7 +3,6 @@
 #include "Tests/Support/ChildProcess.h"
 
 #include <QString>
-#include <QStringList>
 
 #include <xcb/xcb.h>
 
@@ -21,8 +20,8 @@ public:
     QString name() const { return m_name; }
     /// How many windows appeared since the last call.
     int takeAppeared();
-    /// The titles of the windows that can be seen now.
-    QStringList visibleTitles() const;
+    /// The window with this title that can be seen now; 0 when there is none.
+    xcb_window_t windowTitled(const QString &title) const;
     /// Width and height of the visible window with this title, as "WxH".
     QString sizeOf(const QString &title) const;
     /// Asks a window to close, as its close button does.
@@ -35,9 +34,6 @@ private:
     xcb_atom_t atom(const char *name) const;
     QString titleOf(xcb_window_t window) const;
     bool isVisible(xcb_window_t window) const;
-    std::vector<xcb_window_t> visibleWindows() const;
-    /// 0 when there is none.
-    xcb_window_t windowTitled(const QString &title) const;
 
     ChildProcess m_server;
     QString m_reason;

@@ -18,12 +18,12 @@ protected:
     {
         const std::optional<std::string> common = installedReWireSystem()->commonFilesFolder();
         ASSERT_TRUE(common.has_value());
-        m_vendorFolder = QString::fromStdString(*common) + QStringLiteral("/Propellerhead Software");
+        m_vendorFolder = QString::fromStdString(*common) + "/Propellerhead Software";
         if (QDir(m_vendorFolder).exists()) {
             m_vendorFolder.clear();
             GTEST_SKIP() << "a ReWire library is installed here";
         }
-        if (!QDir().mkpath(m_vendorFolder + QStringLiteral("/ReWire")))
+        if (!QDir().mkpath(m_vendorFolder + "/ReWire"))
             GTEST_SKIP() << "the shared folder is not ours to write to";
     }
     void TearDown() override
@@ -36,7 +36,7 @@ protected:
     /// A place of the shared folder holds a fixture, or, where that has no name, nothing.
     void install(const char *library, const char *fixture) const
     {
-        const QString place = m_vendorFolder + QStringLiteral("/ReWire/") + QLatin1String(library);
+        const QString place = m_vendorFolder + "/ReWire/" + QLatin1String(library);
         QFile::remove(place);
         if (*fixture) {
             ASSERT_TRUE(QFile::copy(QStringLiteral(FXPROBE_REWIRE_FIXTURES "/%1.dll").arg(fixture), place));
@@ -73,7 +73,7 @@ TEST_F(InstalledReWire, IsReportedByTheScanner)
         install("ReWireBeta.dll", row.beta);
         install("ReWireDebug.dll", row.debug);
         ScannerRun scanner(QStringLiteral(FXPROBE_SCANNER), folder);
-        scanner.setArguments({QStringLiteral("-rewire_version")});
+        scanner.setArguments({"-rewire_version"});
         const ScannerOutcome outcome = scanner.run();
         const QByteArray line =
             *row.version ? QByteArray("REWIRE LIBRARY VERSION: ") + row.version + "\r\n" : QByteArray();
