@@ -8,7 +8,9 @@
 #include <QDir>
 #include <QTemporaryDir>
 
+#include <algorithm>
 #include <clocale>
+#include <memory>
 #include <ostream>
 #include <string>
 
@@ -47,6 +49,22 @@ public:
 
 private:
     QTemporaryDir m_folder;
+};
+
+/// Bytes at an odd address with nothing behind them, where a sanitizer sees every step aside.
+class OddBytes {
+public:
+    explicit OddBytes(const QByteArray &content)
+        : m_bytes(new uchar[static_cast<std::size_t>(content.size()) + 1])
+        , m_size(static_cast<quint64>(content.size()))
+    {
+        std::copy(content.begin(), content.end(), m_bytes.get() + 1);
+    }
+    ByteView view() const { return ByteView(m_bytes.get() + 1, m_size); }
+
+private:
+    std::unique_ptr<uchar[]> m_bytes;
+    quint64 m_size;
 };
 
 inline QByteArray contentOf(const QString &path)

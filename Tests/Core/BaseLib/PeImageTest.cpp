@@ -6,26 +6,21 @@
 
 #include <gtest/gtest.h>
 
-#include <memory>
-
 namespace {
 
 using Answer = ExportAnswer;
 const std::vector<QByteArray> kEntryPoints = {"VSTPluginMain", "main"};
 const PeContent kPlugin = {{"alpha", "main", "omega"}, {"KERNEL32.dll", "drums.dll"}, {"late.dll"}};
 
-/// What is read from an image, with the bytes at an odd address and nothing behind them, where a sanitizer
-/// sees every step aside.
+/// What is read from an image.
 struct Reading {
-    std::unique_ptr<uchar[]> bytes;
+    OddBytes bytes;
     std::optional<PeImage> image;
 
     explicit Reading(const QByteArray &content)
-        : bytes(new uchar[static_cast<size_t>(content.size()) + 1])
-    {
-        std::memcpy(bytes.get() + 1, content.constData(), static_cast<size_t>(content.size()));
-        image = PeImage::read(ByteView(bytes.get() + 1, static_cast<quint64>(content.size())));
-    }
+        : bytes(content)
+        , image(PeImage::read(bytes.view()))
+    {}
     Answer exports(const std::vector<QByteArray> &names = kEntryPoints) const
     {
         return image ? image->findExports(names) : Answer::Unknown;
@@ -134,35 +129,26 @@ TEST(PeImage, AnyMachinesExportsCount)
     EXPECT_EQ(findExports(ONE_FUNCTION_LIBRARY, kEntryPoints), Answer::NotExported) << "this system's";
 }
 
-namespace {
-
-struct Folder {
-    EmptyFolder files;
-    /// Finds what was written, and the system's "KERNEL32.dll".
-    std::optional<QString> find(const QString &name) const
-    {
-        const QString path = files.path(name);
-        return name == "KERNEL32.dll"_q ? QString()
-               : QFile::exists(path)    ? std::make_optional(path)
-                                        : std::nullopt;
-    }
-};
-
-} // namespace
-
 TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
 {
-    const Folder folder;
+    const EmptyFolder folder;
     const auto add = [&](const char *name, const PeContent &content) {
-        folder.files.write(QLatin1String(name), PeBuilder(content).build());
+        folder.write(name, PeBuilder(content).build());
+    };
+    // Finds what was written, and the system's "KERNEL32.dll".
+    const auto search = [&](const QString &name) {
+        const bool isSystems = name == "KERNEL32.dll";
+        return isSystems || QFile::exists(folder.path(name))
+                   ? std::make_optional(isSystems ? QString() : folder.path(name))
+                   : std::nullopt;
     };
     add("ring1.dll", {{}, {"KERNEL32.dll", "RING2.dll"}, {}});
     add("RING2.dll", {{}, {"ring1.dll", "ring2.DLL"}, {}});
     add("old.dll", {{}, {}, {}, 0x014c, false});
     add("lacking.dll", {{}, {"ring1.dll", "gone.dll"}, {}});
-    folder.files.write("empty.dll"_q);
-    folder.files.write("text.dll"_q, "text");
-    folder.files.write("short.dll"_q, PeBuilder(kPlugin).build().left(600));
+    folder.write("empty.dll"_q);
+    folder.write("text.dll"_q, "text");
+    folder.write("short.dll"_q, PeBuilder(kPlugin).build().left(600));
     const struct {
         const char *name;
         PeContent content;
@@ -183,9 +169,8 @@ TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
         {"needs a part", {{}, {"short.dll"}, {}}, "needs short.dll, which is cut short or damaged"},
         {"the loader knows about an empty file", {{}, {"empty.dll"}, {}}, ""},
     };
-    const auto search = [&](const QString &name) { return folder.find(name); };
     for (const auto &row : rows) {
-        const QString path = folder.files.write("plugin.dll"_q, PeBuilder(row.content).build());
+        const QString path = folder.write("plugin.dll"_q, PeBuilder(row.content).build());
         EXPECT_EQ(whyNotLoadable(path, search), QLatin1String(row.reason)) << row.name;
     }
     EXPECT_EQ(whyNotLoadable("missing.dll"_q, search), QString());
