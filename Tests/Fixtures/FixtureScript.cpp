@@ -2,6 +2,7 @@
 
 #include "Tests/Fixtures/FixturePlatform.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <limits>
@@ -9,79 +10,55 @@
 
 namespace {
 
-/// Reads the words of one line.
-class LineReader {
-public:
-    explicit LineReader(const std::string &line)
-        : m_line(line)
-    {}
+/// The byte of an escape that begins at `position`, which then is that of its last character.
+char escaped(const std::string &line, std::size_t &position)
+{
+    const char kind = ++position < line.size() ? line[position] : '\0';
+    if (kind == '\\' || kind == '"')
+        return kind;
+    if (kind == 'n' || kind == 't')
+        return kind == 'n' ? '\n' : '\t';
+    const std::string digits = line.substr(std::min(position + 1, line.size()), 2);
+    if (kind != 'x' || digits.size() != 2 ||
+        digits.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos)
+        throw ScriptError("unknown escape");
+    position += 2;
+    return static_cast<char>(std::strtoul(digits.c_str(), nullptr, 16));
+}
 
-    /// Puts the next word into `word`; false at the end of the line.
-    bool next(std::string &word)
-    {
-        while (m_position < m_line.size() && isBlank(m_line[m_position]))
-            ++m_position;
-        if (m_position == m_line.size() || m_line[m_position] == '#')
-            return false;
-        word.clear();
-        bool quoted = false;
-        for (; m_position < m_line.size() && (quoted || !isBlank(m_line[m_position])); ++m_position) {
-            if (m_line[m_position] == '"')
-                quoted = !quoted;
-            else
-                word += m_line[m_position] == '\\' ? escaped() : m_line[m_position];
-        }
-        if (quoted)
-            throw ScriptError("a quotation mark is missing");
-        return true;
+std::vector<std::string> wordsOf(const std::string &line)
+{
+    std::vector<std::string> words;
+    bool quoted = false;
+    bool inWord = false;
+    for (std::size_t position = 0; position < line.size(); ++position) {
+        const char character = line[position];
+        const bool isBlank = !quoted && (character == ' ' || character == '\t');
+        if (!inWord && character == '#')
+            break;
+        if (!inWord && !isBlank)
+            words.emplace_back();
+        inWord = !isBlank;
+        if (character == '"')
+            quoted = !quoted;
+        else if (inWord)
+            words.back() += character == '\\' ? escaped(line, position) : character;
     }
-
-private:
-    static bool isBlank(char character) { return character == ' ' || character == '\t'; }
-
-    /// The byte that an escape stands for; leaves the position on the escape's last character.
-    char escaped()
-    {
-        const char kind = ++m_position < m_line.size() ? m_line[m_position] : '\0';
-        switch (kind) {
-        case 'n':
-            return '\n';
-        case 't':
-            return '\t';
-        case '\\':
-        case '"':
-            return kind;
-        case 'x':
-            return hexadecimal();
-        default:
-            throw ScriptError("unknown escape");
-        }
-    }
-
-    char hexadecimal()
-    {
-        const std::string digits = m_line.substr(m_position + 1, 2);
-        if (digits.size() != 2 || digits.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos)
-            throw ScriptError("\\x needs two hexadecimal digits");
-        m_position += 2;
-        return static_cast<char>(std::strtoul(digits.c_str(), nullptr, 16));
-    }
-
-    const std::string &m_line;
-    std::size_t m_position = 0;
-};
+    if (quoted)
+        throw ScriptError("a quotation mark is missing");
+    return words;
+}
 
 ScriptStatement parseLine(const std::string &text, int number)
 {
     ScriptStatement statement;
     statement.line = number;
     try {
-        LineReader reader(text);
-        std::string word;
-        if (reader.next(word))
-            statement.key = word;
-        while (reader.next(word))
-            statement.words.push_back(word);
+        statement.words = wordsOf(text);
+        if (!statement.words.empty()) {
+            statement.key = statement.words.front();
+            statement.words.erase(statement.words.begin());
+        }
     } catch (const ScriptError &error) {
         statement.fail(error.what());
     }

@@ -3,9 +3,12 @@
 #include "Tests/Fixtures/FixtureMisuse.h"
 
 #include <cstdint>
+#include <initializer_list>
 #include <optional>
 #include <stdexcept>
 #include <string>
+#include <type_traits>
+#include <utility>
 #include <vector>
 
 /// A script that cannot be understood. The text names the line.
@@ -28,6 +31,23 @@ struct ScriptStatement {
     std::int32_t number(std::size_t index) const;
     /// Throws ScriptError when the statement has more words than this.
     void allowWords(std::size_t most) const;
+    /// Puts the one word of a statement whose key is among these where it belongs; false for another key.
+    /// Throws ScriptError.
+    template <typename Value>
+    bool take(std::initializer_list<std::pair<const char *, Value *>> known) const
+    {
+        for (const auto &[name, value] : known) {
+            if (key != name)
+                continue;
+            if constexpr (std::is_convertible_v<std::string, Value>)
+                *value = word(0);
+            else
+                *value = number(0);
+            allowWords(1);
+            return true;
+        }
+        return false;
+    }
     /// Throws ScriptError for this statement.
     [[noreturn]] void fail(const std::string &reason) const;
 };

@@ -10,41 +10,6 @@ const std::size_t kNameBuffer = 1024;
 const std::size_t kVendorBuffer = 256;
 const std::size_t kParameterBuffer = 128;
 
-bool takeNumber(EffectScript &effect, const ScriptStatement &statement)
-{
-    const std::pair<const char *, std::int32_t *> numbers[] = {{"id", &effect.uniqueId},
-                                                               {"magic", &effect.magic},
-                                                               {"inputs", &effect.inputs},
-                                                               {"outputs", &effect.outputs}};
-    const std::pair<const char *, std::optional<std::int32_t> *> optionalNumbers[] = {
-        {"category", &effect.category},
-        {"flags", &effect.flags},
-        {"stated-parameters", &effect.statedParameters}};
-    const auto takeOneOf = [&statement](const auto &known) {
-        for (const auto &[key, number] : known) {
-            if (statement.key != key)
-                continue;
-            *number = statement.number(0);
-            statement.allowWords(1);
-            return true;
-        }
-        return false;
-    };
-    return takeOneOf(numbers) || takeOneOf(optionalNumbers);
-}
-
-bool takeFlag(EffectScript &effect, const ScriptStatement &statement)
-{
-    if (statement.key == "null-chunk")
-        effect.nullChunk = true;
-    else if (statement.key == "own-thread")
-        effect.ownThread = true;
-    else
-        return false;
-    statement.allowWords(0);
-    return true;
-}
-
 ScriptedParameter readParameter(const ScriptStatement &statement)
 {
     ScriptedParameter parameter;
@@ -56,7 +21,6 @@ ScriptedParameter readParameter(const ScriptStatement &statement)
         parameter.value = readFloat(statement, 1);
     if (statement.words.size() > 2)
         parameter.label = statement.words[2];
-    statement.allowWords(3);
     return parameter;
 }
 
@@ -71,7 +35,14 @@ void ScriptedText::writeTo(void *buffer) const
 
 bool takeEffectStatement(EffectScript &effect, const ScriptStatement &statement)
 {
-    if (takeNumber(effect, statement) || takeFlag(effect, statement))
+    if (statement.take<std::int32_t>({{"id", &effect.uniqueId},
+                                      {"magic", &effect.magic},
+                                      {"inputs", &effect.inputs},
+                                      {"outputs", &effect.outputs}}) ||
+        statement.take<std::optional<std::int32_t>>({{"category", &effect.category},
+                                                     {"flags", &effect.flags},
+                                                     {"stated-parameters", &effect.statedParameters}}) ||
+        statement.take<std::optional<std::string>>({{"chunk", &effect.chunk}}))
         return true;
     if (statement.key == "name")
         effect.name = readText(statement, 0, kNameBuffer);
@@ -79,17 +50,18 @@ bool takeEffectStatement(EffectScript &effect, const ScriptStatement &statement)
         effect.vendor = readText(statement, 0, kVendorBuffer);
     else if (statement.key == "parameter")
         effect.parameters.push_back(readParameter(statement));
-    else if (statement.key == "editor") {
-        statement.allowWords(2);
+    else if (statement.key == "editor")
         effect.editor = {statement.number(0), statement.number(1)};
-    } else if (statement.key == "new-outputs") {
-        statement.allowWords(2);
+    else if (statement.key == "new-outputs")
         effect.newOutputs = {statement.word(0), statement.number(1)};
-    } else if (statement.key == "chunk") {
-        statement.allowWords(1);
-        effect.chunk = statement.word(0);
-    } else
+    else if (statement.key == "null-chunk")
+        effect.nullChunk = true;
+    else if (statement.key == "own-thread")
+        effect.ownThread = true;
+    else
         return false;
+    const bool isFlag = statement.key == "null-chunk" || statement.key == "own-thread";
+    statement.allowWords(isFlag ? 0 : statement.key == "parameter" ? 3 : 2);
     return true;
 }
 

@@ -18,9 +18,47 @@ PluginScript::AfterChildren readAfterChildren(const ScriptStatement &statement)
     statement.fail("neither 'endless' nor 'repeat'");
 }
 
-HostCall readKnownHostCall(const ScriptStatement &statement, const FixtureStages &stages)
+bool takeFlag(HostCall &call, const std::string &word)
 {
-    HostCall call = readHostCall(statement);
+    if (word == "from-thread")
+        call.caller = HostCall::Caller::OtherThread;
+    else if (word == "until-close")
+        call.caller = HostCall::Caller::UntilClose;
+    else
+        return false;
+    return true;
+}
+
+/// Takes the option whose value stands at `index`.
+void takeOption(HostCall &call, const ScriptStatement &statement, std::size_t index)
+{
+    const std::string &option = statement.words[index - 1];
+    if (option == "index")
+        call.index = statement.number(index);
+    else if (option == "value")
+        call.value = statement.number(index);
+    else if (option == "opt")
+        call.opt = readFloat(statement, index);
+    else if (option == "nested")
+        call.depth = statement.number(index);
+    else
+        statement.fail("no option '" + option + "'");
+}
+
+/// Reads STAGE OPCODE and the named options behind them.
+HostCall readHostCall(const ScriptStatement &statement, const FixtureStages &stages)
+{
+    HostCall call;
+    call.stage = statement.word(0);
+    call.opcode = statement.number(1);
+    for (std::size_t index = 2; index < statement.words.size(); ++index) {
+        if (!takeFlag(call, statement.words[index]))
+            takeOption(call, statement, ++index);
+    }
+    if (call.depth < 1)
+        statement.fail("one call at least");
+    if (call.depth > 1 && call.caller == HostCall::Caller::UntilClose)
+        statement.fail("a call that is kept up does not nest");
     if (!stages.findStage(call.stage) || call.stage.rfind("static-", 0) == 0)
         statement.fail("no effect to call from at '" + call.stage + "'");
     return call;
@@ -36,7 +74,7 @@ void takeStatement(PluginScript &plugin, const ScriptStatement &statement)
     else if (statement.key == "after-children")
         plugin.afterChildren = readAfterChildren(statement);
     else if (statement.key == "ask-host")
-        plugin.hostCalls.push_back(readKnownHostCall(statement, plugin.stages));
+        plugin.hostCalls.push_back(readHostCall(statement, plugin.stages));
     else if (!takeEffectStatement(described, statement))
         statement.fail("unknown");
 }

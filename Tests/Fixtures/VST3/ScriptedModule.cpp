@@ -1,7 +1,6 @@
 #include "Tests/Fixtures/VST3/ScriptedModule.h"
 
 #include "Tests/Fixtures/FixturePlatform.h"
-#include "Tests/Fixtures/VST3/ScriptedClassReader.h"
 
 using namespace Steinberg;
 
@@ -37,18 +36,96 @@ std::vector<FixtureStage> stagesOfVST3()
             {"static-destructor"}};
 }
 
-bool takeFactoryStatement(ScriptedModule &module, const ScriptStatement &statement)
+/// The same for the same name everywhere; FNV-1a.
+std::uint64_t hashOf(const std::string &text, std::uint64_t start)
 {
-    if (statement.key == "generation") {
-        module.generation = statement.number(0);
-        if (module.generation < 0 || module.generation > 3)
-            statement.fail("a generation is 0 to 3");
-    } else if (statement.key == "factory-vendor")
-        module.vendor = statement.word(0);
+    std::uint64_t hash = start;
+    for (const char character : text)
+        hash = (hash ^ static_cast<unsigned char>(character)) * 0x100000001B3u;
+    return hash;
+}
+
+FUID idFromName(const std::string &name)
+{
+    const std::uint64_t first = hashOf(name, 0xCBF29CE484222325u);
+    const std::uint64_t second = hashOf(name, first);
+    return FUID(static_cast<uint32>(first >> 32), static_cast<uint32>(first),
+                static_cast<uint32>(second >> 32), static_cast<uint32>(second));
+}
+
+/// Takes the digits as FUID prints them, so that a test finds them again in the catalogue on any platform.
+FUID idFromDigits(const ScriptStatement &statement)
+{
+    const std::string &digits = statement.word(0);
+    FUID id;
+    if (digits.size() != 32 || digits.find_first_not_of("0123456789ABCDEFabcdef") != std::string::npos ||
+        !id.fromString(digits.c_str()))
+        statement.fail("an id has 32 hexadecimal digits");
+    return id;
+}
+
+std::int32_t busType(const std::string &text)
+{
+    if (text == "main")
+        return 0;
+    return text == "aux" ? 1 : parseNumber(text);
+}
+
+/// Reads "channels" or "channels:type" for each bus.
+std::vector<ScriptedBus> readBuses(const ScriptStatement &statement)
+{
+    std::vector<ScriptedBus> buses;
+    for (const std::string &word : statement.words) {
+        const std::size_t colon = word.find(':');
+        ScriptedBus bus;
+        bus.channels = parseNumber(word.substr(0, colon));
+        bus.type = colon == std::string::npos ? 0 : busType(word.substr(colon + 1));
+        buses.push_back(bus);
+    }
+    return buses;
+}
+
+ScriptedClass scriptedClass(const std::string &name)
+{
+    ScriptedClass described;
+    described.name = name;
+    described.id = idFromName(name);
+    return described;
+}
+
+/// Takes a statement that describes a class; false when the key is none of a class.
+bool takeClassStatement(ScriptedClass &described, const ScriptStatement &statement)
+{
+    using Number = std::optional<std::int32_t>;
+    if (statement.take<std::string>({{"category", &described.category},
+                                     {"subcategories", &described.subCategories},
+                                     {"vendor", &described.vendor},
+                                     {"controller", &described.controller},
+                                     {"version", &described.version}}) ||
+        statement.take<std::optional<std::string>>({{"state", &described.state}}) ||
+        statement.take<Number>(
+            {{"stated-inputs", &described.statedInputs}, {"stated-outputs", &described.statedOutputs}}))
+        return true;
+    if (statement.key == "inputs")
+        described.inputs = readBuses(statement);
+    else if (statement.key == "outputs")
+        described.outputs = readBuses(statement);
+    else if (statement.key == "id")
+        described.id = idFromDigits(statement);
+    else if (statement.key == "ask-host-name")
+        described.asksHostName = true;
     else
         return false;
-    statement.allowWords(1);
     return true;
+}
+
+bool takeFactoryStatement(ScriptedModule &module, const ScriptStatement &statement)
+{
+    const bool taken = statement.take<std::string>({{"factory-vendor", &module.vendor}}) ||
+                       statement.take<int>({{"generation", &module.generation}});
+    if (module.generation < 0 || module.generation > 3)
+        statement.fail("a generation is 0 to 3");
+    return taken;
 }
 
 void takeStatement(ScriptedModule &module, const ScriptStatement &statement)
