@@ -29,12 +29,3 @@ TEST(ReplaceFile, LeavesTheNewContentAndNothingElse)
         EXPECT_EQ(folder.names(), QStringList("残響.xml"_q)) << row.name;
     }
 }
-
-TEST(ReplaceFile, SaysWhyItCannot)
-{
-    const EmptyFolder folder;
-    folder.write("folder.xml/kept"_q);
-    for (const QString &name : {"folder.xml"_q, "missing/a.xml"_q})
-        EXPECT_FALSE(replaceFile(folder.path(name), "new", Durability::Buffered)) << name.toStdString();
-    EXPECT_EQ(folder.names(), QStringList("folder.xml"_q));
-}

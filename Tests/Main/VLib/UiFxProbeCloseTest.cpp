@@ -72,15 +72,6 @@ TEST(UiFxProbeClose, EndsTheEventLoop)
     }
 }
 
-TEST(UiFxProbeClose, BeforeTheLoopStartsIsNotForgotten)
-{
-    HeldScan scan;
-    scan.dialog.requestClose();
-    QCoreApplication::processEvents();
-    scan.dialog.run(*QCoreApplication::instance(), true);
-    EXPECT_FALSE(scan.dialog.isVisible());
-}
-
 TEST(UiFxProbeClose, ScanThatIsOverAtOnceIsNeverShown)
 {
     UiFxProbe dialog(QString(), [](const QString &) { requestShow(); });

@@ -26,7 +26,7 @@ QString logAfterScan(std::function<void(const QString &)> scanRun)
 
 } // namespace
 
-TEST(UiFxProbeScan, IsCancelledWhenTheWindowGoes)
+TEST(UiFxProbeScan, IsCancelledWhenTheWindowGoesAlsoBeforeTheLoopStarts)
 {
     bool over = false;
     {
@@ -35,7 +35,9 @@ TEST(UiFxProbeScan, IsCancelledWhenTheWindowGoes)
             over = true;
         });
         dialog.requestClose();
+        QCoreApplication::processEvents();
         dialog.run(*QCoreApplication::instance(), true);
+        EXPECT_FALSE(dialog.isVisible());
     }
     EXPECT_TRUE(over);
 }

@@ -1,4 +1,5 @@
 #include "Tests/Core/BaseLib/FaultGuardTrials.h"
+#include "Tests/Fixtures/FixturePlatform.h"
 
 #include <array>
 #include <cstring>
@@ -15,7 +16,6 @@ namespace {
 constexpr DWORD kMicrosoftCode = 0xE06D7363;
 bool g_wasUnwound = false;
 void (*volatile g_inner)() = nullptr;
-volatile char *volatile g_page = nullptr; // the handler reads it
 
 } // namespace
 
@@ -24,15 +24,11 @@ extern "C" {
 /// Calls `g_inner` from a frame whose handler is foreignFrameHandler, as a plug-in's own frame would be.
 void callFromForeignFrame();
 
-/// Repairs violations in g_page and leaves everything else to others; notes that its frame was unwound.
+/// Leaves everything to others; notes that its frame was unwound.
 [[gnu::used]] EXCEPTION_DISPOSITION foreignFrameHandler(EXCEPTION_RECORD *record, void *, CONTEXT *, void *)
 {
-    DWORD previous = 0;
     g_wasUnwound |= (record->ExceptionFlags & EXCEPTION_UNWINDING) != 0;
-    if (record->ExceptionCode != EXCEPTION_ACCESS_VIOLATION || !g_page ||
-        !VirtualProtect(const_cast<char *>(g_page), 1, PAGE_READWRITE, &previous))
-        return ExceptionContinueSearch;
-    return ExceptionContinueExecution;
+    return ExceptionContinueSearch;
 }
 }
 
@@ -64,15 +60,6 @@ std::string outcomeInForeignFrame(void (*inner)())
     g_inner = inner;
     g_wasUnwound = false;
     return outcome(callFromForeignFrame);
-}
-
-void writeProtectedPage()
-{
-    void *page = VirtualAlloc(nullptr, 1, MEM_RESERVE | MEM_COMMIT, PAGE_NOACCESS);
-    g_page = static_cast<volatile char *>(page);
-    *g_page = 1;
-    g_page = nullptr;
-    VirtualFree(page, 0, MEM_RELEASE);
 }
 
 /// The tables that Microsoft's compiler leaves with a thrown std::runtime_error; places are distances from
@@ -129,7 +116,7 @@ TEST(FaultGuardFrames, OfPluginsComeFirstAndAreUnwoundForExceptionsOnly)
         const char *outcome;
         bool unwinds;
     } rows[] = {
-        {"violation that the plug-in repairs", writeProtectedPage, "returned", false},
+        {"violation that the plug-in repairs", [] { repairOwnViolation("keep"); }, "returned", false},
         {"violation that it leaves alone", writeNowhere, "SE Exception: Access Violation", false},
         {"exception of this compiler", [] { throw std::runtime_error("x"); }, "exception x", true},
         {"std::runtime_error of Microsoft's compiler",
