@@ -14,9 +14,6 @@ enum class VST2Fixture {
 /// What the names of modules end in: ".so", on Windows ".dll".
 QString vst2Ending();
 
-/// The built module itself.
-QString vst2FixturePath(VST2Fixture fixture = VST2Fixture::Scripted);
-
 /// Puts a module as NAME with the ending into a folder, with its script beside it: a null script
 /// gives no script file, so that the module is a healthy stereo effect named after the file. Returns the
 /// module's full path. The statements are in Tests/Fixtures/README.md.

@@ -1,12 +1,18 @@
+#include "Core/BaseLib/BinaryExports.h"
 #include "Core/BaseLib/LoadFailure.h"
 #include "Core/BaseLib/PeImage.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 
 namespace {
 
+const QByteArray kNames[] = {"VSTPluginMain", "main"};
+
+/// The input without the zero that a QByteArray has behind its content.
+std::vector<uchar> bytesOf(const QByteArray &input) { return {input.begin(), input.end()}; }
+
 void readTables(const PeImage &image, const QByteArray &input)
 {
-    for (const QByteArray &name : {QByteArray("VSTPluginMain"), QByteArray("main")})
+    for (const QByteArray &name : kNames)
         if (image.findExports({name}) == ExportAnswer::Exported)
             require(input.contains(name + '\0'), "what is exported stands in the file");
     for (const auto &libraries : {image.imports(), image.delayImports()})
@@ -16,10 +22,24 @@ void readTables(const PeImage &image, const QByteArray &input)
 
 } // namespace
 
+void fuzzElf(const QByteArray &input)
+{
+    const std::vector<uchar> bytes = bytesOf(input);
+    const ByteView view(bytes.data(), bytes.size());
+    const QString file = "module.so";
+    writeFuzzFile(file, input);
+    for (const QByteArray &name : kNames) {
+        const ExportAnswer answer = findElfExports(view, {name});
+        if (answer == ExportAnswer::Exported)
+            require(input.contains(name + '\0'), "what is exported stands in the file");
+        if (answer != ExportAnswer::Unknown)
+            require(findExports(file, {name}) == answer, "a file read by its pages says the same");
+    }
+}
+
 void fuzzPe(const QByteArray &input)
 {
-    // Without the zero that a QByteArray has behind its content.
-    const std::vector<uchar> bytes(input.begin(), input.end());
+    const std::vector<uchar> bytes = bytesOf(input);
     if (const std::optional<PeImage> image = PeImage::read(ByteView(bytes.data(), bytes.size())))
         readTables(*image, input);
 

@@ -1,0 +1,69 @@
+#include "Tests/Support/PlatformValues.h"
+#include "Tests/Support/VST2Fixture.h"
+#include "Tests/Support/VST3Fixture.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+// In the order of their enumerations.
+const char *const kVst2Modules[] = {FXPROBE_SCRIPTED_VST2, FXPROBE_MAIN_VST2, FXPROBE_BOTH_VST2,
+                                    FXPROBE_NO_ENTRY_VST3};
+const char *const kVst3Modules[] = {FXPROBE_SCRIPTED_VST3, FXPROBE_PLAIN_VST3, FXPROBE_NO_ENTRY_VST3};
+
+/// Copies a module to a path, replacing what is there, so that a test can also update a plug-in. Its script
+/// goes beside it; a null script gives no script file.
+void putFixture(const QString &source, const QString &path, const QByteArray &script)
+{
+    QFile scriptFile(path + ".script");
+    QDir().mkpath(QFileInfo(path).path());
+    QFile::remove(path);
+    scriptFile.remove();
+    EXPECT_TRUE(QFile::copy(source, path)) << qPrintable(source) << " to " << qPrintable(path);
+    if (script.isNull())
+        return;
+    const bool written = scriptFile.open(QIODevice::WriteOnly) && scriptFile.write(script) == script.size();
+    EXPECT_TRUE(written) << qPrintable(scriptFile.errorString());
+}
+
+} // namespace
+
+QString vst2Ending() { return kVst2Ending; }
+
+QString addVST2File(const QString &folder, const QString &name, const QByteArray &script, VST2Fixture fixture)
+{
+    const QString path = folder + '/' + name + vst2Ending();
+    putFixture(kVst2Modules[static_cast<int>(fixture)], path, script);
+    return path;
+}
+
+QString vst3FixturePath(VST3Fixture fixture) { return kVst3Modules[static_cast<int>(fixture)]; }
+
+QString addVST3File(const QString &folder, const QString &name, const QByteArray &script, VST3Fixture fixture)
+{
+    const QString path = folder + '/' + name + ".vst3";
+    putFixture(vst3FixturePath(fixture), path, script);
+    return path;
+}
+
+QString addVST3Bundle(const QString &folder, const QString &name, const QByteArray &script,
+                      VST3Fixture fixture)
+{
+    const QString bundle = folder + '/' + name + ".vst3";
+    putFixture(vst3FixturePath(fixture), vst3BundleBinary(bundle), script);
+    return bundle;
+}
+
+QString vst3BundleBinary(const QString &bundle)
+{
+    return bundle + "/Contents/" + kBundleFolder + '/' + QFileInfo(bundle).completeBaseName() + kBundleEnding;
+}
+
+QString vst3BundlePath(const QString &bundle)
+{
+    return kBundleIsThePlugin ? bundle : vst3BundleBinary(bundle);
+}
