@@ -19,7 +19,6 @@ protected:
             scanner.setEnvironment(QLatin1String(home), m_folder.dataFolder());
         scanner.setWorkingFolder(m_folder.dataFolder());
         scanner.setEnvironment("LC_ALL", "C");
-        scanner.setTimeLimit(std::chrono::seconds(20));
         return scanner.run();
     }
     /// The catalogues anywhere below the data folder.

@@ -43,7 +43,6 @@ public:
     void setEnvironment(const QString &name, const QString &value) { m_environment.insert(name, value); }
     void removeEnvironment(const QString &name) { m_environment.remove(name); }
     void setWorkingFolder(const QString &folder) { m_process.setWorkingDirectory(folder); }
-    void setTimeLimit(std::chrono::milliseconds limit) { m_limit = limit; }
 
     bool start();
     /// Waits in a started run until the condition holds; false when the run or its time limit ended before.
@@ -65,7 +64,6 @@ private:
     QString m_program;
     QStringList m_arguments;
     QProcessEnvironment m_environment;
-    std::chrono::milliseconds m_limit = std::chrono::seconds(100); // CTest waits 120 s
     QDeadlineTimer m_deadline;
     ChildProcess m_process;
     ScannerOutcome m_outcome;

@@ -3,4 +3,4 @@
 // C++ has rules for a function of this name, so only its symbol has it.
 FIXTURE_EXPORT AEffect *olderEntry(audioMasterCallback host) __asm__("main");
 
-AEffect *olderEntry(audioMasterCallback host) { return enterPlugin(host, EntryPoint::First); }
+AEffect *olderEntry(audioMasterCallback host) { return enterPlugin(host, EntryPoint::FIXTURE_MAIN); }
