@@ -7,7 +7,6 @@
 #include <QString>
 #include <QStringList>
 
-#include <chrono>
 #include <functional>
 #include <vector>
 
