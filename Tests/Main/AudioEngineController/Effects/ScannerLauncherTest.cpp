@@ -93,6 +93,17 @@ TEST_F(Launcher, RunsAgainWhileMarkersSurviveAndTellsTheEndsApart)
     }
 }
 
+TEST_F(Launcher, AScannerThatHangsWhenAllIsDoneIsEndedAndNobodyIsBlamed)
+{
+    script("report hang");
+    qputenv("FXPROBE_REPORT", m_folder.path("report").toUtf8());
+    m_launcher.run(job(1));
+    qunsetenv("FXPROBE_REPORT");
+    ASSERT_EQ(m_launcher.ends().size(), 1u);
+    EXPECT_EQ(m_launcher.ends()[0].how, How::TimeLimit);
+    EXPECT_TRUE(m_launcher.ends()[0].culprits.empty());
+}
+
 TEST_F(Launcher, CancellingBlamesNobodyAndRunsNothingElse)
 {
     // The marker of an earlier crash, which the run has not absorbed, is none of ours to delete.

@@ -3,6 +3,7 @@
 // line:
 //   marker=NAME   writes a crash marker of VST 2 (NAME has its ending)
 //   clear         deletes the markers A.scan and A.scan3 first
+//   report        says in the report that the scan has come to its end
 //   hang, fault, exit=N   how it ends (exit=0 without any)
 #include <chrono>
 #include <cstdlib>
@@ -37,6 +38,8 @@ void carryOut(const std::string &word, const fs::path &effects)
         __builtin_trap(); // abort is no crash on Windows
     else if (word == "hang")
         std::this_thread::sleep_for(std::chrono::hours(1));
+    else if (word == "report")
+        std::ofstream(std::getenv("FXPROBE_REPORT"), std::ios::binary) << "{\"event\":\"finished\"}\n";
     else if (word.rfind("marker=", 0) == 0)
         std::ofstream(effects / value)
             << "<CrashedPlugin>\n\t<Path>/p/" << value << "</Path>\n</CrashedPlugin>\n";
