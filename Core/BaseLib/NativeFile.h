@@ -30,6 +30,12 @@ struct PathLess {
     }
 };
 
+/// The same for every spelling of a path, for what looks paths up by their hashes.
+inline QString pathKey(const QString &path)
+{
+    return kPathCase == Qt::CaseSensitive ? path : path.toCaseFolded();
+}
+
 /// fopen for a path with any characters; null when it fails.
 std::FILE *openStream(const QString &path, const char *mode);
 /// Renames a file over an existing one in one step.

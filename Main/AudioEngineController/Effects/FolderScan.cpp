@@ -6,6 +6,8 @@
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
+#include <QSet>
+
 #include <algorithm>
 #include <exception>
 
@@ -59,14 +61,16 @@ bool FolderScan::isCancelled() const
 QStringList FolderScan::findFiles() const
 {
     QStringList paths;
-    std::set<QString, PathLess> seen;
+    QSet<QString> seen;
     FileFinder finder(m_ending);
     finder.setListings(m_listings);
     finder.setCancelled([this] { return isCancelled(); });
     for (const QString &folder : m_host.folders())
-        for (const QString &path : finder.find(folder))
-            if (seen.insert(path).second)
+        for (const QString &path : finder.find(folder)) {
+            seen.insert(pathKey(path));
+            if (seen.size() > paths.size())
                 paths.append(path);
+        }
     return paths;
 }
 

@@ -55,9 +55,10 @@ VSTFolderScan::VSTFolderScan(VSTHost &host)
 
 std::vector<ScanItem> VSTFolderScan::arrange(const QStringList &paths)
 {
-    const std::set<QString> sorted(paths.begin(), paths.end());
+    QStringList sorted = paths;
+    std::sort(sorted.begin(), sorted.end());
     std::vector<ScanItem> items;
-    items.reserve(sorted.size());
+    items.reserve(static_cast<std::size_t>(sorted.size()));
     for (const QString &path : sorted) {
         const QString fileTime = regularFileTimeText(path);
         if (fileTime.isEmpty()) // a folder of that name; or a pipe, which would be waited for
