@@ -28,20 +28,17 @@ std::string textOf(IBStream *stream)
     return text;
 }
 
-/// Asks the host's context as a plug-in does while it is initialised.
-std::string hostName(FUnknown *context)
+/// Whether the context is a host that says its name.
+bool hasHostName(FUnknown *context)
 {
     Vst::IHostApplication *application = nullptr;
     if (!context || context->queryInterface(Vst::IHostApplication::iid,
                                             reinterpret_cast<void **>(&application)) != kResultOk)
-        return "no host application";
+        return false;
     Vst::String128 name = {};
     const tresult result = application->getName(name);
     application->release();
-    std::string text;
-    for (const char16 *unit = name; unit != name + 128 && *unit; ++unit)
-        text += *unit < 0x80 ? static_cast<char>(*unit) : '?';
-    return result == kResultOk ? text : "no name";
+    return result == kResultOk && name[0] != 0;
 }
 
 /// An instance of a scripted class: a component, an edit controller or both in one. The module owns it until
@@ -101,8 +98,8 @@ public:
         if (m_state == State::Initialized)
             reportMisuse("'" + m_class.name + "' was initialised twice");
         scriptedModule().stages.reach("initialize", m_class.name);
-        if (m_class.asksHostName)
-            scriptedModule().stages.note("host-name", m_class.name, hostName(context));
+        if (!hasHostName(context))
+            reportMisuse("'" + m_class.name + "' was initialised by a host without a name");
         const tresult result = scriptedModule().result("initialize", m_class.name);
         m_state = result == kResultOk ? State::Initialized : State::Refused;
         return result;

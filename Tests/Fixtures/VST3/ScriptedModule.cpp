@@ -112,8 +112,6 @@ bool takeClassStatement(ScriptedClass &described, const ScriptStatement &stateme
         described.outputs = readBuses(statement);
     else if (statement.key == "id")
         described.id = idFromDigits(statement);
-    else if (statement.key == "ask-host-name")
-        described.asksHostName = true;
     else
         return false;
     return true;

@@ -31,7 +31,6 @@ struct ScriptedClass {
     std::optional<std::int32_t> statedOutputs;
     std::string controller; ///< "self", or the name of the class that is the edit controller; empty: none
     std::optional<std::string> state; ///< what its instances give as their state, first
-    bool asksHostName = false;        ///< when it is initialised
 };
 
 /// All that the script beside the module says.
