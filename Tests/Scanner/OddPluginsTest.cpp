@@ -31,6 +31,8 @@ TEST_F(OddPlugins, AreListedOrBlamedAsOthersAre)
     } rows[] = {
         {"a/Comp", kUsual, false},
         {"b/comp", kUsual, false}, // differs in nothing but case
+        {"c/Straße", kUsual, false},
+        {"c/STRASSE", kUsual, false}, // alike in capitals only
         {"c/Start of 1970", QDateTime::fromMSecsSinceEpoch(0), false},
         {"c/Future", QDateTime({2099, 12, 31}, {23, 59}), false},
         {deepFolder() + "Deep", kUsual, false},
