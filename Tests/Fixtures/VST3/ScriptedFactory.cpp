@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <type_traits>
 
 using namespace Steinberg;
 
@@ -68,17 +69,22 @@ const ScriptedClass *classWithId(FIDString id)
     return nullptr;
 }
 
-/// Announces a request for the information on a class; null when it is to be refused with `result`. An index
-/// out of range is not in the trace: a host that believes a huge count would fill the disk.
-const ScriptedClass *announce(const char *stage, int32 index, tresult &result)
+/// Answers a request for the information on a class. An index out of range is not in the trace: a host that
+/// believes a huge count would fill the disk.
+template <typename Info>
+tresult describe(const char *stage, int32 index, Info &info)
 {
     const ScriptedClass *described = classAt(index);
-    result = kInvalidArgument;
     if (!described)
-        return nullptr;
+        return kInvalidArgument;
     scriptedModule().stages.reach(stage, described->name);
-    result = scriptedModule().result(stage, described->name);
-    return result == kResultOk ? described : nullptr;
+    const tresult result = scriptedModule().result(stage, described->name);
+    if (result != kResultOk)
+        return result;
+    fillCommon(info, *described);
+    if constexpr (!std::is_same_v<Info, PClassInfo>)
+        fillNewer(info, *described);
+    return kResultOk;
 }
 
 /// The factory of the scripted module: one object for the module's life.
@@ -131,30 +137,17 @@ public:
 
     tresult PLUGIN_API getClassInfo(int32 index, PClassInfo *info) override
     {
-        tresult result = kResultOk;
-        if (const ScriptedClass *described = announce("class-info", index, result))
-            fillCommon(*info, *described);
-        return result;
+        return describe("class-info", index, *info);
     }
 
     tresult PLUGIN_API getClassInfo2(int32 index, PClassInfo2 *info) override
     {
-        tresult result = kResultOk;
-        if (const ScriptedClass *described = announce("class-info2", index, result)) {
-            fillCommon(*info, *described);
-            fillNewer(*info, *described);
-        }
-        return result;
+        return describe("class-info2", index, *info);
     }
 
     tresult PLUGIN_API getClassInfoUnicode(int32 index, PClassInfoW *info) override
     {
-        tresult result = kResultOk;
-        if (const ScriptedClass *described = announce("class-info-unicode", index, result)) {
-            fillCommon(*info, *described);
-            fillNewer(*info, *described);
-        }
-        return result;
+        return describe("class-info-unicode", index, *info);
     }
 
     tresult PLUGIN_API setHostContext(FUnknown *) override
