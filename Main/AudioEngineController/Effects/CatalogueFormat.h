@@ -32,7 +32,8 @@ struct CatalogueFormat {
     bool versionRequired;        ///< a file without a version yields no records; otherwise it counts as 1.0
     double fileTimesTrustedFrom; ///< files of earlier versions carry time stamps of another form
     double categoryMasksFrom;    ///< in files of earlier versions the mask is none yet
-    QString (*fileTime)(const QString &path); ///< a plug-in file's time stamp
+    /// A plug-in file's time stamp; null where every version's times are trusted.
+    QString (*fileTime)(const QString &path);
     MarkerFormat marker;
     std::vector<CatalogueElement> elements;
 };

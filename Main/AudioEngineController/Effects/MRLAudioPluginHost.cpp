@@ -5,12 +5,17 @@
 
 #include <QFile>
 
+#include <limits>
+
 const CatalogueFormat &builtInEffectsFormat()
 {
     using namespace CatalogueElements;
     static const CatalogueElement writtenMask = {kCategoryMask.name, nullptr, kCategoryMask.content};
-    static const CatalogueFormat format = {"/TesselFXConfiguration.xml",  "1.2", false, 0.0, 0.0, nullptr, {},
-                                           {kId, kFavourite, writtenMask}};
+    // There are no files whose times could be read: no version, not even a negative one, is upgraded.
+    constexpr double kEveryVersion = -std::numeric_limits<double>::infinity();
+    static const CatalogueFormat format = {
+        "/TesselFXConfiguration.xml",  "1.2", false, kEveryVersion, kEveryVersion, nullptr, {},
+        {kId, kFavourite, writtenMask}};
     return format;
 }
 
