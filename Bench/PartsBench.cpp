@@ -119,7 +119,7 @@ void fileFinder(benchmark::State &state)
         write(inside + QStringLiteral("/%1.so").arg(number), QByteArray("x"));
     }
     while (state.KeepRunning())
-        benchmark::DoNotOptimize(FileFinder(QStringLiteral(".vst3")).find(folder.path()));
+        benchmark::DoNotOptimize(findFiles(folder.path(), QStringLiteral(".vst3")));
     state.SetComplexityN(state.range(0));
 }
 BENCHMARK(fileFinder)->RangeMultiplier(10)->Range(kFew, 1000)->Complexity(benchmark::oNLogN);

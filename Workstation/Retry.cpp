@@ -92,7 +92,7 @@ QStringList withoutUnrecorded(QStringList names, const QStringList &folders,
     };
     for (const PluginFormat &format : pluginFormats())
         for (const QString &folder : names.isEmpty() ? QStringList() : folders)
-            for (const QString &path : FileFinder(format.ending).find(folder))
+            for (const QString &path : findFiles(folder, format.ending))
                 dropNamesOf(path);
     return names;
 }

@@ -1,11 +1,14 @@
 #include "Core/BaseLib/FileFinder.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/FolderListing.h"
 #include "Core/BaseLib/NativeFile.h"
 
 #include <QDir>
 #include <QFileInfo>
 
+#include <algorithm>
+#include <iterator>
 #include <mutex>
 #include <set>
 
@@ -44,8 +47,8 @@ void logUnsearchable(const QString &folder, const QString &reason)
 
 } // namespace
 
-FileFinder::FileFinder(const QString &ending)
-    : m_ending(ending)
+FileFinder::FileFinder(const QStringList &endings)
+    : m_endings(endings)
 {}
 
 void FileFinder::forgetReports()
@@ -54,31 +57,55 @@ void FileFinder::forgetReports()
     reports().folders.clear();
 }
 
-QStringList FileFinder::find(const QString &folder) const
+QStringList FileFinder::find(const QString &folder, const QString &ending, const Cancelled &isCancelled)
 {
-    QStringList found;
-    if (folder.isEmpty()) // made absolute, it would be the working folder
+    if (folder.isEmpty()) { // made absolute, it would be the working folder
         logUnsearchable(folder, QStringLiteral("no folder is given"));
-    else
-        searchFolder(QDir::cleanPath(QFileInfo(folder).absoluteFilePath()), found);
-    return found;
+        return {};
+    }
+    const QString start = QDir::cleanPath(QFileInfo(folder).absoluteFilePath());
+    const auto [entry, isNew] = m_found.try_emplace(start);
+    const bool isWhole = !isNew || searchFolder(start, isCancelled, entry->second);
+    QStringList paths;
+    std::copy_if(entry->second.begin(), entry->second.end(), std::back_inserter(paths),
+                 [&](const QString &path) { return path.endsWith(ending, Qt::CaseInsensitive); });
+    if (!isWhole)
+        m_found.erase(entry);
+    return paths;
 }
 
-void FileFinder::searchFolder(const QString &folder, QStringList &found) const
+bool FileFinder::isLookedFor(const QString &name) const
 {
-    if (m_cancelled && m_cancelled())
-        return;
-    const FolderListings::Listing listing = m_listings->list(folder);
-    const std::vector<FolderEntry> &entries = listing->entries;
-    if (!listing->problem.isEmpty())
-        logUnsearchable(folder, listing->problem);
-    else if (entries.empty())
+    return std::any_of(m_endings.begin(), m_endings.end(),
+                       [&](const QString &ending) { return name.endsWith(ending, Qt::CaseInsensitive); });
+}
+
+bool FileFinder::searchFolder(const QString &folder, const Cancelled &isCancelled, QStringList &found)
+{
+    if (isCancelled && isCancelled())
+        return false;
+    const FolderContent content = listFolder(folder);
+    if (!content.problem.isEmpty()) {
+        m_unread.append(folder);
+        logUnsearchable(folder, content.problem);
+    } else if (content.entries.empty()) {
         logUnsearchable(folder, reasonAgainst(QFileInfo(folder)));
+    }
     const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
-    for (const FolderEntry &entry : entries)
-        if (entry.name.endsWith(m_ending, Qt::CaseInsensitive))
+    for (const FolderEntry &entry : content.entries)
+        if (isLookedFor(entry.name))
             found.append(prefix + entry.name);
-    for (const FolderEntry &entry : entries)
-        if (entry.isRealFolder && !leadsBack(prefix + entry.name))
-            searchFolder(prefix + entry.name, found);
+    for (const FolderEntry &entry : content.entries) {
+        if (!entry.isRealFolder)
+            continue;
+        const QString path = prefix + entry.name;
+        if (!leadsBack(path) && !searchFolder(path, isCancelled, found))
+            return false;
+    }
+    return true;
+}
+
+QStringList findFiles(const QString &folder, const QString &ending)
+{
+    return FileFinder({ending}).find(folder, ending);
 }

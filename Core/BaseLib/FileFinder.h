@@ -1,40 +1,45 @@
 #pragma once
 
-#include "Core/BaseLib/FolderListing.h"
-
 #include <QString>
 #include <QStringList>
 
 #include <functional>
-#include <memory>
+#include <map>
 
-/// Finds files and folders by the end of their name, in a folder and all folders below it. Looks into each
-/// folder once in its life.
+/// Finds files and folders by the ends of their names, in a folder and all folders below it. Walks through a
+/// folder once in its life: searches for other endings of one scan see the same. Used on one thread.
 class FileFinder {
 public:
-    /// `ending` is the end of the names looked for, with its dot (".vst3"), compared without regard to case.
-    explicit FileFinder(const QString &ending);
+    using Cancelled = std::function<bool()>;
 
-    /// Asked before each folder; the search ends early when it answers true.
-    void setCancelled(std::function<bool()> cancelled) { m_cancelled = std::move(cancelled); }
+    /// `endings` are the ends of the names looked for, with their dots (".vst3"), compared without regard to
+    /// case.
+    explicit FileFinder(const QStringList &endings);
 
-    /// Has it share with others what they saw in the folders; not null.
-    void setListings(std::shared_ptr<FolderListings> listings) { m_listings = std::move(listings); }
+    /// The full paths found that end in `ending`, one of the finder's, "/" as separator: those of a folder in
+    /// the order of their names, followed by what lies in its sub-folders. A folder that matches is listed
+    /// and searched. Hidden entries are passed over and linked folders are not entered; junctions are (people
+    /// keep plug-ins on other drives by them), unless one leads back to where the search comes from: it
+    /// cannot loop. Names that are no valid text are passed over. A folder that cannot be read, or an empty
+    /// path, gives one log line. `isCancelled` is asked before each folder; the search ends early when it
+    /// answers true.
+    QStringList find(const QString &folder, const QString &ending, const Cancelled &isCancelled = nullptr);
 
-    /// The full paths found, "/" as separator: those of a folder in the order of their names, followed by
-    /// what lies in its sub-folders. A folder that matches is listed and searched. Hidden entries are passed
-    /// over and linked folders are not entered; junctions are (people keep plug-ins on other drives by them),
-    /// unless one leads back to where the search comes from: it cannot loop. Names that are no valid text
-    /// are passed over. A folder that cannot be read, or an empty path, gives one log line.
-    QStringList find(const QString &folder) const;
+    /// The folders so far of which not all could be read.
+    const QStringList &unread() const { return m_unread; }
 
     /// Lets folders that cannot be read be reported anew.
     static void forgetReports();
 
 private:
-    void searchFolder(const QString &folder, QStringList &found) const;
+    bool isLookedFor(const QString &name) const;
+    /// False when it ended early.
+    bool searchFolder(const QString &folder, const Cancelled &isCancelled, QStringList &found);
 
-    QString m_ending;
-    std::function<bool()> m_cancelled;
-    std::shared_ptr<FolderListings> m_listings = std::make_shared<FolderListings>();
+    QStringList m_endings;
+    QStringList m_unread;
+    std::map<QString, QStringList> m_found; ///< of each folder searched, the paths of all endings
 };
+
+/// The paths that a search of its own finds.
+QStringList findFiles(const QString &folder, const QString &ending);

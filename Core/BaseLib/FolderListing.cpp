@@ -29,17 +29,7 @@ void sortByName(std::vector<FolderEntry> &entries)
 FolderContent listFolder(const QString &folder)
 {
     FolderContent content = readFolder(folder);
-    sortByName(content.entries);
+    if (content.entries.size() > 1) // most folders of a bundle hold one
+        sortByName(content.entries);
     return content;
-}
-
-FolderListings::Listing FolderListings::list(const QString &folder)
-{
-    Listing &listing = m_listings[folder];
-    if (!listing) {
-        listing = std::make_shared<const FolderContent>(listFolder(folder));
-        if (!listing->problem.isEmpty())
-            m_unread.append(folder);
-    }
-    return listing;
 }

@@ -1,10 +1,7 @@
 #pragma once
 
-#include <QHash>
 #include <QString>
-#include <QStringList>
 
-#include <memory>
 #include <vector>
 
 /// An entry of a folder.
@@ -25,19 +22,3 @@ FolderContent listFolder(const QString &folder);
 
 /// The system's part of it, in any order.
 FolderContent readFolder(const QString &folder);
-
-/// Remembers what lay in folders, so that several searches of one scan walk through them once. Used on one
-/// thread.
-class FolderListings {
-public:
-    using Listing = std::shared_ptr<const FolderContent>;
-
-    /// As `listFolder` saw it first.
-    Listing list(const QString &folder);
-    /// The folders so far of which not all could be read.
-    const QStringList &unread() const { return m_unread; }
-
-private:
-    QStringList m_unread;
-    QHash<QString, Listing> m_listings;
-};

@@ -1,7 +1,6 @@
 #include "Main/AudioEngineController/Effects/AudioPluginHost.h"
 
 #include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/FileFinder.h"
 #include "Main/AudioEngineController/Effects/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/CrashMarker.h"
@@ -157,8 +156,7 @@ void AudioPluginHost::absorbMarkers()
 {
     if (!QDir(m_catalogueFolder).exists())
         return;
-    const QStringList paths =
-        FileFinder(QString::fromLatin1(m_format->marker.ending)).find(m_catalogueFolder);
+    const QStringList paths = findFiles(m_catalogueFolder, QString::fromLatin1(m_format->marker.ending));
     std::vector<EffectRecord> markers;
     std::set<QString, PathLess> filesWithCrashedChild;
     for (const QString &path : paths) {

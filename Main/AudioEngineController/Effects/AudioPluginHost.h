@@ -1,7 +1,7 @@
 #pragma once
 
+#include "Core/BaseLib/FileFinder.h"
 #include "Core/BaseLib/FileTime.h"
-#include "Core/BaseLib/FolderListing.h"
 #include "Core/BaseLib/KriticalSection.h"
 #include "Main/AudioEngineController/Effects/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/EffectList.h"
@@ -42,9 +42,11 @@ public:
     /// Scans the folders (true) or only refreshes the effect list from the known list (false). `inProcess`
     /// matters to the registry only. True when the catalogue was written.
     virtual bool Scan(bool scan, bool inProcess);
+    /// The end of the names of the format's module files, with its dot; empty: it has none.
+    virtual QString moduleEnding() const { return QString(); }
     /// Has scans of several formats walk through the folders once; null, as at first: each walks for itself.
-    void setFolderListings(std::shared_ptr<FolderListings> listings) { m_listings = std::move(listings); }
-    const std::shared_ptr<FolderListings> &folderListings() const { return m_listings; }
+    void setFileFinder(std::shared_ptr<FileFinder> finder) { m_fileFinder = std::move(finder); }
+    const std::shared_ptr<FileFinder> &fileFinder() const { return m_fileFinder; }
     /// Sets what plug-ins are told about the audio they will be used for.
     virtual void setAudioSettings(int /*sampleRate*/, int /*blockSize*/) {}
     /// Category set of a file to the form used in memory, and back.
@@ -134,7 +136,7 @@ private:
 
     const CatalogueFormat *m_format;
     QString m_catalogueFolder;
-    std::shared_ptr<FolderListings> m_listings;
+    std::shared_ptr<FileFinder> m_fileFinder;
     FileStamp m_lastSeen;
     KnownList m_known;
     EffectList m_effects;

@@ -1,7 +1,6 @@
 #include "Main/AudioEngineController/Effects/FolderScan.h"
 
 #include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/FileFinder.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
@@ -11,11 +10,11 @@
 #include <algorithm>
 #include <exception>
 
-FolderScan::FolderScan(AudioPluginHost &host, const char *format, const QString &ending)
+FolderScan::FolderScan(AudioPluginHost &host, const char *format)
     : m_host(host)
     , m_format(format)
-    , m_ending(ending)
-    , m_listings(host.folderListings() ? host.folderListings() : std::make_shared<FolderListings>())
+    , m_finder(host.fileFinder() ? host.fileFinder()
+                                 : std::make_shared<FileFinder>(QStringList(host.moduleEnding())))
 {}
 
 FolderScan::~FolderScan() = default;
@@ -62,11 +61,9 @@ QStringList FolderScan::findFiles() const
 {
     QStringList paths;
     QSet<QString> seen;
-    FileFinder finder(m_ending);
-    finder.setListings(m_listings);
-    finder.setCancelled([this] { return isCancelled(); });
     for (const QString &folder : m_host.folders())
-        for (const QString &path : finder.find(folder)) {
+        for (const QString &path :
+             m_finder->find(folder, m_host.moduleEnding(), [this] { return isCancelled(); })) {
             seen.insert(pathKey(path));
             if (seen.size() > paths.size())
                 paths.append(path);
@@ -76,7 +73,7 @@ QStringList FolderScan::findFiles() const
 
 void FolderScan::keepUnread()
 {
-    for (const QString &folder : m_listings->unread())
+    for (const QString &folder : m_finder->unread())
         for (const EffectRecord *record : m_host.known().all())
             if (record->path.startsWith(folder + QLatin1Char('/'), kPathCase))
                 m_host.AddEffect(*record);

@@ -21,8 +21,8 @@ struct ScanItem {
 /// with progress, cancel and interim writes. Used once, on the scan worker.
 class FolderScan {
 public:
-    /// `format` names the format in the report; `ending` is the end of the module files' names, with its dot.
-    FolderScan(AudioPluginHost &host, const char *format, const QString &ending);
+    /// `format` names the format in the report.
+    FolderScan(AudioPluginHost &host, const char *format);
     virtual ~FolderScan();
     FolderScan(const FolderScan &) = delete;
     FolderScan &operator=(const FolderScan &) = delete;
@@ -71,8 +71,7 @@ private:
 
     AudioPluginHost &m_host;
     const char *m_format;
-    QString m_ending;
-    std::shared_ptr<FolderListings> m_listings;
+    std::shared_ptr<FileFinder> m_finder;
     ProcessState m_processState;
     std::shared_ptr<VProgressDisplay> m_progress;
     std::vector<ScanItem> m_items;

@@ -168,7 +168,11 @@ bool PluginHost::Scan(bool scan, bool inProcess)
 bool PluginHost::scanHosts(bool scan)
 {
     bool written = false;
-    shareFolderListings(std::make_shared<FolderListings>());
+    QStringList endings;
+    for (const auto &host : m_hosts)
+        if (const QString ending = host->moduleEnding(); !ending.isEmpty())
+            endings.append(ending);
+    shareFileFinder(std::make_shared<FileFinder>(endings));
     for (const std::size_t index : kScanOrder) {
         if (scan && m_launcher.isCancelled()) { // what the host knows stays in its catalogue
             ProbeReport::instance().cancelled();
@@ -176,14 +180,14 @@ bool PluginHost::scanHosts(bool scan)
         }
         written |= m_hosts[index]->Scan(scan, true);
     }
-    shareFolderListings(nullptr);
+    shareFileFinder(nullptr);
     return written;
 }
 
-void PluginHost::shareFolderListings(const std::shared_ptr<FolderListings> &listings) const
+void PluginHost::shareFileFinder(const std::shared_ptr<FileFinder> &finder) const
 {
     for (const auto &host : m_hosts)
-        host->setFolderListings(listings);
+        host->setFileFinder(finder);
 }
 
 void PluginHost::cancelScan()

@@ -88,7 +88,7 @@ public:
 private:
     AudioPluginHost *hostOfPrefix(const QString &prefix);
     bool scanHosts(bool scan);
-    void shareFolderListings(const std::shared_ptr<FolderListings> &listings) const;
+    void shareFileFinder(const std::shared_ptr<FileFinder> &finder) const;
     void startLauncher();
     void launch();
     void reloadChanged();

@@ -15,8 +15,6 @@ QStringList pathsIn(const EmptyFolder &folder, const QStringList &names)
     return paths;
 }
 
-FileFinder moduleFinder() { return FileFinder(".vst3"_q); }
-
 } // namespace
 
 TEST(FileFinder, ListsAFolderByNameAndThenWhatLiesBelow)
@@ -31,10 +29,10 @@ TEST(FileFinder, ListsAFolderByNameAndThenWhatLiesBelow)
     const QStringList expected = pathsIn(folder, {"a %1 [x].vst3"_q, "A.VST3"_q, "b.vst3"_q, "C.vst3"_q,
                                                   "🎸.vst3"_q, "C.vst3/Contents/inner.vst3"_q, "sub/a.vst3"_q,
                                                   "sub/deep/z.vst3"_q, "残響/残響.vst3"_q});
-    EXPECT_EQ(moduleFinder().find(folder.path()), expected);
-    EXPECT_EQ(moduleFinder().find(folder.path("sub/..//"_q)), expected);
-    EXPECT_EQ(FileFinder(".DLL"_q).find(folder.path()), pathsIn(folder, {"x.dll"_q}));
-    EXPECT_EQ(FileFinder(".scan"_q).find(folder.path()), QStringList());
+    EXPECT_EQ(findFiles(folder.path(), ".vst3"_q), expected);
+    EXPECT_EQ(findFiles(folder.path("sub/..//"_q), ".vst3"_q), expected);
+    EXPECT_EQ(findFiles(folder.path(), ".DLL"_q), pathsIn(folder, {"x.dll"_q}));
+    EXPECT_EQ(findFiles(folder.path(), ".scan"_q), QStringList());
     EXPECT_EQ(log.lines(), QStringList()) << "folders that merely hold nothing are no fault";
 }
 
@@ -44,24 +42,23 @@ TEST(FileFinder, CancelIsAskedBeforeEachFolder)
     folder.write("a.vst3"_q);
     folder.write("b/b.vst3"_q);
     folder.write("c/c.vst3"_q);
-    FileFinder finder = moduleFinder();
+    FileFinder finder({".vst3"_q});
     int asked = 0;
-    finder.setCancelled([&asked] { return ++asked > 2; });
-    EXPECT_EQ(finder.find(folder.path()), pathsIn(folder, {"a.vst3"_q, "b/b.vst3"_q}));
+    EXPECT_EQ(finder.find(folder.path(), ".vst3"_q, [&asked] { return ++asked > 2; }),
+              pathsIn(folder, {"a.vst3"_q, "b/b.vst3"_q}));
+    EXPECT_EQ(finder.find(folder.path(), ".vst3"_q),
+              pathsIn(folder, {"a.vst3"_q, "b/b.vst3"_q, "c/c.vst3"_q}))
+        << "a search that was cancelled is no answer";
 }
 
-TEST(FileFinder, SharesWhatItSawOnlyWithThoseWhoAsk)
+TEST(FileFinder, WalksOnceForAllEndings)
 {
     const EmptyFolder folder;
     folder.write("a/a.vst3"_q);
     folder.write("a/a.so"_q);
-    const auto listings = std::make_shared<FolderListings>();
-    FileFinder first = moduleFinder();
-    FileFinder second(".so"_q);
-    first.setListings(listings);
-    second.setListings(listings);
-    EXPECT_EQ(first.find(folder.path()), pathsIn(folder, {"a/a.vst3"_q}));
+    FileFinder finder({".vst3"_q, ".so"_q});
+    EXPECT_EQ(finder.find(folder.path(), ".vst3"_q), pathsIn(folder, {"a/a.vst3"_q}));
     folder.write("a/later.so"_q);
-    EXPECT_EQ(second.find(folder.path()), pathsIn(folder, {"a/a.so"_q}));
-    EXPECT_EQ(FileFinder(".so"_q).find(folder.path()), pathsIn(folder, {"a/a.so"_q, "a/later.so"_q}));
+    EXPECT_EQ(finder.find(folder.path(), ".so"_q), pathsIn(folder, {"a/a.so"_q}));
+    EXPECT_EQ(findFiles(folder.path(), ".so"_q), pathsIn(folder, {"a/a.so"_q, "a/later.so"_q}));
 }

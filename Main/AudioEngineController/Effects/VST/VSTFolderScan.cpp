@@ -1,11 +1,11 @@
 #include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
 
+#include "Core/BaseLib/BinaryExports.h"
 #include "Core/BaseLib/DebugLog.h"
 #include "Core/BaseLib/FileTime.h"
 #include "Main/AudioEngineController/Effects/ProbeBracket.h"
 #include "Main/AudioEngineController/Effects/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
-#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
@@ -49,7 +49,7 @@ void carryMarks(const ScanItem &item, EffectRecord &record)
 } // namespace
 
 VSTFolderScan::VSTFolderScan(VSTHost &host)
-    : FolderScan(host, "vst2", VSTModuleFile::ending())
+    : FolderScan(host, "vst2")
     , m_vstHost(host)
 {}
 

@@ -51,6 +51,8 @@ VSTHost &VSTHost::instance()
     return own;
 }
 
+QString VSTHost::moduleEnding() const { return VSTModuleFile::ending(); }
+
 bool VSTHost::Scan(bool scan, bool)
 {
     if (scan)

@@ -21,6 +21,7 @@ public:
     static VSTHost &instance();
 
     bool Scan(bool scan, bool inProcess) override;
+    QString moduleEnding() const override;
     /// As in every format; but of two files of the special shells that offer the same sub-plug-in, the one of
     /// the higher version stays.
     bool AddEffect(const EffectRecord &record) override;

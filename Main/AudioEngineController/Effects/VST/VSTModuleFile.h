@@ -1,7 +1,5 @@
 #pragma once
 
-#include "Core/BaseLib/BinaryExports.h"
-
 #include <QString>
 
 /// How VST 2 modules lie on disk, which differs from platform to platform.

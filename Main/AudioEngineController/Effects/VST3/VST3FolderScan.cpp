@@ -10,14 +10,8 @@
 
 namespace {
 
-constexpr char kEnding[] = ".vst3";
 /// From this many records of a file, or files of a scan, on the user interface hears of them once in advance.
 constexpr std::size_t kMany = 3;
-
-QString displayName(const QString &path)
-{
-    return fileNameOf(path).chopped(static_cast<int>(sizeof kEnding - 1));
-}
 
 /// The old record whose marks a new one takes over: its own; where either of them only stands for a file that
 /// failed, the one that speaks for the file. Null when there is none.
@@ -47,7 +41,7 @@ bool isOutdated(const EffectRecord &first, const QString &fileTime)
 } // namespace
 
 VST3FolderScan::VST3FolderScan(AudioPluginHost &host)
-    : FolderScan(host, "vst3", QString::fromLatin1(kEnding))
+    : FolderScan(host, "vst3")
 {}
 
 std::vector<ScanItem> VST3FolderScan::arrange(const QStringList &paths)
@@ -98,7 +92,7 @@ bool VST3FolderScan::process(const ScanItem &item)
     EffectRecord file;
     file.path = item.path;
     file.fileTime = item.fileTime;
-    showScanning(displayName(item.path));
+    showScanning(fileNameOf(item.path).chopped(host().moduleEnding().size()));
     ProbeEntry entry(format(), file);
     const ProbeBracket bracket(host(), processState(), file);
     DebugTrace(L"Probing %ls", item.path);

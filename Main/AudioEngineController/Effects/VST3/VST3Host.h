@@ -8,6 +8,7 @@ public:
     VST3Host();
 
     bool Scan(bool scan, bool inProcess) override;
+    QString moduleEnding() const override { return QStringLiteral(".vst3"); }
     LoadedPlugin loadPlugin(const QString &identifier) override;
 
 protected:

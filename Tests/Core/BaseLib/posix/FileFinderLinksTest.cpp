@@ -14,7 +14,7 @@ namespace {
 
 QStringList modulesIn(const EmptyFolder &folder)
 {
-    QStringList names = FileFinder(".vst3"_q).find(folder.path());
+    QStringList names = findFiles(folder.path(), ".vst3"_q);
     for (QString &name : names)
         name.remove(folder.path() + QLatin1Char('/'));
     return names;
