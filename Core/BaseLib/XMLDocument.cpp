@@ -25,6 +25,8 @@ QString wholeText(const char *utf8)
                : QString::fromUtf8(utf8);
 }
 
+qint64 integerOf(const char *utf8) { return std::strtoll(utf8, nullptr, 10); }
+
 } // namespace
 
 XMLElement XMLElement::child(const char *name) const
@@ -41,6 +43,8 @@ std::vector<XMLElement> XMLElement::children(const char *name) const
 }
 
 QString XMLElement::text() const { return wholeText(pugi::xml_node(m_node).text().get()); }
+
+qint64 XMLElement::integer() const { return integerOf(pugi::xml_node(m_node).text().get()); }
 
 std::optional<QString> XMLElement::attribute(const char *name) const
 {
@@ -87,11 +91,7 @@ XMLElement XMLDocument::root(const char *name) const
     return XMLElement(m_document->child(name).internal_object());
 }
 
-qint64 parseInteger(const QString &text)
-{
-    const QByteArray digits = text.toUtf8();
-    return std::strtoll(digits.constData(), nullptr, 10);
-}
+qint64 parseInteger(const QString &text) { return integerOf(text.toUtf8().constData()); }
 
 double parseDecimal(const QString &text)
 {

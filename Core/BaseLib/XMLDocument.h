@@ -25,6 +25,8 @@ public:
     std::vector<XMLElement> children(const char *name) const;
     /// The element's text; empty when there is none.
     QString text() const;
+    /// The element's text as `parseInteger` reads it; 0 when there is none.
+    qint64 integer() const;
     /// An attribute's value; nothing when the attribute is absent.
     std::optional<QString> attribute(const char *name) const;
 

@@ -50,6 +50,6 @@ extern const CatalogueElement kVendor;
 extern const CatalogueElement kEnabled;
 extern const CatalogueElement kWorking;
 
-inline qint32 readInt(const XMLElement &element) { return static_cast<qint32>(parseInteger(element.text())); }
-inline bool readBool(const XMLElement &element) { return parseInteger(element.text()) != 0; }
+inline qint32 readInt(const XMLElement &element) { return static_cast<qint32>(element.integer()); }
+inline bool readBool(const XMLElement &element) { return element.integer() != 0; }
 } // namespace CatalogueElements

@@ -136,7 +136,7 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
     // The last one: a name, which is not escaped, may hold something that looks like another.
     const std::vector<XMLElement> ids = crashed.children("SubID");
     if (format.hasSubId && !ids.empty())
-        record.subId = static_cast<quint32>(parseInteger(ids.back().text()));
+        record.subId = static_cast<quint32>(ids.back().integer());
     if (record.subId != 0)
         record.subName = record.name;
     return record;

@@ -22,7 +22,7 @@ Content number(const EffectRecord &record)
 void readSubEffect(EffectRecord &record, const XMLElement &element)
 {
     record.subName = element.child("Name").text();
-    record.subId = static_cast<quint32>(parseInteger(element.child("ID").text()));
+    record.subId = static_cast<quint32>(element.child("ID").integer());
 }
 
 /// The nested block, from behind its opening tag to before its closing one.
