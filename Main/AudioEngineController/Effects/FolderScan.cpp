@@ -44,7 +44,6 @@ void FolderScan::scan()
     keepUnread();
     m_items = arrange(paths);
     reportPlan(static_cast<std::size_t>(paths.size()));
-    collectWaiting();
     if (processItems())
         finish();
     else
@@ -84,7 +83,7 @@ void FolderScan::showItemProgress()
     if (!m_progress)
         return;
     m_progress->setRange(static_cast<int>(m_items.size()), QString());
-    m_progress->setValue(m_done);
+    m_progress->setValue(static_cast<int>(m_done));
 }
 
 void FolderScan::keep(const KnownList::Records &records)
@@ -95,9 +94,10 @@ void FolderScan::keep(const KnownList::Records &records)
 
 void FolderScan::collectWaiting()
 {
-    for (const ScanItem &item : m_items)
-        for (const EffectRecord &record : item.knownRecords)
+    for (std::size_t index = m_done + 1; index < m_items.size(); ++index)
+        for (const EffectRecord &record : m_items[index].knownRecords)
             addWaiting(record);
+    m_isWaitingCollected = true;
 }
 
 void FolderScan::reportPlan(std::size_t files) const
@@ -116,7 +116,7 @@ bool FolderScan::processItems()
         processItem(item);
         ++m_done;
         if (m_progress)
-            m_progress->setValue(m_done);
+            m_progress->setValue(static_cast<int>(m_done));
     }
     return !isCancelled();
 }
@@ -131,6 +131,8 @@ void FolderScan::processItem(const ScanItem &item)
     if (!added)
         return;
     m_added = true;
+    if (!m_isWaitingCollected) // not before: most scans find nothing new
+        collectWaiting();
     write(Durability::Buffered);
 }
 

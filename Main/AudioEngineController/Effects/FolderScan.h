@@ -60,6 +60,7 @@ private:
     QStringList findFiles() const;
     /// Keeps what is known of the files in folders that could not be read: they are neither found nor gone.
     void keepUnread();
+    /// Has interim writes carry what is known of the items behind the present one.
     void collectWaiting();
     void reportPlan(std::size_t files) const;
     bool processItems();
@@ -78,7 +79,8 @@ private:
     WaitingRecords m_waiting;
     std::set<QString, PathLess> m_probed; ///< paths
     std::size_t m_knownAtStart = 0;
-    int m_done = 0; ///< items
+    std::size_t m_done = 0; ///< items
+    bool m_isWaitingCollected = false;
     bool m_added = false;
     bool m_written = false;
 };
