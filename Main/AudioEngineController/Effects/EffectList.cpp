@@ -20,7 +20,9 @@ bool EffectList::add(const EffectRecord &record)
     if (!isNew)
         return false;
     entry->second.record = record;
-    entry->second.ownsName = m_names.insert(record.name).second;
+    const int before = m_names.size();
+    m_names.insert(record.name);
+    entry->second.ownsName = m_names.size() > before;
     if (!entry->second.ownsName)
         NameFromPath(entry->second.record);
     return true;
@@ -41,6 +43,6 @@ void EffectList::remove(const QString &id)
     if (entry == m_entries.end())
         return;
     if (entry->second.ownsName)
-        m_names.erase(entry->second.record.name);
+        m_names.remove(entry->second.record.name);
     m_entries.erase(entry);
 }

@@ -3,9 +3,9 @@
 #include "Main/AudioEngineController/Effects/EffectRecord.h"
 
 #include <QByteArray>
+#include <QSet>
 
 #include <map>
-#include <set>
 
 /// A record that came into a catalogue, with its text once it was written: each record is rendered once,
 /// however many times the file is.
@@ -41,5 +41,5 @@ public:
 
 private:
     Entries m_entries;
-    std::set<QString> m_names;
+    QSet<QString> m_names;
 };
