@@ -8,6 +8,11 @@
 /// The system's request that the process end: a termination signal, or the end of the user's session.
 namespace TerminationSignal {
 
+/// Whoever starts this process as its helper puts its process identifier into this environment variable: the
+/// end of that process is a request as well. A job object of Windows would do it too, but would end the
+/// helper in the middle of its work, and with it whatever plug-ins have started.
+inline constexpr char kParentVariable[] = "FXPROBE_PARENT";
+
 /// From now on the system's request no longer kills the process but is waited for.
 void install();
 /// Makes the request by hand. Safe in a signal handler.

@@ -5,11 +5,13 @@
 #include "Tests/Support/VST3Fixture.h"
 
 #include <QDateTime>
+#include <QDeadlineTimer>
 #include <QFile>
 #include <QFileInfo>
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <QJsonObject>
+#include <QThread>
 
 #include <gtest/gtest.h>
 
@@ -220,6 +222,24 @@ TEST_F(FxScan, TerminationEndsItCleanly)
     EXPECT_TRUE(m_folder.markers().isEmpty()) << qPrintable(m_folder.markers().join(' '));
     EXPECT_TRUE(m_folder.catalogue().contains("<Name>Earlier<"));
     EXPECT_FALSE(m_folder.catalogue().contains("<Name>Hang<"));
+}
+
+TEST_F(FxScan, NoScannerOutlivesItWhateverItsPluginHandles)
+{
+    addVst3("Earlier", "");
+    addVst3("Hang", "effect initialize signal term\nfault initialize hang\n");
+    ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
+    prepare(fxscan, {"--timeout", "0", m_folder.plugins()});
+    ASSERT_TRUE(fxscan.start());
+    ASSERT_TRUE(fxscan.waitUntil([this] { return m_folder.markers().contains("Hang.scan3"); }));
+    fxscan.kill();
+    fxscan.wait();
+    QDeadlineTimer patience(20000);
+    while (!m_folder.markers().isEmpty() && !patience.hasExpired())
+        QThread::msleep(50);
+    EXPECT_TRUE(m_folder.markers().isEmpty()) << "nobody is blamed";
+    addVst3("Hang", "");
+    EXPECT_EQ(states(scan()), (std::map<QString, QString>{{"Earlier", "ok"}, {"Hang", "ok"}}));
 }
 
 TEST_F(FxScan, ListingTouchesNothing)

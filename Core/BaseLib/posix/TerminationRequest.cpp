@@ -1,9 +1,11 @@
 #include "Core/BaseLib/TerminationRequest.h"
 
 #include <csignal>
+#include <cstdlib>
 #include <ctime>
 
 #include <semaphore.h>
+#include <unistd.h>
 
 namespace {
 
@@ -20,6 +22,19 @@ sem_t *requests()
 
 void onSignal(int) { TerminationSignal::raise(); }
 
+/// The process whose helper this one is, or 0; set before anybody waits.
+pid_t s_parent = 0;
+
+/// Only its real parent: whoever stands between (a debugger, a script) outlives it or not, as it likes.
+void watchParent()
+{
+    const char *const text = std::getenv(TerminationSignal::kParentVariable);
+    const pid_t named = text ? static_cast<pid_t>(std::strtol(text, nullptr, 10)) : 0;
+    s_parent = named == getppid() ? named : 0;
+}
+
+bool isParentGone() { return s_parent != 0 && getppid() != s_parent; }
+
 timespec deadlineIn(std::chrono::milliseconds timeout)
 {
     timespec deadline = {};
@@ -35,6 +50,7 @@ timespec deadlineIn(std::chrono::milliseconds timeout)
 void TerminationSignal::install()
 {
     requests(); // made before a handler can run
+    watchParent();
     for (const int number : {SIGTERM, SIGINT, SIGHUP}) {
         struct sigaction action = {};
         // Whoever started us with a signal ignored (nohup) wants it ignored.
@@ -53,5 +69,6 @@ void TerminationSignal::raise() { sem_post(requests()); }
 bool TerminationSignal::wait(std::chrono::milliseconds timeout)
 {
     const timespec deadline = deadlineIn(timeout);
-    return sem_clockwait(requests(), CLOCK_MONOTONIC, &deadline) == 0;
+    // The system tells it by a signal too, but a plug-in may have taken that for itself.
+    return sem_clockwait(requests(), CLOCK_MONOTONIC, &deadline) == 0 || isParentGone();
 }

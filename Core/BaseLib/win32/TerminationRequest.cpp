@@ -1,7 +1,7 @@
 #include "Core/BaseLib/TerminationRequest.h"
 
 #include <climits>
-#include <cwchar>
+#include <cstdlib>
 #include <iterator>
 
 #include <windows.h>
@@ -66,14 +66,14 @@ DWORD WINAPI runWindow(void *created)
 
 void CALLBACK onParentsEnd(void *, BOOLEAN) { TerminationSignal::raise(); }
 
-/// Whoever started this process as its helper says so; it is not to outlive that one.
 void watchParent()
 {
-    wchar_t text[16] = {};
-    if (GetEnvironmentVariableW(L"FXPROBE_PARENT", text, static_cast<DWORD>(std::size(text))) == 0)
+    char text[16] = {};
+    if (GetEnvironmentVariableA(TerminationSignal::kParentVariable, text,
+                                static_cast<DWORD>(std::size(text))) == 0)
         return;
     const HANDLE parent =
-        OpenProcess(SYNCHRONIZE, FALSE, static_cast<DWORD>(std::wcstoul(text, nullptr, 10)));
+        OpenProcess(SYNCHRONIZE, FALSE, static_cast<DWORD>(std::strtoul(text, nullptr, 10)));
     HANDLE wait = nullptr; // lives as long as the process, as the handle does
     if (parent)
         RegisterWaitForSingleObject(&wait, parent, onParentsEnd, nullptr, INFINITE, WT_EXECUTEONLYONCE);

@@ -1,8 +1,11 @@
 #include "Main/AudioEngineController/Effects/ScannerProcess.h"
 
+#include "Core/BaseLib/TerminationRequest.h"
 #include "Main/AudioEngineController/Effects/ScannerChild.h"
 
+#include <QCoreApplication>
 #include <QDeadlineTimer>
+#include <QProcessEnvironment>
 
 #include <algorithm>
 #include <thread>
@@ -20,6 +23,10 @@ ScannerProcess::ScannerProcess()
     : m_child(std::make_unique<ScannerChild>())
 {
     m_child->setProcessChannelMode(QProcess::MergedChannels);
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(QLatin1String(TerminationSignal::kParentVariable),
+                       QString::number(QCoreApplication::applicationPid()));
+    m_child->setProcessEnvironment(environment);
 }
 
 ScannerProcess::~ScannerProcess() { end(); }

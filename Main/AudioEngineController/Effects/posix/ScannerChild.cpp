@@ -11,7 +11,8 @@ ScannerChild::ScannerChild() = default;
 void ScannerChild::setupChildProcess()
 {
     setpgid(0, 0);
-    // Sent when the thread that started the scanner ends, be it with the whole process.
+    // Sent when the thread that started the scanner ends, be it with the whole process: at once, but a
+    // plug-in may have taken the signal for itself.
     prctl(PR_SET_PDEATHSIG, SIGTERM);
 }
 
