@@ -1,5 +1,7 @@
 #pragma once
 
+#include <QtGlobal>
+
 #include <chrono>
 #include <set>
 
@@ -10,3 +12,6 @@ std::set<int> runningThreads();
 /// True when no other threads run than those given, waiting up to `patience` for new ones that are just
 /// ending: a joined thread may still be listed for a moment.
 bool newThreadsEnd(const std::set<int> &before, std::chrono::milliseconds patience);
+
+/// Whether a process of that identifier runs on this machine, also another user's.
+bool isProcessRunning(qint64 process);

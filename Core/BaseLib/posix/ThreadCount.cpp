@@ -1,5 +1,7 @@
 #include "Core/BaseLib/ThreadCount.h"
 
+#include <cerrno>
+#include <csignal>
 #include <cstdlib>
 
 #include <dirent.h>
@@ -15,4 +17,9 @@ std::set<int> runningThreads()
             threads.insert(static_cast<int>(std::strtol(entry->d_name, nullptr, 10)));
     closedir(tasks);
     return threads;
+}
+
+bool isProcessRunning(qint64 process)
+{
+    return process > 0 && (kill(static_cast<pid_t>(process), 0) == 0 || errno == EPERM);
 }

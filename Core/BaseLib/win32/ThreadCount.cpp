@@ -74,3 +74,11 @@ std::set<int> runningThreads()
     } while (Thread32Next(snapshot.get(), &entry));
     return threads;
 }
+
+bool isProcessRunning(qint64 process)
+{
+    const Handle found(OpenProcess(SYNCHRONIZE, FALSE, static_cast<DWORD>(process)));
+    if (!found.isValid())
+        return GetLastError() == ERROR_ACCESS_DENIED;
+    return WaitForSingleObject(found.get(), 0) == WAIT_TIMEOUT; // it may be held open after its end
+}

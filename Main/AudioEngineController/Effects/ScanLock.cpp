@@ -1,11 +1,14 @@
 #include "Main/AudioEngineController/Effects/ScanLock.h"
 
 #include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/NativeFile.h"
+#include "Core/BaseLib/ThreadCount.h"
 
 #include <QCoreApplication>
 #include <QCryptographicHash>
 #include <QDir>
 #include <QFileInfo>
+#include <QSysInfo>
 
 namespace {
 
@@ -17,10 +20,22 @@ QString lockPath(const QString &effectsFolder, ScanLock::Role role)
 {
     const QFileInfo folder(effectsFolder);
     const QString known = folder.exists() ? folder.canonicalFilePath() : folder.absoluteFilePath();
-    const QByteArray hash = QCryptographicHash::hash(known.toUtf8(), QCryptographicHash::Sha1).toHex();
+    const QByteArray hash =
+        QCryptographicHash::hash(pathKey(known).toUtf8(), QCryptographicHash::Sha1).toHex();
     const QString name =
         role == ScanLock::Role::Scanner ? QStringLiteral("FxProbe") : QStringLiteral("fxscan");
     return QStringLiteral("%1/%2-%3.lock").arg(QDir::tempPath(), name, QString::fromLatin1(hash));
+}
+
+/// Whether the process that made the lock has died, though nobody but another user, or a process that a
+/// plug-in started in the dead one, could take it away.
+bool isLeftBehind(const QLockFile &file)
+{
+    qint64 process = 0;
+    QString host;
+    QString application;
+    return file.getLockInfo(&process, &host, &application) && host == QSysInfo::machineHostName() &&
+           !isProcessRunning(process);
 }
 
 } // namespace
@@ -35,7 +50,7 @@ ScanLock::ScanLock(const QString &effectsFolder, Role role)
     // states: numbers are used again, and soon by the next scanner. One that is held open cannot be removed.
     if (m_file.removeStaleLockFile() && m_file.tryLock())
         return;
-    m_heldByOther = m_file.error() == QLockFile::LockFailedError;
+    m_heldByOther = m_file.error() == QLockFile::LockFailedError && !isLeftBehind(m_file);
     if (!m_heldByOther)
         DebugLog(L"Cannot make the lock %ls; scanning without it", lockPath(effectsFolder, role));
 }
@@ -48,7 +63,7 @@ bool ScanLock::isScannerAtWork(const QString &effectsFolder)
     QString host;
     QString application;
     return file.getLockInfo(&process, &host, &application) && process != QCoreApplication::applicationPid() &&
-           !file.removeStaleLockFile();
+           !file.removeStaleLockFile() && !isLeftBehind(file);
 }
 
 QString ScanLock::holder(const QString &effectsFolder)

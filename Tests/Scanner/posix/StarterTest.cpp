@@ -1,6 +1,10 @@
+#include "Main/AudioEngineController/Effects/ScanLock.h"
 #include "Tests/Scanner/InterruptedProbe.h"
 
 #include <csignal>
+
+#include <sys/wait.h>
+#include <unistd.h>
 
 TEST_F(InterruptedProbe, ASignalThatTheStarterIgnoresIsIgnored)
 {
@@ -22,4 +26,27 @@ TEST_F(InterruptedProbe, AReaderThatGoesAwayDoesNotEndTheScan)
     EXPECT_TRUE(scanner.run().succeeded());
     EXPECT_EQ(m_folder.read("status"), "0\n");
     EXPECT_EQ(renewed(), kThree);
+}
+
+TEST_F(InterruptedProbe, ALockOfADeadScannerThatNobodyCanTakeAwayKeepsNobodyAway)
+{
+    slowDown({});
+    int lifeline[2];
+    ASSERT_EQ(pipe(lifeline), 0);
+    const pid_t scanner = fork();
+    if (scanner == 0) {
+        const ScanLock lock(m_folder.effects());
+        char byte = 0;
+        if (fork() == 0) { // as a plug-in may, in whose child the lock lives on
+            close(lifeline[1]);
+            static_cast<void>(read(lifeline[0], &byte, 1) == 0);
+        }
+        _exit(0);
+    }
+    ASSERT_EQ(waitpid(scanner, nullptr, 0), scanner);
+    EXPECT_FALSE(ScanLock::isScannerAtWork(m_folder.effects()));
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(renewed(), kThree);
+    close(lifeline[0]);
+    close(lifeline[1]);
 }
