@@ -51,8 +51,18 @@ EffectRecord *KnownList::recordForCrash(const EffectRecord &marker)
     return nullptr;
 }
 
+void KnownList::followMove(const QString &path)
+{
+    const Knowledge known = lookUp(path);
+    if (known.how != KnownAs::Moved)
+        return;
+    for (const EffectRecord *record : known.records)
+        const_cast<EffectRecord *>(record)->path = path; // one of ours, handed out as const
+}
+
 EffectRecord &KnownList::applyCrash(const EffectRecord &marker)
 {
+    followMove(marker.path);
     EffectRecord *record = recordForCrash(marker);
     if (!record)
         record = &m_records.emplace(fileNameOf(marker.path), marker)->second;

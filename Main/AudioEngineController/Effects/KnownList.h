@@ -56,6 +56,9 @@ public:
     Records all() const;
 
 private:
+    /// Gives records of a file that is gone the path of one of its name that nothing is known of: the file
+    /// was moved, and its marks go with it.
+    void followMove(const QString &path);
     EffectRecord *recordForCrash(const EffectRecord &marker);
 
     std::multimap<QString, EffectRecord, PathLess> m_records;

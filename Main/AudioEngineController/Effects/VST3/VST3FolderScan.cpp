@@ -55,11 +55,12 @@ std::vector<ScanItem> VST3FolderScan::arrange(const QStringList &paths)
 
 void VST3FolderScan::decide(const QString &path, std::vector<ScanItem> &queue)
 {
+    const KnownList::Knowledge known = host().known().lookUp(path);
     if (host().isLeftAlone(path)) {
-        keep(host().known().recordsOfPath(path));
+        if (known.how != KnownAs::Namesake)
+            keep(known.records);
         return;
     }
-    const KnownList::Knowledge known = host().known().lookUp(path);
     ScanItem item{path, VST3ModuleFile::fileTime(path), true, {}};
     const bool isSettled = known.how == KnownAs::Own || known.how == KnownAs::Namesake;
     if (!isSettled || isOutdated(*known.records.front(), item.fileTime)) {

@@ -72,14 +72,17 @@ TEST(KnownList, WhatACrashMarkerAppliesTo)
         std::vector<EffectRecord> filed;
         quint32 subId;
         std::size_t size;
+        std::size_t ofPath; ///< records, afterwards
     } rows[] = {
-        {"nothing known", {}, 0, 1},
-        {"the first of the same path", {known(kHere, "a"), known(kHere, "b")}, 0, 2},
-        {"the same name, its own file gone", {known(kThere, "a")}, 0, 1},
-        {"the same name, its own file there", {known(existing, "a")}, 0, 2},
-        {"a child of a shell", {child1, child2}, 2, 2},
-        {"a whole shell, beside its children", {child1, child2}, 0, 3},
-        {"a child that is not known", {child1}, 3, 2},
+        {"nothing known", {}, 0, 1, 1},
+        {"the first of the same path", {known(kHere, "a"), known(kHere, "b")}, 0, 2, 2},
+        {"the same name, its own file gone", {known(kThere, "a")}, 0, 1, 1},
+        {"the same name, its own file there", {known(existing, "a")}, 0, 2, 1},
+        {"a child of a shell", {child1, child2}, 2, 2, 2},
+        {"a whole shell, beside its children", {child1, child2}, 0, 3, 3},
+        {"a child that is not known", {child1}, 3, 2, 2},
+        {"a child of a shell that was moved", {known(kThere, "a", 1), known(kThere, "b", 2)}, 2, 2, 2},
+        {"a file of several classes that was moved", {known(kThere, "a"), known(kThere, "b")}, 0, 2, 2},
     };
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
@@ -90,6 +93,7 @@ TEST(KnownList, WhatACrashMarkerAppliesTo)
         crash.fileTime = "2025-01-01 00:00";
         list.applyCrash(crash).id = "crash";
         EXPECT_EQ(list.size(), row.size);
+        EXPECT_EQ(list.recordsOfPath(kHere).size(), row.ofPath);
         for (const EffectRecord *record : list.all()) {
             const bool isCulprit = record->id == "crash";
             EXPECT_EQ(record->enabled && record->working, !isCulprit);
