@@ -50,20 +50,19 @@ private:
 
 int reopen(std::vector<EffectRecord> &records, Chooser &chooser)
 {
-    int count = 0;
     std::set<QString> files;
-    for (EffectRecord &record : records) {
-        if (!chooser.choose(record))
-            continue;
-        record.enabled = true;
-        files.insert(record.path);
-        ++count;
+    // To the front: one that the user switched off would speak for the file, which would not be probed.
+    const auto others = std::stable_partition(
+        records.begin(), records.end(), [&](const EffectRecord &record) { return chooser.choose(record); });
+    for (auto record = records.begin(); record != others; ++record) {
+        record->enabled = true;
+        files.insert(record->path);
     }
     // Any of a file's records may be the one that speaks for it.
     for (EffectRecord &record : records)
         if (files.count(record.path) != 0)
             record.fileTime.clear();
-    return count;
+    return static_cast<int>(std::distance(records.begin(), others));
 }
 
 /// A catalogue with what is to be written of it.

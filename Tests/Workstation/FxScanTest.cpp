@@ -155,6 +155,23 @@ TEST_F(FxScan, ARetryBringsOneBackWithItsMarks)
     EXPECT_EQ(states(scan())["Other"], "ok");
 }
 
+TEST_F(FxScan, ARetryIsNotHeldUpByWhatIsSwitchedOff)
+{
+    const QByteArray classes = "class A\nclass B\nclass C\n";
+    const QString path = addVST3File(m_folder.plugins(), "Pair", classes);
+    scan();
+    QByteArray catalogue = m_folder.catalogue();
+    const int c = catalogue.indexOf("<Name>C<");
+    m_folder.write("Effects/VST3Configuration.xml",
+                   catalogue.replace(catalogue.indexOf("<Enabled>1<", c), 11, "<Enabled>0<"));
+    addVST3File(m_folder.plugins(), "Pair", classes + "fault module-entry abort\n");
+    m_folder.setModified(path, QDateTime(QDate(2030, 1, 1), QTime()));
+    scan();
+    addVST3File(m_folder.plugins(), "Pair", classes);
+    EXPECT_EQ(states(scan({"--retry-failed"})),
+              (std::map<QString, QString>{{"A", "ok"}, {"B", "ok"}, {"C", "switched off"}}));
+}
+
 TEST_F(FxScan, WhatFailsAfterAnUpdateIsNeitherNewNorGone)
 {
     const QString path = addVST3File(m_folder.plugins(), "Pair", "class A\nclass B\n");
