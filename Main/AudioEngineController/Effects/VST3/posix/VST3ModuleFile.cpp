@@ -22,6 +22,16 @@ QString usualBinary(const QString &bundle)
            QLatin1String(".so");
 }
 
+/// The path, unless what it leads to is there and no regular file: a pipe would be waited for.
+QString unlessSpecial(const QString &path, QString &reason)
+{
+    const QFileInfo file(path);
+    if (!file.exists() || file.isFile())
+        return path;
+    reason = QStringLiteral("it is not a regular file");
+    return QString();
+}
+
 } // namespace
 
 bool VST3ModuleFile::isModule(const QString &path)
@@ -32,17 +42,12 @@ bool VST3ModuleFile::isModule(const QString &path)
 
 QString VST3ModuleFile::binary(const QString &path, QString &reason)
 {
-    const QFileInfo module(path);
-    if (module.exists() && !module.isDir() && !module.isFile()) {
-        reason = QStringLiteral("it is not a regular file"); // a pipe would be waited for
-        return QString();
-    }
-    if (!module.isDir())
-        return path;
+    if (!QFileInfo(path).isDir())
+        return unlessSpecial(path, reason);
     const QString folder = path + QLatin1String(kBinaryFolder);
     const QString usual = usualBinary(path);
     if (QFileInfo::exists(usual))
-        return usual;
+        return unlessSpecial(usual, reason);
     const QStringList found = QDir(folder).entryList({QStringLiteral("*.so")}, QDir::Files);
     if (found.size() == 1)
         return folder + QLatin1Char('/') + found.first();

@@ -2,6 +2,8 @@
 
 #include <QFile>
 
+#include <sys/stat.h>
+
 namespace {
 
 using VST3FileSystem = VST3ScanBench;
@@ -28,4 +30,15 @@ TEST_F(VST3FileSystem, LinkedModulesAndFoldersAreFollowedWhereTheyAreListed)
     dateLater(file); // the time of a linked module is that of what it points to
     scan();
     EXPECT_EQ(loaded(), texts({"File"}));
+}
+
+TEST_F(VST3FileSystem, APipeInABundleIsNotWaitedFor)
+{
+    m_folder.write("Plugins/Pipe.vst3/Contents/x86_64-linux/other", "");
+    const QString pipe = m_folder.path("Plugins/Pipe.vst3/Contents/x86_64-linux/Pipe.so");
+    ASSERT_EQ(mkfifo(QFile::encodeName(pipe).constData(), 0644), 0);
+    const ScannerOutcome outcome = scanOnce();
+    EXPECT_TRUE(outcome.succeeded());
+    EXPECT_TRUE(outcome.log.contains("it is not a regular file")) << qPrintable(outcome.log);
+    EXPECT_EQ(records("Name Enabled Working"), texts({"Pipe|1|0"}));
 }
