@@ -22,6 +22,9 @@ QString problemOf(const QString &folder)
     return isGone ? QString() : systemMessage(error, folder);
 }
 
+/// The system takes halves of surrogate pairs too, which no file of ours could hold.
+bool isText(const QString &name) { return QString::fromUtf8(name.toUtf8()) == name; }
+
 } // namespace
 
 FolderContent readFolder(const QString &folder)
@@ -30,6 +33,8 @@ FolderContent readFolder(const QString &folder)
     QDirIterator iterator(folder, QDir::AllEntries | QDir::NoDotAndDotDot);
     while (iterator.hasNext()) {
         iterator.next();
+        if (!isText(iterator.fileName()))
+            continue;
         const QFileInfo info = iterator.fileInfo();
         // A link is told apart first: that needs no look at what it points to.
         content.entries.push_back({iterator.fileName(), !info.isSymLink() && info.isDir()});
