@@ -42,6 +42,24 @@ TEST_F(CatalogueState, AnUnusableCatalogueIsReplaced)
     }
 }
 
+TEST_F(CatalogueState, WhatCrashedIsSalvagedFromADamagedOneAndWrittenAgain)
+{
+    addListedModules({kComp});
+    editCatalogue("<Enabled>1<", "<Enabled>0<");
+    editCatalogue("<Working>1<", "<Working>0<");
+    const QByteArray good = m_folder.catalogue();
+    m_folder.write(cataloguePath(), good.left(good.indexOf("</Effects>")));
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(loaded(), QStringList());
+    EXPECT_EQ(m_folder.catalogue(), good);
+
+    // Of a version before the first: what it says means nothing to us.
+    editCatalogue("<Effects version=\"1.1\">", "<Scan>");
+    editCatalogue("</Effects>", "</Scan>");
+    EXPECT_TRUE(run().succeeded());
+    EXPECT_EQ(loaded(), QStringList(kComp));
+}
+
 TEST_F(CatalogueState, AFolderInThePlaceOfTheCatalogueStays)
 {
     addModule(kComp);

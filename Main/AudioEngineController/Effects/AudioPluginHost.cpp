@@ -127,6 +127,7 @@ void AudioPluginHost::ReadCatalogue()
 CatalogueContents AudioPluginHost::readContents()
 {
     const QString path = cataloguePath();
+    m_lastSeen = fileStamp(path);
     m_unread.clear();
     if (!QFile::exists(path))
         return {};
@@ -141,7 +142,7 @@ CatalogueContents AudioPluginHost::readContents()
 void AudioPluginHost::readKnownRecords()
 {
     const CatalogueContents contents = readContents();
-    if (!contents && !contents.isUnread) {
+    if (contents.isBroken) {
         // What crashed must not be loaded again only because of another plug-in's name.
         for (const EffectRecord &record : salvageRecords(*m_format, cataloguePath()))
             if (!record.enabled && !record.working)
@@ -149,7 +150,7 @@ void AudioPluginHost::readKnownRecords()
     }
     for (const EffectRecord &record : contents.records)
         m_known.file(record);
-    m_catalogueOutdated = contents.upgraded;
+    m_catalogueOutdated = contents.upgraded || (!contents && !contents.isUnread);
 }
 
 void AudioPluginHost::absorbMarkers()

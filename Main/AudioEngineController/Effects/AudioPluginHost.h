@@ -92,7 +92,8 @@ public:
     std::size_t effectCount() const { return m_effects.size(); }
     /// True when the effect list holds a record of the same plug-in under the same identifier.
     bool isListed(const EffectRecord &record) const;
-    /// True when the catalogue file holds something else than the known list, being of an earlier version.
+    /// True when the catalogue file holds something else than the known list, being of an earlier version or
+    /// of no use.
     bool isCatalogueOutdated() const { return m_catalogueOutdated; }
     /// Whether there is a catalogue that the system did not let us read. It is not replaced.
     bool isCatalogueUnread() const { return !m_unread.isEmpty(); }

@@ -49,6 +49,7 @@ CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString
     }
     XMLDocument document(XMLDocument::Entities::Literal);
     if (!document.parse(text)) {
+        contents.isBroken = true;
         contents.reason = document.error();
         return contents;
     }

@@ -10,6 +10,7 @@ struct CatalogueContents {
     QString reason;                    ///< why the file could not be used; empty when it was
     std::vector<EffectRecord> records; ///< in the order of the file
     bool isUnread = false;             ///< the file is there, but the system did not let it be read
+    bool isBroken = false;             ///< it is no XML; what it holds can be salvaged at best
     bool upgraded = false;             ///< an earlier version, whose records were changed while reading
 
     explicit operator bool() const { return reason.isEmpty(); }

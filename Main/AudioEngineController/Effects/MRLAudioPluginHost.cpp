@@ -35,8 +35,8 @@ void MRLAudioPluginHost::ReadCatalogue()
 {
     if (catalogueFolder().isEmpty())
         return;
-    const CatalogueContents contents = readContents();
     const TAutoLockCS lock(&m_ks);
+    const CatalogueContents contents = readContents();
     const bool hasEffects = effectList().size() != 0;
     for (const EffectRecord &marks : contents.records) {
         if (hasEffects && !effectList().find(marks.id))

@@ -33,7 +33,7 @@ IQuillonInterface *application() { return ApplicationContext::instance().quillon
 bool isSameOrInside(const QString &folder, const QString &outer)
 {
     const QString inside = QFileInfo(folder).canonicalFilePath() + QLatin1Char('/');
-    return inside.startsWith(QFileInfo(outer).canonicalFilePath() + QLatin1Char('/'));
+    return inside.startsWith(QFileInfo(outer).canonicalFilePath() + QLatin1Char('/'), kPathCase);
 }
 
 } // namespace
@@ -79,13 +79,15 @@ void PluginHost::moveOldCatalogue(const QString &previousEffectsFolder) const
     if (!QFile::exists(old))
         return;
     QDir().mkpath(effectsFolder());
+    // The old folder goes with all its content, but never with the new one inside. Asked now: a system that
+    // tells no case apart moves a file onto itself.
+    const bool isNeeded = isSameOrInside(effectsFolder(), previousEffectsFolder);
     QFile source(old);
     if (!source.rename(effectsFolder() + file)) {
         DebugLog(L"Cannot move %ls to %ls: %ls", old, effectsFolder(), source.errorString());
         return;
     }
-    // The old folder goes with all its content, but never with the new one inside.
-    if (!isSameOrInside(effectsFolder(), previousEffectsFolder))
+    if (!isNeeded)
         QDir(previousEffectsFolder).removeRecursively();
 }
 

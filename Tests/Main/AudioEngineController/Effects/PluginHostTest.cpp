@@ -57,6 +57,7 @@ TEST(PluginHost, MovingTheOldEffectsFolder)
         {"nothing to move, nothing removed", false, "new", nullptr, "", true},
         {"never over an existing file", true, "new", "new", "new", true},
         {"the new folder inside the old one", true, "old/Effects/inner", nullptr, "old", true},
+        {"the same folder", true, kPathCase == Qt::CaseSensitive ? "old" : "OLD", nullptr, "old", true},
     };
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
@@ -96,6 +97,7 @@ TEST(PluginHost, MarksOnBuiltInEffectsAreReadAndWritten)
     host.ReadCatalogue();
     EXPECT_EQ(log.lines(), QStringList()) << "nothing is lost where there are no effects";
     host.setBuiltInEffects(effects);
+    EXPECT_FALSE(host.catalogueChanged()) << "it was just read";
     EXPECT_TRUE(host.findEffect("b")->favourite);
     EXPECT_EQ(host.findEffect("b")->category, 0u) << "the mask is written only";
     EXPECT_EQ(log.count("is passed over"), 2);
