@@ -40,12 +40,18 @@ inline QString pathKey(const QString &path)
 std::FILE *openStream(const QString &path, const char *mode);
 /// Renames a file over an existing one in one step.
 FileResult renameOver(const QString &from, const QString &to);
+/// Deletes a file; one that is not there is no fault.
+FileResult removeFile(const QString &path);
 /// Waits until what was written to an open file has reached the disk; systems that cannot do so are not
 /// blamed.
 void syncToDisk(int fileDescriptor);
 /// Whether a folder that is no link is one of those in which it lies, or may be: a junction of Windows leads
 /// anywhere, and a search that enters would not end.
 bool leadsBack(const QString &folder);
+/// True when the system does not let us see whether there is such a file, or what kind it is of.
+bool cannotBeExamined(const QString &path);
+/// Whether the system takes the name for a device, whatever folder and ending it stands with.
+bool isDeviceName(const QString &name);
 /// Sets a file's modification time to now.
 void touchFile(const QString &path);
 /// What a moment is called in the local time zone.

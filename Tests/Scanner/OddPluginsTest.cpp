@@ -68,6 +68,21 @@ TEST_F(OddPlugins, AreListedOrBlamedAsOthersAre)
     EXPECT_EQ(catalogues(), settled);
 }
 
+// What crashed so gets no record, but is left alone until a run has come to its end.
+TEST_F(OddPlugins, CrashedWaveShellsDoNotComeBackInTheNextRun)
+{
+    for (const char *shell : {"a/WaveShell1-VST3 9.2", "b/WaveShell1-VST3 9.2", "c/WaveShell1-VST3 9.2"})
+        addVST3File(m_folder.plugins(), shell, "class Inner\nfault module-entry kill\n");
+    for (const char *killer : {"Bad1", "Bad2"})
+        addVST2File(m_folder.plugins(), killer, "fault get-vendor-string kill\n");
+    addVST3File(m_folder.plugins(), "Good3", "class Good3\n");
+    addVST2File(m_folder.plugins(), "Good2", "name Good2\n");
+    EXPECT_EQ(runUntilSettled(scannerProgram(), m_folder).size(), 6u);
+    for (const char *name : {"<Name>Good3<", "<Name>Good2<", "<Name>Bad1<", "<Name>Bad2<"})
+        EXPECT_TRUE(catalogues().contains(name)) << name;
+    EXPECT_FALSE(catalogues().contains("WaveShell"));
+}
+
 TEST_F(OddPlugins, AFolderThatChangesDuringTheScan)
 {
     addModule("A", "delay initialize 500\n");

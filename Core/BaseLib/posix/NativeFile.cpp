@@ -24,7 +24,22 @@ FileResult renameOver(const QString &from, const QString &to)
     return {QString::fromLocal8Bit(std::strerror(errno))};
 }
 
+FileResult removeFile(const QString &path)
+{
+    if (unlink(QFile::encodeName(path).constData()) == 0 || errno == ENOENT)
+        return {};
+    return {QString::fromLocal8Bit(std::strerror(errno))};
+}
+
 bool leadsBack(const QString &) { return false; } // only links lead elsewhere
+
+bool cannotBeExamined(const QString &path)
+{
+    struct stat status = {};
+    return stat(QFile::encodeName(path).constData(), &status) != 0 && errno != ENOENT && errno != ENOTDIR;
+}
+
+bool isDeviceName(const QString &) { return false; } // devices are files
 
 void syncToDisk(int fileDescriptor) { fsync(fileDescriptor); }
 

@@ -4,6 +4,7 @@
 
 #include <QDateTime>
 #include <QFileInfo>
+#include <QRegularExpression>
 
 #include <limits>
 #include <tuple>
@@ -12,8 +13,8 @@
 
 namespace {
 
-/// How long others may hold a file that is to be replaced: readers, indexers and virus scanners hold it for
-/// moments.
+/// How long others may hold a file that is to be replaced or deleted: readers, indexers and virus scanners
+/// hold it for moments.
 constexpr DWORD kPatience = 1000; ///< ms
 constexpr DWORD kPause = 10;      ///< ms
 
@@ -44,6 +45,23 @@ private:
 };
 
 bool isHeldByOthers(DWORD error) { return error == ERROR_SHARING_VIOLATION || error == ERROR_ACCESS_DENIED; }
+
+bool isGone(DWORD error) { return error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND; }
+
+/// Tries again for a while what fails only because others hold the file. `operation` leaves the reason with
+/// the system.
+template <typename Operation>
+FileResult patiently(const QString &path, Operation &&operation)
+{
+    for (DWORD waited = 0;; waited += kPause) {
+        if (operation())
+            return {};
+        const DWORD error = GetLastError();
+        if (!isHeldByOthers(error) || waited >= kPatience)
+            return {systemMessage(error, path)};
+        Sleep(kPause);
+    }
+}
 
 /// Volume and number of a file, the same by whatever path it is reached.
 using FileIdentity = std::tuple<DWORD, DWORD, DWORD>;
@@ -81,14 +99,26 @@ FileResult renameOver(const QString &from, const QString &to)
 {
     const std::wstring source = nativePath(from);
     const std::wstring target = nativePath(to);
-    for (DWORD waited = 0;; waited += kPause) {
-        if (MoveFileExW(source.c_str(), target.c_str(), MOVEFILE_REPLACE_EXISTING))
-            return {};
-        const DWORD error = GetLastError();
-        if (!isHeldByOthers(error) || waited >= kPatience)
-            return {systemMessage(error, to)};
-        Sleep(kPause);
-    }
+    return patiently(to,
+                     [&] { return MoveFileExW(source.c_str(), target.c_str(), MOVEFILE_REPLACE_EXISTING); });
+}
+
+FileResult removeFile(const QString &path)
+{
+    const std::wstring file = nativePath(path);
+    return patiently(path, [&] { return DeleteFileW(file.c_str()) || isGone(GetLastError()); });
+}
+
+bool cannotBeExamined(const QString &path)
+{
+    return GetFileAttributesW(nativePath(path).c_str()) == INVALID_FILE_ATTRIBUTES && !isGone(GetLastError());
+}
+
+bool isDeviceName(const QString &name)
+{
+    static const QRegularExpression devices(QStringLiteral("^(con|prn|aux|nul|com[0-9]|lpt[0-9]) *(\\.|$)"),
+                                            QRegularExpression::CaseInsensitiveOption);
+    return devices.match(name).hasMatch();
 }
 
 bool leadsBack(const QString &folder)

@@ -158,17 +158,17 @@ void AudioPluginHost::absorbMarkers()
     if (!QDir(m_catalogueFolder).exists())
         return;
     const QStringList paths = findFiles(m_catalogueFolder, QString::fromLatin1(m_format->marker.ending));
+    // While its scanner runs, a marker blames nobody.
+    if (!paths.isEmpty() && ScanLock::isScannerAtWork(m_catalogueFolder)) {
+        DebugLog(L"Another scanner is at work in %ls; its crash markers stay", m_catalogueFolder);
+        return;
+    }
     std::vector<EffectRecord> markers;
     std::set<QString, PathLess> filesWithCrashedChild;
     for (const QString &path : paths) {
         markers.push_back(ReadCrashMarker(path));
         if (markers.back().subId != 0)
             filesWithCrashedChild.insert(markers.back().path);
-    }
-    // While its scanner runs, a marker blames nobody.
-    if (!paths.isEmpty() && ScanLock::isScannerAtWork(m_catalogueFolder)) {
-        DebugLog(L"Another scanner is at work in %ls; its crash markers stay", m_catalogueFolder);
-        return;
     }
     QStringList absorbed;
     for (std::size_t index = 0; index < markers.size(); ++index) {
@@ -183,7 +183,7 @@ void AudioPluginHost::absorbMarkers()
         return; // Markers stay where nothing else holds what they say.
     m_catalogueOutdated = false;
     for (const QString &path : absorbed)
-        QFile::remove(path);
+        removeMarkerFile(path);
 }
 
 EffectRecord AudioPluginHost::ReadCrashMarker(const QString &marker) const
@@ -194,7 +194,7 @@ EffectRecord AudioPluginHost::ReadCrashMarker(const QString &marker) const
 void AudioPluginHost::releaseHeldMarkers()
 {
     for (const QString &path : m_heldMarkers)
-        QFile::remove(path);
+        removeMarkerFile(path);
     m_heldMarkers.clear();
 }
 
@@ -251,19 +251,33 @@ void AudioPluginHost::completeFailedRecord(EffectRecord &record) const
     record.working = false;
 }
 
+QString AudioPluginHost::freeMarkerPath(const EffectRecord &plugin) const
+{
+    const auto named = [&](const QString &name) {
+        return markerPath(m_format->marker, m_catalogueFolder, plugin.path, name);
+    };
+    // Those of files that are left alone must stay too: a file of the same name would bring them back.
+    const auto isTaken = [&](const QString &marker) {
+        return ActiveMarkers::contains(marker) || m_heldMarkers.contains(marker, Qt::CaseInsensitive);
+    };
+    QString marker = named(plugin.name);
+    // A sub-plug-in may bear the name of its shell, whose own marker must stay as it is.
+    if (isTaken(marker) && plugin.subId != 0)
+        marker = named(plugin.name + QLatin1Char('_') + QString::number(plugin.subId));
+    for (int number = 2; isTaken(marker); ++number) // in front, as the ends of long names are cut off
+        marker = named(QString::number(number) + QLatin1Char('_') + plugin.name);
+    return marker;
+}
+
 QString AudioPluginHost::WriteCrashMarker(const EffectRecord &plugin, const QString &name)
 {
-    QString marker = markerPath(m_format->marker, m_catalogueFolder, plugin.path, name);
-    // A sub-plug-in may bear the name of its shell, whose own marker must stay as it is.
-    if (ActiveMarkers::contains(marker))
-        marker = markerPath(m_format->marker, m_catalogueFolder, plugin.path,
-                            name + QLatin1Char('_') + QString::number(plugin.subId));
-    // Registered first: whoever abandons the markers must find this one whenever it is on disk.
-    ActiveMarkers::add(marker);
     EffectRecord content = plugin;
     content.name = name;
     if (name.isNull())
         NameFromPath(content);
+    const QString marker = freeMarkerPath(content);
+    // Registered first: whoever abandons the markers must find this one whenever it is on disk.
+    ActiveMarkers::add(marker);
     if (const FileResult written = writeMarkerFile(m_format->marker, marker, content); !written)
         DebugLog(L"Cannot write the crash marker %ls: %ls", marker, written.reason);
     return marker;

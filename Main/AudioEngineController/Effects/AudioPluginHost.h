@@ -68,8 +68,8 @@ public:
     /// Reads a crash marker into a fresh record that is not enabled. The file stays: it is deleted once the
     /// catalogue holds what it said.
     EffectRecord ReadCrashMarker(const QString &marker) const;
-    /// Deletes the markers of files that are left alone. Called when a scan has come to its end: until then
-    /// another crash must not bring those files back.
+    /// Deletes the markers of files that are left alone. Called when the scans of all formats have come to
+    /// their ends: until then another crash must not bring those files back.
     void releaseHeldMarkers();
 
     /// Completes the record of a file, or of a sub-plug-in, that failed to load or lists nothing: named after
@@ -133,6 +133,8 @@ private:
     void absorbMarker(const EffectRecord &marker);
     bool writeKnownRecords();
     bool writeRecords(const std::vector<const QByteArray *> &records, Durability durability);
+    /// For a plug-in that bears the name for its marker: a path that no marker in use has.
+    QString freeMarkerPath(const EffectRecord &plugin) const;
     QString freeIdentifier(const EffectRecord &plugin, const QString &name) const;
 
     const CatalogueFormat *m_format;

@@ -22,8 +22,9 @@ QString usableFileName(QString name)
     for (QChar &character : name)
         if (character < QLatin1Char(' ') || QLatin1String("<>:\"/\\|?*").contains(character))
             character = QLatin1Char('_');
-    // A name that starts with a dot would be hidden, and its marker never found.
-    return name.isEmpty() || name.startsWith(QLatin1Char('.')) ? QLatin1Char('_') + name : name;
+    // A name that starts with a dot would be hidden, and its marker never found; a device is no file.
+    const bool isUnusable = name.isEmpty() || name.startsWith(QLatin1Char('.')) || isDeviceName(name);
+    return isUnusable ? QLatin1Char('_') + name : name;
 }
 
 QString cutToBytes(QString text, int limit)
@@ -142,6 +143,12 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
     return record;
 }
 
+void removeMarkerFile(const QString &marker)
+{
+    if (const FileResult removed = removeFile(marker); !removed)
+        DebugLog(L"Cannot delete the crash marker %ls: %ls", marker, removed.reason);
+}
+
 void ActiveMarkers::add(const QString &marker)
 {
     Markers &markers = activeMarkers();
@@ -162,7 +169,7 @@ void ActiveMarkers::remove(const QString &marker)
 {
     Markers &markers = activeMarkers();
     const std::lock_guard<std::mutex> lock(markers.mutex);
-    QFile::remove(marker);
+    removeMarkerFile(marker);
     markers.paths.erase(marker);
 }
 
@@ -173,6 +180,6 @@ void ActiveMarkers::abandon(const std::function<void()> &then)
     if (markers.paths.empty())
         return;
     for (const QString &marker : markers.paths)
-        QFile::remove(marker);
+        removeMarkerFile(marker);
     then();
 }

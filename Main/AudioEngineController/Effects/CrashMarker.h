@@ -21,6 +21,9 @@ FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, co
 /// The file stays: it is deleted once the catalogue holds what it said.
 EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker);
 
+/// Deletes a marker's file; one that stays would name a culprit to the next run, and is logged.
+void removeMarkerFile(const QString &marker);
+
 /// The markers of this process that are on disk now. Any thread.
 namespace ActiveMarkers {
 void add(const QString &marker);

@@ -48,7 +48,6 @@ void FolderScan::scan()
         finish();
     else
         finishCancelled();
-    m_host.releaseHeldMarkers();
 }
 
 bool FolderScan::isCancelled() const

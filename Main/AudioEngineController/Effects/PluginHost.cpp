@@ -183,6 +183,9 @@ bool PluginHost::scanHosts(bool scan)
         written |= m_hosts[index]->Scan(scan, true);
     }
     shareFileFinder(nullptr);
+    for (const auto &host : m_hosts)
+        if (scan && !host->isCatalogueUnread())
+            host->releaseHeldMarkers();
     return written;
 }
 

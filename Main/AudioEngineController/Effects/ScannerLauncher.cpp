@@ -8,8 +8,6 @@
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 
-#include <QFile>
-
 #include <algorithm>
 #include <chrono>
 #include <iterator>
@@ -107,7 +105,7 @@ void ScannerLauncher::waitForEnd(const Job &job, ScannerProcess &scanner, Marker
             end.how = How::Cancelled;
             // Nobody is to blame, unless the plug-in had its time. Markers that the run found are not ours.
             for (const QString &marker : isOverdue ? QStringList() : watch.markersOfRun())
-                QFile::remove(marker);
+                removeMarkerFile(marker);
             return;
         }
         if (isOverLimit(job, watch)) {

@@ -61,8 +61,11 @@ std::vector<ScanItem> VSTFolderScan::arrange(const QStringList &paths)
     items.reserve(static_cast<std::size_t>(sorted.size()));
     for (const QString &path : sorted) {
         const QString fileTime = regularFileTimeText(path);
-        if (fileTime.isEmpty()) // a folder of that name; or a pipe, which would be waited for
+        if (fileTime.isEmpty()) { // a folder of that name; or a pipe, which would be waited for
+            if (cannotBeExamined(path))
+                keep(host().known().recordsOfPath(path));
             continue;
+        }
         const KnownList::Knowledge known = host().known().lookUp(path);
         ScanItem item{path, fileTime, true, {}};
         item.probe = known.how != KnownAs::Own || isOutdated(*known.records.front(), item.fileTime);

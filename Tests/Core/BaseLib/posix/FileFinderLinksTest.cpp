@@ -1,4 +1,5 @@
 #include "Core/BaseLib/FileFinder.h"
+#include "Core/BaseLib/NativeFile.h"
 
 #include "Tests/Core/BaseLib/Fixtures.h"
 #include "Tests/Core/BaseLib/posix/OrdinaryUser.h"
@@ -78,6 +79,10 @@ TEST(FileFinder, AnUnreadableFolderIsOneLogLineAndItsNeighboursAreFound)
         const CapturedLog log;
         return modulesIn(folder) == QStringList({"a/a.vst3"_q, "z/z.vst3"_q}) && log.lines().size() == 1 &&
                log.contains("closed\": Permission denied"_q);
+    }));
+    EXPECT_TRUE(trueForOrdinaryUser([&folder] {
+        return cannotBeExamined(folder.path("closed/x.vst3"_q)) &&
+               !cannotBeExamined(folder.path("a/a.vst3"_q)) && !cannotBeExamined(folder.path("a/none"_q));
     }));
     chmod(closed.constData(), 0755);
 }

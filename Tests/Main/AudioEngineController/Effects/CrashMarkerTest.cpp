@@ -49,6 +49,8 @@ TEST(CrashMarker, FileNames)
         {"/fx/Shell.vst3", "tab\tnew\nline", "tab_new_line"},
         {"/fx/Shell.vst3", "", "_"},
         {"/fx/Shell.vst3", ".hidden", "_.hidden"},
+        {"/fx/Shell.vst3", "nul", isDeviceName("nul") ? "_nul" : "nul"},
+        {"/fx/Shell.vst3", "null", "null"},
     };
     for (const auto &row : rows)
         EXPECT_EQ(markerPath(vst3(), "/e", row.path, row.name), QString("/e/") + row.file + ".scan3");
