@@ -28,6 +28,15 @@ protected:
         prepare(fxscan, options);
         return fxscan.run();
     }
+    /// Starts a scan without a limit and waits until it hangs in its second plug-in.
+    bool startHanging(ScannerRun &fxscan, const char *script) const
+    {
+        addVst3("Earlier", "");
+        addVst3("Hang", script);
+        prepare(fxscan, {"--timeout", "0", m_folder.plugins()});
+        return fxscan.start() &&
+               fxscan.waitUntil([this] { return m_folder.markers().contains("Hang.scan3"); });
+    }
     void prepare(ScannerRun &fxscan, const QStringList &options) const
     {
         fxscan.removeEnvironment("FXPROBE_LOG");
@@ -228,12 +237,8 @@ TEST_F(FxScan, TheLimitAndTheResultHoldWhateverAPluginPrints)
 
 TEST_F(FxScan, TerminationEndsItCleanly)
 {
-    addVst3("Earlier", "");
-    addVst3("Hang", "fault initialize hang\n");
     ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
-    prepare(fxscan, {"--timeout", "0", m_folder.plugins()});
-    ASSERT_TRUE(fxscan.start());
-    ASSERT_TRUE(fxscan.waitUntil([this] { return m_folder.markers().contains("Hang.scan3"); }));
+    ASSERT_TRUE(startHanging(fxscan, "fault initialize hang\n"));
     fxscan.requestTermination();
     EXPECT_EQ(fxscan.wait().exitCode, 3);
     EXPECT_TRUE(m_folder.markers().isEmpty()) << qPrintable(m_folder.markers().join(' '));
@@ -243,12 +248,8 @@ TEST_F(FxScan, TerminationEndsItCleanly)
 
 TEST_F(FxScan, NoScannerOutlivesItWhateverItsPluginHandles)
 {
-    addVst3("Earlier", "");
-    addVst3("Hang", "effect initialize signal term\nfault initialize hang\n");
     ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
-    prepare(fxscan, {"--timeout", "0", m_folder.plugins()});
-    ASSERT_TRUE(fxscan.start());
-    ASSERT_TRUE(fxscan.waitUntil([this] { return m_folder.markers().contains("Hang.scan3"); }));
+    ASSERT_TRUE(startHanging(fxscan, "effect initialize signal term\nfault initialize hang\n"));
     fxscan.kill();
     fxscan.wait();
     QDeadlineTimer patience(20000);

@@ -96,7 +96,6 @@ void FolderScan::collectWaiting()
     for (std::size_t index = m_done + 1; index < m_items.size(); ++index)
         for (const EffectRecord &record : m_items[index].knownRecords)
             addWaiting(record);
-    m_isWaitingCollected = true;
 }
 
 void FolderScan::reportPlan(std::size_t files) const
@@ -129,9 +128,9 @@ void FolderScan::processItem(const ScanItem &item)
     m_probed.insert(item.path);
     if (!added)
         return;
-    m_added = true;
-    if (!m_isWaitingCollected) // not before: most scans find nothing new
+    if (!m_added) // not before: most scans find nothing new
         collectWaiting();
+    m_added = true;
     write(Durability::Buffered);
 }
 

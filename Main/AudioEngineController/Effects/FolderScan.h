@@ -80,7 +80,6 @@ private:
     std::set<QString, PathLess> m_probed; ///< paths
     std::size_t m_knownAtStart = 0;
     std::size_t m_done = 0; ///< items
-    bool m_isWaitingCollected = false;
     bool m_added = false;
     bool m_written = false;
 };
