@@ -1,14 +1,14 @@
 // The parts of a scan one by one. "N" is a number of records or plug-ins; "big O" at the end of a row says
 // how the time grows.
 
-#include "Core/BaseLib/BinaryExports.h"
-#include "Core/BaseLib/FileFinder.h"
-#include "Core/BaseLib/FileTime.h"
-#include "Main/AudioEngineController/Effects/CatalogueFile.h"
-#include "Main/AudioEngineController/Effects/CrashMarker.h"
-#include "Main/AudioEngineController/Effects/KnownList.h"
+#include "Core/BaseLib/Binary/BinaryExports.h"
+#include "Core/BaseLib/Files/FileFinder.h"
+#include "Core/BaseLib/Files/FileTime.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
-#include "Tests/Core/BaseLib/PeBuilder.h"
+#include "Tests/Core/BaseLib/Binary/PeBuilder.h"
 
 #include <QDir>
 #include <QFile>

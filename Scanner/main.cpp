@@ -1,5 +1,5 @@
-#include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/ProcessSetup.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/ProcessSetup.h"
 #include "Scanner/ScannerEntry.h"
 
 #include <QApplication>

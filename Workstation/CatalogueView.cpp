@@ -1,7 +1,7 @@
 #include "Workstation/CatalogueView.h"
 
-#include "Main/AudioEngineController/Effects/CatalogueFile.h"
-#include "Main/AudioEngineController/Effects/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/CatalogueFormat.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFormat.h"
 
 #include <QString>
 #include <QStringList>

@@ -1,6 +1,6 @@
 #include "Workstation/Progress.h"
 
-#include "Main/AudioEngineController/Effects/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Workstation/CatalogueView.h"
 #include "Workstation/ScanAccount.h"
 #include "Workstation/Terminal.h"

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Core/BaseLib/TextFile.h"
+#include "Core/BaseLib/Files/TextFile.h"
 #include "Workstation/ScanAccount.h"
 
 /// Remembers between scans why plug-ins cannot be used: the catalogue has no place for it, and what did not

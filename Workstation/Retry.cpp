@@ -1,7 +1,7 @@
 #include "Workstation/Retry.h"
 
-#include "Core/BaseLib/FileFinder.h"
-#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Core/BaseLib/Files/FileFinder.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Workstation/CatalogueView.h"
 
 #include <QDir>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Core/BaseLib/TextFile.h"
+#include "Core/BaseLib/Files/TextFile.h"
 
 #include <QStringList>
 

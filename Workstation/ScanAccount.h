@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/ScannerLauncher.h"
+#include "Main/AudioEngineController/Effects/Launcher/ScannerLauncher.h"
 
 #include <QByteArray>
 #include <QString>

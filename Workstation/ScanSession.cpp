@@ -1,10 +1,10 @@
 #include "Workstation/ScanSession.h"
 
-#include "Core/BaseLib/ProcessSetup.h"
-#include "Core/BaseLib/TerminationRequest.h"
-#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Core/BaseLib/Process/ProcessSetup.h"
+#include "Core/BaseLib/Process/TerminationRequest.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
-#include "Main/AudioEngineController/Effects/ProbeReport.h"
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Workstation/Terminal.h"
 
 #include <atomic>

@@ -1,6 +1,6 @@
 #include "Main/ReWire/ReWireProbe.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/ReWire/ReWireLibrary.h"
 
 #include <cstdarg>

@@ -1,7 +1,7 @@
 #include "Main/VLib/SimpleGUI.h"
 
-#include "Core/BaseLib/Assertion.h"
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/Assertion.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/VLib/VProgressDisplay.h"
 #include "Main/VLib/VUI.h"
 

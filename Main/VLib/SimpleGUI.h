@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Core/BaseLib/FormatText.h"
+#include "Core/BaseLib/Log/FormatText.h"
 
 #include <QString>
 

@@ -1,9 +1,9 @@
 #include "Main/VLib/UiFxProbe.h"
 
-#include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/PluginThread.h"
-#include "Core/BaseLib/ProcessSetup.h"
-#include "Core/BaseLib/TerminationRequest.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/PluginThread.h"
+#include "Core/BaseLib/Process/ProcessSetup.h"
+#include "Core/BaseLib/Process/TerminationRequest.h"
 #include "Main/VLib/FxProbeUI.h"
 #include "Main/VLib/ScreenLoss.h"
 #include "Main/VLib/SimpleGUI.h"

@@ -1,6 +1,6 @@
 #include "Main/VLib/VObject.h"
 
-#include "Core/BaseLib/Assertion.h"
+#include "Core/BaseLib/Log/Assertion.h"
 
 int VObject::compare(const VObject &other) const
 {

@@ -1,5 +1,5 @@
-#include "Main/AudioEngineController/Effects/CatalogueFile.h"
-#include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Tests/Fuzz/FuzzTarget.h"

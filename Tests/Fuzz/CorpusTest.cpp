@@ -1,4 +1,4 @@
-#include "Core/BaseLib/TextFile.h"
+#include "Core/BaseLib/Files/TextFile.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 
 #include <QDir>

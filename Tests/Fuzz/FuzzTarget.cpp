@@ -1,6 +1,6 @@
 #include "Tests/Fuzz/FuzzTarget.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 
 #include <QDir>
 #include <QFile>

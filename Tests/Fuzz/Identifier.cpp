@@ -1,5 +1,5 @@
-#include "Main/AudioEngineController/Effects/AudioPlugin.h"
-#include "Main/AudioEngineController/Effects/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ClassId.h"
 #include "Tests/Fuzz/FuzzTarget.h"

@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Tests/Fuzz/FuzzTarget.h"

@@ -1,6 +1,6 @@
-#include "Core/BaseLib/BinaryExports.h"
-#include "Core/BaseLib/LoadFailure.h"
-#include "Core/BaseLib/PeImage.h"
+#include "Core/BaseLib/Binary/BinaryExports.h"
+#include "Core/BaseLib/Binary/LoadFailure.h"
+#include "Core/BaseLib/Binary/PeImage.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 
 namespace {

@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 

@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/ScanList.h"
+#include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 
 #include "Tests/Fuzz/FuzzTarget.h"
 

@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Tests/Scanner/ScannerTest.h"

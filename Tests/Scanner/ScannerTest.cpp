@@ -1,7 +1,7 @@
 #include "Tests/Scanner/ScannerTest.h"
 
-#include "Core/BaseLib/TextFile.h"
-#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Core/BaseLib/Files/TextFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 
 #include <QDirIterator>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Tests/Support/ScannerRun.h"
 #include "Tests/Support/TestFolder.h"
 #include "Tests/Support/VST3Fixture.h"

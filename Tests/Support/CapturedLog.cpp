@@ -1,6 +1,6 @@
 #include "Tests/Support/CapturedLog.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 
 class CapturedLog::Sink : public LogSink {
 public:

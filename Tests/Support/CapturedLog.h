@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Core/BaseLib/LogSink.h"
+#include "Core/BaseLib/Log/LogSink.h"
 
 #include <QStringList>
 

@@ -1,6 +1,6 @@
 #include "Tests/Support/TestFolder.h"
 
-#include "Core/BaseLib/TextFile.h"
+#include "Core/BaseLib/Files/TextFile.h"
 
 #include <QDir>
 #include <QFile>

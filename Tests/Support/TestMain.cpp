@@ -1,4 +1,4 @@
-#include "Core/BaseLib/ProcessSetup.h"
+#include "Core/BaseLib/Process/ProcessSetup.h"
 
 #include <QCoreApplication>
 

@@ -1,9 +1,9 @@
 #pragma once
 
-#include "Core/BaseLib/ManualResetEvent.h"
-#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+#include "Core/BaseLib/Process/ManualResetEvent.h"
+#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Launcher/ScannerLauncher.h"
 #include "Main/AudioEngineController/Effects/ParameterHandler.h"
-#include "Main/AudioEngineController/Effects/ScannerLauncher.h"
 
 #include <array>
 #include <atomic>

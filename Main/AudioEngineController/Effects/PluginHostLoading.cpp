@@ -1,7 +1,7 @@
-#include "Core/BaseLib/DebugLog.h"
-#include "Main/AudioEngineController/Effects/DummyAudioPlugin.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Plugin/DummyAudioPlugin.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
-#include "Main/AudioEngineController/Effects/PluginIdentifier.h"
 
 AudioPluginHost *PluginHost::hostOfPrefix(const QString &prefix)
 {

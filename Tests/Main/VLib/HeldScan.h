@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Core/BaseLib/ManualResetEvent.h"
+#include "Core/BaseLib/Process/ManualResetEvent.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/UiFxProbe.h"
 #include "Main/VLib/VProgressDisplay.h"

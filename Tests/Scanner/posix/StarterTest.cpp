@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/ScanLock.h"
+#include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
 #include "Tests/Scanner/InterruptedProbe.h"
 
 #include <csignal>

@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 
-#include "Core/BaseLib/FileTime.h"
-#include "Main/AudioEngineController/Effects/CatalogueFile.h"
+#include "Core/BaseLib/Files/FileTime.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 
 namespace {
 

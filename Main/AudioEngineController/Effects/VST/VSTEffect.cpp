@@ -1,8 +1,8 @@
 #include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
 
-#include "Core/BaseLib/Assertion.h"
-#include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/FaultGuard.h"
+#include "Core/BaseLib/Log/Assertion.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 
 #include <algorithm>

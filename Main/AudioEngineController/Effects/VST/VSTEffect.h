@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/ChannelBuffers.h"
+#include "Main/AudioEngineController/Effects/Plugin/ChannelBuffers.h"
 #include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
 
 #include <QByteArray>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/FolderScan.h"
+#include "Main/AudioEngineController/Effects/Host/FolderScan.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 
 #include <memory>

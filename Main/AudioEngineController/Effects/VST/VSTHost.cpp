@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"

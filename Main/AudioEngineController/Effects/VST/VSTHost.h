@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
 
 #include <atomic>

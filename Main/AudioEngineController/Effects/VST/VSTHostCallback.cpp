@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"

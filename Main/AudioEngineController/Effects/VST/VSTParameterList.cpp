@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST/VSTParameterList.h"
 
-#include "Core/BaseLib/FormatText.h"
+#include "Core/BaseLib/Log/FormatText.h"
 
 #include <QtEndian>
 

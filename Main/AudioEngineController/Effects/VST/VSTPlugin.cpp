@@ -1,10 +1,10 @@
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 
-#include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/PluginBehaviour.h"
-#include "Main/AudioEngineController/Effects/PluginIdentifier.h"
-#include "Main/AudioEngineController/Effects/ProbeReport.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/FaultGuard.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Plugin/PluginBehaviour.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 

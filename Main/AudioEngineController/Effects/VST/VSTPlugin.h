@@ -1,8 +1,8 @@
 #pragma once
 
-#include "Core/BaseLib/PluginLibrary.h"
-#include "Main/AudioEngineController/Effects/AudioPlugin.h"
-#include "Main/AudioEngineController/Effects/EffectRecord.h"
+#include "Core/BaseLib/Binary/PluginLibrary.h"
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
 #include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
 

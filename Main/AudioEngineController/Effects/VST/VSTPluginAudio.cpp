@@ -1,4 +1,4 @@
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 
 #include <algorithm>

@@ -1,8 +1,8 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3FolderScan.h"
 
-#include "Core/BaseLib/DebugLog.h"
-#include "Main/AudioEngineController/Effects/ProbeBracket.h"
-#include "Main/AudioEngineController/Effects/ProbeReport.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/Host/ProbeBracket.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 #include "Main/VLib/SimpleGUI.h"
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/FolderScan.h"
+#include "Main/AudioEngineController/Effects/Host/FolderScan.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 
 /// One scan for VST 3 modules.

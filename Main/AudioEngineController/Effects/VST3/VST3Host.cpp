@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3FolderScan.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
 
 /// The host of VST 3 plug-ins.
 class VST3Host : public AudioPluginHost {

@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Instance.h"
 
-#include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/FaultGuard.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3State.h"
 

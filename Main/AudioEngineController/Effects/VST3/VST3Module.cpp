@@ -1,8 +1,8 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Module.h"
 
-#include "Core/BaseLib/DebugLog.h"
-#include "Core/BaseLib/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/ProbeReport.h"
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/FaultGuard.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
 #include <pluginterfaces/base/ipluginbase.h>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Core/BaseLib/PluginLibrary.h"
+#include "Core/BaseLib/Binary/PluginLibrary.h"
 
 #include <QString>
 

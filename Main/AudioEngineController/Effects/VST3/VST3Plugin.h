@@ -1,7 +1,7 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/AudioPlugin.h"
-#include "Main/AudioEngineController/Effects/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/VST3/IVST3EditOwner.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3HostContext.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Instance.h"

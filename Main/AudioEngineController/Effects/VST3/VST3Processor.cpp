@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Processor.h"
 
-#include "Main/AudioEngineController/Effects/AudioPlugin.h"
+#include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 
 #include <algorithm>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/ChannelBuffers.h"
+#include "Main/AudioEngineController/Effects/Plugin/ChannelBuffers.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3NoParameterChanges.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Speakers.h"

@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Speakers.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/BusFormats/BusFormat.h"
 
 #include <array>

@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 
-#include "Main/AudioEngineController/Effects/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
 
 #include <QStringList>
 

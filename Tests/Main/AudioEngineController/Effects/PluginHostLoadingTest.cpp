@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/AudioPlugin.h"
+#include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/TestFolder.h"

@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 
-#include "Main/AudioEngineController/Effects/MRLAudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/TestApplication.h"

@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
-#include "Core/BaseLib/FileTime.h"
-#include "Main/AudioEngineController/Effects/EffectRecord.h"
+#include "Core/BaseLib/Files/FileTime.h"
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 
 #include <QDir>
 #include <QFileInfo>

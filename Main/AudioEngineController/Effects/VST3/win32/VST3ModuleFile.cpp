@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
-#include "Core/BaseLib/FileTime.h"
+#include "Core/BaseLib/Files/FileTime.h"
 
 #include <pluginterfaces/base/ftypes.h>
 

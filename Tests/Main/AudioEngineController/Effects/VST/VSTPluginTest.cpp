@@ -1,6 +1,6 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 
 namespace {
 

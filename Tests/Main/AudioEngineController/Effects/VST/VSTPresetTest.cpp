@@ -1,6 +1,6 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 
-#include "Core/BaseLib/DebugLog.h"
+#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Tests/Support/NotingUI.h"
 

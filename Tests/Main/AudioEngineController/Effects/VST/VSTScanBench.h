@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Tests/Main/AudioEngineController/Effects/ScanBench.h"
+#include "Tests/Main/AudioEngineController/Effects/Host/ScanBench.h"
 #include "Tests/Support/VST2Fixture.h"
 
 /// The bench with VST 2 modules on it.

@@ -1,0 +1,25 @@
+#pragma once
+
+#include "Core/BaseLib/Binary/ByteView.h"
+
+#include <QString>
+
+#include <vector>
+
+/// What a shared library's own tables say about the names that were asked for.
+enum class ExportAnswer {
+    Exported,    ///< it exports at least one of them
+    NotExported, ///< it exports none of them
+    Unknown      ///< the tables cannot be read or contradict themselves: only loading decides
+};
+
+/// Tells from its file, without running any of its code, whether a shared library exports one of these
+/// symbols. Libraries that it depends on do not count. Reads x86-64 ELF libraries and PE libraries for any
+/// machine; all other files, and those that are missing, special or damaged, give Unknown. Any thread may
+/// ask.
+ExportAnswer findExports(const QString &path, const std::vector<QByteArray> &names);
+
+/// The same for the content of an ELF file, of any alignment, that need not be trustworthy.
+ExportAnswer findElfExports(ByteView file, const std::vector<QByteArray> &names);
+/// The same for the content of a PE file.
+ExportAnswer findPeExports(ByteView file, const std::vector<QByteArray> &names);

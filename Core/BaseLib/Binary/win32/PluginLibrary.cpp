@@ -1,0 +1,70 @@
+#include "Core/BaseLib/Binary/PluginLibrary.h"
+
+#include "Core/BaseLib/Binary/win32/ImportSearch.h"
+#include "Core/BaseLib/Files/win32/WindowsText.h"
+
+#include <QFileInfo>
+
+namespace {
+
+/// While it lives, a damaged file or a missing library brings up no box of the system on this thread.
+class NoErrorBoxes {
+public:
+    NoErrorBoxes() { SetThreadErrorMode(GetThreadErrorMode() | SEM_FAILCRITICALERRORS, &m_before); }
+    ~NoErrorBoxes() { SetThreadErrorMode(m_before, nullptr); }
+    NoErrorBoxes(const NoErrorBoxes &) = delete;
+    NoErrorBoxes &operator=(const NoErrorBoxes &) = delete;
+
+private:
+    DWORD m_before = 0;
+};
+
+/// What the file itself tells beyond the system's words, which name neither machine nor missing library.
+QString foundInFile(const QString &path, const QString &firstFolder)
+{
+    try {
+        return whyNotLoadable(path, importSearch(firstFolder));
+    } catch (const std::exception &) {
+        return {}; // no memory for it
+    }
+}
+
+} // namespace
+
+void *PluginLibrary::loadUncached(const QString &path) noexcept
+{
+    if (path.isEmpty()) {
+        m_errorText = QStringLiteral("no path given");
+        return nullptr;
+    }
+    const NoErrorBoxes quiet;
+    const std::wstring native = nativePath(path);
+    HMODULE module = nullptr;
+    if (searchDllLoadDir)
+        module = LoadLibraryExW(native.c_str(), nullptr, LOAD_LIBRARY_SEARCH_DLL_LOAD_DIR);
+    if (!module)
+        module = LoadLibraryW(native.c_str());
+    if (module)
+        return module;
+    const DWORD error = GetLastError();
+    m_errorText = systemMessage(error, path);
+    const QString reason = foundInFile(path, searchDllLoadDir ? QFileInfo(path).path() : QString());
+    if (!reason.isEmpty())
+        m_errorText += QStringLiteral(" (the file %1)").arg(reason);
+    return nullptr;
+}
+
+void *PluginLibrary::symbol(const char *name) const
+{
+    if (!m_handle)
+        return nullptr;
+    return reinterpret_cast<void *>(GetProcAddress(static_cast<HMODULE>(m_handle), name));
+}
+
+void PluginLibrary::free()
+{
+    if (useProcessCache || !m_handle)
+        return;
+    FreeLibrary(static_cast<HMODULE>(m_handle));
+    m_handle = nullptr;
+}

@@ -1,0 +1,79 @@
+#include "Core/BaseLib/Files/TextFile.h"
+
+#include "Core/BaseLib/Files/NativeFile.h"
+
+#include <QFile>
+#include <QFileInfo>
+
+namespace {
+
+FileResult writeAll(QFile &file, const QByteArray &content, Durability durability)
+{
+    // A disk that fills up takes a part first; only the next attempt says why.
+    for (qint64 written = 0; written < content.size();) {
+        const qint64 taken = file.write(content.constData() + written, content.size() - written);
+        if (taken <= 0)
+            return {file.errorString()};
+        written += taken;
+    }
+    if (!file.flush())
+        return {file.errorString()};
+    if (durability == Durability::Synced)
+        syncToDisk(file.handle());
+    file.close();
+    return file.error() == QFile::NoError ? FileResult{} : FileResult{file.errorString()};
+}
+
+FileResult writeDirectly(const QString &path, const QByteArray &content, Durability durability)
+{
+    QFile file(path);
+    if (!file.open(QIODevice::WriteOnly | QIODevice::Truncate))
+        return {file.errorString()};
+    return writeAll(file, content, durability);
+}
+
+} // namespace
+
+FileResult replaceFile(const QString &path, const QByteArray &content, Durability durability)
+{
+    const QFileInfo existing(path);
+    const bool exists = existing.exists();
+    // A file reached through a link is replaced where it lies; the link stays.
+    const QString target = exists && existing.isSymLink() ? existing.canonicalFilePath() : path;
+    // A device or a pipe is written to; renaming a file over it would take it away.
+    if (exists && !existing.isFile())
+        return writeDirectly(target, content, durability);
+    if (exists) {
+        if (!existing.isWritable())
+            return {QStringLiteral("it is write-protected")};
+        QFile probe(target);
+        if (!probe.open(QIODevice::WriteOnly | QIODevice::Append))
+            return {probe.errorString()};
+    }
+    QFile temporary(target + QStringLiteral(".tmp"));
+    if (!temporary.open(QIODevice::WriteOnly | QIODevice::Truncate))
+        return writeDirectly(target, content, durability);
+    if (exists)
+        temporary.setPermissions(existing.permissions());
+    FileResult result = writeAll(temporary, content, durability);
+    if (result) {
+        result = renameOver(temporary.fileName(), target);
+        if (result)
+            return result;
+    }
+    temporary.remove();
+    return result;
+}
+
+FileResult readWholeFile(const QString &path, QByteArray &content)
+{
+    QFile file(path);
+    // A pipe or a device may have no end.
+    const QFileInfo info(path);
+    if (info.exists() && !info.isFile())
+        return {QStringLiteral("it is not a regular file")};
+    if (!file.open(QIODevice::ReadOnly))
+        return {file.errorString()};
+    content = file.readAll();
+    return file.error() == QFile::NoError ? FileResult{} : FileResult{file.errorString()};
+}

@@ -1,0 +1,103 @@
+#include "Core/BaseLib/Files/XMLDocument.h"
+
+#include "Core/BaseLib/Files/TextFile.h"
+#include "Core/BaseLib/Log/FormatText.h"
+
+#include <charconv>
+#include <cmath>
+#include <cstdlib>
+
+#include <pugixml.hpp>
+
+namespace {
+
+// A text of nothing but blanks is a value too: plug-ins may be called " ". Line ends within a text stay what
+// they are: file names may hold them.
+constexpr unsigned kParseOptions = (pugi::parse_default | pugi::parse_ws_pcdata_single) & ~pugi::parse_eol;
+
+constexpr char kByteOrderMark[] = "\xef\xbb\xbf";
+
+/// A text as it stands: at its start, Qt takes a byte order mark for none of its characters.
+QString wholeText(const char *utf8)
+{
+    return qstrncmp(utf8, kByteOrderMark, sizeof kByteOrderMark - 1) == 0
+               ? QString::fromUtf8(QByteArray(kByteOrderMark) + utf8)
+               : QString::fromUtf8(utf8);
+}
+
+qint64 integerOf(const char *utf8) { return std::strtoll(utf8, nullptr, 10); }
+
+} // namespace
+
+XMLElement XMLElement::child(const char *name) const
+{
+    return XMLElement(pugi::xml_node(m_node).child(name).internal_object());
+}
+
+std::vector<XMLElement> XMLElement::children(const char *name) const
+{
+    std::vector<XMLElement> found;
+    for (const pugi::xml_node node : pugi::xml_node(m_node).children(name))
+        found.push_back(XMLElement(node.internal_object()));
+    return found;
+}
+
+QString XMLElement::text() const { return wholeText(pugi::xml_node(m_node).text().get()); }
+
+qint64 XMLElement::integer() const { return integerOf(pugi::xml_node(m_node).text().get()); }
+
+std::optional<QString> XMLElement::attribute(const char *name) const
+{
+    const pugi::xml_attribute found = pugi::xml_node(m_node).attribute(name);
+    if (!found)
+        return std::nullopt;
+    return QString::fromUtf8(found.value());
+}
+
+XMLDocument::XMLDocument(Entities entities)
+    : m_entities(entities)
+    , m_document(std::make_unique<pugi::xml_document>())
+{}
+
+XMLDocument::~XMLDocument() = default;
+
+bool XMLDocument::load(const QString &path)
+{
+    QByteArray content;
+    if (const FileResult read = readWholeFile(path, content); !read) {
+        m_document->reset();
+        m_error = read.reason;
+        return false;
+    }
+    return parse(content);
+}
+
+bool XMLDocument::parse(const QByteArray &xml)
+{
+    const unsigned options =
+        m_entities == Entities::Decoded ? kParseOptions : kParseOptions & ~pugi::parse_escapes;
+    const pugi::xml_parse_result result =
+        m_document->load_buffer(xml.constData(), static_cast<std::size_t>(xml.size()), options);
+    m_error.clear();
+    if (!result) {
+        m_document->reset();
+        m_error = formatText(L"%s at byte %lld", result.description(), static_cast<long long>(result.offset));
+    }
+    return m_error.isEmpty();
+}
+
+XMLElement XMLDocument::root(const char *name) const
+{
+    return XMLElement(m_document->child(name).internal_object());
+}
+
+qint64 parseInteger(const QString &text) { return integerOf(text.toUtf8().constData()); }
+
+double parseDecimal(const QString &text)
+{
+    const QByteArray digits = text.trimmed().toUtf8();
+    double value = 0.0;
+    std::from_chars(digits.constData(), digits.constData() + digits.size(), value);
+    // "nan" and "inf" parse too, and as a file version would pass or fail every comparison.
+    return std::isfinite(value) ? value : 0.0;
+}

@@ -1,0 +1,45 @@
+#include "Core/BaseLib/Files/FolderListing.h"
+
+#include "Core/BaseLib/Files/win32/WindowsText.h"
+
+#include <QDirIterator>
+#include <QFileInfo>
+
+namespace {
+
+/// Why a folder that is there tells nothing; empty where it is just empty.
+QString problemOf(const QString &folder)
+{
+    WIN32_FIND_DATAW first = {};
+    const HANDLE search = FindFirstFileW(nativePath(folder + QStringLiteral("/*")).c_str(), &first);
+    if (search != INVALID_HANDLE_VALUE) {
+        FindClose(search);
+        return QString();
+    }
+    const DWORD error = GetLastError();
+    const bool isGone =
+        error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND || error == ERROR_DIRECTORY;
+    return isGone ? QString() : systemMessage(error, folder);
+}
+
+/// The system takes halves of surrogate pairs too, which no file of ours could hold.
+bool isText(const QString &name) { return QString::fromUtf8(name.toUtf8()) == name; }
+
+} // namespace
+
+FolderContent readFolder(const QString &folder)
+{
+    FolderContent content;
+    QDirIterator iterator(folder, QDir::AllEntries | QDir::NoDotAndDotDot);
+    while (iterator.hasNext()) {
+        iterator.next();
+        if (!isText(iterator.fileName()))
+            continue;
+        const QFileInfo info = iterator.fileInfo();
+        // A link is told apart first: that needs no look at what it points to.
+        content.entries.push_back({iterator.fileName(), !info.isSymLink() && info.isDir()});
+    }
+    if (content.entries.empty() && QFileInfo(folder).isDir()) // the toolkit keeps the reason to itself
+        content.problem = problemOf(folder);
+    return content;
+}

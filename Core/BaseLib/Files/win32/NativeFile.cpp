@@ -1,0 +1,171 @@
+#include "Core/BaseLib/Files/NativeFile.h"
+
+#include "Core/BaseLib/Files/win32/WindowsText.h"
+
+#include <QDateTime>
+#include <QFileInfo>
+#include <QRegularExpression>
+
+#include <limits>
+#include <tuple>
+
+#include <io.h>
+
+namespace {
+
+/// How long others may hold a file that is to be replaced or deleted: readers, indexers and virus scanners
+/// hold it for moments.
+constexpr DWORD kPatience = 1000; ///< ms
+constexpr DWORD kPause = 10;      ///< ms
+
+/// Between 1601, where the system's times start, and 1970, in units of 100 ns.
+constexpr qint64 kEpoch = 116444736000000000;
+constexpr qint64 kNanosecondsPerUnit = 100;
+
+class FileHandle {
+public:
+    FileHandle(const QString &path, DWORD access)
+        : m_handle(CreateFileW(nativePath(path).c_str(), access,
+                               FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr, OPEN_EXISTING,
+                               FILE_FLAG_BACKUP_SEMANTICS, nullptr)) // for folders too
+    {}
+    ~FileHandle()
+    {
+        if (isOpen())
+            CloseHandle(m_handle);
+    }
+    FileHandle(const FileHandle &) = delete;
+    FileHandle &operator=(const FileHandle &) = delete;
+
+    bool isOpen() const { return m_handle != INVALID_HANDLE_VALUE; }
+    HANDLE get() const { return m_handle; }
+
+private:
+    HANDLE m_handle;
+};
+
+bool isHeldByOthers(DWORD error) { return error == ERROR_SHARING_VIOLATION || error == ERROR_ACCESS_DENIED; }
+
+bool isGone(DWORD error) { return error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND; }
+
+/// Tries again for a while what fails only because others hold the file. `operation` leaves the reason with
+/// the system.
+template <typename Operation>
+FileResult patiently(const QString &path, Operation &&operation)
+{
+    for (DWORD waited = 0;; waited += kPause) {
+        if (operation())
+            return {};
+        const DWORD error = GetLastError();
+        if (!isHeldByOthers(error) || waited >= kPatience)
+            return {systemMessage(error, path)};
+        Sleep(kPause);
+    }
+}
+
+/// Volume and number of a file, the same by whatever path it is reached.
+using FileIdentity = std::tuple<DWORD, DWORD, DWORD>;
+
+std::optional<FileIdentity> identityOf(const QString &path)
+{
+    const FileHandle file(path, FILE_READ_ATTRIBUTES);
+    BY_HANDLE_FILE_INFORMATION information = {};
+    if (!file.isOpen() || !GetFileInformationByHandle(file.get(), &information))
+        return std::nullopt;
+    return FileIdentity(information.dwVolumeSerialNumber, information.nFileIndexHigh,
+                        information.nFileIndexLow);
+}
+
+/// Empty for the top of a drive.
+QString outerFolder(const QString &folder)
+{
+    const QString outer = QFileInfo(folder).path();
+    return outer == folder ? QString() : outer;
+}
+
+qint64 unitsOf(const FILETIME &time)
+{
+    return static_cast<qint64>(quint64(time.dwHighDateTime) << 32 | time.dwLowDateTime);
+}
+
+} // namespace
+
+std::FILE *openStream(const QString &path, const char *mode)
+{
+    return _wfopen(nativePath(path).c_str(), QString::fromLatin1(mode).toStdWString().c_str());
+}
+
+FileResult renameOver(const QString &from, const QString &to)
+{
+    const std::wstring source = nativePath(from);
+    const std::wstring target = nativePath(to);
+    return patiently(to,
+                     [&] { return MoveFileExW(source.c_str(), target.c_str(), MOVEFILE_REPLACE_EXISTING); });
+}
+
+FileResult removeFile(const QString &path)
+{
+    const std::wstring file = nativePath(path);
+    return patiently(path, [&] { return DeleteFileW(file.c_str()) || isGone(GetLastError()); });
+}
+
+bool cannotBeExamined(const QString &path)
+{
+    return GetFileAttributesW(nativePath(path).c_str()) == INVALID_FILE_ATTRIBUTES && !isGone(GetLastError());
+}
+
+bool isDeviceName(const QString &name)
+{
+    static const QRegularExpression devices(QStringLiteral("^(con|prn|aux|nul|com[0-9]|lpt[0-9]) *(\\.|$)"),
+                                            QRegularExpression::CaseInsensitiveOption);
+    return devices.match(name).hasMatch();
+}
+
+bool leadsBack(const QString &folder)
+{
+    const DWORD attributes = GetFileAttributesW(nativePath(folder).c_str());
+    if (attributes == INVALID_FILE_ATTRIBUTES || (attributes & FILE_ATTRIBUTE_REPARSE_POINT) == 0)
+        return false;
+    const std::optional<FileIdentity> target = identityOf(folder);
+    for (QString outer = outerFolder(folder); target && !outer.isEmpty(); outer = outerFolder(outer))
+        if (identityOf(outer) == target)
+            return true;
+    return !target;
+}
+
+void syncToDisk(int fileDescriptor) { _commit(fileDescriptor); }
+
+void touchFile(const QString &path)
+{
+    const FileHandle file(path, FILE_WRITE_ATTRIBUTES);
+    FILETIME now = {};
+    GetSystemTimeAsFileTime(&now);
+    if (file.isOpen())
+        SetFileTime(file.get(), nullptr, nullptr, &now);
+}
+
+std::optional<FileStatus> fileStatus(const QString &path)
+{
+    const QFileInfo file(path);
+    if (!file.exists())
+        return std::nullopt;
+    QDateTime modified = file.lastModified();
+    // Qt takes the first second of 1970 for no time at all; files from package systems that keep no dates
+    // carry it.
+    if (!modified.isValid())
+        modified = QDateTime::fromMSecsSinceEpoch(0);
+    const QDate day = modified.date();
+    const QTime time = modified.time();
+    return FileStatus{file.isFile(), {day.year(), day.month(), day.day(), time.hour(), time.minute()}};
+}
+
+qint64 modifiedNanoseconds(const QString &path)
+{
+    const FileHandle file(path, FILE_READ_ATTRIBUTES);
+    FILETIME modified = {};
+    if (!file.isOpen() || !GetFileTime(file.get(), nullptr, nullptr, &modified))
+        return -1;
+    // 64 bits of nanoseconds end in 2262, file systems later; a time beyond counts as the last one.
+    constexpr qint64 kLast = std::numeric_limits<qint64>::max() / kNanosecondsPerUnit;
+    return qBound(-kLast, unitsOf(modified) - kEpoch, kLast) * kNanosecondsPerUnit;
+}

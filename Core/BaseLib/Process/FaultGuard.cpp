@@ -1,0 +1,36 @@
+#include "Core/BaseLib/Process/FaultGuard.h"
+
+#include "Core/BaseLib/Log/FormatText.h"
+
+#include <array>
+#include <cstring>
+
+namespace {
+
+std::string describe(quint32 code)
+{
+    if (code == FaultCode::kAccessViolation)
+        return "SE Exception: Access Violation";
+    return formatText(L"SE Exception: 0x%08X", code).toStdString();
+}
+
+} // namespace
+
+SEException::SEException(quint32 code)
+    : std::runtime_error(describe(code))
+    , m_code(code)
+{}
+
+QString guardedText(const std::exception &exception)
+{
+    std::array<char, 512> text = {};
+    try {
+        callGuarded([&] {
+            if (const char *what = exception.what())
+                std::strncpy(text.data(), what, text.size() - 1);
+        });
+    } catch (...) {
+        return QString();
+    }
+    return QString::fromUtf8(text.data());
+}

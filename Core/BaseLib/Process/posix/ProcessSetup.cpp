@@ -1,0 +1,68 @@
+#include "Core/BaseLib/Process/ProcessSetup.h"
+
+#include <QByteArray>
+#include <QTextCodec>
+
+#include <clocale>
+#include <csignal>
+
+#include <sys/resource.h>
+#include <unistd.h>
+
+#if defined(__SANITIZE_ADDRESS__)
+#include <sanitizer/lsan_interface.h>
+#endif
+
+namespace {
+
+/// No core file, and nothing for a crash reporter: a limit of 0 still feeds a reporter behind a pipe, a limit
+/// of 1 byte does neither (core(5)).
+void suppressCoreDumps()
+{
+    rlimit limit = {};
+    if (getrlimit(RLIMIT_CORE, &limit) != 0)
+        return;
+    limit.rlim_cur = limit.rlim_max < 1 ? limit.rlim_max : 1;
+    setrlimit(RLIMIT_CORE, &limit);
+}
+
+/// Qt tries the platforms of the list in turn and ends the process when all fail; offscreen never fails.
+void chooseDisplayPlatform()
+{
+    QByteArray platforms = qgetenv("QT_QPA_PLATFORM");
+    if (platforms.isEmpty()) {
+        if (!qEnvironmentVariableIsEmpty("DISPLAY"))
+            platforms += "xcb;";
+        if (!qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY"))
+            platforms += "wayland;";
+    } else if (platforms.contains("offscreen") || platforms.contains("minimal")) {
+        return;
+    } else {
+        platforms += ';';
+    }
+    qputenv("QT_QPA_PLATFORM", platforms + "offscreen");
+}
+
+} // namespace
+
+void prepareProcess()
+{
+    suppressCoreDumps();
+    std::signal(SIGPIPE, SIG_IGN);
+    // File names are bytes; taken as UTF-8 they survive also where the locale is "C".
+    QTextCodec::setCodecForLocale(QTextCodec::codecForName("UTF-8"));
+    chooseDisplayPlatform();
+}
+
+void settleLocale() { std::setlocale(LC_NUMERIC, "C"); }
+
+void leaveProcess(int exitCode)
+{
+    // Nothing to flush: what we write is flushed at once, and a plug-in that hangs inside a print call holds
+    // that stream's lock.
+#if defined(__SANITIZE_ADDRESS__)
+    // The check would run in an exit handler, which is left out here.
+    __lsan_do_leak_check();
+#endif
+    _exit(exitCode);
+}

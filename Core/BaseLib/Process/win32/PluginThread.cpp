@@ -1,0 +1,48 @@
+#include "Core/BaseLib/Process/PluginThread.h"
+
+#include <windows.h>
+
+#include <mmsystem.h>
+#include <objbase.h>
+#include <pthread.h>
+
+namespace {
+/// A window that is never painted asks for it without end.
+constexpr int kMostMessages = 1000;
+constexpr UINT kTimerPeriod = 60000; ///< ms, near the longest
+
+void CALLBACK doNothing(UINT, UINT, DWORD_PTR, DWORD_PTR, DWORD_PTR) {}
+} // namespace
+
+PluginThread::PluginThread()
+    : m_prepared(SUCCEEDED(CoInitializeEx(nullptr, COINIT_APARTMENTTHREADED)))
+    // Has the system start its timer thread now. The toolkit has it started and ended whenever it draws the
+    // window: while a plug-in is being probed, a new thread is taken for the plug-in's.
+    , m_timer(timeSetEvent(kTimerPeriod, kTimerPeriod, doNothing, 0, TIME_PERIODIC))
+{}
+
+PluginThread::~PluginThread()
+{
+    timeKillEvent(m_timer);
+    if (m_prepared)
+        CoUninitialize();
+}
+
+void PluginThread::deliverMessages()
+{
+    MSG message;
+    for (int count = 0; count < kMostMessages; ++count) {
+        if (!PeekMessageW(&message, nullptr, 0, 0, PM_REMOVE))
+            return;
+        TranslateMessage(&message);
+        DispatchMessageW(&message);
+    }
+}
+
+bool PluginThread::hasEndedAlone(std::thread &thread)
+{
+    if (!thread.joinable())
+        return false;
+    auto *handle = static_cast<HANDLE>(pthread_gethandle(thread.native_handle()));
+    return WaitForSingleObject(handle, 0) == WAIT_OBJECT_0;
+}

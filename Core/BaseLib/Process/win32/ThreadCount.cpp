@@ -1,0 +1,84 @@
+#include "Core/BaseLib/Process/ThreadCount.h"
+
+#include <algorithm>
+#include <iterator>
+
+#include <windows.h>
+
+#include <tlhelp32.h>
+#include <winternl.h>
+
+namespace {
+
+constexpr auto kStartAddress = static_cast<THREADINFOCLASS>(9); // ThreadQuerySetWin32StartAddress
+
+/// Closes a handle at the end of a scope.
+class Handle {
+public:
+    explicit Handle(HANDLE handle)
+        : m_handle(handle)
+    {}
+    ~Handle()
+    {
+        if (isValid())
+            CloseHandle(m_handle);
+    }
+    Handle(const Handle &) = delete;
+    Handle &operator=(const Handle &) = delete;
+
+    bool isValid() const { return m_handle && m_handle != INVALID_HANDLE_VALUE; }
+    HANDLE get() const { return m_handle; }
+
+private:
+    HANDLE m_handle;
+};
+
+HMODULE moduleAt(const void *address)
+{
+    HMODULE module = nullptr;
+    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
+                       static_cast<const wchar_t *>(address), &module);
+    return module;
+}
+
+/// The libraries whose threads the system employs for itself: the loader has some load libraries, COM some
+/// wait for calls. They start when a plug-in first needs such, and wait for minutes for more work.
+constexpr const wchar_t *kEmployers[] = {L"ntdll.dll", L"rpcrt4.dll", L"combase.dll", L"ole32.dll"};
+
+bool isTheSystems(DWORD id)
+{
+    const Handle thread(OpenThread(THREAD_QUERY_INFORMATION, FALSE, id));
+    const void *start = nullptr;
+    if (!thread.isValid() ||
+        NtQueryInformationThread(thread.get(), kStartAddress, &start, sizeof start, nullptr) < 0)
+        return false;
+    const HMODULE module = moduleAt(start);
+    return module && std::any_of(std::begin(kEmployers), std::end(kEmployers),
+                                 [&](const wchar_t *name) { return GetModuleHandleW(name) == module; });
+}
+
+} // namespace
+
+std::set<int> runningThreads()
+{
+    std::set<int> threads;
+    const Handle snapshot(CreateToolhelp32Snapshot(TH32CS_SNAPTHREAD, 0));
+    const DWORD process = GetCurrentProcessId();
+    THREADENTRY32 entry = {};
+    entry.dwSize = sizeof entry;
+    if (!snapshot.isValid() || !Thread32First(snapshot.get(), &entry))
+        return threads;
+    do {
+        if (entry.th32OwnerProcessID == process && !isTheSystems(entry.th32ThreadID))
+            threads.insert(static_cast<int>(entry.th32ThreadID));
+    } while (Thread32Next(snapshot.get(), &entry));
+    return threads;
+}
+
+bool isProcessRunning(qint64 process)
+{
+    const Handle found(OpenProcess(SYNCHRONIZE, FALSE, static_cast<DWORD>(process)));
+    if (!found.isValid())
+        return GetLastError() == ERROR_ACCESS_DENIED;
+    return WaitForSingleObject(found.get(), 0) == WAIT_TIMEOUT; // it may be held open after its end
+}

@@ -1,6 +1,0 @@
-#include "Core/BaseLib/DebuggerOutput.h"
-
-void sendLineToDebugger(const QString &)
-{
-    // POSIX systems have no debugger channel; a debugger reads standard error like everybody else.
-}

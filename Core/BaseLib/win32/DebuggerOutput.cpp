@@ -1,9 +1,0 @@
-#include "Core/BaseLib/DebuggerOutput.h"
-
-#include <windows.h>
-
-void sendLineToDebugger(const QString &line)
-{
-    OutputDebugStringW(reinterpret_cast<const wchar_t *>(line.utf16()));
-    OutputDebugStringW(L"\n");
-}

@@ -1,0 +1,55 @@
+#pragma once
+
+#include "Core/BaseLib/Files/XMLDocument.h"
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+
+#include <QByteArray>
+
+#include <optional>
+#include <vector>
+
+/// One element of a catalogue record: how it is read and how it is written. Either may be missing.
+struct CatalogueElement {
+    const char *name;
+    /// Takes the element's value into the record; called only when the element is present.
+    void (*read)(EffectRecord &record, const XMLElement &element);
+    /// The element's content as UTF-8, unescaped; nothing leaves the whole element out.
+    std::optional<QByteArray> (*content)(const EffectRecord &record);
+};
+
+/// What a format's crash markers look like.
+struct MarkerFormat {
+    const char *ending;  ///< end of the file's name, with its dot
+    bool leavesOutEmpty; ///< no Path or Created line when there is no path or time
+    bool hasSubId;       ///< carries the identifier of a sub-plug-in
+};
+
+/// A format's catalogue file: its name, its version, and the elements of a record in the order in which they
+/// are written.
+struct CatalogueFormat {
+    const char *fileName;        ///< appended to the catalogue folder, leading "/" included
+    const char *version;         ///< the version attribute that is written
+    bool versionRequired;        ///< a file without a version yields no records; otherwise it counts as 1.0
+    double fileTimesTrustedFrom; ///< files of earlier versions carry time stamps of another form
+    double categoryMasksFrom;    ///< in files of earlier versions the mask is none yet
+    /// A plug-in file's time stamp; null where every version's times are trusted.
+    QString (*fileTime)(const QString &path);
+    MarkerFormat marker;
+    std::vector<CatalogueElement> elements;
+};
+
+/// Elements that several formats share.
+namespace CatalogueElements {
+extern const CatalogueElement kPath;
+extern const CatalogueElement kFileTime;
+extern const CatalogueElement kName;
+extern const CatalogueElement kId;
+extern const CatalogueElement kCategoryMask;
+extern const CatalogueElement kFavourite;
+extern const CatalogueElement kVendor;
+extern const CatalogueElement kEnabled;
+extern const CatalogueElement kWorking;
+
+inline qint32 readInt(const XMLElement &element) { return static_cast<qint32>(element.integer()); }
+inline bool readBool(const XMLElement &element) { return element.integer() != 0; }
+} // namespace CatalogueElements

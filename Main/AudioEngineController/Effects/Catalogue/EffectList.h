@@ -1,0 +1,45 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+
+#include <QByteArray>
+#include <QSet>
+
+#include <map>
+
+/// A record that came into a catalogue, with its text once it was written: each record is rendered once,
+/// however many times the file is.
+struct ListedEffect {
+    EffectRecord record;
+    mutable QByteArray rendered;
+    bool ownsName = false; ///< the name counts as used because of this record
+};
+
+/// Old records of files that still wait for their probe, sorted by identifier: interim writes carry them, so
+/// that a crash in the middle costs no user marks.
+using WaitingRecords = std::multimap<QString, ListedEffect>;
+
+/// The records of one run, sorted by identifier, each identifier once; and the names that they use.
+class EffectList {
+public:
+    using Entries = std::map<QString, ListedEffect>;
+
+    void clear();
+    std::size_t size() const { return m_entries.size(); }
+    const Entries &entries() const { return m_entries; }
+
+    /// The record that holds the identifier, or null.
+    const EffectRecord *find(const QString &id) const;
+
+    /// Adds a record unless its identifier is empty or held. A record whose name is used gets one made from
+    /// its path, which does not count as used.
+    bool add(const EffectRecord &record);
+    /// Sets the user's mark on a record; nothing for an identifier that is not there.
+    void setFavourite(const QString &id, bool favourite);
+    /// Takes a record out, and its name.
+    void remove(const QString &id);
+
+private:
+    Entries m_entries;
+    QSet<QString> m_names;
+};

@@ -1,0 +1,43 @@
+#pragma once
+
+#include "Core/BaseLib/Files/FileTime.h"
+
+#include <QString>
+#include <QStringList>
+
+#include <map>
+
+/// Watches the crash markers of a scanner's run from outside, without absorbing any: tells those that the run
+/// wrote from those that it found, and whether it gets on.
+class MarkerWatch {
+public:
+    /// Remembers what lies in the Effects folder; made before the run starts. `report` is the file to which
+    /// the run reports its course; empty: it reports none.
+    MarkerWatch(const QString &effectsFolder, const QString &report);
+
+    /// Looks again; called at regular times.
+    void look();
+    /// For how many looks in a row the newest marker of the run has not changed. While it has none, for how
+    /// many looks it has outlived its own report's last line; of a run without a report, for how many nothing
+    /// has changed in the folder since it began to work.
+    int looksWithoutChange() const { return m_unchanged; }
+
+    /// All markers that lie in the folder now, of both formats.
+    QStringList markers() const;
+    /// Those among them that the run wrote.
+    QStringList markersOfRun() const;
+
+private:
+    using Stamps = std::map<QString, FileStamp>;
+
+    Stamps stampsOf(const QStringList &patterns) const;
+    Stamps ofRun(const Stamps &stamps) const;
+    bool hasReportedItsEnd() const;
+
+    QString m_folder;
+    QString m_report;
+    Stamps m_before;
+    Stamps m_last;
+    bool m_hasBegun = false;
+    int m_unchanged = 0;
+};

@@ -1,0 +1,150 @@
+#include "Main/AudioEngineController/Effects/Launcher/ScannerLauncher.h"
+
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/Launcher/MarkerWatch.h"
+#include "Main/AudioEngineController/Effects/Launcher/ScannerChild.h"
+#include "Main/AudioEngineController/Effects/Launcher/ScannerProcess.h"
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+
+#include <algorithm>
+#include <chrono>
+#include <iterator>
+
+namespace {
+
+constexpr std::chrono::milliseconds kStartPatience(30000);
+constexpr std::chrono::milliseconds kStep(1000);
+
+std::vector<ScanCulprit> culpritsOf(const QStringList &markers)
+{
+    std::vector<ScanCulprit> culprits;
+    for (const QString &marker : markers) {
+        const bool isVst3 = marker.endsWith(QLatin1String(".scan3"));
+        const CatalogueFormat &format = isVst3 ? vst3CatalogueFormat() : vstCatalogueFormat();
+        culprits.push_back({isVst3, readMarkerFile(format.marker, marker)});
+    }
+    // The marker of a whole shell is there beside its child's; the child is the culprit.
+    const auto hasChild = [&culprits](const ScanCulprit &whole) {
+        return whole.plugin.subId == 0 &&
+               std::any_of(culprits.begin(), culprits.end(), [&whole](const ScanCulprit &other) {
+                   return other.plugin.subId != 0 && other.plugin.path == whole.plugin.path;
+               });
+    };
+    std::vector<ScanCulprit> guilty;
+    std::remove_copy_if(culprits.begin(), culprits.end(), std::back_inserter(guilty), hasChild);
+    return guilty;
+}
+
+void logOutput(ScannerProcess &scanner)
+{
+    if (const QString output = scanner.takeOutput(); !output.isEmpty())
+        DebugTrace(L"The scanner printed: %ls", output);
+}
+
+} // namespace
+
+QString ScannerRunEnd::description() const
+{
+    switch (how) {
+    case How::NotStarted:
+        return QStringLiteral("it could not be started: ") + text;
+    case How::Exited:
+        return QStringLiteral("it ended by itself with exit code %1").arg(code);
+    case How::Crashed:
+        return QStringLiteral("it was ended by ") + text;
+    case How::TimeLimit:
+        return QStringLiteral("it was ended after %1 s without an answer").arg(code);
+    case How::Cancelled:
+        return QStringLiteral("it was ended because the scan was cancelled");
+    }
+    return QString();
+}
+
+void ScannerLauncher::run(const Job &job)
+{
+    for (int run = 0; run < kMaxRuns && !m_cancelled; ++run) {
+        job.writeScanList();
+        if (!runOnce(job))
+            return;
+    }
+}
+
+/// One run; true when a plug-in ended it, so that another run has to follow.
+bool ScannerLauncher::runOnce(const Job &job)
+{
+    MarkerWatch watch(job.effectsFolder, qEnvironmentVariable("FXPROBE_REPORT"));
+    ScannerProcess scanner;
+    ScannerRunEnd end;
+    if (!scanner.start(job.program, QStringList(job.scanList), kStartPatience)) {
+        DebugLog(L"Scanner failed to Start: %d", scanner.errorCode());
+        end.code = scanner.errorCode();
+        end.text = scanner.errorText();
+        add(end); // at once: only a cancel ends what follows
+    }
+    const bool isStarted = end.text.isEmpty();
+    waitForEnd(job, scanner, watch, end);
+    if (isStarted) {
+        DebugLog(L"The scanner has ended: %ls", end.description());
+        add(end);
+    }
+    return end.how != ScannerRunEnd::How::Cancelled && !watch.markers().isEmpty();
+}
+
+void ScannerLauncher::waitForEnd(const Job &job, ScannerProcess &scanner, MarkerWatch &watch,
+                                 ScannerRunEnd &end)
+{
+    using How = ScannerRunEnd::How;
+    while (!scanner.waitForFinished(kStep)) {
+        logOutput(scanner);
+        watch.look();
+        if (m_cancelled) {
+            const bool isOverdue = isOverLimit(job, watch);
+            scanner.end();
+            end.how = How::Cancelled;
+            // Nobody is to blame, unless the plug-in had its time. Markers that the run found are not ours.
+            for (const QString &marker : isOverdue ? QStringList() : watch.markersOfRun())
+                removeMarkerFile(marker);
+            return;
+        }
+        if (isOverLimit(job, watch)) {
+            scanner.kill();
+            end.how = How::TimeLimit;
+            end.code = job.probeLimit;
+            end.culprits = culpritsOf(watch.markersOfRun());
+            return;
+        }
+    }
+    logOutput(scanner);
+    end.how = scanner.hasCrashed() ? How::Crashed : How::Exited;
+    end.code = scanner.exitCode();
+    if (scanner.hasCrashed())
+        end.text = ScannerChild::crashText(scanner.exitCode());
+    end.culprits = culpritsOf(watch.markersOfRun());
+}
+
+bool ScannerLauncher::isOverLimit(const Job &job, const MarkerWatch &watch) const
+{
+    // In steps, not by a clock: the time a machine sleeps does not count.
+    return job.probeLimit > 0 && watch.looksWithoutChange() >= job.probeLimit;
+}
+
+void ScannerLauncher::reset()
+{
+    m_cancelled = false;
+    const std::lock_guard<std::mutex> lock(m_mutex);
+    m_ends.clear();
+}
+
+std::vector<ScannerRunEnd> ScannerLauncher::ends() const
+{
+    const std::lock_guard<std::mutex> lock(m_mutex);
+    return m_ends;
+}
+
+void ScannerLauncher::add(const ScannerRunEnd &end)
+{
+    const std::lock_guard<std::mutex> lock(m_mutex);
+    m_ends.push_back(end);
+}

@@ -1,0 +1,78 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+
+#include <QString>
+#include <QStringList>
+
+#include <atomic>
+#include <functional>
+#include <mutex>
+#include <vector>
+
+class MarkerWatch;
+class ScannerProcess;
+
+/// A plug-in that a scanner was busy with when it ended.
+struct ScanCulprit {
+    bool isVst3 = false;
+    EffectRecord plugin; ///< path, file time, name and sub-plug-in, as its crash marker says
+};
+
+/// How one run of the scanner ended.
+struct ScannerRunEnd {
+    enum class How {
+        NotStarted, ///< the program could not be started; `code` and `text` are the system's reason
+        Exited,     ///< by itself, with exit code `code`
+        Crashed,    ///< by a signal (POSIX) or an unhandled fault; `code` is its number
+        TimeLimit,  ///< by us: it was busy with one plug-in for too long
+        Cancelled,  ///< by us: the user wants no scan any more
+    };
+    How how = How::NotStarted;
+    int code = 0;
+    QString text;
+    std::vector<ScanCulprit> culprits;
+
+    /// In words, for the log and for people.
+    QString description() const;
+};
+
+/// Runs the scanner on a scan list, again and again while plug-ins end it: each run knows the culprit of the
+/// one before. The launcher knows nothing of catalogues; `PluginHost` runs it on a thread of its own.
+class ScannerLauncher {
+public:
+    /// So often the scanner is run; markers that survive even then are left for the next scan.
+    static constexpr int kMaxRuns = 10;
+
+    /// What the runs need. `program` and `scanList` are full paths.
+    struct Job {
+        QString program;
+        QString scanList;
+        QString effectsFolder;
+        int probeLimit = 0;                  ///< seconds that one plug-in may take; 0: for ever
+        std::function<void()> writeScanList; ///< called before each run
+    };
+
+    /// Runs until a run leaves no marker, the runs are used up, or somebody cancels. On the thread that
+    /// called.
+    void run(const Job &job);
+
+    /// Asks `run` to end at its next look, which is a second away at most. Any thread.
+    void cancel() { m_cancelled = true; }
+    bool isCancelled() const { return m_cancelled; }
+    /// Forgets an earlier request and earlier runs.
+    void reset();
+
+    /// How the runs ended so far. Any thread.
+    std::vector<ScannerRunEnd> ends() const;
+
+private:
+    bool runOnce(const Job &job);
+    void waitForEnd(const Job &job, ScannerProcess &scanner, MarkerWatch &watch, ScannerRunEnd &end);
+    bool isOverLimit(const Job &job, const MarkerWatch &watch) const;
+    void add(const ScannerRunEnd &end);
+
+    std::atomic<bool> m_cancelled{false};
+    mutable std::mutex m_mutex; ///< of the ends
+    std::vector<ScannerRunEnd> m_ends;
+};

@@ -1,0 +1,85 @@
+#include "Main/AudioEngineController/Effects/Launcher/ScannerProcess.h"
+
+#include "Core/BaseLib/Process/TerminationRequest.h"
+#include "Main/AudioEngineController/Effects/Launcher/ScannerChild.h"
+
+#include <QCoreApplication>
+#include <QDeadlineTimer>
+#include <QProcessEnvironment>
+
+#include <algorithm>
+#include <thread>
+
+namespace {
+
+/// What a scanner gets to end by itself: its own patience with a plug-in is two seconds.
+constexpr std::chrono::milliseconds kPatience(4000);
+constexpr qint64 kLook = 100;    ///< ms
+constexpr int kMaxOutput = 2000; ///< bytes
+
+} // namespace
+
+ScannerProcess::ScannerProcess()
+    : m_child(std::make_unique<ScannerChild>())
+{
+    m_child->setProcessChannelMode(QProcess::MergedChannels);
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(QLatin1String(TerminationSignal::kParentVariable),
+                       QString::number(QCoreApplication::applicationPid()));
+    m_child->setProcessEnvironment(environment);
+}
+
+ScannerProcess::~ScannerProcess() { end(); }
+
+bool ScannerProcess::start(const QString &program, const QStringList &arguments,
+                           std::chrono::milliseconds timeout)
+{
+    m_child->start(program, arguments, QIODevice::ReadWrite);
+    m_started = m_child->waitForStarted(static_cast<int>(timeout.count()));
+    return m_started;
+}
+
+bool ScannerProcess::waitForFinished(std::chrono::milliseconds timeout)
+{
+    if (!m_started) {
+        std::this_thread::sleep_for(timeout);
+        return false;
+    }
+    // NOTE: QProcess::waitForFinished does not see its time run out while the process prints without a pause.
+    const QDeadlineTimer deadline(timeout);
+    while (m_child->state() != QProcess::NotRunning && !deadline.hasExpired()) {
+        m_child->waitForReadyRead(static_cast<int>(std::min<qint64>(kLook, deadline.remainingTime())));
+        m_output = (m_output + m_child->readAll()).right(kMaxOutput);
+    }
+    return m_child->state() == QProcess::NotRunning;
+}
+
+void ScannerProcess::end()
+{
+    if (m_child->state() == QProcess::NotRunning)
+        return;
+    m_child->terminate(); // SIGTERM, or WM_CLOSE to its windows, of which it has one for this
+    if (!waitForFinished(kPatience))
+        kill();
+}
+
+void ScannerProcess::kill()
+{
+    m_child->kill();
+    waitForFinished(kPatience);
+}
+
+int ScannerProcess::errorCode() const { return m_child->error(); }
+
+QString ScannerProcess::errorText() const { return m_child->errorString(); }
+
+bool ScannerProcess::hasCrashed() const { return m_child->exitStatus() == QProcess::CrashExit; }
+
+int ScannerProcess::exitCode() const { return m_child->exitCode(); }
+
+QString ScannerProcess::takeOutput()
+{
+    QByteArray output;
+    output.swap(m_output);
+    return QString::fromUtf8(output).trimmed();
+}

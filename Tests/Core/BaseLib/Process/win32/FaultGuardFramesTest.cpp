@@ -1,0 +1,164 @@
+#include "Tests/Core/BaseLib/Process/FaultGuardTrials.h"
+#include "Tests/Fixtures/FixturePlatform.h"
+
+#include <array>
+#include <cstring>
+#include <thread>
+
+#include <windows.h>
+
+#include <gtest/gtest.h>
+
+using namespace FaultGuardTrials;
+
+namespace {
+
+constexpr DWORD kMicrosoftCode = 0xE06D7363;
+bool g_wasUnwound = false;
+void (*volatile g_inner)() = nullptr;
+
+} // namespace
+
+extern "C" {
+
+/// Calls `g_inner` from a frame whose handler is foreignFrameHandler, as a plug-in's own frame would be.
+void callFromForeignFrame();
+
+/// Leaves everything to others; notes that its frame was unwound.
+[[gnu::used]] EXCEPTION_DISPOSITION foreignFrameHandler(EXCEPTION_RECORD *record, void *, CONTEXT *, void *)
+{
+    g_wasUnwound |= (record->ExceptionFlags & EXCEPTION_UNWINDING) != 0;
+    return ExceptionContinueSearch;
+}
+}
+
+asm(R"(
+        .text
+        .globl  callFromForeignFrame
+        .seh_proc callFromForeignFrame
+callFromForeignFrame:
+        subq    $40, %rsp
+        .seh_stackalloc 40
+        .seh_endprologue
+        .seh_handler foreignFrameHandler, @except, @unwind
+        call    *g_innerCall(%rip)
+        nop
+        addq    $40, %rsp
+        ret
+        .seh_endproc
+)");
+
+extern "C" {
+void runInner() { g_inner(); }
+[[gnu::used]] void (*g_innerCall)() = runInner;
+}
+
+namespace {
+
+std::string outcomeInForeignFrame(void (*inner)())
+{
+    g_inner = inner;
+    g_wasUnwound = false;
+    return outcome(callFromForeignFrame);
+}
+
+/// The tables that Microsoft's compiler leaves with a thrown std::runtime_error; places are distances from
+/// the structure itself.
+struct ThrownType {
+    qint32 throwInfo[4] = {0, 0, 0, offset(&ThrownType::types)};
+    qint32 types[3] = {2, offset(&ThrownType::derived), offset(&ThrownType::base)};
+    qint32 derived[5] = {0, offset(&ThrownType::derivedName), 0, -1, 0};
+    qint32 base[5] = {0, offset(&ThrownType::baseName), 8, -1, 0};
+    struct Name {
+        void *table = nullptr;
+        void *spare = nullptr;
+        char text[32] = {};
+    } derivedName{nullptr, nullptr, ".?AVruntime_error@std@@"},
+        baseName{nullptr, nullptr, ".?AVexception@std@@"};
+
+    template <typename Member>
+    static qint32 offset(Member ThrownType::*member)
+    {
+        alignas(ThrownType) static std::array<char, sizeof(ThrownType)> place;
+        auto *type = reinterpret_cast<ThrownType *>(place.data());
+        return static_cast<qint32>(reinterpret_cast<char *>(&(type->*member)) - place.data());
+    }
+};
+
+const char *licenceText(const void *) { return "no licence"; }
+const char *faultyText(const void *) { return *g_nowhere ? "" : nullptr; }
+
+/// A thrown object, whose base `std::exception` lies behind 8 bytes of its own.
+struct ThrownObject {
+    void *own = nullptr;
+    const void *const *functions = nullptr;
+};
+
+void throwAsMicrosoft(const char *(*what)(const void *), const char *baseName)
+{
+    ThrownType type;
+    std::strcpy(type.baseName.text, baseName);
+    const void *functions[] = {nullptr, reinterpret_cast<const void *>(what)};
+    ThrownObject object;
+    object.functions = functions;
+    const ULONG_PTR parameters[] = {0x19930520, reinterpret_cast<ULONG_PTR>(&object),
+                                    reinterpret_cast<ULONG_PTR>(&type), reinterpret_cast<ULONG_PTR>(&type)};
+    RaiseException(kMicrosoftCode, EXCEPTION_NONCONTINUABLE, 4, parameters);
+}
+
+} // namespace
+
+TEST(FaultGuardFrames, OfPluginsComeFirstAndAreUnwoundForExceptionsOnly)
+{
+    const struct {
+        const char *name;
+        void (*inner)();
+        const char *outcome;
+        bool unwinds;
+    } rows[] = {
+        {"violation that the plug-in repairs", [] { repairOwnViolation("keep"); }, "returned", false},
+        {"violation that it leaves alone", writeNowhere, "SE Exception: Access Violation", false},
+        {"exception of this compiler", [] { throw std::runtime_error("x"); }, "exception x", true},
+        {"std::runtime_error of Microsoft's compiler",
+         [] { throwAsMicrosoft(licenceText, ".?AVexception@std@@"); }, "foreign no licence", true},
+        {"one whose text cannot be read", [] { throwAsMicrosoft(faultyText, ".?AVexception@std@@"); },
+         "foreign .?AVruntime_error@std@@", true},
+        {"one of another type", [] { throwAsMicrosoft(nullptr, ".?AVBase@@"); },
+         "foreign .?AVruntime_error@std@@", true},
+        {"one without tables", [] { RaiseException(kMicrosoftCode, 0, 0, nullptr); },
+         "foreign a C++ exception of another compiler", true},
+        {"one with wild tables",
+         [] {
+             const ULONG_PTR wild[] = {0x19930520, 8, 8, 8};
+             RaiseException(kMicrosoftCode, 0, 4, wild);
+         },
+         "foreign a C++ exception of another compiler", true},
+        {"exception of another language", [] { RaiseException(0x0EEDFADE, 0, 0, nullptr); },
+         "SE Exception: 0x0EEDFADE", false},
+    };
+    for (int round = 0; round < 3; ++round) {
+        for (const auto &row : rows) {
+            EXPECT_EQ(outcomeInForeignFrame(row.inner), row.outcome) << row.name << ", round " << round;
+            EXPECT_EQ(g_wasUnwound, row.unwinds) << row.name << ", round " << round;
+        }
+    }
+}
+
+TEST(FaultGuardFrames, AThreadSurvivesOverflowsOfItsStackBetweenOtherCalls)
+{
+    std::thread worker([] {
+        for (int round = 0; round < 5; ++round) {
+            EXPECT_EQ(outcome([] { overflowStack(0); }), kOverflowOutcome) << round;
+            EXPECT_EQ(outcomeInForeignFrame([] { overflowStack(0); }), kOverflowOutcome) << round;
+            EXPECT_EQ(outcome(writeNowhere), "SE Exception: Access Violation") << round;
+        }
+    });
+    worker.join();
+}
+
+TEST(FaultGuardFrames, ATranslatedCallCatchesForeignExceptionsAlone)
+{
+    EXPECT_THROW(callTranslated([] { RaiseException(kMicrosoftCode, 0, 0, nullptr); }), ForeignException);
+    EXPECT_EQ(outcome([] { callTranslated([] { RaiseException(0xC0000123, 0, 0, nullptr); }); }),
+              "SE Exception: 0xC0000123");
+}

@@ -1,0 +1,112 @@
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
+
+#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
+
+#include <QDir>
+#include <QFile>
+#include <QTemporaryDir>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+const MarkerFormat &vst3() { return vst3CatalogueFormat().marker; }
+const MarkerFormat &vst2() { return vstCatalogueFormat().marker; }
+
+EffectRecord crashed(const char *path, const char *time, const char *name, quint32 subId)
+{
+    EffectRecord record;
+    record.path = path;
+    record.fileTime = QString::fromUtf8(time);
+    record.name = name;
+    record.subId = subId;
+    return record;
+}
+
+void expectBack(const EffectRecord &back, const EffectRecord &written)
+{
+    EXPECT_EQ(back.path, written.path);
+    EXPECT_EQ(back.fileTime, written.fileTime);
+    EXPECT_EQ(back.name, written.name);
+    EXPECT_EQ(back.subId, written.subId);
+    EXPECT_FALSE(back.enabled);
+}
+
+} // namespace
+
+TEST(CrashMarker, FileNames)
+{
+    const struct {
+        const char *path, *name; ///< null: no name of its own
+        const char *file;
+    } rows[] = {
+        {"/fx/Röhre x64.vst3", nullptr, "Röhre "},
+        {"/fx/Shell.vst3", "Q10", "Q10"},
+        {"/fx/Shell.vst3", "../A/B: <C>\"|?*\\", "___A_B_ _C______"},
+        {"/fx/Shell.vst3", "tab\tnew\nline", "tab_new_line"},
+        {"/fx/Shell.vst3", "", "_"},
+        {"/fx/Shell.vst3", ".hidden", "_.hidden"},
+        {"/fx/Shell.vst3", "nul", isDeviceName("nul") ? "_nul" : "nul"},
+        {"/fx/Shell.vst3", "null", "null"},
+    };
+    for (const auto &row : rows)
+        EXPECT_EQ(markerPath(vst3(), "/e", row.path, row.name), QString("/e/") + row.file + ".scan3");
+    const QTemporaryDir folder;
+    const QString path = markerPath(vst3(), folder.path(), QString(), QString(300, QChar(0x771F)));
+    EXPECT_TRUE(writeMarkerFile(vst3(), path, EffectRecord()));
+    EXPECT_TRUE(QFile::exists(path)) << "cut to a length that every file system takes";
+}
+
+TEST(CrashMarker, TextAndWhatIsReadBack)
+{
+    const struct {
+        const MarkerFormat &format;
+        EffectRecord record;
+        const char *body;
+        quint32 subIdBack;
+    } rows[] = {
+        {vst3(), crashed("/fx/A & B.vst3", "2024-01-02 03:04", "真空管", 9),
+         "\t<Path>/fx/A & B.vst3</Path>\n\t<Created>2024-01-02 03:04</Created>\n\t<Name>真空管</Name>\n", 0},
+        {vst3(), crashed("", "", "", 0), "\t<Path></Path>\n\t<Created></Created>\n\t<Name></Name>\n", 0},
+        {vst2(), crashed("", "", "N", 0), "\t<Name>N</Name>\n", 0},
+        {vst2(), crashed("/s.dll", "t", "C", 1234),
+         "\t<Path>/s.dll</Path>\n\t<Created>t</Created>\n\t<Name>C</Name>\n\t<SubID>1234</SubID>\n", 1234},
+        {vst2(), crashed("/s.dll", "t", "C", 2147483648u),
+         "\t<Path>/s.dll</Path>\n\t<Created>t</Created>\n\t<Name>C</Name>\n\t<SubID>-2147483648</SubID>\n",
+         2147483648u},
+    };
+    const TestFolder folder;
+    const QString path = folder.path("marker");
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.body);
+        EffectRecord record = row.record;
+        ASSERT_TRUE(writeMarkerFile(row.format, path, record));
+        EXPECT_EQ(folder.read(path).replace(kLineEnd, "\n"),
+                  QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<CrashedPlugin>\n") + row.body +
+                      "</CrashedPlugin>\n");
+        record.subId = row.subIdBack;
+        expectBack(readMarkerFile(row.format, path), record);
+    }
+    const CapturedLog log;
+    const EffectRecord noXml = crashed("/fx/a<b>&.so", "2024-01-02 03:04", "<<", 2147483648u);
+    ASSERT_TRUE(writeMarkerFile(vst2(), path, noXml));
+    expectBack(readMarkerFile(vst2(), path), noXml);
+}
+
+TEST(CrashMarker, AbandoningDeletesWhatIsActiveAndOnlyThen)
+{
+    const QTemporaryDir folder;
+    const QString path = folder.filePath("X.scan3");
+    bool ended = false;
+    ActiveMarkers::abandon([&] { ended = true; });
+    EXPECT_FALSE(ended) << "no plug-in is being probed";
+    ASSERT_TRUE(writeMarkerFile(vst3(), path, EffectRecord()));
+    ActiveMarkers::add(path);
+    ActiveMarkers::abandon([&] { ended = true; });
+    EXPECT_TRUE(ended);
+    EXPECT_FALSE(QFile::exists(path));
+    ActiveMarkers::remove(path);
+}
