@@ -1,0 +1,97 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+
+#include <QString>
+
+#include <set>
+#include <vector>
+
+/// What a plug-in is being asked. Stages follow each other in this order; a shell goes through the middle
+/// ones again for each of its sub-plug-ins.
+enum class ProbeStage {
+    Load,  ///< its library is being loaded
+    Start, ///< the module's entry function, or the VST 2 entry point, runs
+    Ask,   ///< it is asked for its data
+    Close, ///< it is released and unloaded
+};
+
+/// What a probe came to.
+enum class ProbeStatus {
+    Listed,    ///< it lists at least one plug-in
+    Failed,    ///< it does not load, does not start, or lists nothing
+    NoPlugin,  ///< the file is not a plug-in of this format
+    Crashed,   ///< it ended the process that probed it
+    NoAnswer,  ///< it gave no answer within the limit
+    Cancelled, ///< the scan was cancelled while it was probed
+};
+
+/// One file to ask: everything that a format's probe needs to know.
+struct ProbeJob {
+    PluginFormat format = PluginFormat::Unknown;
+    QString path;                 ///< the module: a file or a bundle
+    QString fileTime;             ///< its time stamp; every record of the outcome carries it
+    std::set<quint32> leftOut;    ///< sub-plug-ins of a shell that are listed by name and never loaded
+    bool announceClasses = false; ///< each class is announced as it is listed, however few there are
+};
+
+/// What came of a job. It starts out as failed.
+struct ProbeOutcome {
+    /// What becomes of the catalogue where nothing was listed.
+    enum class IfFailed {
+        Record,    ///< a record of the file says that it does not work; it is asked again when it changes
+        Forget,    ///< no record; the next scan asks again
+        KeepKnown, ///< what was known stays as it is; the next scan asks again
+    };
+
+    ProbeStatus status = ProbeStatus::Failed;
+    ProbeStage stage = ProbeStage::Load; ///< the last one entered
+    QString reason; ///< why it failed: one phrase without the path; empty when it did not
+    IfFailed ifFailed = IfFailed::Record;
+    /// In the module's order, with path and file time. A sub-plug-in that failed or was left out has its name
+    /// and identifier, and `working` is false; a file that failed as a whole has no record here.
+    std::vector<EffectRecord> records;
+    double milliseconds = 0;  ///< from before the module was touched until it was unloaded
+    bool leftThreads = false; ///< more threads run than before, and the module stays mapped
+    bool faulted = false;     ///< a call committed a hardware fault that was contained
+
+    /// The first reason counts: what fails later follows from it.
+    void fail(const QString &why)
+    {
+        if (reason.isEmpty())
+            reason = why;
+    }
+};
+
+/// Hears how a probe gets on, on the thread that probes, before the plug-in is called. Nothing that it does
+/// may throw.
+class IProbeObserver {
+public:
+    virtual ~IProbeObserver() = default;
+
+    virtual void stageEntered(ProbeStage stage) = 0;
+    /// A class of the module is asked next.
+    virtual void classBegins(const QString &name) = 0;
+    /// A class that is to be announced has been dealt with.
+    virtual void classAnnounced() = 0;
+    /// The module is a shell with so many sub-plug-ins.
+    virtual void childrenFound(std::size_t count) = 0;
+    /// A sub-plug-in is loaded next. `child` has the path, file time, sub-plug-in name and identifier.
+    virtual void childBegins(const EffectRecord &child) = 0;
+    /// What came of it: one record, and the reason where it failed.
+    virtual void childEnds(const ProbeOutcome &outcome) = 0;
+    /// A sub-plug-in is closed, at the end of the whole probe; and has been closed.
+    virtual void childCloses(const EffectRecord &child) = 0;
+    virtual void childClosed() = 0;
+};
+
+/// Asks one format's plug-ins. Touches no list, catalogue, marker, report or user interface.
+class IPluginProbe {
+public:
+    virtual ~IPluginProbe() = default;
+
+    /// Loads the job's module, asks it and unloads it again. Never throws: whatever the plug-in throws is
+    /// part of the outcome.
+    virtual ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) = 0;
+};
