@@ -51,14 +51,16 @@ bool PluginLibrary::load(const QString &path)
 
 void PluginLibrary::leaveMapped() { m_handle = nullptr; }
 
-void PluginLibrary::freeUnlessRunning()
+bool PluginLibrary::freeUnlessRunning()
 {
     PluginThread::deliverMessages(); // while the code that they lead to is there
-    if (m_handle && !useProcessCache && !newThreadsEnd(m_threadsBefore, kThreadPatience)) {
+    const bool runsOn = m_handle && !useProcessCache && !newThreadsEnd(m_threadsBefore, kThreadPatience);
+    if (runsOn) {
         DebugLog(L"%ls left threads running and stays in memory", m_path);
         leaveMapped();
     }
     free();
+    return !runsOn;
 }
 
 bool PluginLibrary::exists(const QString &path) { return QFile::exists(path); }

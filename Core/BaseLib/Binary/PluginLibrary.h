@@ -26,8 +26,8 @@ public:
     void leaveMapped();
     /// Unloads the library, unless more threads run than before it was loaded: a thread in unmapped code
     /// would kill the process while another library is being blamed. Such a library stays mapped, with a log
-    /// line.
-    void freeUnlessRunning();
+    /// line; false then.
+    bool freeUnlessRunning();
 
     bool isLoaded() const { return m_handle != nullptr; }
     /// The system's handle, or null.
