@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/Files/TextFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeStage.h"
 
 #include <QElapsedTimer>
 #include <QString>
@@ -11,14 +12,6 @@
 class QFile;
 class QJsonObject;
 class ProbeEntry;
-
-/// What a plug-in is being asked when its stage is reported.
-enum class ProbeStage {
-    Load,  ///< its library is being loaded
-    Start, ///< the module's entry function, or the VST 2 entry point, runs
-    Ask,   ///< it is asked for its data
-    Close, ///< it is released and unloaded
-};
 
 /// The running account of a scan for whoever started it: one JSON object a line, appended to the file that
 /// the environment variable "FXPROBE_REPORT" names. Each line is with the system before the next plug-in
