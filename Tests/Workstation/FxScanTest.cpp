@@ -107,7 +107,7 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
         {"Exit3", true, "fault module-entry _exit\n", "disabled", "exit code 0 while it was starting"},
         {"Hang2", false, "fault get-vendor-string hang\n", "disabled",
          "no answer for 2 s while it was asked for its data"},
-        {"Null2", false, "answer entry null\n", "failed", "its entry point gives no plug-in"},
+        {"Null2", false, "answer entry null\n", "failed", "its entry point returned null"},
         {"Throw2", false, "fault entry throw-std\n", "failed", "thrown by the fixture"},
         {"Refuse3", true, "answer initialize false\n", "failed", "could not be initialised (result 0x"},
         {"Start3", true, "answer module-entry false\n", "failed", "could not start"},

@@ -3,7 +3,7 @@
 #include "Core/BaseLib/Log/Assertion.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
 
 #include <algorithm>
 #include <cstring>
@@ -94,9 +94,16 @@ bool VSTEffect::isEffect() const
     return read && read->magic == kEffectMagic;
 }
 
-void VSTEffect::setOwner(void *owner)
+bool VSTEffect::setOwner(IVSTEffectOwner *owner)
 {
-    callGuarded([&] { m_plugin->resvd1 = reinterpret_cast<VstIntPtr>(owner); });
+    try {
+        callGuarded([&] { m_plugin->resvd1 = reinterpret_cast<VstIntPtr>(owner); });
+        return true;
+    } catch (const SEException &fault) {
+        *m_faulted = true;
+        DebugLog(L"A VST plug-in's effect cannot be written to: %s", fault.what());
+    }
+    return false;
 }
 
 VstIntPtr VSTEffect::dispatch(VstInt32 opcode) { return call(opcode, 0, 0, nullptr, 0.0f).value_or(0); }
@@ -117,6 +124,20 @@ VstIntPtr VSTEffect::dispatchFloat(VstInt32 opcode, float number)
 {
     DebugTrace(L"VST Plugin Dispatch(%d,%f);", opcode, static_cast<double>(number));
     return call(opcode, 0, 0, nullptr, number).value_or(0);
+}
+
+bool VSTEffect::send(VstInt32 opcode)
+{
+    if (isCallable())
+        dispatch(opcode);
+    return isCallable();
+}
+
+bool VSTEffect::sendValue(VstInt32 opcode, VstIntPtr value)
+{
+    if (isCallable())
+        dispatchValue(opcode, value);
+    return isCallable();
 }
 
 std::optional<VstIntPtr> VSTEffect::dispatchAt(VstInt32 opcode, VstInt32 index, VstIntPtr value,
@@ -152,17 +173,17 @@ bool VSTEffect::guard(const char *what, int number, Call &&call)
     const AEffect *const _plugin = m_plugin;
     if (!FXPROBE_VERIFY(0 != _plugin))
         return false;
-    const VSTCallbackNesting::Restore nesting;
+    const auto nesting = VSTCallbackNesting::keep();
     try {
         callGuarded(call);
         return true;
     } catch (const SEException &fault) {
-        m_faulted.set();
+        *m_faulted = true;
         DebugLog(L"VST plug-in %s %d: %s", what, number, fault.what());
     } catch (const std::exception &exception) {
         DebugLog(L"VST plug-in %s %d threw: %ls", what, number, guardedText(exception));
     } catch (...) {
-        DebugLog(L"VST plug-in %s %d threw something that is no standard exception", what, number);
+        DebugLog(L"VST plug-in %s %d threw something that is not a standard exception", what, number);
     }
     return false;
 }

@@ -7,11 +7,14 @@
 #include <QRect>
 
 #include <atomic>
+#include <memory>
 #include <optional>
+
+class IVSTEffectOwner;
 
 /// The checking wrapper around a plug-in's `AEffect`: it alone holds the pointer and calls the dispatcher.
 /// Every call is guarded: what the plug-in throws or faults ends in a log line and a neutral answer. Copies
-/// stand for the same effect.
+/// stand for the same effect and share what is known of its faults.
 class VSTEffect {
 public:
     /// The fields that are read, as they stood when asked.
@@ -29,6 +32,7 @@ public:
     VSTEffect() = default;
     explicit VSTEffect(AEffect *effect)
         : m_plugin(effect)
+        , m_faulted(std::make_shared<std::atomic<bool>>(false))
     {}
 
     bool isHeld() const { return m_plugin != nullptr; }
@@ -37,14 +41,18 @@ public:
     bool isEffect() const;
     /// Nothing when the memory cannot be read.
     std::optional<Fields> fields() const;
-    /// Stores the host's own pointer in the effect, for the host callback to find.
-    void setOwner(void *owner);
+    /// Stores the owner in the effect, for the host callback to find; false when the memory cannot be written
+    /// to.
+    bool setOwner(IVSTEffectOwner *owner);
 
     /// Calls the dispatcher with index 0 and whatever is not given 0 or null; 0 when the call failed.
     VstIntPtr dispatch(VstInt32 opcode);
     VstIntPtr dispatch(VstInt32 opcode, void *pointer);
     VstIntPtr dispatchValue(VstInt32 opcode, VstIntPtr value);
     VstIntPtr dispatchFloat(VstInt32 opcode, float number);
+    /// The same in use: nothing is sent to an effect that faulted. Whether it may be called after that.
+    bool send(VstInt32 opcode);
+    bool sendValue(VstInt32 opcode, VstIntPtr value);
     /// Calls the dispatcher with an index and everything else; nothing when the call failed.
     std::optional<VstIntPtr> dispatchAt(VstInt32 opcode, VstInt32 index, VstIntPtr value, void *pointer);
 
@@ -78,36 +86,21 @@ public:
     Chunk programChunk();
 
     /// True once a call committed a hardware fault: the plug-in's state is unknown then.
-    bool hasFaulted() const { return m_faulted.isSet(); }
+    bool hasFaulted() const { return m_faulted && *m_faulted; }
+    /// Whether an effect in use may still be called.
+    bool isCallable() const { return isHeld() && !hasFaulted(); }
 
     /// Calls a plug-in back from inside the host callback, where whoever called the plug-in is the guard.
     static VstIntPtr dispatchUnguarded(AEffect *effect, VstInt32 opcode);
 
 private:
-    /// Set by whatever thread the plug-in was called on.
-    class Mark {
-    public:
-        Mark() = default;
-        Mark(const Mark &other) { m_set = other.m_set.load(); }
-        Mark &operator=(const Mark &other)
-        {
-            m_set = other.m_set.load();
-            return *this;
-        }
-        void set() { m_set = true; }
-        bool isSet() const { return m_set; }
-
-    private:
-        std::atomic<bool> m_set{false};
-    };
-
     template <typename Call>
     bool guard(const char *what, int number, Call &&call);
     std::optional<VstIntPtr> call(VstInt32 opcode, VstInt32 index, VstIntPtr value, void *pointer,
                                   float number);
 
     AEffect *m_plugin = nullptr;
-    Mark m_faulted;
+    std::shared_ptr<std::atomic<bool>> m_faulted; ///< set by whatever thread the plug-in was called on
 };
 
 /// Decides for guards that look at a fault before they handle it: logs the code and handles access violations

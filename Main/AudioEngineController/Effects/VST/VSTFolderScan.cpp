@@ -1,23 +1,17 @@
 #include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
 
-#include "Core/BaseLib/Binary/BinaryExports.h"
 #include "Core/BaseLib/Files/FileTime.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/Host/ProbeBracket.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
-#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Main/AudioEngineController/Effects/VST/VSTProbe.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
 #include <algorithm>
+#include <optional>
 
 namespace {
-
-bool hasNoEntryPoint(const QString &path)
-{
-    return findExports(path, {"VSTPluginMain", "main"}) == ExportAnswer::NotExported;
-}
 
 /// Whether the record that speaks for a file does not fit it any more.
 bool isOutdated(const EffectRecord &first, const QString &fileTime)
@@ -46,11 +40,121 @@ void carryMarks(const ScanItem &item, EffectRecord &record)
         takeMarks(record, *source);
 }
 
+/// Whether a record of the outcome stands for a sub-plug-in that was only listed.
+bool isLeftOut(const EffectRecord &record) { return !record.enabled; }
+
+/// The sub-plug-ins that killed the scanner in this version of the file; another version gets another chance.
+std::set<quint32> deadlyChildren(const ScanItem &item)
+{
+    std::set<quint32> ids;
+    for (const EffectRecord &old : item.knownRecords)
+        if (old.subId != 0 && !old.enabled && !old.working && old.fileTime == item.fileTime)
+            ids.insert(old.subId);
+    return ids;
+}
+
 } // namespace
+
+/// Writes markers, report and progress of one probe. What it made for the file stands until it is destroyed.
+class VSTFolderScan::Observer final : public IProbeObserver {
+public:
+    Observer(VSTFolderScan &scan, const ScanItem &item, const ProbeJob &job)
+        : m_scan(scan)
+        , m_item(item)
+        , m_addsAtOnce(job.leftOut.empty())
+    {
+        m_file.path = item.path;
+        m_file.fileTime = item.fileTime;
+    }
+
+    void stageEntered(ProbeStage stage) override
+    {
+        if (!m_entry)
+            begin();
+        ProbeReport::stage(stage);
+    }
+    void classBegins(const QString &) override {}
+    void classAnnounced() override {}
+    void childrenFound(std::size_t count) override
+    {
+        m_isShell = true;
+        if (m_scan.progress())
+            m_scan.progress()->setRange(static_cast<int>(count), QStringLiteral("Scanning WaveShell"));
+    }
+    void childBegins(const EffectRecord &child) override
+    {
+        showScanning(child.subName);
+        m_childEntry.emplace(m_scan.format(), child);
+        m_childBracket.emplace(m_scan.host(), m_scan.processState(), child, child.subName);
+    }
+    void childEnds(const ProbeOutcome &outcome) override
+    {
+        if (!outcome.reason.isEmpty())
+            ProbeReport::reason(outcome.reason);
+        if (outcome.status == ProbeStatus::Listed)
+            m_childEntry->listed(1);
+        if (m_addsAtOnce)
+            m_added |= m_scan.addListed(m_item, outcome.records.front());
+        m_childBracket.reset();
+        m_childEntry.reset();
+        m_bracket->showProgress();
+        if (m_scan.progress())
+            m_scan.progress()->setValue(++m_done);
+    }
+    void childCloses(const EffectRecord &child) override
+    {
+        m_closing.emplace(m_scan.host(), m_scan.processState(), child, child.subName);
+    }
+    void childClosed() override { m_closing.reset(); }
+
+    /// Adds the outcome to the catalogue; true when a record was added.
+    bool add(const ProbeOutcome &outcome)
+    {
+        if (!outcome.reason.isEmpty())
+            ProbeReport::reason(outcome.reason);
+        if (m_isShell)
+            m_scan.showItemProgress();
+        if (outcome.status != ProbeStatus::Listed) {
+            DebugLog(L"%ls, Didn't manage it", m_item.path);
+            if (outcome.status == ProbeStatus::NoPlugin)
+                m_entry->isNoPlugin();
+            return outcome.status == ProbeStatus::Failed && m_scan.addFailed(m_item, m_file);
+        }
+        if (!m_isShell)
+            m_entry->listed(1);
+        if (!m_isShell || !m_addsAtOnce) // else the records are where they belong in the order of the names
+            for (const EffectRecord &record : outcome.records)
+                m_added |= m_scan.addListed(m_item, record);
+        return m_added;
+    }
+    /// Whether the module was to be loaded.
+    bool hasBegun() const { return m_entry.has_value(); }
+
+private:
+    void begin()
+    {
+        showScanning(fileNameOf(m_item.path));
+        m_entry.emplace(m_scan.format(), m_file);
+        m_bracket.emplace(m_scan.host(), m_scan.processState(), m_file);
+        DebugTrace(L"Probing %ls", m_item.path);
+    }
+
+    VSTFolderScan &m_scan;
+    const ScanItem &m_item;
+    const bool m_addsAtOnce; ///< sub-plug-ins; those that are left out would get behind the others
+    EffectRecord m_file;
+    bool m_isShell = false;
+    bool m_added = false;
+    int m_done = 0; ///< sub-plug-ins
+    std::optional<ProbeEntry> m_entry;
+    std::optional<ProbeBracket> m_bracket; ///< ends before its entry
+    std::optional<ProbeEntry> m_childEntry;
+    std::optional<ProbeBracket> m_childBracket;
+    std::optional<ProbeBracket> m_closing;
+};
 
 VSTFolderScan::VSTFolderScan(VSTHost &host)
     : FolderScan(host, "vst2")
-    , m_vstHost(host)
 {}
 
 std::vector<ScanItem> VSTFolderScan::arrange(const QStringList &paths)
@@ -88,51 +192,25 @@ bool VSTFolderScan::process(const ScanItem &item)
 
 bool VSTFolderScan::probe(const ScanItem &item)
 {
-    if (hasNoEntryPoint(item.path)) {
-        DebugTrace(L"%ls exports no VST 2 entry point", item.path);
-        ProbeReport::instance().skipped(format(), item.path,
-                                        QStringLiteral("it exports no VST 2 entry point"));
-        return false;
-    }
-    EffectRecord file;
-    file.path = item.path;
-    file.fileTime = item.fileTime;
-    showScanning(fileNameOf(item.path));
-    ProbeEntry entry(format(), file);
-    const ProbeBracket bracket(host(), processState(), file);
-    DebugTrace(L"Probing %ls", item.path);
-    std::vector<EffectRecord> children; // outlive the plug-in, whose end still closes them
-    VSTPlugin plugin(m_vstHost);        // unloads its module before the bracket deletes the marker
-    plugin.setCloseBracket([&](VstInt32 shellId) { return bracketOfChild(children, shellId); });
-    bool isPluginModule = true;
-    if (!plugin.load(item.path, VSTHostCallback, isPluginModule)) {
-        DebugLog(L"%ls, Didn't manage it", item.path);
-        if (!isPluginModule)
-            entry.isNoPlugin();
-        return isPluginModule && addFailed(item, file);
-    }
-    plugin.readInto(file);
-    if (file.vstCategory != kPlugCategShell) {
-        entry.listed(1);
-        return addProbed(item, file);
-    }
-    for (const VSTSubPlugin &sub : plugin.subPlugins()) {
-        children.push_back(file);
-        children.back().name = children.back().subName = sub.name;
-        children.back().subId = sub.id;
-    }
-    if (children.empty())
-        ProbeReport::reason(QStringLiteral("it is a shell and lists no sub-plug-in"));
-    return children.empty() ? addFailed(item, file) : expandShell(item, plugin, children, bracket);
+    ProbeJob job;
+    job.format = PluginFormat::Vst2;
+    job.path = item.path;
+    job.fileTime = item.fileTime;
+    job.leftOut = deadlyChildren(item);
+    Observer observer(*this, item, job);
+    const ProbeOutcome outcome = VSTProbe().run(job, observer);
+    if (observer.hasBegun())
+        return observer.add(outcome);
+    DebugTrace(L"%ls exports no VST 2 entry point", item.path);
+    ProbeReport::instance().skipped(format(), item.path, outcome.reason);
+    return false;
 }
 
-std::shared_ptr<ProbeBracket> VSTFolderScan::bracketOfChild(const std::vector<EffectRecord> &children,
-                                                            VstInt32 shellId)
+bool VSTFolderScan::addListed(const ScanItem &item, const EffectRecord &record)
 {
-    for (const EffectRecord &child : children)
-        if (child.subId == static_cast<quint32>(shellId))
-            return std::make_shared<ProbeBracket>(host(), processState(), child, child.subName);
-    return nullptr;
+    if (isLeftOut(record))
+        return host().AddEffect(*ownRecord(item, record));
+    return record.working ? addProbed(item, record) : addFailed(item, record);
 }
 
 bool VSTFolderScan::addProbed(const ScanItem &item, EffectRecord record)
@@ -147,39 +225,5 @@ bool VSTFolderScan::addProbed(const ScanItem &item, EffectRecord record)
 bool VSTFolderScan::addFailed(const ScanItem &item, EffectRecord record)
 {
     host().completeFailedRecord(record);
-    return addProbed(item, record);
-}
-
-bool VSTFolderScan::expandShell(const ScanItem &item, VSTPlugin &plugin,
-                                const std::vector<EffectRecord> &children, const ProbeBracket &bracket)
-{
-    if (progress())
-        progress()->setRange(static_cast<int>(children.size()), QStringLiteral("Scanning WaveShell"));
-    bool added = false;
-    int done = 0;
-    for (const EffectRecord &child : children) {
-        added |= addChild(item, plugin, child);
-        bracket.showProgress();
-        if (progress())
-            progress()->setValue(++done);
-    }
-    showItemProgress();
-    return added;
-}
-
-bool VSTFolderScan::addChild(const ScanItem &item, VSTPlugin &plugin, const EffectRecord &child)
-{
-    const EffectRecord *old = ownRecord(item, child);
-    if (old && !old->enabled && !old->working && old->fileTime == child.fileTime)
-        return host().AddEffect(
-            *old); // it killed the scanner; another version of the file gets another chance
-    showScanning(child.subName);
-    ProbeEntry entry(format(), child);
-    const ProbeBracket bracket(host(), processState(), child, child.subName);
-    if (!plugin.load(child, VSTHostCallback, 1))
-        return addFailed(item, child);
-    entry.listed(1);
-    EffectRecord record = child;
-    plugin.readInto(record);
     return addProbed(item, record);
 }

@@ -3,10 +3,7 @@
 #include "Main/AudioEngineController/Effects/Host/FolderScan.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 
-#include <memory>
 #include <vector>
-
-class ProbeBracket;
 
 /// One scan for VST 2 plug-ins.
 class VSTFolderScan : public FolderScan {
@@ -18,13 +15,10 @@ protected:
     bool process(const ScanItem &item) override;
 
 private:
+    class Observer;
+
     bool probe(const ScanItem &item);
+    bool addListed(const ScanItem &item, const EffectRecord &record);
     bool addProbed(const ScanItem &item, EffectRecord record);
     bool addFailed(const ScanItem &item, EffectRecord record);
-    bool expandShell(const ScanItem &item, VSTPlugin &plugin, const std::vector<EffectRecord> &children,
-                     const ProbeBracket &bracket);
-    std::shared_ptr<ProbeBracket> bracketOfChild(const std::vector<EffectRecord> &children, VstInt32 shellId);
-    bool addChild(const ScanItem &item, VSTPlugin &plugin, const EffectRecord &child);
-
-    VSTHost &m_vstHost;
 };

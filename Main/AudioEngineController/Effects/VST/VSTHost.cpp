@@ -4,17 +4,13 @@
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 
 #include <QRegularExpression>
 
-#include <algorithm>
-#include <cstdio>
-
 namespace {
-
-std::atomic<VSTHost *> s_instance{nullptr};
 
 constexpr char kOldNameMark[] = " [2.4]"; ///< names of earlier catalogues end so
 constexpr char kOldKeyMark[] = "Waves ";
@@ -32,24 +28,7 @@ double waveShellVersion(const QString &fileName)
 
 VSTHost::VSTHost()
     : AudioPluginHost(&vstCatalogueFormat())
-{
-    VSTHost *none = nullptr;
-    s_instance.compare_exchange_strong(none, this);
-}
-
-VSTHost::~VSTHost()
-{
-    VSTHost *self = this;
-    s_instance.compare_exchange_strong(self, nullptr);
-}
-
-VSTHost &VSTHost::instance()
-{
-    if (VSTHost *existing = s_instance)
-        return *existing;
-    static VSTHost own;
-    return own;
-}
+{}
 
 QString VSTHost::moduleEnding() const { return VSTModuleFile::ending(); }
 
@@ -130,7 +109,7 @@ std::unique_ptr<VSTPlugin> VSTHost::loadRecord(const EffectRecord &record, const
                  record.id);
         return nullptr;
     }
-    auto plugin = std::make_unique<VSTPlugin>(*this);
+    auto plugin = std::make_unique<VSTPlugin>();
     if (plugin->load(record, VSTHostCallback, 0)) {
         if (requestedKey != record.id)
             plugin->setRequestedKey(requestedKey);
@@ -142,71 +121,5 @@ std::unique_ptr<VSTPlugin> VSTHost::loadRecord(const EffectRecord &record, const
 
 void VSTHost::setAudioSettings(int sampleRate, int blockSize)
 {
-    m_sampleRate = sampleRate;
-    m_blockSize = blockSize;
-}
-
-const VSTSpeakerArrangement *VSTHost::findArrangement(int channels) const
-{
-    const auto found = m_arrangements.find(channels);
-    if (found == m_arrangements.end())
-        return nullptr;
-    const VSTSpeakerArrangement &arrangement = found->second;
-    std::printf("Found arrangement for:%d chs:%d type:%d\n", channels, arrangement.numChannels,
-                arrangement.type);
-    for (int index = 0; index < arrangement.numChannels; ++index)
-        std::printf("Speaker: %d%s\n", index, arrangement.speakers[index].name);
-    return &arrangement;
-}
-
-bool VSTHost::shellIdOfPluginBeingLoaded(VstInt32 &id) const
-{
-    const VSTPlugin *plugin = m_pluginBeingLoaded;
-    if (plugin)
-        id = plugin->shellId();
-    return plugin != nullptr;
-}
-
-std::vector<VSTHost::Registered>::iterator VSTHost::registered(const VSTPlugin *plugin)
-{
-    return std::find_if(m_plugins.begin(), m_plugins.end(),
-                        [plugin](const Registered &entry) { return entry.plugin == plugin; });
-}
-
-void VSTHost::registerPlugin(VSTPlugin *plugin)
-{
-    const std::lock_guard<std::mutex> lock(m_pluginsMutex);
-    m_plugins.push_back({plugin, 0});
-}
-
-void VSTHost::unregisterPlugin(VSTPlugin *plugin)
-{
-    std::unique_lock<std::mutex> lock(m_pluginsMutex);
-    m_unpinned.wait(lock, [&] { return registered(plugin)->pins == 0; });
-    m_plugins.erase(registered(plugin));
-}
-
-bool VSTHost::pin(const VSTPlugin *claimed)
-{
-    const std::lock_guard<std::mutex> lock(m_pluginsMutex);
-    const auto entry = registered(claimed);
-    if (entry == m_plugins.end())
-        return false;
-    ++entry->pins;
-    return true;
-}
-
-void VSTHost::unpin(const VSTPlugin *plugin)
-{
-    const std::lock_guard<std::mutex> lock(m_pluginsMutex);
-    if (--registered(plugin)->pins == 0)
-        m_unpinned.notify_all();
-}
-
-void VSTHost::logLoadedPlugins() const
-{
-    const std::lock_guard<std::mutex> lock(m_pluginsMutex);
-    DebugLog(L"VSTs ");
-    for (const Registered &entry : m_plugins)
-        DebugLog(L"vst: %s: ", entry.plugin->name());
+    VSTHostContext::instance().setAudioSettings(sampleRate, blockSize);
 }

@@ -1,9 +1,10 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/VST/IVSTEffectOwner.h"
+#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
 #include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 
 #include <cstring>
 
@@ -23,11 +24,9 @@ constexpr const char *kCapabilities[] = {
     "sendVstTimeInfo", "startStopProcess", "openFileSelector", "closeFileSelector",
     "supplyIdle",      "sizeWindow"};
 
-thread_local std::int32_t t_activeCalls = 0;
-
 /// One call of the callback while it is answered.
 struct HostCall {
-    VSTHost &host;
+    VSTHostContext &context;
     AEffect *effect;
     VstInt32 opcode;
     VstInt32 index;
@@ -35,11 +34,11 @@ struct HostCall {
     void *ptr;
     float opt;
 
-    /// Lets the calling plug-in's object do something, if there is one; says whether there was.
+    /// Lets the owner of the calling plug-in do something, if there is one; says whether there was.
     template <typename Operation>
-    bool withPlugin(Operation &&operation) const
+    bool withOwner(Operation &&operation) const
     {
-        return host.withCallingPlugin(effect, operation);
+        return context.withOwner(effect, operation);
     }
 };
 
@@ -52,8 +51,10 @@ struct Answer {
 Answer currentId(const HostCall &call)
 {
     VstInt32 id = 0;
-    if (!call.host.shellIdOfPluginBeingLoaded(id))
-        call.withPlugin([&](VSTPlugin &plugin) { id = plugin.shellId(); });
+    if (const IVSTEffectOwner *loading = call.context.ownerBeingLoaded())
+        id = loading->shellId();
+    else
+        call.withOwner([&](const IVSTEffectOwner &owner) { id = owner.shellId(); });
     return {id, true};
 }
 
@@ -86,8 +87,8 @@ Answer canDo(const HostCall &call)
 Answer processLevel(const HostCall &call)
 {
     bool isRealtime = false;
-    call.withPlugin([&](const VSTPlugin &plugin) { isRealtime = plugin.isRealtime(); });
-    return {isRealtime ? vst::kVstProcessLevelRealtime : call.host.processLevel()};
+    call.withOwner([&](const IVSTEffectOwner &owner) { isRealtime = owner.isRealtime(); });
+    return {isRealtime ? vst::kVstProcessLevelRealtime : call.context.processLevel()};
 }
 
 Answer ioChanged(const HostCall &call)
@@ -95,7 +96,7 @@ Answer ioChanged(const HostCall &call)
     if (!call.effect)
         return {0};
     DebugLog(L"Host Callback - audioMasterIOChanged");
-    call.withPlugin([](VSTPlugin &plugin) { plugin.ioChanged(); });
+    call.withOwner([](IVSTEffectOwner &owner) { owner.ioChanged(); });
     return {0};
 }
 
@@ -109,8 +110,8 @@ Answer idle(const HostCall &call)
 Answer sizeWindow(const HostCall &call)
 {
     bool resized = false;
-    call.withPlugin([&](VSTPlugin &plugin) {
-        resized = plugin.resizeEditor(call.index, static_cast<VstInt32>(call.value));
+    call.withOwner([&](IVSTEffectOwner &owner) {
+        resized = owner.resizeEditor(call.index, static_cast<VstInt32>(call.value));
     });
     return {resized ? 1 : 0};
 }
@@ -120,40 +121,40 @@ template <typename Operation>
 bool forward(const HostCall &call, Operation &&operation)
 {
     bool forwarded = false;
-    call.withPlugin([&](VSTPlugin &plugin) {
-        forwarded = !call.host.isIgnored(&plugin);
+    call.withOwner([&](IVSTEffectOwner &owner) {
+        forwarded = !call.context.isIgnored(&owner);
         if (forwarded)
-            operation(plugin);
+            operation(owner);
     });
     return forwarded;
 }
 
 Answer automate(const HostCall &call)
 {
-    forward(call, [&](VSTPlugin &plugin) { plugin.parameterChanged(call.index, call.opt); });
+    forward(call, [&](IVSTEffectOwner &owner) { owner.parameterChanged(call.index, call.opt); });
     return {0};
 }
 
 Answer updateDisplay(const HostCall &call)
 {
-    forward(call, [](VSTPlugin &plugin) { plugin.refreshDisplay(); });
+    forward(call, [](IVSTEffectOwner &owner) { owner.refreshDisplay(); });
     return {1};
 }
 
 Answer edit(const HostCall &call, bool begins)
 {
-    return {forward(call, [&](VSTPlugin &plugin) { plugin.parameterEdit(call.index, begins); }) ? 1 : 0};
+    return {forward(call, [&](IVSTEffectOwner &owner) { owner.parameterEdit(call.index, begins); }) ? 1 : 0};
 }
 
 Answer wantMidi(const HostCall &call)
 {
-    call.withPlugin([](VSTPlugin &plugin) { plugin.setWantsMidi(); });
+    call.withOwner([](IVSTEffectOwner &owner) { owner.setWantsMidi(); });
     return {1};
 }
 
 Answer needIdle(const HostCall &call)
 {
-    call.withPlugin([](VSTPlugin &plugin) { plugin.setNeedsIdle(); });
+    call.withOwner([](IVSTEffectOwner &owner) { owner.setNeedsIdle(); });
     return {1};
 }
 
@@ -164,13 +165,13 @@ Answer answerFromSettings(const HostCall &call)
     case audioMasterVersion:
         return {kHostVstVersion};
     case audioMasterGetTime:
-        return {reinterpret_cast<VstIntPtr>(call.host.timeInfo())};
+        return {reinterpret_cast<VstIntPtr>(call.context.timeInfo())};
     case vst::audioMasterGetNumAutomatableParameters:
         return {kAutomatableParameters};
     case audioMasterGetSampleRate:
-        return {call.host.sampleRate()};
+        return {call.context.sampleRate()};
     case audioMasterGetBlockSize:
-        return {call.host.blockSize()};
+        return {call.context.blockSize()};
     case audioMasterGetVendorString:
         return copyText(call.ptr, kHostVendor, sizeof kHostVendor);
     case audioMasterGetProductString:
@@ -218,48 +219,18 @@ Answer answer(const HostCall &call)
     }
 }
 
-/// Counts one active call on this thread; false when it must be refused. The farewell comes with the scope's
-/// end also when an exception passes.
-class ActiveCall {
-public:
-    ActiveCall()
-    {
-        ++t_activeCalls;
-        if (static_cast<std::uint32_t>(t_activeCalls) <= std::uint32_t(VSTCallbackNesting::kMaxActive))
-            return;
-        if (t_activeCalls >= VSTCallbackNesting::kRunaway) {
-            t_activeCalls = 0;
-            return;
-        }
-        m_refused = true;
-        DebugLog(L"VSTHost::HostCallback: Exceeded max Reentrancy: %d of %d", t_activeCalls,
-                 VSTCallbackNesting::kMaxActive);
-    }
-    ~ActiveCall() { --t_activeCalls; }
-    ActiveCall(const ActiveCall &) = delete;
-    ActiveCall &operator=(const ActiveCall &) = delete;
-
-    bool isRefused() const { return m_refused; }
-
-private:
-    bool m_refused = false;
-};
-
 } // namespace
-
-std::int32_t VSTCallbackNesting::active() { return t_activeCalls; }
-
-void VSTCallbackNesting::setActive(std::int32_t count) { t_activeCalls = count; }
 
 VstIntPtr VSTHostCallback(AEffect *effect, VstInt32 opcode, VstInt32 index, VstIntPtr value, void *ptr,
                           float opt)
 {
-    const ActiveCall active;
-    if (active.isRefused())
+    const bool isRefused = !VSTCallbackNesting::enter();
+    const auto leaving = qScopeGuard(VSTCallbackNesting::leave);
+    if (isRefused)
         return 0;
     DebugTrace(L"VST HostCallback(%d, %d, %d, %p, %f);", opcode, index, static_cast<VstInt32>(value), ptr,
                static_cast<double>(opt));
-    const Answer result = answer({VSTHost::instance(), effect, opcode, index, value, ptr, opt});
+    const Answer result = answer({VSTHostContext::instance(), effect, opcode, index, value, ptr, opt});
     if (!result.direct)
         DebugTrace(L"VST HostCallback returned %d", static_cast<VstInt32>(result.value));
     return result.value;

@@ -1,265 +1,244 @@
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Core/BaseLib/Process/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
-#include "Main/AudioEngineController/Effects/Plugin/PluginBehaviour.h"
-#include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/VLib/SimpleGUI.h"
 
 #include <algorithm>
-#include <set>
 
 namespace {
 
-constexpr int kNameSize = 1024;
-constexpr int kVendorSize = 256;
-constexpr int kMaxKey = 255; ///< UTF-16 units
+namespace vst = VstPublished;
 
-using EntryPoint = AEffect *(*)(VSTHostCallbackFunction);
+/// How knobs follow the mouse: along a straight line.
+constexpr VstIntPtr kLinearKnobs = 2;
 
-/// Plug-in text is widened character by character, as unsigned bytes.
-QString widen(const QByteArray &text) { return QString::fromLatin1(text); }
-
-QString nameOfFile(const QString &path)
-{
-    const int slash = path.lastIndexOf(QLatin1Char('/'));
-    return slash < 0 ? QString() : path.mid(slash + 1).section(QLatin1Char('.'), 0, 0);
-}
-
-/// While it lives, the host callback answers calls from inside an entry point for this plug-in.
-class Loading {
-public:
-    Loading(VSTHost &host, VSTPlugin *plugin)
-        : m_host(host)
-    {
-        m_host.setPluginBeingLoaded(plugin);
-    }
-    ~Loading() { m_host.setPluginBeingLoaded(nullptr); }
-    Loading(const Loading &) = delete;
-    Loading &operator=(const Loading &) = delete;
-
-private:
-    VSTHost &m_host;
-};
+/// The channels of a stated count. A negative one gives a negative span, and channels that are not usable.
+ChannelRange rangeOf(VstInt32 count) { return {0, std::max(count, -1) - 1}; }
 
 } // namespace
 
-VSTPlugin::VSTPlugin(VSTHost &host)
-    : m_host(host)
-{
-    m_host.registerPlugin(this);
-}
+VSTPlugin::VSTPlugin() { VSTHostContext::instance().registerOwner(this); }
 
 VSTPlugin::~VSTPlugin()
 {
     setTornDown(true);
     unload();
-    m_host.stopIgnoring(this); // another object may get this address
-    m_host.unregisterPlugin(this);
+    VSTHostContext::instance().unregisterOwner(this);
 }
 
 QString VSTPlugin::identifierPrefix() const { return QString::fromLatin1(PluginPrefix::kVst2); }
 
-bool VSTPlugin::load(const QString &path, VSTHostCallbackFunction callback, bool &isPluginModule)
-{
-    const VSTEffect effect = callEntryPoint(path, callback, isPluginModule);
-    if (!isUsable(effect) || !adopt(effect, path))
-        return false;
-    m_isProbe = true;
-    return true;
-}
-
 bool VSTPlugin::load(const EffectRecord &record, VSTHostCallbackFunction callback, int reloadMode)
 {
-    if (reloadMode == 1)
-        m_isProbe = false;
     if (reloadMode == 0) {
         setTornDown(true);
         unload();
         setTornDown(false);
     }
     m_shellId = static_cast<VstInt32>(record.subId);
-    VSTEffect effect;
-    {
-        const Loading loading(m_host, this);
-        bool isPluginModule = true;
-        effect = callEntryPoint(record.path, callback, isPluginModule);
-    }
-    if (isUsable(effect) && adopt(effect, record.path))
-        return true;
-    if (effect.isHeld() && !effect.isEffect())
-        DebugLog(L"VSTPlugin::Load - Invalid VST Plugin");
-    DebugLog(L"VSTPlugin::Load - Failed to Load DLL: %s", record.path);
-    return false;
-}
-
-bool VSTPlugin::isUsable(const VSTEffect &effect)
-{
-    if (effect.isEffect())
-        return true;
-    ProbeReport::reason(effect.isHeld() ? QStringLiteral("what its entry point gives is no VST 2 plug-in")
-                                        : QStringLiteral("its entry point gives no plug-in"));
-    return false;
-}
-
-VSTEffect VSTPlugin::callEntryPoint(const QString &path, VSTHostCallbackFunction callback,
-                                    bool &isPluginModule)
-{
-    isPluginModule = true;
-    if (!m_library.isLoaded())
-        ProbeReport::stage(ProbeStage::Load);
-    if (!m_library.isLoaded() && !m_library.load(path)) {
-        DebugLog(L"Cannot load the module %ls: %ls", path, m_library.errorText());
-        ProbeReport::reason(QStringLiteral("it could not be loaded: ") + m_library.errorText());
-        return VSTEffect();
-    }
-    m_loaded = true;
-    void *entryPoint = m_library.symbol("VSTPluginMain");
-    if (!entryPoint)
-        entryPoint = m_library.symbol("main");
-    if (!entryPoint) {
-        isPluginModule = false;
-        DebugLog(L"The module %ls exports neither 'VSTPluginMain' nor 'main'", path);
-        ProbeReport::reason(QStringLiteral("it exports no VST 2 entry point"));
-        return VSTEffect();
-    }
-    return VSTEffect(enter(entryPoint, callback));
-}
-
-AEffect *VSTPlugin::enter(void *entryPoint, VSTHostCallbackFunction callback)
-{
-    ProbeReport::stage(ProbeStage::Start);
-    const VSTCallbackNesting::Restore nesting;
-    try {
-        return callGuarded([&] { return reinterpret_cast<EntryPoint>(entryPoint)(callback); });
-    } catch (const SEException &fault) {
-        m_faulted = true;
-        DebugLog(L"VST plug-in entry point: %s", fault.what());
-        ProbeReport::reason(QStringLiteral("its entry point failed: ") + QString::fromLatin1(fault.what()));
-    } catch (const std::exception &exception) {
-        const QString text = guardedText(exception);
-        DebugLog(L"VST plug-in entry point threw: %ls", text);
-        ProbeReport::reason(QStringLiteral("its entry point threw: ") + text);
-    } catch (...) {
-        DebugLog(L"VST plug-in entry point threw something that is no standard exception");
-        ProbeReport::reason(QStringLiteral("its entry point threw something that is no standard exception"));
-    }
-    unload();
-    return nullptr;
-}
-
-bool VSTPlugin::adopt(const VSTEffect &effect, const QString &path)
-{
-    m_faulted |= m_effect.hasFaulted();
-    {
-        const TAutoLockCS lock(&processingLock()); // a thread of the plug-in may have its channels rebuilt
-        m_effect = effect;
-        m_effectOpened = m_canBypass = m_takesMidi = false;
-        m_needsIdle = m_wantsMidi = m_ioChanged = false; // of the effect before
-        m_speakersPending = true;
-    }
-    ProbeReport::stage(ProbeStage::Ask);
-    const auto isSame = [&](const HandedOut &other) { return other.effect.isSame(effect); };
-    if (std::none_of(m_handedOut.begin(), m_handedOut.end(), isSame))
-        m_handedOut.push_back({effect, m_shellId});
-    try {
-        m_effect.setOwner(this);
-    } catch (const SEException &fault) {
-        m_faulted = true;
-        DebugLog(L"The effect of %ls cannot be written to: %s", path, fault.what());
-        ProbeReport::reason(QStringLiteral("what its entry point gives is no VST 2 plug-in"));
+    const VSTLoadResult result = enter(record.path, callback);
+    if (!result.isDone()) {
+        if (result.status == VSTLoadResult::Status::EntryFailed)
+            unload();
+        logFailedLoad(record.path, result);
         return false;
     }
-    m_fields = m_effect.fields().value_or(VSTEffect::Fields{});
-    nameFrom(path);
+    adopt(result.effect);
+    const VSTEffect::Fields fields = m_effect.fields().value_or(VSTEffect::Fields{});
+    m_naming = nameEffect(m_effect, fields, record.path, m_shellId);
     return true;
 }
 
-bool VSTPlugin::asksForName()
+VSTLoadResult VSTPlugin::enter(const QString &path, VSTHostCallbackFunction callback)
 {
-    if (m_fields.numInputs == 0)
-        return m_shellId != 0;
-    const VstIntPtr category = m_effect.dispatch(effGetPlugCategory);
-    return category != kPlugCategSynth || m_shellId != 0;
+    VSTLoadResult result = m_module.load(path);
+    return result.isDone() ? m_module.enter(callback, *this) : result;
 }
 
-void VSTPlugin::nameFrom(const QString &path)
+void VSTPlugin::adopt(const VSTEffect &effect)
 {
-    m_name = nameOfFile(path);
-    if (asksForName()) {
-        const VSTEffect::Text text = m_effect.dispatchText(effGetEffectName, kNameSize);
-        if (text.answer != 0 || !text.bytes.isEmpty())
-            m_name = widen(text.bytes);
-    }
-    m_key = cutText(formatText(L"%ls:%ld", m_name, static_cast<long>(m_fields.uniqueID)), kMaxKey);
-    m_behaviour = PluginBehaviour::lookUp(QStringLiteral("vst"), m_key);
-}
-
-VstInt32 VSTPlugin::statedCategory()
-{
-    if (m_fields.numInputs == 0 || PluginBehaviour::isInstrument(m_behaviour))
-        return kPlugCategSynth;
-    return static_cast<VstInt32>(m_effect.dispatch(effGetPlugCategory));
-}
-
-void VSTPlugin::readInto(EffectRecord &record)
-{
-    record.vstCategory = statedCategory();
-    m_fields = m_effect.fields().value_or(m_fields); // the calls may have changed them
-    record.behaviour = m_behaviour;
-    record.vendor = widen(m_effect.dispatchText(effGetVendorString, kVendorSize).bytes);
-    record.width = m_fields.numOutputs;
-    record.latency = m_fields.initialDelay;
-    record.name = m_name;
-    record.id = m_key;
-}
-
-std::vector<VSTSubPlugin> VSTPlugin::subPlugins()
-{
-    std::vector<VSTSubPlugin> found;
-    std::set<quint32> ids;
-    for (int count = 0; count < kMaxSubPlugins; ++count) {
-        const VSTEffect::Text next = m_effect.dispatchText(effShellGetNextPlugin, kNameSize);
-        const auto id = static_cast<quint32>(next.answer);
-        if (id == 0)
-            return found;
-        if (ids.insert(id).second)
-            found.push_back({id, widen(next.bytes)});
-    }
-    DebugLog(L"The shell %ls names more than %d sub-plug-ins; the rest is left out", m_name, kMaxSubPlugins);
-    return found;
-}
-
-void VSTPlugin::closeEffects()
-{
-    std::vector<HandedOut> effects;
-    effects.swap(m_handedOut);
-    m_faulted |= m_effect.hasFaulted();
-    {
-        const TAutoLockCS lock(&processingLock());
-        m_effect = VSTEffect();
-    }
-    for (auto entry = effects.rbegin(); entry != effects.rend() && !m_faulted; ++entry) {
-        const bool isBracketed = m_closeBracket && entry->shellId != 0;
-        const std::shared_ptr<void> bracket = isBracketed ? m_closeBracket(entry->shellId) : nullptr;
-        entry->effect.dispatch(effClose);
-        m_faulted |= entry->effect.hasFaulted();
-    }
+    const TAutoLockCS lock(&processingLock()); // a thread of the plug-in may have its channels rebuilt
+    m_effect = effect;
+    m_effectOpened = m_canBypass = m_takesMidi = false;
+    m_needsIdle = m_wantsMidi = false; // of the effect before
+    m_speakers.setPending();
 }
 
 void VSTPlugin::unload()
 {
-    if (!m_loaded)
+    if (!m_module.isLoaded())
         return;
-    ProbeReport::stage(ProbeStage::Close);
     VSTPlugin::close();
-    closeEffects();
-    if (m_faulted)
-        m_library.leaveMapped(); // it may hold locks and own threads
-    else
-        m_library.freeUnlessRunning();
-    m_loaded = false;
-    m_faulted = false; // the next module is another
+    adopt(VSTEffect());
+    m_module.unload();
+}
+
+bool VSTPlugin::openPlugin(const AudioSettings &settings)
+{
+    if (!m_effect.isCallable()) {
+        DebugLog(L"%ls is not loaded and cannot be opened", name());
+        return false;
+    }
+    if (!m_effectOpened && !m_effect.dispatchAt(effOpen, 0, 0, nullptr))
+        return false;
+    m_effectOpened = true;
+    if (!applySettings(settings) || !m_effect.sendValue(vst::effSetEditKnobMode, kLinearKnobs))
+        return false;
+    m_takesMidi = canDo("receiveVstMidiEvent");
+    m_canBypass = canDo("bypass");
+    return m_effect.isCallable();
+}
+
+bool VSTPlugin::applySettings(const AudioSettings &settings)
+{
+    if (m_effect.isCallable())
+        m_effect.dispatchFloat(effSetSampleRate, static_cast<float>(settings.sampleRate));
+    return m_effect.sendValue(effSetBlockSize, settings.blockSize);
+}
+
+bool VSTPlugin::canDo(const char *capability)
+{
+    QByteArray text(capability); // a copy: a plug-in may write to it
+    return m_effect.isCallable() && static_cast<VstInt32>(m_effect.dispatch(effCanDo, text.data())) > 0;
+}
+
+bool VSTPlugin::startProcessing()
+{
+    return m_effect.sendValue(effMainsChanged, 1) && m_effect.send(effStartProcess);
+}
+
+void VSTPlugin::stopProcessing()
+{
+    m_effect.send(effStopProcess);
+    m_effect.sendValue(effMainsChanged, 0);
+}
+
+ChannelSetup VSTPlugin::readChannels()
+{
+    if (!isOpen())
+        return {}; // a plug-in may report changes before it is opened
+    const VSTEffect::Fields fields = m_effect.fields().value_or(VSTEffect::Fields{});
+    return {rangeOf(fields.numInputs), rangeOf(fields.numOutputs)};
+}
+
+bool VSTPlugin::bypassPlugin(bool bypassed)
+{
+    return m_canBypass && m_effect.sendValue(vst::effSetBypass, bypassed ? 1 : 0);
+}
+
+void VSTPlugin::close()
+{
+    m_editor.close();
+    AudioPlugin::close();
+}
+
+bool VSTPlugin::processEvents(VstEvents &events)
+{
+    if (!isOpen() || !m_effect.isCallable() || !(m_takesMidi || m_wantsMidi))
+        return false;
+    m_effect.dispatch(effProcessEvents, &events);
+    return true;
+}
+
+void VSTPlugin::setTotalSamples(qint64 samples)
+{
+    if (isOpen())
+        m_effect.sendValue(effSetTotalSampleToProcess, static_cast<VstIntPtr>(samples));
+}
+
+void VSTPlugin::idle()
+{
+    if (!isOpen() || !m_effect.isCallable())
+        return;
+    // A plug-in that asked once is called until it answers that it needs no more.
+    if (m_needsIdle.exchange(false) && m_effect.dispatch(vst::effIdle) != 0)
+        m_needsIdle = true;
+    m_editor.idle();
+}
+
+bool VSTPlugin::UpdateSpeakerArrangement(int inputs, int outputs, bool force)
+{
+    if (!isOpen() || !m_effect.isCallable())
+        return false;
+    if (!m_speakers.isDue() && !force)
+        return m_speakers.wasAccepted();
+    const bool accepted = m_speakers.tell({inputs, outputs}, processingLock());
+    const ChannelSetup known = channels();
+    const ChannelSetup now = readChannels();
+    if (now.inputs.span() != known.inputs.span() || now.outputs.span() != known.outputs.span())
+        rebuildChannels(); // it adapted to the speakers, and not every plug-in says so
+    return accepted;
+}
+
+bool VSTPlugin::StorePreset(PluginPreset &preset)
+{
+    showStatusWithLevel(MessageCode::kScanning, L"Storing %s Preset", name());
+    PluginPreset captured;
+    captured.identifier = identifier();
+    captured.name = name().toLatin1();
+    const bool goesOn = m_presets.capture(captured);
+    if (goesOn) {
+        storeSettings(captured);
+        preset = captured;
+    }
+    showStatusWithLevel(MessageCode::kCompleted, L"");
+    return goesOn && !captured.data.isEmpty();
+}
+
+bool VSTPlugin::LoadPreset(const PluginPreset &preset)
+{
+    showStatusWithLevel(MessageCode::kScanning, L"Loading %s Preset", name());
+    QStringList identifiers(identifier());
+    if (!m_requestedKey.isEmpty())
+        identifiers.append(identifierPrefix() + m_requestedKey);
+    const auto restore = [&] {
+        VSTHostContext &context = VSTHostContext::instance();
+        context.setIgnored(this); // what a plug-in tells about itself meanwhile is no news to anybody
+        const auto ignoring = qScopeGuard([&] { context.stopIgnoring(this); });
+        return m_presets.restore(preset, identifiers);
+    };
+    const bool loaded = restore();
+    if (loaded) {
+        loadSettings(preset);
+        tellListeners([this](IAudioPluginListener &listener) { listener.pluginChanged(*this); });
+    }
+    showStatusWithLevel(MessageCode::kCompleted, L"");
+    return loaded;
+}
+
+void VSTPlugin::ioChanged()
+{
+    m_speakers.setPending();
+    rebuildChannels();
+}
+
+bool VSTPlugin::resizeEditor(VstInt32 width, VstInt32 height)
+{
+    bool resized = false;
+    if (m_editor.isOpen())
+        tellListeners([&](IAudioPluginListener &listener) {
+            resized = listener.resizeEditor(*this, width, height) || resized;
+        });
+    return resized;
+}
+
+void VSTPlugin::parameterChanged(VstInt32 index, float value)
+{
+    tellListeners([&](IAudioPluginListener &listener) {
+        listener.parameterChanged(*this, static_cast<quint32>(index), static_cast<double>(value));
+    });
+}
+
+void VSTPlugin::parameterEdit(VstInt32 index, bool begins)
+{
+    tellListeners([&](IAudioPluginListener &listener) {
+        listener.parameterEdit(*this, static_cast<quint32>(index), begins);
+    });
+}
+
+void VSTPlugin::refreshDisplay()
+{
+    tellListeners([this](IAudioPluginListener &listener) { listener.displayChanged(*this); });
 }

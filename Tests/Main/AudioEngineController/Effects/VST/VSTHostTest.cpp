@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Tests/Support/CapturedLog.h"
@@ -46,7 +47,7 @@ TEST_F(VSTHostTest, LoadsByKey)
     list("ves Q10", "name \"Cut at the front\"");
     list("Broken", "answer entry null");
     const QString retrying = "Found an old Waves plug-in, retrying as:";
-    const QStringList failed{"Found: Broken, trying to load",
+    const QStringList failed{"Found: Broken, trying to load", "The VST plug-in's entry point returned null",
                              "VSTPlugin::Load - Failed to Load DLL: " + m_folder.plugins() + "/Broken" +
                                  vst2Ending(),
                              "Broken, Didn't manage it"};
@@ -75,7 +76,7 @@ TEST_F(VSTHostTest, LoadsByKey)
     const auto first = m_host.loadByKey("Comp");
     const auto second = m_host.loadByKey("Q10");
     const CapturedLog log;
-    m_host.logLoadedPlugins();
+    VSTHostContext::instance().logLoadedPlugins();
     EXPECT_EQ(log.lines(), QStringList({"VSTs ", "vst: Comp: ", "vst: Q10: "}));
 }
 

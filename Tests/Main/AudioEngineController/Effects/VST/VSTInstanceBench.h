@@ -1,7 +1,7 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/TestFolder.h"
@@ -29,7 +29,7 @@ protected:
     {
         EffectRecord record;
         record.path = addVST2File(m_folder.plugins(), file, tracing() + script);
-        auto plugin = std::make_unique<VSTPlugin>(m_host);
+        auto plugin = std::make_unique<VSTPlugin>();
         EXPECT_TRUE(plugin->load(record, VSTHostCallback, 0));
         takeTrace();
         return plugin;
@@ -44,5 +44,4 @@ protected:
 
     TestFolder m_folder;
     const CapturedLog m_log;
-    VSTHost m_host;
 };

@@ -66,7 +66,7 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
         {"start again", [&] { return plugin->start(); }, true, ""},
         {"too large a block", [&] { return plugin->process(65); }, false, ""},
         {"block", [&] { return plugin->process(64); }, true, "process: 64; host-14: 1"},
-        {"idle asked for", [&] { return plugin->idle(), plugin->needsIdle(); }, true, "opcode-53"},
+        {"idle asked for", [&] { return plugin->idle(), true; }, true, "opcode-53"},
         {"other settings",
          [&] {
              return plugin->setAudioSettings(AudioSettings{44100, 32});
@@ -77,14 +77,15 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
              return plugin->setAudioSettings(AudioSettings{0, 32});
          },
          false, ""},
-        {"program", [&] { return plugin->setProgram(0); }, true, "opcode-67; opcode-2; opcode-68"},
-        {"no such program", [&] { return plugin->setProgram(1); }, false, ""},
-        {"its name", [&] { return plugin->programName().isEmpty(); }, true, "opcode-5"},
+        {"program", [&] { return plugin->programs().set(0); }, true, "opcode-67; opcode-2; opcode-68"},
+        {"no such program", [&] { return plugin->programs().set(1); }, false, ""},
+        {"its name", [&] { return plugin->programs().name().isEmpty(); }, true, "opcode-5"},
         {"bypass", [&] { return plugin->setBypass(true); }, true, "opcode-44: 0 1"},
         {"no bypass", [&] { return plugin->setBypass(false); }, true, "opcode-44"},
         {"events", [&] { return plugin->processEvents(*events); }, true, "opcode-25"},
         {"total", [&] { return plugin->setTotalSamples(7), true; }, true, "opcode-73: 0 7"},
-        {"editor's size", [&] { return plugin->editorRect() == QRect(0, 0, 300, 200); }, true, "opcode-13"},
+        {"editor's size", [&] { return plugin->editor().rect() == QRect(0, 0, 300, 200); }, true,
+         "opcode-13"},
         {"editor", [&] { return plugin->openEditor(&window); }, true, "opcode-13; opcode-14"},
         {"idle", [&] { return plugin->idle(), true; }, true, "opcode-53; edit-idle"},
         {"close", [&] { return plugin->close(), true; }, true, "opcode-15; opcode-72; mains-changed"},
@@ -140,7 +141,7 @@ TEST_F(VSTInstance, ChannelsAreRebuiltWhenThePluginSaysSo)
         takeTrace();
         Listener listener([this] { return takeTrace(); });
         plugin->addListener(&listener);
-        EXPECT_TRUE(row.inBlock ? plugin->process(1) : plugin->setProgram(0));
+        EXPECT_TRUE(row.inBlock ? plugin->process(1) : plugin->programs().set(0));
         EXPECT_EQ(takeTrace(), row.rest);
         EXPECT_EQ(listener.heard.join(" / "), row.heard);
         plugin->removeListener(&listener);
@@ -183,15 +184,15 @@ TEST_F(VSTInstance, ListenersHearWhatThePluginTells)
     plugin->addListener(&listener);
     plugin->addListener(&listener);
     ASSERT_TRUE(plugin->open(kSettings));
-    plugin->programName();
+    plugin->programs().name();
     const QStringList heard = {"parameter 3 0.5", "edit 3 1", "edit 3 0", "display"};
     EXPECT_EQ(listener.heard, heard) << "each once, and no size without an editor";
     EXPECT_TRUE(plugin->openEditor(&listener));
     listener.heard.clear();
-    plugin->programName();
+    plugin->programs().name();
     EXPECT_EQ(listener.heard, heard + QStringList("size 640 480"));
     plugin->removeListener(&listener);
-    plugin->programName();
+    plugin->programs().name();
     EXPECT_EQ(listener.heard.size(), 5);
 }
 
@@ -227,7 +228,7 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
         SCOPED_TRACE(row.stage);
         auto plugin = loaded(QByteArray("name Comp\nfault ") + row.stage + " segv", row.stage);
         EXPECT_FALSE(plugin->open(kSettings) && plugin->start() && plugin->process(64));
-        EXPECT_FALSE(plugin->isRunning() || plugin->setProgram(0) || plugin->setBypass(true) ||
+        EXPECT_FALSE(plugin->isRunning() || plugin->programs().set(0) || plugin->setBypass(true) ||
                      plugin->start());
         plugin.reset();
         EXPECT_EQ(takeTrace(), row.calls);
@@ -235,7 +236,7 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
     }
     auto faulty = loaded("fault opcode-2 segv", "between blocks");
     EXPECT_TRUE(faulty->open(kSettings) && faulty->start());
-    EXPECT_FALSE(faulty->setProgram(0) || faulty->process(64) || faulty->isRunning());
+    EXPECT_FALSE(faulty->programs().set(0) || faulty->process(64) || faulty->isRunning());
     auto thrower = loaded("fault process throw-std");
     EXPECT_TRUE(thrower->open(kSettings) && thrower->start());
     EXPECT_FALSE(thrower->process(64) || thrower->isRunning());

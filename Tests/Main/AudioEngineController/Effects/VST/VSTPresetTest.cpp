@@ -112,7 +112,7 @@ TEST_F(VSTPreset, ParametersAreRestoredByName)
               "set-parameter: 1 1; set-parameter: 3 3; set-parameter: 0 4; "
               "set-parameter: 2 5; opcode-68");
     EXPECT_TRUE(m_log.contains("Comp does not take the parameter Z"));
-    EXPECT_FALSE(m_host.isIgnored(plugin.get()));
+    EXPECT_FALSE(VSTHostContext::instance().isIgnored(plugin.get()));
 }
 
 TEST_F(VSTPreset, WhatDoesNotBelongIsRefusedWithAReason)
@@ -129,7 +129,7 @@ TEST_F(VSTPreset, WhatDoesNotBelongIsRefusedWithAReason)
         {good, 0, "vst3:Comp:1000", "it is of vst3:"},
         {{}, 0, own, "it holds no data"},
         {good, 1, own, "no state of its own"},
-        {good, 2, own, "a kind that nobody knows"},
+        {good, 2, own, "of an unknown kind"},
         {changed(good, 0, 3), 0, own, "no parameter list"},
         {changed(good, 7, '\x7F'), 0, own, "144 bytes for 2130706434"},
         {good.left(8) + QByteArray(64, 'A') + good.mid(72), 0, own, "name of parameter 0 does not end"}};
@@ -188,5 +188,5 @@ TEST_F(VSTPreset, NamesOfParameters)
                                   "Overlong",
                                   "Param10"};
     for (int index = 0; index < expected.size(); ++index)
-        EXPECT_EQ(plugin->parameterName(index), expected[index]) << index;
+        EXPECT_EQ(plugin->parameters().name(index), expected[index]) << index;
 }

@@ -94,7 +94,7 @@ TEST_F(VSTSpeakers, AreReadyForTheChannelsOfAFormatOnly)
     QStringList types;
     testing::internal::CaptureStdout();
     for (int channels = -1; channels <= 37; ++channels)
-        if (const VSTSpeakerArrangement *ready = m_host.findArrangement(channels))
+        if (const VSTSpeakerArrangement *ready = VSTHostContext::instance().findArrangement(channels))
             types << QStringLiteral("%1:%2").arg(ready->numChannels).arg(ready->type);
     const std::string printed = testing::internal::GetCapturedStdout();
     EXPECT_EQ(types.join(' '), "1:0 2:1 3:6 4:11 5:14 6:15 7:18 8:22 9:-2 10:-2 11:-2 12:-2 "
@@ -142,5 +142,5 @@ TEST_F(VSTSpeakers, AreToldOnceAndAgainWhenTheChannelsChange)
     EXPECT_EQ(m_plugin->channels().outputs.span(), 4);
     EXPECT_EQ(m_log.count("Exception Caught in VST Plugin"), 1);
     EXPECT_EQ(vstFallbackArrangements(36, 36).size(), 1u) << "large layouts have only numbers";
-    EXPECT_FALSE(VSTPlugin(m_host).UpdateSpeakerArrangement(2, 2, true));
+    EXPECT_FALSE(VSTPlugin().UpdateSpeakerArrangement(2, 2, true));
 }

@@ -1,11 +1,10 @@
+#include "Main/AudioEngineController/Effects/VST/VSTSpeakerLink.h"
+
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 
 #include <algorithm>
 #include <cstdio>
-
-// What a plug-in is told about the speakers behind its channels.
 
 namespace {
 
@@ -16,41 +15,40 @@ constexpr VstInt32 kOwnLayoutChannels = 8;
 
 } // namespace
 
-bool VSTPlugin::UpdateSpeakerArrangement(int inputs, int outputs, bool force)
+bool VSTSpeakerLink::isDue() const { return m_pending || (m_toldCounts && *m_toldCounts != statedCounts()); }
+
+bool VSTSpeakerLink::tell(Counts requested, KriticalSection &processingLock)
 {
-    if (!isOpen() || !isCallable())
-        return false;
+    m_pending = false;
     const Counts stated = statedCounts();
-    const bool areNew = m_toldCounts && *m_toldCounts != stated;
-    if (!areNew && !m_speakersPending && !force)
-        return m_speakersAccepted;
-    m_speakersPending = false;
     m_toldCounts = stated;
-    const std::optional<Counts> counts = countsToTell({inputs, outputs}, stated);
-    m_speakersAccepted = counts && tellSpeakers(*counts);
-    m_speakersPending = false; // some report changed channels only because they were told
-    const ChannelSetup known = channels();
-    const ChannelSetup now = readChannels();
-    if (now.inputs.span() != known.inputs.span() || now.outputs.span() != known.outputs.span())
-        rebuildChannels(); // it adapted to the speakers, and not every plug-in says so
-    return m_speakersAccepted;
+    const std::optional<Counts> counts = countsToTell(requested, stated);
+    if (counts) {
+        const TAutoLockCS lock(&processingLock);
+        m_accepted = tellSpeakers(*counts);
+    } else {
+        m_accepted = false;
+    }
+    m_pending = false; // some report changed channels only because they were told
+    return m_accepted;
 }
 
-VSTPlugin::Counts VSTPlugin::statedCounts() const
+VSTSpeakerLink::Counts VSTSpeakerLink::statedCounts() const
 {
     const VSTEffect::Fields fields = m_effect.fields().value_or(VSTEffect::Fields{});
     return {fields.numInputs, fields.numOutputs};
 }
 
-std::optional<VSTPlugin::Counts> VSTPlugin::countsToTell(Counts requested, Counts stated) const
+std::optional<VSTSpeakerLink::Counts> VSTSpeakerLink::countsToTell(Counts requested, Counts stated) const
 {
     Counts used = requested;
-    if (m_name.contains(QLatin1String(kOwnLayoutMark)))
+    if (m_naming.name.contains(QLatin1String(kOwnLayoutMark)))
         used = {std::min(stated.inputs, kOwnLayoutChannels), std::min(stated.outputs, kOwnLayoutChannels)};
     // The parenthesis stays open: who reads these lines knows them so.
     std::printf("USA: %d,%d | %d,%d | (%d,%d\n", requested.inputs, requested.outputs, used.inputs,
                 used.outputs, stated.inputs, stated.outputs);
-    const Counts formats = {m_host.busFormatChannels(used.inputs), m_host.busFormatChannels(used.outputs)};
+    const VSTHostContext &context = VSTHostContext::instance();
+    const Counts formats = {context.busFormatChannels(used.inputs), context.busFormatChannels(used.outputs)};
     if (stated.outputs > stated.inputs && formats.outputs == stated.outputs)
         used.inputs = stated.inputs;
     else if (stated.outputs < stated.inputs && formats.inputs == stated.inputs)
@@ -58,11 +56,11 @@ std::optional<VSTPlugin::Counts> VSTPlugin::countsToTell(Counts requested, Count
     return formats.inputs == 0 ? std::nullopt : std::make_optional(used);
 }
 
-bool VSTPlugin::tellSpeakers(Counts counts)
+bool VSTSpeakerLink::tellSpeakers(Counts counts)
 {
-    const TAutoLockCS lock(&processingLock());
-    const VSTSpeakerArrangement *inputs = m_host.findArrangement(counts.inputs);
-    const VSTSpeakerArrangement *outputs = m_host.findArrangement(counts.outputs);
+    const VSTHostContext &context = VSTHostContext::instance();
+    const VSTSpeakerArrangement *inputs = context.findArrangement(counts.inputs);
+    const VSTSpeakerArrangement *outputs = context.findArrangement(counts.outputs);
     std::vector<VSTArrangementPair> offers = vstFallbackArrangements(counts.inputs, counts.outputs);
     if (inputs && outputs) {
         DebugTrace(L"VSTPlugin::UpdateSpeakerArrangement: Setting to: %d->%d", counts.inputs, counts.outputs);
@@ -77,7 +75,7 @@ bool VSTPlugin::tellSpeakers(Counts counts)
 }
 
 /// Whether the plug-in accepts the arrangements, of which it gets copies; nothing when the call failed.
-std::optional<bool> VSTPlugin::offer(VSTArrangementPair speakers)
+std::optional<bool> VSTSpeakerLink::offer(VSTArrangementPair speakers)
 {
     const auto answer = m_effect.dispatchAt(effSetSpeakerArrangement, 0,
                                             reinterpret_cast<VstIntPtr>(&speakers.first), &speakers.second);

@@ -1,0 +1,9 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
+
+/// Asks VST 2 modules. A shell is entered once for itself and once for each of its sub-plug-ins.
+class VSTProbe : public IPluginProbe {
+public:
+    ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) override;
+};

@@ -1,0 +1,151 @@
+#include "Main/AudioEngineController/Effects/VST/VSTProbe.h"
+
+#include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
+
+namespace {
+
+/// Notes what it hears, a word or two for each.
+struct Listener final : IProbeObserver {
+    void stageEntered(ProbeStage stage) override
+    {
+        const char *const names[] = {"load", "start", "ask", "close"};
+        heard << names[static_cast<int>(stage)];
+    }
+    void classBegins(const QString &) override { heard << "class"; }
+    void classAnnounced() override { heard << "announced"; }
+    void childrenFound(std::size_t count) override { heard << QString::number(count); }
+    void childBegins(const EffectRecord &child) override { heard << '<' + child.subName; }
+    void childEnds(const ProbeOutcome &outcome) override
+    {
+        EXPECT_EQ(outcome.records.size(), 1u);
+        EXPECT_EQ(outcome.records[0].working, outcome.status == ProbeStatus::Listed);
+        heard << '>' + outcome.reason;
+    }
+    void childCloses(const EffectRecord &child) override { heard << '(' + child.subName; }
+    void childClosed() override { heard << ")"; }
+
+    QStringList heard;
+};
+
+class VSTProbeTest : public VSTInstanceBench {
+protected:
+    ProbeOutcome probe(const QByteArray &script, const char *name = "Comp",
+                       VST2Fixture fixture = VST2Fixture::Scripted, std::set<quint32> leftOut = {})
+    {
+        ProbeJob job;
+        job.path = script.isNull() ? m_folder.path(name)
+                                   : addVST2File(m_folder.plugins(), name, tracing() + script, fixture);
+        job.fileTime = "2022-01-02 03:04";
+        job.leftOut = std::move(leftOut);
+        m_listener.heard.clear();
+        return VSTProbe().run(job, m_listener);
+    }
+
+    Listener m_listener;
+};
+
+} // namespace
+
+TEST_F(VSTProbeTest, OutcomesAreToldApart)
+{
+    const auto scripted = VST2Fixture::Scripted;
+    const char *const whole = "load start ask close";
+    const char *const notAnEffect = "its entry point returned something that is not a VST 2 effect";
+    const struct {
+        const char *name;
+        QByteArray script; // null: no such file
+        VST2Fixture fixture;
+        ProbeStatus status;
+        ProbeStage stage;
+        const char *reason, *heard;
+        bool hasFaulted = false, leftThreads = false;
+    } rows[] = {
+        {"good", "", scripted, ProbeStatus::Listed, ProbeStage::Close, "", whole},
+        {"no entry point", "", VST2Fixture::NoEntry, ProbeStatus::NoPlugin, ProbeStage::Load,
+         "it exports no VST 2 entry point", ""},
+        {"missing", {}, scripted, ProbeStatus::Failed, ProbeStage::Load, "it could not be loaded: ", "load"},
+        {"null", "answer entry null", scripted, ProbeStatus::Failed, ProbeStage::Start,
+         "its entry point returned null", "load start close"},
+        {"wrong magic", "magic 0x50747356", scripted, ProbeStatus::Failed, ProbeStage::Start, notAnEffect,
+         "load start close"},
+        {"no memory", "answer entry no-memory", scripted, ProbeStatus::Failed, ProbeStage::Start, notAnEffect,
+         "load start close"},
+        {"entry throws", "fault entry throw-int", scripted, ProbeStatus::Failed, ProbeStage::Start,
+         "its entry point threw something that is not a standard exception", "load start close"},
+        {"entry faults", "fault entry segv", scripted, ProbeStatus::Failed, ProbeStage::Start,
+         "its entry point failed: SE Exception: Access Violation", "load start close", true},
+        {"call throws", "fault get-vendor-string throw-std", scripted, ProbeStatus::Listed, ProbeStage::Close,
+         "", whole},
+        {"call faults", "fault get-vendor-string segv", scripted, ProbeStatus::Listed, ProbeStage::Close, "",
+         whole, true},
+        {"close faults", "fault close segv", scripted, ProbeStatus::Listed, ProbeStage::Close, "", whole,
+         true},
+        {"thread", "effect entry thread", scripted, ProbeStatus::Listed, ProbeStage::Close, "", whole, false,
+         true},
+        {"childless", "category 10", scripted, ProbeStatus::Failed, ProbeStage::Ask,
+         "it is a shell and lists no sub-plug-ins", whole}};
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.name);
+        const ProbeOutcome outcome = probe(row.script, row.name, row.fixture);
+        EXPECT_EQ(outcome.status, row.status);
+        EXPECT_EQ(outcome.stage, row.stage);
+        EXPECT_TRUE(outcome.reason.contains(row.reason)) << qPrintable(outcome.reason);
+        EXPECT_EQ(outcome.reason.isEmpty(), row.status == ProbeStatus::Listed);
+        EXPECT_EQ(m_listener.heard.join(' '), row.heard);
+        EXPECT_EQ(outcome.records.size(), row.status == ProbeStatus::Listed ? 1u : 0u);
+        EXPECT_EQ(outcome.faulted, row.hasFaulted);
+        EXPECT_EQ(outcome.leftThreads, row.leftThreads);
+        EXPECT_GT(outcome.milliseconds, 0);
+        EXPECT_FALSE(m_log.contains("VSTPlugin::Load")) << "that is said of known plug-ins";
+    }
+}
+
+TEST_F(VSTProbeTest, SubPluginsFailAndAreLeftOutOneByOne)
+{
+    const ProbeOutcome outcome =
+        probe("child 11 A\nchild 12 B\nchild 13 C\nchild 14 D\nchild 15 E\nanswer entry null B\n"
+              "fault entry throw-std D\n",
+              "Shell", VST2Fixture::Scripted, {13});
+    EXPECT_EQ(m_listener.heard.join(' '),
+              "load start ask 5 <A start ask > <B start >its entry point returned null "
+              "<D start close (A ) >its entry point threw: thrown by the fixture "
+              "<E load start ask > close (E )")
+        << "what throws is unloaded";
+    EXPECT_EQ(m_log.count("VSTPlugin::Load - Failed to Load DLL: "), 2);
+    QStringList records;
+    for (const EffectRecord &record : outcome.records)
+        records
+            << QStringLiteral("%1 %2 %3 %4").arg(record.subId).arg(record.name, record.subName, record.id) +
+                   (record.enabled ? "" : " off") + (record.working ? "" : " broken");
+    EXPECT_EQ(records, QStringList({"11 A A A:11", "12 B B  broken", "13 C C  off broken", "14 D D  broken",
+                                    "15 E E E:15"}));
+    EXPECT_EQ(outcome.records.back().fileTime, "2022-01-02 03:04");
+    EXPECT_TRUE(outcome.status == ProbeStatus::Listed && outcome.reason.isEmpty());
+}
+
+TEST_F(VSTProbeTest, WhoIsAskedForItsName)
+{
+    const struct {
+        const char *name, *file, *script, *expected;
+    } rows[] = {
+        {"instrument with inputs", "My Synth.x64", "name Told\ncategory 2", "My Synth"},
+        {"no inputs", "Caf\xC3\xA9", "name Told\ninputs 0", "Caf\xC3\xA9"},
+        {"negative inputs", "Comp", "name Told\ninputs -1", "Told"},
+        {"child without inputs", "Shell", "child 11 Told\ninputs 0", "Told"},
+        {"instrument child with inputs", "Shell", "child 11 Told\ncategory 2", "Told"},
+        {"child of a negative number", "Shell", "child -2 Told\ninputs 0", "Told"},
+        {"nothing told", "Comp.64.x", "name \"\"\nanswer get-effect-name 0", "Comp"},
+        {"an empty name told", "Comp", "name \"\"", ""},
+        {"a name told in spite of 0", "Comp", "name Told\nanswer get-effect-name 0", "Told"},
+        {"hidden file", ".Comp", "inputs 0", ""},
+        {"bytes are Latin-1", "Comp", "name \\xC9t\\xE9\\xFF\\x80", "\xC3\x89t\xC3\xA9\xC3\xBF\xC2\x80"}};
+    for (const auto &row : rows) {
+        const ProbeOutcome outcome = probe(row.script, row.file);
+        ASSERT_EQ(outcome.records.size(), 1u) << row.name;
+        EXPECT_EQ(outcome.records[0].name, row.expected) << row.name;
+    }
+    const QString name(1024, 'n'), vendor(256, 'v');
+    const EffectRecord read = probe(("name " + name + "\nvendor " + vendor).toUtf8()).records.at(0);
+    EXPECT_TRUE(read.name == name && read.vendor == vendor) << "texts end at the buffer";
+    EXPECT_EQ(read.id, name.left(255)) << "the key is cut";
+}
