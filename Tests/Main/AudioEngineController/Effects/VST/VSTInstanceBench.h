@@ -24,13 +24,17 @@ protected:
 
     /// The script's first statement.
     QByteArray tracing() const { return "trace \"" + m_folder.path("trace").toUtf8() + "\"\n"; }
-    /// A plug-in of that script, loaded; the calls of loading are forgotten.
-    std::unique_ptr<VSTPlugin> loaded(const QByteArray &script, const char *file = "Comp")
+    EffectRecord record(const char *file, const QByteArray &script)
     {
         EffectRecord record;
         record.path = addVST2File(m_folder.plugins(), file, tracing() + script);
+        return record;
+    }
+    /// A plug-in of that script, loaded; the calls of loading are forgotten.
+    std::unique_ptr<VSTPlugin> loaded(const QByteArray &script, const char *file = "Comp")
+    {
         auto plugin = std::make_unique<VSTPlugin>();
-        EXPECT_TRUE(plugin->load(record, VSTHostCallback, 0));
+        EXPECT_TRUE(plugin->load(record(file, script), VSTHostCallback, 0));
         takeTrace();
         return plugin;
     }

@@ -49,7 +49,7 @@ TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
                  {"flags 0x30\nparameter A", "kept", "FAILED"}, // no chunk
                  {"chunk a", {}, "FAILED"},                     // one byte is none
                  {"chunk abc\nanswer get-chunk -5", "kept", "FAILED"},
-                 {"chunk abc\nanswer get-chunk 2147483647", "kept", "FAILED"},
+                 {"chunk abc\nanswer get-chunk 2147483647", "kept", "FAILED"}, // more than there is
                  {"chunk abc\nnull-chunk", "kept", "FAILED"},
                  {"chunk abc\nfault get-chunk throw-int", "kept", "FAILED"},
                  {"chunk abc\nfault get-chunk segv", "kept", "FAILED"},
