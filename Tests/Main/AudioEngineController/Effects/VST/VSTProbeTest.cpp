@@ -29,9 +29,9 @@ struct Listener final : IProbeObserver {
 
 class VSTProbeTest : public VSTInstanceBench {
 protected:
-    ProbeOutcome probe(const QByteArray &script, const char *name = "Comp",
-                       VST2Fixture fixture = VST2Fixture::Scripted, std::set<quint32> leftOut = {})
+    ProbeOutcome probe(const QByteArray &script, const char *name = "Comp", std::set<quint32> leftOut = {})
     {
+        const auto fixture = QString(name) == "NoEntry" ? VST2Fixture::NoEntry : VST2Fixture::Scripted;
         ProbeJob job;
         job.path = script.isNull() ? m_folder.path(name)
                                    : addVST2File(m_folder.plugins(), name, tracing() + script, fixture);
@@ -48,45 +48,37 @@ protected:
 
 TEST_F(VSTProbeTest, OutcomesAreToldApart)
 {
-    const auto scripted = VST2Fixture::Scripted;
     const char *const whole = "load start ask close";
-    const char *const notAnEffect = "its entry point returned something that is not a VST 2 effect";
+    const char *const noEffect = "its entry point returned something that is not a VST 2 effect";
+    const char *const foreign = "its entry point threw something that is not a standard exception";
+    const char *const fault = "its entry point failed: SE Exception: Access Violation";
+    const auto listed = ProbeStatus::Listed, failed = ProbeStatus::Failed;
     const struct {
         const char *name;
         QByteArray script; // null: no such file
-        VST2Fixture fixture;
         ProbeStatus status;
         ProbeStage stage;
         const char *reason, *heard;
         bool hasFaulted = false, leftThreads = false;
     } rows[] = {
-        {"good", "", scripted, ProbeStatus::Listed, ProbeStage::Close, "", whole},
-        {"no entry point", "", VST2Fixture::NoEntry, ProbeStatus::NoPlugin, ProbeStage::Load,
-         "it exports no VST 2 entry point", ""},
-        {"missing", {}, scripted, ProbeStatus::Failed, ProbeStage::Load, "it could not be loaded: ", "load"},
-        {"null", "answer entry null", scripted, ProbeStatus::Failed, ProbeStage::Start,
-         "its entry point returned null", "load start close"},
-        {"wrong magic", "magic 0x50747356", scripted, ProbeStatus::Failed, ProbeStage::Start, notAnEffect,
+        {"good", "", listed, ProbeStage::Close, "", whole},
+        {"NoEntry", "", ProbeStatus::NoPlugin, ProbeStage::Load, "it exports no VST 2 entry point", ""},
+        {"missing", {}, failed, ProbeStage::Load, "it could not be loaded: ", "load"},
+        {"null", "answer entry null", failed, ProbeStage::Start, "its entry point returned null",
          "load start close"},
-        {"no memory", "answer entry no-memory", scripted, ProbeStatus::Failed, ProbeStage::Start, notAnEffect,
-         "load start close"},
-        {"entry throws", "fault entry throw-int", scripted, ProbeStatus::Failed, ProbeStage::Start,
-         "its entry point threw something that is not a standard exception", "load start close"},
-        {"entry faults", "fault entry segv", scripted, ProbeStatus::Failed, ProbeStage::Start,
-         "its entry point failed: SE Exception: Access Violation", "load start close", true},
-        {"call throws", "fault get-vendor-string throw-std", scripted, ProbeStatus::Listed, ProbeStage::Close,
-         "", whole},
-        {"call faults", "fault get-vendor-string segv", scripted, ProbeStatus::Listed, ProbeStage::Close, "",
-         whole, true},
-        {"close faults", "fault close segv", scripted, ProbeStatus::Listed, ProbeStage::Close, "", whole,
-         true},
-        {"thread", "effect entry thread", scripted, ProbeStatus::Listed, ProbeStage::Close, "", whole, false,
-         true},
-        {"childless", "category 10", scripted, ProbeStatus::Failed, ProbeStage::Ask,
-         "it is a shell and lists no sub-plug-ins", whole}};
+        {"wrong magic", "magic 1", failed, ProbeStage::Start, noEffect, "load start close"},
+        {"no memory", "answer entry no-memory", failed, ProbeStage::Start, noEffect, "load start close"},
+        {"entry throws", "fault entry throw-int", failed, ProbeStage::Start, foreign, "load start close"},
+        {"entry faults", "fault entry segv", failed, ProbeStage::Start, fault, "load start close", true},
+        {"call throws", "fault get-vendor-string throw-std", listed, ProbeStage::Close, "", whole},
+        {"call faults", "fault get-vendor-string segv", listed, ProbeStage::Close, "", whole, true},
+        {"close faults", "fault close segv", listed, ProbeStage::Close, "", whole, true},
+        {"thread", "effect entry thread", listed, ProbeStage::Close, "", whole, false, true},
+        {"childless", "category 10", failed, ProbeStage::Ask, "it is a shell and lists no sub-plug-ins",
+         whole}};
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
-        const ProbeOutcome outcome = probe(row.script, row.name, row.fixture);
+        const ProbeOutcome outcome = probe(row.script, row.name);
         EXPECT_EQ(outcome.status, row.status);
         EXPECT_EQ(outcome.stage, row.stage);
         EXPECT_TRUE(outcome.reason.contains(row.reason)) << qPrintable(outcome.reason);
@@ -105,7 +97,7 @@ TEST_F(VSTProbeTest, SubPluginsFailAndAreLeftOutOneByOne)
     const ProbeOutcome outcome =
         probe("child 11 A\nchild 12 B\nchild 13 C\nchild 14 D\nchild 15 E\nanswer entry null B\n"
               "fault entry throw-std D\n",
-              "Shell", VST2Fixture::Scripted, {13});
+              "Shell", {13});
     EXPECT_EQ(m_listener.heard.join(' '),
               "load start ask 5 <A start ask > <B start >its entry point returned null "
               "<D start close (A ) >its entry point threw: thrown by the fixture "
@@ -126,23 +118,20 @@ TEST_F(VSTProbeTest, SubPluginsFailAndAreLeftOutOneByOne)
 TEST_F(VSTProbeTest, WhoIsAskedForItsName)
 {
     const struct {
-        const char *name, *file, *script, *expected;
-    } rows[] = {
-        {"instrument with inputs", "My Synth.x64", "name Told\ncategory 2", "My Synth"},
-        {"no inputs", "Caf\xC3\xA9", "name Told\ninputs 0", "Caf\xC3\xA9"},
-        {"negative inputs", "Comp", "name Told\ninputs -1", "Told"},
-        {"child without inputs", "Shell", "child 11 Told\ninputs 0", "Told"},
-        {"instrument child with inputs", "Shell", "child 11 Told\ncategory 2", "Told"},
-        {"child of a negative number", "Shell", "child -2 Told\ninputs 0", "Told"},
-        {"nothing told", "Comp.64.x", "name \"\"\nanswer get-effect-name 0", "Comp"},
-        {"an empty name told", "Comp", "name \"\"", ""},
-        {"a name told in spite of 0", "Comp", "name Told\nanswer get-effect-name 0", "Told"},
-        {"hidden file", ".Comp", "inputs 0", ""},
-        {"bytes are Latin-1", "Comp", "name \\xC9t\\xE9\\xFF\\x80", "\xC3\x89t\xC3\xA9\xC3\xBF\xC2\x80"}};
+        const char *file, *script, *expected;
+    } rows[] = {{"My Synth.x64", "name Told\ncategory 2", "My Synth"}, // an instrument with inputs
+                {"Caf\xC3\xA9", "name Told\ninputs 0", "Caf\xC3\xA9"},
+                {"Comp", "name Told\ninputs -1", "Told"},
+                {"Shell", "child 11 Told\ninputs 0", "Told"},
+                {"Shell", "child -2 Told\ncategory 2", "Told"},
+                {"Comp.64.x", "name \"\"\nanswer get-effect-name 0", "Comp"},
+                {"Comp", "name \"\"", ""},
+                {"Comp", "name Told\nanswer get-effect-name 0", "Told"},
+                {".Comp", "inputs 0", ""}};
     for (const auto &row : rows) {
         const ProbeOutcome outcome = probe(row.script, row.file);
-        ASSERT_EQ(outcome.records.size(), 1u) << row.name;
-        EXPECT_EQ(outcome.records[0].name, row.expected) << row.name;
+        ASSERT_EQ(outcome.records.size(), 1u) << row.script;
+        EXPECT_EQ(outcome.records[0].name, row.expected) << row.script;
     }
     const QString name(1024, 'n'), vendor(256, 'v');
     const EffectRecord read = probe(("name " + name + "\nvendor " + vendor).toUtf8()).records.at(0);
