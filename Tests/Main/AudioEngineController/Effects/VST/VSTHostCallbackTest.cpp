@@ -18,19 +18,15 @@ namespace {
 
 VSTHostContext &context() { return VSTHostContext::instance(); }
 
-/// Calls of the host that an effect still has to make, each in the idle call that answers the one before.
-thread_local int t_callsToNest = 0;
-/// What the innermost of them was answered.
-thread_local VstIntPtr t_innermostAnswer = -1;
+/// What an idle call of the effect was answered by the host, which it asks inside of it.
+thread_local VstIntPtr t_answerInIdle = -1;
 
 VstIntPtr answerIdle(AEffect *effect, int opcode, int index, VstIntPtr value, void *ptr, float opt)
 {
     EXPECT_EQ(opcode, VstPublished::effEditIdle);
     EXPECT_TRUE(index == 0 && value == 0 && ptr == nullptr && opt == 0.0f);
-    if (--t_callsToNest > 0)
-        return VSTHostCallback(effect, VstPublished::audioMasterIdle, 0, 0, nullptr, 0);
-    t_innermostAnswer = VSTHostCallback(effect, audioMasterVersion, 0, 0, nullptr, 0);
-    return 0;
+    t_answerInIdle = VSTHostCallback(effect, audioMasterVersion, 0, 0, nullptr, 0);
+    return 5;
 }
 
 /// A registered owner with its effect, which notes what it hears.
@@ -83,17 +79,7 @@ protected:
     static VstIntPtr call(AEffect *effect, VstInt32 opcode, VstInt32 index = 0, VstIntPtr value = 0,
                           void *ptr = nullptr)
     {
-        t_callsToNest = 1;
         return VSTHostCallback(effect, opcode, index, value, ptr, 0.5f);
-    }
-    /// The answer to the innermost of so many active calls of one thread.
-    static VstIntPtr answerAtDepth(int depth)
-    {
-        AEffect effect = {};
-        effect.dispatcher = answerIdle;
-        t_callsToNest = depth - 1;
-        VSTHostCallback(&effect, VstPublished::audioMasterIdle, 0, 0, nullptr, 0);
-        return t_innermostAnswer;
     }
 
     const CapturedLog m_log;
@@ -211,20 +197,12 @@ TEST_F(VSTHostCallbackTest, SettingsAndOwnersAreAskedAtEachCall)
     for (AEffect *effect : m_askers)
         EXPECT_EQ(call(effect, audioMasterGetCurrentProcessLevel), effect == &m_owner.effect ? 2 : 1);
     debugLogSettings().trace = true;
-    Owner loading(11);
-    const struct {
-        Owner *loading;
-        AEffect *effect;
-        VstIntPtr answer;
-    } rows[] = {{nullptr, nullptr, 0},
-                {nullptr, &m_strange, 0},
-                {nullptr, &m_owner.effect, -0x7FFFFFFF}, // sign-extended
-                {&loading, nullptr, 11},
-                {&loading, &m_owner.effect, 11},
-                {&m_ignored, &m_owner.effect, 0}}; // one without an identifier is loaded
-    for (const auto &row : rows) {
-        context().setOwnerBeingLoaded(row.loading);
-        EXPECT_EQ(call(row.effect, audioMasterCurrentId), row.answer) << &row - rows;
+    for (AEffect *effect : m_askers) // sign-extended
+        EXPECT_EQ(call(effect, audioMasterCurrentId), effect == &m_owner.effect ? -0x7FFFFFFF : 0);
+    for (Owner *loading : {&m_owner, &m_ignored}) {
+        context().setOwnerBeingLoaded(loading);
+        for (AEffect *effect : m_askers)
+            EXPECT_EQ(call(effect, audioMasterCurrentId), loading->shell);
     }
     context().setOwnerBeingLoaded(nullptr);
     EXPECT_EQ(m_log.count("returned"), 0) << "it has no such line";
@@ -232,17 +210,8 @@ TEST_F(VSTHostCallbackTest, SettingsAndOwnersAreAskedAtEachCall)
 
 TEST_F(VSTHostCallbackTest, TheEleventhNestedCallOfAThreadIsRefused)
 {
-    EXPECT_EQ(answerAtDepth(10), 2400);
-    EXPECT_EQ(m_log.lines(), QStringList());
-    EXPECT_EQ(answerAtDepth(11), 0);
-    EXPECT_EQ(m_log.lines(), QStringList("VSTHost::HostCallback: Exceeded max Reentrancy: 11 of 10"));
-    EXPECT_EQ(answerAtDepth(10), 2400) << "a refusal leaves nothing behind";
-    VSTCallbackNesting::setActive(10);
-    VstIntPtr answer = 0;
-    std::thread([&answer] { answer = answerAtDepth(10); }).join();
-    EXPECT_EQ(answer, 2400);
     const struct {
-        std::int32_t before;
+        std::int32_t before; ///< active calls
         VstIntPtr answer;
         std::int32_t after;
     } rows[] = {{9, 2400, 9}, {10, 0, 10}, {4094, 0, 4094}, {4095, 2400, -1}, {-1, 2400, -1}, {-3, 0, -3}};
@@ -251,4 +220,11 @@ TEST_F(VSTHostCallbackTest, TheEleventhNestedCallOfAThreadIsRefused)
         EXPECT_EQ(call(nullptr, audioMasterVersion), row.answer) << row.before;
         EXPECT_EQ(VSTCallbackNesting::active(), row.after) << row.before;
     }
+    EXPECT_EQ(m_log.lines().first(), "VSTHost::HostCallback: Exceeded max Reentrancy: 11 of 10");
+    for (const int before : {8, 9}) {
+        VSTCallbackNesting::setActive(before);
+        EXPECT_EQ(call(&m_owner.effect, VstPublished::audioMasterIdle), 0);
+        EXPECT_EQ(t_answerInIdle, before == 8 ? 2400 : 0);
+    }
+    std::thread([this] { EXPECT_EQ(call(nullptr, audioMasterVersion), 2400); }).join();
 }

@@ -81,22 +81,18 @@ TEST_F(VSTHostTest, LoadsByKey)
 TEST_F(VSTHostTest, ARefreshCleansNamesUp)
 {
     QByteArray text;
-    for (const auto &[id, name] :
-         {std::pair("A", "Comp [2.4]"), {"B", "EQ [2.4] old [2.4]"}, {"C", "Gate[2.4]"}, {"D", "Comp"}})
-        text += QByteArray("<Effect><Path>/fx/") + id + ".so</Path><Name>" + name + "</Name><ID>" + id +
+    for (const char *name : {"Comp [2.4]", "EQ [2.4] old [2.4]", "Gate[2.4]", "Comp"})
+        text += QByteArray("<Effect><Path>/fx/D.so</Path><Name>") + name + "</Name><ID>" + name +
                 "</ID></Effect>";
     m_folder.write("Effects/FXConfiguration.xml", "<Effects version=\"1.4\">" + text + "</Effects>");
-    m_host.ReadCatalogue();
-    EXPECT_TRUE(m_host.Scan(false, true));
-    QStringList names;
-    for (const EffectRecord &record : m_host.effects())
-        names.append(record.name);
-    EXPECT_EQ(names, QStringList({"Comp", "EQ", "Gate[2.4]", "D"})) << "no name twice";
-    const QByteArray written = m_folder.catalogue("FXConfiguration.xml");
-    EXPECT_TRUE(written.contains("<Name>EQ</Name>"));
-    m_host.ReadCatalogue();
-    EXPECT_FALSE(m_host.Scan(false, true)) << "clean now";
-    EXPECT_EQ(m_folder.catalogue("FXConfiguration.xml"), written);
+    for (const bool isFirst : {true, false}) {
+        m_host.ReadCatalogue();
+        EXPECT_EQ(m_host.Scan(false, true), isFirst) << "clean afterwards";
+        QStringList names;
+        for (const EffectRecord &record : m_host.effects())
+            names.append(record.name);
+        EXPECT_EQ(names, QStringList({"Comp", "D", "EQ", "Gate[2.4]"})) << "no name twice";
+    }
 }
 
 TEST_F(VSTHostTest, AShellLeavesTheProgressToTheFilesAgain)

@@ -137,7 +137,7 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
                          "ask-host process 14\nanswer opcode-53 1\n");
     const auto events = std::make_unique<VstEvents>();
     int window = 0;
-    const auto settings = [&](int rate) { return plugin->setAudioSettings(AudioSettings{rate, 32}); };
+    const AudioSettings other{44100, 32};
     const struct {
         const char *name;
         std::function<bool()> operation;
@@ -146,24 +146,19 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
     } steps[] = {
         {"start unopened", [&] { return plugin->start(); }, false, ""},
         {"open", [&] { return plugin->open(kSettings); }, true, kOpened},
-        {"process unstarted", [&] { return plugin->process(1); }, false, ""},
         {"start", [&] { return plugin->start(); }, true, "mains-changed: 0 1; opcode-71"},
         {"too large a block", [&] { return plugin->process(65); }, false, ""},
         {"block", [&] { return plugin->process(64); }, true, "process: 64; host-14: 1"},
         {"idle asked for", [&] { return plugin->idle(), true; }, true, "opcode-53"},
-        {"other settings", [&] { return settings(44100); }, true,
+        {"other settings", [&] { return plugin->setAudioSettings(other); }, true,
          "opcode-72; mains-changed; opcode-10: 44100; opcode-11: 0 32; mains-changed: 0 1; opcode-71"},
-        {"no settings", [&] { return settings(0); }, false, ""},
         {"program", [&] { return plugin->programs().set(0); }, true, "opcode-67; opcode-2; opcode-68"},
-        {"no such program", [&] { return plugin->programs().set(1); }, false, ""},
         {"its name", [&] { return plugin->programs().name().isEmpty(); }, true, "opcode-5"},
         {"bypass", [&] { return plugin->setBypass(true); }, true, "opcode-44: 0 1"},
         {"events", [&] { return plugin->processEvents(*events); }, true, "opcode-25"},
-        {"total", [&] { return plugin->setTotalSamples(7), true; }, true, "opcode-73: 0 7"},
         {"editor's size", [&] { return plugin->editor().rect() == QRect(0, 0, 300, 200); }, true,
          "opcode-13"},
         {"editor", [&] { return plugin->openEditor(&window); }, true, "opcode-13; opcode-14"},
-        {"idle", [&] { return plugin->idle(), true; }, true, "opcode-53; edit-idle"},
         {"close", [&] { return plugin->close(), true; }, true, "opcode-15; opcode-72; mains-changed"},
         {"open again", [&] { return plugin->open(kSettings) && plugin->start(); }, true,
          QString(kOpened).remove("open; ") + "; opcode-44: 0 1; mains-changed: 0 1; opcode-71"},
@@ -205,9 +200,6 @@ TEST_F(VSTInstance, ChannelsAreRebuiltWhenThePluginSaysSo)
     } rows[] = {
         {"in a block: after it", "new-outputs process 5\nask-host process 13", true,
          "process: 1; host-13: 0; opcode-72; mains-changed | 5 outputs", "mains-changed: 0 1; opcode-71"},
-        {"on another thread", "new-outputs opcode-2 5\nask-host opcode-2 13 from-thread", false,
-         "opcode-67; opcode-2; opcode-72; mains-changed | 5 outputs",
-         "mains-changed: 0 1; opcode-71; host-13: 0; opcode-68"},
         {"again while it is stopped for that",
          "new-outputs opcode-2 5\nask-host opcode-2 13\nask-host opcode-72 13", false,
          "opcode-67; opcode-2; opcode-72 | 5 outputs / host-13: 0; mains-changed | 5 outputs",
@@ -265,7 +257,6 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
         QString calls; // from the opening to the end of the object
         const char *line;
     } rows[] = {{"open", "open", "VST plug-in call 0: SE Exception: Access Violation"},
-                {"opcode-71", kOpened + "; mains-changed: 0 1; opcode-71", ""},
                 {"process", kOpened + "; mains-changed: 0 1; opcode-71; process: 64",
                  "Exception Caught in VST Plugin"}};
     for (const auto &row : rows) {
@@ -279,7 +270,6 @@ TEST_F(VSTInstance, AFaultEndsTheUse)
         EXPECT_TRUE(m_log.contains(row.line));
     }
     auto thrower = loaded("fault process throw-std");
-    EXPECT_TRUE(thrower->open(kSettings) && thrower->start());
-    EXPECT_FALSE(thrower->process(64) || thrower->isRunning());
-    EXPECT_TRUE(thrower->start()) << "what throws is as it was";
+    EXPECT_TRUE(thrower->open(kSettings) && thrower->start() && !thrower->process(64) && thrower->start())
+        << "what throws is as it was";
 }
