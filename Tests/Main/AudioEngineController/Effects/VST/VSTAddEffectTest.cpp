@@ -10,9 +10,7 @@ TEST(WaveShellVersion, IsReadFromNamesOfTheOnePattern)
 {
     const std::pair<const char *, double> rows[] = {
         {"WaveShell10-VST 10.25_x64", 10.25}, {"WaveShell1-VST 12_x64", 12.0},
-        {"WaveShell1-VST 9.3", 0.0},          {"WaveShell1-VST 9,3_x64", 0.0},
-        {"WaveShell1-VST nan_x64", 0.0},      {"WaveShell-VST 9.3_x64", 0.0},
-        {"waveshell1-VST 9.3_x64", 0.0},      {"WaveShell1-VST3 9.3_x64", 0.0},
+        {"WaveShell1-VST 9,3_x64", 0.0},      {"WaveShell1-VST nan_x64", 0.0},
         {"My WaveShell1-VST 9.3_x64", 0.0},   {"WaveShell1-VST 9.3_x64 copy", 0.0}};
     for (const auto &[name, version] : rows)
         EXPECT_EQ(waveShellVersion(name + VSTModuleFile::ending()), version) << name;

@@ -116,6 +116,12 @@ TEST_F(VSTSpeakers, AreToldOnceAndAgainWhenTheChannelsChange)
     for (const Step &step : steps)
         take(step);
     EXPECT_EQ(m_plugin->channels().outputs.span(), 4);
+    m_plugin.reset();
+    take({"will say that they changed", "ask-host opcode-2 13", 2, 2, false, true, stereo,
+          "2,2 | 2,2 | (2,2"});
+    EXPECT_TRUE(m_plugin->programs().set(0));
+    takeTrace();
+    take({"said so", nullptr, 2, 2, false, true, stereo, "2,2 | 2,2 | (2,2"});
     EXPECT_EQ(m_log.count("Exception Caught in VST Plugin"), 1);
     EXPECT_EQ(vstFallbackArrangements(36, 36).size(), 1u) << "large layouts have only numbers";
     EXPECT_FALSE(VSTPlugin().UpdateSpeakerArrangement(2, 2, true));
