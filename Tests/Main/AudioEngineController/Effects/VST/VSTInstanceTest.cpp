@@ -159,6 +159,8 @@ TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
         {"editor's size", [&] { return plugin->editor().rect() == QRect(0, 0, 300, 200); }, true,
          "opcode-13"},
         {"editor", [&] { return plugin->openEditor(&window); }, true, "opcode-13; opcode-14"},
+        {"idle", [&] { return plugin->idle(), true; }, true, "opcode-53; edit-idle"},
+        {"total", [&] { return plugin->setTotalSamples(7), true; }, true, "opcode-73: 0 7"},
         {"close", [&] { return plugin->close(), true; }, true, "opcode-15; opcode-72; mains-changed"},
         {"open again", [&] { return plugin->open(kSettings) && plugin->start(); }, true,
          QString(kOpened).remove("open; ") + "; opcode-44: 0 1; mains-changed: 0 1; opcode-71"},
