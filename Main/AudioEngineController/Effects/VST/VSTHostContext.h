@@ -51,7 +51,7 @@ public:
     bool withOwner(const AEffect *effect, Operation &&operation)
     {
         auto *owner = effect ? reinterpret_cast<IVSTEffectOwner *>(effect->resvd1) : nullptr;
-        if (!pin(owner))
+        if (!owner || !pin(owner))
             return false;
         const auto pinned = qScopeGuard([&] { unpin(owner); }); // also when the thread is ended in it
         operation(*owner);

@@ -226,5 +226,5 @@ TEST_F(VSTHostCallbackTest, TheEleventhNestedCallOfAThreadIsRefused)
         EXPECT_EQ(call(&m_owner.effect, VstPublished::audioMasterIdle), 0);
         EXPECT_EQ(t_answerInIdle, before == 8 ? 2400 : 0);
     }
-    std::thread([this] { EXPECT_EQ(call(nullptr, audioMasterVersion), 2400); }).join();
+    std::thread([] { EXPECT_EQ(call(nullptr, audioMasterVersion), 2400); }).join();
 }
