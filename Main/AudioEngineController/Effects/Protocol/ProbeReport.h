@@ -2,7 +2,7 @@
 
 #include "Core/BaseLib/Files/TextFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
-#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeStage.h"
 
 #include <QElapsedTimer>
 #include <QString>
