@@ -111,7 +111,7 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
         {"Throw2", false, "fault entry throw-std\n", "failed", "thrown by the fixture"},
         {"Refuse3", true, "answer initialize false\n", "failed", "could not be initialised (result 0x"},
         {"Start3", true, "answer module-entry false\n", "failed", "could not start"},
-        {"Factory3", true, "answer get-factory null\n", "", "it gives no plug-in factory"},
+        {"Factory3", true, "answer get-factory null\n", "", "GetPluginFactory returned null"},
     };
     for (const auto &row : rows)
         row.isVst3 ? addVst3(row.name, row.script) : addVst2(row.name, row.script);

@@ -8,5 +8,5 @@
 
 QString classIdText(const Steinberg::FUID &classId);
 
-/// The class id that an identifier spells, in capitals or not; an invalid one when it is none.
+/// The class id that an identifier spells, in upper or lower case; an invalid one for any other text.
 Steinberg::FUID classIdOf(const QString &identifier);

@@ -4,6 +4,7 @@
 #include "Main/AudioEngineController/Effects/Host/ProbeBracket.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Probe.h"
 #include "Main/VLib/SimpleGUI.h"
 
 #include <algorithm>
@@ -37,6 +38,30 @@ bool isOutdated(const EffectRecord &first, const QString &fileTime)
 {
     return first.enabled && first.fileTime != fileTime;
 }
+
+/// Passes on how a probe gets on: to the marker, the report and the user interface.
+class ScanObserver : public IProbeObserver {
+public:
+    explicit ScanObserver(const ProbeBracket &bracket)
+        : m_bracket(bracket)
+    {}
+
+    void stageEntered(ProbeStage stage) override { ProbeReport::stage(stage); }
+    void classBegins(const QString &name) override
+    {
+        m_bracket.showProgress();
+        showScanning(name);
+    }
+    void classAnnounced() override { notifyUI(MessageCode::kEntryAdded); }
+    void childrenFound(std::size_t) override {}
+    void childBegins(const EffectRecord &) override {}
+    void childEnds(const ProbeOutcome &) override {}
+    void childCloses(const EffectRecord &) override {}
+    void childClosed() override {}
+
+private:
+    const ProbeBracket &m_bracket;
+};
 
 } // namespace
 
@@ -97,33 +122,31 @@ bool VST3FolderScan::process(const ScanItem &item)
     ProbeEntry entry(format(), file);
     const ProbeBracket bracket(host(), processState(), file);
     DebugTrace(L"Probing %ls", item.path);
-    VST3Plugin plugin; // unloads its module before the bracket deletes the marker
-    plugin.setClassObserver([&bracket] { bracket.showProgress(); });
-    ClassListing records;
-    bool factoryFound = true;
-    const bool isNew = item.knownRecords.empty();
-    plugin.listClasses(records, item.path, isNew, factoryFound);
-    entry.listed(records.size());
-    if (!records.empty())
-        return addRecords(item, file, records);
-    if (factoryFound && !item.path.contains(QLatin1String("WaveShell")))
+    ScanObserver observer(bracket);
+    const ProbeJob job{PluginFormat::Vst3, item.path, item.fileTime, {}, item.knownRecords.empty()};
+    ProbeOutcome outcome = VST3Probe().run(job, observer);
+    if (!outcome.reason.isEmpty()) {
+        DebugLog(L"%ls: %ls", item.path, outcome.reason);
+        ProbeReport::reason(outcome.reason);
+    }
+    entry.listed(outcome.records.size());
+    if (!outcome.records.empty())
+        return addRecords(item, outcome.records);
+    if (outcome.ifFailed == ProbeOutcome::IfFailed::Record)
         return addFailedRecord(item, file);
-    // Tried again next time; until then a shell that listed something once keeps its records and their marks.
-    if (factoryFound)
+    if (outcome.ifFailed == ProbeOutcome::IfFailed::KeepKnown)
         for (const EffectRecord &record : item.knownRecords)
             host().AddEffect(record);
     return false;
 }
 
-bool VST3FolderScan::addRecords(const ScanItem &item, const EffectRecord &file, ClassListing &records)
+bool VST3FolderScan::addRecords(const ScanItem &item, std::vector<EffectRecord> &records)
 {
     const bool announceFirst = records.size() >= kMany || itemCount() >= kMany;
     if (announceFirst)
         notifyUI(MessageCode::kEntryAdded);
     bool added = false;
     for (EffectRecord &record : records) {
-        record.path = file.path;
-        record.fileTime = file.fileTime;
         carryMarks(item.knownRecords, record);
         added |= host().AddEffect(record);
     }

@@ -1,7 +1,6 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Host/FolderScan.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 
 /// One scan for VST 3 modules.
 class VST3FolderScan : public FolderScan {
@@ -16,7 +15,7 @@ protected:
 private:
     void decide(const QString &path, std::vector<ScanItem> &queue);
     void keepLater(const KnownList::Records &records);
-    bool addRecords(const ScanItem &item, const EffectRecord &file, ClassListing &records);
+    bool addRecords(const ScanItem &item, std::vector<EffectRecord> &records);
     bool addFailedRecord(const ScanItem &item, EffectRecord record);
 
     KnownList::Records m_keptByName; ///< records of other files, added when those files had their turn

@@ -4,8 +4,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3FolderScan.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
-
-#include <exception>
+#include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 
 VST3Host::VST3Host()
     : AudioPluginHost(&vst3CatalogueFormat())
@@ -25,15 +24,12 @@ LoadedPlugin VST3Host::loadPlugin(const QString &identifier)
         DebugLog(L"%ls is switched off and not loaded", record->name);
         return {true, nullptr};
     }
-    // Outlives what is thrown, whose code the module holds.
-    auto plugin = std::make_unique<VST3Plugin>();
+    auto plugin = std::make_unique<VST3Plugin>(); // outlives what is thrown, whose code the module holds
     try {
         if (plugin->openClass(*record))
             return {true, std::move(plugin)};
-    } catch (const std::exception &error) {
-        DebugLog(L"%ls: the plug-in threw: %s", record->name, error.what());
     } catch (...) {
-        DebugLog(L"%ls: the plug-in threw something that is no standard exception", record->name);
+        DebugLog(L"%ls: when it was loaded, %ls", record->name, thrownText());
     }
     DebugLog(L"%ls (%ls) could not be loaded", record->name, identifier);
     return {true, nullptr};

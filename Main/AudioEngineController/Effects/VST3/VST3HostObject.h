@@ -112,7 +112,7 @@ public:
     Steinberg::uint32 PLUGIN_API addRef() override { return m_references.add(); }
     /// Never deletes an object that its owner still holds.
     Steinberg::uint32 PLUGIN_API release() override { return settle(m_references.drop()); }
-    /// The owner's farewell; `VST3Owned` calls it.
+    /// Gives the owner's reference back; `VST3Owned` calls it.
     void letGo() noexcept { settle(m_references.dropOwner()); }
 
     /// The object under the interface that names it, which several tables would leave ambiguous.

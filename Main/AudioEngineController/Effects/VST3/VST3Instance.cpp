@@ -1,11 +1,8 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Instance.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Core/BaseLib/Process/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3State.h"
-
-#include <exception>
 
 using namespace Steinberg;
 
@@ -15,13 +12,8 @@ namespace {
 template <typename Step>
 void closeStep(Step step)
 {
-    try {
-        callTranslated(step);
-    } catch (const std::exception &error) {
-        DebugLog(L"Closing the instance, the plug-in threw: %s", error.what());
-    } catch (...) {
-        DebugLog(L"Closing the instance, the plug-in threw something that is no standard exception");
-    }
+    if (const QString thrown = thrownBy(step); !thrown.isEmpty())
+        DebugLog(L"While the instance was being closed, %ls", thrown);
 }
 
 } // namespace
@@ -30,7 +22,7 @@ VST3Instance::~VST3Instance() { close(); }
 
 bool VST3Instance::create(IPluginFactory *factory, const FUID &classId, VST3HostContext &context)
 {
-    const IPtr<IPluginFactory3> newest = queryFor<IPluginFactory3>(factory);
+    const FUnknownPtr<IPluginFactory3> newest(factory);
     if (newest)
         newest->setHostContext(context.unknown());
     IPluginFactory *const maker = newest ? newest.get() : factory;
@@ -61,7 +53,7 @@ bool VST3Instance::startComponent(IPluginFactory *factory, const FUID &classId, 
 
 void VST3Instance::findController(IPluginFactory *factory, VST3HostContext &context)
 {
-    m_controller = queryFor<Vst::IEditController>(m_component).take();
+    m_controller = FUnknownPtr<Vst::IEditController>(m_component).take();
     if (!m_controller)
         startOwnController(factory, context);
     if (!m_controller)
@@ -95,8 +87,8 @@ void VST3Instance::startOwnController(IPluginFactory *factory, VST3HostContext &
 
 void VST3Instance::connect()
 {
-    m_componentPoint = queryFor<Vst::IConnectionPoint>(m_component);
-    m_controllerPoint = queryFor<Vst::IConnectionPoint>(m_controller);
+    m_componentPoint = FUnknownPtr<Vst::IConnectionPoint>(m_component);
+    m_controllerPoint = FUnknownPtr<Vst::IConnectionPoint>(m_controller);
     if (!m_componentPoint || !m_controllerPoint)
         return;
     m_componentPoint->connect(m_controllerPoint);
@@ -160,10 +152,8 @@ bool VST3Instance::setState(const QByteArray &state)
         DebugLog(L"The component refuses the state: 0x%08X", result);
         return false;
     }
-    if (!m_controller)
-        return true;
     tellController(parts->component);
-    if (!parts->controller.isEmpty())
+    if (m_controller && !parts->controller.isEmpty())
         setStateOf(*m_controller, parts->controller); // what it shows only; many have none
     return true;
 }

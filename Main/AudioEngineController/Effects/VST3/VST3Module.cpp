@@ -2,54 +2,52 @@
 
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 
 #include <pluginterfaces/base/ipluginbase.h>
 
-#include <exception>
+using namespace Steinberg;
 
 namespace {
-using FactoryFunction = Steinberg::IPluginFactory *(PLUGIN_API *)();
+using FactoryFunction = IPluginFactory *(PLUGIN_API *)();
 constexpr char kFactoryFunction[] = "GetPluginFactory";
 } // namespace
 
+VST3Module::VST3Module(StageListener stageEntered)
+    : m_stageEntered(std::move(stageEntered))
+{}
+
 VST3Module::~VST3Module() { close(); }
 
-bool VST3Module::open(const QString &path)
+std::optional<VST3Failure> VST3Module::open(const QString &path)
 {
+    const QString step = QLatin1String("VST3 Exception: Failed to get load module:") + path;
     m_path = path;
-    if (!m_library.isLoaded())
-        load();
-    if (m_library.isLoaded())
-        m_initialised = true;
-    if (!m_initialised)
-        return false;
-    ProbeReport::stage(ProbeStage::Start);
-    const bool started = callTranslated([this] { return VST3ModuleFile::start(m_library); });
-    if (!started) {
-        DebugLog(L"The module %ls reports that it could not start", path);
-        ProbeReport::reason(QStringLiteral("its entry function reports that it could not start"));
+    if (!m_library.isLoaded()) {
+        m_stageEntered(ProbeStage::Load);
+        const QString reason = load();
+        if (!m_library.isLoaded())
+            return VST3Failure{step, QLatin1String("it could not be loaded: ") + reason};
     }
-    return started;
+    m_initialised = true;
+    m_stageEntered(ProbeStage::Start);
+    if (!callTranslated([this] { return VST3ModuleFile::start(m_library); }))
+        return VST3Failure{step, QStringLiteral("its entry function reports that it could not start")};
+    return std::nullopt;
 }
 
-void VST3Module::load()
+/// Loads the library; why that failed.
+QString VST3Module::load()
 {
-    ProbeReport::stage(ProbeStage::Load);
     QString reason;
     const QString binary = VST3ModuleFile::binary(m_path, reason);
-    if (!binary.isEmpty() && !m_library.load(binary))
-        reason = m_library.errorText();
-    if (m_library.isLoaded())
-        return;
-    DebugLog(L"Cannot load the module %ls: %ls", m_path, reason);
-    ProbeReport::reason(QStringLiteral("it could not be loaded: ") + reason);
+    if (binary.isEmpty() || m_library.load(binary))
+        return reason;
+    return QString(m_library.errorText()).remove(binary + QLatin1String(": "));
 }
 
-bool VST3Module::exportsFactory() const { return m_library.symbol(kFactoryFunction) != nullptr; }
-
-Steinberg::IPluginFactory *VST3Module::factory()
+IPluginFactory *VST3Module::factory()
 {
     if (m_factory)
         return m_factory;
@@ -58,31 +56,40 @@ Steinberg::IPluginFactory *VST3Module::factory()
     return m_factory;
 }
 
+std::optional<VST3Failure> VST3Module::queryFactory(IPluginFactory *&found)
+{
+    const QString step = QStringLiteral("VST3 Exception: Failed to get factory function");
+    if (!factory())
+        return VST3Failure{step, m_library.symbol(kFactoryFunction)
+                                     ? QStringLiteral("GetPluginFactory returned null")
+                                     : QStringLiteral("it does not export GetPluginFactory")};
+    void *answer = nullptr;
+    if (m_factory->queryInterface(IPluginFactory::iid, &answer) != kResultOk || !answer)
+        return VST3Failure{step, QStringLiteral("its factory does not offer IPluginFactory")};
+    found = static_cast<IPluginFactory *>(answer);
+    return std::nullopt;
+}
+
 /// Takes one step of closing. It happens in a destructor, out of which an exception would end the process: a
 /// plug-in that was listed in full would be blamed for a crash.
 template <typename Step>
 void VST3Module::closeStep(Step step)
 {
-    try {
-        callTranslated(step);
-    } catch (const std::exception &error) {
-        DebugLog(L"%ls: closing it, the plug-in threw: %s", m_path, error.what());
-    } catch (...) {
-        DebugLog(L"%ls: closing it, the plug-in threw something that is no standard exception", m_path);
-    }
+    if (const QString thrown = thrownBy(step); !thrown.isEmpty())
+        DebugLog(L"%ls: while it was being closed, %ls", m_path, thrown);
 }
 
-void VST3Module::close()
+bool VST3Module::close()
 {
     if (!m_initialised)
-        return;
-    ProbeReport::stage(ProbeStage::Close);
+        return false;
+    m_stageEntered(ProbeStage::Close);
     closeStep([this] {
         if (m_factory)
             m_factory->release();
     });
     m_factory = nullptr;
     closeStep([this] { VST3ModuleFile::end(m_library); });
-    m_library.freeUnlessRunning();
     m_initialised = false;
+    return !m_library.freeUnlessRunning();
 }

@@ -1,12 +1,22 @@
 #pragma once
 
 #include "Core/BaseLib/Binary/PluginLibrary.h"
+#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
 
 #include <QString>
+
+#include <functional>
+#include <optional>
 
 namespace Steinberg {
 class IPluginFactory;
 }
+
+/// Why a module cannot be used.
+struct VST3Failure {
+    QString step;   ///< what failed, as the log names it
+    QString reason; ///< the cause, as a user can understand it; without the path
+};
 
 /// One opened VST 3 module: its library, started, and its factory. Used on one thread.
 ///
@@ -14,29 +24,34 @@ class IPluginFactory;
 /// unload.
 class VST3Module {
 public:
-    VST3Module() = default;
+    using StageListener = std::function<void(ProbeStage)>;
+
+    /// `stageEntered` hears of loading, starting and closing before the module is touched. It must not throw.
+    explicit VST3Module(StageListener stageEntered = [](ProbeStage) {});
     /// Closes the module.
     ~VST3Module();
     VST3Module(const VST3Module &) = delete;
     VST3Module &operator=(const VST3Module &) = delete;
 
-    /// Loads and starts the module. False when either fails, with the failed step and the system's reason in
-    /// the log. A module that was loaded but reports that it could not start is ended and unloaded by
-    /// `close()` all the same.
-    bool open(const QString &path);
+    /// Loads and starts the module; nothing when that succeeded. A module that was loaded but reports that it
+    /// could not start is ended and unloaded by `close()` all the same. Exceptions of its entry function
+    /// leave this.
+    std::optional<VST3Failure> open(const QString &path);
     /// The factory, asked for once; owned by the module. Null when the module exports none or answers null.
+    /// Exceptions of the module leave this.
     Steinberg::IPluginFactory *factory();
-    /// Whether the loaded module exports the function that gives a factory.
-    bool exportsFactory() const;
-    /// Releases the factory, ends the module and unloads it. A module that left threads running stays mapped.
-    /// Exceptions of the module are logged and go no further.
-    void close();
+    /// Gives the caller a reference to the factory; nothing when there is one that can be used.
+    std::optional<VST3Failure> queryFactory(Steinberg::IPluginFactory *&factory);
+    /// Releases the factory, ends the module and unloads it. True when it left threads running, for which it
+    /// stays mapped. Exceptions of the module are logged and go no further.
+    bool close();
 
 private:
-    void load();
+    QString load();
     template <typename Step>
     void closeStep(Step step);
 
+    StageListener m_stageEntered;
     QString m_path;
     PluginLibrary m_library;
     Steinberg::IPluginFactory *m_factory = nullptr;

@@ -7,7 +7,7 @@
 /// How a VST 3 module lies on disk and is started, which differs from platform to platform.
 namespace VST3ModuleFile {
 
-/// False for a path that a folder search finds although it is no module of its own: a part of a bundle.
+/// False for a path that a folder search finds although it is not a module: a part of a bundle.
 bool isModule(const QString &path);
 /// The file to load for a module's path; empty, with a reason, when the bundle holds none for this platform.
 QString binary(const QString &path, QString &reason);

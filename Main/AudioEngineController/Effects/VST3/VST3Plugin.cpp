@@ -2,189 +2,211 @@
 
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ClassId.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 #include "Main/VLib/SimpleGUI.h"
 
-#include <algorithm>
-#include <cstring>
-#include <set>
+#include <QScopeGuard>
+
 #include <stdexcept>
 
 using namespace Steinberg;
 
 namespace {
 
-constexpr char kAudioModuleClass[] = "Audio Module Class"; // kVstAudioEffectClass of the SDK
-/// Modules of more classes than this report each one as it is listed.
-constexpr int32 kManyClasses = 6;
-/// More classes than any module has. A factory that states more is only asked for these: two thousand million
-/// calls for classes that do not exist take minutes.
-constexpr int32 kMaxClasses = 0x10000;
+/// What a plug-in may change with a call to its handler, by how it is followed.
+constexpr int32 kRebuilding = Vst::kReloadComponent | Vst::kIoChanged | Vst::kLatencyChanged;
+constexpr int32 kShowing = Vst::kParamValuesChanged | Vst::kParamTitlesChanged;
 
-/// What the factory's newer interfaces tell about a class; zeroed where the factory lacks them.
-PClassInfo2 classDetails(IPluginFactory *factory, int32 index)
-{
-    PClassInfo2 details;
-    std::memset(static_cast<void *>(&details), 0, sizeof details);
-    if (const IPtr<IPluginFactory2> factory2 = queryFor<IPluginFactory2>(factory))
-        factory2->getClassInfo2(index, &details);
-    if (const IPtr<IPluginFactory3> factory3 = queryFor<IPluginFactory3>(factory)) {
-        PClassInfoW unicode; // fetched as hosts do, and not used
-        std::memset(static_cast<void *>(&unicode), 0, sizeof unicode);
-        factory3->getClassInfoUnicode(index, &unicode);
-    }
-    return details;
-}
+void logFailure(const VST3Failure &failure) { DebugLog(L"%ls: %ls", failure.step, failure.reason); }
 
 } // namespace
 
-/// A factory while its classes are listed.
-struct VST3Plugin::FactoryView {
-    IPluginFactory *factory;
-    QString vendor;
-    std::set<QString> names; ///< of the classes met so far
-};
-
-VST3Plugin::VST3Plugin()
-    : m_hostContext(VST3HostContext::createOwned(nullptr))
-{}
+QString VST3Plugin::identifierPrefix() const { return QString::fromLatin1(PluginPrefix::kVst3); }
 
 VST3Plugin::~VST3Plugin() { unload(); }
 
-void VST3Plugin::listClasses(ClassListing &records, const QString &path, bool notifyEachClass,
-                             bool &factoryFound)
+bool VST3Plugin::openClass(const EffectRecord &record)
 {
+    auto dropHalfMade = qScopeGuard([this] { m_instance.close(); });
     try {
-        openAndList(records, path, notifyEachClass, factoryFound);
-    } catch (const std::exception &error) {
-        DebugLog(L"%ls: %s", path, error.what());
-        ProbeReport::reason(QStringLiteral("it threw: ") + QString::fromUtf8(error.what()));
-    } catch (...) {
-        DebugLog(L"%ls: the plug-in threw something that is no standard exception", path);
-        ProbeReport::reason(QStringLiteral("it threw something that is no standard exception"));
+        unload();
+        setTornDown(false);
+        m_hostContext = VST3HostContext::createOwned(static_cast<IVST3EditOwner *>(this));
+        if (const auto failure = m_module.open(record.path)) {
+            logFailure(*failure);
+            return false;
+        }
+        // Not around the loading as well: what passes the system's loader ends the process.
+        const bool created = callTranslated([&] { return createInstance(record); });
+        if (created)
+            dropHalfMade.dismiss();
+        return created;
+    } catch (const std::runtime_error &error) {
+        DebugLog(L"%s", error.what());
     }
+    return false;
 }
 
-void VST3Plugin::openAndList(ClassListing &records, const QString &path, bool notifyEachClass,
-                             bool &factoryFound)
+bool VST3Plugin::createInstance(const EffectRecord &record)
 {
-    records.clear();
-    openModule(path);
-    factoryFound = false;
-    ProbeReport::stage(ProbeStage::Ask);
-    // Not around the loading as well: what passes the system's loader ends the process.
-    callTranslated([&] { listModule(records, notifyEachClass, factoryFound); });
-}
-
-void VST3Plugin::listModule(ClassListing &records, bool notifyEachClass, bool &factoryFound)
-{
-    IPluginFactory *const factory = queryFactory();
-    factoryFound = true;
-    listFactory(records, factory, notifyEachClass);
-}
-
-void VST3Plugin::openModule(const QString &path)
-{
-    if (!m_module.open(path))
-        throw std::runtime_error("VST3 Exception: Failed to get load module:" + path.toStdString());
-}
-
-IPluginFactory *VST3Plugin::queryFactory()
-{
-    IPluginFactory *const module = m_module.factory();
-    void *factory = nullptr;
-    if (!module || module->queryInterface(IPluginFactory::iid, &factory) != kResultOk || !factory) {
-        ProbeReport::reason(m_module.exportsFactory() ? QStringLiteral("it gives no plug-in factory")
-                                                      : QStringLiteral("it exports no \"GetPluginFactory\""));
-        throw std::runtime_error("VST3 Exception: Failed to get factory function");
+    const FUID classId = classIdOf(record.id);
+    if (!classId.isValid()) {
+        DebugLog(L"'%ls' is not a class identifier", record.id);
+        return false;
     }
-    return static_cast<IPluginFactory *>(factory);
+    IPluginFactory *factory = nullptr;
+    if (const auto failure = m_module.queryFactory(factory)) {
+        logFailure(*failure);
+        return false;
+    }
+    const bool created = m_instance.create(factory, classId, *m_hostContext);
+    if (created) {
+        m_record = record;
+        if (m_record.vendor.isEmpty())
+            m_record.vendor = vendorOf(*factory);
+    }
+    factory->release(); // not when the plug-in threw, as for a listing
+    return created;
 }
 
-void VST3Plugin::listFactory(ClassListing &records, IPluginFactory *factory, bool notifyEachClass)
+void VST3Plugin::unload()
 {
-    FactoryView view{factory, vendorOf(*factory), {}};
-    const int32 count = factory->countClasses();
-    const std::size_t before = records.size();
-    for (int32 index = 0; index < std::min(count, kMaxClasses); ++index)
-        listClass(records, view, index, notifyEachClass || count > kManyClasses);
-    if (records.size() == before) {
-        DebugLog(L"No audio class could be listed, of %d classes", count);
-        ProbeReport::reason(QStringLiteral("it lists no audio plug-in, of %1 classes").arg(count));
-    }
-    // Not released when the plug-in threw: its state is unknown then.
-    factory->release();
+    setTornDown(true);
+    AudioPlugin::close();
+    callPlugin("when it was closed", [this] { m_processor.detach(); });
+    m_instance.close();
+    m_module.close();
 }
 
-void VST3Plugin::listClass(ClassListing &records, FactoryView &view, int32 index, bool notify)
+/// Makes a call into the plug-in; what it throws is logged and counts as a refusal.
+template <typename Call>
+bool VST3Plugin::callPlugin(const char *when, Call &&call)
 {
-    PClassInfo info;
-    std::memset(static_cast<void *>(&info), 0, sizeof info);
-    view.factory->getClassInfo(index, &info);
-    if (std::strncmp(info.category, kAudioModuleClass, sizeof info.category) != 0)
-        return;
-    const QString name = fixedText(info.name);
-    if (view.names.count(name) != 0)
-        return;
-    const PClassInfo2 details = classDetails(view.factory, index);
-    m_classId = FUID::fromTUID(info.cid);
-    view.names.insert(name);
-    if (m_classObserver)
-        m_classObserver();
-    showScanning(name);
-    instantiate(records, view, name, details);
-    if (notify)
-        notifyUI(MessageCode::kEntryAdded);
+    bool accepted = false;
+    const QString thrown = thrownBy([&] {
+        if constexpr (std::is_void_v<std::invoke_result_t<Call>>) {
+            call();
+            accepted = true;
+        } else {
+            accepted = call();
+        }
+    });
+    if (!thrown.isEmpty())
+        DebugLog(L"%ls: %s, %ls", m_record.name, when, thrown);
+    return accepted;
 }
 
-void VST3Plugin::instantiate(ClassListing &records, const FactoryView &view, const QString &name,
-                             const PClassInfo2 &details)
+bool VST3Plugin::openPlugin(const AudioSettings &settings)
 {
-    m_component = nullptr;
-    void *component = nullptr;
-    const tresult created =
-        view.factory->createInstance(m_classId.toTUID(), Vst::IComponent::iid, &component);
-    if (created != kResultOk || !component) {
-        DebugLog(L"The class %ls could not be created: 0x%08X", name, created);
-        ProbeReport::reason(
-            formatText(L"its class \"%ls\" could not be created (result 0x%08X)", name, created));
-        return;
-    }
-    m_component = static_cast<Vst::IComponent *>(component);
-    const tresult initialised = m_component->initialize(m_hostContext->unknown());
-    if (initialised != kResultOk) {
-        // Neither terminated nor released: a component that could not start is not called again.
-        DebugLog(L"The class %ls could not be initialised: 0x%08X", name, initialised);
-        ProbeReport::reason(
-            formatText(L"its class \"%ls\" could not be initialised (result 0x%08X)", name, initialised));
-        return;
-    }
-    records.push_back(describe(view, name, details));
-    m_component->terminate();
-    m_component->release();
-    m_component = nullptr;
+    const bool hasAudio = isInstantiated() && callPlugin("when it was opened", [this] {
+                              return m_processor.attach(m_instance.component());
+                          });
+    if (!hasAudio)
+        DebugLog(L"%ls has no audio side that can be used", m_record.name);
+    return hasAudio && applySettings(settings);
 }
 
-EffectRecord VST3Plugin::describe(const FactoryView &view, const QString &name,
-                                  const PClassInfo2 &details) const
+bool VST3Plugin::applySettings(const AudioSettings &settings)
 {
-    EffectRecord record;
-    record.name = name;
-    record.inputs = usedChannels(audioBuses(*m_component, Vst::kInput));
-    record.outputs = usedChannels(audioBuses(*m_component, Vst::kOutput));
-    record.id = classIdText(m_classId);
-    record.categories = fixedText(details.subCategories);
-    record.category = categoryFromSubCategories(record.categories);
-    record.vendor = fixedText(details.vendor);
-    if (record.vendor.isEmpty())
-        record.vendor = view.vendor;
-    if (record.inputs == 0 && record.outputs == 0) {
-        record.outputs = 2;
-        record.inputs = isInstrumentCategory(record.category) ? 0 : 2;
+    return callPlugin("when it was set up",
+                      [&] { return m_processor.setUp(settings.sampleRate, settings.blockSize); });
+}
+
+bool VST3Plugin::setBusFormats(int inputFormat, int outputFormat)
+{
+    const TAutoLockCS lock(&processingLock());
+    if (!isOpen())
+        return false;
+    const bool wasRunning = isRunning();
+    stop();
+    const bool accepted = callPlugin("when its buses were set", [&] {
+        return m_processor.setFormats({inputFormat, outputFormat}, m_settings);
+    });
+    rebuildChannels();
+    return (!wasRunning || start()) && accepted;
+}
+
+bool VST3Plugin::startProcessing()
+{
+    const bool started = callPlugin("when it was started", [this] { return m_processor.start(); });
+    if (!started)
+        deactivate();
+    return started;
+}
+
+void VST3Plugin::stopProcessing()
+{
+    callPlugin("when it was stopped", [this] { m_processor.stop(); });
+    deactivate();
+}
+
+void VST3Plugin::deactivate()
+{
+    callPlugin("when it was deactivated", [this] { m_processor.deactivate(); });
+}
+
+ChannelSetup VST3Plugin::readChannels()
+{
+    ChannelSetup channels;
+    callPlugin("when its channels were counted", [&] { channels = m_processor.readChannels(); });
+    return channels;
+}
+
+bool VST3Plugin::processBlock(ChannelBuffers &buffers, int frames)
+{
+    return callPlugin("when it processed a block", [&] { return m_processor.process(buffers, frames); });
+}
+
+bool VST3Plugin::StorePreset(PluginPreset &preset)
+{
+    showStatusWithLevel(MessageCode::kScanning, L"Storing %s Preset", m_record.name);
+    const auto done = qScopeGuard([] { showStatusWithLevel(MessageCode::kCompleted, L""); });
+    PluginPreset captured;
+    callPlugin("when its state was stored", [&] { captured.data = m_instance.state(); });
+    if (captured.data.isEmpty())
+        return false;
+    captured.isChunk = 1;
+    captured.identifier = identifier();
+    captured.name = m_record.name.toLatin1();
+    storeSettings(captured);
+    preset = captured;
+    return true;
+}
+
+bool VST3Plugin::LoadPreset(const PluginPreset &preset)
+{
+    showStatusWithLevel(MessageCode::kScanning, L"Loading %s Preset", m_record.name);
+    const auto done = qScopeGuard([] { showStatusWithLevel(MessageCode::kCompleted, L""); });
+    if (preset.identifier != identifier() || preset.isChunk != 1) {
+        DebugLog(L"The preset cannot be loaded into %ls: it is of %ls", m_record.name, preset.identifier);
+        return false;
     }
-    return record;
+    if (!callPlugin("when its state was loaded", [&] { return m_instance.setState(preset.data); }))
+        return false;
+    loadSettings(preset);
+    tellListeners([this](IAudioPluginListener &listener) { listener.pluginChanged(*this); });
+    return true;
+}
+
+tresult VST3Plugin::editGesture(Vst::ParamID id, bool begun) noexcept
+{
+    tellListeners([&](IAudioPluginListener &listener) { listener.parameterEdit(*this, id, begun); });
+    return kResultOk;
+}
+
+tresult VST3Plugin::performEdit(Vst::ParamID id, Vst::ParamValue value) noexcept
+{
+    tellListeners([&](IAudioPluginListener &listener) { listener.parameterChanged(*this, id, value); });
+    return kResultOk;
+}
+
+tresult VST3Plugin::restartComponent(int32 flags) noexcept
+{
+    if (flags & kRebuilding)
+        rebuildChannels();
+    if (flags & kShowing)
+        tellListeners([this](IAudioPluginListener &listener) { listener.displayChanged(*this); });
+    return kResultOk;
 }

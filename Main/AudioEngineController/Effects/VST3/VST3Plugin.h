@@ -8,36 +8,18 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Module.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Processor.h"
 
-#include <pluginterfaces/vst/ivstcomponent.h>
-
-#include <functional>
-#include <vector>
-
-/// The records of one module's audio classes, in the factory's class order.
-using ClassListing = std::vector<EffectRecord>;
-
-/// The host's side of one VST 3 module: what lists its classes, or one instance of one of them. Used on one
-/// thread, but for what the plug-in reports; whatever it takes from the plug-in is checked.
+/// One instance of a VST 3 class, in use. Used on one thread, but for what the plug-in reports; whatever it
+/// takes from the plug-in is checked.
 class VST3Plugin : public AudioPlugin, private IVST3EditOwner {
 public:
-    VST3Plugin();
-    /// Closes the instance, then the module, and only then lets go of the host context that plug-ins were
+    VST3Plugin() = default;
+    /// Closes the instance, then the module, and only then lets go of the host context that the plug-in was
     /// given.
     ~VST3Plugin() override;
 
-    /// Called before each audio class is touched.
-    void setClassObserver(std::function<void()> observer) { m_classObserver = std::move(observer); }
-
-    /// Opens the module and lists its audio classes into `records`, which is emptied first; the module stays
-    /// open. Never throws: what the plug-in throws ends the listing, and the classes listed so far stay.
-    /// `factoryFound` becomes false when the module loaded but has no usable factory, and keeps the caller's
-    /// value when it did not load. With `notifyEachClass`, or for a module of more than six classes, the user
-    /// interface hears of each class.
-    void listClasses(ClassListing &records, const QString &path, bool notifyEachClass, bool &factoryFound);
-
     /// Opens the record's module and makes an instance of its class, in place of one that was there. False,
-    /// with the reason in the log, when that fails. What the plug-in throws that is no std::runtime_error
-    /// goes on to the caller; the object can be destroyed or opened again then.
+    /// with the reason in the log, when that fails. Exceptions of the plug-in other than std::runtime_error
+    /// reach the caller; the object can be destroyed or opened again then.
     bool openClass(const EffectRecord &record);
     /// True while there is an instance.
     bool isInstantiated() const { return m_instance.component() != nullptr; }
@@ -69,43 +51,23 @@ protected:
     bool processBlock(ChannelBuffers &buffers, int frames) override;
 
 private:
-    struct FactoryView;
-
     Steinberg::tresult editGesture(Steinberg::Vst::ParamID id, bool begun) noexcept override;
     Steinberg::tresult performEdit(Steinberg::Vst::ParamID id,
                                    Steinberg::Vst::ParamValue value) noexcept override;
     Steinberg::tresult restartComponent(Steinberg::int32 flags) noexcept override;
 
-    /// Throws std::runtime_error when the module does not load or start.
-    void openModule(const QString &path);
-    /// A reference to the module's factory; throws std::runtime_error when there is none that is usable.
-    Steinberg::IPluginFactory *queryFactory();
-    bool openInstance(const EffectRecord &record);
-    bool instantiate(const EffectRecord &record);
+    bool createInstance(const EffectRecord &record);
     /// Whatever became of the start or of the call that ends the processing.
     void deactivate();
     /// Ends the instance, then the module.
     void unload();
     template <typename Call>
-    bool callPlugin(const char *what, Call &&call);
+    bool callPlugin(const char *when, Call &&call);
 
-    void openAndList(ClassListing &records, const QString &path, bool notifyEachClass, bool &factoryFound);
-    void listModule(ClassListing &records, bool notifyEachClass, bool &factoryFound);
-    void listFactory(ClassListing &records, Steinberg::IPluginFactory *factory, bool notifyEachClass);
-    void listClass(ClassListing &records, FactoryView &view, Steinberg::int32 index, bool notify);
-    void instantiate(ClassListing &records, const FactoryView &view, const QString &name,
-                     const Steinberg::PClassInfo2 &details);
-    EffectRecord describe(const FactoryView &view, const QString &name,
-                          const Steinberg::PClassInfo2 &details) const;
-
-    VST3Owned<VST3HostContext> m_hostContext;
+    VST3Owned<VST3HostContext> m_hostContext; ///< outlives the module; null before the first `openClass`
     VST3Module m_module;
-    Steinberg::Vst::IComponent *m_component =
-        nullptr; ///< of the class at hand; released only after a clean listing
-    Steinberg::FUID m_classId;
     VST3Instance m_instance;
     VST3Processor m_processor;
     VST3PluginSettings m_settings;
     EffectRecord m_record; ///< of the instance
-    std::function<void()> m_classObserver;
 };

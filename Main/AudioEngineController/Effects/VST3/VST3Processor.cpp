@@ -1,7 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Processor.h"
 
 #include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 
 #include <algorithm>
 
@@ -16,7 +15,7 @@ constexpr Vst::BusDirection kDirections[] = {Vst::kInput, Vst::kOutput};
 bool VST3Processor::attach(Vst::IComponent *component)
 {
     m_component = component;
-    m_processor = queryFor<Vst::IAudioProcessor>(component);
+    m_processor = FUnknownPtr<Vst::IAudioProcessor>(component);
     return m_processor && m_processor->canProcessSampleSize(Vst::kSample32) == kResultOk;
 }
 

@@ -1,11 +1,39 @@
 #pragma once
 
+#include "Core/BaseLib/Process/FaultGuard.h"
+
 #include <QString>
 
 #include <pluginterfaces/base/ipluginbase.h>
-#include <pluginterfaces/base/smartpointer.h>
 
 #include <cstring>
+#include <exception>
+
+// How a plug-in's interfaces are asked.
+
+/// The exception being handled, in words.
+inline QString thrownText()
+{
+    try {
+        throw;
+    } catch (const std::exception &error) {
+        return QLatin1String("it threw: ") + QString::fromUtf8(error.what());
+    } catch (...) {
+        return QStringLiteral("it threw something other than a standard exception");
+    }
+}
+
+/// Makes a call into a plug-in. What it throws, in words; empty when it threw nothing.
+template <typename Call>
+QString thrownBy(Call &&call)
+{
+    try {
+        callTranslated(call);
+    } catch (...) {
+        return thrownText();
+    }
+    return QString();
+}
 
 /// Text of a fixed-size field, which need not be terminated; invalid UTF-8 is replaced.
 template <std::size_t Size>
@@ -21,16 +49,6 @@ inline QString vendorOf(Steinberg::IPluginFactory &factory)
     std::memset(static_cast<void *>(&info), 0, sizeof info);
     factory.getFactoryInfo(&info);
     return fixedText(info.vendor);
-}
-
-/// Asks for an interface; null when the object lacks it, whatever it answered.
-template <typename Interface>
-Steinberg::IPtr<Interface> queryFor(Steinberg::FUnknown *object)
-{
-    void *found = nullptr;
-    if (object->queryInterface(Interface::iid, &found) != Steinberg::kResultOk)
-        return nullptr;
-    return Steinberg::owned(static_cast<Interface *>(found));
 }
 
 /// Has a factory make an object of a class, with one reference for the caller; null when it gives none, with

@@ -53,7 +53,7 @@ std::optional<VST3State> readVST3State(const QByteArray &data, QString &reason)
 {
     int offset = 0;
     if (takeNumber(data, offset) != kFormat) {
-        reason = QStringLiteral("it is no state of an instance");
+        reason = QStringLiteral("it is not the state of an instance");
         return std::nullopt;
     }
     const std::optional<QByteArray> component = takeHalf(data, offset);

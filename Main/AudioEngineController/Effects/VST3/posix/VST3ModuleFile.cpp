@@ -22,7 +22,7 @@ QString usualBinary(const QString &bundle)
            QLatin1String(".so");
 }
 
-/// The path, unless what it leads to is there and no regular file: a pipe would be waited for.
+/// The path, unless what it leads to exists and is not a regular file: reading a pipe would block.
 QString unlessSpecial(const QString &path, QString &reason)
 {
     const QFileInfo file(path);

@@ -112,7 +112,7 @@ TEST_F(VST3Listing, ClassesThatFailOrAreNoneAreLeftOut)
     EXPECT_EQ(records("Name Working"), texts({"Last|1"}));
     EXPECT_EQ(traceOf("Some").filter("class-info2 of"), QStringList()) << "not asked further";
     for (const char *failure : failures)
-        EXPECT_TRUE(log.contains("The class " + QString(failure) + " could not be ")) << failure;
+        EXPECT_TRUE(log.contains("its class \"" + QString(failure) + "\" could not be ")) << failure;
 }
 
 TEST_F(VST3Listing, StatedClassCountsAreNotBelieved)

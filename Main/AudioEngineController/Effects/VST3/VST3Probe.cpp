@@ -1,0 +1,215 @@
+#include "Main/AudioEngineController/Effects/VST3/VST3Probe.h"
+
+#include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3ClassId.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3HostContext.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Module.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
+
+#include <pluginterfaces/vst/ivstaudioprocessor.h>
+
+#include <QElapsedTimer>
+
+#include <algorithm>
+#include <set>
+
+using namespace Steinberg;
+
+namespace {
+
+/// The records of one module's audio classes, in the factory's class order.
+using ClassListing = std::vector<EffectRecord>;
+
+/// Each class of a module with more classes than this is announced as it is listed.
+constexpr int32 kManyClasses = 6;
+/// More classes than any module has. A factory that states more is only asked for these: two thousand million
+/// calls for classes that do not exist take minutes.
+constexpr int32 kMaxClasses = 0x10000;
+
+/// What the factory's newer interfaces tell about a class; zeroed where the factory lacks them.
+PClassInfo2 classDetails(IPluginFactory &factory, int32 index)
+{
+    PClassInfo2 details;
+    std::memset(static_cast<void *>(&details), 0, sizeof details);
+    if (const FUnknownPtr<IPluginFactory2> factory2(&factory); factory2)
+        factory2->getClassInfo2(index, &details);
+    if (const FUnknownPtr<IPluginFactory3> factory3(&factory); factory3) {
+        PClassInfoW unicode; // fetched as hosts do, and not used
+        std::memset(static_cast<void *>(&unicode), 0, sizeof unicode);
+        factory3->getClassInfoUnicode(index, &unicode);
+    }
+    return details;
+}
+
+/// What an initialised component and the factory say of its class.
+EffectRecord describe(Vst::IComponent &component, const PClassInfo &info, const PClassInfo2 &details,
+                      const QString &factoryVendor)
+{
+    EffectRecord record;
+    record.name = fixedText(info.name);
+    record.inputs = usedChannels(audioBuses(component, Vst::kInput));
+    record.outputs = usedChannels(audioBuses(component, Vst::kOutput));
+    record.id = classIdText(FUID::fromTUID(info.cid));
+    record.categories = fixedText(details.subCategories);
+    record.category = categoryFromSubCategories(record.categories);
+    record.vendor = fixedText(details.vendor);
+    if (record.vendor.isEmpty())
+        record.vendor = factoryVendor;
+    if (record.inputs == 0 && record.outputs == 0) {
+        record.outputs = 2;
+        record.inputs = isInstrumentCategory(record.category) ? 0 : 2;
+    }
+    return record;
+}
+
+/// One module while it is listed.
+class ModuleListing {
+public:
+    ModuleListing(ProbeOutcome &outcome, IProbeObserver &observer)
+        : m_outcome(outcome)
+        , m_observer(observer)
+    {}
+
+    /// Opens the module and lists its audio classes into `records`, which is emptied first; the module stays
+    /// open. What the module throws ends the listing, and the classes listed so far stay. `factoryFound`
+    /// becomes false when the module loaded but has no usable factory, and keeps the caller's value when it
+    /// did not load. With `notifyEachClass`, or for a module of more than six classes, each is announced.
+    void listClasses(ClassListing &records, const QString &path, bool notifyEachClass, bool &factoryFound);
+    /// Ends and unloads the module; true when it left threads running.
+    bool close() { return m_module.close(); }
+
+private:
+    void listFactory(ClassListing &records, bool notifyEachClass, bool &factoryFound);
+    void listClass(ClassListing &records, IPluginFactory &factory, const PClassInfo &info,
+                   const PClassInfo2 &details);
+    void enter(ProbeStage stage);
+    /// The step that failed goes to the log, the cause into the outcome.
+    void fail(const VST3Failure &failure);
+    void failClass(const PClassInfo &info, const char *what, tresult result);
+
+    ProbeOutcome &m_outcome;
+    IProbeObserver &m_observer;
+    VST3Owned<VST3HostContext> m_hostContext = VST3HostContext::createOwned(nullptr); ///< outlives the module
+    VST3Module m_module{[this](ProbeStage stage) { enter(stage); }};
+    QString m_factoryVendor;
+    std::set<QString> m_names; ///< of the classes met so far
+};
+
+void ModuleListing::listClasses(ClassListing &records, const QString &path, bool notifyEachClass,
+                                bool &factoryFound)
+{
+    records.clear();
+    try {
+        if (const auto failure = m_module.open(path)) {
+            fail(*failure);
+            return;
+        }
+        factoryFound = false;
+        enter(ProbeStage::Ask);
+        // Not around the loading as well: what passes the system's loader ends the process.
+        callTranslated([&] { listFactory(records, notifyEachClass, factoryFound); });
+    } catch (...) {
+        m_outcome.fail(thrownText());
+    }
+}
+
+void ModuleListing::listFactory(ClassListing &records, bool notifyEachClass, bool &factoryFound)
+{
+    IPluginFactory *factory = nullptr;
+    if (const auto failure = m_module.queryFactory(factory)) {
+        fail(*failure);
+        return;
+    }
+    factoryFound = true;
+    m_factoryVendor = vendorOf(*factory);
+    const int32 count = factory->countClasses();
+    for (int32 index = 0; index < std::min(count, kMaxClasses); ++index) {
+        PClassInfo info;
+        std::memset(static_cast<void *>(&info), 0, sizeof info);
+        factory->getClassInfo(index, &info);
+        if (std::strncmp(info.category, kVstAudioEffectClass, sizeof info.category) != 0 ||
+            m_names.count(fixedText(info.name)) != 0)
+            continue;
+        listClass(records, *factory, info, classDetails(*factory, index));
+        if (notifyEachClass || count > kManyClasses)
+            m_observer.classAnnounced();
+    }
+    if (records.empty())
+        m_outcome.fail(QStringLiteral("it lists no audio plug-in among its %1 classes").arg(count));
+    factory->release(); // not when the plug-in threw: its state is unknown then
+}
+
+void ModuleListing::listClass(ClassListing &records, IPluginFactory &factory, const PClassInfo &info,
+                              const PClassInfo2 &details)
+{
+    const QString name = fixedText(info.name);
+    m_names.insert(name);
+    m_observer.classBegins(name);
+    tresult result = kResultOk;
+    auto *const component = createObject<Vst::IComponent>(&factory, FUID::fromTUID(info.cid), result);
+    if (!component) {
+        failClass(info, "created", result);
+        return;
+    }
+    result = component->initialize(m_hostContext->unknown());
+    if (result != kResultOk) {
+        failClass(info, "initialised", result); // neither terminated nor released: it is not called again
+        return;
+    }
+    records.push_back(describe(*component, info, details, m_factoryVendor));
+    component->terminate();
+    component->release();
+}
+
+void ModuleListing::enter(ProbeStage stage)
+{
+    m_outcome.stage = stage;
+    m_observer.stageEntered(stage);
+}
+
+void ModuleListing::fail(const VST3Failure &failure)
+{
+    DebugLog(L"%ls", failure.step);
+    m_outcome.fail(failure.reason);
+}
+
+/// A class that failed is left out; of several the outcome tells the first, the log all.
+void ModuleListing::failClass(const PClassInfo &info, const char *what, tresult result)
+{
+    const QString reason =
+        formatText(L"its class \"%ls\" could not be %s (result 0x%08X)", fixedText(info.name), what, result);
+    DebugLog(L"%ls", reason);
+    m_outcome.fail(reason);
+}
+
+ProbeOutcome::IfFailed ifFailed(const QString &path, bool factoryFound)
+{
+    if (!factoryFound)
+        return ProbeOutcome::IfFailed::Forget;
+    // NOTE: a WaveShell finds its plug-ins in other folders, and may do so again at the next scan.
+    return path.contains(QLatin1String("WaveShell")) ? ProbeOutcome::IfFailed::KeepKnown
+                                                     : ProbeOutcome::IfFailed::Record;
+}
+
+} // namespace
+
+ProbeOutcome VST3Probe::run(const ProbeJob &job, IProbeObserver &observer)
+{
+    QElapsedTimer timer;
+    timer.start();
+    ProbeOutcome outcome;
+    bool factoryFound = true;
+    ModuleListing module(outcome, observer);
+    module.listClasses(outcome.records, job.path, job.announceClasses, factoryFound);
+    outcome.leftThreads = module.close();
+    for (EffectRecord &record : outcome.records) {
+        record.path = job.path;
+        record.fileTime = job.fileTime;
+    }
+    outcome.status = outcome.records.empty() ? ProbeStatus::Failed : ProbeStatus::Listed;
+    outcome.ifFailed = ifFailed(job.path, factoryFound);
+    outcome.milliseconds = static_cast<double>(timer.nsecsElapsed()) / 1e6;
+    return outcome;
+}
