@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Core/BaseLib/Binary/PluginLibrary.h"
-#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeStage.h"
 
 #include <QString>
 

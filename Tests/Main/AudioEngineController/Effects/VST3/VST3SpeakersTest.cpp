@@ -9,9 +9,9 @@ using namespace Steinberg::Vst;
 
 namespace {
 
-/// The speakers that a code gives, and the plug-in's channels of the positions from 0 on where position 1
-/// went to channel 7 before.
-void expectSpeakers(int code, SpeakerArrangement speakers, const char *channels)
+/// The speakers that a code gives, and the plug-in's channels of the positions from 0 on; before, position 1
+/// went to channel 7.
+void expectSpeakers(int code, SpeakerArrangement speakers, const std::string &channels)
 {
     SCOPED_TRACE(code);
     VST3ChannelMap map = {{1, 7}};
@@ -27,46 +27,39 @@ void expectSpeakers(int code, SpeakerArrangement speakers, const char *channels)
 TEST(VST3Speakers, OfEveryBusFormat)
 {
     using namespace SpeakerArr;
+    const std::pair<int, SpeakerArrangement> inOrder[] = {
+        {1, kMono},  {2, kStereo}, {3, k30Cine},           {4, k40Music},          {5, k50},
+        {6, k51},    {7, k61Cine}, {8, k70Cine},           {10, k71Cine},          {54, k71CineSideHigh},
+        {55, k50_4}, {58, k51_4},  {65, kAmbi1stOrderACN}, {66, kAmbi2cdOrderACN}, {67, kAmbi3rdOrderACN}};
+    for (const auto &[code, speakers] : inOrder) {
+        std::string channels = "0";
+        for (int channel = 1; channel < getChannelCount(speakers); ++channel)
+            channels += ' ' + std::to_string(channel);
+        expectSpeakers(code, speakers, channels);
+    }
     const struct {
         int code;
         SpeakerArrangement speakers;
         const char *channels;
-    } rows[] = {
-        {1, kMono, "0"},
-        {2, kStereo, "0 1"},
-        {3, k30Cine, "0 1 2"},
-        {4, k40Music, "0 1 2 3"},
-        {5, k50, "0 1 2 3 4"},
-        {6, k51, "0 1 2 3 4 5"},
-        {7, k61Cine, "0 1 2 3 4 5 6"},
-        {8, k70Cine, "0 1 2 3 4 5 6"},
-        {9, k70Music, "0 1 2 5 6 3 4"},
-        {10, k71Cine, "0 1 2 3 4 5 6 7"},
-        {50, k71_4, "0 1 2 3 6 7 4 5 8 9 10 11"},
-        {51, k111MPEG3D, "0 1 2 3 6 7 4 5 8 9 10 11"},
-        {52, k70_4, "0 1 2 5 6 3 4 7 8 9 10"},
-        {53, k70_6, "0 1 2 5 6 3 4 7 8 11 12 9 10"},
-        {54, k71CineSideHigh, "0 1 2 3 4 5 6 7"},
-        {55, k50_4, "0 1 2 3 4 5 6 7 8"},
-        {56, k90_4, "0 1 2 7 8 3 4 5 6 9 10 11 12"},
-        {57, k90_6, "0 1 2 7 8 3 4 5 6 9 10 13 14 11 12"},
-        {58, k51_4, "0 1 2 3 4 5 6 7 8 9"},
-        {59, k70_2, "0 1 2 5 6 3 4 7 8"},
-        {60, k71_2, "0 1 2 3 6 7 4 5 8 9"},
-        {61, k71_6, "0 1 2 3 6 7 4 5 8 9 12 13 10 11"},
-        {62, k91_4, "0 1 2 3 8 9 4 5 6 7 10 11 12 13"},
-        {63, k91_6, "0 1 2 3 8 9 4 5 6 7 10 11 14 15 12 13"},
-        {64, k222, "0 1 2 3 4 5 6 7 8 18 9 10 12 14 13 11 15 17 19 20 16 22 21 23"},
-        {65, kAmbi1stOrderACN, "0 1 2 3"},
-        {66, kAmbi2cdOrderACN, "0 1 2 3 4 5 6 7 8"},
-        {67, kAmbi3rdOrderACN, "0 1 2 3 4 5 6 7 8 9 10 11 12 13 14 15"},
-        {70, k101, "0 1 2 3 4 5 7 8 9 10 6"},
-        {71, k111, "0 1 2 3 4 5 7 8 9 10 11 6"},
-        {72, k131, "0 1 2 3 6 7 4 5 9 10 11 12 13 8"},
-    };
-    EXPECT_EQ(std::size(rows), busFormats().size());
-    for (const auto &row : rows)
+    } reordered[] = {{9, k70Music, "0 1 2 5 6 3 4"},
+                     {50, k71_4, "0 1 2 3 6 7 4 5 8 9 10 11"},
+                     {51, k111MPEG3D, "0 1 2 3 6 7 4 5 8 9 10 11"},
+                     {52, k70_4, "0 1 2 5 6 3 4 7 8 9 10"},
+                     {53, k70_6, "0 1 2 5 6 3 4 7 8 11 12 9 10"},
+                     {56, k90_4, "0 1 2 7 8 3 4 5 6 9 10 11 12"},
+                     {57, k90_6, "0 1 2 7 8 3 4 5 6 9 10 13 14 11 12"},
+                     {59, k70_2, "0 1 2 5 6 3 4 7 8"},
+                     {60, k71_2, "0 1 2 3 6 7 4 5 8 9"},
+                     {61, k71_6, "0 1 2 3 6 7 4 5 8 9 12 13 10 11"},
+                     {62, k91_4, "0 1 2 3 8 9 4 5 6 7 10 11 12 13"},
+                     {63, k91_6, "0 1 2 3 8 9 4 5 6 7 10 11 14 15 12 13"},
+                     {64, k222, "0 1 2 3 4 5 6 7 8 18 9 10 12 14 13 11 15 17 19 20 16 22 21 23"},
+                     {70, k101, "0 1 2 3 4 5 7 8 9 10 6"},
+                     {71, k111, "0 1 2 3 4 5 7 8 9 10 11 6"},
+                     {72, k131, "0 1 2 3 6 7 4 5 9 10 11 12 13 8"}};
+    for (const auto &row : reordered)
         expectSpeakers(row.code, row.speakers, row.channels);
+    EXPECT_EQ(std::size(inOrder) + std::size(reordered), busFormats().size());
 }
 
 TEST(VST3Speakers, OfDiscreteChannelsAndOfNoFormat)
@@ -84,9 +77,7 @@ TEST(VST3Speakers, OfDiscreteChannelsAndOfNoFormat)
 TEST(VST3Speakers, AreLimitedForPluginsOfFewChannels)
 {
     const struct {
-        int code;
-        int limit;
-        int speakers;
+        int code, limit, speakers;
         bool isLimited;
     } rows[] = {{50, 12, 0x2D63F, false},  {50, 13, 0x2D63F, false},  {50, 0, 0x2D63F, false},
                 {50, 10, 0x300063F, true}, {64, 10, 0x300063F, true}, {51, 10, 0x2D63F, false},
