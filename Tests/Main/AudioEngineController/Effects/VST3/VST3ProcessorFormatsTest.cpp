@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <map>
 #include <sstream>
 
 using namespace Steinberg;
@@ -29,12 +30,12 @@ public:
     tresult PLUGIN_API setIoMode(IoMode) override { return kNotImplemented; }
     int32 PLUGIN_API getBusCount(MediaType, BusDirection direction) override
     {
-        return static_cast<int32>(m_buses[static_cast<std::size_t>(direction)].size());
+        return static_cast<int32>(m_buses[direction].size());
     }
     tresult PLUGIN_API getBusInfo(MediaType, BusDirection direction, int32 index, BusInfo &info) override
     {
-        info.channelCount = SpeakerArr::getChannelCount(bus(direction, index));
-        info.busType = index == mainBus(direction) ? kMain : kAux;
+        info.channelCount = SpeakerArr::getChannelCount(m_buses[direction].at(std::size_t(index)));
+        info.busType = index == (direction == kInput ? 1 : 0) ? kMain : kAux;
         return kResultOk;
     }
     tresult PLUGIN_API getRoutingInfo(RoutingInfo &, RoutingInfo &) override { return kNotImplemented; }
@@ -46,23 +47,19 @@ public:
     tresult PLUGIN_API setBusArrangements(SpeakerArrangement *inputs, int32 numIns,
                                           SpeakerArrangement *outputs, int32 numOuts) override
     {
-        const std::vector<SpeakerArrangement> in(inputs, inputs + numIns), out(outputs, outputs + numOuts);
-        offered << std::hex;
-        std::copy(in.begin(), in.end(), std::ostream_iterator<SpeakerArrangement>(offered, " "));
-        offered << "> ";
-        std::copy(out.begin(), out.end(), std::ostream_iterator<SpeakerArrangement>(offered, " "));
+        std::copy_n(inputs, numIns, std::ostream_iterator<SpeakerArrangement>(offered << std::hex, " "));
+        std::copy_n(outputs, numOuts, std::ostream_iterator<SpeakerArrangement>(offered << "> ", " "));
         const auto isKnown = [this](SpeakerArrangement one) { return one == known || one == 0x3; };
         if (!isKnown(inputs[1]) || !isKnown(outputs[0]))
             return kResultFalse;
-        m_buses = {in, out};
+        m_buses = {{kInput, {inputs, inputs + numIns}}, {kOutput, {outputs, outputs + numOuts}}};
         if (takesOther)
-            m_buses[1][0] = takesOther;
+            m_buses[kOutput][0] = takesOther;
         return kResultTrue;
     }
-    tresult PLUGIN_API getBusArrangement(BusDirection direction, int32 index,
-                                         SpeakerArrangement &arrangement) override
+    tresult PLUGIN_API getBusArrangement(BusDirection direction, int32 index, SpeakerArrangement &is) override
     {
-        arrangement = bus(direction, index);
+        is = m_buses[direction].at(std::size_t(index));
         return kResultOk;
     }
     tresult PLUGIN_API canProcessSampleSize(int32) override { return kResultOk; }
@@ -83,13 +80,8 @@ public:
     std::ostringstream offered;
 
 private:
-    static int32 mainBus(BusDirection direction) { return direction == kInput ? 1 : 0; }
-    SpeakerArrangement bus(BusDirection direction, int32 index) const
-    {
-        return m_buses[static_cast<std::size_t>(direction)][static_cast<std::size_t>(index)];
-    }
-
-    std::vector<std::vector<SpeakerArrangement>> m_buses = {{0x80000, 0x3, 0x7}, {0x3}};
+    std::map<BusDirection, std::vector<SpeakerArrangement>> m_buses = {{kInput, {0x80000, 0x3, 0x7}},
+                                                                       {kOutput, {0x3}}};
 };
 
 /// What a block makes of the input positions 10, 20, …: position and channel of the plug-in that it met, at
