@@ -22,21 +22,6 @@ void readTables(const PeImage &image, const QByteArray &input)
 
 } // namespace
 
-void fuzzElf(const QByteArray &input)
-{
-    const std::vector<uchar> bytes = bytesOf(input);
-    const ByteView view(bytes.data(), bytes.size());
-    const QString file = "module.so";
-    writeFuzzFile(file, input);
-    for (const QByteArray &name : kNames) {
-        const ExportAnswer answer = findElfExports(view, {name});
-        if (answer == ExportAnswer::Exported)
-            require(input.contains(name + '\0'), "what is exported stands in the file");
-        if (answer != ExportAnswer::Unknown)
-            require(findExports(file, {name}) == answer, "a file read by its pages says the same");
-    }
-}
-
 void fuzzPe(const QByteArray &input)
 {
     const std::vector<uchar> bytes = bytesOf(input);

@@ -14,12 +14,10 @@ enum class ExportAnswer {
 };
 
 /// Tells from its file, without running any of its code, whether a shared library exports one of these
-/// symbols. Libraries that it depends on do not count. Reads x86-64 ELF libraries and PE libraries for any
-/// machine; all other files, and those that are missing, special or damaged, give Unknown. Any thread may
-/// ask.
+/// symbols. Libraries that it depends on do not count. Reads PE libraries for any machine and, on Linux,
+/// x86-64 ELF libraries; the answer for any other file, and for one that is missing, special or damaged, is
+/// Unknown. Any thread may ask.
 ExportAnswer findExports(const QString &path, const std::vector<QByteArray> &names);
 
-/// The same for the content of an ELF file, of any alignment, that need not be trustworthy.
-ExportAnswer findElfExports(ByteView file, const std::vector<QByteArray> &names);
-/// The same for the content of a PE file.
+/// The same for the content of a PE file, of any alignment, which need not be trustworthy.
 ExportAnswer findPeExports(ByteView file, const std::vector<QByteArray> &names);

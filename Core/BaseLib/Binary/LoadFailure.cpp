@@ -11,6 +11,23 @@ namespace {
 /// No honest plug-in brings that many libraries along.
 constexpr int kMostLibraries = 200;
 
+/// What a machine type means for people.
+QString machineName(quint16 machine)
+{
+    switch (machine) {
+    case kPeMachineX86:
+        return QStringLiteral("32-bit x86");
+    case kPeMachineArm:
+        return QStringLiteral("32-bit ARM");
+    case kPeMachineArm64:
+        return QStringLiteral("64-bit ARM");
+    case kPeMachineItanium:
+        return QStringLiteral("Itanium");
+    default:
+        return formatText(L"another machine (type 0x%04X)", static_cast<unsigned>(machine));
+    }
+}
+
 /// Goes through a library and those that it needs, each once.
 class Diagnosis {
 public:
@@ -25,9 +42,9 @@ public:
             return {}; // the loader's words say it all
         const std::optional<PeImage> image = PeImage::read(file.content());
         if (!image)
-            return QStringLiteral("is no Windows library");
+            return QStringLiteral("is not a Windows library");
         if (image->machine() != kPeMachineX86_64)
-            return QStringLiteral("is built for ") + peMachineName(image->machine());
+            return QStringLiteral("is built for ") + machineName(image->machine());
         if (!image->isComplete())
             return QStringLiteral("is cut short or damaged");
         return ofImports(image->imports().value_or(QStringList()));
@@ -64,22 +81,4 @@ private:
 QString whyNotLoadable(const QString &path, const LibrarySearch &search)
 {
     return Diagnosis(search).of(path);
-}
-
-QString peMachineName(quint16 machine)
-{
-    switch (machine) {
-    case kPeMachineX86:
-        return QStringLiteral("32-bit x86");
-    case kPeMachineX86_64:
-        return QStringLiteral("64-bit x86");
-    case kPeMachineArm:
-        return QStringLiteral("32-bit ARM");
-    case kPeMachineArm64:
-        return QStringLiteral("ARM64");
-    case kPeMachineItanium:
-        return QStringLiteral("Itanium");
-    default:
-        return formatText(L"another machine (type 0x%04X)", static_cast<unsigned>(machine));
-    }
 }

@@ -15,6 +15,3 @@ using LibrarySearch = std::function<std::optional<QString>(const QString &name)>
 /// drums.dll, which is not found". Empty when nothing of this kind is wrong. Libraries that are only loaded
 /// when they are used are not looked at.
 QString whyNotLoadable(const QString &path, const LibrarySearch &search);
-
-/// What a PE file's machine type means for people: "32-bit x86".
-QString peMachineName(quint16 machine);

@@ -16,7 +16,6 @@ inline constexpr quint64 kDosNewHeader = 0x3c;        // where the 32-bit offset
 inline constexpr quint32 kPeMagic = 0x00004550;       // "PE", two zeros
 inline constexpr quint16 kPeOptionalMagic32 = 0x010b; // PE32
 inline constexpr quint16 kPeOptionalMagic64 = 0x020b; // PE32+
-inline constexpr quint16 kPeFlagDll = 0x2000;         // IMAGE_FILE_DLL
 inline constexpr quint64 kPePage = 4096;              // memory is filled from the file in such units
 /// More sections than this the loader takes from no file (PE format, "Number of sections").
 inline constexpr quint16 kMostPeSections = 96;

@@ -67,8 +67,6 @@ std::optional<PeImage> PeImage::read(ByteView file)
     const ByteView table = directories.from(sizeof(quint32));
     PeImage image;
     image.m_machine = found->header.machine;
-    image.m_is64Bit = found->is64Bit();
-    image.m_isDll = (found->header.flags & kPeFlagDll) != 0;
     image.m_directories = table.part(0, size).value_or(table);
     image.m_isComplete = image.addParts(file, found->optional, found->sections, found->header.sectionCount);
     return image;

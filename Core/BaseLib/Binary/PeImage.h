@@ -19,15 +19,12 @@ public:
 
     /// The processor it was built for, as the file header has it (IMAGE_FILE_MACHINE_...).
     quint16 machine() const { return m_machine; }
-    /// Whether it has the headers of 64-bit machines (PE32+).
-    bool is64Bit() const { return m_is64Bit; }
-    bool isDll() const { return m_isDll; }
     /// Whether all that the loader would take from the file is there. The tables of other files are all
     /// unreadable.
     bool isComplete() const { return m_isComplete; }
 
-    /// Whether it exports one of these names. A forwarder to another library is an export, one that has only
-    /// a number is none.
+    /// Whether it exports one of these names. A forwarder to another library counts, an export that has only
+    /// a number does not.
     ExportAnswer findExports(const std::vector<QByteArray> &names) const;
     /// The names of the libraries that the loader loads with it, in the order of the table; none when that is
     /// unreadable.
@@ -45,8 +42,6 @@ private:
     std::optional<QStringList> libraries(quint32 directoryIndex) const;
 
     quint16 m_machine = 0;
-    bool m_is64Bit = false;
-    bool m_isDll = false;
     bool m_isComplete = false;
     ByteView m_directories;
     LoadedParts m_parts;

@@ -1,33 +1,32 @@
 #include "Core/BaseLib/Binary/PluginLibrary.h"
 
-#include "Core/BaseLib/Binary/ElfFormat.h"
+#include "Core/BaseLib/Binary/PagedFile.h"
+#include "Core/BaseLib/Binary/PeFormat.h"
+#include "Core/BaseLib/Binary/posix/ElfTables.h"
 
 #include <QFile>
 
 #include <utility>
 
 #include <dlfcn.h>
+#include <elf.h>
 
 namespace {
 
-/// What a file was built for, where its first bytes say that it is not for this machine; else empty.
+/// What a file is, where its first bytes say that it is not for this machine; else empty.
 QString foreignKind(const QString &path)
 {
-    QFile file(path);
-    // Up to the end of e_machine, which lies at the same place in files of 32 and 64 bits.
-    const QByteArray start = file.open(QIODevice::ReadOnly) ? file.read(20) : QByteArray();
-    if (start.startsWith("MZ"))
+    PagedFile file(path);
+    if (file.content().item<quint16>(0) == kDosMagic)
         return QStringLiteral("a Windows library");
-    if (start.size() < 20 || !start.startsWith("\x7f"
-                                               "ELF"))
+    const std::optional<quint16> machine = elfMachine(file.content());
+    if (!machine || *machine == EM_X86_64)
         return QString();
-    // System V Application Binary Interface, chapter 4 "ELF header"; here of little-endian machines.
-    const int machine = static_cast<uchar>(start[18]) | static_cast<uchar>(start[19]) << 8;
-    for (const auto &[number, name] : {std::pair(3, "32-bit x86"), std::pair(40, "32-bit ARM"),
-                                       std::pair(183, "64-bit ARM"), std::pair(243, "RISC-V")})
-        if (machine == number)
+    for (const auto &[number, name] : {std::pair(EM_386, "32-bit x86"), std::pair(EM_ARM, "32-bit ARM"),
+                                       std::pair(EM_AARCH64, "64-bit ARM"), std::pair(EM_RISCV, "RISC-V")})
+        if (*machine == number)
             return QStringLiteral("built for ") + QLatin1String(name);
-    return machine == kElfMachineX86_64 ? QString() : QStringLiteral("built for another machine");
+    return QStringLiteral("built for another machine");
 }
 
 /// The loader tells files for other machines by what in them surprised it; for another processor's it even

@@ -1,4 +1,4 @@
-#include "Core/BaseLib/Binary/BinaryExports.h"
+#include "Core/BaseLib/Binary/posix/ElfTables.h"
 
 #include "Tests/Core/BaseLib/Files/Fixtures.h"
 #include "Tests/Support/TestFolder.h"

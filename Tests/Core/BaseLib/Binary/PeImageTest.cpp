@@ -53,7 +53,6 @@ constexpr int kDelayImports = kImports + 3 * 20 + 13 + 10; // behind two imports
 
 const Damage kDamages[] = {
     {"nothing", 0, 1, 'M', Answer::Exported, kAllLibraries},
-    {"no library", kFlags, 2, 2, Answer::Exported, kAllLibraries},
     {"without the PE magic", 0x40, 1, 'N'},
     {"neither 32-bit nor 64-bit", kOptionalHeader, 2, 0x107},
     {"optional header up to the directories", kOptionalHeaderSize, 2, 112},
@@ -158,14 +157,14 @@ TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
         {"late imports do not matter", {{}, {}, {"gone.dll"}}, ""},
         {"32-bit x86", {{}, {"gone.dll"}, {}, 0x014c, false}, "is built for 32-bit x86"},
         {"32-bit ARM", {{}, {}, {}, 0x01c4, false}, "is built for 32-bit ARM"},
-        {"ARM64", {{}, {}, {}, 0xaa64}, "is built for ARM64"},
+        {"ARM64", {{}, {}, {}, 0xaa64}, "is built for 64-bit ARM"},
         {"unheard of", {{}, {}, {}, 0x0bad}, "is built for another machine (type 0x0BAD)"},
         {"missing", {{}, {"ring1.dll", "gone.dll", "x.dll"}, {}}, "needs gone.dll, which is not found"},
         {"missing one level down",
          {{}, {"lacking.dll"}, {}},
          "needs lacking.dll, which needs gone.dll, which is not found"},
         {"needs another machine's", {{}, {"old.dll"}, {}}, "needs old.dll, which is built for 32-bit x86"},
-        {"needs a text", {{}, {"text.dll"}, {}}, "needs text.dll, which is no Windows library"},
+        {"needs a text", {{}, {"text.dll"}, {}}, "needs text.dll, which is not a Windows library"},
         {"needs a part", {{}, {"short.dll"}, {}}, "needs short.dll, which is cut short or damaged"},
         {"the loader knows about an empty file", {{}, {"empty.dll"}, {}}, ""},
     };

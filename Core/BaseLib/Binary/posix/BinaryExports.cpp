@@ -1,6 +1,7 @@
 #include "Core/BaseLib/Binary/BinaryExports.h"
 
 #include "Core/BaseLib/Binary/PagedFile.h"
+#include "Core/BaseLib/Binary/posix/ElfTables.h"
 
 ExportAnswer findExports(const QString &path, const std::vector<QByteArray> &names)
 {

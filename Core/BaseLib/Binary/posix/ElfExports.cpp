@@ -1,27 +1,43 @@
-#include "Core/BaseLib/Binary/BinaryExports.h"
+#include "Core/BaseLib/Binary/posix/ElfTables.h"
 
-#include "Core/BaseLib/Binary/ElfFormat.h"
-#include "Core/BaseLib/Binary/ElfTables.h"
+#include <elf.h>
 
 namespace {
 
-bool isExport(const ElfSymbol &symbol)
+/// Starts the table of DT_HASH. Follow: 32-bit symbol indexes, one per bucket, then one per symbol: the next
+/// of the same bucket. Index 0 ends a chain.
+struct HashHeader {
+    quint32 bucketCount;
+    quint32 symbolCount;
+};
+
+/// Starts the table of DT_GNU_HASH, which <elf.h> leaves out. Follow: the 64-bit words of a Bloom filter, the
+/// 32-bit index of each bucket's first symbol (0: empty), then, for each symbol from `firstSymbol` on, its
+/// 32-bit hash with the lowest bit set on the last symbol of its bucket.
+struct GnuHashHeader {
+    quint32 bucketCount;
+    quint32 firstSymbol;
+    quint32 filterSize; ///< in words; a power of two
+    quint32 filterShift;
+};
+
+bool isExport(const Elf64_Sym &symbol)
 {
-    const int binding = symbol.binding();
-    const int visibility = symbol.visibility();
-    return symbol.section != kElfSectionUndefined &&
-           (binding == kElfBindingGlobal || binding == kElfBindingWeak || binding == kElfBindingUnique) &&
-           (visibility == kElfVisibilityDefault || visibility == kElfVisibilityProtected);
+    const int binding = ELF64_ST_BIND(symbol.st_info);
+    const int visibility = ELF64_ST_VISIBILITY(symbol.st_other);
+    return symbol.st_shndx != SHN_UNDEF &&
+           (binding == STB_GLOBAL || binding == STB_WEAK || binding == STB_GNU_UNIQUE) &&
+           (visibility == STV_DEFAULT || visibility == STV_PROTECTED);
 }
 
 /// Whether the symbol at an index is an export of that name.
 ExportAnswer answerAt(const ElfTables &tables, quint64 index, const QByteArray &name)
 {
-    const auto symbol = tables.symbols.item<ElfSymbol>(index);
-    if (!symbol || symbol->name >= tables.strings.size())
+    const auto symbol = tables.symbols.item<Elf64_Sym>(index);
+    if (!symbol || symbol->st_name >= tables.strings.size())
         return ExportAnswer::Unknown;
-    return tables.strings.holdsText(symbol->name, name) && isExport(*symbol) ? ExportAnswer::Exported
-                                                                             : ExportAnswer::NotExported;
+    return tables.strings.holdsText(symbol->st_name, name) && isExport(*symbol) ? ExportAnswer::Exported
+                                                                                : ExportAnswer::NotExported;
 }
 
 quint32 hashOf(const QByteArray &name)
@@ -37,10 +53,10 @@ quint32 hashOf(const QByteArray &name)
 
 ExportAnswer findByHash(const ElfTables &tables, const QByteArray &name)
 {
-    const auto header = tables.hash.item<ElfHashHeader>(0);
+    const auto header = tables.hash.item<HashHeader>(0);
     if (!header || header->bucketCount == 0)
         return ExportAnswer::Unknown;
-    const ByteView buckets = tables.hash.from(sizeof(ElfHashHeader));
+    const ByteView buckets = tables.hash.from(sizeof(HashHeader));
     const ByteView chains = buckets.from(quint64(header->bucketCount) * sizeof(quint32));
     auto index = buckets.item<quint32>(hashOf(name) % header->bucketCount);
     // A chain that leads to more symbols than the table holds goes in circles.
@@ -82,7 +98,7 @@ ExportAnswer findInGnuChain(const ElfTables &tables, ByteView chains, quint64 fi
 }
 
 /// Whether the Bloom filter lets a hash pass; none when the filter cannot be read.
-std::optional<bool> passesFilter(ByteView filter, const ElfGnuHashHeader &header, quint32 hash)
+std::optional<bool> passesFilter(ByteView filter, const GnuHashHeader &header, quint32 hash)
 {
     const bool isPowerOfTwo = header.filterSize != 0 && (header.filterSize & (header.filterSize - 1)) == 0;
     if (!isPowerOfTwo || header.filterShift >= 32)
@@ -95,11 +111,11 @@ std::optional<bool> passesFilter(ByteView filter, const ElfGnuHashHeader &header
 
 ExportAnswer findByGnuHash(const ElfTables &tables, const QByteArray &name)
 {
-    const auto header = tables.hash.item<ElfGnuHashHeader>(0);
+    const auto header = tables.hash.item<GnuHashHeader>(0);
     if (!header || header->bucketCount == 0)
         return ExportAnswer::Unknown;
     const quint32 hash = gnuHashOf(name);
-    const ByteView filter = tables.hash.from(sizeof(ElfGnuHashHeader));
+    const ByteView filter = tables.hash.from(sizeof(GnuHashHeader));
     const std::optional<bool> passes = passesFilter(filter, *header, hash);
     const ByteView buckets = filter.from(quint64(header->filterSize) * sizeof(quint64));
     const auto first = buckets.item<quint32>(hash % header->bucketCount);
