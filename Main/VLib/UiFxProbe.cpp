@@ -14,6 +14,7 @@
 #include <QCoreApplication>
 #include <QLabel>
 #include <QProgressBar>
+#include <QScopeGuard>
 #include <QTimer>
 #include <QVBoxLayout>
 
@@ -28,21 +29,6 @@ constexpr int kHeight = 80;
 constexpr int kTickMilliseconds = 50;
 constexpr std::chrono::milliseconds kPollInterval(10);
 constexpr wchar_t kThreadEnded[] = L"The scan's thread was ended by a plug-in";
-
-/// Calls back when it goes out of scope, also while the stack is unwound.
-template <typename Callback>
-class AtScopeEnd {
-public:
-    explicit AtScopeEnd(Callback callback)
-        : m_callback(std::move(callback))
-    {}
-    ~AtScopeEnd() { m_callback(); }
-    AtScopeEnd(const AtScopeEnd &) = delete;
-    AtScopeEnd &operator=(const AtScopeEnd &) = delete;
-
-private:
-    Callback m_callback;
-};
 
 /// With the screen the user's session is over: the scan ends as on any other request, and no plug-in is to
 /// blame.
@@ -162,7 +148,7 @@ void UiFxProbe::setUpProgressBar()
 // The exception of a forced unwind has no object, so the reference to it is null; that is the compiler's way.
 [[gnu::no_sanitize("null")]] void UiFxProbe::runScan(const std::function<void(const QString &)> &scanRun)
 {
-    const AtScopeEnd finished([this] { markFinished(); });
+    const auto finished = qScopeGuard([this] { markFinished(); });
     try {
         scanRun(m_dataFolder);
     } catch (const abi::__forced_unwind &) {

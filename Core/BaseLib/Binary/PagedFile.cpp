@@ -1,10 +1,20 @@
 #include "Core/BaseLib/Binary/PagedFile.h"
 
+#include <QFileInfo>
+
 #include <algorithm>
 #include <cstring>
 
 namespace {
 constexpr int kPageSize = 4096; ///< bytes
+}
+
+PagedFile::PagedFile(const QString &path)
+    : m_file(path)
+{
+    // Opening a pipe would wait for somebody to write into it.
+    if (QFileInfo(path).isFile() && m_file.open(QIODevice::ReadOnly | QIODevice::Unbuffered))
+        m_size = static_cast<quint64>(m_file.size());
 }
 
 bool PagedFile::read(quint64 offset, void *target, quint64 size)
@@ -28,7 +38,7 @@ bool PagedFile::read(quint64 offset, void *target, quint64 size)
 const QByteArray &PagedFile::page(quint64 number)
 {
     const auto [place, isNew] = m_pages.try_emplace(number);
-    if (isNew)
-        place->second = m_file.readAt(number * kPageSize, kPageSize);
+    if (isNew && m_file.seek(static_cast<qint64>(number * kPageSize)))
+        place->second = m_file.read(kPageSize);
     return place->second;
 }

@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/Files/NativeFile.h"
 
+#include <QDateTime>
 #include <QFileInfo>
 
 #include <cstdio>
@@ -36,4 +37,11 @@ FileStamp fileStamp(const QString &path)
     if (!file.exists())
         return {};
     return {modifiedNanoseconds(path), file.size()};
+}
+
+void touchFile(const QString &path)
+{
+    QFile file(path);
+    if (file.open(QIODevice::ReadWrite | QIODevice::ExistingOnly))
+        file.setFileTime(QDateTime::currentDateTimeUtc(), QFileDevice::FileModificationTime);
 }

@@ -20,3 +20,6 @@ struct FileStamp {
 };
 
 FileStamp fileStamp(const QString &path);
+
+/// Sets the modification time of an existing file to now, in milliseconds; nothing else of it changes.
+void touchFile(const QString &path);

@@ -4,7 +4,6 @@
 
 #include <QString>
 
-#include <cstdio>
 #include <optional>
 
 /// Whether file names that differ in nothing but case are two.
@@ -36,8 +35,6 @@ inline QString pathKey(const QString &path)
     return kPathCase == Qt::CaseSensitive ? path : path.toCaseFolded();
 }
 
-/// fopen for a path with any characters; null when it fails.
-std::FILE *openStream(const QString &path, const char *mode);
 /// Renames a file over an existing one in one step.
 FileResult renameOver(const QString &from, const QString &to);
 /// Deletes a file; one that is not there is no fault.
@@ -52,8 +49,6 @@ bool leadsBack(const QString &folder);
 bool cannotBeExamined(const QString &path);
 /// Whether the system takes the name for a device, whatever folder and ending it stands with.
 bool isDeviceName(const QString &name);
-/// Sets a file's modification time to now.
-void touchFile(const QString &path);
 /// What a moment is called in the local time zone.
 struct CalendarTime {
     int year, month, day, hour, minute;

@@ -1,33 +1,27 @@
 #include "Core/BaseLib/Log/LogSink.h"
 
-#include "Core/BaseLib/Files/NativeFile.h"
-
 std::shared_ptr<FileLogSink> FileLogSink::onStandardError()
 {
-    return std::make_shared<FileLogSink>(stderr, false);
+    auto sink = std::make_shared<FileLogSink>();
+    sink->m_file.open(stderr, QIODevice::WriteOnly); // in the text mode of the C stream
+    return sink;
 }
 
 std::shared_ptr<FileLogSink> FileLogSink::appendingTo(const QString &path)
 {
-    std::FILE *stream = openStream(path, "a");
-    return stream ? std::make_shared<FileLogSink>(stream, true) : nullptr;
-}
-
-FileLogSink::FileLogSink(std::FILE *stream, bool ownsStream)
-    : m_stream(stream)
-    , m_ownsStream(ownsStream)
-{}
-
-FileLogSink::~FileLogSink()
-{
-    if (m_ownsStream)
-        std::fclose(m_stream);
+    auto sink = std::make_shared<FileLogSink>();
+    sink->m_file.setFileName(path);
+    const bool isOpen = sink->m_file.open(QIODevice::WriteOnly | QIODevice::Append | QIODevice::Text);
+    return isOpen ? sink : nullptr;
 }
 
 void FileLogSink::write(int, const QString &line)
 {
-    const QByteArray bytes = line.toUtf8() + '\n'; // the stream's text mode makes it the platform's
+    const QByteArray bytes = line.toUtf8() + '\n';
     const std::lock_guard<std::mutex> lock(m_mutex);
-    std::fwrite(bytes.constData(), 1, static_cast<std::size_t>(bytes.size()), m_stream);
-    std::fflush(m_stream);
+    // NOTE: On Windows Qt goes to the end only once, and the workstation may write to the same file.
+    if (!m_file.isSequential() && (m_file.openMode() & QIODevice::Append) != 0)
+        m_file.seek(m_file.size());
+    m_file.write(bytes);
+    m_file.flush();
 }

@@ -1,8 +1,8 @@
 #pragma once
 
+#include <QFile>
 #include <QString>
 
-#include <cstdio>
 #include <memory>
 #include <mutex>
 
@@ -14,23 +14,16 @@ public:
     virtual void write(int level, const QString &line) = 0;
 };
 
-/// Writes lines as UTF-8 to a C stream, each in one piece and flushed, so that the last line before a crash
-/// is there.
+/// Writes lines as UTF-8, each in one piece and flushed, so that the last line before a crash is there.
 class FileLogSink : public LogSink {
 public:
     static std::shared_ptr<FileLogSink> onStandardError();
     /// Null when the file cannot be opened.
     static std::shared_ptr<FileLogSink> appendingTo(const QString &path);
 
-    FileLogSink(std::FILE *stream, bool ownsStream);
-    ~FileLogSink() override;
-    FileLogSink(const FileLogSink &) = delete;
-    FileLogSink &operator=(const FileLogSink &) = delete;
-
     void write(int level, const QString &line) override;
 
 private:
-    std::FILE *m_stream;
-    bool m_ownsStream;
+    QFile m_file;
     std::mutex m_mutex;
 };

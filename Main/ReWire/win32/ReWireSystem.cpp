@@ -1,5 +1,7 @@
 #include "Main/ReWire/ReWireSystem.h"
 
+#include <QScopeGuard>
+
 #include <vector>
 
 #include <windows.h>
@@ -8,19 +10,11 @@
 
 namespace {
 
-/// What the system may show to the user, for the life of the object.
-class ErrorMode {
-public:
-    explicit ErrorMode(UINT mode)
-        : m_before(SetErrorMode(mode))
-    {}
-    ~ErrorMode() { SetErrorMode(m_before); }
-    ErrorMode(const ErrorMode &) = delete;
-    ErrorMode &operator=(const ErrorMode &) = delete;
-
-private:
-    UINT m_before;
-};
+/// Sets what the system may show to the user until the result goes out of scope.
+auto scopedErrorMode(UINT mode)
+{
+    return qScopeGuard([before = SetErrorMode(mode)] { SetErrorMode(before); });
+}
 
 class WindowsReWire : public ReWireSystem {
 public:
@@ -57,7 +51,7 @@ std::optional<std::string> WindowsReWire::commonFilesFolder()
 
 void *WindowsReWire::load(const std::string &path)
 {
-    const ErrorMode silent(SEM_FAILCRITICALERRORS);
+    const auto silent = scopedErrorMode(SEM_FAILCRITICALERRORS);
     return LoadLibraryA(path.c_str());
 }
 
@@ -77,7 +71,7 @@ std::optional<std::string> WindowsReWire::pathOf(void *library)
 
 std::optional<quint32> WindowsReWire::fileVersion(const std::string &path)
 {
-    const ErrorMode silent(SEM_NOOPENFILEERRORBOX);
+    const auto silent = scopedErrorMode(SEM_NOOPENFILEERRORBOX);
     DWORD ignored = 0;
     const DWORD size = GetFileVersionInfoSizeA(path.c_str(), &ignored);
     std::vector<char> resource(size);

@@ -4,20 +4,9 @@
 #include "Core/BaseLib/Files/win32/WindowsText.h"
 
 #include <QFileInfo>
+#include <QScopeGuard>
 
 namespace {
-
-/// While it lives, a damaged file or a missing library brings up no box of the system on this thread.
-class NoErrorBoxes {
-public:
-    NoErrorBoxes() { SetThreadErrorMode(GetThreadErrorMode() | SEM_FAILCRITICALERRORS, &m_before); }
-    ~NoErrorBoxes() { SetThreadErrorMode(m_before, nullptr); }
-    NoErrorBoxes(const NoErrorBoxes &) = delete;
-    NoErrorBoxes &operator=(const NoErrorBoxes &) = delete;
-
-private:
-    DWORD m_before = 0;
-};
 
 /// What the file itself tells beyond the system's words, which name neither machine nor missing library.
 QString foundInFile(const QString &path, const QString &firstFolder)
@@ -37,7 +26,10 @@ void *PluginLibrary::loadUncached(const QString &path) noexcept
         m_errorText = QStringLiteral("no path given");
         return nullptr;
     }
-    const NoErrorBoxes quiet;
+    // So that a damaged file or a missing library opens no system box.
+    const DWORD errorMode = GetThreadErrorMode();
+    SetThreadErrorMode(errorMode | SEM_FAILCRITICALERRORS, nullptr);
+    const auto restore = qScopeGuard([errorMode] { SetThreadErrorMode(errorMode, nullptr); });
     const std::wstring native = nativePath(path);
     HMODULE module = nullptr;
     if (searchDllLoadDir)

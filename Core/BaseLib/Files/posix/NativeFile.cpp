@@ -4,18 +4,13 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
 #include <ctime>
 #include <limits>
 
-#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
-
-std::FILE *openStream(const QString &path, const char *mode)
-{
-    return std::fopen(QFile::encodeName(path).constData(), mode);
-}
 
 FileResult renameOver(const QString &from, const QString &to)
 {
@@ -42,8 +37,6 @@ bool cannotBeExamined(const QString &path)
 bool isDeviceName(const QString &) { return false; } // devices are files
 
 void syncToDisk(int fileDescriptor) { fsync(fileDescriptor); }
-
-void touchFile(const QString &path) { utimensat(AT_FDCWD, QFile::encodeName(path).constData(), nullptr, 0); }
 
 std::optional<FileStatus> fileStatus(const QString &path)
 {

@@ -1,5 +1,6 @@
 #include "Core/BaseLib/Files/NativeFile.h"
 
+#include "Core/BaseLib/Files/win32/WindowsHandle.h"
 #include "Core/BaseLib/Files/win32/WindowsText.h"
 
 #include <QDateTime>
@@ -22,27 +23,13 @@ constexpr DWORD kPause = 10;      ///< ms
 constexpr qint64 kEpoch = 116444736000000000;
 constexpr qint64 kNanosecondsPerUnit = 100;
 
-class FileHandle {
-public:
-    FileHandle(const QString &path, DWORD access)
-        : m_handle(CreateFileW(nativePath(path).c_str(), access,
-                               FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr, OPEN_EXISTING,
-                               FILE_FLAG_BACKUP_SEMANTICS, nullptr)) // for folders too
-    {}
-    ~FileHandle()
-    {
-        if (isOpen())
-            CloseHandle(m_handle);
-    }
-    FileHandle(const FileHandle &) = delete;
-    FileHandle &operator=(const FileHandle &) = delete;
-
-    bool isOpen() const { return m_handle != INVALID_HANDLE_VALUE; }
-    HANDLE get() const { return m_handle; }
-
-private:
-    HANDLE m_handle;
-};
+/// Opens a file or a folder to ask for what the system keeps of it.
+WindowsHandle openForAttributes(const QString &path)
+{
+    return WindowsHandle(CreateFileW(nativePath(path).c_str(), FILE_READ_ATTRIBUTES,
+                                     FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
+                                     OPEN_EXISTING, FILE_FLAG_BACKUP_SEMANTICS, nullptr)); // for folders too
+}
 
 bool isHeldByOthers(DWORD error) { return error == ERROR_SHARING_VIOLATION || error == ERROR_ACCESS_DENIED; }
 
@@ -68,9 +55,9 @@ using FileIdentity = std::tuple<DWORD, DWORD, DWORD>;
 
 std::optional<FileIdentity> identityOf(const QString &path)
 {
-    const FileHandle file(path, FILE_READ_ATTRIBUTES);
+    const WindowsHandle file = openForAttributes(path);
     BY_HANDLE_FILE_INFORMATION information = {};
-    if (!file.isOpen() || !GetFileInformationByHandle(file.get(), &information))
+    if (!file.isValid() || !GetFileInformationByHandle(file.get(), &information))
         return std::nullopt;
     return FileIdentity(information.dwVolumeSerialNumber, information.nFileIndexHigh,
                         information.nFileIndexLow);
@@ -89,11 +76,6 @@ qint64 unitsOf(const FILETIME &time)
 }
 
 } // namespace
-
-std::FILE *openStream(const QString &path, const char *mode)
-{
-    return _wfopen(nativePath(path).c_str(), QString::fromLatin1(mode).toStdWString().c_str());
-}
 
 FileResult renameOver(const QString &from, const QString &to)
 {
@@ -135,15 +117,6 @@ bool leadsBack(const QString &folder)
 
 void syncToDisk(int fileDescriptor) { _commit(fileDescriptor); }
 
-void touchFile(const QString &path)
-{
-    const FileHandle file(path, FILE_WRITE_ATTRIBUTES);
-    FILETIME now = {};
-    GetSystemTimeAsFileTime(&now);
-    if (file.isOpen())
-        SetFileTime(file.get(), nullptr, nullptr, &now);
-}
-
 std::optional<FileStatus> fileStatus(const QString &path)
 {
     const QFileInfo file(path);
@@ -161,9 +134,9 @@ std::optional<FileStatus> fileStatus(const QString &path)
 
 qint64 modifiedNanoseconds(const QString &path)
 {
-    const FileHandle file(path, FILE_READ_ATTRIBUTES);
+    const WindowsHandle file = openForAttributes(path);
     FILETIME modified = {};
-    if (!file.isOpen() || !GetFileTime(file.get(), nullptr, nullptr, &modified))
+    if (!file.isValid() || !GetFileTime(file.get(), nullptr, nullptr, &modified))
         return -1;
     // 64 bits of nanoseconds end in 2262, file systems later; a time beyond counts as the last one.
     constexpr qint64 kLast = std::numeric_limits<qint64>::max() / kNanosecondsPerUnit;

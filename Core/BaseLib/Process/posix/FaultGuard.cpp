@@ -13,14 +13,27 @@ namespace {
 constexpr std::size_t kHandlerStackSize = std::size_t(256) * 1024;
 constexpr int kFaultSignals[] = {SIGSEGV, SIGBUS, SIGFPE, SIGILL};
 
-/// One guarded call in progress on this thread.
+/// One guarded call in progress; the innermost one of its thread while it lives.
 struct Guard {
+    Guard();
+    ~Guard();
+    Guard(const Guard &) = delete;
+    Guard &operator=(const Guard &) = delete;
+
     sigjmp_buf context;
     volatile quint32 code = 0; ///< of the fault that came, or 0
-    Guard *outer = nullptr;
+    Guard *outer;
 };
 
 thread_local Guard *t_innermost = nullptr;
+
+Guard::Guard()
+    : outer(t_innermost)
+{
+    t_innermost = this;
+}
+
+Guard::~Guard() { t_innermost = outer; }
 
 /// The stack that this thread's handler runs on: after an overflow the thread's own has no room left.
 class HandlerStack {
@@ -84,19 +97,6 @@ void arm()
     pthread_sigmask(SIG_UNBLOCK, &signals, nullptr);
 }
 
-/// Makes a guard the innermost one of its thread for a scope.
-class Nesting {
-public:
-    explicit Nesting(Guard &guard)
-    {
-        guard.outer = t_innermost;
-        t_innermost = &guard;
-    }
-    ~Nesting() { t_innermost = t_innermost->outer; }
-    Nesting(const Nesting &) = delete;
-    Nesting &operator=(const Nesting &) = delete;
-};
-
 } // namespace
 
 void FaultGuardDetail::run(Watch watch, void (*function)(void *), void *argument)
@@ -108,7 +108,6 @@ void FaultGuardDetail::run(Watch watch, void (*function)(void *), void *argument
     }
     arm();
     Guard guard;
-    const Nesting nesting(guard);
     // The handler comes back here; the exception starts in this frame, so that no frame of the plug-in is
     // unwound.
     if (sigsetjmp(guard.context, 1) == 0)

@@ -1,9 +1,9 @@
 #include "Core/BaseLib/Process/ThreadCount.h"
 
+#include "Core/BaseLib/Files/win32/WindowsHandle.h"
+
 #include <algorithm>
 #include <iterator>
-
-#include <windows.h>
 
 #include <tlhelp32.h>
 #include <winternl.h>
@@ -11,27 +11,6 @@
 namespace {
 
 constexpr auto kStartAddress = static_cast<THREADINFOCLASS>(9); // ThreadQuerySetWin32StartAddress
-
-/// Closes a handle at the end of a scope.
-class Handle {
-public:
-    explicit Handle(HANDLE handle)
-        : m_handle(handle)
-    {}
-    ~Handle()
-    {
-        if (isValid())
-            CloseHandle(m_handle);
-    }
-    Handle(const Handle &) = delete;
-    Handle &operator=(const Handle &) = delete;
-
-    bool isValid() const { return m_handle && m_handle != INVALID_HANDLE_VALUE; }
-    HANDLE get() const { return m_handle; }
-
-private:
-    HANDLE m_handle;
-};
 
 HMODULE moduleAt(const void *address)
 {
@@ -47,7 +26,7 @@ constexpr const wchar_t *kEmployers[] = {L"ntdll.dll", L"rpcrt4.dll", L"combase.
 
 bool isTheSystems(DWORD id)
 {
-    const Handle thread(OpenThread(THREAD_QUERY_INFORMATION, FALSE, id));
+    const WindowsHandle thread(OpenThread(THREAD_QUERY_INFORMATION, FALSE, id));
     const void *start = nullptr;
     if (!thread.isValid() ||
         NtQueryInformationThread(thread.get(), kStartAddress, &start, sizeof start, nullptr) < 0)
@@ -62,7 +41,7 @@ bool isTheSystems(DWORD id)
 std::set<int> runningThreads()
 {
     std::set<int> threads;
-    const Handle snapshot(CreateToolhelp32Snapshot(TH32CS_SNAPTHREAD, 0));
+    const WindowsHandle snapshot(CreateToolhelp32Snapshot(TH32CS_SNAPTHREAD, 0));
     const DWORD process = GetCurrentProcessId();
     THREADENTRY32 entry = {};
     entry.dwSize = sizeof entry;
@@ -77,7 +56,7 @@ std::set<int> runningThreads()
 
 bool isProcessRunning(qint64 process)
 {
-    const Handle found(OpenProcess(SYNCHRONIZE, FALSE, static_cast<DWORD>(process)));
+    const WindowsHandle found(OpenProcess(SYNCHRONIZE, FALSE, static_cast<DWORD>(process)));
     if (!found.isValid())
         return GetLastError() == ERROR_ACCESS_DENIED;
     return WaitForSingleObject(found.get(), 0) == WAIT_TIMEOUT; // it may be held open after its end

@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/Host/ProbeBracket.h"
 
-#include "Core/BaseLib/Files/NativeFile.h"
+#include "Core/BaseLib/Files/FileTime.h"
 #include "Core/BaseLib/Process/PluginThread.h"
 #include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
