@@ -8,7 +8,6 @@
 #include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
-#include "Tests/Core/BaseLib/Binary/PeBuilder.h"
 
 #include <QDir>
 #include <QFile>
@@ -141,11 +140,7 @@ BENCHMARK(elfExports);
 
 void peExports(benchmark::State &state)
 {
-    PeContent content;
-    content.exports = {"GetPluginFactory", "InitDll", "ExitDll"};
-    const QTemporaryDir folder;
-    const QString path = folder.filePath(QStringLiteral("plugin.dll"));
-    write(path, PeBuilder(content).build());
+    const QString path = QStringLiteral(FXPROBE_BENCH_WINDOWS_MODULE);
     while (state.KeepRunning())
         benchmark::DoNotOptimize(findExports(path, {"VSTPluginMain", "main"}));
 }

@@ -1,18 +1,17 @@
 #include "Core/BaseLib/Files/FileFinder.h"
 
-#include "Tests/Core/BaseLib/Files/Fixtures.h"
 #include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
-QStringList pathsIn(const EmptyFolder &folder, const QStringList &names)
+/// What a finder answers, seen from "Plugins" and joined by bars.
+QString found(FileFinder &finder, const TestFolder &folder, const QString &ending,
+              const FileFinder::Cancelled &isCancelled = nullptr)
 {
-    QStringList paths;
-    for (const QString &name : names)
-        paths.append(folder.path(name));
-    return paths;
+    return finder.find(folder.plugins(), ending, isCancelled).join('|').remove(folder.plugins() + '/');
 }
 
 } // namespace
@@ -20,45 +19,40 @@ QStringList pathsIn(const EmptyFolder &folder, const QStringList &names)
 TEST(FileFinder, ListsAFolderByNameAndThenWhatLiesBelow)
 {
     const CapturedLog log;
-    const EmptyFolder folder;
+    const TestFolder folder;
     const QString tree =
         "sub/deep/z.vst3|sub/a.vst3|b.vst3|A.VST3|C.vst3/Contents/C.so|C.vst3/Contents/inner.vst3|🎸.vst3|"
-        "残響/残響.vst3|a %1 [x].vst3|.hidden.vst3|.hidden/x.vst3|x.vst3.bak|vst3|x.dll|none/x.txt"_q;
-    for (const QString &name : tree.split(QLatin1Char('|')))
-        folder.write(name);
-    const QStringList expected = pathsIn(folder, {"a %1 [x].vst3"_q, "A.VST3"_q, "b.vst3"_q, "C.vst3"_q,
-                                                  "🎸.vst3"_q, "C.vst3/Contents/inner.vst3"_q, "sub/a.vst3"_q,
-                                                  "sub/deep/z.vst3"_q, "残響/残響.vst3"_q});
-    EXPECT_EQ(findFiles(folder.path(), ".vst3"_q), expected);
-    EXPECT_EQ(findFiles(folder.path("sub/..//"_q), ".vst3"_q), expected);
-    EXPECT_EQ(findFiles(folder.path(), ".DLL"_q), pathsIn(folder, {"x.dll"_q}));
-    EXPECT_EQ(findFiles(folder.path(), ".scan"_q), QStringList());
-    EXPECT_EQ(log.lines(), QStringList()) << "folders that merely hold nothing are no fault";
+        "残響/残響.vst3|a %1 [x].vst3|.hidden.vst3|.hidden/x.vst3|x.vst3.bak|vst3|x.dll|none/x.txt";
+    for (const QString &name : tree.split('|'))
+        folder.write("Plugins/" + name, "");
+    FileFinder finder({".vst3", ".dll", ".scan"});
+    EXPECT_EQ(found(finder, folder, ".vst3"),
+              "a %1 [x].vst3|A.VST3|b.vst3|C.vst3|🎸.vst3|C.vst3/Contents/inner.vst3|sub/a.vst3|"
+              "sub/deep/z.vst3|残響/残響.vst3");
+    folder.write("Plugins/later.dll", "");
+    EXPECT_EQ(found(finder, folder, ".DLL"), "x.dll") << "one walk for all endings";
+    EXPECT_EQ(found(finder, folder, ".scan"), "");
+    EXPECT_EQ(log.lines(), QStringList()) << "a folder that merely holds nothing is not reported";
 }
 
 TEST(FileFinder, CancelIsAskedBeforeEachFolder)
 {
-    const EmptyFolder folder;
-    folder.write("a.vst3"_q);
-    folder.write("b/b.vst3"_q);
-    folder.write("c/c.vst3"_q);
-    FileFinder finder({".vst3"_q});
+    const TestFolder folder;
+    for (const char *name : {"Plugins/a.vst3", "Plugins/b/b.vst3", "Plugins/c/c.vst3"})
+        folder.write(name, "");
+    FileFinder finder({".vst3"});
     int asked = 0;
-    EXPECT_EQ(finder.find(folder.path(), ".vst3"_q, [&asked] { return ++asked > 2; }),
-              pathsIn(folder, {"a.vst3"_q, "b/b.vst3"_q}));
-    EXPECT_EQ(finder.find(folder.path(), ".vst3"_q),
-              pathsIn(folder, {"a.vst3"_q, "b/b.vst3"_q, "c/c.vst3"_q}))
-        << "a search that was cancelled is no answer";
+    EXPECT_EQ(found(finder, folder, ".vst3", [&asked] { return ++asked > 2; }), "a.vst3|b/b.vst3");
+    EXPECT_EQ(found(finder, folder, ".vst3"), "a.vst3|b/b.vst3|c/c.vst3")
+        << "a cancelled search is no answer";
 }
 
-TEST(FileFinder, WalksOnceForAllEndings)
+TEST(FileFinder, AFolderThatCannotBeSearchedIsReportedOnce)
 {
-    const EmptyFolder folder;
-    folder.write("a/a.vst3"_q);
-    folder.write("a/a.so"_q);
-    FileFinder finder({".vst3"_q, ".so"_q});
-    EXPECT_EQ(finder.find(folder.path(), ".vst3"_q), pathsIn(folder, {"a/a.vst3"_q}));
-    folder.write("a/later.so"_q);
-    EXPECT_EQ(finder.find(folder.path(), ".so"_q), pathsIn(folder, {"a/a.so"_q}));
-    EXPECT_EQ(findFiles(folder.path(), ".so"_q), pathsIn(folder, {"a/a.so"_q, "a/later.so"_q}));
+    const CapturedLog log;
+    FileFinder::forgetReports();
+    for (const char *folder : {"", "/no/such/folder"}) {
+        EXPECT_EQ(findFiles(folder, ".vst3") + findFiles(folder, ".vst3"), QStringList());
+    }
+    EXPECT_EQ(log.lines().size(), 2);
 }

@@ -1,6 +1,6 @@
-#include "Core/BaseLib/Process/ProcessState.h"
+#include "Tests/Core/BaseLib/Process/SpoiledState.h"
 
-#include "Tests/Core/BaseLib/Files/Fixtures.h"
+#include <QDir>
 
 #include <cfenv>
 #include <clocale>
@@ -12,14 +12,19 @@
 #include <objbase.h>
 #include <xmmintrin.h>
 
-#include <gtest/gtest.h>
-
 namespace {
 
 LONG WINAPI endAtOnce(EXCEPTION_POINTERS *) { return EXCEPTION_EXECUTE_HANDLER; }
 void ignoreParameter(const wchar_t *, const wchar_t *, const wchar_t *, unsigned, uintptr_t) {}
 
-/// All that a plug-in might spoil, as one text that a failing row shows.
+} // namespace
+
+void prepareState()
+{
+    std::setlocale(LC_ALL, "English_United States.1252");
+    CoInitializeEx(nullptr, COINIT_APARTMENTTHREADED);
+}
+
 std::string wholeState()
 {
     std::ostringstream state;
@@ -45,14 +50,9 @@ std::string wholeState()
     return state.str();
 }
 
-} // namespace
-
-TEST(ProcessState, PutsBackWhatAPluginSpoils)
+std::vector<Spoiling> spoilings()
 {
-    const struct {
-        const char *name;
-        void (*spoil)();
-    } rows[] = {
+    return {
         {"C locale", [] { std::setlocale(LC_ALL, "C"); }},
         {"the thread's own locale",
          [] {
@@ -72,16 +72,4 @@ TEST(ProcessState, PutsBackWhatAPluginSpoils)
         {"boxes of the run-time library", [] { _set_error_mode(_OUT_TO_MSGBOX); }},
         {"COM apartment", [] { CoUninitialize(); }},
     };
-    const LocaleScope english("English_United States.1252"); // one that the first row can leave
-    ASSERT_EQ(CoInitializeEx(nullptr, COINIT_APARTMENTTHREADED), S_OK);
-    const std::string before = wholeState();
-    const ProcessState state;
-    EXPECT_EQ(wholeState(), before) << "taking the state changed it";
-    for (const auto &row : rows) {
-        row.spoil();
-        EXPECT_NE(wholeState(), before) << row.name << " spoils nothing that this test sees";
-        state.restore();
-        EXPECT_EQ(wholeState(), before) << row.name;
-    }
-    CoUninitialize();
 }

@@ -5,19 +5,15 @@
 #include <functional>
 #include <string>
 
-/// Faults to commit under a guard, and what came of them.
-namespace FaultGuardTrials {
-
 #ifdef _WIN32
 inline constexpr char kOverflowOutcome[] = "SE Exception: 0xC00000FD";
 #else
 inline constexpr char kOverflowOutcome[] = "SE Exception: Access Violation";
 #endif
 
-// Faults are committed through volatile values, so that the compiler cannot see and remove them.
-inline volatile int g_zero = 0;
-inline volatile int g_seven = 7;
-inline int *volatile g_nowhere = nullptr;
+inline int *volatile g_nowhere = nullptr; ///< volatile, so that the compiler cannot see and remove the fault
+
+[[gnu::no_sanitize("all")]] inline void writeNowhere() { *g_nowhere = 1; }
 
 [[gnu::noinline]] inline int overflowStack(int depth)
 {
@@ -25,8 +21,6 @@ inline int *volatile g_nowhere = nullptr;
     block[depth % 4096] = char(depth);
     return depth < 0 ? 0 : overflowStack(depth + 1) + block[0];
 }
-
-[[gnu::no_sanitize("all")]] inline void writeNowhere() { *g_nowhere = 1; }
 
 /// What came of a guarded call.
 inline std::string outcome(const std::function<void()> &function)
@@ -44,5 +38,3 @@ inline std::string outcome(const std::function<void()> &function)
     }
     return "returned";
 }
-
-} // namespace FaultGuardTrials

@@ -1,0 +1,2 @@
+int answer(void);
+int answer(void) { return 42; }
