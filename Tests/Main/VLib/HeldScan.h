@@ -13,7 +13,7 @@
 class HeldScan {
 public:
     HeldScan()
-        : dialog(QString(), [this](const QString &) { m_letGo.waitFor(kLongest); })
+        : dialog(QString(), [this](const QString &) { m_letGo.waitFor(std::chrono::hours(1)); })
     {}
     ~HeldScan() { m_letGo.set(); }
 
@@ -25,11 +25,10 @@ public:
             std::this_thread::yield();
     }
     void tick() { QMetaObject::invokeMethod(&dialog, "OnTimer"); }
-    QString text() const { return dialog.findChild<QLabel *>("label")->text(); }
+    QLabel &label() const { return *dialog.findChild<QLabel *>("label"); }
     QProgressBar &bar() const { return *dialog.findChild<QProgressBar *>("progressBar"); }
 
 private:
-    static constexpr std::chrono::minutes kLongest{1};
     ManualResetEvent m_letGo;
 
 public:
