@@ -9,8 +9,8 @@ constexpr char kFolderBelowCommonFiles[] = "\\Propellerhead Software\\ReWire\\";
 /// MAX_PATH of Windows.
 constexpr size_t kPathBuffer = 260;
 
-/// None when the system knows no such folder, or the path is too long. As ever, one character of the buffer
-/// stays unused beside the terminating zero.
+/// None when the system knows no such folder, or the path is too long. One character of the buffer stays
+/// unused beside the terminating zero, as it always has.
 std::optional<std::string> pathOf(ReWireSystem &system, const char *name)
 {
     std::optional<std::string> path = system.commonFilesFolder();

@@ -35,7 +35,7 @@ public:
     int load();
     void free();
     bool isLoaded() const { return m_handle != nullptr; }
-    /// The version in the loaded file, 0.0 when it has none there; none when the file cannot be told.
+    /// The version in the loaded file, 0.0 when it has none there; none when the file's path is unknown.
     std::optional<ReWireVersion> version() const;
     /// The address of an exported function of the loaded library, or null.
     void *function(const char *name) const { return m_system->function(m_handle, name); }

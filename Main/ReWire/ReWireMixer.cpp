@@ -86,7 +86,7 @@ void ReWireMixer::lookUpEntries()
         m_entries[index] = m_library.function(kEntryNames[index]);
 }
 
-/// Older libraries have no idle function, and are welcome.
+/// Older libraries lack the idle function and are accepted.
 bool ReWireMixer::isUsable() const
 {
     for (size_t index = 0; index < kReWireEntryCount; ++index) {

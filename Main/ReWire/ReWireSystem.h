@@ -20,7 +20,7 @@ public:
     /// The address of an exported function, or null.
     virtual void *function(void *library, const char *name) = 0;
     virtual void free(void *library) = 0;
-    /// Where a loaded library was loaded from; none when that cannot be told, or not in 255 characters.
+    /// Where a loaded library was loaded from; none when it is unknown or longer than 255 characters.
     virtual std::optional<std::string> pathOf(void *library) = 0;
     /// The upper half of the version number in a file's version resource: 16 bits each of major and minor
     /// version. None when there is no such resource.

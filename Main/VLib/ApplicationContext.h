@@ -20,7 +20,7 @@ public:
     virtual void pluginListsChanged() = 0;
 };
 
-/// The process-wide road to the host application. Made on first use, from any thread.
+/// The process-wide access to the host application. Made on first use, from any thread.
 class ApplicationContext {
 public:
     static ApplicationContext &instance();

@@ -11,8 +11,8 @@ FxProbeUI::FxProbeUI(std::shared_ptr<StatusHandover> status)
     : m_status(std::move(status))
 {}
 
-// The events are those of the calling thread: plug-ins may have left some on the scan's thread, and a scan is
-// all that this thread ever does.
+// The events are those of the calling thread: plug-ins may have left some on the scan's thread, which has no
+// event loop.
 void FxProbeUI::showStatus(const QString &text)
 {
     QCoreApplication::processEvents();

@@ -6,8 +6,8 @@
 
 class StatusHandover;
 
-/// The program's messages as the scanner's window shows them: status texts, progress and the wish to be seen.
-/// Warnings and questions have no place there; a question is answered no.
+/// Passes the program's messages to the scanner's window: status texts, progress and requests to be shown.
+/// Warnings and questions are not shown there; a question is answered no.
 class FxProbeUI : public VUI {
 public:
     /// `status` is what the window polls; operations after the window is gone change nothing.

@@ -16,7 +16,8 @@ class VUI;
 /// Codes that go with status texts and notifications.
 namespace MessageCode {
 inline constexpr int kScanning = 60000; ///< "Scanning: %ls"
-inline constexpr int kCompleted = 1000; ///< what a status text told of has ended; the text is empty
+inline constexpr int kCompleted =
+    1000; ///< the work that a status text announced has ended; the text is empty
 inline constexpr quint32 kEntryAdded = 0x0FFFFFFF; ///< an entry came into a catalogue
 } // namespace MessageCode
 
@@ -75,20 +76,20 @@ bool askUser(const wchar_t *format, const Arguments &...arguments)
 /// Shows a message box and gives the button pressed; 0 without a user interface.
 int userMessageBox(const QString &text, int flags);
 
-/// The folders that the workstation's own interface has beside the common ones. This program has none of
-/// them; they are told apart by the place at which asking for one is reported.
+/// The further folder getters of the workstation's own interface. This program has none of these folders; the
+/// number of each is the source line under which a call is reported.
 inline constexpr int kWorkstationOnlyFolders[] = {483, 771, 949, 1011, 1092, 1184, 1239};
-/// Reports the asking and gives an empty text. `index` is a place in the list above.
+/// Reports the call and returns an empty text. `index` is a place in the list above.
 const wchar_t *workstationOnlyFolder(std::size_t index);
 
-/// Asks that the window come into sight.
+/// Asks for the window to be shown.
 void requestShow();
 
 /// Passes a bare value to the user interface.
 void notifyUI(quint32 value);
 
-/// Shows "Scanning: " with what is being scanned, and asks for the window: a scan started with a path would
-/// never be seen otherwise.
+/// Shows "Scanning: " with what is being scanned, and asks for the window to be shown: a scan started with a
+/// path would stay out of sight otherwise.
 void showScanning(const QString &what);
 
 /// A progress display of the installed user interface; null where there is none.

@@ -5,7 +5,7 @@
 #include <atomic>
 #include <mutex>
 
-/// What the scan wants to see in the window and the window has not taken over yet.
+/// What the scan posted and the window has not shown yet.
 struct PendingStatus {
     QString text;    ///< empty: none
     int value = -1;  ///< -1: none

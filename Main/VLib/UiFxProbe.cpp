@@ -30,8 +30,8 @@ constexpr int kTickMilliseconds = 50;
 constexpr std::chrono::milliseconds kPollInterval(10);
 constexpr wchar_t kThreadEnded[] = L"The scan's thread was ended by a plug-in";
 
-/// With the screen the user's session is over: the scan ends as on any other request, and no plug-in is to
-/// blame.
+/// Without the screen the user's session is over: the scan ends as on any other request, and no plug-in is
+/// blamed.
 void endWithoutScreen(StatusHandover &status)
 {
     status.setClosing();
@@ -71,9 +71,9 @@ UiFxProbe::UiFxProbe(const QString &dataFolder, std::function<void(const QString
     m_screenLoss = std::make_unique<ScreenLoss>([status = m_status] { endWithoutScreen(*status); });
     setWindowFlags(Qt::Window | Qt::WindowMinimizeButtonHint | Qt::WindowStaysOnTopHint |
                    Qt::WindowCloseButtonHint);
-#if QT_CONFIG(accessibility) // a toolkit may be built without
-    // Has the toolkit start the thread of its accessibility now, which it would start when the window is
-    // first shown: while a plug-in is being probed, a new thread is taken for the plug-in's.
+#if QT_CONFIG(accessibility) // Qt may be built without
+    // Starts Qt's accessibility thread now rather than when the window is first shown: a thread that starts
+    // during a probe would be taken for the plug-in's.
     QAccessible::isActive();
 #endif
     m_worker = std::thread([this, scan = std::move(scanRun)] { runScan(scan); });
@@ -145,14 +145,15 @@ void UiFxProbe::setUpProgressBar()
     m_layout->addWidget(m_progressBar);
 }
 
-// The exception of a forced unwind has no object, so the reference to it is null; that is the compiler's way.
+// The exception of a forced unwind has no object, so the reference to it is null; that is how the compiler
+// does it.
 [[gnu::no_sanitize("null")]] void UiFxProbe::runScan(const std::function<void(const QString &)> &scanRun)
 {
     const auto finished = qScopeGuard([this] { markFinished(); });
     try {
         scanRun(m_dataFolder);
     } catch (const abi::__forced_unwind &) {
-        // A plug-in ends the thread with pthread_exit; to swallow that would abort the process.
+        // A plug-in ended the thread with pthread_exit; swallowing that would abort the process.
         DebugLog(kThreadEnded);
         throw;
     } catch (const std::exception &exception) {
@@ -165,8 +166,8 @@ void UiFxProbe::setUpProgressBar()
 void UiFxProbe::markFinished()
 {
     m_status->setFinished();
-    // A tick at once: most scans find nothing new, and their end need not wait for the timer. It also wakes
-    // the destructor, which may be asleep until the next event.
+    // Ticks at once: most scans find nothing new, and their end need not wait for the timer. It also wakes
+    // the destructor, which may be waiting for the next event.
     QMetaObject::invokeMethod(this, &UiFxProbe::OnTimer, Qt::QueuedConnection);
 }
 
@@ -190,7 +191,7 @@ void UiFxProbe::run(QCoreApplication &application, bool defaultPath)
     auto *timer = new QTimer(this);
     connect(timer, &QTimer::timeout, this, &UiFxProbe::OnTimer);
     timer->start(kTickMilliseconds);
-    // Already closed: there was no loop to end yet, and nobody would end this one.
+    // When it was closed before the loop started, nothing would end the loop.
     if (!m_closed)
         application.exec();
 }
@@ -252,8 +253,8 @@ void UiFxProbe::done(int result)
     endEventLoop();
 }
 
-// Not left to the toolkit, which ends the loop only when no other window of the process is in sight: plug-ins
-// may have some.
+// Not left to Qt, which ends the loop only when no other window of the process is visible: plug-ins may have
+// some.
 void UiFxProbe::endEventLoop()
 {
     m_closed = true;

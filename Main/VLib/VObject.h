@@ -8,8 +8,8 @@ public:
 
     /// The name of the interface that the object stands for.
     virtual const char *className() const = 0;
-    /// Orders objects by identifier: 0 for equal ones, -1 when this one's is smaller, 1 when it is larger. No
-    /// caller is meant to need it, so each call is reported as an assertion.
+    /// Orders objects by identifier: 0 for equal ones, -1 when this one's is smaller, 1 when it is larger.
+    /// Nothing should need this, so each call is reported as an assertion.
     virtual int compare(const VObject &other) const;
 
 protected:

@@ -4,7 +4,7 @@
 
 #include <QString>
 
-/// A progress bar with a line of text, as long work sees it. Called on the thread that does the work.
+/// A progress bar with a line of text, as seen by a lengthy task. Called on the thread that does the work.
 class VProgressDisplay : public VObject {
 public:
     const char *className() const override { return "VProgressDisplay"; }

@@ -20,7 +20,7 @@ public:
     virtual void warn(const QString &) {}
     /// A new progress display; null where there is none.
     virtual std::shared_ptr<VProgressDisplay> createProgressDisplay() = 0;
-    /// Asks that the window come into sight.
+    /// Asks for the window to be shown.
     virtual void requestShow() = 0;
     /// A yes-or-no question; an interface that cannot ask answers no.
     virtual bool askUser(const QString &) { return false; }

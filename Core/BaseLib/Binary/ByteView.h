@@ -15,8 +15,8 @@ public:
     virtual bool read(quint64 offset, void *target, quint64 size) = 0;
 };
 
-/// A stretch of bytes that belong to somebody else, in memory or in a source. Nothing outside of it is read,
-/// whatever position is asked for: positions and sizes may come from a hostile file.
+/// A range of bytes, not owned, in memory or in a source. Nothing outside of it is ever read: positions and
+/// sizes may come from a hostile file.
 class ByteView {
 public:
     ByteView() = default;

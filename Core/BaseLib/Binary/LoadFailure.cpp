@@ -8,7 +8,7 @@
 
 namespace {
 
-/// No honest plug-in brings that many libraries along.
+/// More libraries than any honest plug-in brings along.
 constexpr int kMostLibraries = 200;
 
 /// What a machine type means for people.
@@ -39,7 +39,7 @@ public:
     {
         PagedFile file(path);
         if (file.content().isEmpty())
-            return {}; // the loader's words say it all
+            return {}; // the loader's message says enough
         const std::optional<PeImage> image = PeImage::read(file.content());
         if (!image)
             return QStringLiteral("is not a Windows library");

@@ -10,8 +10,8 @@
 class LoadedParts {
 public:
     /// Adds what the file has for the `size` bytes of memory at an address; the rest of them are zeros. False
-    /// when that cannot be: more content than memory, no room below the end of memory, or not behind the part
-    /// before.
+    /// when the part is impossible: more content than memory, no room below the end of memory, or not behind
+    /// the part before.
     bool add(quint64 address, quint64 size, ByteView content)
     {
         if (content.size() > size || address < m_end || size > std::numeric_limits<quint64>::max() - address)

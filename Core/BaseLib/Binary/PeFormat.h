@@ -17,9 +17,9 @@ inline constexpr quint32 kPeMagic = 0x00004550;       // "PE", two zeros
 inline constexpr quint16 kPeOptionalMagic32 = 0x010b; // PE32
 inline constexpr quint16 kPeOptionalMagic64 = 0x020b; // PE32+
 inline constexpr quint64 kPePage = 4096;              // memory is filled from the file in such units
-/// More sections than this the loader takes from no file (PE format, "Number of sections").
+/// The most sections that the loader accepts (PE format, "Number of sections").
 inline constexpr quint16 kMostPeSections = 96;
-inline constexpr quint64 kPeSector = 512;       // the loader takes sections from such an offset on
+inline constexpr quint64 kPeSector = 512;       // the loader rounds a section's offset down to it
 inline constexpr quint32 kPeDelayByAddress = 1; // dlattrRva: the entry holds relative addresses
 
 inline constexpr quint16 kPeMachineX86 = 0x014c;     // IMAGE_FILE_MACHINE_I386

@@ -2,16 +2,16 @@
 
 namespace {
 
-/// As many names as the 16-bit indexes of an export table lead to.
+/// As many names as the 16-bit indexes of an export table can reach.
 constexpr quint32 kMostPeNames = 1 << 16;
 /// More libraries than any honest file imports.
 constexpr quint64 kMostPeImports = 4096;
-/// Windows takes no longer name of a library (MAX_PATH).
+/// The longest name of a library that Windows accepts (MAX_PATH).
 constexpr quint64 kLongestPeLibraryName = 260;
 
 quint64 roundedUp(quint64 value, quint64 unit) { return (value + unit - 1) / unit * unit; }
 
-/// Adds one section as the loader maps it: what is behind its size in memory shows up to the end of the page.
+/// Adds one section as the loader maps it: the file's content is visible up to the end of the last page.
 bool addSection(LoadedParts &parts, ByteView file, const PeSection &section)
 {
     const quint64 size = roundedUp(section.memorySize ? section.memorySize : section.fileSize, kPePage);
@@ -27,7 +27,7 @@ bool addSection(LoadedParts &parts, ByteView file, const PeSection &section)
 bool isEnd(const PeImport &entry) { return entry.name == 0 || entry.addressTable == 0; }
 bool isEnd(const PeDelayImport &entry) { return entry.name == 0; }
 bool isReadable(const PeImport &) { return true; }
-/// Compilers of the last century wrote absolute addresses.
+/// Old compilers wrote absolute addresses.
 bool isReadable(const PeDelayImport &entry) { return (entry.flags & kPeDelayByAddress) != 0; }
 
 struct Headers {

@@ -10,8 +10,8 @@
 #include <optional>
 
 /// The content of a PE file, a Windows program or library for any machine, read without running any of its
-/// code. Points into the bytes that it was read from, which need not be trustworthy: what contradicts itself
-/// or lies outside of them counts as unreadable.
+/// code. Points into the bytes that it was read from, which may come from a hostile file: what contradicts
+/// itself or lies outside of them counts as unreadable.
 class PeImage {
 public:
     /// None when the bytes do not start with the headers of a PE file.

@@ -32,7 +32,7 @@ public:
     bool isLoaded() const { return m_handle != nullptr; }
     /// The system's handle, or null.
     void *handle() const { return m_handle; }
-    /// The system's own words for why the last load failed.
+    /// The system's message for why the last load failed.
     const QString &errorText() const { return m_errorText; }
 
     /// Whether a file exists at the path.
@@ -40,7 +40,7 @@ public:
 
     /// When set, handles are remembered in one process-wide table by full path and never freed.
     bool useProcessCache = false;
-    /// When set, the library's own folder is searched first for its dependencies. Only Windows has such a
+    /// When set, the library's own folder is searched first for its dependencies. Only Windows has this
     /// switch; elsewhere a library names that folder itself.
     bool searchDllLoadDir = false;
 

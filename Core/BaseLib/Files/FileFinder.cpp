@@ -24,7 +24,7 @@ QString reasonAgainst(const QFileInfo &folder)
     return QString();
 }
 
-/// The folders that were reported as unsearchable already.
+/// The folders that have been reported as unsearchable.
 struct Reports {
     std::mutex mutex;
     std::set<QString> folders;

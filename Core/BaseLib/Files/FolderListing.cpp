@@ -5,7 +5,7 @@
 namespace {
 
 /// Without regard to case first. The folded names are made once: folding them at each comparison took most of
-/// the time that a scan of a large folder computes.
+/// the processor time of a scan of a large folder.
 void sortByName(std::vector<FolderEntry> &entries)
 {
     struct Sorted {

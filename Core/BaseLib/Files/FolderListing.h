@@ -7,17 +7,17 @@
 /// An entry of a folder.
 struct FolderEntry {
     QString name;
-    bool isRealFolder; ///< a folder, and no link to one
+    bool isRealFolder; ///< a folder, not a link to one
 };
 
 struct FolderContent {
     std::vector<FolderEntry> entries;
-    /// In the system's words, why not all of a folder that is there could be read.
+    /// The system's message for why an existing folder could not be read completely; empty when it could.
     QString problem;
 };
 
-/// What lies in a folder, in the order of the names. Left out is what is hidden, special, a link to nothing,
-/// or named by no valid text. Empty when there is no such folder.
+/// What lies in a folder, in the order of the names. Entries that are hidden, special, links to nothing, or
+/// named by invalid text are left out. Empty when there is no such folder.
 FolderContent listFolder(const QString &folder);
 
 /// The system's part of it, in any order.

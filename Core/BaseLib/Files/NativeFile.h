@@ -6,7 +6,7 @@
 
 #include <optional>
 
-/// Whether file names that differ in nothing but case are two.
+/// Whether file names that differ only in case name two files.
 #ifdef _WIN32
 inline constexpr Qt::CaseSensitivity kPathCase = Qt::CaseInsensitive;
 #else
@@ -21,7 +21,7 @@ inline bool isSamePath(const QString &left, const QString &right)
     return QString::compare(left, right, kPathCase) == 0;
 }
 
-/// Orders paths and file names so.
+/// Orders paths and file names in the same way.
 struct PathLess {
     bool operator()(const QString &left, const QString &right) const
     {
@@ -29,7 +29,7 @@ struct PathLess {
     }
 };
 
-/// The same for every spelling of a path, for what looks paths up by their hashes.
+/// The same text for every spelling of a path, for look-ups by hash.
 inline QString pathKey(const QString &path)
 {
     return kPathCase == Qt::CaseSensitive ? path : path.toCaseFolded();
@@ -37,19 +37,19 @@ inline QString pathKey(const QString &path)
 
 /// Renames a file over an existing one in one step.
 FileResult renameOver(const QString &from, const QString &to);
-/// Deletes a file; one that is not there is no fault.
+/// Deletes a file; one that does not exist counts as deleted.
 FileResult removeFile(const QString &path);
-/// Waits until what was written to an open file has reached the disk; systems that cannot do so are not
-/// blamed.
+/// Waits until what was written to an open file has reached the disk; a file system that cannot do so is not
+/// reported.
 void syncToDisk(int fileDescriptor);
-/// Whether a folder that is no link is one of those in which it lies, or may be: a junction of Windows leads
-/// anywhere, and a search that enters would not end.
+/// Whether a folder that is not a link may be one of the folders around it: a junction of Windows leads
+/// anywhere, and a search that entered it would not end.
 bool leadsBack(const QString &folder);
-/// True when the system does not let us see whether there is such a file, or what kind it is of.
+/// True when the system does not let us see whether the file exists, or what kind it is.
 bool cannotBeExamined(const QString &path);
-/// Whether the system takes the name for a device, whatever folder and ending it stands with.
+/// Whether the system reads the name as a device, in any folder and with any ending.
 bool isDeviceName(const QString &name);
-/// What a moment is called in the local time zone.
+/// A time in the local time zone.
 struct CalendarTime {
     int year, month, day, hour, minute;
 };

@@ -9,7 +9,7 @@ namespace {
 
 FileResult writeAll(QFile &file, const QByteArray &content, Durability durability)
 {
-    // A disk that fills up takes a part first; only the next attempt says why.
+    // A disk that fills up accepts a part first; only the next attempt gives the reason.
     for (qint64 written = 0; written < content.size();) {
         const qint64 taken = file.write(content.constData() + written, content.size() - written);
         if (taken <= 0)

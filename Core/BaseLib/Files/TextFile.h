@@ -13,9 +13,9 @@ inline constexpr char kLineEnd[] = "\n";
 /// Whether a written file must have reached the disk when the call returns.
 enum class Durability { Buffered, Synced };
 
-/// What came of a file operation: an empty reason means success.
+/// The outcome of a file operation: an empty reason means success.
 struct FileResult {
-    QString reason; ///< the system's own words for what went wrong
+    QString reason; ///< the system's message for what went wrong
     explicit operator bool() const { return reason.isEmpty(); }
 };
 

@@ -11,13 +11,13 @@
 
 namespace {
 
-// A text of nothing but blanks is a value too: plug-ins may be called " ". Line ends within a text stay what
-// they are: file names may hold them.
+// A text of blanks alone is a value too: a plug-in may be called " ". Line ends within a text stay as they
+// are: file names may hold them.
 constexpr unsigned kParseOptions = (pugi::parse_default | pugi::parse_ws_pcdata_single) & ~pugi::parse_eol;
 
 constexpr char kByteOrderMark[] = "\xef\xbb\xbf";
 
-/// A text as it stands: at its start, Qt takes a byte order mark for none of its characters.
+/// A text with all its characters: Qt drops a byte order mark at its start.
 QString wholeText(const char *utf8)
 {
     return qstrncmp(utf8, kByteOrderMark, sizeof kByteOrderMark - 1) == 0

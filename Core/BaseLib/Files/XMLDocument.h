@@ -68,8 +68,8 @@ private:
     QString m_error;
 };
 
-/// An integer as the catalogue files are read: base 10, a sign allowed, trailing junk ignored, 0 for what is
-/// no number and the nearest limit for what does not fit 64 bits.
+/// An integer as in the catalogue files: base 10, a sign allowed, trailing junk ignored; 0 for a text that is
+/// not a number, and the nearest limit for a number that does not fit 64 bits.
 qint64 parseInteger(const QString &text);
-/// A decimal number read the same in every locale; 0 for what is no number.
+/// A decimal number, read the same in every locale; 0 for a text that is not a number.
 double parseDecimal(const QString &text);

@@ -33,7 +33,7 @@ void configureLogFromEnvironment();
 
 /// Logs one finished message. Any thread; never throws.
 void debugLogMessage(const QString &message) noexcept;
-/// Tells Qt's debug channel that logging a line threw.
+/// Reports on Qt's debug channel that logging a line threw.
 void reportLogException() noexcept;
 
 /// Logs one line, printf-style. Any thread; never throws.

@@ -9,9 +9,9 @@
 /// printf-style formatting of wide text that keeps every character.
 ///
 /// The C library's wide printf converts text through the process's locale and gives up at the first character
-/// that the locale lacks; plug-in names hold any character. Here every text argument (QString, std::wstring,
-/// wide or 8-bit C string) travels as UTF-8 and both "%s" and "%ls" take any of them. Numbers are printed the
-/// same in every locale.
+/// that the locale lacks, and plug-in names hold any character. Here every text argument (QString,
+/// std::wstring, wide or 8-bit C string) travels as UTF-8 and both "%s" and "%ls" take any of them. Numbers
+/// are printed the same in every locale.
 namespace FormatTextDetail {
 
 template <typename Number>

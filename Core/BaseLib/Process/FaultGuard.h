@@ -14,7 +14,7 @@ inline constexpr quint32 kIntegerDivideByZero = 0xC0000094;
 inline constexpr quint32 kStackOverflow = 0xC00000FD;
 } // namespace FaultCode
 
-/// A hardware fault that guarded code committed, as an ordinary exception: "SE Exception: " with "Access
+/// A hardware fault in guarded code, as an ordinary exception: "SE Exception: " with "Access
 /// Violation" or the code.
 class SEException : public std::runtime_error {
 public:
@@ -37,8 +37,8 @@ namespace FaultGuardDetail {
 /// What ends a guarded call and becomes an exception.
 enum class Watch { FaultsAndForeignExceptions, ForeignExceptions };
 
-/// Calls `function(argument)`. What is watched for and happens in it on this thread ends the call and is
-/// thrown from here as an `SEException` or a `ForeignException`; C++ exceptions pass through.
+/// Calls `function(argument)`. A watched event in it on this thread ends the call and is thrown from here as
+/// an `SEException` or a `ForeignException`; C++ exceptions pass through.
 void run(Watch watch, void (*function)(void *), void *argument);
 
 template <typename Function>
@@ -67,22 +67,22 @@ auto call(Watch watch, Function &function) -> std::invoke_result_t<Function &>
 
 } // namespace FaultGuardDetail
 
-/// Calls a function of strangers with hardware faults turned into exceptions (`SEException`), and so are the
-/// C++ exceptions of other compilers (`ForeignException`). Guards nest and are per thread; outside a guard a
-/// fault ends the process as ever. Frames of the function itself are left without unwinding, so what it calls
-/// in our own code must not hold locks or memory while it touches the stranger's.
+/// Calls foreign code. Hardware faults in it become exceptions (`SEException`), and so do the C++ exceptions
+/// of other compilers (`ForeignException`). Guards nest and are per thread; outside a guard a fault ends the
+/// process as usual. The function's own frames are left without unwinding, so code of ours in them must not
+/// hold locks or memory while foreign code runs.
 template <typename Function>
 auto callGuarded(Function &&function) -> std::invoke_result_t<Function &>
 {
     return FaultGuardDetail::call(FaultGuardDetail::Watch::FaultsAndForeignExceptions, function);
 }
 
-/// The same for C++ exceptions of other compilers alone: a fault ends the process as without a guard.
+/// The same for the C++ exceptions of other compilers only: a fault ends the process as without a guard.
 template <typename Function>
 auto callTranslated(Function &&function) -> std::invoke_result_t<Function &>
 {
     return FaultGuardDetail::call(FaultGuardDetail::Watch::ForeignExceptions, function);
 }
 
-/// The text of an exception that a stranger threw, whose own code gives it; empty when that code fails.
+/// The text of an exception that foreign code threw. Its `what` is foreign code too; empty when that fails.
 QString guardedText(const std::exception &exception);

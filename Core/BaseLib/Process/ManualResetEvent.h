@@ -4,7 +4,7 @@
 #include <condition_variable>
 #include <mutex>
 
-/// An event that stays set, for every thread that waits, until somebody resets it. Starts out not set.
+/// An event that stays set, for every thread that waits, until it is reset. Starts out not set.
 class ManualResetEvent {
 public:
     void set();

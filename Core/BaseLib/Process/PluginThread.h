@@ -12,7 +12,7 @@ public:
     PluginThread &operator=(const PluginThread &) = delete;
 
     /// Delivers the messages of windows and COM objects that wait for the calling thread, which none of our
-    /// own event loops does: left lying, those of one plug-in would be delivered by the next one.
+    /// own event loops does: otherwise those of one plug-in would be delivered while the next is probed.
     static void deliverMessages();
 
     /// Whether a plug-in ended the thread in a way that runs nothing of ours: Windows unwinds no stack for

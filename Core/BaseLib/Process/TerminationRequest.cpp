@@ -24,7 +24,7 @@ TerminationWatcher::~TerminationWatcher()
     TerminationSignal::raise(); // wakes the thread
     m_thread.join();
     if (!m_sawWakeUp)
-        TerminationSignal::wait(std::chrono::milliseconds(0)); // not left lying for another watcher
+        TerminationSignal::wait(std::chrono::milliseconds(0)); // which another watcher would take for its own
 }
 
 void TerminationWatcher::watch()

@@ -8,16 +8,16 @@
 /// The system's request that the process end: a termination signal, or the end of the user's session.
 namespace TerminationSignal {
 
-/// Whoever starts this process as its helper puts its process identifier into this environment variable: the
-/// end of that process is a request as well. A job object of Windows would do it too, but would end the
-/// helper in the middle of its work, and with it whatever plug-ins have started.
+/// A process that starts this one puts its own process identifier into this environment variable; its end
+/// counts as a request. A job object of Windows would end this process in the middle of its work instead, and
+/// with it whatever plug-ins have started.
 inline constexpr char kParentVariable[] = "FXPROBE_PARENT";
 
 /// From now on the system's request no longer kills the process but is waited for.
 void install();
 /// Makes the request by hand. Safe in a signal handler.
 void raise();
-/// True when a request came within the time given; each request is told once.
+/// True when a request came within the time given; each request is reported once.
 bool wait(std::chrono::milliseconds timeout);
 
 } // namespace TerminationSignal
@@ -26,7 +26,7 @@ bool wait(std::chrono::milliseconds timeout);
 class TerminationWatcher {
 public:
     /// `requested` is called once, when a request comes. When the watcher still lives `grace` later,
-    /// `overdue` is called, and then again every tenth of a second: whoever asked will not wait for ever.
+    /// `overdue` is called, and then again every tenth of a second: who asked will not wait for ever.
     /// Both run on the watcher's thread.
     TerminationWatcher(std::function<void()> requested, std::function<void()> overdue,
                        std::chrono::milliseconds grace);

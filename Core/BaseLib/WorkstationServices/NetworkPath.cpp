@@ -38,8 +38,8 @@ bool areOnOneServer(const QString &path, const QString &remoteName)
     return !server.isEmpty() && server.compare(serverOf(remoteName), Qt::CaseInsensitive) == 0;
 }
 
-/// What an administrative share ("\\server\D$\folder") or a path with a drive in it has behind the drive;
-/// none when it is neither.
+/// What follows the drive in an administrative share ("\\server\D$\folder") or a path with a drive in it;
+/// none for other paths.
 std::optional<QString> behindItsDrive(const QString &path)
 {
     const int dollar = path.indexOf(QLatin1Char('$'));
@@ -47,7 +47,7 @@ std::optional<QString> behindItsDrive(const QString &path)
     return end >= 0 ? std::make_optional(path.mid(end + 1)) : std::nullopt;
 }
 
-/// The path by way of the drive's server; empty when there is nothing at it.
+/// The path through the drive's server; empty when nothing exists there.
 QString viaServer(const QString &path, const MappedDrive &drive, NetworkDrives &drives)
 {
     const std::optional<QString> rest =
@@ -56,8 +56,7 @@ QString viaServer(const QString &path, const MappedDrive &drive, NetworkDrives &
     return rest && drives.exists(candidate) ? candidate : QString();
 }
 
-/// False when the text with its terminating zero is longer than the buffer: a path that was cut would lead to
-/// another file.
+/// False when the text and its terminating zero do not fit the buffer: a cut path would lead to another file.
 bool copyTo(wchar_t (&buffer)[kNetworkPathBuffer], const QString &text)
 {
     const std::wstring wide = text.toStdWString();

@@ -72,8 +72,8 @@ PathBuffer &scratch()
     return pool[next++ % kScratchResults];
 }
 
-/// Puts a path together and cuts it at the limit. A text is never read beyond what there is room for: it may
-/// lack its terminator.
+/// Builds a path and cuts it at the limit. A text is never read further than there is room for: it may lack
+/// its terminator.
 class PathText {
 public:
     PathText &add(const wchar_t *text)

@@ -3,8 +3,8 @@
 #include <cstddef>
 
 /// The workstation's data folders: a few roots, set once at start-up before other threads start, and what is
-/// derived from them. Everything is wide text that ends at the 260th character at the latest, the terminator
-/// counted, and is cut there without a word: the path limit of the system that the layout is made for. Paths
+/// derived from them. Every text has at most 260 wide characters, the terminator included, and is cut there
+/// silently: the path limit of the system that the layout is made for. Paths
 /// have backslashes on every platform; an unset root leaves a relative one.
 ///
 /// A result lies in a buffer of 260 characters, never null. That of most getters belongs to the getter, whose
@@ -55,7 +55,7 @@ int setWorkFolder(const wchar_t *folder);
 int setPresetFolder(const wchar_t *folder);
 int setAuxFolder(const wchar_t *folder);
 void setInstallRoot(const wchar_t *folder);
-/// From now on the shaders are looked for in the folder that was made out when the system folder was set.
+/// When on, the shaders lie in the folder that was derived when the system folder was set.
 void setShadersOverride(bool on);
 
 /// A folder, or with a name the path of a file in it.

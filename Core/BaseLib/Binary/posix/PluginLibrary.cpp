@@ -29,8 +29,8 @@ QString foreignKind(const QString &path)
     return QStringLiteral("built for another machine");
 }
 
-/// The loader tells files for other machines by what in them surprised it; for another processor's it even
-/// says that they are not there.
+/// The loader's message for a file of another machine names the field that surprised it; for another
+/// processor's it may even say that the file is not there.
 QString withForeignKind(const QString &loaderText, const QString &path)
 {
     const QString kind = loaderText.startsWith(path) ? foreignKind(path) : QString();

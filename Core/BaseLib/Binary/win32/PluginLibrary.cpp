@@ -8,13 +8,13 @@
 
 namespace {
 
-/// What the file itself tells beyond the system's words, which name neither machine nor missing library.
+/// What the file itself tells: the system's message names neither the machine nor the missing library.
 QString foundInFile(const QString &path, const QString &firstFolder)
 {
     try {
         return whyNotLoadable(path, importSearch(firstFolder));
     } catch (const std::exception &) {
-        return {}; // no memory for it
+        return {}; // out of memory
     }
 }
 

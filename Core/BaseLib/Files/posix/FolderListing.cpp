@@ -9,7 +9,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-// Not by the toolkit's own means: they ask the system several times for what the folder itself tells.
+// Not through QDirIterator, which asks the system several times for what the folder itself tells.
 
 namespace {
 
@@ -29,7 +29,7 @@ mode_t ownKind(int folder, const dirent64 &entry)
     return entry.d_type != DT_UNKNOWN ? DTTOIF(entry.d_type) : kindOf(folder, entry, AT_SYMLINK_NOFOLLOW);
 }
 
-/// The name as a text; null when it is none.
+/// The name as text; null when it is not valid.
 QString textOf(const dirent64 &entry)
 {
     const QString name = QFile::decodeName(entry.d_name);
@@ -59,7 +59,7 @@ FolderContent readFolder(const QString &folder)
             content.problem = qt_error_string(errno);
         return content;
     }
-    // Without a stream, which would be made and thrown away for every folder.
+    // Not through opendir, which would allocate a stream for every folder.
     alignas(dirent64) char buffer[kBufferSize];
     ssize_t filled = 0;
     while ((filled = getdents64(descriptor, buffer, sizeof buffer)) > 0)

@@ -43,7 +43,7 @@ std::optional<FileStatus> fileStatus(const QString &path)
     struct stat status = {};
     if (stat(QFile::encodeName(path).constData(), &status) != 0)
         return std::nullopt;
-    // The toolkit reads the rules of the time zone again for each file.
+    // Not through Qt, which reads the rules of the time zone again for each file.
     tm local = {};
     localtime_r(&status.st_mtim.tv_sec, &local);
     return FileStatus{S_ISREG(status.st_mode),

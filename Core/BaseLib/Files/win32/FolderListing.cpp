@@ -7,7 +7,7 @@
 
 namespace {
 
-/// Why a folder that is there tells nothing; empty where it is just empty.
+/// Why an existing folder lists nothing; empty when it is merely empty.
 QString problemOf(const QString &folder)
 {
     WIN32_FIND_DATAW first = {};
@@ -22,7 +22,7 @@ QString problemOf(const QString &folder)
     return isGone ? QString() : systemMessage(error, folder);
 }
 
-/// The system takes halves of surrogate pairs too, which no file of ours could hold.
+/// The system also accepts halves of surrogate pairs, which UTF-8 files cannot hold.
 bool isText(const QString &name) { return QString::fromUtf8(name.toUtf8()) == name; }
 
 } // namespace
@@ -39,7 +39,7 @@ FolderContent readFolder(const QString &folder)
         // A link is told apart first: that needs no look at what it points to.
         content.entries.push_back({iterator.fileName(), !info.isSymLink() && info.isDir()});
     }
-    if (content.entries.empty() && QFileInfo(folder).isDir()) // the toolkit keeps the reason to itself
+    if (content.entries.empty() && QFileInfo(folder).isDir()) // Qt does not give the reason
         content.problem = problemOf(folder);
     return content;
 }

@@ -2,5 +2,5 @@
 
 void sendLineToDebugger(const QString &)
 {
-    // POSIX systems have no debugger channel; a debugger reads standard error like everybody else.
+    // POSIX systems have no debugger channel; a debugger shows standard error.
 }

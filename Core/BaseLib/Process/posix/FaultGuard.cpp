@@ -74,7 +74,7 @@ void onFault(int signalNumber, siginfo_t *, void *)
         guard->code = codeOf(signalNumber);
         siglongjmp(guard->context, 1);
     }
-    // Nobody guards this code: die of it as ever.
+    // No guard on this thread: end the process as usual.
     std::signal(signalNumber, SIG_DFL);
     raise(signalNumber);
 }

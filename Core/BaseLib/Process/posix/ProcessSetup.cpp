@@ -49,7 +49,7 @@ void prepareProcess()
 {
     suppressCoreDumps();
     std::signal(SIGPIPE, SIG_IGN);
-    // File names are bytes; taken as UTF-8 they survive also where the locale is "C".
+    // File names are bytes; read as UTF-8 they also survive where the locale is "C".
     QTextCodec::setCodecForLocale(QTextCodec::codecForName("UTF-8"));
     chooseDisplayPlatform();
 }

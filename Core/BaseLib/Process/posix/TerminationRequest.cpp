@@ -25,7 +25,7 @@ void onSignal(int) { TerminationSignal::raise(); }
 /// The process whose helper this one is, or 0; set before anybody waits.
 pid_t s_parent = 0;
 
-/// Only its real parent: whoever stands between (a debugger, a script) outlives it or not, as it likes.
+/// Only the real parent counts: a debugger or a script in between may end at any time.
 void watchParent()
 {
     const char *const text = std::getenv(TerminationSignal::kParentVariable);
@@ -69,6 +69,6 @@ void TerminationSignal::raise() { sem_post(requests()); }
 bool TerminationSignal::wait(std::chrono::milliseconds timeout)
 {
     const timespec deadline = deadlineIn(timeout);
-    // The system tells it by a signal too, but a plug-in may have taken that for itself.
+    // The system could signal the parent's end, but a plug-in may have taken that signal for itself.
     return sem_clockwait(requests(), CLOCK_MONOTONIC, &deadline) == 0 || isParentGone();
 }

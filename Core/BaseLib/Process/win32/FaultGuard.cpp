@@ -12,7 +12,7 @@ extern "C" __declspec(dllimport) void NTAPI RtlCaptureContext(PCONTEXT) __attrib
 
 namespace {
 
-/// What the system keeps free of the stack for dealing with its overflow, in bytes.
+/// What the system keeps free of the stack to handle its overflow, in bytes.
 constexpr ULONG kOverflowReserve = 64 * 1024;
 /// Exceptions of this program's own compiler have codes that end so (libgcc's unwind-seh.c).
 constexpr DWORD kOwnExceptions = 0x474343;

@@ -39,7 +39,7 @@ struct TypeDescriptor {
 /// Of an exception record's parameters: magic number, object, throw information, module.
 constexpr DWORD kParameters = 4;
 constexpr char kStandardException[] = ".?AVexception@std@@";
-/// No type has that many bases.
+/// More bases than any type has.
 constexpr qint32 kMostTypes = 64;
 /// Place of `what` in the table of virtual functions.
 constexpr std::size_t kWhat = 1;
@@ -94,6 +94,6 @@ void MicrosoftException::describe(const EXCEPTION_RECORD &record, char *text, st
     try {
         callGuarded([&] { read(record, text, size); });
     } catch (...) {
-        // What was copied so far has to do.
+        // The text keeps what was copied so far.
     }
 }

@@ -12,7 +12,7 @@ inline constexpr DWORD kCode = 0xE06D7363;
 
 /// What an exception says of itself, while it is on its way and its object still exists: the text of a
 /// `std::exception`, else the decorated name of its type, cut to `size - 1` bytes and terminated. The record
-/// is a stranger's: what cannot be read makes the text a general one.
+/// is foreign data: where it cannot be read, the text is a general one.
 void describe(const EXCEPTION_RECORD &record, char *text, std::size_t size);
 
 } // namespace MicrosoftException

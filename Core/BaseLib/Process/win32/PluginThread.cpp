@@ -7,7 +7,7 @@
 #include <pthread.h>
 
 namespace {
-/// A window that is never painted asks for it without end.
+/// A window that is never painted keeps asking to be.
 constexpr int kMostMessages = 1000;
 constexpr UINT kTimerPeriod = 60000; ///< ms, near the longest
 
@@ -16,8 +16,8 @@ void CALLBACK doNothing(UINT, UINT, DWORD_PTR, DWORD_PTR, DWORD_PTR) {}
 
 PluginThread::PluginThread()
     : m_prepared(SUCCEEDED(CoInitializeEx(nullptr, COINIT_APARTMENTTHREADED)))
-    // Has the system start its timer thread now. The toolkit has it started and ended whenever it draws the
-    // window: while a plug-in is being probed, a new thread is taken for the plug-in's.
+    // Starts the system's timer thread now. Qt would have it started and ended whenever it draws the window;
+    // a thread that starts during a probe would be taken for the plug-in's.
     , m_timer(timeSetEvent(kTimerPeriod, kTimerPeriod, doNothing, 0, TIME_PERIODIC))
 {}
 

@@ -11,7 +11,7 @@
 
 namespace {
 
-/// What the console that this process joined wrote in before; 0 without one.
+/// The code page that the joined console had before; 0 without a console.
 UINT consoleCodePage = 0;
 
 void keepQuiet(const wchar_t *, const wchar_t *, const wchar_t *, unsigned, uintptr_t) {}
@@ -61,7 +61,7 @@ void leaveProcess(int exitCode)
 {
     if (consoleCodePage != 0)
         SetConsoleOutputCP(consoleCodePage);
-    // Not ExitProcess, which has every module detach, nor exit: nothing of ours is left to flush.
+    // Neither ExitProcess, which detaches every module, nor exit: nothing of ours is left to flush.
     TerminateProcess(GetCurrentProcess(), static_cast<UINT>(exitCode));
     std::abort();
 }

@@ -16,8 +16,8 @@ HANDLE requests()
     return semaphore;
 }
 
-/// What ends the process as soon as it is answered is not answered: whoever takes the request ends the
-/// process when its work is tidied up, and the system waits some seconds for that.
+/// An answer would end the process at once. The request is never answered instead: the process ends itself
+/// when its work is tidied up, and the system waits some seconds for that.
 [[noreturn]] void waitForTheEnd()
 {
     while (true)
@@ -45,8 +45,8 @@ LRESULT CALLBACK onWindowMessage(HWND window, UINT message, WPARAM wParam, LPARA
     return DefWindowProcW(window, message, wParam, lParam);
 }
 
-/// Receives what the system sends to windows when the session ends, or when somebody asks the process to
-/// close. It is never shown; windows for messages alone are not told of such.
+/// Runs a window, never shown, for what the system sends when the session ends or when the process is asked
+/// to close. A message-only window would not receive that.
 DWORD WINAPI runWindow(void *created)
 {
     WNDCLASSEXW windowClass = {};
@@ -83,7 +83,7 @@ void watchParent()
 
 void TerminationSignal::install()
 {
-    requests(); // made before anybody asks
+    requests(); // made before the first request
     SetConsoleCtrlHandler(onConsoleEvent, TRUE);
     watchParent();
     // The window lives as long as the process.

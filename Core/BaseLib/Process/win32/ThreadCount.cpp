@@ -20,9 +20,9 @@ HMODULE moduleAt(const void *address)
     return module;
 }
 
-/// The libraries whose threads the system employs for itself: the loader has some load libraries, COM some
-/// wait for calls. They start when a plug-in first needs such, and wait for minutes for more work.
-constexpr const wchar_t *kEmployers[] = {L"ntdll.dll", L"rpcrt4.dll", L"combase.dll", L"ole32.dll"};
+/// The libraries whose threads the system runs for itself: some load libraries for the loader, some wait for
+/// COM calls. They start when a plug-in first needs one, and then wait minutes for more work.
+constexpr const wchar_t *kSystemWorkers[] = {L"ntdll.dll", L"rpcrt4.dll", L"combase.dll", L"ole32.dll"};
 
 bool isTheSystems(DWORD id)
 {
@@ -32,7 +32,7 @@ bool isTheSystems(DWORD id)
         NtQueryInformationThread(thread.get(), kStartAddress, &start, sizeof start, nullptr) < 0)
         return false;
     const HMODULE module = moduleAt(start);
-    return module && std::any_of(std::begin(kEmployers), std::end(kEmployers),
+    return module && std::any_of(std::begin(kSystemWorkers), std::end(kSystemWorkers),
                                  [&](const wchar_t *name) { return GetModuleHandleW(name) == module; });
 }
 

@@ -46,13 +46,3 @@ TEST(FileFinder, CancelIsAskedBeforeEachFolder)
     EXPECT_EQ(found(finder, folder, ".vst3"), "a.vst3|b/b.vst3|c/c.vst3")
         << "a cancelled search is no answer";
 }
-
-TEST(FileFinder, AFolderThatCannotBeSearchedIsReportedOnce)
-{
-    const CapturedLog log;
-    FileFinder::forgetReports();
-    for (const char *folder : {"", "/no/such/folder"}) {
-        EXPECT_EQ(findFiles(folder, ".vst3") + findFiles(folder, ".vst3"), QStringList());
-    }
-    EXPECT_EQ(log.lines().size(), 2);
-}

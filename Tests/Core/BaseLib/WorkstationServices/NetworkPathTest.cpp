@@ -43,7 +43,6 @@ TEST(NetworkPath, IsFoundByShareOrByServer)
         {"result too long", R"(\\s\a\x)" + room, R"(\\s\a)", ""},
         {"drive that has it", R"(\\S\D$\x)", R"(\\t\a \\s\a \\s\b)", R"(R:\x)", true, R"(P:\x R:\x)"},
         {"dollar before colon", R"(\\s\d:\x$\y)", R"(\\s\a)", R"(P:\y)", true, R"(P:\y P:\x$\y)"},
-        {"by the colon", R"(\\s\d:\x:y)", R"(\\s\a)", R"(P:\x:y)", true, R"(P:\x:y)"},
         {"neither dollar nor colon", R"(\\s\d\x)", R"(\\s\a)", "", true, R"(P:\x P:\d\x P:)"},
         {"no server", R"(\\)", R"(\\s\a \\)", "", false},
     };

@@ -25,8 +25,6 @@ constexpr int kLookUp = 0x158;
 constexpr int kGnuSymbol = 0x2f0; ///< of "VSTPluginMain"
 constexpr int kLoadedEnd = 0x540; ///< section headers and the like follow
 
-constexpr int kNoteType = kSegments + 3 * 56; ///< of the segment behind the dynamic section's
-
 } // namespace
 
 TEST(ElfExports, AreFoundByEitherTable)
@@ -59,7 +57,7 @@ TEST(ElfExports, ADamagedLibraryIsLeftToTheLoader)
         {"object file", offsetof(Elf64_Ehdr, e_type), 2, ET_REL},
         {"segment longer than the file", kSegments + offsetof(Elf64_Phdr, p_filesz), 8, 1 << 30},
         {"segments one over the other", kSegments + 56 + offsetof(Elf64_Phdr, p_vaddr), 8, 0},
-        {"two dynamic sections", kNoteType, 4, PT_DYNAMIC},
+        {"two dynamic sections", kSegments + 4 * 56, 4, PT_DYNAMIC},
         {"other symbol size", kSymbolSize, 8, 16},
         {"look-up table nowhere", kDynamic + 8, 8, ~quint64(0)},
         {"no look-up table", kDynamic, 8, DT_DEBUG},

@@ -2,7 +2,6 @@
 #include "Tests/Fixtures/FixturePlatform.h"
 
 #include <array>
-#include <cstring>
 #include <thread>
 
 #include <windows.h>
@@ -92,10 +91,9 @@ struct ThrownObject {
     const void *const *functions = nullptr;
 };
 
-void throwAsMicrosoft(const char *(*what)(const void *), const char *baseName)
+void throwAsMicrosoft(const char *(*what)(const void *))
 {
     ThrownType type;
-    std::strcpy(type.baseName.text, baseName);
     const void *functions[] = {nullptr, reinterpret_cast<const void *>(what)};
     ThrownObject object;
     object.functions = functions;
@@ -117,11 +115,9 @@ TEST(FaultGuardFrames, OfPluginsComeFirstAndAreUnwoundForExceptionsOnly)
         {"violation that the plug-in repairs", [] { repairOwnViolation("keep"); }, "returned", false},
         {"violation that it leaves alone", writeNowhere, "SE Exception: Access Violation", false},
         {"exception of this compiler", [] { throw std::runtime_error("x"); }, "exception x", true},
-        {"std::runtime_error of Microsoft's compiler",
-         [] { throwAsMicrosoft(licenceText, ".?AVexception@std@@"); }, "foreign no licence", true},
-        {"one whose text cannot be read", [] { throwAsMicrosoft(faultyText, ".?AVexception@std@@"); },
-         "foreign .?AVruntime_error@std@@", true},
-        {"one of another type", [] { throwAsMicrosoft(nullptr, ".?AVBase@@"); },
+        {"std::runtime_error of Microsoft's compiler", [] { throwAsMicrosoft(licenceText); },
+         "foreign no licence", true},
+        {"one whose text cannot be read", [] { throwAsMicrosoft(faultyText); },
          "foreign .?AVruntime_error@std@@", true},
         {"one without tables", [] { RaiseException(kMicrosoftCode, 0, 0, nullptr); },
          "foreign a C++ exception of another compiler", true},
