@@ -294,8 +294,8 @@ TEST_F(FxScan, WrongUsage)
         const char *message;
     } rows[] = {
         {{"--no-such-option"}, "no-such-option"},
-        {{"--format", "xml"}, "'xml' is no format"},
-        {{"--timeout", "-1"}, "'-1' is no number of seconds"},
+        {{"--format", "xml"}, "unknown format 'xml'; use table, json or csv"},
+        {{"--timeout", "-1"}, "--timeout must be 0 to 86400 seconds, not '-1'"},
         {{"--list", "--retry-failed"}, "--list makes no scan"},
         {{nowhere}, "there is no folder"},
         {{m_folder.plugins(), "--retry", "Nobody"}, "no plug-in 'Nobody'"},
