@@ -12,10 +12,18 @@ if(NOT CMAKE_BUILD_TYPE)
     set(CMAKE_BUILD_TYPE Release CACHE STRING "Kind of build" FORCE)
 endif()
 
+# Qt's words "signals" and "slots" are names like any other in our code.
+add_compile_definitions(QT_NO_KEYWORDS)
+
 find_program(CCACHE_PROGRAM ccache)
-if(CCACHE_PROGRAM)
-    set(CMAKE_C_COMPILER_LAUNCHER "${CCACHE_PROGRAM}")
-    set(CMAKE_CXX_COMPILER_LAUNCHER "${CCACHE_PROGRAM}")
+find_program(ENV_PROGRAM env)
+if(CCACHE_PROGRAM AND ENV_PROGRAM)
+    # Clones share what was compiled, wherever they lie. Without the sloppiness ccache stores nothing that is compiled with a
+    # precompiled header; it still compares what the headers hold.
+    set(compiler_cache "${ENV_PROGRAM}" "CCACHE_BASEDIR=${PROJECT_SOURCE_DIR}" CCACHE_NOHASHDIR=1
+        "CCACHE_SLOPPINESS=pch_defines,time_macros,include_file_mtime,include_file_ctime" "${CCACHE_PROGRAM}")
+    set(CMAKE_C_COMPILER_LAUNCHER ${compiler_cache})
+    set(CMAKE_CXX_COMPILER_LAUNCHER ${compiler_cache})
 endif()
 
 # The folder that holds this platform's half of every room: posix or win32.
@@ -41,5 +49,36 @@ function(fxprobe_target target)
         target_compile_options(${target} PRIVATE -fsanitize=${FXPROBE_SANITIZE}
                                -fno-sanitize-recover=all -fno-omit-frame-pointer)
         target_link_options(${target} PUBLIC -fsanitize=${FXPROBE_SANITIZE})
+    endif()
+endfunction()
+
+# Only g++'s are shared by clones through the compiler cache without more ado.
+set(FXPROBE_PRECOMPILE OFF)
+if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND NOT CMAKE_DISABLE_PRECOMPILE_HEADERS)
+    set(FXPROBE_PRECOMPILE ON)
+endif()
+
+# fxprobe_precompile(OWNER LINK libraries… HEADERS headers…): compiles the headers once, as the libraries' users see them. The
+# owner is a target of its own, since what shares them must have all of its definitions.
+function(fxprobe_precompile owner)
+    cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "LINK;HEADERS")
+    set(empty_source "${CMAKE_CURRENT_BINARY_DIR}/${owner}.cpp")
+    file(GENERATE OUTPUT "${empty_source}" CONTENT "")
+    add_library(${owner} OBJECT "${empty_source}")
+    target_link_libraries(${owner} PRIVATE ${arg_LINK})
+    fxprobe_target(${owner})
+    if(FXPROBE_PRECOMPILE)
+        target_precompile_headers(${owner} PRIVATE ${arg_HEADERS})
+    endif()
+endfunction()
+
+# fxprobe_share_precompiled(OWNER TARGETS…): the targets must be compiled with the owner's options.
+function(fxprobe_share_precompiled owner)
+    if(FXPROBE_PRECOMPILE)
+        foreach(target IN LISTS ARGN)
+            target_precompile_headers(${target} REUSE_FROM ${owner})
+            # ccache needs it to see which precompiled header a source takes.
+            target_compile_options(${target} PRIVATE -fpch-preprocess)
+        endforeach()
     endif()
 endfunction()

@@ -14,6 +14,7 @@ add_library(vst3sdk STATIC
 target_include_directories(vst3sdk SYSTEM PUBLIC "${VST3_SDK_ROOT}")
 target_compile_definitions(vst3sdk PUBLIC RELEASE=1)
 target_compile_options(vst3sdk PRIVATE -w)
+set_property(TARGET vst3sdk PROPERTY CXX_CLANG_TIDY "")
 if(WIN32)
     target_link_libraries(vst3sdk PUBLIC ole32)
 endif()
