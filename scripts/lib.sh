@@ -8,9 +8,6 @@ export LC_ALL=C.UTF-8
 
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 
-# Clones share what was compiled.
-export CCACHE_BASEDIR=$root CCACHE_NOHASHDIR=1
-
 fail() {
     printf '%s: %s\n' "${0##*/}" "$*" >&2
     exit 1
@@ -29,16 +26,38 @@ step() {
     if ((SECONDS - started > 1)); then printf 'done (%d s)\n' $((SECONDS - started)); else printf 'done\n'; fi
 }
 
-# configure PRESET: with tests.
-configure() {
-    if ! grep -qs '^FXPROBE_BUILD_TESTS:BOOL=ON$' "$root/build/$1/CMakeCache.txt" || [[ ! -f $root/build/$1/build.ninja ]]; then
-        step "Configuring $1" cmake -S "$root" --preset "$1" -DFXPROBE_BUILD_TESTS=ON
-    fi
+# in_root COMMAND…: where CMake finds the presets.
+in_root() { (cd "$root" && "$@"); }
+
+# configure PRESET [OPTION…]
+configure() { step "Configuring $1" in_root cmake --preset "$@"; }
+
+# build PRESET [TARGET…]: the targets, or what the preset names.
+build() {
+    local preset=$1
+    shift
+    step "Building ${*:-$preset}" in_root cmake --build --preset "$preset" ${@:+--target "$@"}
 }
 
-# configure_without_tests PRESET: leaves a tree that is configured already, with or without tests, as it is.
-configure_without_tests() {
-    if [[ ! -f $root/build/$1/build.ninja ]]; then
-        step "Configuring $1" cmake -S "$root" --preset "$1" -DFXPROBE_BUILD_TESTS=OFF
+# configure_windows: from nothing when the libraries lie elsewhere now; a build folder remembers where it found each of them.
+configure_windows() {
+    local preset=windows-release configured=$root/build/windows-release/configured-with fresh=()
+    local options=("-DFXPROBE_WINDOWS_PREFIX=$("$root/scripts/windows-toolchain" --prefix)"
+        "-DFXPROBE_WINDOWS_PLUGINS=$("$root/scripts/windows-plugins" --prefix)")
+    [[ -f $configured && $(<"$configured") == "${options[*]}" ]] || fresh=(--fresh)
+    configure "$preset" "${fresh[@]}" "${options[@]}"
+    printf '%s\n' "${options[*]}" >"$configured"
+}
+
+# run_tests PRESET [CTEST-OPTION…]: shows the tests as they run, and at the end whether all of them passed.
+run_tests() {
+    local preset=$1 log=$root/build/$1/ctest.log
+    shift
+    printf 'Testing %s\n' "$preset"
+    if in_root ctest --preset "$preset" -j"$(nproc)" "$@" 2>&1 | tee "$log"; then
+        printf '%s: passed\n' "$preset"
+        return
     fi
+    printf '%s: FAILED (%s)\n' "$preset" "$log"
+    return 1
 }
