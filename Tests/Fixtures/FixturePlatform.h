@@ -7,12 +7,9 @@
 /// The full path of the module that this function is linked into.
 std::string modulePath();
 
-/// Reads a whole file; false when it cannot be opened.
-bool readFile(const std::string &path, std::string &content);
 /// Appends to a file in one write, so that the lines of several processes do not mix; false when it fails.
 bool appendToFile(const std::string &path, const std::string &text);
 
-void sleepMilliseconds(int milliseconds);
 /// Ends the process at once, without exit handlers.
 [[noreturn]] void endProcess(int exitCode);
 /// Ends the process from outside, as a user would who lost patience.
@@ -22,7 +19,7 @@ void endThread();
 
 void setFileMask(int mask);
 /// Touches memory that is not there and repairs that in a handler of its own, as copy protection does, and
-/// leaves a handler behind, which ends the process at any other violation. False for any value but "keep".
-bool repairOwnViolation(const std::string &afterwards);
+/// leaves a handler behind, which ends the process at any other violation. The value says nothing.
+bool repairOwnViolation(const std::string &value);
 /// Lets an alarm signal arrive after so many seconds, where the system has one; false for none.
 bool startAlarm(const std::string &seconds);

@@ -1,39 +1,45 @@
 #include "Tests/Fixtures/FixtureScript.h"
 
+#include "Tests/Fixtures/FixtureFaults.h"
 #include "Tests/Fixtures/FixturePlatform.h"
 
 #include <algorithm>
-#include <cerrno>
+#include <charconv>
+#include <chrono>
+#include <cstdio>
 #include <cstdlib>
-#include <limits>
-#include <sstream>
+#include <filesystem>
+#include <fstream>
+#include <thread>
 
 namespace {
 
-/// The byte of an escape that begins at `position`, which then is that of its last character.
-char escaped(const std::string &line, std::size_t &position)
+/// Statements that name a stage, of every format.
+const char kOrders[] = "effect delay fault answer ask-host";
+
+bool holdsWord(const std::string &words, const std::string &word)
 {
-    const char kind = ++position < line.size() ? line[position] : '\0';
-    if (kind == '\\' || kind == '"')
-        return kind;
-    if (kind == 'n' || kind == 't')
-        return kind == 'n' ? '\n' : '\t';
-    const std::string digits = line.substr(std::min(position + 1, line.size()), 2);
-    if (kind != 'x' || digits.size() != 2 ||
-        digits.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos)
-        throw ScriptError("unknown escape");
-    position += 2;
-    return static_cast<char>(std::strtoul(digits.c_str(), nullptr, 16));
+    return (' ' + words + ' ').find(' ' + word + ' ') != std::string::npos;
 }
 
-std::vector<std::string> wordsOf(const std::string &line)
+/// The byte that an escape at a place stands for; moves the place to its last character.
+char escapedByte(const std::string &line, std::size_t &place)
 {
-    std::vector<std::string> words;
-    bool quoted = false;
-    bool inWord = false;
-    for (std::size_t position = 0; position < line.size(); ++position) {
-        const char character = line[position];
-        const bool isBlank = !quoted && (character == ' ' || character == '\t');
+    const char kind = place + 1 < line.size() ? line[++place] : '\\';
+    if (kind != 'x')
+        return kind == 'n' ? '\n' : kind == 't' ? '\t' : kind;
+    place += 2;
+    return static_cast<char>(std::strtoul(line.substr(place - 1, 2).c_str(), nullptr, 16));
+}
+
+/// Splits a line at its blanks.
+FixtureScript::Words wordsOf(const std::string &line)
+{
+    FixtureScript::Words words;
+    bool quoted = false, inWord = false;
+    for (std::size_t place = 0; place < line.size(); ++place) {
+        const char character = line[place];
+        const bool isBlank = !quoted && (character == ' ' || character == '\t' || character == '\r');
         if (!inWord && character == '#')
             break;
         if (!inWord && !isBlank)
@@ -42,110 +48,148 @@ std::vector<std::string> wordsOf(const std::string &line)
         if (character == '"')
             quoted = !quoted;
         else if (inWord)
-            words.back() += character == '\\' ? escaped(line, position) : character;
+            words.back() += character == '\\' ? escapedByte(line, place) : character;
     }
     if (quoted)
-        throw ScriptError("a quotation mark is missing");
+        reportMisuse("a quotation mark is missing: " + line);
     return words;
 }
 
-ScriptStatement parseLine(const std::string &text, int number)
+std::string printable(const std::string &text)
 {
-    ScriptStatement statement;
-    statement.line = number;
-    try {
-        statement.words = wordsOf(text);
-        if (!statement.words.empty()) {
-            statement.key = statement.words.front();
-            statement.words.erase(statement.words.begin());
-        }
-    } catch (const ScriptError &error) {
-        statement.fail(error.what());
+    std::string result;
+    for (const char character : text) {
+        const auto byte = static_cast<unsigned char>(character);
+        char escape[8] = {character};
+        if (byte < 0x20 || byte == 0x7F)
+            std::snprintf(escape, sizeof escape, "\\x%02X", byte);
+        result += escape;
     }
-    return statement;
+    return result;
 }
 
 } // namespace
 
-const std::string &ScriptStatement::word(std::size_t index) const
+void reportMisuse(const std::string &reason)
 {
-    if (index >= words.size())
-        fail("word " + std::to_string(index + 1) + " is missing");
-    return words[index];
+    std::fprintf(stderr, "fixture misused: %s: %s\n", modulePath().c_str(), reason.c_str());
+    std::fflush(stderr);
+    endProcess(kFixtureMisused);
 }
 
-std::string ScriptStatement::optionalWord(std::size_t index) const
+std::int32_t numberOf(const std::string &text)
 {
-    return index < words.size() ? words[index] : std::string();
-}
-
-std::int32_t ScriptStatement::number(std::size_t index) const
-{
-    try {
-        return parseNumber(word(index));
-    } catch (const ScriptError &error) {
-        fail(error.what());
-    }
-}
-
-void ScriptStatement::allowWords(std::size_t most) const
-{
-    if (words.size() > most)
-        fail("word " + std::to_string(most + 1) + " is one too many");
-}
-
-void ScriptStatement::fail(const std::string &reason) const
-{
-    throw ScriptError("line " + std::to_string(line) + ", '" + key + "': " + reason);
-}
-
-std::vector<ScriptStatement> parseScript(const std::string &script)
-{
-    std::vector<ScriptStatement> statements;
-    std::istringstream lines(script);
-    std::string text;
-    for (int number = 1; std::getline(lines, text); ++number) {
-        if (!text.empty() && text.back() == '\r')
-            text.pop_back();
-        ScriptStatement statement = parseLine(text, number);
-        if (!statement.key.empty())
-            statements.push_back(std::move(statement));
-    }
-    return statements;
-}
-
-std::optional<std::vector<ScriptStatement>> moduleStatements()
-{
-    std::string script;
-    return readFile(modulePath() + ".script", script) ? std::make_optional(parseScript(script))
-                                                      : std::nullopt;
-}
-
-std::int32_t parseNumber(const std::string &text)
-{
-    const bool hexadecimal = text.rfind("0x", 0) == 0;
+    const bool isHexadecimal = text.rfind("0x", 0) == 0;
     char *end = nullptr;
-    errno = 0;
-    const long long value = std::strtoll(text.c_str(), &end, hexadecimal ? 16 : 10);
-    const long long most =
-        hexadecimal ? std::numeric_limits<std::uint32_t>::max() : std::numeric_limits<std::int32_t>::max();
-    if (text.empty() || *end != '\0' || errno != 0 || value > most ||
-        value < std::numeric_limits<std::int32_t>::min())
-        throw ScriptError("'" + text + "' is no 32-bit number");
-    return static_cast<std::int32_t>(static_cast<std::uint32_t>(value));
+    const long long value = std::strtoll(text.c_str(), &end, isHexadecimal ? 16 : 10);
+    const auto number = static_cast<std::int32_t>(value);
+    if (text.empty() || *end != '\0' ||
+        (value != number && !(isHexadecimal && value == static_cast<std::uint32_t>(number))))
+        reportMisuse("'" + text + "' is not a 32-bit number");
+    return number;
 }
 
-std::int32_t numberOfAnswer(const std::string &answer)
+float floatOf(const std::string &text)
 {
-    try {
-        return parseNumber(answer);
-    } catch (const ScriptError &error) {
-        reportMisuse(error.what());
+    float value = 0;
+    if (std::from_chars(text.data(), text.data() + text.size(), value).ec != std::errc())
+        reportMisuse("'" + text + "' is not a number");
+    return value;
+}
+
+std::string textOf(float value)
+{
+    char text[64] = {};
+    return std::string(text, std::to_chars(text, text + sizeof text, value).ptr);
+}
+
+FixtureScript::FixtureScript(const FixtureWords &format)
+{
+    const std::filesystem::path module = std::filesystem::u8path(modulePath());
+    subjects.push_back({module.stem().u8string(), 0, 0});
+    std::ifstream file(std::filesystem::u8path(modulePath() + ".script"), std::ios::binary);
+    exists = file.is_open();
+    for (std::string line; std::getline(file, line);)
+        if (Words words = wordsOf(line); !words.empty())
+            add(std::move(words), format);
+    subjects[0].name = text("name", 0, subjects[0].name);
+}
+
+void FixtureScript::add(Words words, const FixtureWords &format)
+{
+    const std::string key = words.front();
+    words.erase(words.begin());
+    const bool isOrder = holdsWord(kOrders, key) && !words.empty() && holdsWord(format.stages, words[0]);
+    const bool isOfModule = isOrder || key == "trace" || holdsWord(format.moduleKeys, key);
+    if (key == format.subjectKey)
+        subjects.push_back({words.back(), format.subjectHasNumber ? numberOf(words[0]) : 0, subjects.size()});
+    else if (!isOfModule && !holdsWord(format.subjectKeys, key))
+        reportMisuse("unknown statement '" + key + ' ' + (words.empty() ? "" : words[0]) + "'");
+    m_statements.push_back({key, std::move(words), isOfModule ? 0 : subjects.size() - 1});
+}
+
+std::vector<FixtureScript::Words> FixtureScript::all(const std::string &key, std::size_t place) const
+{
+    std::vector<Words> found;
+    for (const Statement &statement : m_statements)
+        if (statement.key == key && statement.place == place)
+            found.push_back(statement.words);
+    return found;
+}
+
+std::string FixtureScript::text(const std::string &key, std::size_t place, const std::string &usual) const
+{
+    const std::vector<Words> found = all(key, place);
+    return found.empty() ? usual : found.back().at(0);
+}
+
+std::int32_t FixtureScript::number(const std::string &key, std::size_t place, std::int32_t usual) const
+{
+    return has(key, place) ? numberOf(text(key, place, {})) : usual;
+}
+
+std::vector<FixtureScript::Words> FixtureScript::ordered(const char *key, const std::string &stage,
+                                                         const FixtureSubject &subject,
+                                                         std::size_t least) const
+{
+    std::vector<Words> found = all(key);
+    const auto isOfOther = [&](const Words &words) {
+        const bool isOfAll = words.size() <= least;
+        return words[0] != stage ||
+               !(isOfAll || words.back() == subject.name ||
+                 (subject.number != 0 && words.back() == std::to_string(subject.number)));
+    };
+    found.erase(std::remove_if(found.begin(), found.end(), isOfOther), found.end());
+    return found;
+}
+
+void FixtureScript::reach(const std::string &stage, const FixtureSubject &subject,
+                          const std::string &detail) const
+{
+    note(stage, subject, detail);
+    for (const Words &words : ordered("effect", stage, subject, 3))
+        if (!causeSideEffect(words.at(1), words.size() > 2 ? words[2] : ""))
+            reportMisuse("the side effect '" + words[1] + "' is not possible here");
+    for (const Words &words : ordered("delay", stage, subject))
+        std::this_thread::sleep_for(std::chrono::milliseconds(numberOf(words.at(1))));
+    for (const Words &words : ordered("fault", stage, subject))
+        if (!commitFault(words.at(1)))
+            reportMisuse("there is no fault '" + words[1] + "'");
+}
+
+void FixtureScript::note(const std::string &stage, const FixtureSubject &subject,
+                         const std::string &detail) const
+{
+    for (const Words &trace : all("trace")) {
+        std::string line = (trace.size() > 1 ? trace[1] + ' ' : "") + stage;
+        line += (subject.name.empty() ? "" : ' ' + subject.name) + (detail.empty() ? "" : ": " + detail);
+        if (!appendToFile(trace.at(0), printable(line) + '\n'))
+            reportMisuse("cannot write the trace file '" + trace[0] + "'");
     }
 }
 
-std::string baseName(const std::string &path)
+std::string FixtureScript::answer(const std::string &stage, const FixtureSubject &subject) const
 {
-    const std::string name = path.substr(path.find_last_of("/\\") + 1);
-    return name.substr(0, name.rfind('.'));
+    const std::vector<Words> answers = ordered("answer", stage, subject);
+    return answers.empty() ? "" : answers.front().at(1);
 }

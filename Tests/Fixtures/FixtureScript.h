@@ -1,84 +1,76 @@
 #pragma once
 
-#include "Tests/Fixtures/FixtureMisuse.h"
-
 #include <cstdint>
-#include <initializer_list>
-#include <optional>
-#include <stdexcept>
 #include <string>
-#include <type_traits>
-#include <utility>
 #include <vector>
 
-/// A script that cannot be understood. The text names the line.
-class ScriptError : public std::runtime_error {
+/// The exit code of a process whose fixture was scripted wrongly or called against its rules, so that neither
+/// passes for one of the faults that a test asked for.
+inline constexpr int kFixtureMisused = 86;
+
+/// Ends the process with kFixtureMisused and says why on the error output.
+[[noreturn]] void reportMisuse(const std::string &reason);
+
+/// A 32-bit number, decimal or with 0x; a hexadecimal one may set the top bit. Anything else is a misuse.
+std::int32_t numberOf(const std::string &text);
+/// A decimal fraction, whatever the locale; "inf" and "nan" too.
+float floatOf(const std::string &text);
+std::string textOf(float value);
+
+/// What a call concerns: the module, one of its classes or one of its sub-plug-ins.
+struct FixtureSubject {
+    std::string name;
+    std::int32_t number = 0;
+    std::size_t place = 0; ///< among the script's subjects; 0 is the module
+};
+
+/// The words of a format's scripts, between blanks.
+struct FixtureWords {
+    std::string subjectKey;  ///< begins a class or sub-plug-in
+    bool subjectHasNumber;   ///< whether a number stands before its name
+    std::string subjectKeys; ///< describe the subject above them, or the module
+    std::string moduleKeys;  ///< concern the module wherever they stand
+    std::string stages;
+};
+
+/// The script beside the module, see README.md.
+class FixtureScript {
 public:
-    using std::runtime_error::runtime_error;
+    using Words = std::vector<std::string>;
+
+    /// Reads the script. A statement that the format does not know is a misuse.
+    explicit FixtureScript(const FixtureWords &format);
+
+    bool exists = false;                  ///< whether there is a script
+    std::vector<FixtureSubject> subjects; ///< the module itself, then those of the script in order
+
+    /// The words behind each statement of a key that describes a subject.
+    std::vector<Words> all(const std::string &key, std::size_t place = 0) const;
+    /// The first word of the last of them.
+    std::string text(const std::string &key, std::size_t place, const std::string &usual) const;
+    std::int32_t number(const std::string &key, std::size_t place, std::int32_t usual) const;
+    bool has(const std::string &key, std::size_t place = 0) const { return !all(key, place).empty(); }
+
+    /// Tells that the module is called: writes the trace line, then causes the side effects, the delays and
+    /// the fault that the script has for this stage and subject.
+    void reach(const std::string &stage, const FixtureSubject &subject = {},
+               const std::string &detail = {}) const;
+    /// Writes a trace line only; it is in the file before the call goes on.
+    void note(const std::string &stage, const FixtureSubject &subject, const std::string &detail) const;
+    /// The scripted answer for a stage and subject; empty where there is none.
+    std::string answer(const std::string &stage, const FixtureSubject &subject = {}) const;
+
+private:
+    struct Statement {
+        std::string key;
+        Words words;
+        std::size_t place;
+    };
+    void add(Words words, const FixtureWords &format);
+    /// The statements of a key that name this stage, and this subject or none; its name is their last word
+    /// but for the first `least`.
+    std::vector<Words> ordered(const char *key, const std::string &stage, const FixtureSubject &subject,
+                               std::size_t least = 2) const;
+
+    std::vector<Statement> m_statements;
 };
-
-/// One statement of a script: its key and the words behind it.
-struct ScriptStatement {
-    int line = 0; ///< counted from 1
-    std::string key;
-    std::vector<std::string> words;
-
-    /// The word at an index; throws ScriptError when the statement has fewer.
-    const std::string &word(std::size_t index) const;
-    /// The word at an index, or an empty text.
-    std::string optionalWord(std::size_t index) const;
-    /// The word at an index as a 32-bit number, decimal or with 0x; a hexadecimal one may set the top bit.
-    std::int32_t number(std::size_t index) const;
-    /// Throws ScriptError when the statement has more words than this.
-    void allowWords(std::size_t most) const;
-    /// Puts the one word of a statement whose key is among these where it belongs; false for another key.
-    /// Throws ScriptError.
-    template <typename Value>
-    bool take(std::initializer_list<std::pair<const char *, Value *>> known) const
-    {
-        for (const auto &[name, value] : known) {
-            if (key != name)
-                continue;
-            if constexpr (std::is_convertible_v<std::string, Value>)
-                *value = word(0);
-            else
-                *value = number(0);
-            allowWords(1);
-            return true;
-        }
-        return false;
-    }
-    /// Throws ScriptError for this statement.
-    [[noreturn]] void fail(const std::string &reason) const;
-};
-
-/// Splits a script into its statements: one per line, words between blanks, texts with blanks in double
-/// quotes, \xHH \n \t \\ \" for bytes that cannot stand as they are, `#` in front of a comment. Throws
-/// ScriptError.
-std::vector<ScriptStatement> parseScript(const std::string &script);
-
-/// The statements of the script beside this module; none without a script. Throws ScriptError.
-std::optional<std::vector<ScriptStatement>> moduleStatements();
-
-/// A text as a 32-bit number as ScriptStatement::number reads it; throws ScriptError.
-std::int32_t parseNumber(const std::string &text);
-/// The same of an answer. It is read when it is due, in the middle of a call, and must not throw into the
-/// host: one that is no number ends the process.
-std::int32_t numberOfAnswer(const std::string &answer);
-
-/// The file name of a path without its ending: what a plug-in without a script is called.
-std::string baseName(const std::string &path);
-
-/// What the script says of the module, read on first use. One that cannot be understood ends the process.
-template <typename Script>
-const Script &moduleScript()
-{
-    static const Script script = [] {
-        try {
-            return Script();
-        } catch (const ScriptError &error) {
-            reportMisuse(error.what());
-        }
-    }();
-    return script;
-}

@@ -1,6 +1,6 @@
 #include "Tests/Support/ScannerRun.h"
 
-#include "Tests/Fixtures/FixtureMisuse.h"
+#include "Tests/Fixtures/FixtureScript.h"
 #include "Tests/Support/TestFolder.h"
 
 #include <QFile>

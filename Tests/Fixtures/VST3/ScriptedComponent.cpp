@@ -1,7 +1,4 @@
-#include "Tests/Fixtures/VST3/ScriptedComponent.h"
-
-#include "Tests/Fixtures/FixtureMisuse.h"
-#include "Tests/Fixtures/VST3/ScriptedModule.h"
+#include "Tests/Fixtures/VST3/VST3Script.h"
 
 #include <pluginterfaces/base/ibstream.h>
 #include <pluginterfaces/vst/ivstcomponent.h>
@@ -9,16 +6,27 @@
 #include <pluginterfaces/vst/ivsthostapplication.h>
 #include <pluginterfaces/vst/ivstmessage.h>
 
+#include <algorithm>
 #include <memory>
+#include <optional>
 
 using namespace Steinberg;
 
 namespace {
 
+const char kController[] = "Component Controller Class";
+
+/// The buses of a direction, each "CHANNELS" or "CHANNELS:TYPE".
+FixtureScript::Words busesOf(const FixtureSubject &described, Vst::BusDirection direction)
+{
+    const auto stated = script().all(direction == Vst::kInput ? "inputs" : "outputs", described.place);
+    return stated.empty() ? FixtureScript::Words{"2"} : stated.back();
+}
+
 const char *nameOf(Vst::BusDirection direction) { return direction == Vst::kInput ? "input" : "output"; }
 
 /// All that a stream holds from where it stands.
-std::string textOf(IBStream *stream)
+std::string contentOf(IBStream *stream)
 {
     std::string text;
     char bytes[4096];
@@ -31,14 +39,9 @@ std::string textOf(IBStream *stream)
 /// Whether the context is a host that says its name.
 bool hasHostName(FUnknown *context)
 {
-    Vst::IHostApplication *application = nullptr;
-    if (!context || context->queryInterface(Vst::IHostApplication::iid,
-                                            reinterpret_cast<void **>(&application)) != kResultOk)
-        return false;
+    const FUnknownPtr<Vst::IHostApplication> application(context);
     Vst::String128 name = {};
-    const tresult result = application->getName(name);
-    application->release();
-    return result == kResultOk && name[0] != 0;
+    return application && application->getName(name) == kResultOk && name[0] != 0;
 }
 
 /// An instance of a scripted class: a component, an edit controller or both in one. The module owns it until
@@ -48,30 +51,32 @@ class ScriptedComponent final : public Vst::IComponent,
                                 public Vst::IEditController,
                                 public Vst::IConnectionPoint {
 public:
-    explicit ScriptedComponent(const ScriptedClass &described)
+    explicit ScriptedComponent(const FixtureSubject &described)
         : m_class(described)
-        , m_data(described.state)
-    {}
+        , m_isController(textOf(described, "controller") == "self" ||
+                         textOf(described, "category") == kController)
+        , m_isComponent(textOf(described, "category") != kController)
+    {
+        if (script().has("state", described.place))
+            m_data = textOf(described, "state");
+    }
     virtual ~ScriptedComponent() = default;
     /// Gives up the reference that it was made with.
     void forgetMaker() { --m_references; }
 
-    tresult PLUGIN_API queryInterface(const TUID interfaceId, void **object) override
+    tresult PLUGIN_API queryInterface(const TUID id, void **object) override
     {
         expectAlive("queryInterface");
         *object = nullptr;
-        if (FUnknownPrivate::iidEqual(interfaceId, FUnknown::iid) ||
-            FUnknownPrivate::iidEqual(interfaceId, IPluginBase::iid) ||
-            (FUnknownPrivate::iidEqual(interfaceId, Vst::IComponent::iid) && isComponent()))
-            *object = static_cast<Vst::IComponent *>(this);
-        else if (FUnknownPrivate::iidEqual(interfaceId, Vst::IEditController::iid) && isController())
-            *object = static_cast<Vst::IEditController *>(this);
-        else if (FUnknownPrivate::iidEqual(interfaceId, Vst::IConnectionPoint::iid))
-            *object = static_cast<Vst::IConnectionPoint *>(this);
-        else
-            return kNoInterface;
-        addRef();
-        return kResultOk;
+        if (m_isComponent) {
+            QUERY_INTERFACE(id, object, Vst::IComponent::iid, Vst::IComponent)
+        }
+        if (m_isController) {
+            QUERY_INTERFACE(id, object, Vst::IEditController::iid, Vst::IEditController)
+        }
+        QUERY_INTERFACE(id, object, FUnknown::iid, Vst::IComponent)
+        QUERY_INTERFACE(id, object, Vst::IConnectionPoint::iid, Vst::IConnectionPoint)
+        return kNoInterface;
     }
 
     uint32 PLUGIN_API addRef() override
@@ -88,7 +93,7 @@ public:
         if (m_state == State::Initialized)
             reportMisuse("'" + m_class.name + "' was released without terminate");
         m_references = 0;
-        scriptedModule().stages.reach("release", m_class.name);
+        script().reach("release", m_class);
         return 0;
     }
 
@@ -97,10 +102,10 @@ public:
         expectAlive("initialize");
         if (m_state == State::Initialized)
             reportMisuse("'" + m_class.name + "' was initialised twice");
-        scriptedModule().stages.reach("initialize", m_class.name);
+        script().reach("initialize", m_class);
         if (!hasHostName(context))
             reportMisuse("'" + m_class.name + "' was initialised by a host without a name");
-        const tresult result = scriptedModule().result("initialize", m_class.name);
+        const tresult result = resultAt("initialize", m_class);
         m_state = result == kResultOk ? State::Initialized : State::Refused;
         return result;
     }
@@ -109,25 +114,27 @@ public:
     {
         expectInitialized("terminate");
         m_state = State::Terminated;
-        scriptedModule().stages.reach("terminate", m_class.name);
-        return scriptedModule().result("terminate", m_class.name);
+        script().reach("terminate", m_class);
+        return resultAt("terminate", m_class);
     }
 
     tresult PLUGIN_API getControllerClassId(TUID classId) override
     {
         const tresult result = reach("controller-class-id");
-        if (result != kResultOk || m_class.controller.empty())
+        const std::string name = textOf(m_class, "controller");
+        if (result != kResultOk || name.empty())
             return result == kResultOk ? kNotImplemented : result;
-        if (const ScriptedClass *controller = scriptedModule().classWithName(m_class.controller))
-            controller->id.toTUID(classId);
+        for (const FixtureSubject &other : script().subjects)
+            if (other.name == name && other.place > 0)
+                idOf(other).toTUID(classId);
         return kResultOk;
     }
 
     tresult PLUGIN_API setIoMode(Vst::IoMode mode) override
     {
         expectAlive("setIoMode");
-        scriptedModule().stages.reach("set-io-mode", m_class.name, std::to_string(mode));
-        return scriptedModule().result("set-io-mode", m_class.name);
+        script().reach("set-io-mode", m_class, std::to_string(mode));
+        return resultAt("set-io-mode", m_class);
     }
 
     int32 PLUGIN_API getBusCount(Vst::MediaType type, Vst::BusDirection direction) override
@@ -135,31 +142,31 @@ public:
         expectInitialized("getBusCount");
         if (type != Vst::kAudio)
             return 0;
-        scriptedModule().stages.reach("bus-count", m_class.name, nameOf(direction));
-        const auto &stated = direction == Vst::kInput ? m_class.statedInputs : m_class.statedOutputs;
-        const auto &buses = direction == Vst::kInput ? m_class.inputs : m_class.outputs;
-        return stated ? *stated : static_cast<int32>(buses.size());
+        script().reach("bus-count", m_class, nameOf(direction));
+        return script().number(direction == Vst::kInput ? "stated-inputs" : "stated-outputs", m_class.place,
+                               static_cast<int32>(busesOf(m_class, direction).size()));
     }
 
     tresult PLUGIN_API getBusInfo(Vst::MediaType type, Vst::BusDirection direction, int32 index,
                                   Vst::BusInfo &bus) override
     {
         expectInitialized("getBusInfo");
-        const auto &buses = direction == Vst::kInput ? m_class.inputs : m_class.outputs;
+        const FixtureScript::Words buses = busesOf(m_class, direction);
         // Not in the trace: a host that believes a huge count would fill the disk.
         if (type != Vst::kAudio || index < 0 || static_cast<std::size_t>(index) >= buses.size())
             return kInvalidArgument;
-        scriptedModule().stages.reach("bus-info", m_class.name,
-                                      std::string(nameOf(direction)) + " " + std::to_string(index));
-        const tresult result = scriptedModule().result("bus-info", m_class.name);
+        script().reach("bus-info", m_class, std::string(nameOf(direction)) + " " + std::to_string(index));
+        const tresult result = resultAt("bus-info", m_class);
         if (result != kResultOk)
             return result;
-        const ScriptedBus &scripted = buses[static_cast<std::size_t>(index)];
+        const std::string &word = buses[static_cast<std::size_t>(index)];
+        const std::size_t colon = std::min(word.find(':'), word.size());
+        const std::string busType = word.substr(std::min(colon + 1, word.size()));
         bus = {};
         bus.mediaType = type;
         bus.direction = direction;
-        bus.channelCount = scripted.channels;
-        bus.busType = scripted.type;
+        bus.channelCount = numberOf(word.substr(0, colon));
+        bus.busType = busType.empty() ? 0 : busType == "aux" ? 1 : numberOf(busType);
         return kResultOk;
     }
 
@@ -167,17 +174,15 @@ public:
     {
         return kNotImplemented;
     }
-
     tresult PLUGIN_API activateBus(Vst::MediaType, Vst::BusDirection, int32, TBool) override
     {
         return kResultOk;
     }
-
     tresult PLUGIN_API setActive(TBool) override { return kResultOk; }
 
     tresult PLUGIN_API setState(IBStream *state) override
     {
-        const std::string bytes = textOf(state);
+        const std::string bytes = contentOf(state);
         const tresult result = reach("set-state", bytes);
         if (result == kResultOk)
             m_data = bytes;
@@ -189,57 +194,46 @@ public:
         const tresult result = reach("get-state");
         if (result != kResultOk || !m_data)
             return result == kResultOk ? kNotImplemented : result;
-        std::string bytes = *m_data;
-        return state->write(bytes.data(), static_cast<int32>(bytes.size()), nullptr);
+        return state->write(m_data->data(), static_cast<int32>(m_data->size()), nullptr);
     }
 
     tresult PLUGIN_API setComponentState(IBStream *state) override
     {
-        return reach("set-component-state", textOf(state));
+        return reach("set-component-state", contentOf(state));
     }
-
     tresult PLUGIN_API setComponentHandler(Vst::IComponentHandler *handler) override
     {
         return reach("set-component-handler", handler ? "" : "null");
     }
-
     tresult PLUGIN_API connect(Vst::IConnectionPoint *) override { return reach("connect"); }
-
     tresult PLUGIN_API disconnect(Vst::IConnectionPoint *) override { return reach("disconnect"); }
 
     int32 PLUGIN_API getParameterCount() override { return 0; }
     tresult PLUGIN_API getParameterInfo(int32, Vst::ParameterInfo &) override { return kInvalidArgument; }
-    tresult PLUGIN_API getParamStringByValue(Vst::ParamID, Vst::ParamValue, Vst::String128) override
+    tresult PLUGIN_API getParamStringByValue(Vst::ParamID, double, Vst::String128) override
     {
-        return kInvalidArgument;
+        return kResultFalse;
     }
-    tresult PLUGIN_API getParamValueByString(Vst::ParamID, Vst::TChar *, Vst::ParamValue &) override
+    tresult PLUGIN_API getParamValueByString(Vst::ParamID, char16 *, double &) override
     {
-        return kInvalidArgument;
+        return kResultFalse;
     }
-    Vst::ParamValue PLUGIN_API normalizedParamToPlain(Vst::ParamID, Vst::ParamValue) override { return 0; }
-    Vst::ParamValue PLUGIN_API plainParamToNormalized(Vst::ParamID, Vst::ParamValue) override { return 0; }
-    Vst::ParamValue PLUGIN_API getParamNormalized(Vst::ParamID) override { return 0; }
-    tresult PLUGIN_API setParamNormalized(Vst::ParamID, Vst::ParamValue) override { return kInvalidArgument; }
+    double PLUGIN_API normalizedParamToPlain(Vst::ParamID, double) override { return 0; }
+    double PLUGIN_API plainParamToNormalized(Vst::ParamID, double) override { return 0; }
+    double PLUGIN_API getParamNormalized(Vst::ParamID) override { return 0; }
+    tresult PLUGIN_API setParamNormalized(Vst::ParamID, double) override { return kInvalidArgument; }
     IPlugView *PLUGIN_API createView(FIDString) override { return nullptr; }
     tresult PLUGIN_API notify(Vst::IMessage *) override { return kResultOk; }
 
 private:
     enum class State { Created, Initialized, Refused, Terminated };
 
-    bool isController() const
-    {
-        return m_class.controller == "self" || m_class.category == "Component Controller Class";
-    }
-
-    bool isComponent() const { return !isController() || m_class.controller == "self"; }
-
     /// Announces a call to an initialised instance; the scripted answer.
     tresult reach(const char *stage, const std::string &detail = {})
     {
         expectInitialized(stage);
-        scriptedModule().stages.reach(stage, m_class.name, detail);
-        return scriptedModule().result(stage, m_class.name);
+        script().reach(stage, m_class, detail);
+        return resultAt(stage, m_class);
     }
 
     void expectAlive(const char *call) const
@@ -257,7 +251,8 @@ private:
             reportMisuse(std::string(call) + " of '" + m_class.name + "', which is not initialised");
     }
 
-    const ScriptedClass &m_class;
+    FixtureSubject m_class;
+    bool m_isController, m_isComponent;
     std::optional<std::string> m_data;
     State m_state = State::Created;
     uint32 m_references = 1;
@@ -265,12 +260,11 @@ private:
 
 } // namespace
 
-tresult createComponent(const ScriptedClass &described, FIDString interfaceId, void **object)
+tresult createInstanceOf(const FixtureSubject &described, FIDString interfaceId, void **object)
 {
     static std::vector<std::unique_ptr<ScriptedComponent>> all;
     all.push_back(std::make_unique<ScriptedComponent>(described));
-    ScriptedComponent &made = *all.back();
-    const tresult result = made.queryInterface(interfaceId, object);
-    made.forgetMaker();
+    const tresult result = all.back()->queryInterface(interfaceId, object);
+    all.back()->forgetMaker();
     return result;
 }

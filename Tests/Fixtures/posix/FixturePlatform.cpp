@@ -1,11 +1,7 @@
 #include "Tests/Fixtures/FixturePlatform.h"
 
-#include <chrono>
 #include <csignal>
 #include <cstdlib>
-#include <fstream>
-#include <iterator>
-#include <thread>
 
 #include <dlfcn.h>
 #include <fcntl.h>
@@ -38,13 +34,6 @@ std::string modulePath()
     return info.dli_fname ? info.dli_fname : "";
 }
 
-bool readFile(const std::string &path, std::string &content)
-{
-    std::ifstream file(path, std::ios::binary);
-    content.assign(std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>());
-    return file.is_open();
-}
-
 bool appendToFile(const std::string &path, const std::string &text)
 {
     const int file = open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0666);
@@ -55,11 +44,6 @@ bool appendToFile(const std::string &path, const std::string &text)
     return written == static_cast<ssize_t>(text.size());
 }
 
-void sleepMilliseconds(int milliseconds)
-{
-    std::this_thread::sleep_for(std::chrono::milliseconds(milliseconds));
-}
-
 void endProcess(int exitCode) { _exit(exitCode); }
 
 void killProcess() { kill(getpid(), SIGKILL); }
@@ -68,10 +52,10 @@ void endThread() { pthread_exit(nullptr); }
 
 void setFileMask(int mask) { umask(static_cast<mode_t>(mask)); }
 
-bool repairOwnViolation(const std::string &afterwards)
+bool repairOwnViolation(const std::string &)
 {
     void *page = mmap(nullptr, kPageSize, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-    if (page == MAP_FAILED || afterwards != "keep")
+    if (page == MAP_FAILED)
         return false;
     struct sigaction own = {};
     own.sa_sigaction = repairPage;

@@ -8,14 +8,6 @@
 
 namespace {
 
-/// Whoever opens a file of ours must be able to read, append to and remove it meanwhile, as elsewhere.
-HANDLE openFile(const std::string &path, DWORD access, DWORD disposition)
-{
-    return CreateFileW(std::filesystem::u8path(path).c_str(), access,
-                       FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr, disposition,
-                       FILE_ATTRIBUTE_NORMAL, nullptr);
-}
-
 const std::size_t kPageSize = 4096;
 
 bool isViolation(const EXCEPTION_RECORD &record)
@@ -71,23 +63,12 @@ std::string modulePath()
     return std::filesystem::path(path).generic_u8string();
 }
 
-bool readFile(const std::string &path, std::string &content)
-{
-    content.clear();
-    const HANDLE file = openFile(path, GENERIC_READ, OPEN_EXISTING);
-    if (file == INVALID_HANDLE_VALUE)
-        return false;
-    char buffer[4096];
-    DWORD read = 0;
-    while (ReadFile(file, buffer, sizeof buffer, &read, nullptr) && read > 0)
-        content.append(buffer, read);
-    CloseHandle(file);
-    return true;
-}
-
 bool appendToFile(const std::string &path, const std::string &text)
 {
-    const HANDLE file = openFile(path, FILE_APPEND_DATA, OPEN_ALWAYS);
+    // Whoever reads the file must be able to remove it meanwhile, as elsewhere.
+    const HANDLE file = CreateFileW(std::filesystem::u8path(path).c_str(), FILE_APPEND_DATA,
+                                    FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
+                                    OPEN_ALWAYS, FILE_ATTRIBUTE_NORMAL, nullptr);
     if (file == INVALID_HANDLE_VALUE)
         return false;
     DWORD written = 0;
@@ -95,8 +76,6 @@ bool appendToFile(const std::string &path, const std::string &text)
     CloseHandle(file);
     return written == text.size();
 }
-
-void sleepMilliseconds(int milliseconds) { Sleep(static_cast<DWORD>(milliseconds)); }
 
 void endProcess(int exitCode)
 {
@@ -110,10 +89,10 @@ void endThread() { ExitThread(0); }
 
 void setFileMask(int mask) { _umask(mask); }
 
-bool repairOwnViolation(const std::string &afterwards)
+bool repairOwnViolation(const std::string &)
 {
     void *page = VirtualAlloc(nullptr, kPageSize, MEM_RESERVE | MEM_COMMIT, PAGE_NOACCESS);
-    if (!page || afterwards != "keep")
+    if (!page)
         return false;
     writeIntoRepairedPage(page);
     SetUnhandledExceptionFilter(endAtViolation);
