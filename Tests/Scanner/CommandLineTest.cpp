@@ -1,5 +1,5 @@
-#include "Tests/Scanner/ScannerTest.h"
 #include "Tests/Support/PlatformValues.h"
+#include "Tests/Support/ScanBench.h"
 
 #include <QDir>
 #include <QDirIterator>
@@ -9,7 +9,7 @@ namespace {
 
 const QString kBelowHome = "AppData/Roaming/Morrow Labs/Quillon/Preferences/Tessel/";
 
-class CommandLine : public ScannerTest {
+class CommandLine : public ScanBench {
 protected:
     ScannerOutcome runWith(const QStringList &arguments) const
     {
@@ -19,6 +19,7 @@ protected:
             scanner.setEnvironment(QLatin1String(home), m_folder.dataFolder());
         scanner.setWorkingFolder(m_folder.dataFolder());
         scanner.setEnvironment("LC_ALL", "C");
+        forgetTrace();
         return scanner.run();
     }
     /// The catalogues anywhere below the data folder.
@@ -40,8 +41,9 @@ QString longFolder() { return QString(200, 'a') + '/' + QString(200, 'b') + '/' 
 
 TEST_F(CommandLine, NothingIsDoneWithoutAScanList)
 {
-    addModule("Comp");
+    put("Comp.vst3");
     const QString missing = m_folder.path("Effects/Missing.xml");
+    const QByteArray outdated = "REWIRE VERSION UPDATE REQUIRED";
     const struct {
         const char *name;
         QStringList arguments;
@@ -49,24 +51,18 @@ TEST_F(CommandLine, NothingIsDoneWithoutAScanList)
         QByteArray output;
     } rows[] = {
         {"no argument and no scan list below the home folder", {}, 0, ""},
-        {"a missing file", {missing}, 0, ""},
         {"a missing file before one that exists", {missing, m_folder.scanList()}, 0, ""},
         {"an empty argument", {QString()}, 0, ""},
-        {"version probe", {"-rewire_version"}, 1, "REWIRE VERSION UPDATE REQUIRED\n"},
-        {"version probe with a scan list behind it",
-         {"-rewire_version", m_folder.scanList()},
-         1,
-         "REWIRE VERSION UPDATE REQUIRED\n"},
+        {"version probe with a scan list behind it", {"-rewire_version", m_folder.scanList()}, 1, outdated},
         {"version probe in capitals is a missing file", {"-REWIRE_VERSION"}, 0, ""},
         {"version probe with more behind it is a missing file", {"-rewire_version2"}, 0, ""},
-        {"version probe after a blank is a missing file", {" -rewire_version"}, 0, ""},
     };
     const auto before = effectsFolder();
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
         const ScannerOutcome outcome = runWith(row.arguments);
         EXPECT_EQ(outcome.exitCode, row.exitCode);
-        EXPECT_EQ(outcome.standardOutput, textLines(row.output));
+        EXPECT_EQ(outcome.standardOutput.trimmed(), row.output);
         EXPECT_EQ(outcome.log, QString());
         EXPECT_EQ(effectsFolder(), before);
         EXPECT_EQ(loaded(), QStringList());
@@ -86,31 +82,26 @@ TEST_F(CommandLine, ThePathDecidesWhereTheCatalogueLands)
         QString effects;  ///< the folder that the catalogue lands in; null: nowhere
     } rows[] = {
         {"no argument", kBelowHome + "Effects/FXScan.xml", {}, kBelowHome + "Effects"},
-        {"full path", "a/Effects/FXScan.xml", there + "a/Effects/FXScan.xml", "a/Effects"},
-        {"another file name", "a/Effects/x", there + "a/Effects/x", "a/Effects"},
+        {"full path, another file name", "a/Effects/x", there + "a/Effects/x", "a/Effects"},
         {"the last Effects counts", "a/Effects/b/Effects/f", there + "a/Effects/b/Effects/f",
          "a/Effects/b/Effects"},
         {"a folder below Effects", "a/Effects/b/f", there + "a/Effects/b/f", "a/Effects"},
         {"lower case is another folder", "a/effects/f", there + "a/effects/f", {}},
         {"a longer name is another folder", "a/MyEffects/f", there + "a/MyEffects/f", {}},
-        {"relative path", "a/Effects/f", "a/Effects/f", "a/Effects"},
         {"relative path with dots", "a/Effects/f", "./a/../a/Effects/f", "a/Effects"},
         {"relative path without a data folder", "Effects/f", "Effects/f", {}},
-        {"both separators", "C\\x/Effects/f", there + "C\\x/Effects/f",
-         QDir::fromNativeSeparators("C\\x/Effects")},
         {"the slash wins over a later backslash", "a/Effects/b\\Effects\\f",
          there + "a/Effects/b\\Effects\\f", "a/Effects"},
         {"Japanese and emoji", foreign + "/Effects/f", there + foreign + "/Effects/f", foreign + "/Effects"},
         {"500 characters", longFolder() + "/Effects/f", there + longFolder() + "/Effects/f",
          longFolder() + "/Effects"},
     };
-    const QString module = addModule(foreign);
+    const QString module = put(foreign + ".vst3");
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
         if (row.argument.isNull() && !kHomeFollowsEnvironment)
             continue;
         m_folder.write(row.scanList, m_folder.read(m_folder.scanList()));
-        forgetTrace();
         const ScannerOutcome outcome = runWith(QStringList(row.argument).mid(row.argument.isNull() ? 1 : 0));
         const QString catalogue = row.effects + "/VST3Configuration.xml";
         const bool isWritten = !row.effects.isNull();
@@ -118,17 +109,8 @@ TEST_F(CommandLine, ThePathDecidesWhereTheCatalogueLands)
         EXPECT_EQ(loaded(), QStringList(foreign));
         EXPECT_EQ(catalogues(), isWritten ? QStringList(catalogue) : QStringList());
         EXPECT_EQ(m_folder.read(catalogue).contains(module.toUtf8()), isWritten);
-        // A catalogue that has no place is told about, and nothing else.
-        EXPECT_EQ(logLines(outcome).filter("Cannot write the").isEmpty(), isWritten)
-            << qPrintable(outcome.log);
+        EXPECT_EQ(outcome.log.contains("Cannot write the"), !isWritten) << qPrintable(outcome.log);
         QFile::remove(m_folder.path(catalogue));
         QFile::remove(m_folder.path(row.scanList));
     }
-}
-
-TEST_F(CommandLine, FurtherArgumentsAreIgnored)
-{
-    addModule("Comp");
-    EXPECT_TRUE(runWith({m_folder.scanList(), "-rewire_version"}).succeeded());
-    EXPECT_EQ(listed(), QStringList("Comp"));
 }

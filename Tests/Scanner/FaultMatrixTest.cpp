@@ -1,9 +1,5 @@
-#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
-#include "Tests/Scanner/ScannerTest.h"
 #include "Tests/Support/PlatformValues.h"
-#include "Tests/Support/VST2Fixture.h"
+#include "Tests/Support/ScanBench.h"
 
 #include <QFileInfo>
 #include <QRegularExpression>
@@ -49,14 +45,12 @@ shell  close              ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            
 shell  static-destructor  M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
 )";
 
-const QStringList kFormats{"vst3", "vst2", "shell"};
-
 QStringList words(const QString &line) { return line.split(' ', Qt::SkipEmptyParts); }
 
 QStringList matrixLines() { return QString::fromLatin1(kMatrix).split('\n', Qt::SkipEmptyParts); }
 
 /// A line of the matrix: the format and the stage, then what becomes of each kind of fault.
-class FaultMatrix : public ScannerTest, public testing::WithParamInterface<int> {
+class FaultMatrix : public ScanBench, public testing::WithParamInterface<int> {
 protected:
     FaultMatrix()
         : m_kinds(words(matrixLines().first()).mid(2))
@@ -70,32 +64,17 @@ protected:
         return m_format == "shell" ? m_stage != "static-destructor"
                                    : m_format == "vst3" && !whole.match(m_stage).hasMatch();
     }
-    /// What the module's trace holds once the fault is being committed.
-    QString faultLine(const QString &kind) const
-    {
-        return kind + ' ' + m_stage + (isOfOnePlugin() ? ' ' + kind + " B" : QString());
-    }
-    bool hasReached(const QString &kind) const
-    {
-        const QString line = faultLine(kind);
-        const QStringList lines = trace();
-        return std::any_of(lines.begin(), lines.end(),
-                           [&line](const QString &text) { return text.startsWith(line); });
-    }
     void add(const QString &kind) const
     {
         const QByteArray name = kind.toUtf8();
-        QByteArray script = "trace \"" + tracePath().toUtf8() + "\" " + name + '\n';
+        QByteArray script;
         if (m_format != "vst2")
             for (const char *letter : {"A", "B", "C"})
                 script += (m_format == "vst3" ? "class \"" : "child " + QByteArray::number(*letter) + " \"") +
                           name + ' ' + letter + "\"\n";
         script +=
             "fault " + m_stage.toUtf8() + ' ' + name + (isOfOnePlugin() ? " \"" + name + " B\"\n" : "\n");
-        if (m_format == "vst3")
-            addVST3File(m_folder.plugins(), kind, script);
-        else
-            addVST2File(m_folder.plugins(), kind, script);
+        put(kind + (m_format == "vst3" ? ".vst3" : ".vst2"), script);
     }
     /// Runs the scanner until no marker survives; what hangs is ended from outside. The number of runs.
     int runs() const
@@ -105,7 +84,7 @@ protected:
             forgetTrace();
             ScannerRun scanner(scannerProgram(), m_folder);
             EXPECT_TRUE(scanner.start());
-            if (scanner.waitUntil([this] { return hasReached("hang"); }))
+            if (waitForStage(scanner, "hang", m_stage + (isOfOnePlugin() ? " hang B" : "")))
                 scanner.kill();
             scanner.wait();
             if (m_folder.markers().isEmpty())
@@ -122,16 +101,14 @@ protected:
 
 QString FaultMatrix::found(const QString &kind) const
 {
-    const bool isVst3 = m_format == "vst3";
     QStringList found;
-    const CatalogueContents contents =
-        isVst3 ? readCatalogueFile(vst3CatalogueFormat(), cataloguePath())
-               : readCatalogueFile(vstCatalogueFormat(), m_folder.effects() + "/FXConfiguration.xml");
-    for (const EffectRecord &record : contents.records) {
-        if (QFileInfo(record.path).completeBaseName() != kind)
+    const char *file = m_format == "vst3" ? "VST3Configuration.xml" : "FXConfiguration.xml";
+    for (const QString &row : recordsOf(file, "Name Path Enabled Working")) {
+        const QStringList values = row.split('|');
+        if (QFileInfo(values[1]).completeBaseName() != kind)
             continue;
-        const char *state = record.working ? "" : record.enabled ? "?" : "!";
-        found.append((record.name == kind ? "M" : record.name.right(1)) + state);
+        const char *state = values[3] == "1" ? "" : values[2] == "1" ? "?" : "!";
+        found.append((values[0] == kind ? "M" : values[0].right(1)) + state);
     }
     found.sort();
     return found.isEmpty() ? "-" : found.join(QString());

@@ -1,67 +1,104 @@
-#include "Tests/Scanner/DisturbedScan.h"
-#include "Tests/Scanner/InterruptedProbe.h"
+#include "Tests/Scanner/InterruptedScan.h"
+
+#include "Tests/Support/VST3Fixture.h"
 
 #include <QElapsedTimer>
+#include <QFile>
 
 namespace {
 
-class InterruptedRescan : public InterruptedProbe, public testing::WithParamInterface<int> {};
-
-/// Kills the scanner at moments spread over the scan. The number is the first moment's.
-class KillSweep : public DisturbedScan, public testing::WithParamInterface<int> {
+class Termination : public InterruptedScan, public testing::WithParamInterface<TerminationWay> {
 protected:
-    KillSweep()
-        : DisturbedScan("delay initialize 4\n")
-    {}
-    void killAt(qint64 milliseconds) const
+    ScannerRun m_scanner{scannerProgram(), m_folder};
+};
+
+/// A scanner that hangs in the middle of its second module.
+class SecondScanner : public InterruptedScan {
+protected:
+    SecondScanner()
     {
-        ScannerRun scanner(scannerProgram(), m_folder);
-        ASSERT_TRUE(scanner.start());
-        QElapsedTimer clock;
-        clock.start();
-        scanner.waitUntil([&] { return clock.elapsed() >= milliseconds; });
-        scanner.kill();
-        scanner.wait();
+        update("fault initialize hang\n");
+        EXPECT_TRUE(m_first.start() && waitForStage(m_first, "B", "initialize"));
     }
+
+    ScannerRun m_first{scannerProgram(), m_folder};
 };
 
 } // namespace
 
-TEST_P(InterruptedRescan, AKilledScannerCostsNoMarks)
+TEST_P(Termination, ASlowPluginIsWaitedForAndKept)
 {
-    const QString &culprit = kThree[GetParam()];
-    slowDown("fault initialize hang\n", culprit);
-    ScannerRun scanner(scannerProgram(), m_folder);
-    ASSERT_TRUE(scanner.start());
-    ASSERT_TRUE(waitForStage(scanner, culprit, "initialize"));
-    scanner.kill();
-    scanner.wait();
-    EXPECT_EQ(renewed(), kThree.mid(0, GetParam()));
-    EXPECT_EQ(m_folder.markers(), QStringList(culprit + ".scan3"));
-
-    EXPECT_EQ(runUntilSettled(scannerProgram(), m_folder).size(), 1u);
-    EXPECT_EQ(renewed(culprit), kThree);
+    update("delay initialize 500\n");
+    EXPECT_TRUE(interrupt(m_scanner, {GetParam()}).succeeded());
+    EXPECT_EQ(renewed(), QStringList({"A", "B"}));
+    EXPECT_EQ(m_folder.markers(), QStringList());
+    scan();
+    EXPECT_EQ(loaded(), QStringList("C"));
+    EXPECT_EQ(renewed(), m_names);
 }
 
-INSTANTIATE_TEST_SUITE_P(At, InterruptedRescan, testing::Values(0, 1, 2),
-                         [](const auto &row) { return kThree[row.param].toStdString(); });
-
-TEST_P(KillSweep, EveryMomentLeavesAWholeCatalogue)
+TEST_P(Termination, APluginThatHangsIsLeftAndNotBlamed)
 {
-    const QByteArray before = m_folder.catalogue();
+    update("fault initialize hang\n");
     QElapsedTimer clock;
     clock.start();
-    EXPECT_TRUE(run().succeeded());
-    const qint64 whole = clock.elapsed();
-    for (int moment = GetParam(); moment < 40; moment += 4) {
-        m_folder.write(cataloguePath(), before);
-        killAt(whole * moment / 40);
-        SCOPED_TRACE(moment);
-        EXPECT_EQ(listed(), m_names);
-        const std::set<QString> named = namedByMarkers();
-        EXPECT_LE(named.size(), 1u);
-        expectSettled(named);
+    EXPECT_TRUE(interrupt(m_scanner, {GetParam(), GetParam()}).succeeded());
+    EXPECT_GE(clock.elapsed(), 2000);
+    EXPECT_LT(clock.elapsed(), 10000);
+    EXPECT_EQ(m_folder.markers(), QStringList());
+    EXPECT_EQ(renewed(), QStringList("A"));
+    update({});
+    scan();
+    EXPECT_EQ(loaded(), QStringList({"B", "C"}));
+}
+
+INSTANTIATE_TEST_SUITE_P(By, Termination, testing::ValuesIn(terminationWays()),
+                         [](const auto &row) { return std::string(row.param.name); });
+
+TEST_F(InterruptedScan, AKilledScannerCostsNoMarks)
+{
+    for (int number = 0; number < m_names.size(); ++number) {
+        SCOPED_TRACE(number);
+        const QString &culprit = m_names[number];
+        update("fault initialize hang\n", culprit);
+        m_folder.write(cataloguePath(), m_listed);
+        ScannerRun scanner(scannerProgram(), m_folder);
+        ASSERT_TRUE(scanner.start() && waitForStage(scanner, culprit, "initialize"));
+        scanner.kill();
+        scanner.wait();
+        EXPECT_EQ(renewed(), m_names.mid(0, number));
+        EXPECT_EQ(m_folder.markers(), QStringList(culprit + ".scan3"));
+        scan();
+        EXPECT_EQ(renewed(culprit), m_names);
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(From, KillSweep, testing::Range(0, 4));
+TEST_F(SecondScanner, LeavesABusyFolderAlone)
+{
+    const QString link = m_folder.path("Link");
+    QFile::link(m_folder.dataFolder(), link);
+    const auto before = effectsFolder();
+    const QStringList traceBefore = trace();
+    // Those that do not exist here name no folder, and nothing happens at all.
+    for (const QString &scanList : {m_folder.scanList(), m_folder.path("Effects/../Effects/FXScan.xml"),
+                                    link + "/Effects/FXScan.xml", m_folder.scanList().toUpper()}) {
+        SCOPED_TRACE(qPrintable(scanList));
+        ScannerRun second(scannerProgram(), m_folder);
+        second.setArguments({scanList});
+        const ScannerOutcome outcome = second.run();
+        EXPECT_TRUE(outcome.succeeded());
+        EXPECT_EQ(outcome.log.contains("Another scanner is at work"), QFile::exists(scanList))
+            << qPrintable(outcome.log);
+        EXPECT_EQ(effectsFolder(), before);
+        EXPECT_EQ(trace(), traceBefore);
+    }
+}
+
+TEST_F(SecondScanner, WorksOnAnotherFolder)
+{
+    const TestFolder other;
+    addVST3File(other.plugins(), "Comp");
+    other.writeScanList();
+    EXPECT_TRUE(ScannerRun(scannerProgram(), other).run().succeeded());
+    EXPECT_TRUE(other.catalogue().contains("<Name>Comp</Name>")) << other.catalogue().constData();
+}

@@ -105,13 +105,6 @@ xcb_window_t VirtualScreen::windowTitled(const QString &title) const
     return 0;
 }
 
-QString VirtualScreen::sizeOf(const QString &title) const
-{
-    const auto request = xcb_get_geometry(m_connection, windowTitled(title));
-    const auto answer = owned(xcb_get_geometry_reply(m_connection, request, nullptr));
-    return answer ? QStringLiteral("%1x%2").arg(answer->width).arg(answer->height) : QString();
-}
-
 void VirtualScreen::requestClose(const QString &title) const
 {
     xcb_client_message_event_t message = {};

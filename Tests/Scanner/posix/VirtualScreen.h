@@ -22,8 +22,6 @@ public:
     int takeAppeared();
     /// The window with this title that can be seen now; 0 when there is none.
     xcb_window_t windowTitled(const QString &title) const;
-    /// Width and height of the visible window with this title, as "WxH".
-    QString sizeOf(const QString &title) const;
     /// Asks a window to close, as its close button does.
     void requestClose(const QString &title) const;
     /// Ends the server under its programs.

@@ -1,0 +1,52 @@
+#pragma once
+
+#include "Tests/Support/ScanBench.h"
+
+/// Listed modules with the user's marks, all changed since; the scan is disturbed while they are probed.
+class InterruptedScan : public ScanBench {
+protected:
+    explicit InterruptedScan(const QStringList &names = {"A", "B", "C"})
+        : m_names(names)
+    {
+        for (const QString &name : m_names)
+            put(name + ".vst3");
+        scan();
+        for (const QString &name : m_names)
+            mark(name, "Favourite", "1");
+        m_listed = m_folder.read(cataloguePath());
+    }
+    /// Updates all, one of them with this script.
+    void update(const QByteArray &script, const QString &module = "B") const
+    {
+        for (const QString &name : m_names)
+            dateLater(put(name + ".vst3", name == module ? script : QByteArray()));
+        forgetTrace();
+    }
+    /// Makes the requests, one after the other, once the second module is being probed.
+    ScannerOutcome interrupt(ScannerRun &scanner, const std::vector<TerminationWay> &ways) const
+    {
+        if (!scanner.start() || !waitForStage(scanner, "B", "initialize"))
+            return {};
+        for (const TerminationWay &way : ways)
+            scanner.requestTermination(way);
+        return scanner.wait();
+    }
+    /// The modules whose records hold their new time stamp. All must be there with their marks, working but
+    /// for the culprit.
+    QStringList renewed(const QString &culprit = {}) const
+    {
+        QStringList names, listed;
+        for (const QString &row : sortedRecords("Name FileTime Favourite Enabled Working")) {
+            const QString name = row.section('|', 0, 0);
+            EXPECT_TRUE(row.endsWith(name == culprit ? "|1|0|0" : "|1|1|1")) << qPrintable(row);
+            listed.append(name);
+            if (row.contains("|2022-"))
+                names.append(name);
+        }
+        EXPECT_EQ(listed, m_names);
+        return names;
+    }
+
+    const QStringList m_names;
+    QByteArray m_listed; ///< the catalogue before the updates
+};

@@ -1,0 +1,327 @@
+#include "Tests/Support/ScanBench.h"
+#include "Tests/Support/VST2Fixture.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+
+#include <functional>
+
+namespace {
+
+// Whole scans, each a few steps. Files of "put" lie in "Plugins", others in the data folder, which "@" stands
+// for; "\n" is a line's end and "." in a list an empty one.
+//   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated
+//   write FILE: TEXT; remove FILE; move FILE FILE
+//   folders FOLDER…               what the scan list names
+//   mark NAME ELEMENT VALUE       as the user does
+//   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
+//   scan [N]                      until no marker survives, which takes N runs (1)
+//   same                          a scan that loads nothing and writes nothing
+//   loaded MODULE…                what the scan loaded, in order
+//   log: TEXT                     what its log holds
+//   vst3, vst2 ELEMENTS: ROW, ROW what the catalogue lists, in any order
+const char kScans[] = R"(
+= A catalogue that cannot be used is replaced
+put Comp.vst3:
+write Effects/VST3Configuration.xml:
+scan
+vst3 Name: Comp
+write Effects/VST3Configuration.xml: not a catalogue\n
+scan
+loaded Comp
+log: Cannot use the catalogue @/Effects/VST3Configuration.xml
+write Effects/VST3Configuration.xml: <Scan></Scan>
+scan
+loaded Comp
+cut Effects/VST3Configuration.xml: <Vendor>
+scan
+loaded Comp
+vst3 Name Enabled: Comp|1
+same
+
+= What crashed is salvaged from a damaged catalogue
+put Comp.vst3:
+scan
+mark Comp Enabled 0
+mark Comp Working 0
+cut Effects/VST3Configuration.xml: </Effects>
+scan
+loaded .
+vst3 Name Enabled Working: Comp|0|0
+
+= A folder in the place of the catalogue stays and nothing is loaded in vain
+put Comp.vst3:
+write Effects/VST3Configuration.xml/kept: old
+scan
+loaded .
+log: Cannot write the catalogue
+holds Effects/VST3Configuration.xml/kept: old
+
+= Leftovers of a temporary file do no harm
+put Comp.vst3:
+write Effects/VST3Configuration.xml.tmp: half a catalogue
+scan
+vst3 Name: Comp
+write Effects/VST3Configuration.xml.tmp/x: a folder in its place
+put New.vst3:
+scan
+vst3 Name: Comp, New
+
+= Earlier versions are brought up to date without loading anything
+put Comp.vst3:
+scan
+edit Effects/VST3Configuration.xml: <Effects version="1.1"> => <Effects version="0.9">
+edit Effects/VST3Configuration.xml: 2021-03-04 05:06 => 04.03.21 05:06:07
+scan
+loaded .
+vst3 Name FileTime: Comp|2021-03-04 05:06
+same
+
+= A scan list without folders empties the catalogues
+put Comp.vst3:
+put Echo.vst2:
+scan
+write Effects/FXScan.xml: <Scan><Folder>@/Plugins</Folder><Group><Path>@/Plugins</Path></Group></Scan>
+scan
+loaded .
+vst3 Name: .
+vst2 Name: .
+
+= Folders that cannot be searched are named and passed over
+put Comp.vst3:
+write File: x
+folders @/無い🎛 @/File @/Plugins
+scan
+log: Cannot search the folder "@/無い🎛": it does not exist
+log: Cannot search the folder "@/File": it is not a folder
+vst3 Name: Comp
+
+= A folder that is listed twice is searched once
+put Comp.vst3:
+put Inner/Deep.vst3:
+folders @/Plugins @/Plugins/ @/Plugins/Inner @/Plugins/Inner/..
+scan
+loaded Comp Deep
+folders @/Plugins/Inner @/Plugins
+put Inner/Deep.vst3: class D
+put Comp.vst3: class C
+remove Effects/VST3Configuration.xml
+scan
+loaded Deep Comp
+vst3 Name: C, D
+
+= Names of all sorts in both formats
+put a/Comp.vst3: class Three1
+put b/comp.vst3: class Three2
+put 日本🎛/音🎛.vst3: class Foreign
+put 日本🎛/致命的💥.vst3: class X | fault initialize kill
+put a/Comp.vst2: name Two1
+put b/comp.vst2: name Two2 | id 2
+put 日本🎛/音🎛.vst2: name "Latin \xF6"
+put 日本🎛/致命的💥.vst2: fault get-vendor-string kill
+scan 3
+vst3 Name Enabled Working: Three1|1|1, Three2|1|1, Foreign|1|1, 致命的💥|0|0
+vst2 Name Enabled Working: Two1|1|1, Two2|1|1, Latin ö|1|1, 致命的💥|0|0
+same
+
+= Texts that look like markup keep their marks
+put A.vst3: class "A &amp; B &lt;" | vendor "C & D"
+put B.vst2: name "E &amp; F"
+scan
+mark &lt; Favourite 1
+vst3 Name Vendor: A &amp; B &lt;|C & D
+new A.vst3: class "A &amp; B &lt;" | vendor V
+scan
+loaded A
+vst3 Name Vendor Favourite: A &amp; B &lt;|V|1
+vst2 Name: E &amp; F
+same
+
+= Several killers of both formats need one run each and one more
+put a/WaveShell1-VST3 9.2.vst3: class Inner | fault module-entry kill
+put b/WaveShell1-VST3 9.2.vst3: class Inner | fault module-entry kill
+put Bad1.vst2: fault get-vendor-string kill
+put Bad2.vst2: fault get-vendor-string kill
+put Good.vst3:
+put Good.vst2:
+scan 5
+vst3 Name: Good
+vst2 Name Enabled Working: Bad1|0|0, Bad2|0|0, Good|1|1
+
+= A namesake starts without marks
+put a/Comp.vst2: name One
+put Other.vst3:
+scan
+mark One Favourite 1
+put b/Comp.vst2: name Two | id 2
+scan
+loaded Comp
+vst2 Name Favourite: One|1, Two|0
+same
+
+= The marker of a child speaks for the child alone
+put Shell.vst2: child 1 One | child 2 Two
+put Other.vst2:
+scan
+write Effects/Shell.scan: <CrashedPlugin><Path>@/Plugins/Shell.vst2</Path><Created>2021-03-04 05:06</Created><Name>Shell</Name></CrashedPlugin>
+write Effects/Two.scan: <CrashedPlugin><Path>@/Plugins/Shell.vst2</Path><Created>2021-03-04 05:06</Created><Name>Two</Name><SubID>2</SubID></CrashedPlugin>
+scan
+loaded .
+vst2 Name Enabled Working: One|1|1, Two|0|0, Other|1|1
+
+= A marker of a file that was moved follows it and one of a file that is there stays there
+put a/Comp.vst3:
+put b/Same.vst3: class B
+scan
+write Effects/1.scan3: <CrashedPlugin><Path>@/Plugins/a/Comp.vst3</Path><Created>2021-03-04 05:06</Created><Name>Comp</Name></CrashedPlugin>
+write Effects/2.scan3: <CrashedPlugin><Path>@/gone/Same.vst3</Path><Created>2021-03-04 05:06</Created><Name>Same</Name></CrashedPlugin>
+scan
+vst3 Name Enabled: Comp|0, B|1
+same
+
+= Markers outlive a catalogue that cannot be written and those of no use do not
+put Comp.vst3:
+write Effects/VST3Configuration.xml/kept: old
+write Effects/Comp.scan3: <CrashedPlugin><Path>@/Plugins/Comp.vst3</Path><Name>Comp</Name></CrashedPlugin>
+write Effects/bad.scan: <CrashedPlugin><Path>/x
+run
+markers Comp.scan3
+
+= A plug-in without a record is listed when its fault is gone
+put Comp.vst3: class Comp | answer get-factory null
+put Echo.vst2: answer entry null
+scan
+vst3 Name: .
+vst2 Name Working: Echo|0
+new Comp.vst3:
+new Echo.vst2:
+scan
+vst3 Name Working: Comp|1
+vst2 Name Working: Echo|1
+same
+)";
+
+struct ScanCase {
+    std::string name;
+    QStringList steps;
+
+    friend void PrintTo(const ScanCase &scan, std::ostream *out) { *out << scan.name; }
+};
+
+std::vector<ScanCase> scanCases()
+{
+    std::vector<ScanCase> cases;
+    for (const QString &line : QString::fromUtf8(kScans).split('\n', Qt::SkipEmptyParts)) {
+        if (line.startsWith("= "))
+            cases.push_back({line.mid(2).toStdString(), {}});
+        else
+            cases.back().steps.append(line);
+    }
+    return cases;
+}
+
+class ScanTable : public ScanBench, public testing::WithParamInterface<ScanCase> {
+protected:
+    void carryOut(const QString &step)
+    {
+        const QString head = step.section(':', 0, 0);
+        const QString text = resolved(step.section(':', 1)).trimmed();
+        const QString verb = head.section(' ', 0, 0);
+        const QString file = head.section(' ', 1);
+        const std::map<QString, std::function<void()>> verbs = {
+            {"put", [&] { put(file, script(text)); }},
+            {"new", [&] { dateLater(put(file, script(text))); }},
+            {"write", [&] { m_folder.write(file, text.toUtf8().replace("\\n", "\n")); }},
+            {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
+            {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(file))); }},
+            {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
+            {"mark", [&] { markAsUser(file.split(' ')); }},
+            {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
+            {"cut",
+             [&] { edit(file, m_folder.read(file).mid(m_folder.read(file).indexOf(text.toUtf8())), {}); }},
+            {"scan", [&] { scanWithRuns(file.isEmpty() ? 1 : file.toInt()); }},
+            {"run", [&] { m_last = scanOnce(); }},
+            {"same", [&] { expectNothingToDo(); }},
+            {"loaded", [&] { EXPECT_EQ(loaded().join(' '), file == "." ? "" : file); }},
+            {"markers", [&] { EXPECT_EQ(m_folder.markers().join(' '), file); }},
+            {"log", [&] { EXPECT_TRUE(m_last.log.contains(text)) << qPrintable(m_last.log); }},
+            {"vst3", [&] { expectRecords("VST3Configuration.xml", file, text); }},
+            {"vst2", [&] { expectRecords("FXConfiguration.xml", file, text); }}};
+        verbs.at(verb)();
+    }
+
+private:
+    QString resolved(QString text) const
+    {
+        return text.replace('@', m_folder.dataFolder()).replace(".vst2<", vst2Ending() + '<');
+    }
+    static QByteArray script(const QString &statements)
+    {
+        return QString(statements + '\n').replace(" | ", "\n").toUtf8();
+    }
+    void markAsUser(const QStringList &words) const
+    {
+        for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"}) {
+            QByteArray text = m_folder.catalogue(file);
+            const int record = text.indexOf(words[0].toUtf8() + "</Name>");
+            const int value = text.indexOf('<' + words[1].toUtf8() + '>', record) + words[1].size() + 2;
+            if (record >= 0)
+                m_folder.write(QString("Effects/") + file,
+                               text.replace(value, text.indexOf('<', value) - value, words[2].toUtf8()));
+        }
+    }
+    void edit(const QString &file, const QString &from, const QString &to) const
+    {
+        const QString text = QString::fromUtf8(m_folder.read(file));
+        EXPECT_TRUE(text.contains(from)) << qPrintable(text);
+        m_folder.write(file, QString(text).replace(from, to).toUtf8());
+    }
+    void scanWithRuns(int count)
+    {
+        if (count > 1) {
+            forgetTrace();
+            EXPECT_EQ(scanUntilSettled(), count);
+        } else {
+            m_last = scan();
+        }
+    }
+    void expectNothingToDo() const
+    {
+        for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"})
+            dateFirst("Effects/" + QString(file));
+        const auto before = effectsFolder();
+        const QDateTime modified = QFileInfo(cataloguePath()).lastModified();
+        scan();
+        EXPECT_EQ(loaded(), QStringList());
+        EXPECT_EQ(effectsFolder(), before);
+        EXPECT_EQ(QFileInfo(cataloguePath()).lastModified(), modified);
+    }
+    void expectRecords(const char *file, const QString &elements, const QString &rows) const
+    {
+        QStringList found = recordsOf(file, elements.toUtf8()), expected = rows.split(", ");
+        found.sort();
+        expected.sort();
+        EXPECT_EQ(found, rows == "." ? QStringList() : expected);
+    }
+
+    ScannerOutcome m_last;
+};
+
+} // namespace
+
+TEST_P(ScanTable, EndsAsItSays)
+{
+    for (const QString &step : GetParam().steps) {
+        SCOPED_TRACE(step.toStdString());
+        carryOut(step);
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Of, ScanTable, testing::ValuesIn(scanCases()), [](const auto &row) {
+    std::string name;
+    for (const char character : row.param.name)
+        if (std::isalnum(static_cast<unsigned char>(character)))
+            name += character;
+    return name;
+});

@@ -1,0 +1,169 @@
+#include "Tests/Support/ScanBench.h"
+
+#include "Tests/Support/VST2Fixture.h"
+#include "Tests/Support/VST3Fixture.h"
+
+#include <QDirIterator>
+#include <QFileInfo>
+#include <QRegularExpression>
+
+#include <algorithm>
+
+namespace {
+
+/// The text of an element in a record's block; "-" where there is none.
+QByteArray elementOf(const QByteArray &block, const QByteArray &name)
+{
+    const int start = block.indexOf("\t<" + name + '>');
+    const int end = block.indexOf("</" + name + '>', start);
+    const int content = start + name.size() + 3;
+    return start < 0 || end < 0 ? QByteArray("-") : block.mid(content, end - content);
+}
+
+} // namespace
+
+QStringList texts(std::initializer_list<const char *> utf8)
+{
+    QStringList result;
+    for (const char *text : utf8)
+        result.append(QString::fromUtf8(text));
+    return result;
+}
+
+ScanBench::ScanBench(const char *catalogue, const QString &ending)
+    : m_catalogue(QString::fromLatin1(catalogue))
+    , m_ending(ending)
+{
+    m_folder.writeScanList();
+}
+
+QString ScanBench::scannerProgram() { return QStringLiteral(FXPROBE); }
+
+QByteArray ScanBench::traceStatement(const QString &name) const
+{
+    return "trace \"" + m_folder.path("trace").toUtf8() + "\" \"" + QFileInfo(name).fileName().toUtf8() +
+           "\"\n";
+}
+
+QString ScanBench::put(const QString &file, const QByteArray &script) const
+{
+    const QString name = file.section('.', 0, -2);
+    const QByteArray traced = traceStatement(name) + script;
+    if (file.endsWith(".vst2"))
+        return dateFirst(addVST2File(m_folder.plugins(), name, traced));
+    const QByteArray own = "class \"" + QFileInfo(name).fileName().toUtf8() + "\"\n";
+    return dateFirst(
+        addVST3File(m_folder.plugins(), name, traced + (script.contains("class ") ? QByteArray() : own)));
+}
+
+QString ScanBench::dateFirst(const QString &path) const
+{
+    m_folder.setModified(path, QDateTime({2021, 3, 4}, {5, 6, 7}));
+    return path;
+}
+
+void ScanBench::dateLater(const QString &path) const
+{
+    m_folder.setModified(path, QDateTime({2022, 3, 4}, {5, 6, 7}));
+}
+
+QString ScanBench::addRaw(const QString &name, const QByteArray &content) const
+{
+    m_folder.write(modulePath(name), content);
+    return dateFirst(modulePath(name));
+}
+
+ScannerOutcome ScanBench::scanOnce(const std::map<QString, QString> &environment) const
+{
+    ScannerRun scanner(scannerProgram(), m_folder);
+    for (const auto &[name, value] : environment)
+        value.isNull() ? scanner.removeEnvironment(name) : scanner.setEnvironment(name, value);
+    forgetTrace();
+    return scanner.run();
+}
+
+ScannerOutcome ScanBench::scan() const
+{
+    const ScannerOutcome outcome = scanOnce();
+    EXPECT_TRUE(outcome.succeeded()) << outcome.exitCode << ", log:\n" << qPrintable(outcome.log);
+    EXPECT_EQ(m_folder.markers(), QStringList());
+    return outcome;
+}
+
+int ScanBench::scanUntilSettled() const
+{
+    return static_cast<int>(runUntilSettled(scannerProgram(), m_folder).size());
+}
+
+void ScanBench::expectSettled() const
+{
+    const QByteArray before = m_folder.catalogue(m_catalogue);
+    scan();
+    EXPECT_EQ(loaded(), QStringList());
+    EXPECT_EQ(m_folder.catalogue(m_catalogue), before);
+}
+
+QStringList ScanBench::traceOf(const QString &name) const
+{
+    QStringList calls = trace().filter(QRegularExpression('^' + QRegularExpression::escape(name) + ' '));
+    return calls.replaceInStrings(QRegularExpression("^.{" + QString::number(name.size() + 1) + '}'), "");
+}
+
+QStringList ScanBench::loaded() const
+{
+    return trace().filter(" static-constructor").replaceInStrings(" static-constructor", "");
+}
+
+bool ScanBench::waitForStage(ScannerRun &scanner, const QString &module, const QString &stage) const
+{
+    return scanner.waitUntil([&] {
+        const QStringList calls = traceOf(module);
+        return std::any_of(calls.begin(), calls.end(),
+                           [&](const QString &call) { return call.startsWith(stage); });
+    });
+}
+
+QStringList ScanBench::recordsOf(const QString &file, const char *elements) const
+{
+    QStringList found;
+    const QByteArray catalogue = m_folder.catalogue(file);
+    for (int at = catalogue.indexOf("\t<Effect>"); at >= 0; at = catalogue.indexOf("\t<Effect>", at + 1)) {
+        const QByteArray block = catalogue.mid(at, catalogue.indexOf("\t</Effect>", at) - at);
+        QByteArray line;
+        for (const QByteArray &element : QByteArray(elements).split(' '))
+            line += (line.isNull() ? "" : "|") + elementOf(block, element);
+        found.append(QString::fromUtf8(line));
+    }
+    return found;
+}
+
+QStringList ScanBench::sortedRecords(const char *elements) const
+{
+    QStringList found = records(elements);
+    found.sort();
+    return found;
+}
+
+void ScanBench::mark(const QString &name, const char *element, const QByteArray &value) const
+{
+    QByteArray catalogue = m_folder.catalogue(m_catalogue);
+    const int named = catalogue.indexOf("<Name>" + name.toUtf8() + "</Name>");
+    ASSERT_GE(named, 0) << qPrintable(name);
+    const int record = catalogue.lastIndexOf("<Effect>", named);
+    const QByteArray tag = QByteArray("<") + element + '>';
+    const int content = catalogue.indexOf(tag, record) + tag.size();
+    catalogue.replace(content, catalogue.indexOf('<', content) - content, value);
+    m_folder.write("Effects/" + m_catalogue, catalogue);
+}
+
+std::map<QString, QByteArray> ScanBench::effectsFolder() const
+{
+    std::map<QString, QByteArray> contents;
+    QDirIterator entries(m_folder.effects(), QDir::AllEntries | QDir::Hidden | QDir::NoDotAndDotDot,
+                         QDirIterator::Subdirectories);
+    while (entries.hasNext()) {
+        const QString path = entries.next();
+        contents[path] = m_folder.read(path);
+    }
+    return contents;
+}
