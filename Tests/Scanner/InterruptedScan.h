@@ -2,6 +2,8 @@
 
 #include "Tests/Support/ScanBench.h"
 
+#include <algorithm>
+
 /// Listed modules with the user's marks, all changed since; the scan is disturbed while they are probed.
 class InterruptedScan : public ScanBench {
 protected:
@@ -44,6 +46,8 @@ protected:
                 names.append(name);
         }
         EXPECT_EQ(listed, m_names);
+        const QStringList ids = records("ID");
+        EXPECT_TRUE(std::is_sorted(ids.begin(), ids.end())) << qPrintable(ids.join(' '));
         return names;
     }
 

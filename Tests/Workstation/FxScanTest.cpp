@@ -19,6 +19,8 @@
 
 namespace {
 
+const QString kScanner = QFileInfo(QStringLiteral(FXPROBE_FXSCAN)).path() + "/FxProbe";
+
 /// The real fxscan with the real scanner on scripted plug-ins.
 class FxScan : public testing::Test {
 protected:
@@ -126,6 +128,9 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
     };
     const QJsonObject first = scan({"--timeout", "2"});
     check(first);
+    EXPECT_EQ(m_folder.read(m_folder.scanList()).replace("\r\n", "\n"),
+              "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<Scan>\n\t<Path>" + m_folder.plugins().toUtf8() +
+                  "</Path>\n</Scan>\n");
     EXPECT_TRUE(reason(first, "Text3").startsWith("it could not be loaded: "));
     EXPECT_TRUE(first["scan"]["finished"].toBool());
 
@@ -216,7 +221,7 @@ TEST_F(FxScan, ALiveScannersMarkerBlamesNobody)
 {
     addVst3("Slow", "fault initialize hang\n");
     m_folder.writeScanList();
-    ScannerRun other(QFileInfo(QStringLiteral(FXPROBE_FXSCAN)).path() + "/FxProbe", m_folder);
+    ScannerRun other(kScanner, m_folder);
     ASSERT_TRUE(other.start());
     ASSERT_TRUE(other.waitUntil([this] { return !m_folder.markers().isEmpty(); }));
     const ScannerOutcome outcome = run({m_folder.plugins(), "--retry-failed"});
@@ -258,6 +263,42 @@ TEST_F(FxScan, NoScannerOutlivesItWhateverItsPluginHandles)
     EXPECT_TRUE(m_folder.markers().isEmpty()) << "nobody is blamed";
     addVst3("Hang", "");
     EXPECT_EQ(states(scan()), (std::map<QString, QString>{{"Earlier", "ok"}, {"Hang", "ok"}}));
+}
+
+TEST_F(FxScan, AScannerThatIsMissingOrCannotStartIsSaidAtOnce)
+{
+    const QFileInfo program(QStringLiteral(FXPROBE_FXSCAN));
+    ASSERT_TRUE(QFile::copy(program.filePath(), m_folder.path(program.fileName())));
+    addVst3("Comp", "");
+    ScannerRun fxscan(m_folder.path(program.fileName()), m_folder);
+    prepare(fxscan, {m_folder.plugins()});
+    EXPECT_TRUE(fxscan.run().standardError.contains("there is no scanner program"));
+    EXPECT_TRUE(m_folder.catalogue().contains("<Name>Comp<")) << "scanned in its own process";
+    m_folder.write(program.fileName().replace("fxscan", "FxProbe"), "not a program");
+    const ScannerOutcome &outcome = fxscan.run();
+    EXPECT_EQ(outcome.exitCode, 3);
+    EXPECT_TRUE(outcome.standardError.contains("FxProbe")) << outcome.standardError.constData();
+}
+
+TEST_F(FxScan, TheReasonOfAnEarlierFileIsNotThatOfItsUpdate)
+{
+    addVst3("Comp", "answer initialize false\n");
+    EXPECT_TRUE(reason(scan(), "Comp").contains("could not be initialised"));
+    addVst3("Comp", "answer module-entry false\n");
+    m_folder.setModified("Plugins/Comp.vst3", QDateTime(QDate(2030, 1, 1), QTime()));
+    EXPECT_TRUE(ScannerRun(kScanner, m_folder).run().succeeded()); // without fxscan, which would note it
+    const ScannerOutcome listed = run({"--list", "--format", "json"});
+    EXPECT_FALSE(
+        reason(QJsonDocument::fromJson(listed.standardOutput).object(), "Comp").contains("initialised"))
+        << listed.standardOutput.constData();
+}
+
+TEST_F(FxScan, EachClassAndChildHasTheLimitForItself)
+{
+    addVst3("Slow", "class B\nclass C\ndelay initialize 900\n");
+    addVst2("Shell", "child 1 One\nchild 2 Two\nchild 3 Three\ndelay entry 900\n");
+    for (const auto &[name, state] : states(scan({"--timeout", "2"})))
+        EXPECT_EQ(state, "ok") << qPrintable(name);
 }
 
 TEST_F(FxScan, ListingTouchesNothing)

@@ -2,10 +2,8 @@
 
 #include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
-#include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/TestFolder.h"
 
-#include <QDir>
 #include <QFile>
 #include <QTemporaryDir>
 
@@ -24,15 +22,6 @@ EffectRecord crashed(const char *path, const char *time, const char *name, quint
     record.name = name;
     record.subId = subId;
     return record;
-}
-
-void expectBack(const EffectRecord &back, const EffectRecord &written)
-{
-    EXPECT_EQ(back.path, written.path);
-    EXPECT_EQ(back.fileTime, written.fileTime);
-    EXPECT_EQ(back.name, written.name);
-    EXPECT_EQ(back.subId, written.subId);
-    EXPECT_FALSE(back.enabled);
 }
 
 } // namespace
@@ -74,6 +63,8 @@ TEST(CrashMarker, TextAndWhatIsReadBack)
         {vst2(), crashed("", "", "N", 0), "\t<Name>N</Name>\n", 0},
         {vst2(), crashed("/s.dll", "t", "C", 1234),
          "\t<Path>/s.dll</Path>\n\t<Created>t</Created>\n\t<Name>C</Name>\n\t<SubID>1234</SubID>\n", 1234},
+        {vst2(), crashed("/fx/a<b>&.so", "t", "<<", 7), // no XML
+         "\t<Path>/fx/a<b>&.so</Path>\n\t<Created>t</Created>\n\t<Name><<</Name>\n\t<SubID>7</SubID>\n", 7},
         {vst2(), crashed("/s.dll", "t", "C", 2147483648u),
          "\t<Path>/s.dll</Path>\n\t<Created>t</Created>\n\t<Name>C</Name>\n\t<SubID>-2147483648</SubID>\n",
          2147483648u},
@@ -82,18 +73,16 @@ TEST(CrashMarker, TextAndWhatIsReadBack)
     const QString path = folder.path("marker");
     for (const auto &row : rows) {
         SCOPED_TRACE(row.body);
-        EffectRecord record = row.record;
+        const EffectRecord &record = row.record;
         ASSERT_TRUE(writeMarkerFile(row.format, path, record));
         EXPECT_EQ(folder.read(path).replace(kLineEnd, "\n"),
                   QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<CrashedPlugin>\n") + row.body +
                       "</CrashedPlugin>\n");
-        record.subId = row.subIdBack;
-        expectBack(readMarkerFile(row.format, path), record);
+        const EffectRecord back = readMarkerFile(row.format, path);
+        EXPECT_EQ(back.path + back.fileTime + back.name, record.path + record.fileTime + record.name);
+        EXPECT_EQ(back.subId, row.subIdBack);
+        EXPECT_FALSE(back.enabled);
     }
-    const CapturedLog log;
-    const EffectRecord noXml = crashed("/fx/a<b>&.so", "2024-01-02 03:04", "<<", 2147483648u);
-    ASSERT_TRUE(writeMarkerFile(vst2(), path, noXml));
-    expectBack(readMarkerFile(vst2(), path), noXml);
 }
 
 TEST(CrashMarker, AbandoningDeletesWhatIsActiveAndOnlyThen)
