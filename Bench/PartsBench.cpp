@@ -6,8 +6,8 @@
 #include "Core/BaseLib/Files/FileTime.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 
 #include <QDir>
 #include <QFile>

@@ -25,6 +25,8 @@ namespace {
 /// Where the workstation keeps its scan list, below the user's home folder.
 constexpr char kDefaultScanList[] =
     "/AppData/Roaming/Morrow Labs/Quillon/Preferences/Tessel/Effects/FXScan.xml";
+/// The exit code for a scan list that is there and cannot be used.
+constexpr int kUnusableList = 2;
 constexpr char kReWireArgument[] = "-rewire_version";
 /// How long a plug-in may go on after somebody asked the process to end.
 constexpr std::chrono::seconds kTerminationGrace(2);
@@ -55,7 +57,7 @@ void runDialog(QApplication &application, const QString &dataFolder, bool isDefa
         [&application] {
             QMetaObject::invokeMethod(&application, &QApplication::quit, Qt::QueuedConnection);
         },
-        [] { ActiveMarkers::abandon([] { leaveProcess(0); }); }, kTerminationGrace);
+        [] { CrashMarker::abandonAll([] { leaveProcess(0); }); }, kTerminationGrace);
     QObject::connect(
         &application, &QGuiApplication::commitDataRequest, &application,
         [](QSessionManager &) { TerminationSignal::raise(); }, Qt::DirectConnection);
@@ -84,7 +86,14 @@ int runScanner(QApplication &application)
         ProbeReport::instance().busy();
         return 0;
     }
-    QuillonInterfaceImpl workstation(dataFolder, ReadScanList(path));
+    const ScanListContents list = ReadScanList(path);
+    if (!list) {
+        DebugLog(L"The scan list %ls cannot be used, so nothing is scanned: %ls", path, list.reason);
+        ProbeReport::instance().unreadList(path, list.reason);
+        ProbeReport::instance().finish();
+        return kUnusableList;
+    }
+    QuillonInterfaceImpl workstation(dataFolder, list.folders);
     ApplicationContext::instance().quillonInterface = &workstation;
     runDialog(application, dataFolder, isDefaultPath);
     ApplicationContext::instance().quillonInterface = nullptr;

@@ -2,9 +2,6 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
-#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 
 #include <QFile>
 
@@ -46,47 +43,37 @@ QString badText(const EffectRecord &record)
     return QString();
 }
 
-void readCatalogue(const PluginFormat &format, const QString &effectsFolder, CatalogueView &view)
+void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder, CatalogueView &view)
 {
-    const QString path = effectsFolder + QLatin1String(format.catalogue.fileName);
+    const QString path = effectsFolder + QLatin1String(format.catalogue->fileName);
     if (!QFile::exists(path))
         return;
-    CatalogueContents contents = readCatalogueFile(format.catalogue, path);
-    if (!contents) {
-        contents.records = salvageRecords(format.catalogue, path);
-        view.problems.append(QStringLiteral("%1 cannot be read by the next scan, which will probe everything "
+    const CatalogueContents contents = readCatalogueFile(*format.catalogue, path);
+    if (!contents)
+        view.problems.append(QStringLiteral("%1 cannot be read as a whole, and the next scan probes the rest "
                                             "anew: %2")
                                  .arg(path, contents.reason));
-    }
     std::set<QString> crashed;
-    for (const EffectRecord &record : contents.records)
+    std::set<QString> described; // by records of what is in the file
+    for (const EffectRecord &record : contents.records) {
         if (record.isCrashedFile())
             crashed.insert(record.path);
+        if (!record.standsForFile())
+            described.insert(record.path);
+    }
     const auto isOfCrashedFile = [&crashed](const EffectRecord &record) {
         return crashed.count(record.path) != 0 && !record.isCrashedFile();
     };
     for (const EffectRecord &record : contents.records) {
-        view.plugins.push_back({&format, record, isOfCrashedFile(record)});
+        if (record.standsForFile() && described.count(record.path) != 0)
+            continue; // its plug-ins are shown, each with the reason that the file has
+        view.plugins.push_back({&format, record, QString(), isOfCrashedFile(record)});
         if (const QString bad = badText(record); !bad.isEmpty())
             view.problems.append(QStringLiteral("%1 is not well-formed XML: %2").arg(path, bad));
     }
 }
 
 } // namespace
-
-const std::vector<PluginFormat> &pluginFormats()
-{
-    static const std::vector<PluginFormat> formats{
-        {"vst3", "VST 3", QStringLiteral(".vst3"), vst3CatalogueFormat()},
-        {"vst2", "VST 2", VSTModuleFile::ending(), vstCatalogueFormat()}};
-    return formats;
-}
-
-const PluginFormat &pluginFormat(const QString &key)
-{
-    return key == QLatin1String(pluginFormats().front().key) ? pluginFormats().front()
-                                                             : pluginFormats().back();
-}
 
 const char *stateText(PluginState state)
 {
@@ -128,8 +115,9 @@ QStringList CataloguedPlugin::categories() const
 CatalogueView readCatalogues(const QString &effectsFolder)
 {
     CatalogueView view;
-    for (const PluginFormat &format : pluginFormats())
-        readCatalogue(format, effectsFolder, view);
+    for (const PluginFormatInfo &format : pluginFormats())
+        if (format.isScanned())
+            readCatalogue(format, effectsFolder, view);
     const auto sortKey = [](const CataloguedPlugin &plugin) {
         return std::make_tuple(plugin.record.name.toCaseFolded(), plugin.record.path, plugin.record.id);
     };

@@ -1,24 +1,12 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFormat.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <QString>
 #include <QStringList>
 
 #include <vector>
-
-/// One plug-in format as fxscan deals with it.
-struct PluginFormat {
-    const char *key;   ///< as in reports and in JSON
-    const char *title; ///< for people
-    QString ending;    ///< of the files' names, with its dot
-    const CatalogueFormat &catalogue;
-};
-
-/// VST 3 and VST 2, in the order in which they are scanned.
-const std::vector<PluginFormat> &pluginFormats();
-/// The format of that key; VST 2 for a key that nobody knows.
-const PluginFormat &pluginFormat(const QString &key);
 
 /// Whether a plug-in of the catalogue can be used.
 enum class PluginState {
@@ -33,13 +21,16 @@ const char *stateText(PluginState state);
 
 /// One record of a catalogue.
 struct CataloguedPlugin {
-    const PluginFormat *format;
+    const PluginFormatInfo *format;
     EffectRecord record;
 
+    QString reason; ///< why it cannot be used: one phrase, without a full stop; empty when it can
     bool isOfCrashedFile = false; ///< another record says that the whole file ended the scanner: it is not
                                   ///< loaded any more
 
     PluginState state() const;
+    /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
+    bool hasWidth() const { return format->catalogue->marker.hasSubId; }
     bool isUsable() const { return record.working && !isOfCrashedFile; }
     /// The categories' names, else what the plug-in says of itself.
     QStringList categories() const;

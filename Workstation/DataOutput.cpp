@@ -12,7 +12,14 @@ constexpr int kSchema = 1;
 
 QJsonValue channels(qint32 count) { return count < 0 ? QJsonValue() : QJsonValue(count); }
 
-QJsonObject identityOf(const PluginFormat &format, const QString &name, const QString &path, quint32 subId)
+/// The catalogue of VST 2 tells the outputs, that of VST 3 the inputs.
+QJsonValue outputsOf(const CataloguedPlugin &plugin)
+{
+    return plugin.hasWidth() ? channels(plugin.record.width) : QJsonValue();
+}
+
+QJsonObject identityOf(const PluginFormatInfo &format, const QString &name, const QString &path,
+                       quint32 subId)
 {
     QJsonObject object{{QStringLiteral("format"), QLatin1String(format.key)},
                        {QStringLiteral("name"), name},
@@ -22,21 +29,20 @@ QJsonObject identityOf(const PluginFormat &format, const QString &name, const QS
     return object;
 }
 
-QJsonObject pluginObject(const ScanSummary &summary, const CataloguedPlugin &plugin)
+QJsonObject pluginObject(const CataloguedPlugin &plugin)
 {
     const EffectRecord &record = plugin.record;
-    const bool isVst3 = plugin.format == &pluginFormats().front();
     QJsonObject object = identityOf(*plugin.format, record.name, record.path, record.subId);
     object.insert(QStringLiteral("id"), record.id);
     object.insert(QStringLiteral("vendor"), record.vendor);
     object.insert(QStringLiteral("categories"), QJsonArray::fromStringList(plugin.categories()));
-    object.insert(QStringLiteral("inputs"), isVst3 ? channels(record.inputs) : QJsonValue());
-    object.insert(QStringLiteral("outputs"), isVst3 ? QJsonValue() : channels(record.width));
+    object.insert(QStringLiteral("inputs"), channels(record.inputs));
+    object.insert(QStringLiteral("outputs"), outputsOf(plugin));
     object.insert(QStringLiteral("state"), QLatin1String(stateText(plugin.state())));
     object.insert(QStringLiteral("favourite"), record.favourite);
     object.insert(QStringLiteral("fileTime"), record.fileTime);
-    if (const PluginFailure *failure = failureOf(summary, plugin))
-        object.insert(QStringLiteral("reason"), failure->reason);
+    if (!plugin.reason.isEmpty())
+        object.insert(QStringLiteral("reason"), plugin.reason);
     return object;
 }
 
@@ -85,21 +91,11 @@ QByteArray csvLine(const QStringList &fields)
 
 } // namespace
 
-const PluginFailure *failureOf(const ScanSummary &summary, const CataloguedPlugin &plugin)
-{
-    const auto found =
-        std::find_if(summary.failures.begin(), summary.failures.end(), [&](const PluginFailure &failure) {
-            return failure.format == plugin.format && failure.path == plugin.record.path &&
-                   failure.subId == plugin.record.subId;
-        });
-    return found == summary.failures.end() || plugin.isUsable() ? nullptr : &*found;
-}
-
 QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders)
 {
     QJsonArray plugins;
     for (const CataloguedPlugin &plugin : summary.plugins)
-        plugins.append(pluginObject(summary, plugin));
+        plugins.append(pluginObject(plugin));
     QJsonObject object{{QStringLiteral("schema"), kSchema},
                        {QStringLiteral("dataFolder"), dataFolder},
                        {QStringLiteral("plugins"), plugins},
@@ -119,22 +115,15 @@ QByteArray renderCsv(const ScanSummary &summary)
         csvLine({QStringLiteral("format"), QStringLiteral("name"), QStringLiteral("vendor"),
                  QStringLiteral("categories"), QStringLiteral("channels"), QStringLiteral("state"),
                  QStringLiteral("reason"), QStringLiteral("id"), QStringLiteral("path")});
-    for (const CataloguedPlugin &plugin : summary.plugins) {
-        const PluginFailure *failure = failureOf(summary, plugin);
+    for (const CataloguedPlugin &plugin : summary.plugins)
         text += csvLine({QString::fromLatin1(plugin.format->key), plugin.record.name, plugin.record.vendor,
                          plugin.categories().join(QLatin1Char(';')), channelsText(plugin),
-                         QString::fromLatin1(stateText(plugin.state())),
-                         failure ? failure->reason : QString(), plugin.record.id, plugin.record.path});
-    }
-    for (const PluginFailure &failure : summary.failures) {
-        const bool isListed =
-            std::any_of(summary.plugins.begin(), summary.plugins.end(), [&](const CataloguedPlugin &plugin) {
-                return failureOf(summary, plugin) == &failure;
-            });
-        if (!isListed)
+                         QString::fromLatin1(stateText(plugin.state())), plugin.reason, plugin.record.id,
+                         plugin.record.path});
+    for (const PluginFailure &failure : summary.failures)
+        if (!failure.isCatalogued)
             text += csvLine({QString::fromLatin1(failure.format->key), failure.name, QString(), QString(),
                              QString(), QString::fromLatin1(stateText(failure.state)), failure.reason,
                              QString(), failure.path});
-    }
     return text;
 }

@@ -68,7 +68,7 @@ QStringList foldersToScan(const ScanOptions &options, const DataFiles &files)
 {
     if (options.folders.isEmpty() && options.isRetry())
         if (const QStringList last =
-                settleFolders(ReadScanList(files.effects + QLatin1String(kScanListFile))).folders;
+                settleFolders(ReadScanList(files.effects + QLatin1String(kScanListFile)).folders).folders;
             !last.isEmpty())
             return last;
     if (options.folders.isEmpty())

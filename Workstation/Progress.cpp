@@ -1,7 +1,6 @@
 #include "Workstation/Progress.h"
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
-#include "Workstation/CatalogueView.h"
 #include "Workstation/ScanAccount.h"
 #include "Workstation/Terminal.h"
 
@@ -20,7 +19,7 @@ QString nameOf(const ScanAccount &account, const PluginKey &key)
     const QString part =
         probe && !probe->subName.isEmpty() ? QStringLiteral(", %1").arg(probe->subName) : QString();
     return QStringLiteral("%1  %2%3")
-        .arg(QLatin1String(pluginFormat(key.format).title), fileNameOf(key.path), part);
+        .arg(QLatin1String(formatInfo(key.format).title), fileNameOf(key.path), part);
 }
 
 } // namespace

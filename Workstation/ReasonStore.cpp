@@ -19,9 +19,9 @@ ReasonStore::ReasonStore(const QString &file)
         return;
     for (const QJsonValue value : QJsonDocument::fromJson(content).array()) {
         const QJsonObject entry = value.toObject();
-        set({entry[kFormat].toString(), entry[kPath].toString(),
-             static_cast<quint32>(entry[kSubId].toDouble())},
-            entry[kFileTime].toString(), entry[kReason].toString());
+        if (const PluginFormatInfo *format = formatOfKey(entry[kFormat].toString()))
+            set({format->format, entry[kPath].toString(), static_cast<quint32>(entry[kSubId].toDouble())},
+                entry[kFileTime].toString(), entry[kReason].toString());
     }
 }
 
@@ -40,7 +40,7 @@ FileResult ReasonStore::write(const QString &file) const
 {
     QJsonArray entries;
     for (const auto &[key, entry] : m_entries)
-        entries.append(QJsonObject{{kFormat, key.format},
+        entries.append(QJsonObject{{kFormat, QLatin1String(formatInfo(key.format).key)},
                                    {kPath, key.path},
                                    {kSubId, static_cast<qint64>(key.subId)},
                                    {kFileTime, entry.fileTime},

@@ -67,7 +67,7 @@ int reopen(std::vector<EffectRecord> &records, Chooser &chooser)
 
 /// A catalogue with what is to be written of it.
 struct Reopened {
-    const PluginFormat *format;
+    const PluginFormatInfo *format;
     QString path;
     std::vector<EffectRecord> records;
     int count;
@@ -89,9 +89,9 @@ QStringList withoutUnrecorded(QStringList names, const QStringList &folders,
         if (recorded.count(path) == 0)
             names.erase(std::remove_if(names.begin(), names.end(), isThisFile), names.end());
     };
-    for (const PluginFormat &format : pluginFormats())
-        for (const QString &folder : names.isEmpty() ? QStringList() : folders)
-            for (const QString &path : findFiles(folder, format.ending))
+    for (const PluginFormatInfo &format : pluginFormats())
+        for (const QString &folder : names.isEmpty() || !format.isScanned() ? QStringList() : folders)
+            for (const QString &path : findFiles(folder, format.moduleEnding))
                 dropNamesOf(path);
     return names;
 }
@@ -103,13 +103,13 @@ RetryOutcome retryPlugins(const QString &effectsFolder, const QStringList &names
     RetryOutcome outcome;
     Chooser chooser(names);
     std::vector<Reopened> catalogues;
-    for (const PluginFormat &format : pluginFormats()) {
-        const QString path = effectsFolder + QLatin1String(format.catalogue.fileName);
+    for (const PluginFormatInfo &format : pluginFormats()) {
+        if (!format.isScanned())
+            continue;
+        const QString path = effectsFolder + QLatin1String(format.catalogue->fileName);
         if (!QFile::exists(path))
             continue;
-        CatalogueContents contents = readCatalogueFile(format.catalogue, path);
-        if (!contents) // nothing in it would be kept from the next scan, but for what crashed
-            contents.records = salvageRecords(format.catalogue, path);
+        CatalogueContents contents = readCatalogueFile(*format.catalogue, path);
         const int count = reopen(contents.records, chooser);
         catalogues.push_back({&format, path, std::move(contents.records), count});
     }
@@ -121,7 +121,7 @@ RetryOutcome retryPlugins(const QString &effectsFolder, const QStringList &names
         if (catalogue.count == 0)
             continue;
         if (const FileResult written =
-                replaceFile(catalogue.path, renderCatalogue(catalogue.format->catalogue, catalogue.records),
+                replaceFile(catalogue.path, renderCatalogue(*catalogue.format->catalogue, catalogue.records),
                             Durability::Synced);
             !written)
             outcome.written.reason = QStringLiteral("%1: %2").arg(catalogue.path, written.reason);

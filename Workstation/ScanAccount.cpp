@@ -1,33 +1,30 @@
 #include "Workstation/ScanAccount.h"
 
-#include <QFile>
-#include <QFileInfo>
-#include <QJsonDocument>
-#include <QJsonObject>
-
 #include <algorithm>
 
 namespace {
 
-PluginKey keyOf(const QJsonObject &line)
-{
-    return {line.value(QLatin1String("format")).toString(), line.value(QLatin1String("path")).toString(),
-            static_cast<quint32>(line.value(QLatin1String("subId")).toDouble())};
-}
+PluginKey keyOf(const ReportLine &line) { return {line.format, line.path, line.subId}; }
 
 /// What a plug-in was doing in a stage of the report.
-QString stageText(const QString &stage)
+QString stageText(std::optional<ProbeStage> stage)
 {
-    static const std::map<QString, QString> texts{
-        {QStringLiteral("load"), QStringLiteral(" while it was being loaded")},
-        {QStringLiteral("start"), QStringLiteral(" while it was starting")},
-        {QStringLiteral("ask"), QStringLiteral(" while it was asked for its data")},
-        {QStringLiteral("close"), QStringLiteral(" while it was being closed and unloaded")}};
-    const auto text = texts.find(stage);
-    return text == texts.end() ? QString() : text->second;
+    if (!stage)
+        return QString();
+    switch (*stage) {
+    case ProbeStage::Load:
+        return QStringLiteral(" while it was being loaded");
+    case ProbeStage::Start:
+        return QStringLiteral(" while it was starting");
+    case ProbeStage::Ask:
+        return QStringLiteral(" while it was asked for its data");
+    case ProbeStage::Close:
+        return QStringLiteral(" while it was being closed and unloaded");
+    }
+    return QString();
 }
 
-QString blame(const ScannerRunEnd &end, const QString &stage)
+QString blame(const ScannerRunEnd &end, std::optional<ProbeStage> stage)
 {
     const QString when = stageText(stage);
     switch (end.how) {
@@ -44,81 +41,87 @@ QString blame(const ScannerRunEnd &end, const QString &stage)
 
 PluginKey pluginKey(const ScanCulprit &culprit)
 {
-    return {culprit.isVst3 ? QStringLiteral("vst3") : QStringLiteral("vst2"), culprit.plugin.path,
-            culprit.plugin.subId};
+    return {culprit.format, culprit.plugin.path, culprit.plugin.subId};
 }
 
 ScanAccount::ScanAccount(const QString &reportFile)
-    : m_file(reportFile)
-    , m_read(QFileInfo(reportFile).size()) // what others reported before is none of this scan's
+    : m_report(reportFile)
 {}
 
 void ScanAccount::update()
 {
-    QFile file(m_file);
-    if (!file.open(QIODevice::ReadOnly) || !file.seek(m_read))
-        return;
-    const QByteArray news = file.readAll();
-    m_read += news.size();
-    m_rest += news;
-    int from = 0;
-    for (int end = m_rest.indexOf('\n'); end >= 0; end = m_rest.indexOf('\n', from)) {
-        takeLine(m_rest.mid(from, end - from));
-        from = end + 1;
-    }
-    m_rest.remove(0, from);
+    for (const ReportLine &line : m_report.takeNewLines())
+        takeLine(line);
 }
 
-void ScanAccount::takeLine(const QByteArray &text)
+void ScanAccount::takeLine(const ReportLine &line)
 {
-    const QJsonObject line = QJsonDocument::fromJson(text).object();
-    const QString event = line.value(QLatin1String("event")).toString();
-    m_finished = event == QLatin1String("finished");
-    m_busy = event == QLatin1String("busy");
-    if (event == QLatin1String("start")) {
+    using Event = ReportLine::Event;
+    m_finished = line.event == Event::Finished;
+    m_busy = line.event == Event::Busy;
+    switch (line.event) {
+    case Event::Start:
         m_done += static_cast<int>(
             std::count_if(m_open.begin(), m_open.end(), [](const PluginKey &key) { return key.subId == 0; }));
         m_open.clear();
         m_planned = m_done; // what is left of the plan is planned anew
-    } else if (event == QLatin1String("plan")) {
-        m_planned += line.value(QLatin1String("probes")).toInt();
-    } else if (event == QLatin1String("begin")) {
-        begin(keyOf(line), line);
-    } else if (event == QLatin1String("stage")) {
+        break;
+    case Event::Plan:
+        m_planned += line.probes;
+        break;
+    case Event::Begin:
+        begin(line);
+        break;
+    case Event::Stage:
         if (!m_open.empty())
-            m_probes[m_open.back()].stage = line.value(QLatin1String("stage")).toString();
-    } else if (event == QLatin1String("end") || event == QLatin1String("skipped")) {
-        end(keyOf(line), line);
-    } else if (event == QLatin1String("unwritten")) {
-        const QString problem = QStringLiteral("%1 could not be written: %2")
-                                    .arg(line.value(QLatin1String("path")).toString(),
-                                         line.value(QLatin1String("reason")).toString());
-        if (!m_problems.contains(problem))
-            m_problems.append(problem);
+            m_probes[m_open.back()].stage = line.stage;
+        break;
+    case Event::End:
+    case Event::Skipped:
+        end(line);
+        break;
+    case Event::Unwritten:
+        addProblem(QStringLiteral("%1 could not be written: %2").arg(line.path, line.reason));
+        break;
+    case Event::UnreadList:
+        addProblem(QStringLiteral("the scan list %1 cannot be used, so nothing was scanned: %2")
+                       .arg(line.path, line.reason));
+        break;
+    case Event::Busy:
+    case Event::Finished:
+    case Event::Ended:
+    case Event::Unknown:
+        break;
     }
 }
 
-void ScanAccount::begin(const PluginKey &key, const QJsonObject &line)
+void ScanAccount::addProblem(const QString &problem)
 {
-    m_open.push_back(key);
-    m_begun.push_back(key);
-    ProbeAccount account;
-    account.subName = line.value(QLatin1String("subName")).toString();
-    m_probes[key] = account;
+    if (!m_problems.contains(problem))
+        m_problems.append(problem);
 }
 
-void ScanAccount::end(const PluginKey &key, const QJsonObject &line)
+void ScanAccount::begin(const ReportLine &line)
 {
-    const bool isSkipped = line.value(QLatin1String("event")) == QLatin1String("skipped");
-    ProbeAccount &account = m_probes[key];
+    m_open.push_back(keyOf(line));
+    m_begun.push_back(keyOf(line));
+    ProbeAccount account;
+    account.subName = line.subName;
+    m_probes[keyOf(line)] = account;
+}
+
+void ScanAccount::end(const ReportLine &line)
+{
+    const bool isSkipped = line.event == ReportLine::Event::Skipped;
+    ProbeAccount &account = m_probes[keyOf(line)];
     account.isLoaded = !isSkipped;
-    account.noPlugin = isSkipped || line.value(QLatin1String("noPlugin")).toBool();
-    account.reason = line.value(QLatin1String("reason")).toString();
-    account.records = line.value(QLatin1String("records")).toInt();
-    account.milliseconds = line.value(QLatin1String("milliseconds")).toDouble(-1);
-    const auto open = std::find(m_open.begin(), m_open.end(), key);
+    account.noPlugin = isSkipped || line.noPlugin;
+    account.reason = line.reason;
+    account.records = line.records;
+    account.milliseconds = line.milliseconds;
+    const auto open = std::find(m_open.begin(), m_open.end(), keyOf(line));
     m_open.erase(open, m_open.end());
-    if (key.subId == 0)
+    if (line.subId == 0)
         ++m_done;
 }
 
@@ -151,7 +154,7 @@ const ProbeAccount *ScanAccount::find(const PluginKey &key) const
     return found == m_probes.end() ? nullptr : &found->second;
 }
 
-bool ScanAccount::wasProbed(const QString &format, const QString &path) const
+bool ScanAccount::wasProbed(PluginFormat format, const QString &path) const
 {
     const auto found = m_probes.lower_bound({format, path, 0});
     return found != m_probes.end() && found->first.format == format && found->first.path == path;

@@ -1,20 +1,19 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Launcher/ScannerLauncher.h"
+#include "Main/AudioEngineController/Effects/Protocol/ReportReader.h"
 
-#include <QByteArray>
 #include <QString>
 #include <QStringList>
 
 #include <map>
+#include <optional>
 #include <tuple>
 #include <vector>
 
-class QJsonObject;
-
 /// Tells one plug-in, or sub-plug-in, of a file from all others.
 struct PluginKey {
-    QString format; ///< "vst3" or "vst2"
+    PluginFormat format = PluginFormat::Unknown;
     QString path;
     quint32 subId = 0;
 
@@ -30,12 +29,12 @@ PluginKey pluginKey(const ScanCulprit &culprit);
 /// What a scan said of one probe.
 struct ProbeAccount {
     QString subName;
-    QString stage;            ///< the last one that it entered
-    QString reason;           ///< why it failed; empty: it did not
-    double milliseconds = -1; ///< -1: it did not come to its end
-    int records = 0;          ///< so many plug-ins of it work
-    bool noPlugin = false;    ///< no plug-in of its format
-    bool isLoaded = true;     ///< false: seen without loading it
+    std::optional<ProbeStage> stage; ///< the last one that it entered; none before the first
+    QString reason;                  ///< why it failed; empty: it did not
+    double milliseconds = -1;        ///< -1: it did not come to its end
+    int records = 0;                 ///< so many plug-ins of it work
+    bool noPlugin = false;           ///< no plug-in of its format
+    bool isLoaded = true;            ///< false: seen without loading it
 };
 
 /// Follows the report that scanners write while they work.
@@ -70,16 +69,15 @@ public:
     /// What became of a probe; null when there was none.
     const ProbeAccount *find(const PluginKey &key) const;
     /// Whether the file was probed in any way.
-    bool wasProbed(const QString &format, const QString &path) const;
+    bool wasProbed(PluginFormat format, const QString &path) const;
 
 private:
-    void takeLine(const QByteArray &text);
-    void begin(const PluginKey &key, const QJsonObject &line);
-    void end(const PluginKey &key, const QJsonObject &line);
+    void takeLine(const ReportLine &line);
+    void begin(const ReportLine &line);
+    void end(const ReportLine &line);
+    void addProblem(const QString &problem);
 
-    QString m_file;
-    qint64 m_read;     ///< bytes of the file
-    QByteArray m_rest; ///< of a line that is not complete yet
+    ReportReader m_report;
     std::vector<PluginKey> m_open;
     std::vector<PluginKey> m_begun;
     std::map<PluginKey, ProbeAccount> m_probes;

@@ -95,7 +95,7 @@ void ScanSession::scanHere()
 void ScanSession::endOverdueProbe() const
 {
     if (m_cancelled && m_sinceCancel.hasExpired(kPatience))
-        ActiveMarkers::abandon([] { leaveProcess(ScanExit::kNotFinished); });
+        CrashMarker::abandonAll([] { leaveProcess(ScanExit::kNotFinished); });
 }
 
 void ScanSession::waitForLauncher()

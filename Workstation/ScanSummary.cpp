@@ -9,24 +9,26 @@ constexpr std::size_t kSlowest = 5;
 
 PluginKey keyOf(const CataloguedPlugin &plugin)
 {
-    return {QString::fromLatin1(plugin.format->key), plugin.record.path, plugin.record.subId};
+    return {plugin.format->format, plugin.record.path, plugin.record.subId};
 }
 
-using PluginIdentity = std::tuple<QString, QString, QString, quint32>;
+using PluginIdentity = std::tuple<PluginFormat, QString, QString, quint32>;
 
 /// What makes a plug-in the same in two catalogues; several classes share a file.
 PluginIdentity identityOf(const CataloguedPlugin &plugin)
 {
     const QString id = plugin.isUsable() ? plugin.record.id : QString();
-    return {QString::fromLatin1(plugin.format->key), plugin.record.path, id, plugin.record.subId};
+    return {plugin.format->format, plugin.record.path, id, plugin.record.subId};
 }
 
 QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, const ReasonStore &reasons)
 {
     const PluginKey key = keyOf(plugin);
-    const ProbeAccount *probe = account ? account->find(key) : nullptr;
-    if (probe && !probe->reason.isEmpty())
-        return probe->reason;
+    const PluginKey file{key.format, key.path, 0};
+    for (const PluginKey &each : {key, file})
+        if (const ProbeAccount *probe = account ? account->find(each) : nullptr;
+            probe && !probe->reason.isEmpty())
+            return probe->reason;
     if (plugin.isOfCrashedFile)
         return QStringLiteral("its file ended the scanner");
     if (const QString known = reasons.find(key, plugin.record.fileTime); !known.isEmpty())
@@ -37,19 +39,19 @@ QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, con
 
 void addFailures(ScanSummary &summary, const ScanAccount *account, const ReasonStore &reasons)
 {
-    for (const CataloguedPlugin &plugin : summary.plugins)
-        if (!plugin.isUsable())
-            summary.failures.push_back({plugin.format, plugin.state(), plugin.record.name, plugin.record.path,
-                                        plugin.record.subId, reasonOf(plugin, account, reasons)});
+    for (CataloguedPlugin &plugin : summary.plugins) {
+        if (plugin.isUsable())
+            continue;
+        plugin.reason = reasonOf(plugin, account, reasons);
+        summary.failures.push_back({plugin.format, plugin.state(), plugin.record.name, plugin.record.path,
+                                    plugin.record.subId, plugin.reason, true});
+    }
 }
 
 /// Format and path of a file.
-using FileIdentity = std::pair<QString, QString>;
+using FileIdentity = std::pair<PluginFormat, QString>;
 
-FileIdentity fileOf(const CataloguedPlugin &plugin)
-{
-    return {QString::fromLatin1(plugin.format->key), plugin.record.path};
-}
+FileIdentity fileOf(const CataloguedPlugin &plugin) { return {plugin.format->format, plugin.record.path}; }
 
 /// Files that have no record in the catalogue: no plug-ins, or such that get none although they failed.
 void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
@@ -65,8 +67,8 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
             continue;
         const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;
         (probe.noPlugin ? summary.noPlugins : summary.failures)
-            .push_back(
-                {&pluginFormat(key.format), PluginState::Failed, name, key.path, key.subId, probe.reason});
+            .push_back({&formatInfo(key.format), PluginState::Failed, name, key.path, key.subId, probe.reason,
+                        false});
     }
 }
 
@@ -144,7 +146,7 @@ ReasonStore reasonsToRemember(const ScanSummary &summary)
     for (const CataloguedPlugin &plugin : summary.plugins)
         fileTimes[keyOf(plugin)] = plugin.record.fileTime;
     for (const PluginFailure &failure : summary.failures) {
-        const PluginKey key{QString::fromLatin1(failure.format->key), failure.path, failure.subId};
+        const PluginKey key{failure.format->format, failure.path, failure.subId};
         if (const auto time = fileTimes.find(key); time != fileTimes.end())
             store.set(key, time->second, failure.reason);
     }

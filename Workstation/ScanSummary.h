@@ -6,12 +6,13 @@
 
 /// A plug-in, or a file that was taken for one, that cannot be used.
 struct PluginFailure {
-    const PluginFormat *format;
+    const PluginFormatInfo *format;
     PluginState state;
     QString name;
     QString path;
     quint32 subId;
-    QString reason; ///< one phrase, without a full stop
+    QString reason;    ///< one phrase, without a full stop
+    bool isCatalogued; ///< it is one of the catalogue's plug-ins, too
 };
 
 /// A file and the time that its probe took.

@@ -12,5 +12,3 @@ QByteArray renderCsv(const ScanSummary &summary);
 
 /// Channels of a plug-in as far as the catalogue tells: inputs in VST 3, outputs in VST 2.
 QString channelsText(const CataloguedPlugin &plugin);
-/// The failure of a plug-in of the summary; null for one that can be used.
-const PluginFailure *failureOf(const ScanSummary &summary, const CataloguedPlugin &plugin);

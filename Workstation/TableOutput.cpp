@@ -100,11 +100,10 @@ QString renderCounts(const ScanSummary &summary)
 
 QString channelsText(const CataloguedPlugin &plugin)
 {
-    const bool isVst3 = plugin.format == &pluginFormats().front();
-    const qint32 channels = isVst3 ? plugin.record.inputs : plugin.record.width;
+    const qint32 channels = plugin.hasWidth() ? plugin.record.width : plugin.record.inputs;
     if (!plugin.isUsable() || channels < 0)
         return QStringLiteral("-");
-    return QString::number(channels) + (isVst3 ? QLatin1String(" in") : QLatin1String(" out"));
+    return QString::number(channels) + (plugin.hasWidth() ? QLatin1String(" out") : QLatin1String(" in"));
 }
 
 QString renderTable(const ScanSummary &summary)

@@ -1,7 +1,7 @@
+#include "Main/AudioEngineController/Effects/Catalogue/BuiltInCatalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
-#include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 
 #include <algorithm>
@@ -22,18 +22,12 @@ bool anyTextHolds(const std::vector<EffectRecord> &records, const char *characte
 void readAndWrite(const CatalogueFormat &format, const QByteArray &input)
 {
     writeFuzzFile(kFile, input);
-    const CatalogueContents contents = readCatalogueFile(format, kFile);
-    require(contents || contents.records.empty(), "a file that cannot be used gives no records");
-    const std::vector<EffectRecord> records = contents ? contents.records : salvageRecords(format, kFile);
+    const std::vector<EffectRecord> records = readCatalogueFile(format, kFile).records;
     const QByteArray written = renderCatalogue(format, records);
     writeFuzzFile(kFile, written);
-    // Nothing is escaped.
-    if (!anyTextHolds(records, "<"))
+    if (!anyTextHolds(records, "\n")) // nothing is escaped, and lines are told by their ends
         require(renderCatalogue(format, readCatalogueFile(format, kFile).records) == written,
-                "what was read is written and read again the same");
-    if (!anyTextHolds(records, "\n"))
-        require(renderCatalogue(format, salvageRecords(format, kFile)) == written,
-                "what was written is salvaged whole, whatever the texts are");
+                "what was read is written and read again the same, whatever the texts are");
 }
 
 } // namespace

@@ -1,6 +1,6 @@
+#include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 
 namespace {
@@ -13,8 +13,8 @@ void readAndWrite(const MarkerFormat &format, const QByteArray &input)
     require(!read.enabled && (format.hasSubId || read.subId == 0), "a marker names what is not enabled");
     if (anyHolds({read.path, read.fileTime, read.name}, "\r\n"))
         return; // markers are read by their lines where their texts make them no XML
-    require(bool(writeMarkerFile(format, name, read)), "a marker can be written");
-    const EffectRecord again = readMarkerFile(format, name);
+    const CrashMarker marker(format, ".", read, read.name);
+    const EffectRecord again = readMarkerFile(format, marker.path());
     require(again.path == read.path && again.fileTime == read.fileTime && again.name == read.name &&
                 again.subId == read.subId,
             "what was read is written and read again the same");

@@ -1,5 +1,5 @@
+#include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 
 void fuzzName(const QByteArray &input)
@@ -16,7 +16,7 @@ void fuzzName(const QByteArray &input)
 
     const MarkerFormat &format = vstCatalogueFormat().marker;
     for (const QString &name : {QString(), record.path}) {
-        const QString marker = markerPath(format, "folder", record.path, name);
+        const QString marker = CrashMarker(format, "folder", record, name).path();
         const QString file = marker.mid(7);
         require(marker.startsWith("folder/") && !anyHolds({file}, "/\\:\n") && !file.startsWith('.'),
                 "a marker lies in its folder, to be seen");

@@ -9,9 +9,11 @@ void fuzzScanList(const QByteArray &input)
 
     const QString list = "FXScan.xml";
     writeFuzzFile(list, input);
-    const QStringList folders = ReadScanList(list);
-    if (anyHolds({folders.join(QString())}, "<&"))
+    const ScanListContents contents = ReadScanList(list);
+    require(contents || contents.folders.isEmpty(), "a list that cannot be used names no folders");
+    if (anyHolds({contents.folders.join(QString())}, "\n"))
         return; // nothing is escaped
-    require(bool(WriteScanList(list, folders)), "a scan list can be written");
-    require(ReadScanList(list) == folders, "what was read is written and read again the same");
+    require(bool(WriteScanList(list, contents.folders)), "a scan list can be written");
+    require(ReadScanList(list).folders == contents.folders,
+            "what was read is written and read again the same");
 }

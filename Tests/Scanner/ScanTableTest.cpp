@@ -177,7 +177,7 @@ scan
 write Effects/1.scan3: <CrashedPlugin><Path>@/Plugins/a/Comp.vst3</Path><Created>2021-03-04 05:06</Created><Name>Comp</Name></CrashedPlugin>
 write Effects/2.scan3: <CrashedPlugin><Path>@/gone/Same.vst3</Path><Created>2021-03-04 05:06</Created><Name>Same</Name></CrashedPlugin>
 scan
-vst3 Name Enabled: Comp|0, B|1
+vst3 Name Enabled Working: Comp|0|0, Comp|0|0, B|1|1
 same
 
 = Markers outlive a catalogue that cannot be written and those of no use do not

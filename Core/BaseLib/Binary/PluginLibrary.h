@@ -35,6 +35,8 @@ public:
     /// The system's message for why the last load failed.
     const QString &errorText() const { return m_errorText; }
 
+    /// The end of the names of the system's libraries, with its dot.
+    static QString fileEnding();
     /// Whether a file exists at the path.
     static bool exists(const QString &path);
 

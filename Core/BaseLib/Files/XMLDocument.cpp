@@ -17,16 +17,6 @@ constexpr unsigned kParseOptions = (pugi::parse_default | pugi::parse_ws_pcdata_
 
 constexpr char kByteOrderMark[] = "\xef\xbb\xbf";
 
-/// A text with all its characters: Qt drops a byte order mark at its start.
-QString wholeText(const char *utf8)
-{
-    return qstrncmp(utf8, kByteOrderMark, sizeof kByteOrderMark - 1) == 0
-               ? QString::fromUtf8(QByteArray(kByteOrderMark) + utf8)
-               : QString::fromUtf8(utf8);
-}
-
-qint64 integerOf(const char *utf8) { return std::strtoll(utf8, nullptr, 10); }
-
 } // namespace
 
 XMLElement XMLElement::child(const char *name) const
@@ -42,9 +32,11 @@ std::vector<XMLElement> XMLElement::children(const char *name) const
     return found;
 }
 
-QString XMLElement::text() const { return wholeText(pugi::xml_node(m_node).text().get()); }
+const char *XMLElement::utf8() const { return pugi::xml_node(m_node).text().get(); }
 
-qint64 XMLElement::integer() const { return integerOf(pugi::xml_node(m_node).text().get()); }
+QString XMLElement::text() const { return textOfUtf8(utf8(), static_cast<int>(qstrlen(utf8()))); }
+
+qint64 XMLElement::integer() const { return integerOfUtf8(utf8()); }
 
 std::optional<QString> XMLElement::attribute(const char *name) const
 {
@@ -91,7 +83,17 @@ XMLElement XMLDocument::root(const char *name) const
     return XMLElement(m_document->child(name).internal_object());
 }
 
-qint64 parseInteger(const QString &text) { return integerOf(text.toUtf8().constData()); }
+qint64 integerOfUtf8(const char *utf8) { return std::strtoll(utf8, nullptr, 10); }
+
+QString textOfUtf8(const char *utf8, int size)
+{
+    constexpr int kMarkSize = static_cast<int>(sizeof kByteOrderMark) - 1;
+    const bool hasMark = size >= kMarkSize && qstrncmp(utf8, kByteOrderMark, kMarkSize) == 0;
+    return hasMark ? QString::fromUtf8(kByteOrderMark + QByteArray(utf8, size))
+                   : QString::fromUtf8(utf8, size);
+}
+
+qint64 parseInteger(const QString &text) { return integerOfUtf8(text.toUtf8().constData()); }
 
 double parseDecimal(const QString &text)
 {

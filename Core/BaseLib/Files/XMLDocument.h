@@ -25,6 +25,8 @@ public:
     std::vector<XMLElement> children(const char *name) const;
     /// The element's text; empty when there is none.
     QString text() const;
+    /// The same as UTF-8; never null, valid as long as the document.
+    const char *utf8() const;
     /// The element's text as `parseInteger` reads it; 0 when there is none.
     qint64 integer() const;
     /// An attribute's value; nothing when the attribute is absent.
@@ -71,5 +73,9 @@ private:
 /// An integer as in the catalogue files: base 10, a sign allowed, trailing junk ignored; 0 for a text that is
 /// not a number, and the nearest limit for a number that does not fit 64 bits.
 qint64 parseInteger(const QString &text);
+/// The same of text that a null character, or anything that is not part of a number, follows.
+qint64 integerOfUtf8(const char *utf8);
+/// A text with all its characters: Qt drops a byte order mark at its start.
+QString textOfUtf8(const char *utf8, int size);
 /// A decimal number, read the same in every locale; 0 for a text that is not a number.
 double parseDecimal(const QString &text);

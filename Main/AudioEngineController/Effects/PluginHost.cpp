@@ -3,11 +3,11 @@
 #include "Core/BaseLib/Files/FileFinder.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/Host/AudioUnitHost.h"
 #include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
 #include "Main/VLib/ApplicationContext.h"
@@ -20,13 +20,28 @@
 
 namespace {
 
-constexpr std::size_t kScanOrder[] = {1, 0, 2, 3}; ///< VST 3 first
-
 #ifdef _WIN32
 constexpr char kScannerProgram[] = "/FxProbe.exe";
 #else
 constexpr char kScannerProgram[] = "/FxProbe";
 #endif
+
+/// The host column of the table of formats.
+std::unique_ptr<AudioPluginHost> makeHost(PluginFormat format)
+{
+    switch (format) {
+    case PluginFormat::Vst2:
+        return std::make_unique<VSTHost>();
+    case PluginFormat::Vst3:
+        return std::make_unique<VST3Host>();
+    case PluginFormat::BuiltIn:
+        return std::make_unique<MRLAudioPluginHost>();
+    case PluginFormat::AudioUnit:
+    case PluginFormat::Unknown:
+        break;
+    }
+    return std::make_unique<AudioUnitHost>();
+}
 
 IQuillonInterface *application() { return ApplicationContext::instance().quillonInterface; }
 
@@ -45,12 +60,13 @@ PluginHost &PluginHost::instance()
 }
 
 PluginHost::PluginHost()
-    : m_hosts{std::make_unique<VSTHost>(), std::make_unique<VST3Host>(), std::make_unique<AudioUnitHost>(),
-              std::make_unique<MRLAudioPluginHost>()}
-    , m_sortedCategoryNames(CategoryTable::instance().sortedNames())
+    : m_sortedCategoryNames(CategoryTable::instance().sortedNames())
     , m_instrumentPosition(CategoryTable::instance().instrumentPosition())
     , m_ambisonicsPosition(CategoryTable::instance().ambisonicsPosition())
-{}
+{
+    for (const PluginFormatInfo &info : pluginFormats())
+        m_hosts.emplace(info.format, makeHost(info.format));
+}
 
 PluginHost::~PluginHost()
 {
@@ -59,14 +75,20 @@ PluginHost::~PluginHost()
         m_launcherThread.join();
 }
 
+/// In the order in which formats are scanned.
+void PluginHost::forEachHost(const std::function<void(AudioPluginHost &)> &operation) const
+{
+    for (const PluginFormatInfo &info : pluginFormats())
+        operation(*m_hosts.at(info.format));
+}
+
 void PluginHost::initialise(const QString &dataFolder, const QString &previousEffectsFolder, int sampleRate,
                             int blockSize)
 {
     // Absolute: a plug-in may change the working folder while its marker must be found.
     setCatalogueFolder(QFileInfo(dataFolder + QStringLiteral("/Effects")).absoluteFilePath());
     m_pluginMetadataFolder = dataFolder + QStringLiteral("/Plugin Metadata");
-    for (const auto &host : m_hosts)
-        host->setCatalogueFolder(effectsFolder());
+    forEachHost([this](AudioPluginHost &host) { host.setCatalogueFolder(effectsFolder()); });
     setAudioSettings(sampleRate, blockSize);
     if (!previousEffectsFolder.isEmpty())
         moveOldCatalogue(previousEffectsFolder);
@@ -93,17 +115,15 @@ void PluginHost::moveOldCatalogue(const QString &previousEffectsFolder) const
 
 void PluginHost::ReadCatalogue()
 {
-    for (const auto &host : m_hosts)
-        host->ReadCatalogue();
+    forEachHost([](AudioPluginHost &host) { host.ReadCatalogue(); });
 }
 
-QStringList PluginHost::folders() const { return m_hosts.front()->folders(); }
+QStringList PluginHost::folders() const { return m_hosts.at(PluginFormat::Vst2)->folders(); }
 
 bool PluginHost::catalogueChanged()
 {
     bool changed = false;
-    for (const auto &host : m_hosts)
-        changed |= host->catalogueChanged();
+    forEachHost([&](AudioPluginHost &host) { changed |= host.catalogueChanged(); });
     return changed;
 }
 
@@ -111,8 +131,7 @@ void PluginHost::setAudioSettings(int sampleRate, int blockSize)
 {
     m_sampleRate = sampleRate;
     m_blockSize = blockSize;
-    for (const auto &host : m_hosts)
-        host->setAudioSettings(sampleRate, blockSize);
+    forEachHost([=](AudioPluginHost &host) { host.setAudioSettings(sampleRate, blockSize); });
 }
 
 void PluginHost::setIntParameter(IntParameter parameter, int value)
@@ -149,8 +168,7 @@ bool PluginHost::Scan(bool scan, bool inProcess)
         m_completed = std::make_unique<ManualResetEvent>();
     m_completed->reset();
     m_launcher.reset();
-    for (const auto &host : m_hosts)
-        host->clearCancel();
+    forEachHost([](AudioPluginHost &host) { host.clearCancel(); });
     FileFinder::forgetReports();
     ReadCatalogue();
     m_scannerPath = usualScannerPath();
@@ -171,35 +189,28 @@ bool PluginHost::scanHosts(bool scan)
 {
     bool written = false;
     QStringList endings;
-    for (const auto &host : m_hosts)
-        if (const QString ending = host->moduleEnding(); !ending.isEmpty())
-            endings.append(ending);
-    shareFileFinder(std::make_shared<FileFinder>(endings));
-    for (const std::size_t index : kScanOrder) {
+    for (const PluginFormatInfo &info : pluginFormats())
+        if (info.isScanned())
+            endings.append(info.moduleEnding);
+    const auto finder = std::make_shared<FileFinder>(endings);
+    forEachHost([&](AudioPluginHost &host) {
         if (scan && m_launcher.isCancelled()) { // what the host knows stays in its catalogue
             ProbeReport::instance().cancelled();
-            break;
+            return;
         }
-        written |= m_hosts[index]->Scan(scan, true);
-    }
-    shareFileFinder(nullptr);
-    for (const auto &host : m_hosts)
-        if (scan && !host->isCatalogueUnread())
-            host->releaseHeldMarkers();
+        host.setFileFinder(finder);
+        written |= host.Scan(scan, true);
+        host.setFileFinder(nullptr);
+    });
+    if (scan)
+        forEachHost([](AudioPluginHost &host) { host.scansEnded(); });
     return written;
-}
-
-void PluginHost::shareFileFinder(const std::shared_ptr<FileFinder> &finder) const
-{
-    for (const auto &host : m_hosts)
-        host->setFileFinder(finder);
 }
 
 void PluginHost::cancelScan()
 {
     m_launcher.cancel();
-    for (const auto &host : m_hosts)
-        host->cancel();
+    forEachHost([](AudioPluginHost &host) { host.cancel(); });
 }
 
 void PluginHost::startLauncher()
@@ -234,13 +245,13 @@ void PluginHost::launch()
 void PluginHost::reloadChanged()
 {
     bool changed = false;
-    for (const auto &host : m_hosts) {
-        if (!host->catalogueChanged())
-            continue;
-        host->ReadCatalogue();
-        host->Scan(false, true);
+    forEachHost([&](AudioPluginHost &host) {
+        if (!host.catalogueChanged())
+            return;
+        host.ReadCatalogue();
+        host.Scan(false, true);
         changed = true;
-    }
+    });
     if (changed)
         notifyWorkstation();
 }

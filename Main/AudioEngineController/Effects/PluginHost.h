@@ -1,12 +1,14 @@
 #pragma once
 
 #include "Core/BaseLib/Process/ManualResetEvent.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Launcher/ScannerLauncher.h"
 #include "Main/AudioEngineController/Effects/ParameterHandler.h"
 
-#include <array>
 #include <atomic>
+#include <functional>
+#include <map>
 #include <memory>
 #include <thread>
 
@@ -81,22 +83,20 @@ public:
     int instrumentPosition() const { return m_instrumentPosition; }
     int ambisonicsPosition() const { return m_ambisonicsPosition; }
 
-    AudioPluginHost &vst2Host() { return *m_hosts[0]; }
-    AudioPluginHost &vst3Host() { return *m_hosts[1]; }
-    AudioPluginHost &builtInHost() { return *m_hosts[3]; }
+    /// The host of a format of the table.
+    AudioPluginHost &host(PluginFormat format) { return *m_hosts.at(format); }
 
 private:
-    AudioPluginHost *hostOfPrefix(const QString &prefix);
     bool scanHosts(bool scan);
-    void shareFileFinder(const std::shared_ptr<FileFinder> &finder) const;
     void startLauncher();
     void launch();
     void reloadChanged();
     void notifyWorkstation() const;
     void moveOldCatalogue(const QString &previousEffectsFolder) const;
 
-    /// In this order: VST 2, VST 3, Audio Units, built-in effects.
-    std::array<std::unique_ptr<AudioPluginHost>, 4> m_hosts;
+    void forEachHost(const std::function<void(AudioPluginHost &)> &operation) const;
+
+    std::map<PluginFormat, std::unique_ptr<AudioPluginHost>> m_hosts; ///< one for each row of the table
     QString m_pluginMetadataFolder;
     QString m_scannerPath;
     std::unique_ptr<ManualResetEvent> m_completed;

@@ -54,15 +54,25 @@ protected:
         std::set<QString> named;
         for (const QString &marker : m_folder.markers())
             named.insert(marker.section('.', 0, 0));
-        EXPECT_EQ(sortedRecords("Name"), m_names);
+        EXPECT_EQ(distinctNames(), m_names);
         EXPECT_LE(scanUntilSettled(), 1 + static_cast<int>(named.size()));
-        EXPECT_EQ(sortedRecords("Name"), m_names);
+        EXPECT_EQ(distinctNames(), m_names);
         for (const QString &row : sortedRecords("Name Favourite Enabled Working")) {
             const QString name = row.section('|', 0, 0);
+            if (named.count(name) != 0 && row.endsWith("|0|0|0"))
+                continue; // stands for the file that the marker named
             const QString state = name == kSwitchedOff ? "|1|0|1" : "|1|1|1";
             EXPECT_TRUE(row.endsWith(state) || (named.count(name) != 0 && row.endsWith("|1|0|0")))
                 << qPrintable(row);
         }
+    }
+
+    /// A file that crashed has a record of its own beside its class's.
+    QStringList distinctNames() const
+    {
+        QStringList names = sortedRecords("Name");
+        names.removeDuplicates();
+        return names;
     }
 
     const QString kSwitchedOff = "M3";

@@ -62,3 +62,5 @@ void PluginLibrary::free()
     dlclose(m_handle);
     m_handle = nullptr;
 }
+
+QString PluginLibrary::fileEnding() { return QStringLiteral(".so"); }

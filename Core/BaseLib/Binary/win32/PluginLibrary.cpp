@@ -60,3 +60,5 @@ void PluginLibrary::free()
     FreeLibrary(static_cast<HMODULE>(m_handle));
     m_handle = nullptr;
 }
+
+QString PluginLibrary::fileEnding() { return QStringLiteral(".dll"); }

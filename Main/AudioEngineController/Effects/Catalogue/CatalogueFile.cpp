@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 
-#include <QList>
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueLines.h"
 
 namespace {
 
@@ -11,34 +11,53 @@ EffectRecord readRecord(const CatalogueFormat &format, const XMLElement &effect)
         if (!element.read)
             continue;
         if (const XMLElement child = effect.child(element.name))
-            element.read(record, child);
+            element.read(record, ElementContent(child));
     }
     return record;
 }
 
-void upgradeRecord(const CatalogueFormat &format, double version, EffectRecord &record)
+/// What an XML reader makes of the file; the version, where it states one.
+std::optional<QString> readAsXml(const CatalogueFormat &format, const QByteArray &text,
+                                 CatalogueContents &contents)
 {
-    if (version < format.fileTimesTrustedFrom)
-        record.fileTime = format.fileTime(record.path);
-    if (version < format.categoryMasksFrom)
-        record.category = 0;
+    XMLDocument document(XMLDocument::Entities::Literal);
+    if (!document.parse(text)) {
+        contents.reason = document.error();
+        return std::nullopt;
+    }
+    const XMLElement root = document.root("Effects");
+    if (!root) {
+        contents.reason = QStringLiteral("it has no \"Effects\" element");
+        return std::nullopt;
+    }
+    const std::optional<QString> version = root.attribute("version");
+    if (!version && format.versionRequired) {
+        contents.reason = QStringLiteral("it states no version");
+        return std::nullopt;
+    }
+    contents.records.clear();
+    for (const XMLElement &effect : root.children("Effect"))
+        contents.records.push_back(readRecord(format, effect));
+    return version.value_or(QStringLiteral("1.0"));
 }
 
-/// A line of ours with its content escaped; lines of any other form as they are.
-QByteArray escapedLine(const QByteArray &line)
+void upgrade(const CatalogueFormat &format, double version, const FileTimeOf &fileTimeOf,
+             CatalogueContents &contents)
 {
-    const int start = line.indexOf('>') + 1;
-    const int end = line.lastIndexOf("</");
-    if (start <= 0 || end < start)
-        return line;
-    QByteArray content = line.mid(start, end - start);
-    content.replace('&', "&amp;").replace('<', "&lt;").replace('>', "&gt;");
-    return line.left(start) + content + line.mid(end);
+    const bool hasOldTimes = version < format.fileTimesTrustedFrom;
+    const bool hasOldMasks = version < format.categoryMasksFrom;
+    for (EffectRecord &record : contents.records) {
+        if (hasOldTimes)
+            record.fileTime = fileTimeOf ? fileTimeOf(record.path) : QString();
+        if (hasOldMasks)
+            record.category = 0;
+    }
 }
 
 } // namespace
 
-CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path)
+CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path,
+                                    const FileTimeOf &fileTimeOf)
 {
     CatalogueContents contents;
     QByteArray text;
@@ -47,48 +66,14 @@ CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString
         contents.reason = read.reason;
         return contents;
     }
-    XMLDocument document(XMLDocument::Entities::Literal);
-    if (!document.parse(text)) {
-        contents.isBroken = true;
-        contents.reason = document.error();
-        return contents;
-    }
-    const XMLElement root = document.root("Effects");
-    if (!root) {
-        contents.reason = QStringLiteral("it has no \"Effects\" element");
-        return contents;
-    }
-    const std::optional<QString> stated = root.attribute("version");
-    if (!stated && format.versionRequired) {
-        contents.reason = QStringLiteral("it states no version");
-        return contents;
-    }
-    const double version = stated ? parseDecimal(*stated) : 1.0;
-    contents.upgraded = version < format.fileTimesTrustedFrom || version < format.categoryMasksFrom;
-    for (const XMLElement &effect : root.children("Effect")) {
-        contents.records.push_back(readRecord(format, effect));
-        upgradeRecord(format, version, contents.records.back());
-    }
+    CatalogueLines lines = readCatalogueLines(format, text);
+    contents.records = std::move(lines.records);
+    std::optional<QString> version = lines.version;
+    contents.isAsWritten = lines.isWhole && lines.version == QLatin1String(format.version);
+    if (!lines.isWhole)
+        version = readAsXml(format, text, contents);
+    upgrade(format, parseDecimal(version.value_or(lines.version)), fileTimeOf, contents);
     return contents;
-}
-
-std::vector<EffectRecord> salvageRecords(const CatalogueFormat &format, const QString &path)
-{
-    std::vector<EffectRecord> records;
-    QByteArray content;
-    QByteArray block;
-    if (!readWholeFile(path, content))
-        return records;
-    const QList<QByteArray> lines = content.replace("\r\n", "\n").split('\n');
-    for (const QByteArray &line : lines) {
-        if (line == "\t<Effect>")
-            block.clear();
-        block += escapedLine(line) + '\n';
-        XMLDocument document;
-        if (line == "\t</Effect>" && document.parse(block))
-            records.push_back(readRecord(format, document.root("Effect")));
-    }
-    return records;
 }
 
 QByteArray xmlHeaderLine() { return QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>") + kLineEnd; }

@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Files/TextFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFormat.h"
 
+#include <functional>
 #include <vector>
 
 /// What a catalogue file held.
@@ -10,18 +11,20 @@ struct CatalogueContents {
     QString reason;                    ///< why the file could not be used; empty when it was
     std::vector<EffectRecord> records; ///< in the order of the file
     bool isUnread = false;             ///< the file is there, but the system did not let it be read
-    bool isBroken = false;             ///< it is no XML; what it holds can be salvaged at best
-    bool upgraded = false;             ///< an earlier version, whose records were changed while reading
+    bool isAsWritten = false; ///< of this version and in our layout: written again, it would be the same
 
     explicit operator bool() const { return reason.isEmpty(); }
 };
 
-/// Reads a catalogue file, upgrading records of earlier versions.
-CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path);
+/// Gives the time stamp of a module's file.
+using FileTimeOf = std::function<QString(const QString &path)>;
 
-/// The records of a catalogue that is no XML (texts are not escaped, and a plug-in's name may hold "<"), read
-/// by its lines.
-std::vector<EffectRecord> salvageRecords(const CatalogueFormat &format, const QString &path);
+/// Reads a catalogue file: by its lines where it has the layout in which it is written, as XML where it has
+/// another. Records of earlier versions are upgraded: their time stamps, which were of another form, become
+/// those of the files now, or none where `fileTimeOf` is null. Where the file cannot be used as a whole, the
+/// records before the place that cannot be read are there.
+CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path,
+                                    const FileTimeOf &fileTimeOf = nullptr);
 
 /// A record as the catalogue file holds it, line ends included. Nothing is escaped: the files' other readers
 /// and writers do not expect it.

@@ -9,7 +9,7 @@ using Content = std::optional<QByteArray>;
 template <QString EffectRecord::*Field>
 constexpr CatalogueElement textElement(const char *name)
 {
-    return {name, [](EffectRecord &record, const XMLElement &element) { record.*Field = element.text(); },
+    return {name, [](EffectRecord &record, const ElementContent &element) { record.*Field = element.text(); },
             [](const EffectRecord &record) -> Content { return (record.*Field).toUtf8(); }};
 }
 
@@ -17,13 +17,13 @@ template <bool EffectRecord::*Field>
 constexpr CatalogueElement boolElement(const char *name)
 {
     return {name,
-            [](EffectRecord &record, const XMLElement &element) {
+            [](EffectRecord &record, const ElementContent &element) {
                 record.*Field = CatalogueElements::readBool(element);
             },
             [](const EffectRecord &record) -> Content { return QByteArray(record.*Field ? "1" : "0"); }};
 }
 
-void readCategoryMask(EffectRecord &record, const XMLElement &element)
+void readCategoryMask(EffectRecord &record, const ElementContent &element)
 {
     const auto mask = static_cast<quint32>(CatalogueElements::readInt(element));
     record.category = CategoryTable::instance().maskToCategory(mask);

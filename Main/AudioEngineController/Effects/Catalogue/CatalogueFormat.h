@@ -1,7 +1,7 @@
 #pragma once
 
-#include "Core/BaseLib/Files/XMLDocument.h"
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/ElementContent.h"
 
 #include <QByteArray>
 
@@ -12,7 +12,7 @@
 struct CatalogueElement {
     const char *name;
     /// Takes the element's value into the record; called only when the element is present.
-    void (*read)(EffectRecord &record, const XMLElement &element);
+    void (*read)(EffectRecord &record, const ElementContent &element);
     /// The element's content as UTF-8, unescaped; nothing leaves the whole element out.
     std::optional<QByteArray> (*content)(const EffectRecord &record);
 };
@@ -31,9 +31,7 @@ struct CatalogueFormat {
     const char *version;         ///< the version attribute that is written
     bool versionRequired;        ///< a file without a version yields no records; otherwise it counts as 1.0
     double fileTimesTrustedFrom; ///< files of earlier versions carry time stamps of another form
-    double categoryMasksFrom;    ///< in files of earlier versions the mask is none yet
-    /// A plug-in file's time stamp; null where every version's times are trusted.
-    QString (*fileTime)(const QString &path);
+    double categoryMasksFrom;    ///< in files of earlier versions the mask is not one yet
     MarkerFormat marker;
     std::vector<CatalogueElement> elements;
 };
@@ -50,6 +48,6 @@ extern const CatalogueElement kVendor;
 extern const CatalogueElement kEnabled;
 extern const CatalogueElement kWorking;
 
-inline qint32 readInt(const XMLElement &element) { return static_cast<qint32>(element.integer()); }
-inline bool readBool(const XMLElement &element) { return element.integer() != 0; }
+inline qint32 readInt(const ElementContent &element) { return static_cast<qint32>(element.integer()); }
+inline bool readBool(const ElementContent &element) { return element.integer() != 0; }
 } // namespace CatalogueElements

@@ -34,7 +34,7 @@ void EffectList::setFavourite(const QString &id, bool favourite)
     if (entry == m_entries.end())
         return;
     entry->second.record.favourite = favourite;
-    entry->second.rendered = QByteArray();
+    entry->second.forgetText();
 }
 
 void EffectList::remove(const QString &id)

@@ -1,18 +1,35 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 
 #include <QByteArray>
 #include <QSet>
 
 #include <map>
 
-/// A record that came into a catalogue, with its text once it was written: each record is rendered once,
-/// however many times the file is.
-struct ListedEffect {
+/// A record that came into a catalogue. It is rendered once, however many times the file is written.
+class ListedEffect {
+public:
+    ListedEffect() = default;
+    explicit ListedEffect(EffectRecord listed)
+        : record(std::move(listed))
+    {}
+
     EffectRecord record;
-    mutable QByteArray rendered;
     bool ownsName = false; ///< the name counts as used because of this record
+
+    /// The record's text in a format's catalogue file.
+    const QByteArray &text(const CatalogueFormat &format)
+    {
+        if (m_rendered.isNull())
+            m_rendered = renderRecord(format, record);
+        return m_rendered;
+    }
+    /// To be called when the record was changed.
+    void forgetText() { m_rendered = QByteArray(); }
+
+private:
+    QByteArray m_rendered;
 };
 
 /// Old records of files that still wait for their probe, sorted by identifier: interim writes carry them, so
@@ -27,6 +44,7 @@ public:
     void clear();
     std::size_t size() const { return m_entries.size(); }
     const Entries &entries() const { return m_entries; }
+    Entries &entries() { return m_entries; }
 
     /// The record that holds the identifier, or null.
     const EffectRecord *find(const QString &id) const;

@@ -1,6 +1,35 @@
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 
+#include <tuple>
+
+namespace {
+
+auto fieldsOf(const EffectRecord &record)
+{
+    return std::tie(record.path, record.fileTime, record.name, record.id, record.vendor, record.categories,
+                    record.inputs, record.outputs, record.enabled, record.category, record.working,
+                    record.favourite, record.vstCategory, record.behaviour, record.width, record.latency,
+                    record.subName, record.subId);
+}
+
+} // namespace
+
+bool operator==(const EffectRecord &left, const EffectRecord &right)
+{
+    return fieldsOf(left) == fieldsOf(right);
+}
+
 QString fileNameOf(const QString &path) { return path.mid(path.lastIndexOf(QLatin1Char('/')) + 1); }
+
+bool EffectRecord::standsForFile() const
+{
+    if (working || subId != 0)
+        return false;
+    EffectRecord file;
+    file.path = path;
+    NameFromPath(file);
+    return id == file.name || id.startsWith(path);
+}
 
 void takeMarks(EffectRecord &record, const EffectRecord &old)
 {

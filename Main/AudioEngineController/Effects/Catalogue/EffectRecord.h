@@ -27,6 +27,9 @@ struct EffectRecord {
 
     /// True for what a crash marker made of a whole file: disabled and not working.
     bool isCrashedFile() const { return !enabled && !working && subId == 0; }
+    /// True for what stands for a whole file that crashed or failed: such a record is named after the file,
+    /// or identified by its path.
+    bool standsForFile() const;
     /// True when the user switched the plug-in off: what crashed is not working as well.
     bool isSwitchedOff() const { return !enabled && working; }
     /// True when both records stand for the same file, or the same sub-plug-in of one.
@@ -35,6 +38,9 @@ struct EffectRecord {
         return subId == other.subId && isSamePath(path, other.path);
     }
 };
+
+/// True when all fields are the same.
+bool operator==(const EffectRecord &left, const EffectRecord &right);
 
 /// The last component of a path.
 QString fileNameOf(const QString &path);

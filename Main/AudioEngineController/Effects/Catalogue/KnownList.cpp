@@ -1,9 +1,6 @@
 #include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
 
-#include <QFile>
-
 #include <algorithm>
-#include <iterator>
 #include <tuple>
 
 namespace {
@@ -11,13 +8,97 @@ namespace {
 int rankOf(const EffectRecord &record)
 {
     if (record.isCrashedFile())
-        return 0;
-    return record.subId != 0 && !record.enabled ? 2 : 1;
+        return record.standsForFile() ? 0 : 1;
+    if (record.standsForFile())
+        return 2;
+    return record.subId != 0 && !record.enabled ? 4 : 3;
 }
 
-/// Of the records of a file name, those of the full path, which come first.
-KnownList::Records firstOfPath(KnownList::Records records, const QString &path)
+void markCrashed(EffectRecord &record)
 {
+    record.enabled = false;
+    record.working = false;
+}
+
+} // namespace
+
+void KnownList::clear()
+{
+    m_byFileName.clear();
+    m_records.clear();
+}
+
+bool KnownList::addRecord(const EffectRecord &record)
+{
+    const QString fileName = fileNameOf(record.path);
+    const auto [first, last] = m_byFileName.equal_range(fileName);
+    const bool isThere =
+        std::any_of(first, last, [&](const auto &entry) { return entry.second->id == record.id; });
+    if (isThere)
+        return false;
+    m_records.push_back(record);
+    m_byFileName.emplace_hint(last, fileName, &m_records.back());
+    return true;
+}
+
+/// The record that a marker is about: of a sub-plug-in its own, of a file the one that stands for it.
+EffectRecord *KnownList::find(const EffectRecord &marker)
+{
+    const auto [first, last] = m_byFileName.equal_range(fileNameOf(marker.path));
+    const auto found = std::find_if(first, last, [&](const auto &entry) {
+        const EffectRecord &record = *entry.second;
+        const bool isItsOwn =
+            marker.subId != 0 || m_identity == Identity::SubPlugin || record.standsForFile();
+        return record.isSamePlugin(marker) && isItsOwn;
+    });
+    return found == last ? nullptr : found->second;
+}
+
+EffectRecord &KnownList::applyCrash(const EffectRecord &marker)
+{
+    EffectRecord *record = find(marker);
+    if (!record) {
+        m_records.push_back(marker);
+        record = &m_records.back();
+        m_byFileName.emplace(fileNameOf(marker.path), record);
+    }
+    record->fileTime = marker.fileTime;
+    markCrashed(*record);
+    if (marker.subId == 0)
+        disableOthers(*record);
+    return *record;
+}
+
+void KnownList::disableOthers(const EffectRecord &crashed)
+{
+    const auto [first, last] = m_byFileName.equal_range(fileNameOf(crashed.path));
+    for (auto entry = first; entry != last; ++entry)
+        if (isSamePath(entry->second->path, crashed.path) && !entry->second->isSwitchedOff()) {
+            entry->second->fileTime = crashed.fileTime;
+            markCrashed(*entry->second);
+        }
+}
+
+KnownList::Records KnownList::recordsOfFileName(const QString &path) const
+{
+    Records records;
+    const auto [first, last] = m_byFileName.equal_range(fileNameOf(path));
+    for (auto entry = first; entry != last; ++entry)
+        records.push_back(entry->second);
+    if (records.size() < 2) // most have one, and sorting allocates
+        return records;
+    const auto place = [&](const EffectRecord *record) {
+        return std::make_tuple(!isSamePath(record->path, path), rankOf(*record));
+    };
+    std::stable_sort(
+        records.begin(), records.end(),
+        [&](const EffectRecord *left, const EffectRecord *right) { return place(left) < place(right); });
+    return records;
+}
+
+KnownList::Records KnownList::recordsOfPath(const QString &path) const
+{
+    Records records = recordsOfFileName(path);
     const auto others = std::find_if(records.begin(), records.end(), [&](const EffectRecord *record) {
         return !isSamePath(record->path, path);
     });
@@ -25,96 +106,10 @@ KnownList::Records firstOfPath(KnownList::Records records, const QString &path)
     return records;
 }
 
-} // namespace
-
-bool KnownList::file(const EffectRecord &record)
-{
-    const QString fileName = fileNameOf(record.path);
-    const auto [first, last] = m_records.equal_range(fileName);
-    const bool isThere =
-        std::any_of(first, last, [&](const auto &entry) { return entry.second.id == record.id; });
-    if (!isThere)
-        m_records.emplace_hint(last, fileName, record);
-    return !isThere;
-}
-
-EffectRecord *KnownList::recordForCrash(const EffectRecord &marker)
-{
-    for (const EffectRecord *record : recordsOfFileName(marker.path)) {
-        const bool isSame = record->isSamePlugin(marker);
-        // The crash of a whole shell is none of its sub-plug-ins': their records stay, beside a new one for
-        // the file.
-        const bool isMoved = marker.subId == 0 && record->subId == 0 && !QFile::exists(record->path);
-        if (isSame || isMoved)
-            return const_cast<EffectRecord *>(record); // one of ours, handed out as const
-    }
-    return nullptr;
-}
-
-void KnownList::followMove(const QString &path)
-{
-    const Knowledge known = lookUp(path);
-    if (known.how != KnownAs::Moved)
-        return;
-    for (const EffectRecord *record : known.records)
-        const_cast<EffectRecord *>(record)->path = path; // one of ours, handed out as const
-}
-
-EffectRecord &KnownList::applyCrash(const EffectRecord &marker)
-{
-    followMove(marker.path);
-    EffectRecord *record = recordForCrash(marker);
-    if (!record)
-        record = &m_records.emplace(fileNameOf(marker.path), marker)->second;
-    record->path = marker.path;
-    record->fileTime = marker.fileTime;
-    record->enabled = false;
-    record->working = false;
-    return *record;
-}
-
-KnownList::Records KnownList::recordsOfFileName(const QString &path) const
-{
-    Records records;
-    const auto [first, last] = m_records.equal_range(fileNameOf(path));
-    for (auto entry = first; entry != last; ++entry)
-        records.push_back(&entry->second);
-    const auto place = [&](const EffectRecord *record) {
-        return std::make_tuple(!isSamePath(record->path, path), rankOf(*record));
-    };
-    if (records.size() > 1) // most have one, and sorting allocates
-        std::stable_sort(
-            records.begin(), records.end(),
-            [&](const EffectRecord *left, const EffectRecord *right) { return place(left) < place(right); });
-    return records;
-}
-
-KnownList::Records KnownList::recordsOfPath(const QString &path) const
-{
-    return firstOfPath(recordsOfFileName(path), path);
-}
-
-KnownList::Knowledge KnownList::lookUp(const QString &path) const
-{
-    Records ofName = recordsOfFileName(path);
-    if (ofName.empty())
-        return {KnownAs::Unknown, {}};
-    if (isSamePath(ofName.front()->path, path))
-        return {KnownAs::Own, firstOfPath(std::move(ofName), path)};
-    Records moved;
-    std::copy_if(ofName.begin(), ofName.end(), std::back_inserter(moved),
-                 [](const EffectRecord *record) { return !QFile::exists(record->path); });
-    if (!moved.empty())
-        return {KnownAs::Moved, std::move(moved)};
-    if (ofName.front()->isCrashedFile())
-        return {KnownAs::Unknown, {}};
-    return {KnownAs::Namesake, std::move(ofName)};
-}
-
 bool KnownList::isIdHeldByOther(const QString &id, const EffectRecord &plugin) const
 {
-    return std::any_of(m_records.begin(), m_records.end(), [&](const auto &entry) {
-        return entry.second.id == id && !entry.second.isSamePlugin(plugin);
+    return std::any_of(m_records.begin(), m_records.end(), [&](const EffectRecord &record) {
+        return record.id == id && !record.isSamePlugin(plugin);
     });
 }
 
@@ -122,7 +117,7 @@ KnownList::Records KnownList::all() const
 {
     Records records;
     records.reserve(m_records.size());
-    for (const auto &entry : m_records)
-        records.push_back(&entry.second);
+    for (const auto &entry : m_byFileName)
+        records.push_back(entry.second);
     return records;
 }

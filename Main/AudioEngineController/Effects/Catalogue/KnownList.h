@@ -2,64 +2,68 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 
+#include <deque>
 #include <map>
 #include <vector>
 
-/// How a file is known.
-enum class KnownAs {
-    Unknown,
-    Own,      ///< by its full path
-    Moved,    ///< by the name of a file that is gone
-    Namesake, ///< by the name of another file that is there, and did not crash: a crash says nothing of a
-              ///< namesake
-};
-
-/// What the previous catalogue and the surviving crash markers say: records sorted by the file name of their
-/// path, those of one file name in the order in which they were filed. Records stay where they are in memory
-/// until the list is cleared.
+/// What the previous catalogue and the surviving crash markers say: records that are looked up by the file
+/// name of their path, those of one file name in the order in which they were added. Records stay where they
+/// are in memory until the list is cleared.
 class KnownList {
 public:
     using Records = std::vector<const EffectRecord *>;
 
-    void clear() { m_records.clear(); }
+    /// What tells the plug-ins of one file apart.
+    enum class Identity {
+        Identifier, ///< every plug-in of a file has one of its own
+        SubPlugin,  ///< the sub-plug-in number; the record of number 0 is the file's own
+    };
+
+    explicit KnownList(Identity identity = Identity::Identifier)
+        : m_identity(identity)
+    {}
+
+    void clear();
     std::size_t size() const { return m_records.size(); }
     bool isEmpty() const { return m_records.empty(); }
 
-    /// Files a record under its file name, unless one with the same file name and identifier is there: the
-    /// first wins.
-    bool file(const EffectRecord &record);
+    /// True when both records, of whatever files, stand for the same plug-in of a file.
+    bool isSameOfFile(const EffectRecord &left, const EffectRecord &right) const
+    {
+        return m_identity == Identity::SubPlugin ? left.subId == right.subId : left.id == right.id;
+    }
 
-    /// Applies a crash marker: to the record of the same plug-in, else, for a whole file, to one of the same
-    /// file name whose own file is gone, else as a new record. What it applies to becomes disabled and not
-    /// working; its identifier is the caller's to set.
+    /// Adds a record, unless one with the same file name and identifier is there: the first wins.
+    bool addRecord(const EffectRecord &record);
+
+    /// Applies a crash marker. One of a sub-plug-in concerns the record of that path and identifier. One of a
+    /// whole file speaks for everything in it: one record stands for the file, which is the one that is given
+    /// back, and the file's others become disabled and not working as well, but for those that the user
+    /// switched off. Where there is no record, the marker becomes one; its identifier is the caller's to set.
+    /// Records of other paths are never touched.
     EffectRecord &applyCrash(const EffectRecord &marker);
 
     /// All records of one full path, the one that speaks for the file first: what crashed as a whole comes
-    /// before the others, so that the file is not loaded again because another of its classes sorts before
-    /// it; sub-plug-ins that are disabled come last, so that one bad child does not have an unchanged shell
-    /// loaded at every scan.
+    /// before what failed as a whole, and both before the others, so that the file is not loaded again
+    /// because another of its classes sorts before it; sub-plug-ins that are disabled come last, so that one
+    /// bad child does not have an unchanged shell loaded at every scan.
     Records recordsOfPath(const QString &path) const;
     /// The same for all records of a file name, those of the full path before the others.
     Records recordsOfFileName(const QString &path) const;
-
-    /// What the previous catalogue says of a file found in a folder.
-    struct Knowledge {
-        KnownAs how;
-        Records records; ///< the one that speaks for them first
-    };
-    Knowledge lookUp(const QString &path) const;
 
     /// True when a record of another plug-in holds the identifier.
     bool isIdHeldByOther(const QString &id, const EffectRecord &plugin) const;
 
     /// Every record, in the order of the file names.
     Records all() const;
+    /// Every record, in the order in which they were added.
+    const std::deque<EffectRecord> &inOrder() const { return m_records; }
 
 private:
-    /// Gives records of a file that is gone the path of one of its name that nothing is known of: the file
-    /// was moved, and its marks go with it.
-    void followMove(const QString &path);
-    EffectRecord *recordForCrash(const EffectRecord &marker);
+    EffectRecord *find(const EffectRecord &marker);
+    void disableOthers(const EffectRecord &crashed);
 
-    std::multimap<QString, EffectRecord, PathLess> m_records;
+    Identity m_identity;
+    std::deque<EffectRecord> m_records;
+    std::multimap<QString, EffectRecord *, PathLess> m_byFileName;
 };

@@ -10,11 +10,36 @@
 #include <algorithm>
 #include <exception>
 
-FolderScan::FolderScan(AudioPluginHost &host, const char *format)
+namespace {
+
+/// From this many records of a file, or files of a scan, on the user interface hears of them once in advance.
+constexpr std::size_t kMany = 3;
+
+/// What a file that fails keeps of a record: the marks. It is not working, and asked again when the file
+/// changes; what the user switched off stays as it is.
+EffectRecord keptBesideFailure(const EffectRecord &old, const EffectRecord &file)
+{
+    EffectRecord kept = old;
+    kept.path = file.path;
+    if (!old.isSwitchedOff()) {
+        kept.fileTime = file.fileTime;
+        kept.working = false;
+    }
+    return kept;
+}
+
+/// True for a sub-plug-in that killed the scanner, in the version of the file that is there.
+bool isDeadly(const EffectRecord &old, const QString &fileTime)
+{
+    return old.subId != 0 && !old.enabled && !old.working && old.fileTime == fileTime;
+}
+
+} // namespace
+
+FolderScan::FolderScan(CatalogueHost &host)
     : m_host(host)
-    , m_format(format)
     , m_finder(host.fileFinder() ? host.fileFinder()
-                                 : std::make_shared<FileFinder>(QStringList(host.moduleEnding())))
+                                 : std::make_shared<FileFinder>(QStringList(host.info().moduleEnding)))
 {}
 
 FolderScan::~FolderScan() = default;
@@ -35,19 +60,22 @@ void FolderScan::scan()
 {
     m_host.clearEffects();
     if (m_host.isCatalogueUnread()) {
-        write(Durability::Synced); // says why it cannot: nothing would come of the probes, and known crashes
-        return;                    // would happen again
+        m_written |=
+            m_host.WriteCatalogue(); // says why it cannot: nothing would come of the probes, and known
+        return;                      // crashes would happen again
     }
     m_progress = createProgressDisplay();
-    m_knownAtStart = m_host.known().size();
-    const QStringList paths = findFiles();
-    keepUnread();
-    m_items = arrange(paths);
-    reportPlan(static_cast<std::size_t>(paths.size()));
-    if (processItems())
-        finish();
-    else
-        finishCancelled();
+    const QStringList modules = findModules();
+    if (isCancelled()) { // the catalogue holds all that is known
+        m_host.refillEffects();
+        return;
+    }
+    m_plan = std::make_unique<ScanPlan>(m_host, m_host.folders(), m_finder->unread());
+    m_plan->decide(modules);
+    ProbeReport::instance().plan(m_host.format(), static_cast<std::size_t>(modules.size()),
+                                 m_plan->items().size());
+    addKept();
+    finish(probeItems());
 }
 
 bool FolderScan::isCancelled() const
@@ -55,63 +83,45 @@ bool FolderScan::isCancelled() const
     return m_host.isCancelled() || (m_progress && m_progress->isCancelled());
 }
 
-QStringList FolderScan::findFiles() const
+QStringList FolderScan::findModules() const
 {
     QStringList paths;
     QSet<QString> seen;
     for (const QString &folder : m_host.folders())
         for (const QString &path :
-             m_finder->find(folder, m_host.moduleEnding(), [this] { return isCancelled(); })) {
+             m_finder->find(folder, m_host.info().moduleEnding, [this] { return isCancelled(); })) {
             seen.insert(pathKey(path));
-            if (seen.size() > paths.size())
+            if (seen.size() > paths.size() && m_host.isModule(path))
                 paths.append(path);
         }
+    if (m_host.probesInPathOrder())
+        std::sort(paths.begin(), paths.end());
     return paths;
 }
 
-void FolderScan::keepUnread()
+void FolderScan::addKept()
 {
-    for (const QString &folder : m_finder->unread())
-        for (const EffectRecord *record : m_host.known().all())
-            if (record->path.startsWith(folder + QLatin1Char('/'), kPathCase))
-                m_host.AddEffect(*record);
+    for (const EffectRecord *record : m_plan->kept())
+        m_host.AddEffect(*record);
+    for (const EffectRecord &record : m_plan->keptMoved())
+        m_host.AddEffect(record);
 }
 
 void FolderScan::showItemProgress()
 {
     if (!m_progress)
         return;
-    m_progress->setRange(static_cast<int>(m_items.size()), QString());
+    m_progress->setRange(static_cast<int>(m_plan->items().size()), QString());
     m_progress->setValue(static_cast<int>(m_done));
 }
 
-void FolderScan::keep(const KnownList::Records &records)
-{
-    for (const EffectRecord *record : records)
-        m_host.AddEffect(*record);
-}
-
-void FolderScan::collectWaiting()
-{
-    for (std::size_t index = m_done + 1; index < m_items.size(); ++index)
-        for (const EffectRecord &record : m_items[index].knownRecords)
-            addWaiting(record);
-}
-
-void FolderScan::reportPlan(std::size_t files) const
-{
-    const auto isProbed = [](const ScanItem &item) { return item.probe; };
-    const auto probes = std::count_if(m_items.begin(), m_items.end(), isProbed);
-    ProbeReport::instance().plan(m_format, files, static_cast<std::size_t>(probes));
-}
-
-bool FolderScan::processItems()
+bool FolderScan::probeItems()
 {
     showItemProgress();
-    for (const ScanItem &item : m_items) {
+    for (const ScanItem &item : m_plan->items()) {
         if (isCancelled())
             return false;
-        processItem(item);
+        probe(item);
         ++m_done;
         if (m_progress)
             m_progress->setValue(static_cast<int>(m_done));
@@ -119,56 +129,195 @@ bool FolderScan::processItems()
     return !isCancelled();
 }
 
-void FolderScan::processItem(const ScanItem &item)
+ProbeJob FolderScan::jobOf(const ScanItem &item) const
 {
-    const bool added = process(item);
-    removeWaiting(item);
-    if (!item.probe)
+    ProbeJob job;
+    job.format = m_host.format();
+    job.path = item.path;
+    job.fileTime = item.fileTime;
+    job.announceClasses = item.known.empty() && item.moved.empty();
+    for (const EffectRecord *old : item.known)
+        if (isDeadly(*old, item.fileTime))
+            job.leftOut.insert(old->subId);
+    return job;
+}
+
+void FolderScan::probe(const ScanItem &item)
+{
+    if (!m_runner)
+        m_runner = std::make_unique<ProbeRunner>(m_host);
+    m_file = EffectRecord();
+    m_file.path = item.path;
+    m_file.fileTime = item.fileTime;
+    m_isTouched = false;
+    m_childrenDone = 0;
+    ProbeOutcome outcome = m_runner->run(jobOf(item), *this);
+    outcome.reason.remove(item.path + QLatin1String(": ")); // the path stands beside it
+    keepOutcome(item, outcome);
+    if (m_childrenDone != 0)
+        showItemProgress();
+}
+
+void FolderScan::log(const ScanItem &item, const ProbeOutcome &outcome) const
+{
+    if (!outcome.reason.isEmpty())
+        DebugLog(L"%ls: %ls", item.path, outcome.reason);
+    ProbeReport &report = ProbeReport::instance();
+    if (!m_isTouched && outcome.status == ProbeStatus::NoPlugin) {
+        report.skipped(m_host.format(), item.path, outcome.reason);
         return;
-    m_probed.insert(item.path);
-    if (!added)
-        return;
-    if (!m_added) // not before: most scans find nothing new
-        collectWaiting();
-    m_added = true;
-    write(Durability::Buffered);
-}
-
-void FolderScan::finishCancelled()
-{
-    ProbeReport::instance().cancelled();
-    // Nothing is lost: whatever this run did not get to stays as it was.
-    m_waiting.clear();
-    for (const EffectRecord *record : m_host.known().all())
-        if (m_probed.count(record->path) == 0)
-            addWaiting(*record);
-    write(Durability::Synced);
-}
-
-void FolderScan::finish()
-{
-    complete();
-    m_waiting.clear();
-    const bool countDiffers = m_host.effectCount() != m_knownAtStart;
-    if (m_added || countDiffers || m_knownAtStart == 0 || m_host.isCatalogueOutdated())
-        write(Durability::Synced);
-}
-
-void FolderScan::write(Durability durability) { m_written |= m_host.WriteCatalogue(m_waiting, durability); }
-
-void FolderScan::addWaiting(const EffectRecord &record)
-{
-    if (!record.path.isEmpty() && !m_host.isListed(record))
-        m_waiting.insert({record.id, {record, {}}});
-}
-
-void FolderScan::removeWaiting(const ScanItem &item)
-{
-    for (const EffectRecord &record : item.knownRecords) {
-        const auto [first, last] = m_waiting.equal_range(record.id);
-        const auto entry = std::find_if(
-            first, last, [&](const auto &waiting) { return waiting.second.record.isSamePlugin(record); });
-        if (entry != last)
-            m_waiting.erase(entry);
     }
+    if (!m_isTouched)
+        report.begin(m_host.format(), m_file);
+    report.end(m_host.format(), m_file, outcome);
+}
+
+void FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
+{
+    bool added = false;
+    if (outcome.status == ProbeStatus::Listed)
+        added = addListed(item, outcome);
+    else if (outcome.status == ProbeStatus::Failed && outcome.ifFailed == ProbeOutcome::IfFailed::Record)
+        added = addFailed(item);
+    else if (outcome.status == ProbeStatus::Failed)
+        keepUnchanged(item);
+    log(item, outcome);
+    if (m_waiting.empty() && added)
+        collectWaiting(m_done + 1);
+    for (const KnownList::Records &records : {item.known, item.moved})
+        for (const EffectRecord *record : records) {
+            const auto [first, last] = m_waiting.equal_range(record->id);
+            const auto entry = std::find_if(first, last, [&](const auto &waiting) {
+                return waiting.second.record.isSamePlugin(*record);
+            });
+            if (entry != last)
+                m_waiting.erase(entry);
+        }
+    if (added)
+        writeInterim();
+}
+
+bool FolderScan::addListed(const ScanItem &item, const ProbeOutcome &outcome)
+{
+    const bool announcesEach = m_host.announcesEachRecord();
+    const bool announcesFirst =
+        !announcesEach && (outcome.records.size() >= kMany || m_plan->items().size() >= kMany);
+    if (announcesFirst)
+        notifyUI(MessageCode::kEntryAdded);
+    bool added = false;
+    for (const EffectRecord &record : outcome.records) {
+        const bool isAdded = addProbed(item, record, outcome.records.size() == 1);
+        added |= isAdded;
+        if (isAdded && announcesEach)
+            notifyUI(MessageCode::kEntryAdded);
+    }
+    if (added && !announcesFirst && !announcesEach)
+        notifyUI(MessageCode::kEntryAdded);
+    return added;
+}
+
+bool FolderScan::addProbed(const ScanItem &item, EffectRecord record, bool isOnly)
+{
+    for (const EffectRecord *old : item.known)
+        if (record.subId == old->subId && isDeadly(*old, item.fileTime))
+            return m_host.AddEffect(*old); // another version of the file gets another chance
+    if (!record.working)
+        m_host.completeFailedRecord(record);
+    if (const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly))
+        takeMarks(record, *source);
+    return m_host.AddEffect(record);
+}
+
+bool FolderScan::addFailed(const ScanItem &item)
+{
+    EffectRecord file = m_file;
+    file.working = false;
+    bool added = addProbed(item, file, false);
+    m_host.completeFailedRecord(file);
+    for (const KnownList::Records &records : {item.known, item.moved})
+        for (const EffectRecord *old : records)
+            if (!m_host.known().isSameOfFile(*old, file) && !old->standsForFile())
+                added |= m_host.AddEffect(keptBesideFailure(*old, file));
+    return added;
+}
+
+/// Keeps what is known of a file that is asked again next time.
+void FolderScan::keepUnchanged(const ScanItem &item)
+{
+    for (const EffectRecord *record : item.known)
+        m_host.AddEffect(*record);
+    for (const EffectRecord *record : item.moved) {
+        EffectRecord moved = *record;
+        moved.path = item.path;
+        moved.fileTime.clear(); // that of another path's file says nothing
+        m_host.AddEffect(moved);
+    }
+}
+
+void FolderScan::collectWaiting(std::size_t from)
+{
+    std::set<QString, PathLess> settled;
+    const std::vector<ScanItem> &items = m_plan->items();
+    for (std::size_t index = 0; index < std::min(from, items.size()); ++index) {
+        settled.insert(items[index].path);
+        if (!items[index].moved.empty())
+            settled.insert(items[index].moved.front()->path);
+    }
+    for (const EffectRecord *record : m_host.known().all())
+        if (!m_host.isListed(record->id) && settled.count(record->path) == 0)
+            m_waiting.insert({record->id, ListedEffect(*record)});
+}
+
+void FolderScan::writeInterim() { m_written |= m_host.writeInterim(m_waiting, Durability::Buffered); }
+
+void FolderScan::finish(bool isWhole)
+{
+    m_waiting.clear();
+    if (isWhole) {
+        for (const EffectRecord *record : m_plan->away())
+            if (!m_host.isListed(record->id)) // else a file that is there lists it
+                m_host.AddEffect(*record);
+    } else {
+        ProbeReport::instance().cancelled();
+        collectWaiting(m_done);
+    }
+    m_written |= m_host.writeIfChanged(m_waiting);
+}
+
+void FolderScan::stageEntered(ProbeStage stage)
+{
+    if (!m_isTouched) {
+        m_isTouched = true;
+        showScanning(m_host.displayName(m_file.path));
+        DebugTrace(L"Probing %ls", m_file.path);
+        ProbeReport::instance().begin(m_host.format(), m_file);
+    }
+    ProbeReport::instance().stage(stage);
+}
+
+void FolderScan::classBegins(const QString &name) { showScanning(name); }
+
+void FolderScan::classAnnounced() { notifyUI(MessageCode::kEntryAdded); }
+
+void FolderScan::childrenFound(std::size_t count)
+{
+    if (m_progress)
+        m_progress->setRange(static_cast<int>(count), QStringLiteral("Scanning WaveShell"));
+}
+
+void FolderScan::childBegins(const EffectRecord &child)
+{
+    m_child = child;
+    showScanning(child.subName);
+    ProbeReport::instance().begin(m_host.format(), child);
+}
+
+void FolderScan::childEnds(const ProbeOutcome &outcome)
+{
+    if (!outcome.reason.isEmpty())
+        DebugLog(L"%ls, %ls: %ls", m_child.path, m_child.subName, outcome.reason);
+    ProbeReport::instance().end(m_host.format(), m_child, outcome);
+    ++m_childrenDone;
+    if (m_progress)
+        m_progress->setValue(static_cast<int>(m_childrenDone));
 }

@@ -1,85 +1,66 @@
 #pragma once
 
-#include "Core/BaseLib/Process/ProcessState.h"
-#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
+#include "Main/AudioEngineController/Effects/Host/ProbeRunner.h"
+#include "Main/AudioEngineController/Effects/Host/ScanPlan.h"
 
 #include <memory>
-#include <vector>
 
 class VProgressDisplay;
 
-/// A file that a scan has to deal with.
-struct ScanItem {
-    QString path;
-    QString fileTime;
-    bool probe = true; ///< false: what is known is kept
-    std::vector<EffectRecord>
-        knownRecords; ///< what the previous catalogue says of the file, the one that speaks for it first
-};
-
-/// One scan of a host's folders: finds the files, has the format decide which to probe, and goes through them
-/// with progress, cancel and interim writes. Used once, on the scan worker.
-class FolderScan {
+/// One scan of a host's folders: finds the modules, has those probed that are new or changed, and keeps what
+/// they say: passes marks on, adds records, writes catalogues, logs and reports each outcome once. Used once,
+/// on the scan worker.
+class FolderScan : private IProbeObserver {
 public:
-    /// `format` names the format in the report.
-    FolderScan(AudioPluginHost &host, const char *format);
-    virtual ~FolderScan();
-    FolderScan(const FolderScan &) = delete;
-    FolderScan &operator=(const FolderScan &) = delete;
+    explicit FolderScan(CatalogueHost &host);
+    ~FolderScan() override;
 
     /// True when the catalogue was written at least once. Never throws.
     bool run();
 
-protected:
-    /// Looks at the files found, in the order of the folders, keeps what is known of those that need no
-    /// probe, and gives the rest.
-    virtual std::vector<ScanItem> arrange(const QStringList &paths) = 0;
-    /// Probes one file, or keeps it, as the item says. True when a record was added to the catalogue.
-    virtual bool process(const ScanItem &item) = 0;
-    /// Called when all items were processed, before the last write.
-    virtual void complete() {}
-
-    AudioPluginHost &host() { return m_host; }
-    const char *format() const { return m_format; }
-    const ProcessState &processState() const { return m_processState; }
-    VProgressDisplay *progress() const { return m_progress.get(); }
-    std::size_t itemCount() const { return m_items.size(); }
-    /// Shows the range and value of the files again, after a file used the bar for itself.
-    void showItemProgress();
-    /// Adds what is known of a file to the effect list as it stands.
-    void keep(const KnownList::Records &records);
-    /// True when this run has probed the file.
-    bool wasProbed(const QString &path) const { return m_probed.count(path) != 0; }
-    /// Has interim writes carry a known record that this run has not settled yet.
-    void addWaiting(const EffectRecord &record);
-    /// True when the user, the host or the system asked the scan to stop.
-    bool isCancelled() const;
-
 private:
     void scan();
-    QStringList findFiles() const;
-    /// Keeps what is known of the files in folders that could not be read: they are neither found nor gone.
-    void keepUnread();
-    /// Has interim writes carry what is known of the items behind the present one.
-    void collectWaiting();
-    void reportPlan(std::size_t files) const;
-    bool processItems();
-    void processItem(const ScanItem &item);
-    void finishCancelled();
-    void finish();
-    void write(Durability durability);
-    void removeWaiting(const ScanItem &item);
+    QStringList findModules() const;
+    void addKept();
+    bool probeItems();
+    void probe(const ScanItem &item);
+    ProbeJob jobOf(const ScanItem &item) const;
+    void finish(bool isWhole);
 
-    AudioPluginHost &m_host;
-    const char *m_format;
+    void keepOutcome(const ScanItem &item, const ProbeOutcome &outcome);
+    void log(const ScanItem &item, const ProbeOutcome &outcome) const;
+    bool addListed(const ScanItem &item, const ProbeOutcome &outcome);
+    bool addFailed(const ScanItem &item);
+    void keepUnchanged(const ScanItem &item);
+    bool addProbed(const ScanItem &item, EffectRecord record, bool isOnly);
+
+    /// Has interim writes carry what is known of the items from one on.
+    void collectWaiting(std::size_t from);
+    void writeInterim();
+    bool isCancelled() const;
+    void showItemProgress();
+
+    void stageEntered(ProbeStage stage) override;
+    void classBegins(const QString &name) override;
+    void classAnnounced() override;
+    void childrenFound(std::size_t count) override;
+    void childBegins(const EffectRecord &child) override;
+    void childEnds(const ProbeOutcome &outcome) override;
+    void childCloses(const EffectRecord &) override {}
+    void childClosed() override {}
+
+    CatalogueHost &m_host;
     std::shared_ptr<FileFinder> m_finder;
-    ProcessState m_processState;
+    std::unique_ptr<ScanPlan> m_plan;
+    std::unique_ptr<ProbeRunner> m_runner; ///< made for the first item: most scans find nothing new
     std::shared_ptr<VProgressDisplay> m_progress;
-    std::vector<ScanItem> m_items;
     WaitingRecords m_waiting;
-    std::set<QString, PathLess> m_probed; ///< paths
-    std::size_t m_knownAtStart = 0;
     std::size_t m_done = 0; ///< items
-    bool m_added = false;
     bool m_written = false;
+
+    EffectRecord m_file;            ///< of the item at hand: path and time
+    EffectRecord m_child;           ///< the sub-plug-in at hand
+    bool m_isTouched = false;       ///< the item at hand has entered its first stage
+    std::size_t m_childrenDone = 0; ///< of the item at hand
 };

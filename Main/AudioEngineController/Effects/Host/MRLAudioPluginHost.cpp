@@ -5,22 +5,8 @@
 
 #include <QFile>
 
-#include <limits>
-
-const CatalogueFormat &builtInEffectsFormat()
-{
-    using namespace CatalogueElements;
-    static const CatalogueElement writtenMask = {kCategoryMask.name, nullptr, kCategoryMask.content};
-    // There are no files whose times could be read: no version, not even a negative one, is upgraded.
-    constexpr double kEveryVersion = -std::numeric_limits<double>::infinity();
-    static const CatalogueFormat format = {
-        "/TesselFXConfiguration.xml",  "1.2", false, kEveryVersion, kEveryVersion, nullptr, {},
-        {kId, kFavourite, writtenMask}};
-    return format;
-}
-
 MRLAudioPluginHost::MRLAudioPluginHost()
-    : AudioPluginHost(&builtInEffectsFormat())
+    : CatalogueHost(PluginFormat::BuiltIn)
 {}
 
 void MRLAudioPluginHost::setBuiltInEffects(const std::vector<EffectRecord> &effects)

@@ -1,11 +1,11 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
 
 /// The host of the maker's built-in effects. Its file holds only the user's marks on them. The effects
 /// themselves come from the application; the scanner has none and never writes the file, so that no mark is
 /// lost.
-class MRLAudioPluginHost : public AudioPluginHost {
+class MRLAudioPluginHost : public CatalogueHost {
 public:
     MRLAudioPluginHost();
 
@@ -26,6 +26,3 @@ public:
     /// are no effects, for an empty file would lose the marks.
     bool writeMarks();
 };
-
-/// The file of the marks on built-in effects.
-const CatalogueFormat &builtInEffectsFormat();

@@ -1,27 +1,15 @@
 #include "Main/AudioEngineController/Effects/Launcher/MarkerWatch.h"
 
-#include <QDir>
-#include <QFile>
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 
-#include <algorithm>
+#include <QDir>
 
 namespace {
-
-const QStringList &markerPatterns()
-{
-    static const QStringList patterns{QStringLiteral("*.scan"), QStringLiteral("*.scan3")};
-    return patterns;
-}
 
 const QStringList &allPatterns()
 {
     static const QStringList patterns = markerPatterns() + QStringList(QStringLiteral("*Configuration.xml"));
     return patterns;
-}
-
-bool isMarker(const QString &path)
-{
-    return path.endsWith(QLatin1String(".scan")) || path.endsWith(QLatin1String(".scan3"));
 }
 
 /// The newest marker; none when there is no marker.
@@ -32,7 +20,7 @@ Stamps newestMarker(const Stamps &stamps)
     for (auto entry = stamps.begin(); entry != stamps.end(); ++entry) {
         const bool isNewer =
             newest == stamps.end() || entry->second.modifiedNanoseconds > newest->second.modifiedNanoseconds;
-        if (isMarker(entry->first) && isNewer)
+        if (formatOfMarker(entry->first) && isNewer)
             newest = entry;
     }
     return newest == stamps.end() ? Stamps() : Stamps{*newest};
@@ -42,6 +30,7 @@ Stamps newestMarker(const Stamps &stamps)
 
 MarkerWatch::MarkerWatch(const QString &effectsFolder, const QString &report)
     : m_folder(effectsFolder)
+    , m_reportsCourse(!report.isEmpty())
     , m_report(report)
     , m_before(stampsOf(allPatterns()))
 {}
@@ -51,21 +40,12 @@ void MarkerWatch::look()
     const Stamps changed = ofRun(stampsOf(allPatterns()));
     const Stamps marker = newestMarker(changed);
     m_hasBegun |= !changed.empty();
-    const bool mayBeStuck = !marker.empty() || (m_report.isEmpty() ? m_hasBegun : hasReportedItsEnd());
+    for (const ReportLine &line : m_report.takeNewLines())
+        m_hasReportedItsEnd = line.isLast();
+    const bool mayBeStuck = !marker.empty() || (m_reportsCourse ? m_hasReportedItsEnd : m_hasBegun);
     const Stamps &now = marker.empty() ? changed : marker;
     m_unchanged = mayBeStuck && now == m_last ? m_unchanged + 1 : 0;
     m_last = now;
-}
-
-bool MarkerWatch::hasReportedItsEnd() const
-{
-    constexpr qint64 kTail = 64; // bytes; longer than the last line
-    QFile file(m_report);
-    if (!file.open(QIODevice::ReadOnly))
-        return false;
-    file.seek(std::max<qint64>(0, file.size() - kTail));
-    const QByteArray tail = file.readAll();
-    return tail.endsWith("{\"event\":\"finished\"}\n") || tail.endsWith("{\"event\":\"ended\"}\n");
 }
 
 QStringList MarkerWatch::markers() const

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Core/BaseLib/Files/FileTime.h"
+#include "Main/AudioEngineController/Effects/Protocol/ReportReader.h"
 
 #include <QString>
 #include <QStringList>
@@ -32,12 +33,13 @@ private:
 
     Stamps stampsOf(const QStringList &patterns) const;
     Stamps ofRun(const Stamps &stamps) const;
-    bool hasReportedItsEnd() const;
 
     QString m_folder;
-    QString m_report;
+    bool m_reportsCourse;
+    ReportReader m_report;
     Stamps m_before;
     Stamps m_last;
     bool m_hasBegun = false;
+    bool m_hasReportedItsEnd = false;
     int m_unchanged = 0;
 };

@@ -5,36 +5,22 @@
 #include "Main/AudioEngineController/Effects/Launcher/ScannerChild.h"
 #include "Main/AudioEngineController/Effects/Launcher/ScannerProcess.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
 
-#include <algorithm>
 #include <chrono>
-#include <iterator>
 
 namespace {
 
 constexpr std::chrono::milliseconds kStartPatience(30000);
 constexpr std::chrono::milliseconds kStep(1000);
 
-std::vector<ScanCulprit> culpritsOf(const QStringList &markers)
+std::vector<ScanCulprit> culpritsOf(const QStringList &files)
 {
     std::vector<ScanCulprit> culprits;
-    for (const QString &marker : markers) {
-        const bool isVst3 = marker.endsWith(QLatin1String(".scan3"));
-        const CatalogueFormat &format = isVst3 ? vst3CatalogueFormat() : vstCatalogueFormat();
-        culprits.push_back({isVst3, readMarkerFile(format.marker, marker)});
-    }
-    // The marker of a whole shell is there beside its child's; the child is the culprit.
-    const auto hasChild = [&culprits](const ScanCulprit &whole) {
-        return whole.plugin.subId == 0 &&
-               std::any_of(culprits.begin(), culprits.end(), [&whole](const ScanCulprit &other) {
-                   return other.plugin.subId != 0 && other.plugin.path == whole.plugin.path;
-               });
-    };
-    std::vector<ScanCulprit> guilty;
-    std::remove_copy_if(culprits.begin(), culprits.end(), std::back_inserter(guilty), hasChild);
-    return guilty;
+    const std::vector<FoundMarker> markers = readMarkers(files);
+    for (const FoundMarker &marker : markers)
+        if (!isExcused(marker, markers))
+            culprits.push_back({marker.format, marker.plugin});
+    return culprits;
 }
 
 void logOutput(ScannerProcess &scanner)

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <QString>
 #include <QStringList>
@@ -15,7 +16,7 @@ class ScannerProcess;
 
 /// A plug-in that a scanner was busy with when it ended.
 struct ScanCulprit {
-    bool isVst3 = false;
+    PluginFormat format = PluginFormat::Unknown;
     EffectRecord plugin; ///< path, file time, name and sub-plug-in, as its crash marker says
 };
 

@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/Plugin/DummyAudioPlugin.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <algorithm>
 

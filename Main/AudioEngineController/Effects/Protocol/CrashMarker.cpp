@@ -1,5 +1,6 @@
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 
+#include "Core/BaseLib/Files/FileTime.h"
 #include "Core/BaseLib/Files/XMLDocument.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
@@ -9,6 +10,7 @@
 #include <algorithm>
 #include <mutex>
 #include <set>
+#include <utility>
 
 namespace {
 
@@ -34,15 +36,23 @@ QString cutToBytes(QString text, int limit)
     return text;
 }
 
-struct Markers {
+/// The markers of this process that are on disk.
+struct ActiveMarkers {
     std::mutex mutex;
     std::set<QString> paths;
 };
 
-Markers &activeMarkers()
+ActiveMarkers &activeMarkers()
 {
-    static Markers &markers = *new Markers; // outlives the watcher that may abandon them
+    static ActiveMarkers &markers = *new ActiveMarkers; // outlives the watcher that may abandon them
     return markers;
+}
+
+bool contains(const std::set<QString> &paths, const QString &marker)
+{
+    return std::any_of(paths.begin(), paths.end(), [&](const QString &path) {
+        return QString::compare(path, marker, Qt::CaseInsensitive) == 0; // as some file systems do
+    });
 }
 
 /// The raw content of one of our own lines; empty where there is none.
@@ -86,19 +96,27 @@ QByteArray markerText(const MarkerFormat &format, const EffectRecord &record)
     return text + "</CrashedPlugin>" + kLineEnd;
 }
 
-} // namespace
-
-QString markerPath(const MarkerFormat &format, const QString &folder, const QString &path,
-                   const QString &name)
+QString markerPath(const MarkerFormat &format, const QString &folder, const QString &name)
 {
-    EffectRecord record;
-    record.path = path;
-    record.name = name;
-    if (name.isNull())
-        NameFromPath(record);
     const QString ending = QString::fromLatin1(format.ending);
-    return folder + QLatin1Char('/') + cutToBytes(usableFileName(record.name), kMaxFileName - ending.size()) +
+    return folder + QLatin1Char('/') + cutToBytes(usableFileName(name), kMaxFileName - ending.size()) +
            ending;
+}
+
+/// A path that no marker in use has; called with the active markers locked.
+QString freeMarkerPath(const MarkerFormat &format, const QString &folder, const EffectRecord &plugin,
+                       const QStringList &taken)
+{
+    const auto isTaken = [&](const QString &marker) {
+        return contains(activeMarkers().paths, marker) || taken.contains(marker, Qt::CaseInsensitive);
+    };
+    QString marker = markerPath(format, folder, plugin.name);
+    // A sub-plug-in may bear the name of its shell, whose own marker must stay as it is.
+    if (isTaken(marker) && plugin.subId != 0)
+        marker = markerPath(format, folder, plugin.name + QLatin1Char('_') + QString::number(plugin.subId));
+    for (int number = 2; isTaken(marker); ++number) // in front, as the ends of long names are cut off
+        marker = markerPath(format, folder, QString::number(number) + QLatin1Char('_') + plugin.name);
+    return marker;
 }
 
 FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, const EffectRecord &record)
@@ -109,6 +127,65 @@ FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, co
         file.flush())
         return {};
     return {file.errorString()};
+}
+
+} // namespace
+
+CrashMarker::CrashMarker(const MarkerFormat &format, const QString &folder, EffectRecord plugin,
+                         const QString &name, const QStringList &taken)
+{
+    plugin.name = name;
+    if (name.isNull())
+        NameFromPath(plugin);
+    {
+        // Registered first: whoever abandons the markers must find this one whenever it is on disk.
+        const std::lock_guard<std::mutex> lock(activeMarkers().mutex);
+        m_path = freeMarkerPath(format, folder, plugin, taken);
+        activeMarkers().paths.insert(m_path);
+    }
+    if (const FileResult written = writeMarkerFile(format, m_path, plugin); !written)
+        DebugLog(L"Cannot write the crash marker %ls: %ls", m_path, written.reason);
+}
+
+CrashMarker::~CrashMarker() { remove(); }
+
+CrashMarker::CrashMarker(CrashMarker &&other) noexcept
+    : m_path(std::exchange(other.m_path, QString()))
+{}
+
+CrashMarker &CrashMarker::operator=(CrashMarker &&other) noexcept
+{
+    if (this != &other) {
+        remove();
+        m_path = std::exchange(other.m_path, QString());
+    }
+    return *this;
+}
+
+void CrashMarker::refresh() const
+{
+    if (!m_path.isEmpty())
+        touchFile(m_path);
+}
+
+void CrashMarker::remove()
+{
+    if (m_path.isEmpty())
+        return;
+    const std::lock_guard<std::mutex> lock(activeMarkers().mutex);
+    removeMarkerFile(m_path);
+    activeMarkers().paths.erase(m_path);
+    m_path.clear();
+}
+
+void CrashMarker::abandonAll(const std::function<void()> &then)
+{
+    const std::lock_guard<std::mutex> lock(activeMarkers().mutex);
+    if (activeMarkers().paths.empty())
+        return;
+    for (const QString &marker : activeMarkers().paths)
+        removeFile(marker); // a failure is not logged: the plug-in that hangs may hold what the log waits for
+    then();
 }
 
 EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
@@ -149,37 +226,38 @@ void removeMarkerFile(const QString &marker)
         DebugLog(L"Cannot delete the crash marker %ls: %ls", marker, removed.reason);
 }
 
-void ActiveMarkers::add(const QString &marker)
+const PluginFormatInfo *formatOfMarker(const QString &file)
 {
-    Markers &markers = activeMarkers();
-    const std::lock_guard<std::mutex> lock(markers.mutex);
-    markers.paths.insert(marker);
+    const PluginFormatInfo *found = nullptr;
+    for (const PluginFormatInfo &info : pluginFormats())
+        if (info.isScanned() && file.endsWith(QLatin1String(info.catalogue->marker.ending)))
+            found = &info;
+    return found;
 }
 
-bool ActiveMarkers::contains(const QString &marker)
+QStringList markerPatterns()
 {
-    Markers &markers = activeMarkers();
-    const std::lock_guard<std::mutex> lock(markers.mutex);
-    return std::any_of(markers.paths.begin(), markers.paths.end(), [&](const QString &path) {
-        return QString::compare(path, marker, Qt::CaseInsensitive) == 0;
-    });
+    QStringList patterns;
+    for (const PluginFormatInfo &info : pluginFormats())
+        if (info.isScanned())
+            patterns.append(QLatin1Char('*') + QLatin1String(info.catalogue->marker.ending));
+    return patterns;
 }
 
-void ActiveMarkers::remove(const QString &marker)
+std::vector<FoundMarker> readMarkers(const QStringList &files)
 {
-    Markers &markers = activeMarkers();
-    const std::lock_guard<std::mutex> lock(markers.mutex);
-    removeMarkerFile(marker);
-    markers.paths.erase(marker);
+    std::vector<FoundMarker> markers;
+    for (const QString &file : files)
+        if (const PluginFormatInfo *info = formatOfMarker(file))
+            markers.push_back({file, info->format, readMarkerFile(info->catalogue->marker, file)});
+    return markers;
 }
 
-void ActiveMarkers::abandon(const std::function<void()> &then)
+bool isExcused(const FoundMarker &marker, const std::vector<FoundMarker> &all)
 {
-    Markers &markers = activeMarkers();
-    const std::lock_guard<std::mutex> lock(markers.mutex);
-    if (markers.paths.empty())
-        return;
-    for (const QString &marker : markers.paths)
-        removeFile(marker); // a failure is not logged: the plug-in that hangs may hold what the log waits for
-    then();
+    const auto isChild = [&](const FoundMarker &other) {
+        return other.format == marker.format && other.plugin.subId != 0 &&
+               isSamePath(other.plugin.path, marker.plugin.path);
+    };
+    return marker.plugin.subId == 0 && std::any_of(all.begin(), all.end(), isChild);
 }

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
-#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeStage.h"
 
 #include <QString>
@@ -33,7 +33,6 @@ struct ProbeOutcome {
     /// What becomes of the catalogue where nothing was listed.
     enum class IfFailed {
         Record,    ///< a record of the file says that it does not work; it is asked again when it changes
-        Forget,    ///< no record; the next scan asks again
         KeepKnown, ///< what was known stays as it is; the next scan asks again
     };
 

@@ -1,24 +1,30 @@
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/Protocol/ReportLines.h"
 
 #include <QFile>
 #include <QJsonDocument>
 #include <QJsonObject>
 
+#include <algorithm>
 #include <cmath>
 
 namespace {
 
-constexpr const char *kStageNames[] = {"load", "start", "ask", "close"};
+using namespace ReportWord;
 
-QJsonObject identity(const char *format, const QString &path, quint32 subId)
+QJsonObject identity(PluginFormat format, const QString &path, quint32 subId)
 {
-    QJsonObject line{{QStringLiteral("format"), QLatin1String(format)}, {QStringLiteral("path"), path}};
+    QJsonObject line{{QLatin1String(kFormat), QLatin1String(formatInfo(format).key)},
+                     {QLatin1String(kPath), path}};
     if (subId != 0)
-        line.insert(QStringLiteral("subId"), static_cast<qint64>(subId));
+        line.insert(QLatin1String(kSubId), static_cast<qint64>(subId));
     return line;
 }
+
+/// To a thousandth.
+double rounded(double milliseconds) { return std::round(milliseconds * 1000.0) / 1000.0; }
 
 } // namespace
 
@@ -54,23 +60,55 @@ void ProbeReport::write(const char *event, QJsonObject line)
 {
     if (!m_file)
         return;
-    line.insert(QStringLiteral("event"), QLatin1String(event));
+    line.insert(QLatin1String(kEvent), QLatin1String(event));
     m_file->write(QJsonDocument(line).toJson(QJsonDocument::Compact) + '\n');
 }
 
-void ProbeReport::plan(const char *format, std::size_t files, std::size_t probes)
+void ProbeReport::plan(PluginFormat format, std::size_t files, std::size_t probes)
 {
-    write("plan", {{QStringLiteral("format"), QLatin1String(format)},
-                   {QStringLiteral("files"), static_cast<qint64>(files)},
-                   {QStringLiteral("probes"), static_cast<qint64>(probes)}});
+    write("plan", {{QLatin1String(kFormat), QLatin1String(formatInfo(format).key)},
+                   {QLatin1String(kFiles), static_cast<qint64>(files)},
+                   {QLatin1String(kProbes), static_cast<qint64>(probes)}});
 }
 
-void ProbeReport::skipped(const char *format, const QString &path, const QString &reason)
+void ProbeReport::begin(PluginFormat format, const EffectRecord &plugin)
+{
+    if (!m_file)
+        return;
+    QJsonObject line = identity(format, plugin.path, plugin.subId);
+    if (plugin.subId != 0)
+        line.insert(QLatin1String(kSubName), plugin.subName);
+    write("begin", line);
+}
+
+void ProbeReport::stage(ProbeStage stage)
+{
+    if (m_file)
+        write("stage", {{QLatin1String(kStage), QLatin1String(kStages[static_cast<std::size_t>(stage)])}});
+}
+
+void ProbeReport::end(PluginFormat format, const EffectRecord &plugin, const ProbeOutcome &outcome)
+{
+    if (!m_file)
+        return;
+    QJsonObject line = identity(format, plugin.path, plugin.subId);
+    const auto works = [](const EffectRecord &record) { return record.working; };
+    line.insert(QLatin1String(kMilliseconds), rounded(outcome.milliseconds));
+    line.insert(QLatin1String(kRecords),
+                static_cast<qint64>(std::count_if(outcome.records.begin(), outcome.records.end(), works)));
+    if (outcome.status == ProbeStatus::NoPlugin)
+        line.insert(QLatin1String(kNoPlugin), true);
+    if (!outcome.reason.isEmpty())
+        line.insert(QLatin1String(kReason), outcome.reason);
+    write("end", line);
+}
+
+void ProbeReport::skipped(PluginFormat format, const QString &path, const QString &reason)
 {
     if (!m_file)
         return;
     QJsonObject line = identity(format, path, 0);
-    line.insert(QStringLiteral("reason"), reason);
+    line.insert(QLatin1String(kReason), reason);
     write("skipped", line);
 }
 
@@ -79,60 +117,15 @@ void ProbeReport::cancelled() { m_complete = false; }
 void ProbeReport::unwritten(const QString &path, const QString &reason)
 {
     m_complete = false;
-    write("unwritten", {{QStringLiteral("path"), path}, {QStringLiteral("reason"), reason}});
+    write("unwritten", {{QLatin1String(kPath), path}, {QLatin1String(kReason), reason}});
+}
+
+void ProbeReport::unreadList(const QString &path, const QString &reason)
+{
+    m_complete = false;
+    write("unreadList", {{QLatin1String(kPath), path}, {QLatin1String(kReason), reason}});
 }
 
 void ProbeReport::busy() { write("busy", {}); }
 
 void ProbeReport::finish() { write(m_complete ? "finished" : "ended", {}); }
-
-ProbeEntry::ProbeEntry(const char *format, const EffectRecord &plugin)
-    : m_format(format)
-    , m_path(plugin.path)
-    , m_subId(plugin.subId)
-    , m_outer(ProbeReport::instance().m_current)
-{
-    ProbeReport &report = ProbeReport::instance();
-    report.m_current = this;
-    if (!report.isOpen())
-        return;
-    QJsonObject line = identity(m_format, m_path, m_subId);
-    if (m_subId != 0)
-        line.insert(QStringLiteral("subName"), plugin.subName);
-    report.write("begin", line);
-    m_timer.start();
-}
-
-ProbeEntry::~ProbeEntry()
-{
-    ProbeReport &report = ProbeReport::instance();
-    report.m_current = m_outer;
-    if (!report.isOpen())
-        return;
-    QJsonObject line = identity(m_format, m_path, m_subId);
-    line.insert(QStringLiteral("milliseconds"),
-                std::round(static_cast<double>(m_timer.nsecsElapsed()) / 1000.0) / 1000.0);
-    line.insert(QStringLiteral("records"), static_cast<qint64>(m_records));
-    if (m_noPlugin)
-        line.insert(QStringLiteral("noPlugin"), true);
-    if (!m_reason.isEmpty())
-        line.insert(QStringLiteral("reason"), m_reason);
-    report.write("end", line);
-}
-
-void ProbeReport::reason(const QString &text)
-{
-    ProbeEntry *entry = instance().m_current;
-    if (entry && entry->m_reason.isEmpty())
-        entry->m_reason =
-            QString(text).remove(entry->m_path + QLatin1String(": ")); // the path stands beside it
-}
-
-void ProbeReport::stage(ProbeStage stage)
-{
-    ProbeReport &report = instance();
-    if (!report.m_current || !report.isOpen())
-        return;
-    const auto index = static_cast<std::size_t>(stage);
-    report.write("stage", {{QStringLiteral("stage"), QLatin1String(kStageNames[index])}});
-}

@@ -1,8 +1,10 @@
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 
 #include "Core/BaseLib/Files/XMLDocument.h"
-#include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueLines.h"
+
+#include <QFile>
 
 QString dataFolderOf(const QString &scanListPath)
 {
@@ -14,17 +16,27 @@ QString dataFolderOf(const QString &scanListPath)
     return QString();
 }
 
-QStringList ReadScanList(const QString &path)
+ScanListContents ReadScanList(const QString &path)
 {
-    QStringList folders;
-    XMLDocument document;
-    if (!document.load(path)) {
-        DebugLog(L"Cannot read the scan list %ls: %ls", path, document.error());
-        return folders;
+    ScanListContents contents;
+    QByteArray text;
+    if (!QFile::exists(path))
+        return contents;
+    if (const FileResult read = readWholeFile(path, text); !read) {
+        contents.reason = read.reason;
+        return contents;
     }
-    for (const XMLElement &folder : document.root("Scan").children("Path"))
-        folders.append(folder.text());
-    return folders;
+    if (readScanListLines(text, contents.folders))
+        return contents;
+    XMLDocument document;
+    if (!document.parse(text))
+        contents.reason = document.error();
+    else if (!text.trimmed().endsWith("</Scan>"))
+        contents.reason = QStringLiteral("it does not end with \"</Scan>\"");
+    else
+        for (const XMLElement &folder : document.root("Scan").children("Path"))
+            contents.folders.append(folder.text());
+    return contents;
 }
 
 FileResult WriteScanList(const QString &path, const QStringList &folders)

@@ -1,12 +1,11 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 
+#include "Core/BaseLib/Binary/PluginLibrary.h"
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
-#include "Main/AudioEngineController/Effects/VST/VSTFolderScan.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
-#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
+#include "Main/AudioEngineController/Effects/VST/VSTProbe.h"
 
 #include <QRegularExpression>
 
@@ -21,23 +20,19 @@ double waveShellVersion(const QString &fileName)
 {
     static const QRegularExpression pattern(
         QStringLiteral("\\AWaveShell[+-]?\\d+-VST\\s*([+-]?\\d+(?:\\.\\d*)?)_x64%1\\z")
-            .arg(QRegularExpression::escape(VSTModuleFile::ending())));
+            .arg(QRegularExpression::escape(PluginLibrary::fileEnding())));
     const QRegularExpressionMatch match = pattern.match(fileName);
     return match.hasMatch() ? parseDecimal(match.captured(1)) : 0.0;
 }
 
 VSTHost::VSTHost()
-    : AudioPluginHost(&vstCatalogueFormat())
+    : CatalogueHost(PluginFormat::Vst2)
 {}
-
-QString VSTHost::moduleEnding() const { return VSTModuleFile::ending(); }
 
 bool VSTHost::Scan(bool scan, bool)
 {
-    if (scan)
-        return VSTFolderScan(*this).run();
-    refillEffects();
-    return cleanUpNames();
+    const bool written = CatalogueHost::Scan(scan, true);
+    return scan ? written : cleanUpNames();
 }
 
 bool VSTHost::cleanUpNames()
@@ -66,14 +61,14 @@ bool VSTHost::AddEffect(const EffectRecord &record)
     const TAutoLockCS lock(&m_ks);
     const EffectRecord *stored = effectList().find(record.id);
     if (!stored || !record.path.contains(QLatin1String("WaveShell")))
-        return AudioPluginHost::AddEffect(record);
+        return CatalogueHost::AddEffect(record);
     if (waveShellVersion(fileNameOf(record.path)) <= waveShellVersion(fileNameOf(stored->path)))
         return false;
     EffectRecord later = record;
     if (later.category == 0 && !later.favourite && later.enabled)
         takeMarks(later, *stored);
     effectList().remove(record.id);
-    return AudioPluginHost::AddEffect(later);
+    return CatalogueHost::AddEffect(later);
 }
 
 std::optional<EffectRecord> VSTHost::findByKey(QString key) const
@@ -123,3 +118,5 @@ void VSTHost::setAudioSettings(int sampleRate, int blockSize)
 {
     VSTHostContext::instance().setAudioSettings(sampleRate, blockSize);
 }
+
+std::unique_ptr<IPluginProbe> VSTHost::makeProbe() const { return std::make_unique<VSTProbe>(); }

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
 
 #include <memory>
 
@@ -8,12 +8,11 @@ class VSTPlugin;
 
 /// The host of VST 2 plug-ins: their catalogue, and those loaded for use. What plug-ins ask and report goes
 /// to `VSTHostContext`.
-class VSTHost : public AudioPluginHost {
+class VSTHost : public CatalogueHost {
 public:
     VSTHost();
 
     bool Scan(bool scan, bool inProcess) override;
-    QString moduleEnding() const override;
     /// As in every format; but of two files of the special shells that offer the same sub-plug-in, the one of
     /// the higher version stays.
     bool AddEffect(const EffectRecord &record) override;
@@ -24,6 +23,7 @@ public:
     LoadedPlugin loadPlugin(const QString &identifier) override;
 
     void setAudioSettings(int sampleRate, int blockSize) override;
+    std::unique_ptr<IPluginProbe> makeProbe() const override;
 
 private:
     std::optional<EffectRecord> findByKey(QString key) const;

@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Main/VLib/SimpleGUI.h"
 

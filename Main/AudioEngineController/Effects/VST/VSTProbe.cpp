@@ -106,10 +106,8 @@ void Run::ask()
     if (result.isDone())
         result = enter();
     outcome.fail(result.reason);
-    if (result.status == VSTLoadResult::Status::NoEntryPoint) {
+    if (result.status == VSTLoadResult::Status::NoEntryPoint)
         outcome.status = ProbeStatus::NoPlugin;
-        outcome.ifFailed = ProbeOutcome::IfFailed::Forget;
-    }
     if (!result.isDone())
         return;
     EffectRecord file;

@@ -1,19 +1,31 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3FolderScan.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
+#include "Main/AudioEngineController/Effects/VST3/VST3Probe.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 
 VST3Host::VST3Host()
-    : AudioPluginHost(&vst3CatalogueFormat())
+    : CatalogueHost(PluginFormat::Vst3)
 {}
 
-bool VST3Host::Scan(bool scan, bool inProcess)
+bool VST3Host::isModule(const QString &path) const { return VST3ModuleFile::isModule(path); }
+
+QString VST3Host::moduleTime(const QString &path) const { return VST3ModuleFile::fileTime(path); }
+
+QString VST3Host::moduleFolder(const QString &path) const
 {
-    return scan ? VST3FolderScan(*this).run() : AudioPluginHost::Scan(scan, inProcess);
+    const int bundle = path.lastIndexOf(QLatin1String(".vst3/Contents/"), -1, Qt::CaseInsensitive);
+    return CatalogueHost::moduleFolder(bundle < 0 ? path : path.left(bundle));
 }
+
+QString VST3Host::displayName(const QString &path) const
+{
+    return fileNameOf(path).chopped(info().moduleEnding.size());
+}
+
+std::unique_ptr<IPluginProbe> VST3Host::makeProbe() const { return std::make_unique<VST3Probe>(); }
 
 LoadedPlugin VST3Host::loadPlugin(const QString &identifier)
 {

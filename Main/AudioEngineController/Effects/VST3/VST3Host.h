@@ -1,15 +1,21 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
 
 /// The host of VST 3 plug-ins.
-class VST3Host : public AudioPluginHost {
+class VST3Host : public CatalogueHost {
 public:
     VST3Host();
 
-    bool Scan(bool scan, bool inProcess) override;
-    QString moduleEnding() const override { return QStringLiteral(".vst3"); }
     LoadedPlugin loadPlugin(const QString &identifier) override;
+
+    bool isModule(const QString &path) const override;
+    QString moduleTime(const QString &path) const override;
+    QString moduleFolder(const QString &path) const override;
+    QString displayName(const QString &path) const override;
+    bool probesInPathOrder() const override { return false; }
+    bool announcesEachRecord() const override { return false; }
+    std::unique_ptr<IPluginProbe> makeProbe() const override;
 
 protected:
     bool isMarkerWithoutRecord(const EffectRecord &marker) const override;

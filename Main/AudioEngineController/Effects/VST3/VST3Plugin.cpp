@@ -2,7 +2,7 @@
 
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ClassId.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/VLib/SimpleGUI.h"

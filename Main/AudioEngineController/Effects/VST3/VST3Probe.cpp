@@ -186,11 +186,9 @@ void ModuleListing::failClass(const PClassInfo &info, const char *what, tresult 
 
 ProbeOutcome::IfFailed ifFailed(const QString &path, bool factoryFound)
 {
-    if (!factoryFound)
-        return ProbeOutcome::IfFailed::Forget;
     // NOTE: a WaveShell finds its plug-ins in other folders, and may do so again at the next scan.
-    return path.contains(QLatin1String("WaveShell")) ? ProbeOutcome::IfFailed::KeepKnown
-                                                     : ProbeOutcome::IfFailed::Record;
+    const bool isAskedAgain = !factoryFound || path.contains(QLatin1String("WaveShell"));
+    return isAskedAgain ? ProbeOutcome::IfFailed::KeepKnown : ProbeOutcome::IfFailed::Record;
 }
 
 } // namespace

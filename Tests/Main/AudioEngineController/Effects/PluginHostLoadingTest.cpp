@@ -23,12 +23,12 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHost)
     const QString vst3 = addVST3File(folder.plugins(), "C",
                                      QByteArray("class C\nid ") + good + "\nclass T\nid " + throws +
                                          "\nfault initialize throw-int T\n");
-    list(registry.vst3Host(), vst3, good);
-    list(registry.vst3Host(), vst3, throws);
-    list(registry.vst3Host(), vst3, "FF112233445566778899AABBCCDDEEFF");
-    list(registry.vst3Host(), vst3, "Off", false);
-    list(registry.builtInHost(), QString(), "a");
-    list(registry.vst2Host(), addVST2File(folder.plugins(), "Q", "name Q\nid 7\n"), "Q:7");
+    list(registry.host(PluginFormat::Vst3), vst3, good);
+    list(registry.host(PluginFormat::Vst3), vst3, throws);
+    list(registry.host(PluginFormat::Vst3), vst3, "FF112233445566778899AABBCCDDEEFF");
+    list(registry.host(PluginFormat::Vst3), vst3, "Off", false);
+    list(registry.host(PluginFormat::BuiltIn), QString(), "a");
+    list(registry.host(PluginFormat::Vst2), addVST2File(folder.plugins(), "Q", "name Q\nid 7\n"), "Q:7");
     const struct {
         const char *identifier;
         const char *loaded; // the identifier of what came; null: nothing

@@ -1,6 +1,6 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
 
-#include "Main/AudioEngineController/Effects/Catalogue/PluginIdentifier.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 #include "Tests/Support/QtPrinters.h"
 

@@ -144,18 +144,18 @@ TEST_F(Launcher, TheRegistryScansOutOfProcessAndReloadsWhatChanged)
     EXPECT_FALSE(registry->Scan(true, false)) << "one launcher at a time";
     EXPECT_EQ(workstation.changes, 1) << "the lists as they were";
     waitFor([&] { return !registry->isLauncherRunning(); });
-    ASSERT_EQ(registry->vst3Host().effects().size(), 1u);
-    EXPECT_EQ(registry->vst3Host().effects()[0].name, "Comp");
+    ASSERT_EQ(registry->host(PluginFormat::Vst3).effects().size(), 1u);
+    EXPECT_EQ(registry->host(PluginFormat::Vst3).effects()[0].name, "Comp");
     EXPECT_EQ(workstation.changes, 2);
     registry->Scan(true, false);
     waitFor([&] { return !registry->isLauncherRunning(); });
     EXPECT_EQ(workstation.changes, 3) << "nothing changed, nothing reloaded";
-    EXPECT_EQ(registry->vst3Host().effects().size(), 1u);
+    EXPECT_EQ(registry->host(PluginFormat::Vst3).effects().size(), 1u);
 
     addVST3File(m_folder.plugins(), "Hang", "class Hang\nfault initialize hang\n");
     registry->Scan(true, false);
     waitFor([&] { return !m_folder.markers().isEmpty(); });
-    registry->vst3Host().ReadCatalogue();
+    registry->host(PluginFormat::Vst3).ReadCatalogue();
     EXPECT_FALSE(m_folder.markers().isEmpty()) << "that of a scanner at work says nothing";
     QElapsedTimer time;
     time.start();

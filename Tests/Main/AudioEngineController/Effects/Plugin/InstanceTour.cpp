@@ -123,11 +123,11 @@ protected:
 TEST_F(InstanceTour, OfTheVST3Plugins)
 {
     list(qEnvironmentVariable("FXPROBE_TOUR_VST3", realPlugins(m_folder) + "/vst3"), {"*.vst3"});
-    tour(m_registry.vst3Host(), "vst3:");
+    tour(m_registry.host(PluginFormat::Vst3), "vst3:");
 }
 
 TEST_F(InstanceTour, OfTheVST2Plugins)
 {
     list(qEnvironmentVariable("FXPROBE_TOUR_VST", realPlugins(m_folder) + "/vst"), {"*.so", "*.dll"});
-    tour(m_registry.vst2Host(), "vst2:");
+    tour(m_registry.host(PluginFormat::Vst2), "vst2:");
 }

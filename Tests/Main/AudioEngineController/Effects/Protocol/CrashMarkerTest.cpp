@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Tests/Support/TestFolder.h"
 
 #include <QFile>
@@ -42,11 +42,11 @@ TEST(CrashMarker, FileNames)
         {"/fx/Shell.vst3", "null", "null"},
     };
     for (const auto &row : rows)
-        EXPECT_EQ(markerPath(vst3(), "/e", row.path, row.name), QString("/e/") + row.file + ".scan3");
+        EXPECT_EQ(CrashMarker(vst3(), "/e", crashed(row.path, "", "", 0), row.name).path(),
+                  QString("/e/") + row.file + ".scan3");
     const QTemporaryDir folder;
-    const QString path = markerPath(vst3(), folder.path(), QString(), QString(300, QChar(0x771F)));
-    EXPECT_TRUE(writeMarkerFile(vst3(), path, EffectRecord()));
-    EXPECT_TRUE(QFile::exists(path)) << "cut to a length that every file system takes";
+    const CrashMarker marker(vst3(), folder.path(), EffectRecord(), QString(300, QChar(0x771F)));
+    EXPECT_TRUE(QFile::exists(marker.path())) << "cut to a length that every file system takes";
 }
 
 TEST(CrashMarker, TextAndWhatIsReadBack)
@@ -70,11 +70,11 @@ TEST(CrashMarker, TextAndWhatIsReadBack)
          2147483648u},
     };
     const TestFolder folder;
-    const QString path = folder.path("marker");
     for (const auto &row : rows) {
         SCOPED_TRACE(row.body);
         const EffectRecord &record = row.record;
-        ASSERT_TRUE(writeMarkerFile(row.format, path, record));
+        const CrashMarker marker(row.format, folder.dataFolder(), record, record.name);
+        const QString path = marker.path();
         EXPECT_EQ(folder.read(path).replace(kLineEnd, "\n"),
                   QByteArray("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<CrashedPlugin>\n") + row.body +
                       "</CrashedPlugin>\n");
@@ -88,14 +88,28 @@ TEST(CrashMarker, TextAndWhatIsReadBack)
 TEST(CrashMarker, AbandoningDeletesWhatIsActiveAndOnlyThen)
 {
     const QTemporaryDir folder;
-    const QString path = folder.filePath("X.scan3");
     bool ended = false;
-    ActiveMarkers::abandon([&] { ended = true; });
+    CrashMarker::abandonAll([&] { ended = true; });
     EXPECT_FALSE(ended) << "no plug-in is being probed";
-    ASSERT_TRUE(writeMarkerFile(vst3(), path, EffectRecord()));
-    ActiveMarkers::add(path);
-    ActiveMarkers::abandon([&] { ended = true; });
+    const CrashMarker marker(vst3(), folder.path(), EffectRecord(), "X");
+    ASSERT_TRUE(QFile::exists(marker.path()));
+    CrashMarker::abandonAll([&] { ended = true; });
     EXPECT_TRUE(ended);
-    EXPECT_FALSE(QFile::exists(path));
-    ActiveMarkers::remove(path);
+    EXPECT_FALSE(QFile::exists(marker.path()));
+}
+
+TEST(CrashMarker, AFileBelongsToOneOwner)
+{
+    const QTemporaryDir folder;
+    CrashMarker first(vst3(), folder.path(), EffectRecord(), "X");
+    const QString path = first.path();
+    CrashMarker namesake(vst3(), folder.path(), EffectRecord(), "x");
+    EXPECT_EQ(namesake.path(), folder.filePath("2_x.scan3"));
+    CrashMarker owner(std::move(first));
+    EXPECT_EQ(owner.path(), path);
+    owner = std::move(namesake);
+    EXPECT_FALSE(QFile::exists(path)) << "the one that was owned before";
+    EXPECT_TRUE(QFile::exists(owner.path()));
+    const CrashMarker taken(vst3(), folder.path(), EffectRecord(), "Y", {folder.filePath("y.scan3")});
+    EXPECT_EQ(taken.path(), folder.filePath("2_Y.scan3"));
 }

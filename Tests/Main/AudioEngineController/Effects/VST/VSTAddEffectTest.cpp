@@ -1,5 +1,5 @@
+#include "Core/BaseLib/Binary/PluginLibrary.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
 #include "Tests/Support/QtPrinters.h"
 
 #include <gtest/gtest.h>
@@ -13,7 +13,7 @@ TEST(WaveShellVersion, IsReadFromNamesOfTheOnePattern)
         {"WaveShell1-VST 9,3_x64", 0.0},      {"WaveShell1-VST nan_x64", 0.0},
         {"My WaveShell1-VST 9.3_x64", 0.0},   {"WaveShell1-VST 9.3_x64 copy", 0.0}};
     for (const auto &[name, version] : rows)
-        EXPECT_EQ(waveShellVersion(name + VSTModuleFile::ending()), version) << name;
+        EXPECT_EQ(waveShellVersion(name + PluginLibrary::fileEnding()), version) << name;
     EXPECT_EQ(waveShellVersion("WaveShell1-VST 9.3_x64.vst3"), 0.0);
 }
 
@@ -37,7 +37,7 @@ TEST(VSTAddEffect, OfTwoSpecialShellsTheNewerStays)
         EffectRecord record;
         record.id = record.name = "Q10";
         const auto add = [&](const char *file) {
-            record.path = QStringLiteral("/fx/") + file + VSTModuleFile::ending();
+            record.path = QStringLiteral("/fx/") + file + PluginLibrary::fileEnding();
             return host.AddEffect(record);
         };
         EXPECT_TRUE(add(row.first)) << row.name;

@@ -105,9 +105,11 @@ TEST_F(VSTHostTest, AShellLeavesTheProgressToTheFilesAgain)
     EXPECT_TRUE(m_host.Scan(true, true));
     installVUI(nullptr);
     const QString ending = vst2Ending();
-    const QString child = "; show; notified fffffff; value ";
-    EXPECT_EQ(ui->heard.join("; "),
-              "range 2 ; value 0; 60000 Scanning: a Shell" + ending +
-                  "; show; range 2 Scanning WaveShell; 60000 Scanning: A" + child + "1; 60000 Scanning: B" +
-                  child + "2; range 2 ; value 0; value 1; 60000 Scanning: b Comp" + ending + child + '2');
+    const QString child = "; show; value ";
+    EXPECT_EQ(
+        ui->heard.join("; "),
+        "range 2 ; value 0; 60000 Scanning: a Shell" + ending +
+            "; show; range 2 Scanning WaveShell; 60000 Scanning: A" + child + "1; 60000 Scanning: B" + child +
+            "2; notified fffffff; notified fffffff; range 2 ; value 0; value 1; 60000 Scanning: b Comp" +
+            ending + "; show; notified fffffff; value 2");
 }

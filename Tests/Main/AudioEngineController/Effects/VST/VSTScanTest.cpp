@@ -51,8 +51,8 @@ TEST_F(VSTScan, FilesThatFailAreRecordedAndFilesThatAreNoPluginsAreNot)
     const QString log = scan().log;
     EXPECT_EQ(records("Name ID Enabled Working"), texts({"Empty|Empty|1|0", "Healthy|Healthy:1000|1|1",
                                                          "Null|Null|1|0", "Text|Text|1|0", "Wild|Wild|1|0"}));
-    for (const QString &reason :
-         {QString(kTextFileReason), modulePath("Empty") + ": ", modulePath("Wild") + ", Didn't manage it"})
+    for (const QString &reason : {QString(kTextFileReason), modulePath("Empty") + ": ",
+                                  modulePath("Wild") + ": its entry point returned something"})
         EXPECT_TRUE(log.contains(reason)) << qPrintable(log);
     expectSettled();
 }

@@ -109,9 +109,10 @@ TEST_F(VST3ScanTest, MarksOutliveUpdatesFailuresAndMoves)
     scan();
     EXPECT_EQ(loaded(), texts({"Comp", "Failing", "Moved"})) << "what is switched off is not asked";
     EXPECT_EQ(sortedRecords("Name FileTime CategoryMask Favourite Enabled Working"),
-              texts({"Failing|2022-03-04 05:06|16384|1|1|0", "Moved|2021-03-04 05:06|16384|1|1|1",
-                     "New|2022-03-04 05:06|16|0|1|1", "Off|2021-03-04 05:06|0|0|0|1",
-                     "Renamed|2022-03-04 05:06|16384|1|1|1", "Touched|2021-03-04 05:06|0|0|1|1"}));
+              texts({"Failing|2022-03-04 05:06|0|0|1|0", "Failing|2022-03-04 05:06|16384|1|1|0",
+                     "Moved|2021-03-04 05:06|16384|1|1|1", "New|2022-03-04 05:06|16|0|1|1",
+                     "Off|2021-03-04 05:06|0|0|0|1", "Renamed|2022-03-04 05:06|16384|1|1|1",
+                     "Touched|2021-03-04 05:06|0|0|1|1"}));
     add("Failing");
     scan();
     EXPECT_TRUE(records("Name CategoryMask Favourite Working").contains("Failing|16384|1|1"));

@@ -1,6 +1,5 @@
-#include "Main/AudioEngineController/Effects/VST/VSTCatalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 
-#include "Core/BaseLib/Files/FileTime.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 
 namespace {
@@ -8,7 +7,7 @@ namespace {
 using Content = std::optional<QByteArray>;
 
 template <qint32 EffectRecord::*Field>
-void readNumber(EffectRecord &record, const XMLElement &element)
+void readNumber(EffectRecord &record, const ElementContent &element)
 {
     record.*Field = CatalogueElements::readInt(element);
 }
@@ -19,7 +18,7 @@ Content number(const EffectRecord &record)
     return QByteArray::number(record.*Field);
 }
 
-void readSubEffect(EffectRecord &record, const XMLElement &element)
+void readSubEffect(EffectRecord &record, const ElementContent &element)
 {
     record.subName = element.child("Name").text();
     record.subId = static_cast<quint32>(element.child("ID").integer());
@@ -45,7 +44,6 @@ const CatalogueFormat &vstCatalogueFormat()
         true, // a file that states no version is older than any that can be read
         1.4,
         1.3,
-        fileTimeText,
         {".scan", true, true},
         {kPath,
          kFileTime,

@@ -1,22 +1,23 @@
-#include "Main/AudioEngineController/Effects/VST3/VST3Catalogue.h"
-
-#include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 
 namespace {
 
 using Content = std::optional<QByteArray>;
 
-void readInputs(EffectRecord &record, const XMLElement &element)
+void readInputs(EffectRecord &record, const ElementContent &element)
 {
     record.inputs = CatalogueElements::readInt(element);
 }
 
-void readOutputs(EffectRecord &record, const XMLElement &element)
+void readOutputs(EffectRecord &record, const ElementContent &element)
 {
     record.outputs = CatalogueElements::readInt(element);
 }
 
-void readCategories(EffectRecord &record, const XMLElement &element) { record.categories = element.text(); }
+void readCategories(EffectRecord &record, const ElementContent &element)
+{
+    record.categories = element.text();
+}
 
 Content inputs(const EffectRecord &record) { return QByteArray::number(record.inputs); }
 
@@ -33,7 +34,6 @@ const CatalogueFormat &vst3CatalogueFormat()
         false,
         1.1,
         0.0,
-        VST3ModuleFile::fileTime,
         {".scan3", false, false},
         {kPath,
          kFileTime,

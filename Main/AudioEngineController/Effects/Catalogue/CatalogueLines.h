@@ -1,0 +1,22 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFormat.h"
+
+#include <QByteArray>
+
+#include <vector>
+
+/// A catalogue file read by its lines.
+struct CatalogueLines {
+    QString version;
+    std::vector<EffectRecord> records; ///< in the order of the file
+    bool isWhole = false; ///< false: some line is not as we write it; the records before it are there
+};
+
+/// Reads a catalogue that has the layout in which we write it. Texts in it are not escaped, so a name that
+/// holds "<" makes the file something that no XML reader takes, or takes for something else: what we wrote is
+/// read as we wrote it.
+CatalogueLines readCatalogueLines(const CatalogueFormat &format, const QByteArray &content);
+
+/// Reads the folders of a scan list that has our layout. False, and no folders, when it has another.
+bool readScanListLines(const QByteArray &content, QStringList &folders);

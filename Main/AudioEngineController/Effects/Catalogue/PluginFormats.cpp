@@ -1,0 +1,69 @@
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
+
+#include "Core/BaseLib/Binary/PluginLibrary.h"
+#include "Core/BaseLib/Log/Assertion.h"
+#include "Main/AudioEngineController/Effects/Catalogue/BuiltInCatalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
+
+#include <algorithm>
+
+namespace {
+
+template <typename Matches>
+const PluginFormatInfo *find(Matches &&matches)
+{
+    const std::vector<PluginFormatInfo> &formats = pluginFormats();
+    const auto found = std::find_if(formats.begin(), formats.end(), matches);
+    return found == formats.end() ? nullptr : &*found;
+}
+
+const PluginFormatInfo *infoOfPrefix(const QString &prefix)
+{
+    return find([&](const PluginFormatInfo &info) { return prefix == QLatin1String(info.prefix); });
+}
+
+} // namespace
+
+const std::vector<PluginFormatInfo> &pluginFormats()
+{
+    static const std::vector<PluginFormatInfo> formats{
+        {PluginFormat::Vst3, "vst3", "VST 3", PluginPrefix::kVst3, QStringLiteral(".vst3"),
+         &vst3CatalogueFormat()},
+        {PluginFormat::Vst2, "vst2", "VST 2", PluginPrefix::kVst2, PluginLibrary::fileEnding(),
+         &vstCatalogueFormat()},
+        {PluginFormat::AudioUnit, "au", "Apple AudioUnit", PluginPrefix::kAudioUnit, QString(), nullptr},
+        {PluginFormat::BuiltIn, "mrl", "Built-in", PluginPrefix::kBuiltIn, QString(),
+         &builtInEffectsFormat()}};
+    return formats;
+}
+
+const PluginFormatInfo &formatInfo(PluginFormat format)
+{
+    const PluginFormatInfo *const info =
+        find([format](const PluginFormatInfo &each) { return each.format == format; });
+    FXPROBE_VERIFY(0 != info);
+    return info ? *info : pluginFormats().front();
+}
+
+const PluginFormatInfo *formatOfKey(const QString &key)
+{
+    return find([&](const PluginFormatInfo &info) { return key == QLatin1String(info.key); });
+}
+
+PluginFormat formatOfPrefix(const QString &prefix)
+{
+    const PluginFormatInfo *const info = infoOfPrefix(prefix);
+    return info ? info->format : PluginFormat::Unknown;
+}
+
+QString prefixOf(const QString &identifier)
+{
+    return identifier.left(identifier.indexOf(QLatin1Char(':')) + 1);
+}
+
+QString formatName(const QString &prefix)
+{
+    const PluginFormatInfo *const info = infoOfPrefix(prefix);
+    return info ? QString::fromLatin1(info->title) : QStringLiteral("Unknown");
+}

@@ -1,0 +1,121 @@
+#pragma once
+
+#include "Core/BaseLib/Files/FileTime.h"
+#include "Core/BaseLib/Files/NativeFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
+#include "Main/AudioEngineController/Effects/Catalogue/EffectList.h"
+#include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
+#include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
+
+#include <memory>
+#include <set>
+
+/// Base of the hosts of formats that have a catalogue. Holds what the previous run left (the known list) and
+/// what this run found (the effect list), and reads and writes the file that carries them.
+class CatalogueHost : public AudioPluginHost {
+public:
+    /// Reads the previous catalogue into the known list, which is emptied first, and absorbs the crash
+    /// markers: the catalogue is rewritten with what they say, and only then are they deleted, so that the
+    /// knowledge outlives another crash.
+    void ReadCatalogue() override;
+    bool catalogueChanged() override;
+    bool Scan(bool scan, bool inProcess) override;
+    bool AddEffect(const EffectRecord &record) override;
+    std::optional<EffectRecord> findEffect(const QString &id) const override;
+    std::vector<EffectRecord> effects() const override;
+    /// Deletes the markers of files that are left alone: until all formats are through, another crash must
+    /// not bring those files back.
+    void scansEnded() override;
+
+    /// Writes the effect list. A file that cannot be written is logged and stays as it was; false then.
+    bool WriteCatalogue() override
+    {
+        WaitingRecords none;
+        return writeInterim(none, Durability::Synced);
+    }
+    /// Writes the effect list, and with it the records of files still waiting for their probe. An identifier
+    /// that is listed already is not written twice.
+    bool writeInterim(WaitingRecords &waiting, Durability durability);
+    /// Writes the same, unless the file holds exactly that. True when it was written.
+    bool writeIfChanged(WaitingRecords &waiting);
+
+    /// Writes the crash marker for a plug-in that is about to be touched. A null name is made from the
+    /// record's path.
+    CrashMarker WriteCrashMarker(const EffectRecord &plugin, const QString &name = QString()) const;
+    /// Reads a crash marker into a fresh record that is not enabled. The file stays: it is deleted once the
+    /// catalogue holds what it said.
+    EffectRecord ReadCrashMarker(const QString &marker) const;
+
+    /// Completes the record of a file, or of a sub-plug-in, that failed to load or lists nothing: named after
+    /// the file (a sub-plug-in keeps its name), enabled, not working, so that it is shown and not probed
+    /// again until it changes.
+    void completeFailedRecord(EffectRecord &record) const;
+
+    PluginFormat format() const { return m_info.format; }
+    const PluginFormatInfo &info() const { return m_info; }
+    const KnownList &known() const { return m_known; }
+    /// True for a file that this run must not touch although nothing is recorded about it.
+    bool isLeftAlone(const QString &path) const { return m_leftAlone.count(path) != 0; }
+    /// True when the effect list holds the identifier.
+    bool isListed(const QString &id) const;
+    /// Whether there is a catalogue that the system did not let us read. It is not replaced.
+    bool isCatalogueUnread() const { return !m_unread.isEmpty(); }
+
+    /// Empties the effect list.
+    void clearEffects();
+    /// Empties the effect list and fills it from the known list.
+    void refillEffects();
+
+    /// What a format knows of its modules on disk. The defaults are those of a format whose modules are plain
+    /// files.
+    ///
+    /// False for a path that a folder search finds although it is not a module of its own.
+    virtual bool isModule(const QString & /*path*/) const { return true; }
+    /// The time stamp of the file that an update of the module replaces; empty when there is no such module.
+    virtual QString moduleTime(const QString &path) const;
+    /// The folder in which a module lies: that of its bundle, if it is inside one.
+    virtual QString moduleFolder(const QString &path) const;
+    /// What a user reads while it is probed.
+    virtual QString displayName(const QString &path) const { return fileNameOf(path); }
+    /// Whether modules are probed in the order of their paths, not in that of the folders.
+    virtual bool probesInPathOrder() const { return true; }
+    /// Whether the user interface hears of each record that is added, or once of each file.
+    virtual bool announcesEachRecord() const { return true; }
+    /// What asks the modules; null for a format without any.
+    virtual std::unique_ptr<IPluginProbe> makeProbe() const { return nullptr; }
+
+protected:
+    explicit CatalogueHost(PluginFormat format);
+
+    /// The catalogue file's content; what cannot be used is logged.
+    CatalogueContents readContents();
+    QString cataloguePath() const;
+    EffectList &effectList() { return m_effects; }
+
+    /// Whether a crash marker only keeps its file from being touched in this run, without a record.
+    virtual bool isMarkerWithoutRecord(const EffectRecord & /*marker*/) const { return false; }
+
+private:
+    void readKnownRecords();
+    void absorbMarkers();
+    void absorbMarker(const EffectRecord &marker);
+    bool writeKnownRecords();
+    QByteArray render(WaitingRecords &waiting);
+    bool writeText(const QByteArray &text, Durability durability);
+    bool matchesFile() const;
+    QString freeIdentifier(const EffectRecord &plugin, const QString &name) const;
+
+    const PluginFormatInfo &m_info;
+    FileStamp m_lastSeen;
+    KnownList m_known;
+    EffectList m_effects;
+    std::set<QString, PathLess> m_leftAlone;
+    QStringList m_heldMarkers;      ///< of files left alone
+    QStringList m_unwrittenMarkers; ///< absorbed, but what they say could not be written down
+    QByteArray m_written; ///< what this process wrote to the file last; null: nothing since it was read
+    bool m_isKnownAsRead = false; ///< the file holds exactly the known list, in our layout
+    QString m_unread;             ///< why the catalogue that is there could not be read
+};

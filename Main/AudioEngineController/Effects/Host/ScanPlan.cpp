@@ -1,0 +1,221 @@
+#include "Main/AudioEngineController/Effects/Host/ScanPlan.h"
+
+#include <QDir>
+#include <QFileInfo>
+
+#include <algorithm>
+#include <functional>
+
+namespace {
+
+bool isBelow(const QString &path, const QString &folder)
+{
+    const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
+    return path.startsWith(prefix, kPathCase) || isSamePath(path, folder);
+}
+
+bool isBelowAny(const QString &path, const QStringList &folders)
+{
+    return std::any_of(folders.begin(), folders.end(),
+                       [&](const QString &folder) { return isBelow(path, folder); });
+}
+
+/// Whether the record that speaks for a file does not fit it any more.
+bool isOutdated(const EffectRecord &first, const QString &fileTime)
+{
+    if (!first.enabled)
+        return first.subId != 0; // all sub-plug-ins of a shell are disabled
+    return first.fileTime != fileTime;
+}
+
+/// How many of the last folders of two paths have the same names: a folder was renamed, or moved as a whole.
+int commonEnd(const QString &left, const QString &right)
+{
+    const QStringList a = left.split(QLatin1Char('/'));
+    const QStringList b = right.split(QLatin1Char('/'));
+    int common = 0;
+    while (common < std::min(a.size(), b.size()) &&
+           isSamePath(a.at(a.size() - 1 - common), b.at(b.size() - 1 - common)))
+        ++common;
+    return common;
+}
+
+const EffectRecord *findIn(const KnownList::Records &records,
+                           const std::function<bool(const EffectRecord &)> &matches)
+{
+    const auto found = std::find_if(records.begin(), records.end(),
+                                    [&](const EffectRecord *each) { return matches(*each); });
+    return found == records.end() ? nullptr : *found;
+}
+
+/// A lone record that stands for a whole file, as catalogues of earlier versions hold; null when there is
+/// none.
+const EffectRecord *loneFileRecord(const KnownList::Records &records)
+{
+    return records.size() == 1 && records.front()->standsForFile() ? records.front() : nullptr;
+}
+
+} // namespace
+
+ScanPlan::ScanPlan(const CatalogueHost &host, const QStringList &folders, const QStringList &unread)
+    : m_host(host)
+    , m_unread(unread)
+{
+    for (const QString &folder : folders)
+        if (!folder.isEmpty())
+            m_folders.append(QDir::cleanPath(QFileInfo(folder).absoluteFilePath()));
+}
+
+void ScanPlan::keep(const KnownList::Records &records)
+{
+    m_kept.insert(m_kept.end(), records.begin(), records.end());
+}
+
+void ScanPlan::decide(const QStringList &modules)
+{
+    QSet<QString> found;
+    for (const QString &path : modules) {
+        found.insert(pathKey(path));
+        decideModule(path);
+    }
+    sortMissing(found);
+    for (const KnownFile &gone : m_gone)
+        settleGone(gone, modules);
+    std::stable_partition(m_items.begin(), m_items.end(),
+                          [](const ScanItem &item) { return !item.known.empty(); });
+}
+
+void ScanPlan::decideModule(const QString &path)
+{
+    KnownList::Records known = m_host.known().recordsOfPath(path);
+    const QString fileTime = m_host.moduleTime(path);
+    if (m_host.isLeftAlone(path))
+        keep(known);
+    else if (fileTime.isEmpty()) { // not a module after all; unless nobody lets us see
+        if (cannotBeExamined(path))
+            keep(known);
+    } else if (known.empty() || isOutdated(*known.front(), fileTime))
+        m_items.push_back({path, fileTime, std::move(known), {}});
+    else
+        keep(known);
+}
+
+void ScanPlan::sortMissing(const QSet<QString> &found)
+{
+    QSet<QString> gone;
+    for (const EffectRecord *record : m_host.known().all()) {
+        const QString key = pathKey(record->path);
+        if (found.contains(key) || gone.contains(key))
+            continue;
+        if (!isGone(record->path)) {
+            m_away.push_back(record);
+            continue;
+        }
+        gone.insert(key);
+        m_gone.push_back({record->path, m_host.known().recordsOfPath(record->path)});
+    }
+}
+
+bool ScanPlan::isGone(const QString &path)
+{
+    const QString folder = m_host.moduleFolder(path);
+    if (!isBelowAny(folder, m_folders))
+        return true;
+    const auto [entry, isNew] = m_isFolderThere.try_emplace(folder, false);
+    if (isNew)
+        entry->second =
+            !isBelowAny(folder, m_unread) && QFileInfo(folder).isReadable() &&
+            !QDir(folder).isEmpty(QDir::AllEntries | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot);
+    return entry->second;
+}
+
+/// Gives the records of a gone file to one that may be the same: to one of its name of which nothing is
+/// known, else to one that is there because it crashed, else to one that is known, which is asked again.
+void ScanPlan::settleGone(const KnownFile &gone, const QStringList &modules)
+{
+    if (ScanItem *item = bestUnknown(gone)) {
+        item->moved = gone.records;
+        return;
+    }
+    QStringList namesakes;
+    for (const QString &path : modules)
+        if (isSamePath(fileNameOf(path), fileNameOf(gone.path)))
+            namesakes.append(path);
+    if (!namesakes.isEmpty() && !moveToCrashed(gone, namesakes))
+        askAgain(namesakes);
+}
+
+ScanItem *ScanPlan::bestUnknown(const KnownFile &gone)
+{
+    ScanItem *best = nullptr;
+    int bestEnd = 0;
+    for (ScanItem &item : m_items) {
+        if (!item.known.empty() || !item.moved.empty())
+            continue;
+        if (const int end = commonEnd(item.path, gone.path); end > bestEnd) {
+            best = &item;
+            bestEnd = end;
+        }
+    }
+    return best;
+}
+
+bool ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes)
+{
+    const auto isOnlyCrashed = [this](const QString &path) {
+        const KnownList::Records known = m_host.known().recordsOfPath(path);
+        return known.size() == 1 && known.front()->isCrashedFile();
+    };
+    const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);
+    if (crashed == namesakes.end())
+        return false;
+    const EffectRecord &file = *m_host.known().recordsOfPath(*crashed).front();
+    for (const EffectRecord *record : gone.records) {
+        if (m_host.known().isSameOfFile(*record, file) || record->standsForFile())
+            continue;
+        m_keptMoved.push_back(*record);
+        EffectRecord &moved = m_keptMoved.back();
+        moved.path = file.path;
+        moved.fileTime = file.fileTime;
+        if (!moved.isSwitchedOff())
+            moved.enabled = moved.working = false;
+    }
+    return true;
+}
+
+/// Has modules asked again that were to be kept: what only the gone file listed may be theirs as well.
+void ScanPlan::askAgain(const QStringList &namesakes)
+{
+    for (const QString &path : namesakes) {
+        const KnownList::Records known = m_host.known().recordsOfPath(path);
+        const auto isKept = [&](const EffectRecord *record) { return isSamePath(record->path, path); };
+        if (known.empty() || !known.front()->enabled || m_host.isLeftAlone(path) ||
+            std::none_of(m_kept.begin(), m_kept.end(), isKept))
+            continue;
+        m_kept.erase(std::remove_if(m_kept.begin(), m_kept.end(), isKept), m_kept.end());
+        m_items.push_back({path, m_host.moduleTime(path), known, {}});
+    }
+}
+
+const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRecord &probed,
+                                            bool isOnly) const
+{
+    const auto isSame = [&](const EffectRecord &old) { return m_host.known().isSameOfFile(old, probed); };
+    const auto hasId = [&](const EffectRecord &old) { return old.id == probed.id; };
+    if (const EffectRecord *own = findIn(item.known, isSame))
+        return own;
+    KnownList::Records gone = item.moved; // first: the likeliest
+    for (const KnownFile &file : m_gone)
+        if (isSamePath(fileNameOf(file.path), fileNameOf(item.path)))
+            gone.insert(gone.end(), file.records.begin(), file.records.end());
+    if (const EffectRecord *same = findIn(gone, hasId))
+        return same;
+    if (const EffectRecord *same = findIn(gone, isSame))
+        return same;
+    if (const EffectRecord *same = findIn(m_away, hasId))
+        return same;
+    if (!isOnly)
+        return nullptr;
+    const EffectRecord *lone = loneFileRecord(item.known);
+    return lone ? lone : loneFileRecord(item.moved);
+}

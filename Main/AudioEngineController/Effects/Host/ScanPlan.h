@@ -1,0 +1,70 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
+
+#include <QSet>
+
+#include <map>
+#include <vector>
+
+/// A module that a scan has to probe.
+struct ScanItem {
+    QString path;
+    QString fileTime;
+    KnownList::Records known; ///< of this path, the one that speaks for the file first
+    KnownList::Records moved; ///< of a file that is gone, of this file name: they move here, whole
+};
+
+/// Decides what becomes of each module that a search found, and of what is known of those that it did not
+/// find. Pure bookkeeping: nothing is loaded, added or written.
+///
+/// A file that is not there is *gone* when the folder that it lay in was searched and has other content, or
+/// is not below a listed folder any more. It is *away* when that folder is not there, cannot be read or is
+/// empty: drives are unplugged.
+class ScanPlan {
+public:
+    /// The host's known list must not change while the plan is used. `unread` are the folders below `folders`
+    /// of which not all could be read.
+    ScanPlan(const CatalogueHost &host, const QStringList &folders, const QStringList &unread);
+
+    /// Decides about all modules that were found.
+    void decide(const QStringList &modules);
+
+    /// Records that stay as they are.
+    const std::vector<const EffectRecord *> &kept() const { return m_kept; }
+    /// Records of gone files that moved to the path of a file that crashed: changed copies.
+    const std::vector<EffectRecord> &keptMoved() const { return m_keptMoved; }
+    /// What is to be probed: known files first, so that of two files with one identifier the known one wins.
+    const std::vector<ScanItem> &items() const { return m_items; }
+    /// Records of files that are away. One whose identifier a probed file lists gives way to it.
+    const KnownList::Records &away() const { return m_away; }
+
+    /// The old record whose marks a newly probed one takes over; null when there is none. `isOnly`: the
+    /// file lists nothing else.
+    const EffectRecord *sourceOfMarks(const ScanItem &item, const EffectRecord &probed, bool isOnly) const;
+
+private:
+    struct KnownFile {
+        QString path;
+        KnownList::Records records;
+    };
+
+    void decideModule(const QString &path);
+    void sortMissing(const QSet<QString> &found);
+    bool isGone(const QString &path);
+    void settleGone(const KnownFile &gone, const QStringList &modules);
+    ScanItem *bestUnknown(const KnownFile &gone);
+    bool moveToCrashed(const KnownFile &gone, const QStringList &namesakes);
+    void askAgain(const QStringList &namesakes);
+    void keep(const KnownList::Records &records);
+
+    const CatalogueHost &m_host;
+    QStringList m_folders; ///< clean
+    QStringList m_unread;
+    std::map<QString, bool> m_isFolderThere; ///< and searched, with some content
+    std::vector<const EffectRecord *> m_kept;
+    std::vector<EffectRecord> m_keptMoved;
+    std::vector<ScanItem> m_items;
+    std::vector<KnownFile> m_gone;
+    KnownList::Records m_away;
+};

@@ -1,0 +1,23 @@
+#pragma once
+
+/// The words of the report that its writer and its reader share; docs/report.md describes them.
+namespace ReportWord {
+inline constexpr char kEvent[] = "event";
+inline constexpr char kFormat[] = "format";
+inline constexpr char kPath[] = "path";
+inline constexpr char kSubId[] = "subId";
+inline constexpr char kSubName[] = "subName";
+inline constexpr char kStage[] = "stage";
+inline constexpr char kReason[] = "reason";
+inline constexpr char kMilliseconds[] = "milliseconds";
+inline constexpr char kRecords[] = "records";
+inline constexpr char kNoPlugin[] = "noPlugin";
+inline constexpr char kFiles[] = "files";
+inline constexpr char kProbes[] = "probes";
+
+/// In the order of `ReportLine::Event`.
+inline constexpr const char *kEvents[] = {"start",   "busy",      "plan",       "begin",    "stage", "end",
+                                          "skipped", "unwritten", "unreadList", "finished", "ended"};
+/// In the order of `ProbeStage`.
+inline constexpr const char *kStages[] = {"load", "start", "ask", "close"};
+} // namespace ReportWord

@@ -1,3 +1,0 @@
-#include "Main/AudioEngineController/Effects/VST/VSTModuleFile.h"
-
-QString VSTModuleFile::ending() { return QStringLiteral(".so"); }
