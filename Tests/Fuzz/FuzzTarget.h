@@ -15,26 +15,20 @@ struct FuzzTarget {
 
 void fuzzCatalogue(const QByteArray &input);
 void fuzzElf(const QByteArray &input);
-void fuzzIdentifier(const QByteArray &input);
 void fuzzKnown(const QByteArray &input);
 void fuzzMarker(const QByteArray &input);
-void fuzzName(const QByteArray &input);
 void fuzzPe(const QByteArray &input);
 void fuzzScanList(const QByteArray &input);
-void fuzzVersion(const QByteArray &input);
 
 inline constexpr FuzzTarget kFuzzTargets[] = {
     {"catalogue", fuzzCatalogue},
 #ifndef _WIN32 // where nothing reads ELF files
     {"elf", fuzzElf},
 #endif
-    {"identifier", fuzzIdentifier},
     {"known", fuzzKnown},
     {"marker", fuzzMarker},
-    {"name", fuzzName},
     {"pe", fuzzPe},
     {"scanlist", fuzzScanList},
-    {"version", fuzzVersion},
 };
 
 void require(bool holds, const char *rule);

@@ -19,17 +19,6 @@ namespace {
 const QString kCatalogues = "Effects";
 const QByteArray kSeparator = "\n--- marker\n";
 
-void checkKnown(const KnownList &known)
-{
-    for (const EffectRecord *record : known.all()) {
-        const KnownList::Records own = known.recordsOfPath(record->path);
-        require(std::find(own.begin(), own.end(), record) != own.end(), "each record is its own file's");
-        for (const EffectRecord *each : known.recordsOfFileName("here/" + fileNameOf(record->path)))
-            require(isSamePath(fileNameOf(each->path), fileNameOf(record->path)),
-                    "a record belongs to the file's name");
-    }
-}
-
 /// What a host absorbed from a marker is in the catalogue, where the next one finds it.
 void checkKept(const CatalogueHost &first, CatalogueHost &second, const EffectRecord &crashed)
 {
@@ -60,7 +49,6 @@ void readLeftovers(const CatalogueFormat &format, const QByteArray &catalogue, c
     Host host;
     host.setCatalogueFolder(kCatalogues);
     host.ReadCatalogue();
-    checkKnown(host.known());
     Host next;
     if (!QFile::exists(markerPath))
         checkKept(host, next, crashed);

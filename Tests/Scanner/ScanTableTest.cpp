@@ -12,11 +12,12 @@ namespace {
 // Whole scans, each a few steps. Files of "put" lie in "Plugins", others in the data folder, which "@" stands
 // for; "\n" is a line's end and "." in a list an empty one.
 //   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated
-//   write FILE: TEXT; remove FILE; move FILE FILE
+//   write FILE: TEXT; remove FILE; holds FILE: TEXT
 //   folders FOLDER…               what the scan list names
 //   mark NAME ELEMENT VALUE       as the user does
 //   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
 //   scan [N]                      until no marker survives, which takes N runs (1)
+//   run; markers FILE…            one run, and the markers that survive it
 //   same                          a scan that loads nothing and writes nothing
 //   loaded MODULE…                what the scan loaded, in order
 //   log: TEXT                     what its log holds
@@ -180,6 +181,25 @@ scan
 vst3 Name Enabled Working: Comp|0|0, Comp|0|0, B|1|1
 same
 
+= A crash follows the file and says nothing of a namesake
+put old/Moved.vst3:
+put Pair.vst3: class A | class B | id 00000000000000000000000000000001
+put a/Comp.vst3: class One | fault initialize kill
+put b/Comp.vst3: class Two
+scan 2
+mark Moved Favourite 1
+new Pair.vst3: class A | class B | fault module-entry kill
+scan 2
+remove Plugins/old/Moved.vst3
+put new/Moved.vst3:
+write Effects/1.scan3: <CrashedPlugin><Path>@/Plugins/new/Moved.vst3</Path><Created>2021-03-04 05:06</Created><Name>Moved</Name></CrashedPlugin>
+scan
+loaded .
+remove Plugins/Pair.vst3
+scan
+vst3 Name Enabled Favourite: Comp|0|0, Two|1|0, Moved|0|1
+same
+
 = Markers outlive a catalogue that cannot be written and those of no use do not
 put Comp.vst3:
 write Effects/VST3Configuration.xml/kept: old
@@ -262,14 +282,18 @@ private:
     }
     void markAsUser(const QStringList &words) const
     {
+        bool isMarked = false;
         for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"}) {
             QByteArray text = m_folder.catalogue(file);
             const int record = text.indexOf(words[0].toUtf8() + "</Name>");
             const int value = text.indexOf('<' + words[1].toUtf8() + '>', record) + words[1].size() + 2;
-            if (record >= 0)
-                m_folder.write(QString("Effects/") + file,
-                               text.replace(value, text.indexOf('<', value) - value, words[2].toUtf8()));
+            if (record < 0)
+                continue;
+            m_folder.write(QString("Effects/") + file,
+                           text.replace(value, text.indexOf('<', value) - value, words[2].toUtf8()));
+            isMarked = true;
         }
+        EXPECT_TRUE(isMarked);
     }
     void edit(const QString &file, const QString &from, const QString &to) const
     {

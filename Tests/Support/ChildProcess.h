@@ -24,5 +24,3 @@ struct TerminationWay {
 /// The system's ways to ask a process to end; the first one as the end of the user's session does.
 const std::vector<TerminationWay> &terminationWays();
 void requestTermination(QProcess &process, const TerminationWay &way = terminationWays().front());
-/// The number of the signal that ended a crashed process; 0 where there is no such thing.
-int endingSignal(const QProcess &process);

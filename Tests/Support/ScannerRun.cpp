@@ -117,7 +117,6 @@ void ScannerRun::readOutcome()
     m_outcome.standardOutput = m_process.readAllStandardOutput();
     m_outcome.standardError = m_process.readAllStandardError();
     m_outcome.log = QString::fromUtf8(m_folder.read(QLatin1String(kLogFile)));
-    m_outcome.signal = endingSignal(m_process);
     const bool bySignal = m_process.exitStatus() == QProcess::CrashExit;
     m_outcome.exitCode = bySignal ? -1 : m_process.exitCode();
     m_outcome.crashed = bySignal || m_outcome.exitCode == kSanitizerExit;

@@ -18,7 +18,6 @@ struct ScannerOutcome {
     bool timedOut = false; ///< ended by force at the time limit
     bool crashed = false;  ///< ended by a signal, or by a sanitizer in place of one
     int exitCode = -1;     ///< -1 when a signal ended it
-    int signal = 0;        ///< the signal that ended it, or 0
     QByteArray standardOutput;
     QByteArray standardError;
     QString log; ///< what this run wrote to its debug log

@@ -20,9 +20,3 @@ void requestTermination(QProcess &process, const TerminationWay &way)
     if (process.processId() > 0) // 0, of one that has ended, stands for our own group
         ::kill(static_cast<pid_t>(process.processId()), way.number);
 }
-
-// NOTE: Qt documents no value for a crashed process; on these platforms Qt 5 puts the signal there.
-int endingSignal(const QProcess &process)
-{
-    return process.exitStatus() == QProcess::CrashExit ? process.exitCode() : 0;
-}

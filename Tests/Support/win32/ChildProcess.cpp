@@ -58,5 +58,3 @@ void requestTermination(QProcess &process, const TerminationWay &way)
     Request request = {static_cast<DWORD>(process.processId()), static_cast<UINT>(way.number)};
     EnumWindows(tellWindow, reinterpret_cast<LPARAM>(&request));
 }
-
-int endingSignal(const QProcess &) { return 0; }
