@@ -130,7 +130,7 @@ same
 put A.vst3: class "A &amp; B &lt;" | vendor "C & D"
 put B.vst2: name "E &amp; F"
 scan
-mark &lt; Favourite 1
+mark A &amp; B &lt; Favourite 1
 vst3 Name Vendor: A &amp; B &lt;|C & D
 new A.vst3: class "A &amp; B &lt;" | vendor V
 scan
@@ -180,6 +180,15 @@ write Effects/2.scan3: <CrashedPlugin><Path>@/gone/Same.vst3</Path><Created>2021
 scan
 vst3 Name Enabled Working: Comp|0|0, Comp|0|0, B|1|1
 same
+
+= A child that is switched off does not speak for its shell
+put Shell.vst2: child 1 One | child 2 Two
+scan
+mark One Enabled 0
+new Shell.vst2: child 1 One | child 2 Two | vendor New
+scan
+loaded Shell
+vst2 Name Vendor Enabled: One|Fixture Works|0, Two|New|1
 
 = A crash follows the file and says nothing of a namesake
 put old/Moved.vst3:
@@ -256,7 +265,7 @@ protected:
             {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
             {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(file))); }},
             {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
-            {"mark", [&] { markAsUser(file.split(' ')); }},
+            {"mark", [&] { markAsUser(file); }},
             {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
             {"cut",
              [&] { edit(file, m_folder.read(file).mid(m_folder.read(file).indexOf(text.toUtf8())), {}); }},
@@ -280,20 +289,9 @@ private:
     {
         return QString(statements + '\n').replace(" | ", "\n").toUtf8();
     }
-    void markAsUser(const QStringList &words) const
+    void markAsUser(const QString &words) const
     {
-        bool isMarked = false;
-        for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"}) {
-            QByteArray text = m_folder.catalogue(file);
-            const int record = text.indexOf(words[0].toUtf8() + "</Name>");
-            const int value = text.indexOf('<' + words[1].toUtf8() + '>', record) + words[1].size() + 2;
-            if (record < 0)
-                continue;
-            m_folder.write(QString("Effects/") + file,
-                           text.replace(value, text.indexOf('<', value) - value, words[2].toUtf8()));
-            isMarked = true;
-        }
-        EXPECT_TRUE(isMarked);
+        mark(words.section(' ', 0, -3), words.section(' ', -2, -2).toUtf8(), words.section(' ', -1).toUtf8());
     }
     void edit(const QString &file, const QString &from, const QString &to) const
     {

@@ -146,14 +146,19 @@ QStringList ScanBench::sortedRecords(const char *elements) const
 
 void ScanBench::mark(const QString &name, const char *element, const QByteArray &value) const
 {
-    QByteArray catalogue = m_folder.catalogue(m_catalogue);
-    const int named = catalogue.indexOf("<Name>" + name.toUtf8() + "</Name>");
-    ASSERT_GE(named, 0) << qPrintable(name);
-    const int record = catalogue.lastIndexOf("<Effect>", named);
-    const QByteArray tag = QByteArray("<") + element + '>';
-    const int content = catalogue.indexOf(tag, record) + tag.size();
-    catalogue.replace(content, catalogue.indexOf('<', content) - content, value);
-    m_folder.write("Effects/" + m_catalogue, catalogue);
+    bool isMarked = false;
+    for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"}) {
+        QByteArray catalogue = m_folder.catalogue(file);
+        const int named = catalogue.indexOf("<Name>" + name.toUtf8() + "</Name>");
+        const QByteArray tag = QByteArray("<") + element + '>';
+        const int content = catalogue.indexOf(tag, catalogue.lastIndexOf("<Effect>", named)) + tag.size();
+        if (named < 0)
+            continue;
+        catalogue.replace(content, catalogue.indexOf('<', content) - content, value);
+        m_folder.write(QLatin1String("Effects/") + file, catalogue);
+        isMarked = true;
+    }
+    EXPECT_TRUE(isMarked) << qPrintable(name);
 }
 
 std::map<QString, QByteArray> ScanBench::effectsFolder() const

@@ -15,7 +15,7 @@ QStringList texts(std::initializer_list<const char *> utf8);
 /// depends on the minute in which it runs, and write their calls to one trace.
 class ScanBench : public testing::Test {
 protected:
-    /// `catalogue` is the file that `records` and `mark` look at, `ending` that of a module's name.
+    /// `catalogue` is the file that `records` looks at, `ending` that of a module's name.
     explicit ScanBench(const char *catalogue = "VST3Configuration.xml", const QString &ending = ".vst3");
 
     /// The program under test.
@@ -62,7 +62,7 @@ protected:
     /// The same, sorted.
     QStringList sortedRecords(const char *elements) const;
     /// What the workstation does when the user marks a plug-in: changes one element of the record with the
-    /// name.
+    /// name, in whatever catalogue has one.
     void mark(const QString &name, const char *element, const QByteArray &value) const;
     /// Everything in the "Effects" folder and below, with the files' contents.
     std::map<QString, QByteArray> effectsFolder() const;
