@@ -29,13 +29,11 @@ struct DataFiles {
         : effects(dataFolder + QStringLiteral("/Effects"))
         , log(dataFolder + QStringLiteral("/FxProbe.log"))
         , report(dataFolder + QStringLiteral("/FxProbe.report"))
-        , reasons(dataFolder + QStringLiteral("/fxscan-reasons.json"))
     {}
 
     QString effects;
     QString log;
     QString report;
-    QString reasons;
 };
 
 void complain(const QString &text)
@@ -105,7 +103,7 @@ int conclude(const ScanOptions &options, const ScanSummary &summary, const QStri
 
 int listOnly(const ScanOptions &options, const DataFiles &files)
 {
-    return conclude(options, summariseCatalogue(readCatalogues(files.effects), ReasonStore(files.reasons)),
+    return conclude(options, summariseCatalogue(readCatalogues(files.effects), ProbeMemory(files.effects)),
                     {});
 }
 
@@ -140,10 +138,8 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
     ScanSession session(options, registry, qEnvironmentVariable("FXPROBE_REPORT"));
     const bool isFinished = session.run();
     ScanSummary summary =
-        summariseScan(readCatalogues(files.effects), before, session.account(), ReasonStore(files.reasons));
+        summariseScan(readCatalogues(files.effects), before, session.account(), ProbeMemory(files.effects));
     summary.finished = isFinished;
-    if (const FileResult kept = reasonsToRemember(summary).write(files.reasons); !kept)
-        DebugLog(L"Cannot write %ls: %ls", files.reasons, kept.reason);
     if (!isFinished)
         complain(session.reason());
     return conclude(options, summary, folders);

@@ -6,37 +6,6 @@ namespace {
 
 PluginKey keyOf(const ReportLine &line) { return {line.format, line.path, line.subId}; }
 
-/// What a plug-in was doing in a stage of the report.
-QString stageText(std::optional<ProbeStage> stage)
-{
-    if (!stage)
-        return QString();
-    switch (*stage) {
-    case ProbeStage::Load:
-        return QStringLiteral(" while it was being loaded");
-    case ProbeStage::Start:
-        return QStringLiteral(" while it was starting");
-    case ProbeStage::Ask:
-        return QStringLiteral(" while it was asked for its data");
-    case ProbeStage::Close:
-        return QStringLiteral(" while it was being closed and unloaded");
-    }
-    return QString();
-}
-
-QString blame(const ScannerRunEnd &end, std::optional<ProbeStage> stage)
-{
-    const QString when = stageText(stage);
-    switch (end.how) {
-    case ScannerRunEnd::How::Crashed:
-        return QStringLiteral("it crashed the scanner%1: %2").arg(when, end.text);
-    case ScannerRunEnd::How::TimeLimit:
-        return QStringLiteral("it gave no answer for %1 s%2").arg(end.code).arg(when);
-    default:
-        return QStringLiteral("it ended the scanner with exit code %1%2").arg(end.code).arg(when);
-    }
-}
-
 } // namespace
 
 PluginKey pluginKey(const ScanCulprit &culprit)
@@ -72,10 +41,6 @@ void ScanAccount::takeLine(const ReportLine &line)
     case Event::Begin:
         begin(line);
         break;
-    case Event::Stage:
-        if (!m_open.empty())
-            m_probes[m_open.back()].stage = line.stage;
-        break;
     case Event::End:
     case Event::Skipped:
         end(line);
@@ -87,6 +52,7 @@ void ScanAccount::takeLine(const ReportLine &line)
         addProblem(QStringLiteral("the scan list %1 cannot be used, so nothing was scanned: %2")
                        .arg(line.path, line.reason));
         break;
+    case Event::Stage:
     case Event::Busy:
     case Event::Finished:
     case Event::Ended:
@@ -130,7 +96,7 @@ void ScanAccount::scannerEnded(const ScannerRunEnd &end)
     update();
     for (const ScanCulprit &culprit : end.culprits) {
         ProbeAccount &account = m_probes[pluginKey(culprit)];
-        account.reason = blame(end, account.stage);
+        account.reason = culprit.reason;
         account.records = 0;
     }
 }
@@ -140,12 +106,6 @@ std::vector<PluginKey> ScanAccount::takeBegun()
     std::vector<PluginKey> begun;
     begun.swap(m_begun);
     return begun;
-}
-
-QString ScanAccount::reasonOf(const ScanCulprit &culprit) const
-{
-    const ProbeAccount *account = find(pluginKey(culprit));
-    return account ? account->reason : QString();
 }
 
 const ProbeAccount *ScanAccount::find(const PluginKey &key) const

@@ -7,7 +7,6 @@
 #include <QStringList>
 
 #include <map>
-#include <optional>
 #include <tuple>
 #include <vector>
 
@@ -29,12 +28,11 @@ PluginKey pluginKey(const ScanCulprit &culprit);
 /// What a scan said of one probe.
 struct ProbeAccount {
     QString subName;
-    std::optional<ProbeStage> stage; ///< the last one that it entered; none before the first
-    QString reason;                  ///< why it failed; empty: it did not
-    double milliseconds = -1;        ///< -1: it did not come to its end
-    int records = 0;                 ///< so many plug-ins of it work
-    bool noPlugin = false;           ///< no plug-in of its format
-    bool isLoaded = true;            ///< false: seen without loading it
+    QString reason;           ///< why it failed; empty: it did not
+    double milliseconds = -1; ///< -1: it did not come to its end
+    int records = 0;          ///< so many plug-ins of it work
+    bool noPlugin = false;    ///< no plug-in of its format
+    bool isLoaded = true;     ///< false: seen without loading it
 };
 
 /// Follows the report that scanners write while they work.
@@ -64,8 +62,6 @@ public:
     const QStringList &problems() const { return m_problems; }
 
     const std::map<PluginKey, ProbeAccount> &probes() const { return m_probes; }
-    /// Why a culprit is one.
-    QString reasonOf(const ScanCulprit &culprit) const;
     /// What became of a probe; null when there was none.
     const ProbeAccount *find(const PluginKey &key) const;
     /// Whether the file was probed in any way.

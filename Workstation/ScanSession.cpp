@@ -138,7 +138,7 @@ void ScanSession::takeEnd(const ScannerRunEnd &end)
     m_account.scannerEnded(end);
     for (const ScanCulprit &culprit : end.culprits) {
         m_hasNewCulprit |= m_blamed.insert(pluginKey(culprit)).second;
-        m_progress.say(QStringLiteral("%1: %2").arg(culprit.plugin.path, m_account.reasonOf(culprit)));
+        m_progress.say(QStringLiteral("%1: %2").arg(culprit.plugin.path, culprit.reason));
     }
     if (end.how == ScannerRunEnd::How::NotStarted) {
         m_reason =

@@ -21,7 +21,7 @@ PluginIdentity identityOf(const CataloguedPlugin &plugin)
     return {plugin.format->format, plugin.record.path, id, plugin.record.subId};
 }
 
-QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, const ReasonStore &reasons)
+QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, const ProbeMemory &memory)
 {
     const PluginKey key = keyOf(plugin);
     const PluginKey file{key.format, key.path, 0};
@@ -29,20 +29,23 @@ QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, con
         if (const ProbeAccount *probe = account ? account->find(each) : nullptr;
             probe && !probe->reason.isEmpty())
             return probe->reason;
+    const RememberedProbe *last = memory.find(key.format, key.path);
+    if (const QString reason =
+            last && last->fileTime == plugin.record.fileTime ? last->reasonOf(key.subId) : QString();
+        !reason.isEmpty())
+        return reason;
     if (plugin.isOfCrashedFile)
         return QStringLiteral("its file ended the scanner");
-    if (const QString known = reasons.find(key, plugin.record.fileTime); !known.isEmpty())
-        return known;
     return plugin.state() == PluginState::Disabled ? QStringLiteral("it ended the scanner in an earlier scan")
                                                    : QStringLiteral("it failed in an earlier scan");
 }
 
-void addFailures(ScanSummary &summary, const ScanAccount *account, const ReasonStore &reasons)
+void addFailures(ScanSummary &summary, const ScanAccount *account, const ProbeMemory &memory)
 {
     for (CataloguedPlugin &plugin : summary.plugins) {
         if (plugin.isUsable())
             continue;
-        plugin.reason = reasonOf(plugin, account, reasons);
+        plugin.reason = reasonOf(plugin, account, memory);
         summary.failures.push_back({plugin.format, plugin.state(), plugin.record.name, plugin.record.path,
                                     plugin.record.subId, plugin.reason, true});
     }
@@ -115,40 +118,26 @@ void addSlowest(ScanSummary &summary, const ScanAccount &account)
 
 } // namespace
 
-ScanSummary summariseCatalogue(CatalogueView now, const ReasonStore &reasons)
+ScanSummary summariseCatalogue(CatalogueView now, const ProbeMemory &memory)
 {
     ScanSummary summary;
     summary.plugins = std::move(now.plugins);
     summary.problems = std::move(now.problems);
-    addFailures(summary, nullptr, reasons);
+    addFailures(summary, nullptr, memory);
     return summary;
 }
 
 ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const ScanAccount &account,
-                          const ReasonStore &reasons)
+                          const ProbeMemory &memory)
 {
     ScanSummary summary;
     summary.isScan = true;
     summary.finished = account.isFinished();
     summary.plugins = std::move(now.plugins);
     summary.problems = account.problems() + now.problems;
-    addFailures(summary, &account, reasons);
+    addFailures(summary, &account, memory);
     addUnrecorded(summary, account);
     count(summary, before, account);
     addSlowest(summary, account);
     return summary;
-}
-
-ReasonStore reasonsToRemember(const ScanSummary &summary)
-{
-    ReasonStore store;
-    std::map<PluginKey, QString> fileTimes;
-    for (const CataloguedPlugin &plugin : summary.plugins)
-        fileTimes[keyOf(plugin)] = plugin.record.fileTime;
-    for (const PluginFailure &failure : summary.failures) {
-        const PluginKey key{failure.format->format, failure.path, failure.subId};
-        if (const auto time = fileTimes.find(key); time != fileTimes.end())
-            store.set(key, time->second, failure.reason);
-    }
-    return store;
 }

@@ -1,7 +1,7 @@
 #pragma once
 
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Workstation/CatalogueView.h"
-#include "Workstation/ReasonStore.h"
 #include "Workstation/ScanAccount.h"
 
 /// A plug-in, or a file that was taken for one, that cannot be used.
@@ -36,10 +36,8 @@ struct ScanSummary {
     bool finished = false; ///< the scan came to its end
 };
 
-/// What the catalogue says. `reasons` gives those of earlier scans.
-ScanSummary summariseCatalogue(CatalogueView now, const ReasonStore &reasons);
+/// What the catalogue says. `memory` gives the reasons of earlier probes.
+ScanSummary summariseCatalogue(CatalogueView now, const ProbeMemory &memory);
 /// The same after a scan: `before` is the catalogue as the scan found it.
 ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const ScanAccount &account,
-                          const ReasonStore &reasons);
-/// The reasons to remember for later scans.
-ReasonStore reasonsToRemember(const ScanSummary &summary);
+                          const ProbeMemory &memory);

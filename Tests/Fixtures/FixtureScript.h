@@ -67,8 +67,8 @@ private:
         std::size_t place;
     };
     void add(Words words, const FixtureWords &format);
-    /// The statements of a key that name this stage, and this subject or none; its name is their last word
-    /// but for the first `least`.
+    /// The statements of a key that apply at this stage to this subject. Those of more than `least` words end
+    /// with the subject's name or number; the others apply to all.
     std::vector<Words> ordered(const char *key, const std::string &stage, const FixtureSubject &subject,
                                std::size_t least = 2) const;
 

@@ -136,7 +136,12 @@ new A.vst3: class "A &amp; B &lt;" | vendor V
 scan
 loaded A
 vst3 Name Vendor Favourite: A &amp; B &lt;|V|1
-vst2 Name: E &amp; F
+put C.vst3:
+put C.vst2:
+scan
+loaded C C
+vst3 Name Vendor: A &amp; B &lt;|V, C|Fixture Works
+vst2 Name: E &amp; F, C
 same
 
 = Several killers of both formats need one run each and one more
@@ -206,7 +211,7 @@ scan
 loaded .
 remove Plugins/Pair.vst3
 scan
-vst3 Name Enabled Favourite: Comp|0|0, Two|1|0, Moved|0|1
+vst3 Name Enabled Favourite: Comp|0|0, Two|1|0, Moved|0|0, Moved|0|1
 same
 
 = Markers outlive a catalogue that cannot be written and those of no use do not
@@ -216,6 +221,20 @@ write Effects/Comp.scan3: <CrashedPlugin><Path>@/Plugins/Comp.vst3</Path><Name>C
 write Effects/bad.scan: <CrashedPlugin><Path>/x
 run
 markers Comp.scan3
+
+= A copy is not loaded again while the file that holds its identifiers is there
+put a/Comp.vst3: class A
+put b/Comp.vst3: class A
+scan
+vst3 Name: A
+scan
+loaded .
+remove Plugins/a/Comp.vst3
+write Plugins/a/other: content
+scan
+loaded Comp
+vst3 Name: A
+same
 
 = A plug-in without a record is listed when its fault is gone
 put Comp.vst3: class Comp | answer get-factory null

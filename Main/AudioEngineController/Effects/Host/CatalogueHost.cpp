@@ -93,6 +93,7 @@ void CatalogueHost::ReadCatalogue()
     const TAutoLockCS lock(&m_ks);
     m_known.clear();
     m_leftAlone.clear();
+    m_absorbed.clear();
     m_heldMarkers.clear();
     m_unwrittenMarkers.clear();
     m_written.clear();
@@ -162,6 +163,7 @@ void CatalogueHost::absorbMarker(const EffectRecord &marker)
         m_leftAlone.insert(marker.path);
         return;
     }
+    m_absorbed.push_back(marker);
     EffectRecord &crashed = m_known.applyCrash(marker);
     crashed.id = freeIdentifier(crashed, marker.name);
 }

@@ -57,6 +57,8 @@ public:
     PluginFormat format() const { return m_info.format; }
     const PluginFormatInfo &info() const { return m_info; }
     const KnownList &known() const { return m_known; }
+    /// What the crash markers said that the last reading absorbed.
+    const std::vector<EffectRecord> &absorbed() const { return m_absorbed; }
     /// True for a file that this run must not touch although nothing is recorded about it.
     bool isLeftAlone(const QString &path) const { return m_leftAlone.count(path) != 0; }
     /// True when the effect list holds the identifier.
@@ -113,6 +115,7 @@ private:
     KnownList m_known;
     EffectList m_effects;
     std::set<QString, PathLess> m_leftAlone;
+    std::vector<EffectRecord> m_absorbed;
     QStringList m_heldMarkers;      ///< of files left alone
     QStringList m_unwrittenMarkers; ///< absorbed, but what they say could not be written down
     QByteArray m_written; ///< what this process wrote to the file last; null: nothing since it was read

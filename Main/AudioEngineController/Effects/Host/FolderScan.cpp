@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <exception>
+#include <map>
 
 namespace {
 
@@ -40,6 +41,7 @@ FolderScan::FolderScan(CatalogueHost &host)
     : m_host(host)
     , m_finder(host.fileFinder() ? host.fileFinder()
                                  : std::make_shared<FileFinder>(QStringList(host.info().moduleEnding)))
+    , m_memory(host.catalogueFolder())
 {}
 
 FolderScan::~FolderScan() = default;
@@ -70,8 +72,11 @@ void FolderScan::scan()
         m_host.refillEffects();
         return;
     }
-    m_plan = std::make_unique<ScanPlan>(m_host, m_host.folders(), m_finder->unread());
+    for (const QString &path : modules)
+        m_found.insert(pathKey(path));
+    m_plan = std::make_unique<ScanPlan>(m_host, m_memory, m_host.folders(), m_finder->unread());
     m_plan->decide(modules);
+    rememberCrashes();
     ProbeReport::instance().plan(m_host.format(), static_cast<std::size_t>(modules.size()),
                                  m_plan->items().size());
     addKept();
@@ -149,11 +154,15 @@ void FolderScan::probe(const ScanItem &item)
     m_file = EffectRecord();
     m_file.path = item.path;
     m_file.fileTime = item.fileTime;
+    m_remembered = RememberedProbe();
     m_isTouched = false;
     m_childrenDone = 0;
     ProbeOutcome outcome = m_runner->run(jobOf(item), *this);
     outcome.reason.remove(item.path + QLatin1String(": ")); // the path stands beside it
+    remember(outcome);
     keepOutcome(item, outcome);
+    m_memory.set(m_remembered);
+    writeMemory(false);
     if (m_childrenDone != 0)
         showItemProgress();
 }
@@ -225,7 +234,58 @@ bool FolderScan::addProbed(const ScanItem &item, EffectRecord record, bool isOnl
         m_host.completeFailedRecord(record);
     if (const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly))
         takeMarks(record, *source);
-    return m_host.AddEffect(record);
+    if (m_host.AddEffect(record))
+        return true;
+    const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
+    for (RememberedPlugin &plugin : m_remembered.plugins)
+        if (holder && plugin.id == record.id)
+            plugin.heldBy = holder->path;
+    return false;
+}
+
+/// What a crash marker said that this run absorbed. The launcher, which saw the end, knows more.
+void FolderScan::rememberCrashes()
+{
+    for (const EffectRecord &marker : m_host.absorbed()) {
+        const RememberedProbe *last = m_memory.find(m_host.format(), marker.path);
+        const bool isKnown =
+            last && last->fileTime == marker.fileTime &&
+            (marker.subId == 0 ? last->status == ProbeStatus::Crashed || last->status == ProbeStatus::NoAnswer
+                               : last->reasonOf(marker.subId) != last->reason);
+        if (!isKnown)
+            m_memory.setCrash(m_host.format(), marker, ProbeStatus::Crashed,
+                              QStringLiteral("it ended the scanner"));
+    }
+}
+
+void FolderScan::remember(const ProbeOutcome &outcome)
+{
+    std::map<quint32, QString> reasons;
+    for (const RememberedPlugin &child : m_remembered.plugins)
+        reasons[child.subId] = child.reason;
+    m_remembered.format = m_host.format();
+    m_remembered.path = m_file.path;
+    m_remembered.fileTime = m_file.fileTime;
+    m_remembered.status = outcome.status;
+    m_remembered.stage = outcome.stage;
+    m_remembered.reason = outcome.reason;
+    m_remembered.milliseconds = outcome.milliseconds;
+    m_remembered.plugins.clear();
+    for (const EffectRecord &record : outcome.records)
+        m_remembered.plugins.push_back(
+            {record.id, record.subId, reasons[record.subId], record.inputs, record.outputs, QString()});
+}
+
+/// Failures at once, the rest now and then: what is lost with a process costs time only.
+void FolderScan::writeMemory(bool isLast)
+{
+    constexpr qint64 kPause = 100; // ms
+    const bool isDue = !m_sinceMemory.isValid() || m_sinceMemory.hasExpired(kPause);
+    if (!isDue && !isLast && m_remembered.reason.isEmpty())
+        return;
+    if (const FileResult written = m_memory.write(); !written)
+        DebugLog(L"Cannot write what the probes came to: %ls", written.reason);
+    m_sinceMemory.start();
 }
 
 bool FolderScan::addFailed(const ScanItem &item)
@@ -277,11 +337,23 @@ void FolderScan::finish(bool isWhole)
         for (const EffectRecord *record : m_plan->away())
             if (!m_host.isListed(record->id)) // else a file that is there lists it
                 m_host.AddEffect(*record);
+        forgetGone();
     } else {
         ProbeReport::instance().cancelled();
         collectWaiting(m_done);
     }
     m_written |= m_host.writeIfChanged(m_waiting);
+    writeMemory(true);
+}
+
+void FolderScan::forgetGone()
+{
+    if (!m_plan->hasGone() && m_plan->items().empty())
+        return; // as it was read
+    QSet<QString> there = m_found;
+    for (const EffectRecord *record : m_plan->away())
+        there.insert(pathKey(record->path));
+    m_memory.keepOnly(m_host.format(), [&](const QString &path) { return there.contains(pathKey(path)); });
 }
 
 void FolderScan::stageEntered(ProbeStage stage)
@@ -317,6 +389,7 @@ void FolderScan::childEnds(const ProbeOutcome &outcome)
     if (!outcome.reason.isEmpty())
         DebugLog(L"%ls, %ls: %ls", m_child.path, m_child.subName, outcome.reason);
     ProbeReport::instance().end(m_host.format(), m_child, outcome);
+    m_remembered.plugins.push_back({QString(), m_child.subId, outcome.reason, -1, -1, QString()});
     ++m_childrenDone;
     if (m_progress)
         m_progress->setValue(static_cast<int>(m_childrenDone));

@@ -4,6 +4,9 @@
 #include "Main/AudioEngineController/Effects/Host/ProbeRunner.h"
 #include "Main/AudioEngineController/Effects/Host/ScanPlan.h"
 
+#include <QElapsedTimer>
+#include <QSet>
+
 #include <memory>
 
 class VProgressDisplay;
@@ -34,6 +37,10 @@ private:
     bool addFailed(const ScanItem &item);
     void keepUnchanged(const ScanItem &item);
     bool addProbed(const ScanItem &item, EffectRecord record, bool isOnly);
+    void rememberCrashes();
+    void remember(const ProbeOutcome &outcome);
+    void writeMemory(bool isLast);
+    void forgetGone();
 
     /// Has interim writes carry what is known of the items from one on.
     void collectWaiting(std::size_t from);
@@ -55,10 +62,14 @@ private:
     std::unique_ptr<ScanPlan> m_plan;
     std::unique_ptr<ProbeRunner> m_runner; ///< made for the first item: most scans find nothing new
     std::shared_ptr<VProgressDisplay> m_progress;
+    ProbeMemory m_memory;
+    QElapsedTimer m_sinceMemory; ///< since it was written
+    QSet<QString> m_found;       ///< the modules, by `pathKey`
     WaitingRecords m_waiting;
     std::size_t m_done = 0; ///< items
     bool m_written = false;
 
+    RememberedProbe m_remembered;   ///< of the item at hand
     EffectRecord m_file;            ///< of the item at hand: path and time
     EffectRecord m_child;           ///< the sub-plug-in at hand
     bool m_isTouched = false;       ///< the item at hand has entered its first stage

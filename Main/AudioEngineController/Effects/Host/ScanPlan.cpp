@@ -57,8 +57,10 @@ const EffectRecord *loneFileRecord(const KnownList::Records &records)
 
 } // namespace
 
-ScanPlan::ScanPlan(const CatalogueHost &host, const QStringList &folders, const QStringList &unread)
+ScanPlan::ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const QStringList &folders,
+                   const QStringList &unread)
     : m_host(host)
+    , m_memory(memory)
     , m_unread(unread)
 {
     for (const QString &folder : folders)
@@ -81,6 +83,10 @@ void ScanPlan::decide(const QStringList &modules)
     sortMissing(found);
     for (const KnownFile &gone : m_gone)
         settleGone(gone, modules);
+    if (!m_items.empty() || !m_gone.empty()) { // else there is nothing that a copy may be of
+        leaveOutCopies();
+        askCopiesOfUnsettled();
+    }
     std::stable_partition(m_items.begin(), m_items.end(),
                           [](const ScanItem &item) { return !item.known.empty(); });
 }
@@ -183,18 +189,61 @@ bool ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
     return true;
 }
 
-/// Has modules asked again that were to be kept: what only the gone file listed may be theirs as well.
-void ScanPlan::askAgain(const QStringList &namesakes)
+bool ScanPlan::isKept(const QString &path) const
 {
-    for (const QString &path : namesakes) {
+    return std::any_of(m_kept.begin(), m_kept.end(),
+                       [&](const EffectRecord *record) { return isSamePath(record->path, path); });
+}
+
+/// Has modules asked again that were to be kept: what a gone file listed may be theirs as well.
+void ScanPlan::askAgain(const QStringList &paths)
+{
+    for (const QString &path : paths) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
-        const auto isKept = [&](const EffectRecord *record) { return isSamePath(record->path, path); };
-        if (known.empty() || !known.front()->enabled || m_host.isLeftAlone(path) ||
-            std::none_of(m_kept.begin(), m_kept.end(), isKept))
+        if (known.empty() || !known.front()->enabled || m_host.isLeftAlone(path) || !isKept(path))
             continue;
-        m_kept.erase(std::remove_if(m_kept.begin(), m_kept.end(), isKept), m_kept.end());
+        m_kept.erase(
+            std::remove_if(m_kept.begin(), m_kept.end(),
+                           [&](const EffectRecord *record) { return isSamePath(record->path, path); }),
+            m_kept.end());
         m_items.push_back({path, m_host.moduleTime(path), known, {}});
     }
+}
+
+/// True for a file of which nothing is catalogued because others hold all that it lists, and still do.
+bool ScanPlan::isUnchangedCopy(const ScanItem &item) const
+{
+    if (!item.known.empty() || !item.moved.empty())
+        return false;
+    const RememberedProbe *last = m_memory.find(m_host.format(), item.path);
+    if (!last || last->fileTime != item.fileTime || !last->isCopy())
+        return false;
+    return std::all_of(last->plugins.begin(), last->plugins.end(), [this](const RememberedPlugin &plugin) {
+        const auto holds = [&](const EffectRecord &record) { return record.id == plugin.id; };
+        return isKept(plugin.heldBy) && findIn(m_host.known().recordsOfPath(plugin.heldBy), holds);
+    });
+}
+
+void ScanPlan::leaveOutCopies()
+{
+    m_items.erase(std::remove_if(m_items.begin(), m_items.end(),
+                                 [this](const ScanItem &item) { return isUnchangedCopy(item); }),
+                  m_items.end());
+}
+
+/// Has files asked again that list something which another file held that is gone or asked now.
+void ScanPlan::askCopiesOfUnsettled()
+{
+    QStringList copies;
+    m_memory.forEach(m_host.format(), [&](const RememberedProbe &last) {
+        const bool isUnsettled =
+            std::any_of(last.plugins.begin(), last.plugins.end(), [this](const RememberedPlugin &plugin) {
+                return !plugin.heldBy.isEmpty() && !isKept(plugin.heldBy);
+            });
+        if (isUnsettled)
+            copies.append(last.path);
+    });
+    askAgain(copies);
 }
 
 const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRecord &probed,

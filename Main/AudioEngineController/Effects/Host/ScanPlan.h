@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 
 #include <QSet>
 
@@ -24,8 +25,9 @@ struct ScanItem {
 class ScanPlan {
 public:
     /// The host's known list must not change while the plan is used. `unread` are the folders below `folders`
-    /// of which not all could be read.
-    ScanPlan(const CatalogueHost &host, const QStringList &folders, const QStringList &unread);
+    /// of which not all could be read. `memory` tells which files are copies of others.
+    ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const QStringList &folders,
+             const QStringList &unread);
 
     /// Decides about all modules that were found.
     void decide(const QStringList &modules);
@@ -38,6 +40,9 @@ public:
     const std::vector<ScanItem> &items() const { return m_items; }
     /// Records of files that are away. One whose identifier a probed file lists gives way to it.
     const KnownList::Records &away() const { return m_away; }
+
+    /// Whether files are gone that were known.
+    bool hasGone() const { return !m_gone.empty(); }
 
     /// The old record whose marks a newly probed one takes over; null when there is none. `isOnly`: the
     /// file lists nothing else.
@@ -55,10 +60,15 @@ private:
     void settleGone(const KnownFile &gone, const QStringList &modules);
     ScanItem *bestUnknown(const KnownFile &gone);
     bool moveToCrashed(const KnownFile &gone, const QStringList &namesakes);
-    void askAgain(const QStringList &namesakes);
+    void askAgain(const QStringList &paths);
+    bool isKept(const QString &path) const;
+    bool isUnchangedCopy(const ScanItem &item) const;
+    void leaveOutCopies();
+    void askCopiesOfUnsettled();
     void keep(const KnownList::Records &records);
 
     const CatalogueHost &m_host;
+    const ProbeMemory &m_memory;
     QStringList m_folders; ///< clean
     QStringList m_unread;
     std::map<QString, bool> m_isFolderThere; ///< and searched, with some content

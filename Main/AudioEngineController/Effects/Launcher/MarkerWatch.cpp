@@ -40,8 +40,13 @@ void MarkerWatch::look()
     const Stamps changed = ofRun(stampsOf(allPatterns()));
     const Stamps marker = newestMarker(changed);
     m_hasBegun |= !changed.empty();
-    for (const ReportLine &line : m_report.takeNewLines())
+    for (const ReportLine &line : m_report.takeNewLines()) {
         m_hasReportedItsEnd = line.isLast();
+        if (line.event == ReportLine::Event::Begin)
+            m_lastStage.reset();
+        else if (line.event == ReportLine::Event::Stage)
+            m_lastStage = line.stage;
+    }
     const bool mayBeStuck = !marker.empty() || (m_reportsCourse ? m_hasReportedItsEnd : m_hasBegun);
     const Stamps &now = marker.empty() ? changed : marker;
     m_unchanged = mayBeStuck && now == m_last ? m_unchanged + 1 : 0;

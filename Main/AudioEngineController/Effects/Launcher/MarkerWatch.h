@@ -7,6 +7,7 @@
 #include <QStringList>
 
 #include <map>
+#include <optional>
 
 /// Watches the crash markers of a scanner's run from outside, without absorbing any: tells those that the run
 /// wrote from those that it found, and whether it gets on.
@@ -22,6 +23,9 @@ public:
     /// many looks it has outlived its own report's last line; of a run without a report, for how many nothing
     /// has changed in the folder since it began to work.
     int looksWithoutChange() const { return m_unchanged; }
+
+    /// The last stage that the run reported; none before the first.
+    std::optional<ProbeStage> lastStage() const { return m_lastStage; }
 
     /// All markers that lie in the folder now, of both formats.
     QStringList markers() const;
@@ -41,5 +45,6 @@ private:
     Stamps m_last;
     bool m_hasBegun = false;
     bool m_hasReportedItsEnd = false;
+    std::optional<ProbeStage> m_lastStage;
     int m_unchanged = 0;
 };

@@ -5,6 +5,7 @@
 #include "Main/AudioEngineController/Effects/Launcher/ScannerChild.h"
 #include "Main/AudioEngineController/Effects/Launcher/ScannerProcess.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 
 #include <chrono>
 
@@ -13,14 +14,54 @@ namespace {
 constexpr std::chrono::milliseconds kStartPatience(30000);
 constexpr std::chrono::milliseconds kStep(1000);
 
-std::vector<ScanCulprit> culpritsOf(const QStringList &files)
+/// What a plug-in was doing in the stage that the report told last.
+QString stageText(std::optional<ProbeStage> stage)
 {
-    std::vector<ScanCulprit> culprits;
-    const std::vector<FoundMarker> markers = readMarkers(files);
-    for (const FoundMarker &marker : markers)
-        if (!isExcused(marker, markers))
-            culprits.push_back({marker.format, marker.plugin});
-    return culprits;
+    if (!stage)
+        return QString();
+    switch (*stage) {
+    case ProbeStage::Load:
+        return QStringLiteral(" while it was being loaded");
+    case ProbeStage::Start:
+        return QStringLiteral(" while it was starting");
+    case ProbeStage::Ask:
+        return QStringLiteral(" while it was asked for its data");
+    case ProbeStage::Close:
+        return QStringLiteral(" while it was being closed and unloaded");
+    }
+    return QString();
+}
+
+QString blame(const ScannerRunEnd &end, std::optional<ProbeStage> stage)
+{
+    const QString when = stageText(stage);
+    switch (end.how) {
+    case ScannerRunEnd::How::Crashed:
+        return QStringLiteral("it crashed the scanner%1: %2").arg(when, end.text);
+    case ScannerRunEnd::How::TimeLimit:
+        return QStringLiteral("it gave no answer for %1 s%2").arg(end.code).arg(when);
+    default:
+        return QStringLiteral("it ended the scanner with exit code %1%2").arg(end.code).arg(when);
+    }
+}
+
+/// Names the culprits of a run that has ended, and has the next run and later ones know what they did.
+void findCulprits(const QString &effectsFolder, MarkerWatch &watch, ScannerRunEnd &end)
+{
+    watch.look();
+    ProbeMemory memory(effectsFolder);
+    const std::vector<FoundMarker> markers = readMarkers(watch.markersOfRun());
+    for (const FoundMarker &marker : markers) {
+        if (isExcused(marker, markers))
+            continue;
+        const QString reason = blame(end, watch.lastStage());
+        const bool isTimeLimit = end.how == ScannerRunEnd::How::TimeLimit;
+        end.culprits.push_back({marker.format, marker.plugin, reason});
+        memory.setCrash(marker.format, marker.plugin,
+                        isTimeLimit ? ProbeStatus::NoAnswer : ProbeStatus::Crashed, reason);
+    }
+    if (const FileResult written = memory.write(); !written)
+        DebugLog(L"Cannot write what the probes came to: %ls", written.reason);
 }
 
 void logOutput(ScannerProcess &scanner)
@@ -98,7 +139,7 @@ void ScannerLauncher::waitForEnd(const Job &job, ScannerProcess &scanner, Marker
             scanner.kill();
             end.how = How::TimeLimit;
             end.code = job.probeLimit;
-            end.culprits = culpritsOf(watch.markersOfRun());
+            findCulprits(job.effectsFolder, watch, end);
             return;
         }
     }
@@ -107,7 +148,7 @@ void ScannerLauncher::waitForEnd(const Job &job, ScannerProcess &scanner, Marker
     end.code = scanner.exitCode();
     if (scanner.hasCrashed())
         end.text = ScannerChild::crashText(scanner.exitCode());
-    end.culprits = culpritsOf(watch.markersOfRun());
+    findCulprits(job.effectsFolder, watch, end);
 }
 
 bool ScannerLauncher::isOverLimit(const Job &job, const MarkerWatch &watch) const

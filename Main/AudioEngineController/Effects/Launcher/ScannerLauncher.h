@@ -18,6 +18,7 @@ class ScannerProcess;
 struct ScanCulprit {
     PluginFormat format = PluginFormat::Unknown;
     EffectRecord plugin; ///< path, file time, name and sub-plug-in, as its crash marker says
+    QString reason;      ///< in words, what it did: one phrase
 };
 
 /// How one run of the scanner ended.

@@ -27,3 +27,12 @@ TEST(NameFromPath, TakesOutTheBitnessMarks)
         EXPECT_EQ(record.name, row.name ? row.name : "kept") << row.path;
     }
 }
+
+TEST(EffectList, TakesNothingWithoutAnIdentifier)
+{
+    EffectList list;
+    EffectRecord record;
+    record.name = "Nameless";
+    EXPECT_FALSE(list.add(record));
+    EXPECT_EQ(list.size(), 0u);
+}

@@ -1,0 +1,219 @@
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
+
+#include "Core/BaseLib/Files/NativeFile.h"
+#include "Main/AudioEngineController/Effects/Protocol/ReportLines.h"
+
+#include <QJsonArray>
+#include <QJsonDocument>
+#include <QJsonObject>
+
+#include <algorithm>
+#include <iterator>
+
+namespace {
+
+using namespace ReportWord;
+
+constexpr char kVersion[] = "version";
+constexpr int kThisVersion = 1;
+constexpr char kFileTime[] = "fileTime";
+constexpr char kStatus[] = "status";
+constexpr char kPlugins[] = "plugins";
+constexpr char kId[] = "id";
+constexpr char kInputs[] = "inputs";
+constexpr char kOutputs[] = "outputs";
+constexpr char kHeldBy[] = "heldBy";
+
+/// In the order of `ProbeStatus`.
+constexpr const char *kStatusTexts[] = {"listed",  "failed",    "no plug-in",
+                                        "crashed", "no answer", "cancelled"};
+
+QLatin1String word(const char *text) { return QLatin1String(text); }
+
+/// Inserts what is there: most plug-ins have no reason and no holder.
+void insertText(QJsonObject &object, const char *name, const QString &text)
+{
+    if (!text.isEmpty())
+        object.insert(word(name), text);
+}
+
+QJsonObject jsonOf(const RememberedPlugin &plugin)
+{
+    QJsonObject object;
+    insertText(object, kId, plugin.id);
+    if (plugin.subId != 0)
+        object.insert(word(kSubId), static_cast<qint64>(plugin.subId));
+    insertText(object, kReason, plugin.reason);
+    if (plugin.inputs >= 0)
+        object.insert(word(kInputs), plugin.inputs);
+    if (plugin.outputs >= 0)
+        object.insert(word(kOutputs), plugin.outputs);
+    insertText(object, kHeldBy, plugin.heldBy);
+    return object;
+}
+
+QByteArray render(const RememberedProbe &probe)
+{
+    QJsonArray plugins;
+    for (const RememberedPlugin &plugin : probe.plugins)
+        plugins.append(jsonOf(plugin));
+    QJsonObject object{{word(kFormat), word(formatInfo(probe.format).key)},
+                       {word(kPath), probe.path},
+                       {word(kFileTime), probe.fileTime},
+                       {word(kStatus), word(statusText(probe.status))},
+                       {word(kStage), word(kStages[static_cast<std::size_t>(probe.stage)])},
+                       {word(kMilliseconds), probe.milliseconds}};
+    insertText(object, kReason, probe.reason);
+    if (!plugins.isEmpty())
+        object.insert(word(kPlugins), plugins);
+    return QJsonDocument(object).toJson(QJsonDocument::Compact);
+}
+
+RememberedPlugin pluginOf(const QJsonObject &object)
+{
+    RememberedPlugin plugin;
+    plugin.id = object.value(word(kId)).toString();
+    plugin.subId = static_cast<quint32>(object.value(word(kSubId)).toDouble());
+    plugin.reason = object.value(word(kReason)).toString();
+    plugin.inputs = object.value(word(kInputs)).toInt(-1);
+    plugin.outputs = object.value(word(kOutputs)).toInt(-1);
+    plugin.heldBy = object.value(word(kHeldBy)).toString();
+    return plugin;
+}
+
+/// The place of a text in a table; the first one for a text that is not there.
+template <typename Enum, std::size_t Size>
+Enum enumOf(const QString &text, const char *const (&texts)[Size])
+{
+    const auto found = std::find_if(std::begin(texts), std::end(texts),
+                                    [&](const char *each) { return text == word(each); });
+    return found == std::end(texts) ? Enum{} : static_cast<Enum>(std::distance(std::begin(texts), found));
+}
+
+RememberedProbe probeOf(const QJsonObject &object)
+{
+    RememberedProbe probe;
+    if (const PluginFormatInfo *format = formatOfKey(object.value(word(kFormat)).toString()))
+        probe.format = format->format;
+    probe.path = object.value(word(kPath)).toString();
+    probe.fileTime = object.value(word(kFileTime)).toString();
+    probe.status = enumOf<ProbeStatus>(object.value(word(kStatus)).toString(), kStatusTexts);
+    probe.stage = enumOf<ProbeStage>(object.value(word(kStage)).toString(), kStages);
+    probe.reason = object.value(word(kReason)).toString();
+    probe.milliseconds = object.value(word(kMilliseconds)).toDouble();
+    for (const QJsonValue plugin : object.value(word(kPlugins)).toArray())
+        probe.plugins.push_back(pluginOf(plugin.toObject()));
+    return probe;
+}
+
+} // namespace
+
+const char *statusText(ProbeStatus status) { return kStatusTexts[static_cast<std::size_t>(status)]; }
+
+bool RememberedProbe::isCopy() const
+{
+    return !plugins.empty() &&
+           std::none_of(plugins.begin(), plugins.end(),
+                        [](const RememberedPlugin &plugin) { return plugin.heldBy.isEmpty(); });
+}
+
+QString RememberedProbe::reasonOf(quint32 subId) const
+{
+    for (const RememberedPlugin &plugin : plugins)
+        if (subId != 0 && plugin.subId == subId && !plugin.reason.isEmpty())
+            return plugin.reason;
+    return reason;
+}
+
+ProbeMemory::ProbeMemory(const QString &effectsFolder)
+    : m_file(effectsFolder + QLatin1String(kProbeMemoryFile))
+{}
+
+std::map<ProbeMemory::Key, ProbeMemory::Entry> &ProbeMemory::entries() const
+{
+    if (m_entries)
+        return *m_entries;
+    m_entries.emplace();
+    QByteArray content;
+    if (!readWholeFile(m_file, content))
+        return *m_entries;
+    const QJsonObject root = QJsonDocument::fromJson(content).object();
+    if (root.value(word(kVersion)).toInt() != kThisVersion)
+        return *m_entries;
+    for (const QJsonValue value : root.value(word(kProbes)).toArray()) {
+        const RememberedProbe probe = probeOf(value.toObject());
+        if (probe.format != PluginFormat::Unknown && !probe.path.isEmpty())
+            (*m_entries)[{probe.format, pathKey(probe.path)}] = {probe, {}};
+    }
+    return *m_entries;
+}
+
+const RememberedProbe *ProbeMemory::find(PluginFormat format, const QString &path) const
+{
+    const auto found = entries().find({format, pathKey(path)});
+    return found == entries().end() ? nullptr : &found->second.probe;
+}
+
+void ProbeMemory::forEach(PluginFormat format,
+                          const std::function<void(const RememberedProbe &)> &operation) const
+{
+    for (const auto &[key, entry] : entries())
+        if (key.first == format)
+            operation(entry.probe);
+}
+
+void ProbeMemory::set(const RememberedProbe &probe)
+{
+    entries()[{probe.format, pathKey(probe.path)}] = {probe, {}};
+    m_changed = true;
+}
+
+void ProbeMemory::setCrash(PluginFormat format, const EffectRecord &plugin, ProbeStatus status,
+                           const QString &reason)
+{
+    RememberedProbe probe;
+    if (const RememberedProbe *last = find(format, plugin.path); last && plugin.subId != 0)
+        probe = *last; // its siblings' outcomes stay
+    probe.format = format;
+    probe.path = plugin.path;
+    probe.fileTime = plugin.fileTime;
+    if (plugin.subId == 0) {
+        probe.status = status;
+        probe.reason = reason;
+    } else {
+        const auto isIt = [&](const RememberedPlugin &each) { return each.subId == plugin.subId; };
+        probe.plugins.erase(std::remove_if(probe.plugins.begin(), probe.plugins.end(), isIt),
+                            probe.plugins.end());
+        probe.plugins.push_back({QString(), plugin.subId, reason, -1, -1, QString()});
+    }
+    set(probe);
+}
+
+void ProbeMemory::keepOnly(PluginFormat format, const std::function<bool(const QString &path)> &isKept)
+{
+    for (auto entry = entries().begin(); entry != entries().end();) {
+        const bool stays = entry->first.first != format || isKept(entry->second.probe.path);
+        m_changed |= !stays;
+        entry = stays ? std::next(entry) : entries().erase(entry);
+    }
+}
+
+FileResult ProbeMemory::write()
+{
+    if (!m_changed)
+        return {};
+    QByteArray text = QByteArray("{\"version\":") + QByteArray::number(kThisVersion) + ",\"probes\":[";
+    const char *separator = "\n";
+    for (auto &each : entries()) {
+        Entry &entry = each.second;
+        if (entry.text.isNull())
+            entry.text = render(entry.probe);
+        text += separator;
+        text += entry.text;
+        separator = ",\n";
+    }
+    text += "\n]}\n";
+    const FileResult written = replaceFile(m_file, text, Durability::Buffered);
+    m_changed = !written;
+    return written;
+}
