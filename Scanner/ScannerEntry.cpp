@@ -93,9 +93,7 @@ int runScanner(QApplication &application)
         ProbeReport::instance().finish();
         return kUnusableList;
     }
-    QuillonInterfaceImpl workstation(dataFolder, list.folders);
-    ApplicationContext::instance().quillonInterface = &workstation;
+    const QuillonInterfaceImpl workstation(dataFolder, list.folders);
     runDialog(application, dataFolder, isDefaultPath);
-    ApplicationContext::instance().quillonInterface = nullptr;
     return 0;
 }

@@ -3,7 +3,9 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
 
+#include <QDir>
 #include <QFile>
+#include <QFileInfo>
 
 #include <algorithm>
 #include <array>
@@ -43,6 +45,13 @@ QString badText(const EffectRecord &record)
     return QString();
 }
 
+/// Whether a file is not there because its folder is not, or is empty.
+bool isAway(const QString &path)
+{
+    const QFileInfo file(path);
+    return !file.exists() && (!file.dir().exists() || file.dir().isEmpty());
+}
+
 void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder, CatalogueView &view)
 {
     const QString path = effectsFolder + QLatin1String(format.catalogue->fileName);
@@ -67,7 +76,7 @@ void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder,
     for (const EffectRecord &record : contents.records) {
         if (record.standsForFile() && described.count(record.path) != 0)
             continue; // its plug-ins are shown, each with the reason that the file has
-        view.plugins.push_back({&format, record, QString(), isOfCrashedFile(record)});
+        view.plugins.push_back({&format, record, QString(), isOfCrashedFile(record), isAway(record.path)});
         if (const QString bad = badText(record); !bad.isEmpty())
             view.problems.append(QStringLiteral("%1 is not well-formed XML: %2").arg(path, bad));
     }
@@ -86,12 +95,16 @@ const char *stateText(PluginState state)
         return "disabled";
     case PluginState::SwitchedOff:
         return "switched off";
+    case PluginState::FolderAway:
+        return "folder away";
     }
     return "";
 }
 
 PluginState CataloguedPlugin::state() const
 {
+    if (isAway)
+        return PluginState::FolderAway;
     if (isOfCrashedFile)
         return PluginState::Disabled;
     if (record.isSwitchedOff())

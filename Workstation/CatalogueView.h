@@ -14,6 +14,7 @@ enum class PluginState {
     Failed,      ///< it does not work
     Disabled,    ///< it ended the scanner; it is not loaded any more
     SwitchedOff, ///< by the user
+    FolderAway,  ///< the folder that it lay in is not there, or is empty: on a drive that is unplugged
 };
 
 /// For people and for JSON.
@@ -28,10 +29,12 @@ struct CataloguedPlugin {
     bool isOfCrashedFile = false; ///< another record says that the whole file ended the scanner: it is not
                                   ///< loaded any more
 
+    bool isAway = false; ///< see `PluginState::FolderAway`
+
     PluginState state() const;
     /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
     bool hasWidth() const { return format->catalogue->marker.hasSubId; }
-    bool isUsable() const { return record.working && !isOfCrashedFile; }
+    bool isUsable() const { return record.working && !isOfCrashedFile && !isAway; }
     /// The categories' names, else what the plug-in says of itself.
     QStringList categories() const;
 };

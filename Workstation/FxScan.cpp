@@ -6,12 +6,12 @@
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
+#include "Main/VLib/ApplicationContext.h"
 #include "Workstation/PluginFolders.h"
 #include "Workstation/Retry.h"
 #include "Workstation/ScanSession.h"
 #include "Workstation/SummaryOutput.h"
 #include "Workstation/Terminal.h"
-#include "Workstation/WorkstationInterface.h"
 
 #include <QDeadlineTimer>
 #include <QDir>
@@ -124,7 +124,7 @@ int retry(const ScanOptions &options, const QStringList &folders, PluginHost &re
 
 int scan(const ScanOptions &options, const DataFiles &files, const QStringList &folders)
 {
-    const WorkstationInterface workstation(options.dataFolder, folders);
+    const HostApplication workstation(options.dataFolder, folders);
     PluginHost &registry = PluginHost::instance();
     AudioPlugins::setRegistry(&registry);
     registry.initialise(options.dataFolder, QString(), PluginHost::kDefaultSampleRate,

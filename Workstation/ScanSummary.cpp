@@ -23,6 +23,8 @@ PluginIdentity identityOf(const CataloguedPlugin &plugin)
 
 QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, const ProbeMemory &memory)
 {
+    if (plugin.isAway)
+        return QStringLiteral("the folder that it lay in is not there, or is empty");
     const PluginKey key = keyOf(plugin);
     const PluginKey file{key.format, key.path, 0};
     for (const PluginKey &each : {key, file})

@@ -5,3 +5,16 @@ ApplicationContext &ApplicationContext::instance()
     static ApplicationContext context;
     return context;
 }
+
+HostApplication::HostApplication(const QString &dataFolder, const QStringList &scanFolders)
+    : m_dataFolder(dataFolder)
+    , m_scanFolders(scanFolders)
+{
+    ApplicationContext::instance().quillonInterface = this;
+}
+
+HostApplication::~HostApplication()
+{
+    if (ApplicationContext::instance().quillonInterface == this)
+        ApplicationContext::instance().quillonInterface = nullptr;
+}

@@ -20,14 +20,34 @@ public:
     virtual void pluginListsChanged() = 0;
 };
 
-/// The process-wide access to the host application. Made on first use, from any thread.
+/// The process-wide road to the host application. Made on first use, from any thread.
 class ApplicationContext {
 public:
     static ApplicationContext &instance();
 
-    /// The host application's services, or null before the entry stored them; not owned.
+    /// The host application's services, or null while none are installed; not owned.
     IQuillonInterface *quillonInterface = nullptr;
 
 private:
     ApplicationContext() = default;
+};
+
+/// The host application of a process that has settled its folders: the scanner, or a program that plays the
+/// workstation. Its services are the process's for as long as the object lives.
+class HostApplication : public IQuillonInterface {
+public:
+    HostApplication(const QString &dataFolder, const QStringList &scanFolders);
+    ~HostApplication() override;
+    HostApplication(const HostApplication &) = delete;
+    HostApplication &operator=(const HostApplication &) = delete;
+
+    QString dataFolder() const override { return m_dataFolder; }
+    QStringList scanFolders() const override { return m_scanFolders; }
+    bool isScanner() const override { return false; }
+    /// Nothing: such a program reads the catalogues when a scan is over.
+    void pluginListsChanged() override {}
+
+private:
+    const QString m_dataFolder;
+    const QStringList m_scanFolders;
 };

@@ -5,16 +5,13 @@
 #include <atomic>
 
 /// Plays the application that the registry and its hosts ask, and counts what it is told.
-class TestApplication : public IQuillonInterface {
+class TestApplication : public HostApplication {
 public:
     explicit TestApplication(const QStringList &scanFolders = {}, bool isScanner = false)
-        : folders(scanFolders)
+        : HostApplication(QString(), scanFolders)
+        , folders(scanFolders)
         , scanner(isScanner)
-    {
-        ApplicationContext::instance().quillonInterface = this;
-    }
-    ~TestApplication() override { ApplicationContext::instance().quillonInterface = nullptr; }
-    QString dataFolder() const override { return QString(); }
+    {}
     QStringList scanFolders() const override { return folders; }
     bool isScanner() const override { return scanner; }
     void pluginListsChanged() override { ++changes; }

@@ -39,7 +39,7 @@ TEST(Output, NothingInATextSteersTheTerminal)
 
 TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)
 {
-    CataloguedPlugin plugin{&pluginFormats().front(), {}, {}, false};
+    CataloguedPlugin plugin{&pluginFormats().front(), {}, {}, false, false};
     plugin.record.name = "A \"B\", C";
     plugin.record.vendor = "two\nlines";
     plugin.record.inputs = 2;
