@@ -28,7 +28,7 @@ QStringList namesOfSet(quint32 category)
     return names;
 }
 
-/// The first text of a record that is no XML as it stands.
+/// The first text of a record that is not well-formed XML as it stands.
 QString badText(const EffectRecord &record)
 {
     const struct {

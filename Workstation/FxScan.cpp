@@ -193,7 +193,7 @@ int runFxScan(ScanOptions options)
         ownScanner = std::make_unique<ScanLock>(files.effects);
     prepareEnvironment(options, files);
     if (const QFileInfo report(qEnvironmentVariable("FXPROBE_REPORT")); report.exists() && !report.isFile()) {
-        complain(QStringLiteral("the report %1 is no file").arg(report.filePath()));
+        complain(QStringLiteral("the report %1 is not a file").arg(report.filePath()));
         return ScanExit::kUsage;
     }
     return scan(options, files, folders);

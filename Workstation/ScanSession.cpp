@@ -18,7 +18,7 @@ constexpr qint64 kPatience = 2000; ///< ms that a plug-in in this process gets a
 
 std::atomic<bool> s_isScanningHere{false};
 
-/// A plug-in in this process may call exit(): that is no successful scan.
+/// A plug-in in this process may call exit(): that is not a successful scan.
 void leaveUnfinished()
 {
     if (s_isScanningHere)

@@ -67,7 +67,7 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
     for (const auto &[key, probe] : account.probes()) {
         if (probe.reason.isEmpty() || recorded.count({key.format, key.path}) != 0)
             continue;
-        // What lies in a bundle of the other format is no plug-in of this one, and nobody thinks so.
+        // Nobody takes what lies in a bundle of the other format for a plug-in of this one.
         if (probe.noPlugin && key.path.contains(QLatin1String(".vst3/Contents/"), Qt::CaseInsensitive))
             continue;
         const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;

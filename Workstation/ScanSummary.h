@@ -25,7 +25,7 @@ struct ProbeTime {
 struct ScanSummary {
     std::vector<CataloguedPlugin> plugins;
     std::vector<PluginFailure> failures;
-    std::vector<PluginFailure> noPlugins; ///< files that look like plug-ins and are none
+    std::vector<PluginFailure> noPlugins; ///< files that look like plug-ins and are not
     QStringList problems;                 ///< one sentence each
     std::vector<ProbeTime> slowest;       ///< the slowest first
     QStringList removed;                  ///< names of what is gone

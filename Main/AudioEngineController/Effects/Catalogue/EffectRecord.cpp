@@ -49,7 +49,7 @@ bool NameFromPath(EffectRecord &record)
     if (dot < 0)
         return false;
     const int start = record.path.lastIndexOf(QLatin1Char('/')) + 1;
-    // A "." in a folder's name is no ending of the file's.
+    // A "." in a folder's name is not the start of the file's ending.
     QString name = dot < start ? record.path.mid(start) : record.path.mid(start, dot - start);
     for (const QLatin1String mark : {QLatin1String("x64"), QLatin1String("_64"), QLatin1String(" 64bit")}) {
         const int at = name.indexOf(mark);

@@ -23,7 +23,7 @@ struct EffectRecord {
     qint32 width = 0;       ///< VST 2: channel width
     qint32 latency = 0;     ///< VST 2: samples
     QString subName;        ///< VST 2: name of a shell's sub-plug-in
-    quint32 subId = 0;      ///< VST 2: identifier of a shell's sub-plug-in; 0: it is none
+    quint32 subId = 0;      ///< VST 2: identifier of a shell's sub-plug-in; 0: it is not one
 
     /// True for what a crash marker made of a whole file: disabled and not working.
     bool isCrashedFile() const { return !enabled && !working && subId == 0; }

@@ -43,7 +43,7 @@ struct ScannerRunEnd {
 /// one before. The launcher knows nothing of catalogues; `PluginHost` runs it on a thread of its own.
 class ScannerLauncher {
 public:
-    /// So often the scanner is run; markers that survive even then are left for the next scan.
+    /// Maximum number of scanner runs; markers that survive even then are left for the next scan.
     static constexpr int kMaxRuns = 10;
 
     /// What the runs need. `program` and `scanList` are full paths.

@@ -24,7 +24,7 @@ QString usableFileName(QString name)
     for (QChar &character : name)
         if (character < QLatin1Char(' ') || QLatin1String("<>:\"/\\|?*").contains(character))
             character = QLatin1Char('_');
-    // A name that starts with a dot would be hidden, and its marker never found; a device is no file.
+    // A name that starts with a dot would be hidden, and its marker never found; a device is not a file.
     const bool isUnusable = name.isEmpty() || name.startsWith(QLatin1Char('.')) || isDeviceName(name);
     return isUnusable ? QLatin1Char('_') + name : name;
 }

@@ -47,7 +47,7 @@ QByteArray writeParameterList(const std::vector<VSTStoredParameter> &parameters)
 std::optional<std::vector<VSTStoredParameter>> readParameterList(const QByteArray &data, QString &reason)
 {
     if (data.size() < kHeaderSize || numberAt(data, 0) != kFormat) {
-        reason = QStringLiteral("it is no parameter list");
+        reason = QStringLiteral("it is not a parameter list");
         return std::nullopt;
     }
     const quint32 count = numberAt(data, 4);

@@ -195,7 +195,7 @@ bool VSTPlugin::LoadPreset(const PluginPreset &preset)
         identifiers.append(identifierPrefix() + m_requestedKey);
     const auto restore = [&] {
         VSTHostContext &context = VSTHostContext::instance();
-        context.setIgnored(this); // what a plug-in tells about itself meanwhile is no news to anybody
+        context.setIgnored(this); // nobody needs to hear what a plug-in reports about itself meanwhile
         const auto ignoring = qScopeGuard([&] { context.stopIgnoring(this); });
         return m_presets.restore(preset, identifiers);
     };

@@ -51,7 +51,7 @@ bool VSTPresets::captureParameters(PluginPreset &preset)
         const QByteArray name = storedName(m_parameters.name(index));
         const std::optional<float> value = m_effect.isCallable() ? m_effect.parameter(index) : std::nullopt;
         if (!value)
-            return false; // half of a state is none
+            return false; // half of a state is not a state
         parameters.push_back({name, *value});
     }
     preset.data = writeParameterList(parameters);

@@ -17,8 +17,9 @@ struct VST3PluginSettings {
 
 /// The speakers of a bus format, or of a number of discrete channels (`kDiscreteChannels` added), and where
 /// its channels go. The map is set to that of a named format, extended by that of discrete channels, and left
-/// alone by a code that is none, which gives stereo. A format wider than the plug-in's limit is replaced by a
-/// limited one where there is one, with a log line; the map stays that of the format. Any thread.
+/// alone by a code that is not in the table, which gives stereo. A format wider than the plug-in's limit is
+/// replaced by a limited one where there is one, with a log line; the map stays that of the format. Any
+/// thread.
 Steinberg::Vst::SpeakerArrangement arrangementFor(int formatCode, VST3ChannelMap &channelMap,
                                                   const VST3PluginSettings &pluginSettings);
 

@@ -120,7 +120,7 @@ TEST_F(VSTPreset, WhatDoesNotBelongIsRefusedWithAReason)
                 {{}, 0, own, "it holds no data"},
                 {good, 1, own, "no state of its own"},
                 {good, 2, own, "of an unknown kind"},
-                {QByteArray(good).replace(0, 1, "3"), 0, own, "no parameter list"},
+                {QByteArray(good).replace(0, 1, "3"), 0, own, "not a parameter list"},
                 {QByteArray(good).replace(7, 1, "\x7F"), 0, own, "144 bytes for 2130706434"},
                 {good.left(8) + QByteArray(64, 'A') + good.mid(72), 0, own, "parameter 0 does not end"}};
     auto plugin = loaded("parameter A\nparameter B");
