@@ -95,15 +95,12 @@ void ScanPlan::decideModule(const QString &path)
 {
     KnownList::Records known = m_host.known().recordsOfPath(path);
     const QString fileTime = m_host.moduleTime(path);
-    if (m_host.isLeftAlone(path))
+    const bool isAbsent = fileTime.isEmpty(); // not a module after all; unless nobody lets us see
+    if (m_host.isLeftAlone(path) || (isAbsent && cannotBeExamined(path)) ||
+        (!isAbsent && !known.empty() && !isOutdated(*known.front(), fileTime)))
         keep(known);
-    else if (fileTime.isEmpty()) { // not a module after all; unless nobody lets us see
-        if (cannotBeExamined(path))
-            keep(known);
-    } else if (known.empty() || isOutdated(*known.front(), fileTime))
+    else if (!isAbsent)
         m_items.push_back({path, fileTime, std::move(known), {}});
-    else
-        keep(known);
 }
 
 void ScanPlan::sortMissing(const QSet<QString> &found)

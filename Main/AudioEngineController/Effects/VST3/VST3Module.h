@@ -41,7 +41,7 @@ public:
     /// Exceptions of the module leave this.
     Steinberg::IPluginFactory *factory();
     /// Gives the caller a reference to the factory; nothing when there is one that can be used.
-    std::optional<VST3Failure> queryFactory(Steinberg::IPluginFactory *&factory);
+    std::optional<VST3Failure> queryFactory(Steinberg::IPluginFactory *&found);
     /// Releases the factory, ends the module and unloads it. True when it left threads running, for which it
     /// stays mapped. Exceptions of the module are logged and go no further.
     bool close();
