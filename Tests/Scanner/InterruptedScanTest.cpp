@@ -80,8 +80,9 @@ TEST_F(SecondScanner, LeavesABusyFolderAlone)
     const auto before = effectsFolder();
     const QStringList traceBefore = trace();
     // Those that do not exist here name no folder, and nothing happens at all.
-    for (const QString &scanList : {m_folder.scanList(), m_folder.path("Effects/../Effects/FXScan.xml"),
-                                    link + "/Effects/FXScan.xml", m_folder.scanList().toUpper()}) {
+    for (const QString &scanList :
+         {m_folder.scanList(), m_folder.path("Effects/../Effects/FXScan.xml"), link + "/Effects/FXScan.xml",
+          m_folder.dataFolder().toUpper() + "/Effects/FXScan.xml"}) {
         SCOPED_TRACE(qPrintable(scanList));
         ScannerRun second(scannerProgram(), m_folder);
         second.setArguments({scanList});
