@@ -2,77 +2,80 @@
 
 #include <QStringList>
 
-#include <cstring>
+#include <algorithm>
+#include <optional>
+#include <string>
+#include <string_view>
 
 namespace {
 
 constexpr char kHeader[] = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>";
 constexpr char kRootStart[] = "<Effects version=\"";
 constexpr char kRootEnd[] = "\">";
+constexpr char kRecordEnd[] = "\t</Effect>";
 
 /// A place in a text that moves on over what is expected there.
 class Lines {
 public:
     explicit Lines(const QByteArray &text)
-        : m_text(text)
+        : m_text(text.constData(), static_cast<std::size_t>(text.size()))
     {
-        const int firstEnd = text.indexOf('\n');
-        m_lineEnd = firstEnd > 0 && text.at(firstEnd - 1) == '\r' ? "\r\n" : "\n";
+        const std::size_t firstEnd = m_text.find('\n');
+        const bool hasReturns = firstEnd != 0 && firstEnd != m_text.npos && m_text[firstEnd - 1] == '\r';
+        m_lineEnd = hasReturns ? "\r\n" : "\n";
     }
 
-    bool startsWith(const char *expected) const
+    std::string_view lineEnd() const { return m_lineEnd; }
+    bool startsWith(std::string_view expected) const
     {
-        return std::strncmp(m_text.constData() + m_at, expected, std::strlen(expected)) == 0;
+        return m_text.compare(m_at, expected.size(), expected) == 0;
     }
-    bool take(const char *expected)
+    bool take(std::string_view expected)
     {
         if (!startsWith(expected))
             return false;
-        m_at += static_cast<int>(std::strlen(expected));
+        m_at += expected.size();
         return true;
     }
-    bool takeLine(const char *line) { return take(line) && take(m_lineEnd); }
+    bool takeLine(std::string_view line) { return take(line) && take(m_lineEnd); }
     bool isAtEnd() const { return m_at == m_text.size(); }
 
-    /// The bytes up to a line's end that reads `closing`, and moves behind that line's end; null when there
-    /// is none. `isNext` says whether what follows may follow: a text may look like an end itself.
+    /// The bytes up to `end`, which has the end of its line; moves behind it. Nothing, and no move, when
+    /// there is no end behind which `isNext` holds: a text may look like an end itself.
     template <typename IsNext>
-    ElementContent takeUntil(const char *closing, bool &found, IsNext &&isNext)
+    std::optional<ElementContent> takeUntil(std::string_view end, IsNext &&isNext)
     {
-        const QByteArray end = QByteArray(closing) + m_lineEnd;
-        const int start = m_at;
-        for (int at = m_text.indexOf(end, start); at >= 0; at = m_text.indexOf(end, at + 1)) {
+        const std::size_t start = m_at;
+        for (std::size_t at = m_text.find(end, start); at != m_text.npos; at = m_text.find(end, at + 1)) {
             m_at = at + end.size();
-            if (!isNext())
-                continue;
-            found = true;
-            return {m_text.constData() + start, at - start};
+            if (isNext())
+                return ElementContent(m_text.data() + start, static_cast<int>(at - start));
         }
         m_at = start;
-        found = false;
-        return {};
+        return std::nullopt;
     }
 
 private:
-    const QByteArray &m_text;
-    const char *m_lineEnd;
-    int m_at = 0;
+    std::string_view m_text;
+    std::string_view m_lineEnd;
+    std::size_t m_at = 0;
 };
 
 /// The tags of an element of a format, spelt once.
 struct ElementTags {
     const CatalogueElement *element;
-    QByteArray opening; ///< with its indentation
-    QByteArray closing;
+    std::string opening; ///< with its indentation
+    std::string closing; ///< with the end of its line
 };
 
-std::vector<ElementTags> tagsOf(const CatalogueFormat &format)
+std::vector<ElementTags> tagsOf(const CatalogueFormat &format, std::string_view lineEnd)
 {
     std::vector<ElementTags> tags;
-    for (const CatalogueElement &element : format.elements)
+    for (const CatalogueElement &element : format.elements) {
+        const std::string name = std::string(element.name) + '>';
         if (element.content)
-            tags.push_back(
-                {&element, QByteArray("\t\t<") + element.name + '>', QByteArray("</") + element.name + '>'});
+            tags.push_back({&element, "\t\t<" + name, "</" + name + std::string(lineEnd)});
+    }
     return tags;
 }
 
@@ -80,22 +83,19 @@ std::vector<ElementTags> tagsOf(const CatalogueFormat &format)
 bool takeElements(Lines &lines, const std::vector<ElementTags> &tags, EffectRecord &record)
 {
     for (auto tag = tags.begin(); tag != tags.end(); ++tag) {
-        if (!lines.take(tag->opening.constData()))
+        if (!lines.take(tag->opening))
             continue; // left out: only what a plug-in does not have is
         const auto isNext = [&] {
-            for (auto later = tag + 1; later != tags.end(); ++later)
-                if (lines.startsWith(later->opening.constData()))
-                    return true;
-            return lines.startsWith("\t</Effect>");
+            const auto isOpened = [&](const ElementTags &later) { return lines.startsWith(later.opening); };
+            return std::any_of(tag + 1, tags.end(), isOpened) || lines.startsWith(kRecordEnd);
         };
-        bool found = false;
-        const ElementContent content = lines.takeUntil(tag->closing.constData(), found, isNext);
-        if (!found)
+        const std::optional<ElementContent> content = lines.takeUntil(tag->closing, isNext);
+        if (!content)
             return false;
         if (tag->element->read)
-            tag->element->read(record, content);
+            tag->element->read(record, *content);
     }
-    return lines.takeLine("\t</Effect>");
+    return lines.takeLine(kRecordEnd);
 }
 
 } // namespace
@@ -104,13 +104,14 @@ CatalogueLines readCatalogueLines(const CatalogueFormat &format, const QByteArra
 {
     CatalogueLines read;
     Lines lines(content);
-    bool hasVersion = false;
     if (!lines.takeLine(kHeader) || !lines.take(kRootStart))
         return read;
-    read.version = lines.takeUntil(kRootEnd, hasVersion, [] { return true; }).text();
-    if (!hasVersion)
+    const std::optional<ElementContent> version =
+        lines.takeUntil(kRootEnd + std::string(lines.lineEnd()), [] { return true; });
+    if (!version)
         return read;
-    const std::vector<ElementTags> tags = tagsOf(format);
+    read.version = version->text();
+    const std::vector<ElementTags> tags = tagsOf(format, lines.lineEnd());
     while (lines.takeLine("\t<Effect>")) {
         EffectRecord record;
         if (!takeElements(lines, tags, record))
@@ -127,12 +128,12 @@ bool readScanListLines(const QByteArray &content, QStringList &folders)
     if (!lines.takeLine(kHeader) || !lines.takeLine("<Scan>"))
         return false;
     const auto isNext = [&] { return lines.startsWith("\t<Path>") || lines.startsWith("</Scan>"); };
+    const std::string closing = "</Path>" + std::string(lines.lineEnd());
     while (lines.take("\t<Path>")) {
-        bool found = false;
-        const ElementContent folder = lines.takeUntil("</Path>", found, isNext);
-        if (!found)
+        const std::optional<ElementContent> folder = lines.takeUntil(closing, isNext);
+        if (!folder)
             break;
-        folders.append(folder.text());
+        folders.append(folder->text());
     }
     if (lines.takeLine("</Scan>") && lines.isAtEnd())
         return true;

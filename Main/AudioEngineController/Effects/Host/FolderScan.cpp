@@ -191,7 +191,7 @@ void FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
     else if (outcome.status == ProbeStatus::Failed)
         keepUnchanged(item);
     log(item, outcome);
-    if (m_waiting.empty() && added)
+    if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
     for (const KnownList::Records &records : {item.known, item.moved})
         for (const EffectRecord *record : records) {
@@ -316,6 +316,7 @@ void FolderScan::keepUnchanged(const ScanItem &item)
 
 void FolderScan::collectWaiting(std::size_t from)
 {
+    m_hasCollected = true;
     std::set<QString, PathLess> settled;
     const std::vector<ScanItem> &items = m_plan->items();
     for (std::size_t index = 0; index < std::min(from, items.size()); ++index) {

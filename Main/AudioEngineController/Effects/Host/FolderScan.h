@@ -66,7 +66,8 @@ private:
     QElapsedTimer m_sinceMemory; ///< since it was written
     QSet<QString> m_found;       ///< the modules, by `pathKey`
     WaitingRecords m_waiting;
-    std::size_t m_done = 0; ///< items
+    bool m_hasCollected = false; ///< what waits, for the first interim write
+    std::size_t m_done = 0;      ///< items
     bool m_written = false;
 
     RememberedProbe m_remembered;   ///< of the item at hand
