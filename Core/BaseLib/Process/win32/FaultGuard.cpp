@@ -87,12 +87,34 @@ fxprobeGuardReturn:
 
 namespace {
 
+/// NOTE: Wine commits a stack whole, with its guard on the last page, and keeps it there whatever was asked
+/// for. An overflow is then raised where nothing can handle it, and Wine ends the thread. So the guard is put
+/// where Windows has it.
+void guardReserve()
+{
+    MEMORY_BASIC_INFORMATION stack = {}, reserve = {};
+    SYSTEM_INFO system = {};
+    GetSystemInfo(&system);
+    VirtualQuery(&stack, &stack, sizeof stack);
+    // Below it lies the page that nothing may touch.
+    auto *start = static_cast<std::byte *>(stack.AllocationBase) + system.dwPageSize;
+    auto *end = start + kOverflowReserve;
+    VirtualQuery(end - 1, &reserve, sizeof reserve);
+    const bool isOpen = reserve.State == MEM_COMMIT && (reserve.Protect & PAGE_GUARD) == 0;
+    DWORD before = 0;
+    if (isOpen && reinterpret_cast<std::byte *>(&stack) > end)
+        VirtualProtect(start, kOverflowReserve, PAGE_READWRITE | PAGE_GUARD, &before);
+}
+
 /// Once for each thread: an overflow leaves too little room to find the guard's frame in.
 void reserveForOverflow()
 {
     thread_local const bool reserved = [] {
         ULONG size = kOverflowReserve;
-        return SetThreadStackGuarantee(&size) != 0;
+        const bool granted = SetThreadStackGuarantee(&size) != 0;
+        if (granted)
+            guardReserve();
+        return granted;
     }();
     static_cast<void>(reserved);
 }

@@ -1,5 +1,7 @@
 #include "Core/BaseLib/Process/PluginThread.h"
 
+#include "Core/BaseLib/Process/FaultGuard.h"
+
 #include <windows.h>
 
 #include <mmsystem.h>
@@ -19,7 +21,11 @@ PluginThread::PluginThread()
     // Starts the system's timer thread now. Qt would have it started and ended whenever it draws the window;
     // a thread that starts during a probe would be taken for the plug-in's.
     , m_timer(timeSetEvent(kTimerPeriod, kTimerPeriod, doNothing, 0, TIME_PERIODIC))
-{}
+{
+    // Makes room on this stack for handling its overflow before the first module is loaded, which is not
+    // guarded.
+    callGuarded([] {});
+}
 
 PluginThread::~PluginThread()
 {

@@ -40,6 +40,17 @@ TEST(FaultGuard, FaultsBecomeExceptionsAgainAndAgain)
     worker.join();
 }
 
+TEST(FaultGuard, ContainsTheFirstStackOverflowOfAThreadWhateverTheFrames)
+{
+    int (*const recursions[])(int) = {overflowStack<256>, overflowStack<1024>, overflowStack<2048>,
+                                      overflowStack<8192>, overflowStack<65536>};
+    for (std::size_t row = 0; row < std::size(recursions); ++row) {
+        std::string result = "the thread was ended";
+        std::thread([&] { result = outcome([&] { recursions[row](0); }); }).join();
+        EXPECT_EQ(result, kOverflowOutcome) << "row " << row;
+    }
+}
+
 TEST(FaultGuard, GuardsNestAndATranslatedCallLetsFaultsOut)
 {
     std::string inner, translated = "not ended";

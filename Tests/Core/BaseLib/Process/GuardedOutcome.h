@@ -15,11 +15,13 @@ inline int *volatile g_nowhere = nullptr; ///< volatile, so that the compiler ca
 
 [[gnu::no_sanitize("all")]] inline void writeNowhere() { *g_nowhere = 1; }
 
-[[gnu::noinline]] inline int overflowStack(int depth)
+/// Recurses with frames of `size` bytes and a little more.
+template <int size = 4096>
+[[gnu::noinline, gnu::no_sanitize("all")]] int overflowStack(int depth)
 {
-    volatile char block[4096] = {};
-    block[depth % 4096] = char(depth);
-    return depth < 0 ? 0 : overflowStack(depth + 1) + block[0];
+    volatile char block[size] = {};
+    block[depth % size] = char(depth);
+    return depth < 0 ? 0 : overflowStack<size>(depth + 1) + block[0];
 }
 
 /// What came of a guarded call.
