@@ -10,6 +10,9 @@ int main(int argc, char **argv)
     configureLogFromEnvironment();
     int exitCode = 0;
     {
+        // Sizes are those of an ordinary display; also 150% must give neither 100% nor 200%.
+        QApplication::setAttribute(Qt::AA_EnableHighDpiScaling);
+        QApplication::setHighDpiScaleFactorRoundingPolicy(Qt::HighDpiScaleFactorRoundingPolicy::PassThrough);
         QApplication application(argc, argv);
         settleLocale();
         exitCode = runScanner(application);

@@ -4,6 +4,7 @@
 #include "Core/BaseLib/Process/PluginThread.h"
 #include "Core/BaseLib/Process/ProcessSetup.h"
 #include "Core/BaseLib/Process/TerminationRequest.h"
+#include "Main/VLib/ElidedLabel.h"
 #include "Main/VLib/FxProbeUI.h"
 #include "Main/VLib/ScreenLoss.h"
 #include "Main/VLib/SimpleGUI.h"
@@ -11,8 +12,7 @@
 
 #include <QAccessible>
 #include <QCloseEvent>
-#include <QCoreApplication>
-#include <QLabel>
+#include <QGuiApplication>
 #include <QProgressBar>
 #include <QScopeGuard>
 #include <QTimer>
@@ -20,12 +20,14 @@
 
 #include <cxxabi.h>
 
+#include <algorithm>
 #include <utility>
 
 namespace {
 
 constexpr int kWidth = 333;
 constexpr int kHeight = 80;
+constexpr int kPlainResolution = 96; ///< dots per inch of a display at 100%
 constexpr int kTickMilliseconds = 50;
 constexpr std::chrono::milliseconds kPollInterval(10);
 constexpr wchar_t kThreadEnded[] = L"The scan's thread was ended by a plug-in";
@@ -49,6 +51,13 @@ QPalette labelPalette()
         for (const auto role : {QPalette::WindowText, QPalette::Text, QPalette::ButtonText})
             palette.setBrush(group, role, brush);
     return palette;
+}
+
+/// Other platforms answer such a request with a warning.
+bool canComeToFront()
+{
+    const QString platform = QGuiApplication::platformName();
+    return platform == QLatin1String("xcb") || platform == QLatin1String("windows");
 }
 
 } // namespace
@@ -96,6 +105,7 @@ void UiFxProbe::setUpWidgets()
     setUpWindow();
     setUpLabel();
     setUpProgressBar();
+    fixSize();
     setWindowTitle(QCoreApplication::translate("FxProbeClass", "Quillon Audio FX"));
     m_label->setText(QString());
     QMetaObject::connectSlotsByName(this);
@@ -105,9 +115,6 @@ void UiFxProbe::setUpWindow()
 {
     if (objectName().isEmpty())
         setObjectName(QStringLiteral("FxProbeClass"));
-    resize(kWidth, kHeight);
-    setMinimumSize(kWidth, kHeight);
-    setMaximumSize(kWidth, kHeight);
     setStyleSheet(QStringLiteral("QDialog {background-color:rgb(55, 57, 62);\nborder: 1px solid black; }\n"));
     m_layout = new QVBoxLayout(this);
     m_layout->setSpacing(6);
@@ -118,7 +125,7 @@ void UiFxProbe::setUpWindow()
 
 void UiFxProbe::setUpLabel()
 {
-    m_label = new QLabel(this);
+    m_label = new ElidedLabel(this);
     m_label->setObjectName(QStringLiteral("label"));
     m_label->setPalette(labelPalette());
     QFont font;
@@ -143,6 +150,14 @@ void UiFxProbe::setUpProgressBar()
     m_progressBar->setValue(24);
     m_progressBar->setTextVisible(false);
     m_layout->addWidget(m_progressBar);
+}
+
+// Fonts follow the display's resolution, also where Qt does not scale windows by it. Only whole quarters
+// count: a platform without a screen pretends to have an odd one.
+void UiFxProbe::fixSize()
+{
+    const int quarters = std::max(4, 4 * logicalDpiY() / kPlainResolution);
+    setFixedSize(kWidth * quarters / 4, kHeight * quarters / 4);
 }
 
 // The exception of a forced unwind has no object, so the reference to it is null; that is how the compiler
@@ -187,7 +202,9 @@ void UiFxProbe::run(QCoreApplication &application, bool defaultPath)
     if (defaultPath)
         m_status->requestShow();
     else
-        setWindowState(Qt::WindowMinimized);
+        // Not setWindowState: on X11 it creates the window at once, and taking the state back would then map
+        // it before it has the hint that keeps it on top.
+        overrideWindowState(Qt::WindowMinimized);
     auto *timer = new QTimer(this);
     connect(timer, &QTimer::timeout, this, &UiFxProbe::OnTimer);
     timer->start(kTickMilliseconds);
@@ -214,8 +231,10 @@ void UiFxProbe::showWindow()
 {
     setWindowState(Qt::WindowNoState);
     show();
-    raise();
-    activateWindow();
+    if (canComeToFront()) {
+        raise();
+        activateWindow();
+    }
 }
 
 void UiFxProbe::showPendingStatus()

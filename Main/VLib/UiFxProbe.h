@@ -7,9 +7,9 @@
 #include <memory>
 #include <thread>
 
+class ElidedLabel;
 class FxProbeUI;
 class QCoreApplication;
-class QLabel;
 class QProgressBar;
 class QVBoxLayout;
 class ScreenLoss;
@@ -71,6 +71,7 @@ private:
     void setUpWindow();
     void setUpLabel();
     void setUpProgressBar();
+    void fixSize();
     void runScan(const std::function<void(const QString &)> &scanRun);
     void markFinished();
     /// Also notices that a plug-in ended the thread.
@@ -80,7 +81,7 @@ private:
     void endEventLoop();
 
     QVBoxLayout *m_layout = nullptr;
-    QLabel *m_label = nullptr;
+    ElidedLabel *m_label = nullptr;
     QProgressBar *m_progressBar = nullptr;
     QString m_dataFolder;
     std::shared_ptr<StatusHandover> m_status;
