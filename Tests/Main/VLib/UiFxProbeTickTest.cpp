@@ -61,6 +61,17 @@ TEST(UiFxProbeTick, LongAndOddTextsAreShownAsTheyAre)
     EXPECT_GT(widthOf(QString(550, 'W')), 333);
 }
 
+TEST(UiFxProbeTick, ATextThatIsTooLongKeepsItsEnd)
+{
+    HeldScan scan;
+    const auto picture = [&](const QString &text) {
+        scan.label().setText(text);
+        return scan.label().grab().toImage();
+    };
+    for (const QString &name : {QString("Shelving EQ ").repeated(40), QString("\u97F3\u91CF").repeated(200)})
+        EXPECT_NE(picture(name + "A"), picture(name + "B")) << qPrintable(name);
+}
+
 TEST(UiFxProbeTick, ShowsTheWindowOnceWhenAsked)
 {
     HeldScan scan;

@@ -88,6 +88,24 @@ TEST_F(OnScreen, WithNothingToProbeNoWindowAppears)
     EXPECT_EQ(m_screen.takeAppeared(), 0);
 }
 
+TEST_F(OnScreen, TheWindowStaysOnTopOfOthers)
+{
+    if (!m_screen.startWindowManager())
+        GTEST_SKIP() << "IceWM did not start";
+    put(kComp + ".vst3", "delay initialize 3000\n");
+    ASSERT_TRUE(m_scanner.start());
+    EXPECT_TRUE(
+        m_scanner.waitUntil([this] { return m_screen.isFocusedOnTop(m_screen.windowTitled(kTitle)); }));
+}
+
+TEST_F(OnScreen, TheWindowScalesWithTheDisplayAlsoByFractions)
+{
+    m_screen.setResolution(144);
+    put(kComp + ".vst3", "delay initialize 1000\n");
+    ASSERT_TRUE(waitForWindow());
+    EXPECT_EQ(m_screen.sizeOf(m_screen.windowTitled(kTitle)), QSize(333, 80) * 1.5);
+}
+
 TEST_P(LosingTheScreen, BlamesNobody)
 {
     put("Before.vst3");
