@@ -21,6 +21,7 @@
 #include <cxxabi.h>
 
 #include <algorithm>
+#include <cmath>
 #include <utility>
 
 namespace {
@@ -152,12 +153,13 @@ void UiFxProbe::setUpProgressBar()
     m_layout->addWidget(m_progressBar);
 }
 
-// Fonts follow the display's resolution, also where Qt does not scale windows by it. Only whole quarters
-// count: a platform without a screen pretends to have an odd one.
+// Fonts follow the display's resolution, so the window does, whether Qt scales it or not. Only in whole
+// quarters: a resolution of 100 is what servers without a display make up.
 void UiFxProbe::fixSize()
 {
-    const int quarters = std::max(4, 4 * logicalDpiY() / kPlainResolution);
-    setFixedSize(kWidth * quarters / 4, kHeight * quarters / 4);
+    const qreal ratio = devicePixelRatioF();
+    const qreal scale = std::floor(4 * ratio * logicalDpiY() / kPlainResolution) / 4;
+    setFixedSize((QSizeF(kWidth, kHeight) * std::max(1.0, scale) / ratio).toSize());
 }
 
 // The exception of a forced unwind has no object, so the reference to it is null; that is how the compiler

@@ -33,6 +33,15 @@ protected:
     ScannerRun m_scanner{scannerProgram(), m_folder};
 };
 
+struct Resolution {
+    int dotsPerInch;
+    QSize size;
+
+    friend void PrintTo(const Resolution &row, std::ostream *out) { *out << row.dotsPerInch << " dpi"; }
+};
+
+class OnScaledScreen : public OnScreen, public testing::WithParamInterface<Resolution> {};
+
 class LosingTheScreen : public OnScreen, public testing::WithParamInterface<const char *> {};
 
 } // namespace
@@ -98,13 +107,18 @@ TEST_F(OnScreen, TheWindowStaysOnTopOfOthers)
         m_scanner.waitUntil([this] { return m_screen.isFocusedOnTop(m_screen.windowTitled(kTitle)); }));
 }
 
-TEST_F(OnScreen, TheWindowScalesWithTheDisplayAlsoByFractions)
+TEST_P(OnScaledScreen, TheWindowFollowsTheResolution)
 {
-    m_screen.setResolution(144);
+    m_screen.setResolution(GetParam().dotsPerInch);
     put(kComp + ".vst3", "delay initialize 1000\n");
     ASSERT_TRUE(waitForWindow());
-    EXPECT_EQ(m_screen.sizeOf(m_screen.windowTitled(kTitle)), QSize(333, 80) * 1.5);
+    EXPECT_EQ(m_screen.sizeOf(m_screen.windowTitled(kTitle)), GetParam().size);
 }
+
+INSTANTIATE_TEST_SUITE_P(Of, OnScaledScreen,
+                         testing::Values(Resolution{96, {333, 80}}, Resolution{100, {333, 80}},
+                                         Resolution{144, {500, 120}}, Resolution{192, {666, 160}}),
+                         [](const auto &row) { return std::to_string(row.param.dotsPerInch) + "Dpi"; });
 
 TEST_P(LosingTheScreen, BlamesNobody)
 {
