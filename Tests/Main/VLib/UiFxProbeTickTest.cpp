@@ -2,6 +2,8 @@
 
 #include "Tests/Support/QtPrinters.h"
 
+#include <QFontDatabase>
+
 #include <gtest/gtest.h>
 
 #include <climits>
@@ -63,6 +65,8 @@ TEST(UiFxProbeTick, LongAndOddTextsAreShownAsTheyAre)
 
 TEST(UiFxProbeTick, ATextThatIsTooLongKeepsItsEnd)
 {
+    if (QFontDatabase().families().isEmpty())
+        GTEST_SKIP() << "without fonts all letters look alike";
     HeldScan scan;
     const auto picture = [&](const QString &text) {
         scan.label().setText(text);
