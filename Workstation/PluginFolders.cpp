@@ -23,7 +23,8 @@ QStringList foldersOfVariable(const char *name)
 
 QStringList usualPluginFolders()
 {
-    return foldersOfVariable("VST3_PATH") + foldersOfVariable("VST_PATH") + platformPluginFolders();
+    return foldersOfVariable("VST3_PATH") + foldersOfVariable("VST_PATH") + foldersOfVariable("LXVST_PATH") +
+           platformPluginFolders();
 }
 
 QString userDataFolder()

@@ -4,7 +4,7 @@
 #include <QStringList>
 
 /// Where plug-ins usually lie on this platform, whether the folders exist or not, after those that the
-/// environment variables "VST3_PATH" and "VST_PATH" name.
+/// environment variables "VST3_PATH", "VST_PATH" and "LXVST_PATH" name.
 QStringList usualPluginFolders();
 
 /// Where fxscan keeps its files when no folder is given: below the platform's place for user data.

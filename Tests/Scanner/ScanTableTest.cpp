@@ -12,7 +12,8 @@ namespace {
 // Whole scans, each a few steps. Files of "put" lie in "Plugins", others in the data folder, which "@" stands
 // for; "\n" is a line's end and "." in a list an empty one.
 //   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated
-//   write FILE: TEXT; remove FILE; holds FILE: TEXT
+//   write FILE: TEXT; remove FILE; move FILE FILE; holds FILE: TEXT
+//   link FILE FILE                where it lies and where it leads; where there are links
 //   folders FOLDER…               what the scan list names
 //   mark NAME ELEMENT VALUE       as the user does
 //   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
@@ -111,6 +112,49 @@ remove Effects/VST3Configuration.xml
 scan
 loaded Deep Comp
 vst3 Name: C, D
+
+= Linked folders are searched once and a file stays where it is known
+put z/Comp.vst3:
+put z/Echo.vst2:
+put ../Outside/Far.vst3:
+put ../Store/Odd.vst3:
+link Plugins/a Plugins/z
+link Plugins/z/loop Plugins
+link Plugins/z/top .
+link Outside/up Outside
+link Plugins/first Outside
+link Plugins/second Outside/up
+link Plugins/Named.vst3 Store/Odd.vst3
+link Plugins/Also.vst3 Plugins/Named.vst3
+link Plugins/None.vst3 Plugins/none
+scan
+loaded Comp Far Echo
+vst3 Path: @/Plugins/z/Comp.vst3, @/Plugins/first/Far.vst3, @/Plugins/Also.vst3
+vst2 Name: Echo
+remove Plugins/first
+scan
+loaded Far
+vst3 Path: @/Plugins/z/Comp.vst3, @/Plugins/second/Far.vst3, @/Plugins/Also.vst3
+link Plugins/first Outside
+same
+folders @/Plugins/a @/Plugins
+same
+folders @/Plugins/a
+scan
+loaded Comp Echo
+vst3 Path: @/Plugins/a/Comp.vst3
+folders @/Plugins @/Plugins/a
+scan
+loaded Far
+vst3 Path: @/Plugins/a/Comp.vst3, @/Plugins/first/Far.vst3, @/Plugins/Also.vst3
+
+= What a bundle holds is never a VST 2 module
+put Damaged.vst3/Left.vst2:
+put Other.VST3/Contents/aarch64-other/Other.vst2:
+put Good.vst2:
+scan
+vst2 Name: Good
+same
 
 = Names of all sorts in both formats
 put a/Comp.vst3: class Three1
@@ -283,6 +327,7 @@ protected:
             {"write", [&] { m_folder.write(file, text.toUtf8().replace("\\n", "\n")); }},
             {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
             {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(file))); }},
+            {"link", [&] { link(file.section(' ', 0, 0), file.section(' ', 1)); }},
             {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
             {"mark", [&] { markAsUser(file); }},
             {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
@@ -307,6 +352,12 @@ private:
     static QByteArray script(const QString &statements)
     {
         return QString(statements + '\n').replace(" | ", "\n").toUtf8();
+    }
+    void link(const QString &place, const QString &target)
+    {
+        if (!QFile::link(m_folder.path(target), m_folder.path(place)) ||
+            !QFileInfo(m_folder.path(place)).isSymbolicLink())
+            GTEST_SKIP() << "no links can be made here";
     }
     void markAsUser(const QString &words) const
     {

@@ -10,6 +10,7 @@ QStringList platformPluginFolders()
     return {home + QStringLiteral("/.vst3"),
             QStringLiteral("/usr/local/lib/vst3"),
             QStringLiteral("/usr/lib/vst3"),
+            QStringLiteral("/usr/lib64/vst3"),
             QStringLiteral("/usr/lib/x86_64-linux-gnu/vst3"),
             home + QStringLiteral("/.vst"),
             home + QStringLiteral("/.lxvst"),
@@ -17,5 +18,7 @@ QStringList platformPluginFolders()
             QStringLiteral("/usr/local/lib/lxvst"),
             QStringLiteral("/usr/lib/vst"),
             QStringLiteral("/usr/lib/lxvst"),
+            QStringLiteral("/usr/lib64/vst"),
+            QStringLiteral("/usr/lib64/lxvst"),
             QStringLiteral("/usr/lib/x86_64-linux-gnu/vst")};
 }

@@ -45,10 +45,20 @@ void logUnsearchable(const QString &folder, const QString &reason)
         DebugLog(L"Cannot search the folder \"%ls\": %ls", folder, reason);
 }
 
+/// What a path becomes when the folder at its start is reached by another one.
+QString moved(const QString &path, const QString &from, const QString &to)
+{
+    const auto withoutSlash = [](const QString &folder) {
+        return folder.endsWith(QLatin1Char('/')) ? folder.chopped(1) : folder;
+    };
+    return withoutSlash(to) + path.mid(withoutSlash(from).size());
+}
+
 } // namespace
 
-FileFinder::FileFinder(const QStringList &endings)
+FileFinder::FileFinder(const QStringList &endings, Links links)
     : m_endings(endings)
+    , m_links(links)
 {}
 
 void FileFinder::forgetReports()
@@ -57,21 +67,25 @@ void FileFinder::forgetReports()
     reports().folders.clear();
 }
 
-QStringList FileFinder::find(const QString &folder, const QString &ending, const Cancelled &isCancelled)
+QStringList FileFinder::find(const QStringList &folders, const QString &ending, const Cancelled &isCancelled)
 {
-    if (folder.isEmpty()) { // made absolute, it would be the working folder
-        logUnsearchable(folder, QStringLiteral("no folder is given"));
-        return {};
-    }
-    const QString start = QDir::cleanPath(QFileInfo(folder).absoluteFilePath());
-    const auto [entry, isNew] = m_found.try_emplace(start);
-    const bool isWhole = !isNew || searchFolder(start, isCancelled, entry->second);
+    const bool isWhole = (!folders.isEmpty() && folders == m_folders) || search(folders, isCancelled);
+    m_folders = isWhole ? folders : QStringList();
     QStringList paths;
-    std::copy_if(entry->second.begin(), entry->second.end(), std::back_inserter(paths),
+    std::copy_if(m_found.begin(), m_found.end(), std::back_inserter(paths),
                  [&](const QString &path) { return path.endsWith(ending, Qt::CaseInsensitive); });
-    if (!isWhole)
-        m_found.erase(entry);
     return paths;
+}
+
+QString FileFinder::foundInsteadOf(const QString &path) const
+{
+    for (const Place &other : m_otherPaths)
+        if (isBelow(path, other.path)) {
+            const QString real = moved(path, other.path, other.real);
+            const auto listed = m_listedByLink.constFind(pathKey(real));
+            return listed != m_listedByLink.constEnd() ? *listed : searchedAs(real);
+        }
+    return {};
 }
 
 bool FileFinder::isLookedFor(const QString &name) const
@@ -80,7 +94,53 @@ bool FileFinder::isLookedFor(const QString &name) const
                        [&](const QString &ending) { return name.endsWith(ending, Qt::CaseInsensitive); });
 }
 
-bool FileFinder::searchFolder(const QString &folder, const Cancelled &isCancelled, QStringList &found)
+/// False when it ended early.
+bool FileFinder::search(const QStringList &folders, const Cancelled &isCancelled)
+{
+    *this = FileFinder(m_endings, m_links);
+    for (const Place &start : settleStarts(folders))
+        if (!searchFolder(start, start.path, isCancelled))
+            return false;
+    for (std::size_t index = 0; index < m_met.size(); ++index) { // following one adds others
+        const Link link = m_met[index];
+        if (!follow(link, isCancelled))
+            return false;
+    }
+    return true;
+}
+
+/// The folders to search, each real one once.
+std::vector<FileFinder::Place> FileFinder::settleStarts(const QStringList &folders)
+{
+    std::vector<Place> starts;
+    for (const QString &folder : folders) {
+        if (folder.isEmpty()) { // made absolute, it would be the working folder
+            logUnsearchable(folder, QStringLiteral("no folder is given"));
+            continue;
+        }
+        const QString path = QDir::cleanPath(QFileInfo(folder).absoluteFilePath());
+        const Place start{path, realPath(path).value_or(path)};
+        const QString before = searchedAs(start.real);
+        if (before.isNull()) {
+            m_starts.insert(pathKey(start.real), path);
+            starts.push_back(start);
+        } else if (!isSamePath(before, path)) {
+            m_otherPaths.push_back(start);
+        }
+    }
+    for (const Place &start : starts) {
+        m_realFolders.append(start.real);
+        const bool isMet = std::any_of(starts.begin(), starts.end(), [&](const Place &other) {
+            return &other != &start && isBelow(start.real, other.real);
+        });
+        if (isMet)
+            m_startsMet.insert(pathKey(start.real), start.path);
+    }
+    return starts;
+}
+
+/// False when it ended early.
+bool FileFinder::searchFolder(const Place &start, const QString &folder, const Cancelled &isCancelled)
 {
     if (isCancelled && isCancelled())
         return false;
@@ -92,20 +152,85 @@ bool FileFinder::searchFolder(const QString &folder, const Cancelled &isCancelle
         logUnsearchable(folder, reasonAgainst(QFileInfo(folder)));
     }
     const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
-    for (const FolderEntry &entry : content.entries)
-        if (isLookedFor(entry.name))
-            found.append(prefix + entry.name);
     for (const FolderEntry &entry : content.entries) {
-        if (!entry.isRealFolder)
+        if (entry.isLink && m_links == Links::Followed)
+            m_met.push_back({prefix + entry.name, entry.isFolder});
+        else if (isLookedFor(entry.name) && !wasReached(m_listedByLink, start, prefix + entry.name))
+            m_found.append(prefix + entry.name);
+    }
+    for (const FolderEntry &entry : content.entries) {
+        if (!entry.isFolder || entry.isLink)
             continue;
         const QString path = prefix + entry.name;
-        if (!leadsBack(path) && !searchFolder(path, isCancelled, found))
+        if (!wasReached(m_startsMet, start, path) && !searchFolder(start, path, isCancelled))
             return false;
     }
     return true;
 }
 
-QStringList findFiles(const QString &folder, const QString &ending)
+/// Whether a path below a start leads to something that was reached by another path.
+bool FileFinder::wasReached(const Reached &reached, const Place &start, const QString &path)
 {
-    return FileFinder({ending}).find(folder, ending);
+    if (reached.isEmpty())
+        return false;
+    const QString real = moved(path, start.path, start.real);
+    const auto found = reached.constFind(pathKey(real));
+    if (found == reached.constEnd())
+        return false;
+    if (!isSamePath(*found, path))
+        m_otherPaths.push_back({path, real});
+    return true;
+}
+
+/// Searches the folder that a link leads to, and lists what is looked for. False when it ended early.
+bool FileFinder::follow(const Link &link, const Cancelled &isCancelled)
+{
+    const std::optional<QString> real = realPath(link.path);
+    const auto isInside = [&](const QString &folder) { return isBelow(folder, *real); };
+    if (!real || std::any_of(m_realFolders.begin(), m_realFolders.end(), isInside))
+        return true;
+    const Place place{link.path, *real};
+    const bool isNew = searchedAs(place.real).isNull();
+    if (!isNew || m_listedByLink.contains(pathKey(place.real)))
+        m_otherPaths.push_back(place);
+    if (isLookedFor(link.path) && !isListed(place)) {
+        m_found.append(link.path);
+        m_listedByLink.insert(pathKey(place.real), link.path);
+    }
+    if (!link.isToFolder || !isNew)
+        return true;
+    m_starts.insert(pathKey(place.real), link.path);
+    m_startsMet.insert(pathKey(place.real), link.path);
+    return searchFolder(place, place.path, isCancelled);
+}
+
+/// Whether what a link leads to was listed. Where it has another ending than the link, it was not, although
+/// its folder was searched.
+bool FileFinder::isListed(const Place &place) const
+{
+    if (m_listedByLink.contains(pathKey(place.real)))
+        return true;
+    const QString before = searchedAs(place.real);
+    return std::any_of(m_endings.begin(), m_endings.end(), [&](const QString &ending) {
+        return place.path.endsWith(ending, Qt::CaseInsensitive) &&
+               before.endsWith(ending, Qt::CaseInsensitive);
+    });
+}
+
+/// The path under which the search of some start comes upon a real file or folder; null when none does.
+QString FileFinder::searchedAs(const QString &real) const
+{
+    for (QString part = real; !m_starts.isEmpty(); part.truncate(part.lastIndexOf(QLatin1Char('/')))) {
+        const auto start = m_starts.constFind(pathKey(part));
+        if (start != m_starts.constEnd())
+            return moved(real, part, *start);
+        if (!part.contains(QLatin1Char('/')) || QFileInfo(part).isHidden())
+            break;
+    }
+    return {};
+}
+
+QStringList findFiles(const QString &folder, const QString &ending, FileFinder::Links links)
+{
+    return FileFinder({ending}, links).find({folder}, ending);
 }

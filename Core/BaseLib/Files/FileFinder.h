@@ -1,29 +1,39 @@
 #pragma once
 
+#include <QHash>
 #include <QString>
 #include <QStringList>
 
 #include <functional>
-#include <map>
+#include <vector>
 
-/// Finds files and folders by the ends of their names, in a folder and all folders below it. Each folder is
-/// read once: all searches of one scan see the same files. Used on one thread.
+/// Finds files and folders by the ends of their names, in some folders and all folders below them. Each
+/// folder is read once: all searches of one scan see the same files. Used on one thread.
 class FileFinder {
 public:
     using Cancelled = std::function<bool()>;
+    enum class Links { Followed, NotEntered };
 
     /// `endings` are the ends of the names looked for, with their dots (".vst3"), compared without regard to
     /// case.
-    explicit FileFinder(const QStringList &endings);
+    explicit FileFinder(const QStringList &endings, Links links = Links::Followed);
 
     /// The full paths found that end in `ending`, one of the finder's, "/" as separator: those of a folder in
-    /// the order of their names, followed by what lies in its sub-folders. A folder that matches is listed
-    /// and searched. Hidden entries are skipped and linked folders are not entered; junctions are (people use
-    /// them to keep plug-ins on other drives), unless one leads back to a folder around it, so that the
-    /// search ends. Names that are not valid text are skipped. A folder that cannot be read, or an empty
-    /// path, gives one log line. `isCancelled` is asked before each folder; the search ends early when it
-    /// answers true.
-    QStringList find(const QString &folder, const QString &ending, const Cancelled &isCancelled = nullptr);
+    /// the order of their names, followed by what lies in its sub-folders; what only links lead to comes
+    /// behind all others. A folder that matches is listed and searched. Hidden entries are skipped, and so
+    /// are names that are not valid text. A folder that cannot be read, or an empty path, gives one log line.
+    /// `isCancelled` is asked before each folder; the search ends early when it answers true.
+    ///
+    /// Each real folder is searched once, and each real file listed once, by the first path that leads there.
+    /// A link to one of `folders`, or to a folder around one, is passed over.
+    QStringList find(const QStringList &folders, const QString &ending,
+                     const Cancelled &isCancelled = nullptr);
+
+    /// The path under which the last search came upon what this other path leads to as well; null when it
+    /// knows of no such path.
+    QString foundInsteadOf(const QString &path) const;
+    /// Whether there is anything that more than one path led to.
+    bool hasOtherPaths() const { return !m_otherPaths.empty(); }
 
     /// The folders so far of which not all could be read.
     const QStringList &unread() const { return m_unread; }
@@ -32,14 +42,40 @@ public:
     static void forgetReports();
 
 private:
+    /// A path, and the one without links that leads to the same. The top of a file system has no real name
+    /// that ends in "/".
+    struct Place {
+        QString path, real;
+    };
+    struct Link {
+        QString path;
+        bool isToFolder;
+    };
+    /// Paths by the keys of the real ones.
+    using Reached = QHash<QString, QString>;
+
     bool isLookedFor(const QString &name) const;
-    /// False when it ended early.
-    bool searchFolder(const QString &folder, const Cancelled &isCancelled, QStringList &found);
+    bool search(const QStringList &folders, const Cancelled &isCancelled);
+    std::vector<Place> settleStarts(const QStringList &folders);
+    bool searchFolder(const Place &start, const QString &folder, const Cancelled &isCancelled);
+    bool wasReached(const Reached &reached, const Place &start, const QString &path);
+    bool follow(const Link &link, const Cancelled &isCancelled);
+    bool isListed(const Place &place) const;
+    QString searchedAs(const QString &real) const;
 
     QStringList m_endings;
+    Links m_links;
+    QStringList m_folders; ///< that were searched last
+    QStringList m_found;   ///< in them, of all endings
     QStringList m_unread;
-    std::map<QString, QStringList> m_found; ///< of each folder searched, the paths of all endings
+    QStringList m_realFolders; ///< m_folders without links
+    std::vector<Link> m_met;   ///< links, in the order in which they are followed
+    std::vector<Place> m_otherPaths;
+    Reached m_starts;       ///< where searches start: the folders, and those that links lead to
+    Reached m_startsMet;    ///< those that another search comes upon; mostly empty, which saves a look-up
+    Reached m_listedByLink; ///< links that are looked for
 };
 
-/// The paths that a new finder finds.
-QStringList findFiles(const QString &folder, const QString &ending);
+/// The paths that a new finder finds in one folder.
+QStringList findFiles(const QString &folder, const QString &ending,
+                      FileFinder::Links links = FileFinder::Links::Followed);

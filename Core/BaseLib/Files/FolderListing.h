@@ -7,7 +7,8 @@
 /// An entry of a folder.
 struct FolderEntry {
     QString name;
-    bool isRealFolder; ///< a folder, not a link to one
+    bool isFolder; ///< or a link to one
+    bool isLink;   ///< a symbolic link, or a junction of Windows
 };
 
 struct FolderContent {

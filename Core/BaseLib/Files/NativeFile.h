@@ -29,6 +29,13 @@ struct PathLess {
     }
 };
 
+/// Whether a path is that of the folder or of something in it.
+inline bool isBelow(const QString &path, const QString &folder)
+{
+    const int end = folder.endsWith(QLatin1Char('/')) ? folder.size() - 1 : folder.size();
+    return path.startsWith(folder, kPathCase) && (path.size() == end || path.at(end) == QLatin1Char('/'));
+}
+
 /// The same text for every spelling of a path, for look-ups by hash.
 inline QString pathKey(const QString &path)
 {
@@ -42,9 +49,10 @@ FileResult removeFile(const QString &path);
 /// Waits until what was written to an open file has reached the disk; a file system that cannot do so is not
 /// reported.
 void syncToDisk(int fileDescriptor);
-/// Whether a folder that is not a link may be one of the folders around it: a junction of Windows leads
-/// anywhere, and a search that entered it would not end.
-bool leadsBack(const QString &folder);
+/// The path without links that leads to the same file or folder, or, where the system does not tell it, a
+/// text that is the same for all paths that lead there. It does not end in "/". None when there is no such
+/// file.
+std::optional<QString> realPath(const QString &path);
 /// True when the system does not let us see whether the file exists, or what kind it is.
 bool cannotBeExamined(const QString &path);
 /// Whether the system reads the name as a device, in any folder and with any ending.

@@ -45,7 +45,7 @@ void add(std::vector<FolderEntry> &entries, int folder, const dirent64 &entry)
     const mode_t target = own == S_IFLNK ? kindOf(folder, entry, 0) : own;
     const QString name = target == S_IFDIR || target == S_IFREG ? textOf(entry) : QString();
     if (!name.isNull())
-        entries.push_back({name, own == S_IFDIR});
+        entries.push_back({name, target == S_IFDIR, own == S_IFLNK});
 }
 
 } // namespace

@@ -5,9 +5,11 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <ctime>
 #include <limits>
+#include <memory>
 
 #include <sys/stat.h>
 #include <unistd.h>
@@ -26,7 +28,14 @@ FileResult removeFile(const QString &path)
     return {QString::fromLocal8Bit(std::strerror(errno))};
 }
 
-bool leadsBack(const QString &) { return false; } // only links lead elsewhere
+std::optional<QString> realPath(const QString &path)
+{
+    const std::unique_ptr<char, decltype(&std::free)> real(
+        realpath(QFile::encodeName(path).constData(), nullptr), &std::free);
+    if (!real)
+        return std::nullopt;
+    return std::strcmp(real.get(), "/") == 0 ? QString() : QFile::decodeName(real.get());
+}
 
 bool cannotBeExamined(const QString &path)
 {

@@ -2,44 +2,54 @@
 
 #include "Core/BaseLib/Files/win32/WindowsText.h"
 
-#include <QDirIterator>
-#include <QFileInfo>
+#include <QScopeGuard>
+
+// Not through QDirIterator, which takes shortcuts of the desktop for links and does not tell junctions apart.
 
 namespace {
 
-/// Why an existing folder lists nothing; empty when it is merely empty.
-QString problemOf(const QString &folder)
-{
-    WIN32_FIND_DATAW first = {};
-    const HANDLE search = FindFirstFileW(nativePath(folder + QStringLiteral("/*")).c_str(), &first);
-    if (search != INVALID_HANDLE_VALUE) {
-        FindClose(search);
-        return QString();
-    }
-    const DWORD error = GetLastError();
-    const bool isGone =
-        error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND || error == ERROR_DIRECTORY;
-    return isGone ? QString() : systemMessage(error, folder);
-}
-
 /// The system also accepts halves of surrogate pairs, which UTF-8 files cannot hold.
 bool isText(const QString &name) { return QString::fromUtf8(name.toUtf8()) == name; }
+
+/// What leads elsewhere; other reparse points are files and folders of cloud storage and the like.
+bool isLink(const WIN32_FIND_DATAW &entry)
+{
+    return (entry.dwFileAttributes & FILE_ATTRIBUTE_REPARSE_POINT) != 0 &&
+           (entry.dwReserved0 == IO_REPARSE_TAG_SYMLINK || entry.dwReserved0 == IO_REPARSE_TAG_MOUNT_POINT);
+}
+
+void add(std::vector<FolderEntry> &entries, const WIN32_FIND_DATAW &entry)
+{
+    const QString name = QString::fromWCharArray(entry.cFileName);
+    const bool isHidden = (entry.dwFileAttributes & FILE_ATTRIBUTE_HIDDEN) != 0;
+    if (name == QLatin1String(".") || name == QLatin1String("..") || isHidden || !isText(name))
+        return;
+    entries.push_back({name, (entry.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) != 0, isLink(entry)});
+}
+
+bool isAbsence(DWORD error)
+{
+    return error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND || error == ERROR_DIRECTORY;
+}
 
 } // namespace
 
 FolderContent readFolder(const QString &folder)
 {
     FolderContent content;
-    QDirIterator iterator(folder, QDir::AllEntries | QDir::NoDotAndDotDot);
-    while (iterator.hasNext()) {
-        iterator.next();
-        if (!isText(iterator.fileName()))
-            continue;
-        const QFileInfo info = iterator.fileInfo();
-        // A link is told apart first: that needs no look at what it points to.
-        content.entries.push_back({iterator.fileName(), !info.isSymLink() && info.isDir()});
+    WIN32_FIND_DATAW entry = {};
+    const HANDLE search = FindFirstFileExW(nativePath(folder + QStringLiteral("/*")).c_str(), FindExInfoBasic,
+                                           &entry, FindExSearchNameMatch, nullptr, FIND_FIRST_EX_LARGE_FETCH);
+    if (search == INVALID_HANDLE_VALUE) {
+        if (const DWORD error = GetLastError(); !isAbsence(error))
+            content.problem = systemMessage(error, folder);
+        return content;
     }
-    if (content.entries.empty() && QFileInfo(folder).isDir()) // Qt does not give the reason
-        content.problem = problemOf(folder);
+    const auto close = qScopeGuard([search] { FindClose(search); });
+    do
+        add(content.entries, entry);
+    while (FindNextFileW(search, &entry));
+    if (const DWORD error = GetLastError(); error != ERROR_NO_MORE_FILES)
+        content.problem = systemMessage(error, folder);
     return content;
 }

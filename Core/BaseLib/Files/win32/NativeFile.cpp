@@ -2,13 +2,16 @@
 
 #include "Core/BaseLib/Files/win32/WindowsHandle.h"
 #include "Core/BaseLib/Files/win32/WindowsText.h"
+#include "Core/BaseLib/Log/FormatText.h"
 
 #include <QDateTime>
+#include <QDir>
 #include <QFileInfo>
 #include <QRegularExpression>
 
 #include <limits>
 #include <tuple>
+#include <vector>
 
 #include <io.h>
 
@@ -53,9 +56,8 @@ FileResult patiently(const QString &path, Operation &&operation)
 /// Volume and number of a file, the same by whatever path it is reached.
 using FileIdentity = std::tuple<DWORD, DWORD, DWORD>;
 
-std::optional<FileIdentity> identityOf(const QString &path)
+std::optional<FileIdentity> identityOf(const WindowsHandle &file)
 {
-    const WindowsHandle file = openForAttributes(path);
     BY_HANDLE_FILE_INFORMATION information = {};
     if (!file.isValid() || !GetFileInformationByHandle(file.get(), &information))
         return std::nullopt;
@@ -63,11 +65,28 @@ std::optional<FileIdentity> identityOf(const QString &path)
                         information.nFileIndexLow);
 }
 
-/// Empty for the top of a drive.
-QString outerFolder(const QString &folder)
+/// Where an open file lies; empty when the system does not tell.
+QString finalPath(const WindowsHandle &file)
 {
-    const QString outer = QFileInfo(folder).path();
-    return outer == folder ? QString() : outer;
+    std::vector<wchar_t> text(MAX_PATH);
+    DWORD length = 0;
+    while ((length = GetFinalPathNameByHandleW(file.get(), text.data(), static_cast<DWORD>(text.size()), 0)) >
+           text.size())
+        text.resize(length);
+    QString path = QDir::fromNativeSeparators(QString::fromWCharArray(text.data(), static_cast<int>(length)));
+    if (path.startsWith(QLatin1String("//?/UNC/")))
+        path.remove(2, 6);
+    else if (path.startsWith(QLatin1String("//?/")))
+        path.remove(0, 4);
+    if (path.endsWith(QLatin1Char('/')))
+        path.chop(1);
+    return path;
+}
+
+bool isReparsePoint(const QString &path)
+{
+    const DWORD attributes = GetFileAttributesW(nativePath(path).c_str());
+    return attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_REPARSE_POINT) != 0;
 }
 
 qint64 unitsOf(const FILETIME &time)
@@ -103,16 +122,18 @@ bool isDeviceName(const QString &name)
     return devices.match(name).hasMatch();
 }
 
-bool leadsBack(const QString &folder)
+std::optional<QString> realPath(const QString &path)
 {
-    const DWORD attributes = GetFileAttributesW(nativePath(folder).c_str());
-    if (attributes == INVALID_FILE_ATTRIBUTES || (attributes & FILE_ATTRIBUTE_REPARSE_POINT) == 0)
-        return false;
-    const std::optional<FileIdentity> target = identityOf(folder);
-    for (QString outer = outerFolder(folder); target && !outer.isEmpty(); outer = outerFolder(outer))
-        if (identityOf(outer) == target)
-            return true;
-    return !target;
+    const WindowsHandle file = openForAttributes(path);
+    const std::optional<FileIdentity> identity = identityOf(file);
+    if (!identity)
+        return std::nullopt;
+    const QString real = finalPath(file);
+    if (!real.isEmpty() && !isReparsePoint(real))
+        return real;
+    // NOTE: Wine does not resolve the links of the system that it runs on.
+    const auto &[volume, high, low] = *identity;
+    return formatText(L"%08lx:%08lx%08lx", volume, high, low);
 }
 
 void syncToDisk(int fileDescriptor) { _commit(fileDescriptor); }

@@ -131,7 +131,8 @@ void CatalogueHost::absorbMarkers()
     if (!QDir(catalogueFolder()).exists())
         return;
     const QStringList files =
-        findFiles(catalogueFolder(), QString::fromLatin1(m_info.catalogue->marker.ending));
+        findFiles(catalogueFolder(), QString::fromLatin1(m_info.catalogue->marker.ending),
+                  FileFinder::Links::NotEntered); // they are deleted
     // While its scanner runs, a marker blames nobody.
     if (!files.isEmpty() && ScanLock::isScannerAtWork(catalogueFolder())) {
         DebugLog(L"Another scanner is at work in %ls; its crash markers stay", catalogueFolder());

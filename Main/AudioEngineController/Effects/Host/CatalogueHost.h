@@ -75,7 +75,11 @@ public:
     /// files.
     ///
     /// False for a path that a folder search finds although it is not a module of its own.
-    virtual bool isModule(const QString & /*path*/) const { return true; }
+    virtual bool isModule(const QString &path) const
+    {
+        // In a bundle, whole or not, lie modules of the bundle's format.
+        return !path.contains(QLatin1String(".vst3/"), Qt::CaseInsensitive);
+    }
     /// The time stamp of the file that an update of the module replaces; empty when there is no such module.
     virtual QString moduleTime(const QString &path) const;
     /// The folder in which a module lies: that of its bundle, if it is inside one.

@@ -5,7 +5,7 @@
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
-#include <QSet>
+#include <QHash>
 
 #include <algorithm>
 #include <exception>
@@ -90,18 +90,30 @@ bool FolderScan::isCancelled() const
 
 QStringList FolderScan::findModules() const
 {
-    QStringList paths;
-    QSet<QString> seen;
-    for (const QString &folder : m_host.folders())
-        for (const QString &path :
-             m_finder->find(folder, m_host.info().moduleEnding, [this] { return isCancelled(); })) {
-            seen.insert(pathKey(path));
-            if (seen.size() > paths.size() && m_host.isModule(path))
-                paths.append(path);
-        }
+    QStringList paths =
+        m_finder->find(m_host.folders(), m_host.info().moduleEnding, [this] { return isCancelled(); });
+    const auto isPart = [this](const QString &path) { return !m_host.isModule(path); };
+    paths.erase(std::remove_if(paths.begin(), paths.end(), isPart), paths.end());
+    if (m_finder->hasOtherPaths())
+        keepKnownPaths(paths);
     if (m_host.probesInPathOrder())
         std::sort(paths.begin(), paths.end());
     return paths;
+}
+
+/// A file to which several paths lead stays under the one by which it is known.
+void FolderScan::keepKnownPaths(QStringList &paths) const
+{
+    QHash<QString, int> places;
+    for (int place = 0; place < paths.size(); ++place)
+        places.insert(pathKey(paths.at(place)), place);
+    for (const EffectRecord *record : m_host.known().all()) {
+        if (places.contains(pathKey(record->path)))
+            continue;
+        const auto found = places.constFind(pathKey(m_finder->foundInsteadOf(record->path)));
+        if (found != places.constEnd() && m_host.known().recordsOfPath(paths.at(*found)).empty())
+            paths[*found] = record->path;
+    }
 }
 
 void FolderScan::addKept()

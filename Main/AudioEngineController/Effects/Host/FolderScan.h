@@ -25,6 +25,7 @@ public:
 private:
     void scan();
     QStringList findModules() const;
+    void keepKnownPaths(QStringList &paths) const;
     void addKept();
     bool probeItems();
     void probe(const ScanItem &item);

@@ -8,12 +8,6 @@
 
 namespace {
 
-bool isBelow(const QString &path, const QString &folder)
-{
-    const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
-    return path.startsWith(prefix, kPathCase) || isSamePath(path, folder);
-}
-
 bool isBelowAny(const QString &path, const QStringList &folders)
 {
     return std::any_of(folders.begin(), folders.end(),

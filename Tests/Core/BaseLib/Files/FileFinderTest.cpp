@@ -11,7 +11,7 @@ namespace {
 QString found(FileFinder &finder, const TestFolder &folder, const QString &ending,
               const FileFinder::Cancelled &isCancelled = nullptr)
 {
-    return finder.find(folder.plugins(), ending, isCancelled).join('|').remove(folder.plugins() + '/');
+    return finder.find({folder.plugins()}, ending, isCancelled).join('|').remove(folder.plugins() + '/');
 }
 
 } // namespace
