@@ -14,6 +14,7 @@ namespace {
 //   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated
 //   write FILE: TEXT; remove FILE; move FILE FILE; holds FILE: TEXT
 //   link FILE FILE                where it lies and where it leads; where there are links
+//   short FILE BYTES              ends a file after so many and dates it as updated
 //   folders FOLDER…               what the scan list names
 //   mark NAME ELEMENT VALUE       as the user does
 //   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
@@ -155,6 +156,58 @@ put Good.vst2:
 scan
 vst2 Name: Good
 same
+
+= A module that is cut short is looked at until it is whole again
+put A.vst3:
+put B.vst2:
+put Shell.vst2: child 1 One | child 2 Two | fault entry kill Two
+put Late.vst3: class New
+short Plugins/Late.vst3 1000
+scan 2
+mark A Favourite 1
+short Plugins/A.vst3 9000
+short Plugins/B.vst2 0
+short Plugins/Shell.vst2 70
+scan
+loaded .
+log: Late.vst3: it is cut short: 1000 of at least
+log: it is empty
+vst3 Name FileTime Enabled Working: A||1|0, A|2021-03-04 05:06|1|0, Late||1|0
+same
+put A.vst3:
+put B.vst2:
+put Shell.vst2: child 1 One | child 2 Two | fault entry kill Two
+put Late.vst3: class New
+scan
+loaded A Late B Shell
+vst3 Name Favourite Working: A|1|1, New|0|1
+vst2 Name Enabled Working: B|1|1, One|1|1, Two|0|0
+same
+
+= A file that is not a program library is not a plug-in
+put T.vst3:
+put Other.vst3: class Other
+scan
+write Plugins/T.vst3: INPUT(T.vst3.0)
+write Plugins/ld.so: INPUT(ld.so.0)
+write Plugins/ld.dll: MZ, but a text of more than the bytes that a header of any kind has
+scan
+vst3 Name: Other
+vst2 Name: .
+same
+
+= A bundle without a module for this machine says what it has
+write Plugins/X.vst3/Contents/aarch64-linux/X.so: x
+scan
+log: X.vst3: the bundle has modules for aarch64-linux only
+write Plugins/Y.vst3/Contents/arm64-win/Y.vst3: y
+write Plugins/Y.vst3/Contents/Resources/y.txt: y
+scan
+log: Y.vst3: the bundle has modules for arm64-win only
+write Plugins/Z.vst3/z: z
+link Plugins/Z.vst3/Contents Plugins/Z.vst3/Contents
+scan
+log: Z.vst3: its folder Contents cannot be searched: 
 
 = Names of all sorts in both formats
 put a/Comp.vst3: class Three1
@@ -328,6 +381,7 @@ protected:
             {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
             {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(file))); }},
             {"link", [&] { link(file.section(' ', 0, 0), file.section(' ', 1)); }},
+            {"short", [&] { cutShort(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
             {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
             {"mark", [&] { markAsUser(file); }},
             {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
@@ -358,6 +412,12 @@ private:
         if (!QFile::link(m_folder.path(target), m_folder.path(place)) ||
             !QFileInfo(m_folder.path(place)).isSymbolicLink())
             GTEST_SKIP() << "no links can be made here";
+    }
+    void cutShort(const QString &file, qint64 size)
+    {
+        const QString path = m_folder.path(resolved(file + '<').chopped(1));
+        EXPECT_TRUE(QFile::resize(path, size));
+        dateLater(path);
     }
     void markAsUser(const QString &words) const
     {

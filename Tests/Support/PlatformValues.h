@@ -19,8 +19,6 @@ extern const char *const kForeignLocale;
 /// Whether the environment says where the home folder is. On Windows it is the user's profile, whatever that
 /// says.
 extern const bool kHomeFollowsEnvironment;
-/// What the log says of a module file that is a text.
-extern const char *const kTextFileReason;
 /// Which of two values "Linux/Windows" in a table counts.
 extern const int kSystemsPlace;
 /// Names of modules, as far as the system allows them, that upset a reader of markup; one lies in a

@@ -19,5 +19,8 @@ enum class ExportAnswer {
 /// Unknown. Any thread may ask.
 ExportAnswer findExports(const QString &path, const std::vector<QByteArray> &names);
 
+/// The same for the content of such a file.
+ExportAnswer findExports(ByteView file, const std::vector<QByteArray> &names);
+
 /// The same for the content of a PE file, of any alignment, which need not be trustworthy.
 ExportAnswer findPeExports(ByteView file, const std::vector<QByteArray> &names);

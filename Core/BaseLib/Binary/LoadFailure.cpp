@@ -1,8 +1,8 @@
 #include "Core/BaseLib/Binary/LoadFailure.h"
 
+#include "Core/BaseLib/Binary/ModuleFile.h"
 #include "Core/BaseLib/Binary/PagedFile.h"
-#include "Core/BaseLib/Binary/PeImage.h"
-#include "Core/BaseLib/Log/FormatText.h"
+#include "Core/BaseLib/Files/NativeFile.h"
 
 #include <QSet>
 
@@ -11,21 +11,12 @@ namespace {
 /// More libraries than any honest plug-in brings along.
 constexpr int kMostLibraries = 200;
 
-/// What a machine type means for people.
-QString machineName(quint16 machine)
+/// "a", "a and b", "a, b and c".
+QString inWords(const QStringList &names)
 {
-    switch (machine) {
-    case kPeMachineX86:
-        return QStringLiteral("32-bit x86");
-    case kPeMachineArm:
-        return QStringLiteral("32-bit ARM");
-    case kPeMachineArm64:
-        return QStringLiteral("64-bit ARM");
-    case kPeMachineItanium:
-        return QStringLiteral("Itanium");
-    default:
-        return formatText(L"another machine (type 0x%04X)", static_cast<unsigned>(machine));
-    }
+    return names.size() < 2 ? names.join(QString())
+                            : names.mid(0, names.size() - 1).join(QLatin1String(", ")) +
+                                  QLatin1String(" and ") + names.last();
 }
 
 /// Goes through a library and those that it needs, each once.
@@ -37,43 +28,47 @@ public:
 
     QString of(const QString &path)
     {
-        PagedFile file(path);
-        if (file.content().isEmpty())
-            return {}; // the loader's message says enough
-        const std::optional<PeImage> image = PeImage::read(file.content());
-        if (!image)
-            return QStringLiteral("is not a Windows library");
-        if (image->machine() != kPeMachineX86_64)
-            return QStringLiteral("is built for ") + machineName(image->machine());
-        if (!image->isComplete())
-            return QStringLiteral("is cut short or damaged");
-        return ofImports(image->imports().value_or(QStringList()));
+        lookAt(path);
+        if (!m_missing.isEmpty())
+            return QStringLiteral("it needs %1, which %2 not installed")
+                .arg(inWords(m_missing),
+                     m_missing.size() == 1 ? QStringLiteral("is") : QStringLiteral("are"));
+        return m_unusable;
     }
 
 private:
-    QString ofImports(const QStringList &names)
+    void lookAt(const QString &path)
     {
-        for (const QString &name : names) {
-            const QString reason = ofImport(name);
-            if (!reason.isEmpty())
-                return QStringLiteral("needs ") + name + QStringLiteral(", which ") + reason;
-        }
-        return {};
+        PagedFile file(path);
+        for (const QString &name : neededLibraries(file.content()).value_or(QStringList()))
+            lookFor(name);
     }
 
-    QString ofImport(const QString &name)
+    void lookFor(const QString &name)
     {
-        if (m_seen.size() >= kMostLibraries || m_seen.contains(name.toLower()))
-            return {};
-        m_seen.insert(name.toLower());
+        if (m_seen.size() >= kMostLibraries || m_seen.contains(pathKey(name)))
+            return;
+        m_seen.insert(pathKey(name));
         const std::optional<QString> path = m_search(name);
         if (!path)
-            return QStringLiteral("is not found");
-        return path->isEmpty() ? QString() : of(*path);
+            m_missing.append(name);
+        else if (!path->isEmpty())
+            lookInto(name, *path);
+    }
+
+    void lookInto(const QString &name, const QString &path)
+    {
+        const ModuleInspection library = inspectModule(path);
+        if (library.verdict == ModuleInspection::Verdict::Loadable)
+            lookAt(path);
+        else if (m_unusable.isEmpty())
+            m_unusable = QStringLiteral("it needs %1, and ").arg(name) + library.reason;
     }
 
     const LibrarySearch &m_search;
     QSet<QString> m_seen;
+    QStringList m_missing;
+    QString m_unusable; ///< the first library that is there in vain
 };
 
 } // namespace

@@ -13,7 +13,12 @@ PagedFile::PagedFile(const QString &path)
     : m_file(path)
 {
     // Opening a pipe would wait for somebody to write into it.
-    if (QFileInfo(path).isFile() && m_file.open(QIODevice::ReadOnly | QIODevice::Unbuffered))
+    const QFileInfo file(path);
+    if (file.exists() && !file.isFile())
+        m_problem = QStringLiteral("it is not a regular file");
+    else if (!m_file.open(QIODevice::ReadOnly | QIODevice::Unbuffered))
+        m_problem = m_file.errorString();
+    else
         m_size = static_cast<quint64>(m_file.size());
 }
 

@@ -15,12 +15,15 @@ public:
 
     /// Empty when the file is missing, special or cannot be read. Valid as long as this object.
     ByteView content() { return ByteView(*this, m_size); }
+    /// The system's message for why it cannot be read; empty when it can.
+    const QString &problem() const { return m_problem; }
 
 private:
     bool read(quint64 offset, void *target, quint64 size) override;
     const QByteArray &page(quint64 number);
 
     QFile m_file;
+    QString m_problem;
     quint64 m_size = 0;                    ///< bytes, when it was opened
     std::map<quint64, QByteArray> m_pages; ///< by number
 };

@@ -49,6 +49,13 @@ bool PluginLibrary::load(const QString &path)
     return m_handle != nullptr;
 }
 
+void PluginLibrary::setErrorText(const QString &path, const LibrarySearch &search, const QString &loaderText)
+{
+    m_errorText = whyNotLoadable(path, search);
+    if (m_errorText.isEmpty())
+        m_errorText = QStringLiteral("it could not be loaded: ") + loaderText;
+}
+
 void PluginLibrary::leaveMapped() { m_handle = nullptr; }
 
 bool PluginLibrary::freeUnlessRunning()

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Core/BaseLib/Binary/LoadFailure.h"
+
 #include <QString>
 
 #include <set>
@@ -32,7 +34,7 @@ public:
     bool isLoaded() const { return m_handle != nullptr; }
     /// The system's handle, or null.
     void *handle() const { return m_handle; }
-    /// The system's message for why the last load failed.
+    /// Why the last load failed, as a phrase about "it": libraries that it needs, or the system's message.
     const QString &errorText() const { return m_errorText; }
 
     /// The end of the names of the system's libraries, with its dot.
@@ -50,6 +52,9 @@ private:
     /// Asks the system's loader; null on failure, with `m_errorText` set. What a library's start-up code
     /// throws ends the process: it would leave the loader in the middle of its work, with its lock held.
     void *loadUncached(const QString &path) noexcept;
+
+    /// What the files tell comes first: the loader names one of several missing libraries, or none.
+    void setErrorText(const QString &path, const LibrarySearch &search, const QString &loaderText);
 
     void *m_handle = nullptr;
     QString m_path;

@@ -1,3 +1,4 @@
+#include "Core/BaseLib/Binary/ModuleFile.h"
 #include "Core/BaseLib/Binary/posix/ElfTables.h"
 #include "Tests/Fuzz/FuzzTarget.h"
 
@@ -6,7 +7,8 @@ void fuzzElf(const QByteArray &input)
     // Without the zero that a QByteArray has behind its content.
     const std::vector<uchar> bytes(input.begin(), input.end());
     const ByteView view(bytes.data(), bytes.size());
-    elfMachine(view);
+    readElfNeeds(view);
+    inspectContent(view);
     const QString file = "module.so";
     writeFuzzFile(file, input);
     for (const QByteArray name : {"VSTPluginMain", "main"}) {

@@ -7,6 +7,5 @@ const bool kBundleIsThePlugin = true;
 const char *const kForeignModule = "Contents/x86_64-win/Several.vst3";
 const char *const kForeignLocale = "C.UTF-8";
 const bool kHomeFollowsEnvironment = true;
-const char *const kTextFileReason = "file too short";
 const std::array<const char *, 2> kNamesLikeMarkup = {"Bad\r", "sub<br/Bad</Path>"};
 const int kSystemsPlace = 0;

@@ -7,6 +7,5 @@ const bool kBundleIsThePlugin = false;
 const char *const kForeignModule = "Contents/x86_64-linux/Several.so";
 const char *const kForeignLocale = "German_Germany.1252";
 const bool kHomeFollowsEnvironment = false;
-const char *const kTextFileReason = "the file is not a Windows library";
 const std::array<const char *, 2> kNamesLikeMarkup = {"Bad & worse", "sub&#13;/Bad&lt;/Path&gt;"};
 const int kSystemsPlace = 1;

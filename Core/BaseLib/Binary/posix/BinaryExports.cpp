@@ -1,11 +1,29 @@
 #include "Core/BaseLib/Binary/BinaryExports.h"
 
+#include "Core/BaseLib/Binary/ModuleFile.h"
 #include "Core/BaseLib/Binary/PagedFile.h"
+#include "Core/BaseLib/Binary/PeImage.h"
 #include "Core/BaseLib/Binary/posix/ElfTables.h"
+
+const LibraryForm kOwnForm = LibraryForm::Elf;
+
+std::optional<QStringList> neededLibraries(ByteView file)
+{
+    const std::optional<ElfNeeds> needs = readElfNeeds(file);
+    if (needs)
+        return needs->libraries;
+    const std::optional<PeImage> image = PeImage::read(file);
+    return image ? image->imports() : std::nullopt;
+}
 
 ExportAnswer findExports(const QString &path, const std::vector<QByteArray> &names)
 {
     PagedFile file(path);
-    const ExportAnswer answer = findElfExports(file.content(), names);
-    return answer != ExportAnswer::Unknown ? answer : findPeExports(file.content(), names);
+    return findExports(file.content(), names);
+}
+
+ExportAnswer findExports(ByteView file, const std::vector<QByteArray> &names)
+{
+    const ExportAnswer answer = findElfExports(file, names);
+    return answer != ExportAnswer::Unknown ? answer : findPeExports(file, names);
 }

@@ -2,11 +2,19 @@
 
 #include "Core/BaseLib/Binary/LoadedParts.h"
 
+#include <QFile>
+
+#include <utility>
+
 #include <elf.h>
 
 static_assert(Q_BYTE_ORDER == Q_LITTLE_ENDIAN, "fields are copied as they stand in the file");
 
 namespace {
+
+/// More than any honest library needs.
+constexpr std::size_t kMostElfNames = 4096;
+constexpr quint64 kLongestElfName = 4096; ///< PATH_MAX
 
 bool isSharedLibrary(const Elf64_Ehdr &header)
 {
@@ -53,10 +61,11 @@ std::optional<LoadPlan> readLoadPlan(ByteView file)
     return plan;
 }
 
-/// The entries of the dynamic section that lead to symbols. As in the loader, a repeated entry replaces the
-/// one before.
+/// The entries of the dynamic section that lead to symbols and to other libraries. As in the loader, a
+/// repeated entry replaces the one before.
 struct DynamicSection {
     std::optional<quint64> symbols, symbolSize, strings, stringsSize, hash, gnuHash;
+    std::vector<std::pair<Elf64_Sxword, quint64>> names; ///< tags and offsets among the strings
 
     void take(const Elf64_Dyn &entry)
     {
@@ -78,6 +87,12 @@ struct DynamicSection {
             break;
         case DT_GNU_HASH:
             gnuHash = entry.d_un.d_val;
+            break;
+        case DT_NEEDED:
+        case DT_RPATH:
+        case DT_RUNPATH:
+            if (names.size() < kMostElfNames)
+                names.emplace_back(entry.d_tag, entry.d_un.d_val);
             break;
         default:
             break;
@@ -124,10 +139,22 @@ std::optional<ElfTables> readElfTables(ByteView file)
                      dynamic->gnuHash.has_value()};
 }
 
-std::optional<quint16> elfMachine(ByteView file)
+std::optional<ElfNeeds> readElfNeeds(ByteView file)
 {
-    const auto header = file.item<Elf32_Ehdr>(0); // the two forms differ behind this field
-    if (!header || std::memcmp(header->e_ident, ELFMAG, SELFMAG) != 0)
+    const std::optional<LoadPlan> plan = readLoadPlan(file);
+    const std::optional<DynamicSection> dynamic = plan ? readDynamicSection(*plan) : std::nullopt;
+    if (!dynamic || !dynamic->strings)
         return std::nullopt;
-    return header->e_machine;
+    const ByteView strings = plan->segments.from(*dynamic->strings);
+    ElfNeeds needs;
+    for (const auto &[tag, offset] : dynamic->names) {
+        const std::optional<QByteArray> name = strings.text(offset, kLongestElfName);
+        if (!name)
+            return std::nullopt;
+        if (tag == DT_NEEDED)
+            needs.libraries.append(QFile::decodeName(*name));
+        else
+            needs.folders.append(QFile::decodeName(*name).split(QLatin1Char(':'), Qt::SkipEmptyParts));
+    }
+    return needs;
 }

@@ -2,6 +2,8 @@
 
 #include "Core/BaseLib/Binary/BinaryExports.h"
 
+#include <QStringList>
+
 #include <optional>
 
 /// The tables in which the system's loader looks up a shared library's symbols. They point into the file.
@@ -21,8 +23,14 @@ inline constexpr quint64 kMostElfSteps = 1 << 20;
 /// contradicts itself.
 std::optional<ElfTables> readElfTables(ByteView file);
 
-/// The processor that an ELF file of 32 or 64 bits was built for (EM_…); none for any other file.
-std::optional<quint16> elfMachine(ByteView file);
+/// The libraries that a shared library needs, and the folders that it names for finding them.
+struct ElfNeeds {
+    QStringList libraries;
+    QStringList folders; ///< as they stand there, with "$ORIGIN" and the like
+};
+
+/// None when the file is not an x86-64 shared library, is cut short or contradicts itself.
+std::optional<ElfNeeds> readElfNeeds(ByteView file);
 
 /// Whether the content of an ELF file, of any alignment and not to be trusted, exports one of these symbols.
 ExportAnswer findElfExports(ByteView file, const std::vector<QByteArray> &names);

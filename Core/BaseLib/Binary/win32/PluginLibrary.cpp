@@ -6,20 +6,6 @@
 #include <QFileInfo>
 #include <QScopeGuard>
 
-namespace {
-
-/// What the file itself tells: the system's message names neither the machine nor the missing library.
-QString foundInFile(const QString &path, const QString &firstFolder)
-{
-    try {
-        return whyNotLoadable(path, importSearch(firstFolder));
-    } catch (const std::exception &) {
-        return {}; // out of memory
-    }
-}
-
-} // namespace
-
 void *PluginLibrary::loadUncached(const QString &path) noexcept
 {
     if (path.isEmpty()) {
@@ -39,10 +25,8 @@ void *PluginLibrary::loadUncached(const QString &path) noexcept
     if (module)
         return module;
     const DWORD error = GetLastError();
-    m_errorText = systemMessage(error, path);
-    const QString reason = foundInFile(path, searchDllLoadDir ? QFileInfo(path).path() : QString());
-    if (!reason.isEmpty())
-        m_errorText += QStringLiteral(" (the file %1)").arg(reason);
+    setErrorText(path, importSearch(searchDllLoadDir ? QFileInfo(path).path() : QString()),
+                 systemMessage(error, QStringLiteral("the file")));
     return nullptr;
 }
 

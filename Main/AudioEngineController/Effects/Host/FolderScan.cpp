@@ -23,7 +23,8 @@ EffectRecord keptBesideFailure(const EffectRecord &old, const EffectRecord &file
     EffectRecord kept = old;
     kept.path = file.path;
     if (!old.isSwitchedOff()) {
-        kept.fileTime = file.fileTime;
+        if (!file.fileTime.isEmpty()) // else the file comes back as it was, with what crashed in it
+            kept.fileTime = file.fileTime;
         kept.working = false;
     }
     return kept;
@@ -196,12 +197,14 @@ void FolderScan::log(const ScanItem &item, const ProbeOutcome &outcome) const
 void FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
 {
     bool added = false;
+    if (outcome.ifFailed == ProbeOutcome::IfFailed::LookAgain)
+        m_file.fileTime.clear();
     if (outcome.status == ProbeStatus::Listed)
         added = addListed(item, outcome);
-    else if (outcome.status == ProbeStatus::Failed && outcome.ifFailed == ProbeOutcome::IfFailed::Record)
-        added = addFailed(item);
-    else if (outcome.status == ProbeStatus::Failed)
+    else if (outcome.status == ProbeStatus::Failed && outcome.ifFailed == ProbeOutcome::IfFailed::KeepKnown)
         keepUnchanged(item);
+    else if (outcome.status == ProbeStatus::Failed) // what was only looked at can wait for the last write
+        added = addFailed(item) && m_isTouched;
     log(item, outcome);
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);

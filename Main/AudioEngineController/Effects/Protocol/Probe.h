@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Core/BaseLib/Binary/ModuleFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeStage.h"
@@ -34,6 +35,7 @@ struct ProbeOutcome {
     enum class IfFailed {
         Record,    ///< a record of the file says that it does not work; it is asked again when it changes
         KeepKnown, ///< what was known stays as it is; the next scan asks again
+        LookAgain, ///< as `Record`, without a time stamp: copies that are cut short keep their time
     };
 
     ProbeStatus status = ProbeStatus::Failed;
@@ -52,6 +54,18 @@ struct ProbeOutcome {
     {
         if (reason.isEmpty())
             reason = why;
+    }
+
+    /// Takes over what the file tells before it is loaded. True when it may be.
+    bool accept(const ModuleInspection &file)
+    {
+        using Verdict = ModuleInspection::Verdict;
+        fail(file.reason);
+        if (file.verdict == Verdict::NoLibrary || file.verdict == Verdict::NoExport)
+            status = ProbeStatus::NoPlugin;
+        if (file.verdict == Verdict::CutShort || file.verdict == Verdict::Unopened)
+            ifFailed = IfFailed::LookAgain;
+        return file.verdict == Verdict::Loadable;
     }
 };
 

@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTModule.h"
 
-#include "Core/BaseLib/Binary/BinaryExports.h"
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Log/FormatText.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
 #include "Main/AudioEngineController/Effects/VST/IVSTEffectOwner.h"
 #include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
@@ -30,6 +30,23 @@ VSTLoadResult entryFailed(Status status, const QString &how)
     return failed(status, QStringLiteral("its entry point ") + how);
 }
 
+/// What a hardware fault is for people.
+QString inWords(const SEException &fault)
+{
+    switch (fault.code()) {
+    case FaultCode::kAccessViolation:
+        return QStringLiteral("invalid memory access");
+    case FaultCode::kIllegalInstruction:
+        return QStringLiteral("invalid instruction");
+    case FaultCode::kIntegerDivideByZero:
+        return QStringLiteral("division by zero");
+    case FaultCode::kStackOverflow:
+        return QStringLiteral("stack overflow");
+    default:
+        return formatText(L"fault 0x%08X", fault.code());
+    }
+}
+
 VSTLoadResult invalidEffect()
 {
     return entryFailed(Status::InvalidEffect,
@@ -38,17 +55,19 @@ VSTLoadResult invalidEffect()
 
 } // namespace
 
-VSTLoadResult VSTModule::inspect(const QString &path)
+ModuleInspection VSTModule::inspect(const QString &path)
 {
-    const bool isNone = findExports(path, {kEntryPoint, kOldEntryPoint}) == ExportAnswer::NotExported;
-    return isNone ? noEntryPoint() : VSTLoadResult();
+    ModuleInspection file = inspectModule(path, {kEntryPoint, kOldEntryPoint});
+    if (file.verdict == ModuleInspection::Verdict::NoExport)
+        file.reason = noEntryPoint().reason;
+    return file;
 }
 
 VSTLoadResult VSTModule::load(const QString &path)
 {
     if (!m_library.isLoaded() && !m_library.load(path)) {
         DebugLog(L"Cannot load the module %ls: %ls", path, m_library.errorText());
-        return failed(Status::NotLoaded, QStringLiteral("it could not be loaded: ") + m_library.errorText());
+        return failed(Status::NotLoaded, m_library.errorText());
     }
     m_entryPoint = m_library.symbol(kEntryPoint);
     if (!m_entryPoint)
@@ -70,8 +89,9 @@ VSTLoadResult VSTModule::enter(VSTHostCallbackFunction callback, IVSTEffectOwner
         return takeOver(callGuarded([&] { return entryPoint(callback); }), owner);
     } catch (const SEException &fault) {
         m_faulted = true;
-        return entryFailed(Status::EntryFailed,
-                           QStringLiteral("failed: ") + QString::fromLatin1(fault.what()));
+        DebugLog(L"The VST plug-in's entry point failed: %s", fault.what());
+        return failed(Status::EntryFailed,
+                      QStringLiteral("it crashed when it was started (%1)").arg(inWords(fault)));
     } catch (const std::exception &exception) {
         return entryFailed(Status::EntryFailed, QStringLiteral("threw: ") + guardedText(exception));
     } catch (...) {

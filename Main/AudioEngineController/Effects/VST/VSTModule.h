@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Core/BaseLib/Binary/ModuleFile.h"
 #include "Core/BaseLib/Binary/PluginLibrary.h"
 #include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
 
@@ -43,8 +44,8 @@ public:
     VSTModule(const VSTModule &) = delete;
     VSTModule &operator=(const VSTModule &) = delete;
 
-    /// What can be seen of a file without loading it: done, unless it surely exports no entry point.
-    static VSTLoadResult inspect(const QString &path);
+    /// What can be seen of a file without loading it. One that surely exports no entry point is not a module.
+    static ModuleInspection inspect(const QString &path);
 
     bool isLoaded() const { return m_library.isLoaded(); }
     /// Loads the library, unless one is loaded, and looks for its entry point.

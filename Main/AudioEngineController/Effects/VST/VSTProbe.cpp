@@ -102,9 +102,9 @@ VSTLoadResult Run::enter()
 
 void Run::ask()
 {
-    VSTLoadResult result = VSTModule::inspect(m_job.path);
-    if (result.isDone())
-        result = enter();
+    if (!outcome.accept(VSTModule::inspect(m_job.path)))
+        return;
+    VSTLoadResult result = enter();
     outcome.fail(result.reason);
     if (result.status == VSTLoadResult::Status::NoEntryPoint)
         outcome.status = ProbeStatus::NoPlugin;

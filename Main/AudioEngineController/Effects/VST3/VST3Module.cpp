@@ -20,6 +20,15 @@ VST3Module::VST3Module(StageListener stageEntered)
 
 VST3Module::~VST3Module() { close(); }
 
+ModuleInspection VST3Module::inspect(const QString &path)
+{
+    QString reason;
+    const QString binary = VST3ModuleFile::binary(path, reason);
+    if (binary.isEmpty())
+        return {ModuleInspection::Verdict::Foreign, reason};
+    return inspectModule(binary);
+}
+
 std::optional<VST3Failure> VST3Module::open(const QString &path)
 {
     const QString step = QLatin1String("VST3 Exception: Failed to get load module:") + path;
@@ -28,7 +37,7 @@ std::optional<VST3Failure> VST3Module::open(const QString &path)
         m_stageEntered(ProbeStage::Load);
         const QString reason = load();
         if (!m_library.isLoaded())
-            return VST3Failure{step, QLatin1String("it could not be loaded: ") + reason};
+            return VST3Failure{step, reason};
     }
     m_initialised = true;
     m_stageEntered(ProbeStage::Start);
@@ -44,7 +53,7 @@ QString VST3Module::load()
     const QString binary = VST3ModuleFile::binary(m_path, reason);
     if (binary.isEmpty() || m_library.load(binary))
         return reason;
-    return QString(m_library.errorText()).remove(binary + QLatin1String(": "));
+    return m_library.errorText();
 }
 
 IPluginFactory *VST3Module::factory()

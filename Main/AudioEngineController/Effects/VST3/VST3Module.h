@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Core/BaseLib/Binary/ModuleFile.h"
 #include "Core/BaseLib/Binary/PluginLibrary.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeStage.h"
 
@@ -33,6 +34,8 @@ public:
     VST3Module(const VST3Module &) = delete;
     VST3Module &operator=(const VST3Module &) = delete;
 
+    /// What can be seen of a module without loading it.
+    static ModuleInspection inspect(const QString &path);
     /// Loads and starts the module; nothing when that succeeded. A module that was loaded but reports that it
     /// could not start is ended and unloaded by `close()` all the same. Exceptions of its entry function
     /// leave this.

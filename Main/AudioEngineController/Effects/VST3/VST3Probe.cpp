@@ -199,6 +199,11 @@ ProbeOutcome VST3Probe::run(const ProbeJob &job, IProbeObserver &observer)
     timer.start();
     ProbeOutcome outcome;
     bool factoryFound = true;
+    outcome.ifFailed = ifFailed(job.path, true);
+    if (!outcome.accept(VST3Module::inspect(job.path))) {
+        outcome.milliseconds = static_cast<double>(timer.nsecsElapsed()) / 1e6;
+        return outcome;
+    }
     ModuleListing module(outcome, observer);
     module.listClasses(outcome.records, job.path, job.announceClasses, factoryFound);
     outcome.leftThreads = module.close();

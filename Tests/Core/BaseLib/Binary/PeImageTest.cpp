@@ -1,5 +1,6 @@
 #include "Core/BaseLib/Binary/PeImage.h"
 #include "Core/BaseLib/Binary/LoadFailure.h"
+#include "Core/BaseLib/Binary/ModuleFile.h"
 
 #include "Tests/Core/BaseLib/Binary/CorpusFile.h"
 #include "Tests/Support/TestFolder.h"
@@ -82,29 +83,77 @@ TEST(PeImage, ExportsOfEachMachineAreFound)
 
 TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
 {
+    const QString own =
+        kOwnForm == LibraryForm::Pe
+            ? ""
+            : "it needs plug.dll, and it is built for Windows; this machine needs one for Linux";
     const struct {
         const char *name;
         QString library;
-        QString imported; ///< found as "missing.dll"; none when empty
-        const char *reason;
+        QString missing, plug; ///< what is found under these names
+        QString reason;
     } rows[] = {
-        {"nothing wrong, and imports in circles", "pe/64-bit.dll", "pe/64-bit.dll", ""},
-        {"other machine", "pe/32-bit.dll", "", "is built for 32-bit x86"},
-        {"missing", "pe/64-bit.dll", "", "needs missing.dll, which is not found"},
-        {"needs another machine's", "pe/64-bit.dll", "pe/arm64.dll",
-         "needs missing.dll, which is built for 64-bit ARM"},
-        {"needs another system's", "pe/64-bit.dll", "elf/exported-gnu",
-         "needs missing.dll, which is not a Windows library"},
-        {"needs a part of one", "pe/64-bit.dll", "pe/cut-short.dll",
-         "needs missing.dll, which is cut short or damaged"},
-        {"not there: the loader says so", "pe/none", "", ""},
+        {"needs itself", "pe/64-bit.dll", "", "pe/64-bit.dll", own},
+        {"one is missing", "pe/64-bit.dll", "none", "", "it needs missing.dll, which is not installed"},
+        {"two are missing", "pe/64-bit.dll", "none", "none",
+         "it needs missing.dll and plug.dll, which are not installed"},
+        {"needs what is cut short", "pe/64-bit.dll", "", "pe/cut-short.dll",
+         "it needs plug.dll, and it is cut short: "},
+        {"needs a text", "pe/64-bit.dll", "scanlist/folders.xml", "none",
+         "it needs plug.dll, which is not installed"},
+        {"not there: the loader says so", "pe/none", "none", "none", ""},
     };
     for (const auto &row : rows) {
         const auto search = [&](const QString &name) -> std::optional<QString> {
-            if (name != "missing.dll")
-                return QString(); // known to load
-            return row.imported.isEmpty() ? std::nullopt : std::make_optional(corpusPath(row.imported));
+            const QString found = name == "missing.dll" ? row.missing : name == "plug.dll" ? row.plug : "";
+            if (found == "none")
+                return std::nullopt;
+            return found.isEmpty() ? found : corpusPath(found);
         };
-        EXPECT_EQ(whyNotLoadable(corpusPath(row.library), search), row.reason) << row.name;
+        const QString reason = whyNotLoadable(corpusPath(row.library), search);
+        EXPECT_EQ(reason.left(row.reason.size()), row.reason) << row.name;
+        EXPECT_EQ(reason.isEmpty(), row.reason.isEmpty()) << row.name << ": " << qPrintable(reason);
     }
+}
+
+TEST(ModuleFile, TellsBeforeLoadingWhatCannotBeLoaded)
+{
+    using Verdict = ModuleInspection::Verdict;
+    const struct {
+        const char *name, *file;
+        int offset, width;
+        quint64 value;
+        Verdict ofElf, ofPe; ///< where these are the system's own
+    } rows[] = {
+        {"ELF", "elf/exported-gnu", 0, 1, 0x7f, Verdict::Loadable, Verdict::Foreign},
+        {"ELF of 32 bits, all headers there", "elf/exported-gnu", 4, 1, 1, Verdict::Loadable,
+         Verdict::Foreign},
+        {"ELF for ARM", "elf/exported-gnu", 18, 2, 183, Verdict::Foreign, Verdict::Foreign},
+        {"ELF of the other byte order", "elf/exported-gnu", 5, 1, 2, Verdict::Loadable, Verdict::Foreign},
+        {"segment behind the end", "elf/exported-gnu", 0x40 + 32, 8, 1 << 30, Verdict::CutShort,
+         Verdict::CutShort},
+        {"segment that wraps around", "elf/exported-gnu", 0x40 + 32, 8, ~0ULL, Verdict::CutShort,
+         Verdict::CutShort},
+        {"section headers behind the end", "elf/exported-gnu", 40, 8, 1 << 30, Verdict::CutShort,
+         Verdict::CutShort},
+        {"ELF magic that is none", "elf/exported-gnu", 1, 1, 'e', Verdict::NoLibrary, Verdict::NoLibrary},
+        {"PE", "pe/64-bit.dll", 0, 1, 'M', Verdict::Foreign, Verdict::Loadable},
+        {"PE of 32 bits", "pe/32-bit.dll", 0, 1, 'M', Verdict::Foreign, Verdict::Foreign},
+        {"section behind the end", "pe/64-bit.dll", kSection + 16, 4, ~0U, Verdict::CutShort,
+         Verdict::CutShort},
+        {"program of DOS", "pe/64-bit.dll", 0x40, 1, 'N', Verdict::NoLibrary, Verdict::NoLibrary},
+    };
+    for (const auto &row : rows) {
+        CorpusFile file(row.file);
+        file.put(row.offset, row.width, row.value);
+        const ModuleInspection seen = inspectContent(file.view());
+        EXPECT_EQ(seen.verdict, kOwnForm == LibraryForm::Elf ? row.ofElf : row.ofPe) << row.name;
+        EXPECT_EQ(seen.reason.isEmpty(), seen.verdict == Verdict::Loadable) << row.name;
+    }
+    for (const char *name : {"elf/exported-gnu", "elf/needs-two", "pe/64-bit.dll", "pe/32-bit.dll"})
+        for (CorpusFile part(name); !part.content.isEmpty();) {
+            part.content.chop(1);
+            ASSERT_EQ(inspectContent(part.view()).verdict, Verdict::CutShort)
+                << name << ", " << part.content.size() << " bytes";
+        }
 }

@@ -11,6 +11,7 @@ namespace {
 // Bundle layout, module name and entry functions are those of the VST 3 documentation, "Plug-in format
 // structure" (Linux).
 constexpr char kBinaryFolder[] = "/Contents/x86_64-linux";
+constexpr char kMachine[] = "x86_64-linux";
 
 using EntryFunction = bool (*)(void *libraryHandle);
 using ExitFunction = bool (*)();
@@ -51,7 +52,7 @@ QString VST3ModuleFile::binary(const QString &path, QString &reason)
     const QStringList found = QDir(folder).entryList({QStringLiteral("*.so")}, QDir::Files);
     if (found.size() == 1)
         return folder + QLatin1Char('/') + found.first();
-    reason = found.isEmpty() ? QStringLiteral("the bundle has no module in Contents/x86_64-linux")
+    reason = found.isEmpty() ? whyNoBinary(path, QLatin1String(kMachine))
                              : QStringLiteral("the bundle has several modules and none of its own name");
     return QString();
 }

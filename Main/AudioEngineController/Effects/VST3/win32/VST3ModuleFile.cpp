@@ -39,7 +39,7 @@ QString VST3ModuleFile::binary(const QString &path, QString &reason)
 {
     if (!QFileInfo(path).isDir())
         return path;
-    reason = QStringLiteral("the bundle has no module in Contents/x86_64-win");
+    reason = whyNoBinary(path, QStringLiteral("x86_64-win"));
     return QString();
 }
 

@@ -1,3 +1,4 @@
+#include "Core/BaseLib/Binary/PluginLibrary.h"
 #include "Core/BaseLib/Binary/posix/ElfTables.h"
 
 #include "Tests/Core/BaseLib/Binary/CorpusFile.h"
@@ -86,4 +87,20 @@ TEST(ElfExports, WhatHasNoEndOrNoContentIsLeftToTheLoader)
     ASSERT_EQ(mkfifo(qPrintable(folder.path("pipe.so")), 0600), 0);
     for (const char *name : {"pipe.so", "missing.so", "Plugins", "/dev/zero"})
         EXPECT_EQ(findExports(folder.path(name), kEntryPoints), Answer::Unknown) << name;
+}
+
+TEST(PluginLibrary, NamesTheLibrariesThatAreMissing)
+{
+    const TestFolder folder;
+    const QString path = folder.path("needs-two.so"), beside = "lib/libgone.so.1";
+    ASSERT_TRUE(QFile::copy(corpusPath("elf/needs-two"), path));
+    PluginLibrary library;
+    EXPECT_FALSE(library.load(path));
+    EXPECT_EQ(library.errorText(), "it needs libgone.so.1 and libaway.so.2, which are not installed");
+    folder.write(beside, "a text");
+    EXPECT_FALSE(library.load(path));
+    EXPECT_EQ(library.errorText(), "it needs libaway.so.2, which is not installed");
+    folder.write("lib/libaway.so.2", folder.read(path));
+    EXPECT_FALSE(library.load(path));
+    EXPECT_EQ(library.errorText(), "it needs libgone.so.1, and it is not a program library");
 }

@@ -51,7 +51,7 @@ TEST_F(VSTProbeTest, OutcomesAreToldApart)
     const char *const whole = "load start ask close";
     const char *const noEffect = "its entry point returned something that is not a VST 2 effect";
     const char *const foreign = "its entry point threw something that is not a standard exception";
-    const char *const fault = "its entry point failed: SE Exception: Access Violation";
+    const char *const fault = "it crashed when it was started (invalid memory access)";
     const auto listed = ProbeStatus::Listed, failed = ProbeStatus::Failed;
     const struct {
         const char *name;
@@ -63,7 +63,7 @@ TEST_F(VSTProbeTest, OutcomesAreToldApart)
     } rows[] = {
         {"good", "", listed, ProbeStage::Close, "", whole},
         {"NoEntry", "", ProbeStatus::NoPlugin, ProbeStage::Load, "it exports no VST 2 entry point", ""},
-        {"missing", {}, failed, ProbeStage::Load, "it could not be loaded: ", "load"},
+        {"missing", {}, failed, ProbeStage::Load, "it cannot be opened: ", ""},
         {"null", "answer entry null", failed, ProbeStage::Start, "its entry point returned null",
          "load start close"},
         {"wrong magic", "magic 1", failed, ProbeStage::Start, noEffect, "load start close"},

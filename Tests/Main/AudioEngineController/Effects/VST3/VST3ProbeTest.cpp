@@ -116,10 +116,9 @@ TEST_F(VST3ProbeTest, AModuleForAnotherMachineIsNotLoaded)
     qToLittleEndian<quint16>(isElf ? 183 : 0xAA64, module.data() + machine);
     m_folder.write("arm.vst3", module);
     const ProbeOutcome outcome = probe(m_folder.path("arm.vst3"));
-    EXPECT_EQ(m_observer.heard, QStringList("load"));
+    EXPECT_EQ(m_observer.heard, QStringList());
     EXPECT_EQ(outcome.ifFailed, ProbeOutcome::IfFailed::Record);
-    EXPECT_TRUE(outcome.reason.startsWith("it could not be loaded: ") && outcome.reason.contains("ARM"))
-        << qPrintable(outcome.reason);
+    EXPECT_EQ(outcome.reason, "it is built for 64-bit ARM; this machine needs 64-bit x86");
 }
 
 TEST_F(VST3ProbeTest, BusesGiveTheChannels)

@@ -1,0 +1,34 @@
+#include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
+
+#include "Core/BaseLib/Files/FolderListing.h"
+
+#include <QRegularExpression>
+
+namespace {
+
+/// The folders of other machines and systems ("aarch64-linux") that are not empty.
+QStringList otherMachines(const FolderContent &contents, const QString &path)
+{
+    static const QRegularExpression pattern(QStringLiteral("^(.+-(linux|win)|MacOS)$"));
+    QStringList machines;
+    for (const FolderEntry &entry : contents.entries)
+        if (entry.isFolder && pattern.match(entry.name).hasMatch() &&
+            !listFolder(path + QLatin1Char('/') + entry.name).entries.empty())
+            machines.append(entry.name);
+    return machines;
+}
+
+} // namespace
+
+QString VST3ModuleFile::whyNoBinary(const QString &bundle, const QString &folder)
+{
+    const QString path = bundle + QLatin1String("/Contents");
+    const FolderContent contents = listFolder(path);
+    for (const QString &problem : {contents.problem, listFolder(path + QLatin1Char('/') + folder).problem})
+        if (!problem.isEmpty())
+            return QStringLiteral("its folder Contents cannot be searched: ") + problem;
+    const QStringList machines = otherMachines(contents, path);
+    if (!machines.isEmpty())
+        return QStringLiteral("the bundle has modules for %1 only").arg(machines.join(QLatin1String(", ")));
+    return QStringLiteral("the bundle has no module in Contents/") + folder;
+}
