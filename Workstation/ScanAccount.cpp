@@ -80,7 +80,7 @@ void ScanAccount::end(const ReportLine &line)
 {
     const bool isSkipped = line.event == ReportLine::Event::Skipped;
     ProbeAccount &account = m_probes[keyOf(line)];
-    account.isLoaded = !isSkipped;
+    account.isLoaded = account.stage.has_value();
     account.noPlugin = isSkipped || line.noPlugin;
     account.reason = line.reason;
     account.records = line.records;
@@ -117,5 +117,6 @@ const ProbeAccount *ScanAccount::find(const PluginKey &key) const
 bool ScanAccount::wasProbed(PluginFormat format, const QString &path) const
 {
     const auto found = m_probes.lower_bound({format, path, 0});
-    return found != m_probes.end() && found->first.format == format && found->first.path == path;
+    return found != m_probes.end() && found->first.format == format && found->first.path == path &&
+           found->second.isLoaded;
 }

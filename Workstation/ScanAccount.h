@@ -64,7 +64,7 @@ public:
     const std::map<PluginKey, ProbeAccount> &probes() const { return m_probes; }
     /// What became of a probe; null when there was none.
     const ProbeAccount *find(const PluginKey &key) const;
-    /// Whether the file was probed in any way.
+    /// Whether the file was loaded.
     bool wasProbed(PluginFormat format, const QString &path) const;
 
 private:

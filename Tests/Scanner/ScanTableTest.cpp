@@ -119,6 +119,7 @@ put z/Comp.vst3:
 put z/Echo.vst2:
 put ../Outside/Far.vst3:
 put ../Store/Odd.vst3:
+put ../Loose.vst3:
 link Plugins/a Plugins/z
 link Plugins/z/loop Plugins
 link Plugins/z/top .
@@ -467,6 +468,8 @@ TEST_P(ScanTable, EndsAsItSays)
     for (const QString &step : GetParam().steps) {
         SCOPED_TRACE(step.toStdString());
         carryOut(step);
+        if (IsSkipped())
+            return;
     }
 }
 

@@ -117,6 +117,7 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
     };
     for (const auto &row : rows)
         row.isVst3 ? addVst3(row.name, row.script) : addVst2(row.name, row.script);
+    m_folder.write("Plugins/Empty3.vst3", ""); // looked at in each scan
     const auto check = [&rows](const QJsonObject &result) {
         for (const auto &row : rows) {
             SCOPED_TRACE(row.name);
@@ -130,6 +131,7 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
     EXPECT_EQ(m_folder.read(m_folder.scanList()).replace("\r\n", "\n"),
               "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<Scan>\n\t<Path>" + m_folder.plugins().toUtf8() +
                   "</Path>\n</Scan>\n");
+    EXPECT_EQ(reason(first, "Empty3"), "it is empty");
     EXPECT_TRUE(first["scan"]["finished"].toBool());
 
     const QByteArray csv = run({"--list", "--format", "csv"}).standardOutput;

@@ -77,6 +77,8 @@ quint64 elfEnd(ByteView file)
 std::optional<quint64> peEnd(ByteView file)
 {
     const auto start = file.from(kDosNewHeader).item<quint32>(0);
+    if (start && *start >= kMostPeStart)
+        return std::nullopt; // a text
     const quint64 headerEnd = start.value_or(kDosNewHeader) + sizeof(PeHeader);
     if (!start || file.size() < headerEnd)
         return headerEnd;

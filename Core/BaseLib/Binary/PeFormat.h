@@ -13,6 +13,7 @@ static_assert(Q_BYTE_ORDER == Q_LITTLE_ENDIAN, "fields are copied as they stand 
 
 inline constexpr quint16 kDosMagic = 0x5a4d;          // "MZ"
 inline constexpr quint64 kDosNewHeader = 0x3c;        // where the 32-bit offset of the PE header stands
+inline constexpr quint32 kMostPeStart = 0x10000000;   // the loader takes none that lies beyond
 inline constexpr quint32 kPeMagic = 0x00004550;       // "PE", two zeros
 inline constexpr quint16 kPeOptionalMagic32 = 0x010b; // PE32
 inline constexpr quint16 kPeOptionalMagic64 = 0x020b; // PE32+
