@@ -11,11 +11,14 @@ namespace {
 /// The system also accepts halves of surrogate pairs, which UTF-8 files cannot hold.
 bool isText(const QString &name) { return QString::fromUtf8(name.toUtf8()) == name; }
 
-/// What leads elsewhere; other reparse points are files and folders of cloud storage and the like.
+/// Other reparse points are files and folders of cloud storage and the like.
 bool isLink(const WIN32_FIND_DATAW &entry)
 {
-    return (entry.dwFileAttributes & FILE_ATTRIBUTE_REPARSE_POINT) != 0 &&
-           (entry.dwReserved0 == IO_REPARSE_TAG_SYMLINK || entry.dwReserved0 == IO_REPARSE_TAG_MOUNT_POINT);
+    if ((entry.dwFileAttributes & FILE_ATTRIBUTE_REPARSE_POINT) == 0)
+        return false;
+    const DWORD tag = entry.dwReserved0;
+    return tag == IO_REPARSE_TAG_SYMLINK || tag == IO_REPARSE_TAG_MOUNT_POINT ||
+           tag == 0; // NOTE: Wine gives links of the system that it runs on no tag
 }
 
 void add(std::vector<FolderEntry> &entries, const WIN32_FIND_DATAW &entry)
@@ -27,9 +30,12 @@ void add(std::vector<FolderEntry> &entries, const WIN32_FIND_DATAW &entry)
     entries.push_back({name, (entry.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) != 0, isLink(entry)});
 }
 
-bool isAbsence(DWORD error)
+/// Whether nothing could be listed because there is no such folder.
+bool isAbsent(const QString &folder, DWORD error)
 {
-    return error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND || error == ERROR_DIRECTORY;
+    const DWORD attributes = GetFileAttributesW(nativePath(folder).c_str());
+    const bool isFile = attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_DIRECTORY) == 0;
+    return isFile || error == ERROR_FILE_NOT_FOUND || error == ERROR_PATH_NOT_FOUND;
 }
 
 } // namespace
@@ -41,7 +47,7 @@ FolderContent readFolder(const QString &folder)
     const HANDLE search = FindFirstFileExW(nativePath(folder + QStringLiteral("/*")).c_str(), FindExInfoBasic,
                                            &entry, FindExSearchNameMatch, nullptr, FIND_FIRST_EX_LARGE_FETCH);
     if (search == INVALID_HANDLE_VALUE) {
-        if (const DWORD error = GetLastError(); !isAbsence(error))
+        if (const DWORD error = GetLastError(); !isAbsent(folder, error))
             content.problem = systemMessage(error, folder);
         return content;
     }

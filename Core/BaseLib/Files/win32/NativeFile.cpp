@@ -83,12 +83,6 @@ QString finalPath(const WindowsHandle &file)
     return path;
 }
 
-bool isReparsePoint(const QString &path)
-{
-    const DWORD attributes = GetFileAttributesW(nativePath(path).c_str());
-    return attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_REPARSE_POINT) != 0;
-}
-
 qint64 unitsOf(const FILETIME &time)
 {
     return static_cast<qint64>(quint64(time.dwHighDateTime) << 32 | time.dwLowDateTime);
@@ -129,9 +123,9 @@ std::optional<QString> realPath(const QString &path)
     if (!identity)
         return std::nullopt;
     const QString real = finalPath(file);
-    if (!real.isEmpty() && !isReparsePoint(real))
+    if (!real.isEmpty())
         return real;
-    // NOTE: Wine does not resolve the links of the system that it runs on.
+    // Drivers of some drives tell no path.
     const auto &[volume, high, low] = *identity;
     return formatText(L"%08lx:%08lx%08lx", volume, high, low);
 }
