@@ -39,7 +39,7 @@ struct ProbeOutcome {
     };
 
     ProbeStatus status = ProbeStatus::Failed;
-    ProbeStage stage = ProbeStage::Load; ///< the last one entered
+    ProbeStage stage = ProbeStage::Load; ///< where it failed, if it did, else the last one entered
     QString reason; ///< why it failed: one phrase without the path; empty when it did not
     IfFailed ifFailed = IfFailed::Record;
     /// In the module's order, with path and file time. A sub-plug-in that failed or was left out has its name

@@ -28,35 +28,80 @@ constexpr int32 kManyClasses = 6;
 /// calls for classes that do not exist take minutes.
 constexpr int32 kMaxClasses = 0x10000;
 
-/// What the factory's newer interfaces tell about a class; zeroed where the factory lacks them.
-PClassInfo2 classDetails(IPluginFactory &factory, int32 index)
+/// What a factory tells of a class.
+struct ClassInfo {
+    bool isOrdinary = false; ///< the oldest form tells of it
+    bool isAudio = false;
+    QString name;
+    FUID id;
+    QString subCategories; ///< not in the oldest form
+    QString vendor;        ///< neither
+};
+
+/// Zeroes an SDK structure and has the factory fill it. One that fills it and answers that it failed is
+/// believed.
+template <typename Info, typename Ask>
+bool isAnswered(Info &info, Ask &&ask)
 {
-    PClassInfo2 details;
-    std::memset(static_cast<void *>(&details), 0, sizeof details);
-    if (const FUnknownPtr<IPluginFactory2> factory2(&factory); factory2)
-        factory2->getClassInfo2(index, &details);
-    if (const FUnknownPtr<IPluginFactory3> factory3(&factory); factory3) {
-        PClassInfoW unicode; // fetched as hosts do, and not used
-        std::memset(static_cast<void *>(&unicode), 0, sizeof unicode);
-        factory3->getClassInfoUnicode(index, &unicode);
+    std::memset(static_cast<void *>(&info), 0, sizeof info);
+    return ask() == kResultOk || info.category[0] != 0;
+}
+
+template <typename Info>
+void readBasics(ClassInfo &read, const Info &info)
+{
+    read.isAudio = std::strncmp(info.category, kVstAudioEffectClass, sizeof info.category) == 0;
+    read.name = fixedText(info.name);
+    read.id = FUID::fromTUID(info.cid);
+}
+
+template <typename Info>
+void readDetails(ClassInfo &read, const Info &info)
+{
+    read.subCategories = fixedText(info.subCategories);
+    read.vendor = fixedText(info.vendor);
+}
+
+ClassInfo classInfo(IPluginFactory &factory, int32 index)
+{
+    ClassInfo read;
+    PClassInfo info;
+    read.isOrdinary = isAnswered(info, [&] { return factory.getClassInfo(index, &info); });
+    readBasics(read, info);
+    return read;
+}
+
+/// Asks the newer forms. An ordinary class has its details from the second; the third is asked as hosts do,
+/// and not used. A class that the oldest form does not tell of is what the richest other one says.
+void askNewerForms(ClassInfo &read, IPluginFactory &factory, int32 index)
+{
+    if (const FUnknownPtr<IPluginFactory2> factory2(&factory); factory2) {
+        PClassInfo2 info;
+        if (isAnswered(info, [&] { return factory2->getClassInfo2(index, &info); }) && !read.isOrdinary)
+            readBasics(read, info);
+        readDetails(read, info);
     }
-    return details;
+    if (const FUnknownPtr<IPluginFactory3> factory3(&factory); factory3) {
+        PClassInfoW info;
+        if (isAnswered(info, [&] { return factory3->getClassInfoUnicode(index, &info); }) &&
+            !read.isOrdinary) {
+            readBasics(read, info);
+            readDetails(read, info);
+        }
+    }
 }
 
 /// What an initialised component and the factory say of its class.
-EffectRecord describe(Vst::IComponent &component, const PClassInfo &info, const PClassInfo2 &details,
-                      const QString &factoryVendor)
+EffectRecord describe(Vst::IComponent &component, const ClassInfo &info, const QString &factoryVendor)
 {
     EffectRecord record;
-    record.name = fixedText(info.name);
+    record.name = info.name;
     record.inputs = usedChannels(audioBuses(component, Vst::kInput));
     record.outputs = usedChannels(audioBuses(component, Vst::kOutput));
-    record.id = classIdText(FUID::fromTUID(info.cid));
-    record.categories = fixedText(details.subCategories);
+    record.id = classIdText(info.id);
+    record.categories = info.subCategories;
     record.category = categoryFromSubCategories(record.categories);
-    record.vendor = fixedText(details.vendor);
-    if (record.vendor.isEmpty())
-        record.vendor = factoryVendor;
+    record.vendor = info.vendor.isEmpty() ? factoryVendor : info.vendor;
     if (record.inputs == 0 && record.outputs == 0) {
         record.outputs = 2;
         record.inputs = isInstrumentCategory(record.category) ? 0 : 2;
@@ -82,12 +127,13 @@ public:
 
 private:
     void listFactory(ClassListing &records, bool notifyEachClass, bool &factoryFound);
-    void listClass(ClassListing &records, IPluginFactory &factory, const PClassInfo &info,
-                   const PClassInfo2 &details);
+    /// Whether it is an audio class of a name that was not met yet.
+    bool isNew(const ClassInfo &info) const { return info.isAudio && m_names.count(info.name) == 0; }
+    void listClass(ClassListing &records, IPluginFactory &factory, const ClassInfo &info);
     void enter(ProbeStage stage);
     /// The step that failed goes to the log, the cause into the outcome.
     void fail(const VST3Failure &failure);
-    void failClass(const PClassInfo &info, const char *what, tresult result);
+    void failClass(const QString &name, const char *what, tresult result);
 
     ProbeOutcome &m_outcome;
     IProbeObserver &m_observer;
@@ -126,13 +172,12 @@ void ModuleListing::listFactory(ClassListing &records, bool notifyEachClass, boo
     m_factoryVendor = vendorOf(*factory);
     const int32 count = factory->countClasses();
     for (int32 index = 0; index < std::min(count, kMaxClasses); ++index) {
-        PClassInfo info;
-        std::memset(static_cast<void *>(&info), 0, sizeof info);
-        factory->getClassInfo(index, &info);
-        if (std::strncmp(info.category, kVstAudioEffectClass, sizeof info.category) != 0 ||
-            m_names.count(fixedText(info.name)) != 0)
+        ClassInfo info = classInfo(*factory, index);
+        if (!info.isOrdinary || isNew(info))
+            askNewerForms(info, *factory, index);
+        if (!isNew(info))
             continue;
-        listClass(records, *factory, info, classDetails(*factory, index));
+        listClass(records, *factory, info);
         if (notifyEachClass || count > kManyClasses)
             m_observer.classAnnounced();
     }
@@ -141,31 +186,32 @@ void ModuleListing::listFactory(ClassListing &records, bool notifyEachClass, boo
     factory->release(); // not when the plug-in threw: its state is unknown then
 }
 
-void ModuleListing::listClass(ClassListing &records, IPluginFactory &factory, const PClassInfo &info,
-                              const PClassInfo2 &details)
+void ModuleListing::listClass(ClassListing &records, IPluginFactory &factory, const ClassInfo &info)
 {
-    const QString name = fixedText(info.name);
-    m_names.insert(name);
-    m_observer.classBegins(name);
+    m_names.insert(info.name);
+    m_observer.classBegins(info.name);
     tresult result = kResultOk;
-    auto *const component = createObject<Vst::IComponent>(&factory, FUID::fromTUID(info.cid), result);
+    auto *const component = createObject<Vst::IComponent>(&factory, info.id, result);
     if (!component) {
-        failClass(info, "created", result);
+        failClass(info.name, "created", result);
         return;
     }
     result = component->initialize(m_hostContext->unknown());
     if (result != kResultOk) {
-        failClass(info, "initialised", result); // neither terminated nor released: it is not called again
+        failClass(info.name, "initialised",
+                  result); // neither terminated nor released: it is not called again
         return;
     }
-    records.push_back(describe(*component, info, details, m_factoryVendor));
+    records.push_back(describe(*component, info, m_factoryVendor));
     component->terminate();
     component->release();
 }
 
+/// The stage of a failure stays: what comes after it only clears up.
 void ModuleListing::enter(ProbeStage stage)
 {
-    m_outcome.stage = stage;
+    if (m_outcome.reason.isEmpty())
+        m_outcome.stage = stage;
     m_observer.stageEntered(stage);
 }
 
@@ -176,10 +222,10 @@ void ModuleListing::fail(const VST3Failure &failure)
 }
 
 /// A class that failed is left out; of several the outcome tells the first, the log all.
-void ModuleListing::failClass(const PClassInfo &info, const char *what, tresult result)
+void ModuleListing::failClass(const QString &name, const char *what, tresult result)
 {
     const QString reason =
-        formatText(L"its class \"%ls\" could not be %s (result 0x%08X)", fixedText(info.name), what, result);
+        formatText(L"its class \"%ls\" could not be %s (result 0x%08X)", name, what, result);
     DebugLog(L"%ls", reason);
     m_outcome.fail(reason);
 }

@@ -6,8 +6,10 @@
 
 #include <pluginterfaces/base/ipluginbase.h>
 
+#include <algorithm>
 #include <cstring>
 #include <exception>
+#include <iterator>
 
 // How a plug-in's interfaces are asked.
 
@@ -40,6 +42,15 @@ template <std::size_t Size>
 QString fixedText(const Steinberg::char8 (&field)[Size])
 {
     return QString::fromUtf8(field, static_cast<int>(strnlen(field, Size)));
+}
+
+/// The same of UTF-16; half a surrogate pair is replaced.
+template <std::size_t Size>
+QString fixedText(const Steinberg::char16 (&field)[Size])
+{
+    const auto length = std::find(std::begin(field), std::end(field), Steinberg::char16(0)) - field;
+    const QString text(reinterpret_cast<const QChar *>(field), static_cast<int>(length));
+    return QString::fromUtf8(text.toUtf8());
 }
 
 /// The vendor that a factory states; empty when it states none.

@@ -2,19 +2,19 @@
 #include "Tests/Support/TestFolder.h"
 #include "Tests/Support/VST3Fixture.h"
 
+#include <QRegularExpression>
 #include <QtEndian>
 
 #include <gtest/gtest.h>
 
 namespace {
 
+const QStringList kStages = {"load", "start", "ask", "close"};
+
 /// Writes down what it hears: stages, classes that begin, and "!" for each that is announced.
 class NotingObserver : public IProbeObserver {
 public:
-    void stageEntered(ProbeStage stage) override
-    {
-        heard << QStringList{"load", "start", "ask", "close"}.at(static_cast<int>(stage));
-    }
+    void stageEntered(ProbeStage stage) override { heard << kStages.at(static_cast<int>(stage)); }
     void classBegins(const QString &name) override { heard << name; }
     void classAnnounced() override { heard << "!"; }
     void childrenFound(std::size_t) override {}
@@ -49,6 +49,7 @@ protected:
 
 TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
 {
+    const QRegularExpression isEarlier("^(load|start|ask)$");
     const QString thrown = "it threw: thrown by the fixture", none = "it lists no audio plug-in among its ";
     const struct {
         const char *name;
@@ -66,8 +67,8 @@ TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
          "record: " + none + "-5 classes"},
         {"not initialised", "class A\nclass B\nanswer initialize false A", "load start ask A B close",
          "B: its class \"A\" could not be initialised (result 0x00000001)"},
-        {"not created", "class A\nclass B\nanswer create-instance null\nanswer class-info false B",
-         "load start ask A close", "record: its class \"A\" could not be created (result 0x00000000)"},
+        {"not created", "class A\nclass B\nanswer create-instance null", "load start ask A B close",
+         "record: its class \"A\" could not be created (result 0x00000000)"},
         {"other categories",
          "class 1\ncategory \"Component Controller Class\"\nclass 2\ncategory \"Audio Module\"\n"
          "class 3\ncategory \"Audio Module Class and 32 bytes!!\"\nclass 4\ncategory \"audio module class\"",
@@ -102,8 +103,36 @@ TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
         EXPECT_EQ(outcome.status, listed.isEmpty() ? ProbeStatus::Failed : ProbeStatus::Listed) << row.name;
         if (listed.isEmpty())
             listed << QStringList{"record", "keep"}.at(static_cast<int>(outcome.ifFailed));
+        EXPECT_EQ(kStages.at(static_cast<int>(outcome.stage)),
+                  outcome.reason.isEmpty() ? "close" : m_observer.heard.filter(isEarlier).last())
+            << row.name;
         EXPECT_EQ(listed.join(' ') + (outcome.leftThreads ? " left threads: " : ": ") + outcome.reason,
                   row.outcome);
+    }
+}
+
+TEST_F(VST3ProbeTest, AClassIsWhatTheFormsSayThatAreAnswered)
+{
+    // In the older forms the bytes E9 are no UTF-8; in UTF-16 they are a letter.
+    const QByteArray described = "class \"A\xE9\"\nvendor \"V\xE9\"\nsubcategories Fx|EQ\n";
+    const QByteArray refused[] = {"answer class-info false\n", "answer class-info2 false\n",
+                                  "answer class-info-unicode false\n"};
+    const struct {
+        int answered; // 1, 2 and 4: the forms by their age
+        const char *record, *last = "";
+    } rows[] = {{7, "A\uFFFD|V\uFFFD|Fx|EQ"},  {1, "A\uFFFD|Fixture Works|"},
+                {2, "A\uFFFD|V\uFFFD|Fx|EQ"},  {4, "A\u00E9|V\u00E9|Fx|EQ"},
+                {5, "A\uFFFD|Fixture Works|"}, {6, "A\u00E9|V\u00E9|Fx|EQ"},
+                {6, "", "category Audio"},     {2, "A\uFFFD|V\uFFFD|Fx|EQ", "generation 2"},
+                {4, "", "generation 2"},       {0, ""}};
+    for (const auto &row : rows) {
+        QByteArray script = described + row.last + '\n';
+        for (int form = 0; form < 3; ++form)
+            script += (row.answered >> form & 1) != 0 ? QByteArray() : refused[form];
+        QStringList found;
+        for (const EffectRecord &record : probe("Forms", script).records)
+            found << record.name + '|' + record.vendor + '|' + record.categories;
+        EXPECT_EQ(found.join(' '), QString::fromUtf8(row.record)) << script.constData();
     }
 }
 
