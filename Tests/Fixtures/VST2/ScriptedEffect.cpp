@@ -1,61 +1,124 @@
-#include "Tests/Fixtures/VST2/ScriptedEffect.h"
+#include "Tests/Fixtures/FixtureScript.h"
+
+#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
 
 #include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <cstring>
+#include <map>
 #include <memory>
 #include <optional>
 #include <thread>
-#include <utility>
+
+#ifdef _WIN32
+#define FIXTURE_EXPORT extern "C" __declspec(dllexport)
+#else
+#define FIXTURE_EXPORT extern "C" __attribute__((visibility("default")))
+#endif
 
 namespace {
+
+namespace vst = VstPublished;
 
 /// What stands above the 32 bits of the flags, where other compilers leave what was in memory before.
 const auto kFlagsPadding = static_cast<VstIntPtr>(0x5A5A5A5A00000000);
 /// What the numbers of a closed effect read as.
 const auto kSpoiled = static_cast<std::int32_t>(0xDDDDDDDD);
+const int kOpcodes = 128; ///< those from here on are no stages
+/// The most bytes of a chunk that a trace shows.
+const VstIntPtr kShownBytes = 64;
+
+// Constant, since static constructors read them.
+
+constexpr std::pair<int, const char *> kStages[] = {{effOpen, "open"},
+                                                    {effClose, "close"},
+                                                    {effGetParamName, "get-param-name"},
+                                                    {effMainsChanged, "mains-changed"},
+                                                    {vst::effEditIdle, "edit-idle"},
+                                                    {effGetChunk, "get-chunk"},
+                                                    {effSetChunk, "set-chunk"},
+                                                    {effGetPlugCategory, "get-plug-category"},
+                                                    {effSetSpeakerArrangement, "set-speaker-arrangement"},
+                                                    {effGetEffectName, "get-effect-name"},
+                                                    {effGetVendorString, "get-vendor-string"},
+                                                    {vst::effGetParameterProperties, "get-param-properties"},
+                                                    {effShellGetNextPlugin, "shell-next"}};
+constexpr int kWithPointer[] = {effGetParamName,    effGetChunk,
+                                effSetChunk,        effGetEffectName,
+                                effGetVendorString, effShellGetNextPlugin,
+                                effEditGetRect,     effGetProgramName,
+                                effCanDo,           vst::effGetParameterProperties};
+
+using Field = decltype(&AEffect::numInputs);
+/// The numbers of an effect, under the keys that set them.
+constexpr std::pair<const char *, Field> kFields[] = {
+    {"magic", &AEffect::magic},          {"inputs", &AEffect::numInputs},
+    {"outputs", &AEffect::numOutputs},   {"id", &AEffect::uniqueID},
+    {"latency", &AEffect::initialDelay}, {"stated-parameters", &AEffect::numParams},
+    {"programs", &AEffect::numPrograms}};
+
+/// The stage at which a dispatcher opcode is reached.
+std::string stageOf(int opcode)
+{
+    for (const auto &[named, stage] : kStages)
+        if (opcode == named)
+            return stage;
+    return "opcode-" + std::to_string(opcode);
+}
+
+const FixtureScript &script()
+{
+    static const FixtureScript script = [] {
+        std::string stages = "static-constructor entry get-parameter set-parameter process static-destructor";
+        for (int opcode = 0; opcode < kOpcodes; ++opcode)
+            stages += ' ' + stageOf(opcode);
+        std::string keys = "name vendor category flags parameter chunk editor set own-thread";
+        for (const auto &[key, field] : kFields)
+            keys += ' ' + std::string(key);
+        return FixtureScript({"child", true, keys, "after-children", stages});
+    }();
+    return script;
+}
+
+/// What comes after the listed children: "endless", "repeat" or nothing.
+std::string afterChildren() { return script().text("after-children", 0, {}); }
+bool isShell() { return script().subjects.size() > 1 || !afterChildren().empty(); }
+
+/// "TYPE(SPEAKERS…)".
+std::string arrangementText(const void *pointer)
+{
+    const auto *arrangement = static_cast<const VstSpeakerArrangement *>(pointer);
+    std::string text;
+    for (int index = 0; arrangement && index < arrangement->numChannels; ++index)
+        text += (index ? " " : "") + std::to_string(arrangement->speakers[index].type);
+    return arrangement ? std::to_string(arrangement->type) + '(' + text + ')' : "null";
+}
+
+/// What the trace tells about a call of the dispatcher; empty where all is zero.
+std::string detailOf(int opcode, int index, VstIntPtr value, const void *pointer, float opt)
+{
+    if (opcode == effSetSampleRate)
+        return textOf(opt);
+    if (opcode == effSetSpeakerArrangement)
+        return arrangementText(reinterpret_cast<const void *>(value)) + " -> " + arrangementText(pointer);
+    if (index == 0 && value == 0)
+        return {};
+    std::string detail = std::to_string(index) + " " + std::to_string(value);
+    if (opcode == effSetChunk)
+        detail.append(" ").append(static_cast<const char *>(pointer),
+                                  static_cast<std::size_t>(std::clamp<VstIntPtr>(value, 0, kShownBytes)));
+    return detail;
+}
 
 /// A text that fills the buffer gets no terminator; what lies behind a shorter one is left as it was.
-void fill(void *buffer, std::size_t size, const std::string &text, bool terminate = true)
+VstIntPtr fill(void *buffer, std::size_t size, const std::string &text, bool terminate = true)
 {
     std::memcpy(buffer, text.data(), std::min(size, text.size()));
     if (terminate && text.size() < size)
         static_cast<char *>(buffer)[text.size()] = '\0';
+    return 1;
 }
-
-/// The host call that this thread is nesting, while it waits for the host to call back.
-thread_local const HostCall *nestedCall = nullptr;
-thread_local int nestedDepth = 0; ///< the calls that are still to be made
-
-/// A thread that does the same again and again until it is stopped. One that was not outlives this object, as
-/// in a plug-in that nobody closed: it dies when the module is unmapped under it.
-class RepeatingThread {
-public:
-    template <typename Step>
-    explicit RepeatingThread(Step step)
-        : m_thread([stopping = m_stopping, step] {
-            for (; !*stopping; std::this_thread::sleep_for(std::chrono::milliseconds(1)))
-                step();
-        })
-    {}
-    RepeatingThread(RepeatingThread &&) = default;
-    ~RepeatingThread()
-    {
-        if (m_thread.joinable())
-            m_thread.detach();
-    }
-    void stop()
-    {
-        *m_stopping = true;
-        if (m_thread.joinable())
-            m_thread.join();
-    }
-
-private:
-    std::shared_ptr<std::atomic<bool>> m_stopping = std::make_shared<std::atomic<bool>>(false);
-    std::thread m_thread;
-};
 
 /// One effect that the module handed out. It stays in memory when it is closed, so that a call after that is
 /// found out.
@@ -67,57 +130,52 @@ public:
         , m_name(script().text("name", subject.place, subject.name) + (isOfSecondMain ? " by main" : ""))
         , m_parameters(script().all("parameter", subject.place))
     {
-        if (script().has("chunk", subject.place))
+        if (has("chunk"))
             m_chunk = script().text("chunk", subject.place, {});
         for (const FixtureScript::Words &parameter : m_parameters)
             m_values.push_back(parameter.size() > 1 ? floatOf(parameter[1]) : 0);
-        const int usualFlags = effFlagsCanReplacing | (m_chunk ? effFlagsProgramChunks : 0) |
-                               (script().has("editor", subject.place) ? effFlagsHasEditor : 0);
-        effect.magic = number("magic", kEffectMagic);
         effect.dispatcher = [](AEffect *self, int opcode, int index, VstIntPtr value, void *pointer,
                                float opt) { return of(self).dispatch(opcode, index, value, pointer, opt); };
         effect.process = effect.processReplacing = processBlock;
         effect.processDoubleReplacing = [](AEffect *, double **, double **, int) {};
         effect.setParameter = setParameter;
         effect.getParameter = getParameter;
-        effect.numPrograms = effect.version = 1;
-        effect.numParams = number("stated-parameters", static_cast<int>(m_parameters.size()));
-        effect.numInputs = number("inputs", 2);
-        effect.numOutputs = number("outputs", 2);
-        effect.flags = kFlagsPadding | static_cast<std::uint32_t>(number("flags", usualFlags));
         effect.object = this;
-        const int id = number("id", subject.number ? subject.number : 1000);
-        effect.uniqueID = isOfSecondMain ? id + 1 : id;
-        if (script().has("own-thread", subject.place))
-            m_threads.emplace_back([] {});
+        effect.magic = kEffectMagic;
+        effect.numPrograms = effect.version = 1;
+        effect.numInputs = effect.numOutputs = 2;
+        effect.numParams = static_cast<int>(m_parameters.size());
+        effect.uniqueID = subject.number ? subject.number : 1000;
+        for (const auto &[key, field] : kFields)
+            effect.*field = number(key, effect.*field);
+        effect.uniqueID += isOfSecondMain ? 1 : 0;
+        const int usualFlags = effFlagsCanReplacing | (m_chunk ? effFlagsProgramChunks : 0) |
+                               (has("editor") ? effFlagsHasEditor : 0);
+        effect.flags = kFlagsPadding | static_cast<std::uint32_t>(number("flags", usualFlags));
+        if (has("own-thread"))
+            repeatUntilClose([] {});
+        askHost("entry");
+    }
+    /// Threads that nobody stopped outlive the effect, as in a plug-in that nobody closed: they die when the
+    /// module is unmapped under them.
+    ~Effect()
+    {
+        for (std::thread &thread : m_threads)
+            thread.detach();
     }
     Effect(const Effect &) = delete;
     Effect &operator=(const Effect &) = delete;
 
-    /// Makes the host calls that the script has for a stage.
-    void askHost(const std::string &stage)
-    {
-        for (const FixtureScript::Words &words : script().all("ask-host")) {
-            const HostCall call(words);
-            if (words[0] != stage)
-                continue;
-            if (call.fromThread)
-                std::thread([&] { askAtDepth(call, call.depth); }).join();
-            else
-                askAtDepth(call, call.depth);
-            if (call.untilClose)
-                m_threads.emplace_back([this, call] { ask(call); });
-        }
-    }
-
     /// Ends the effect's threads and spoils what the host must not read any more.
     void close()
     {
-        for (RepeatingThread &thread : m_threads)
-            thread.stop();
+        *m_stopping = true;
+        for (std::thread &thread : m_threads)
+            thread.join();
+        m_threads.clear();
         isClosed = true;
-        effect.magic = effect.numPrograms = effect.numParams = effect.numInputs = kSpoiled;
-        effect.numOutputs = effect.initialDelay = effect.uniqueID = kSpoiled;
+        for (const auto &[key, field] : kFields)
+            effect.*field = kSpoiled;
     }
 
     AEffect effect = {};
@@ -162,11 +220,11 @@ private:
                 outputs[channel][frame] += channel < effect->numInputs ? inputs[channel][frame] : 1.0f;
     }
 
+    bool has(const char *key) const { return script().has(key, m_subject.place); }
     std::int32_t number(const char *key, std::int32_t usual) const
     {
         return script().number(key, m_subject.place, usual);
     }
-
     bool hasParameter(int index) const
     {
         return index >= 0 && static_cast<std::size_t>(index) < m_parameters.size();
@@ -175,31 +233,62 @@ private:
     void reach(const std::string &stage, const std::string &detail)
     {
         script().reach(stage, m_subject, detail);
-        for (const FixtureScript::Words &words : script().all("new-outputs", m_subject.place))
-            if (words[0] == stage)
-                effect.numOutputs = numberOf(words.at(1));
+        for (const FixtureScript::Words &words : script().all("set", m_subject.place))
+            for (const auto &[key, field] : kFields)
+                if (words.at(0) == stage && words.at(1) == key)
+                    effect.*field = numberOf(words.at(2));
         askHost(stage);
+    }
+
+    template <typename Step>
+    void repeatUntilClose(Step step)
+    {
+        m_threads.emplace_back([stopping = m_stopping, step] {
+            for (; !*stopping; std::this_thread::sleep_for(std::chrono::milliseconds(1)))
+                step();
+        });
+    }
+
+    /// Makes the host calls that the script has for a stage.
+    void askHost(const std::string &stage)
+    {
+        for (const FixtureScript::Words &words : script().all("ask-host")) {
+            const auto has = [&](const char *option) {
+                return std::find(words.begin(), words.end(), option) != words.end();
+            };
+            const auto after = [&](const char *option) {
+                return has(option) ? *(std::find(words.begin(), words.end() - 1, option) + 1) : "0";
+            };
+            if (words[0] != stage)
+                continue;
+            const auto ask = [this, opcode = numberOf(words.at(1)), index = numberOf(after("index")),
+                              value = numberOf(after("value")), opt = floatOf(after("opt"))] {
+                return m_host(&effect, opcode, index, value, nullptr, opt);
+            };
+            const auto note = [&] { script().note("host-" + words[1], m_subject, std::to_string(ask())); };
+            if (has("from-thread"))
+                std::thread(note).join();
+            else
+                note();
+            if (has("until-close"))
+                repeatUntilClose(ask);
+        }
     }
 
     VstIntPtr dispatch(int opcode, int index, VstIntPtr value, void *pointer, float opt)
     {
-        const bool asksParameter =
-            opcode == effGetParamName || opcode == VstPublished::effGetParameterProperties;
-        if (needsPointer(opcode) && !pointer)
+        const bool asksParameter = opcode == effGetParamName || opcode == vst::effGetParameterProperties;
+        const bool asksChild = opcode == effShellGetNextPlugin;
+        if (!pointer &&
+            std::find(std::begin(kWithPointer), std::end(kWithPointer), opcode) != std::end(kWithPointer))
             reportMisuse(stageOf(opcode) + " without a pointer");
         if (opcode == effSetChunk && value < 0)
             reportMisuse("set-chunk with a negative size");
+        if (asksChild)
+            return nextChild(pointer);
         if (asksParameter && !hasParameter(index))
             return 0;
-        if (opcode == effShellGetNextPlugin)
-            return nextChild(pointer);
-        // Taken first: a fault that this stage commits ends the nesting.
-        const HostCall *call =
-            opcode == VstPublished::effEditIdle ? std::exchange(nestedCall, nullptr) : nullptr;
-        const int depth = nestedDepth;
         reach(stageOf(opcode), detailOf(opcode, index, value, pointer, opt));
-        if (call)
-            askAtDepth(*call, depth);
         return answer(stageOf(opcode), m_subject, handle(opcode, index, value, pointer));
     }
 
@@ -216,12 +305,10 @@ private:
             close();
             return 0;
         case effGetParamName:
-            fill(pointer, 128, m_parameters[static_cast<std::size_t>(index)].at(0));
-            return 0;
+            return fill(pointer, 128, m_parameters[static_cast<std::size_t>(index)].at(0));
         case effGetChunk:
             if (m_chunk)
-                *static_cast<const void **>(pointer) =
-                    script().has("null-chunk", m_subject.place) ? nullptr : m_chunk->data();
+                *static_cast<const void **>(pointer) = m_chunk->data();
             return m_chunk ? static_cast<VstIntPtr>(m_chunk->size()) : 0;
         case effSetChunk:
             m_chunk = std::string(static_cast<const char *>(pointer), static_cast<std::size_t>(value));
@@ -233,15 +320,11 @@ private:
         case effEditGetRect:
             return editorRect(pointer);
         case effGetEffectName:
-            fill(pointer, 1024, m_name);
-            return 1;
+            return fill(pointer, 1024, m_name);
         case effGetVendorString:
-            fill(pointer, 256, script().text("vendor", m_subject.place, "Fixture Works"));
-            return 1;
-        case VstPublished::effGetParameterProperties:
+            return fill(pointer, 256, script().text("vendor", m_subject.place, "Fixture Works"));
+        case vst::effGetParameterProperties:
             return properties(m_parameters[static_cast<std::size_t>(index)], pointer);
-        case effGetVstVersion:
-            return kVstVersion;
         default:
             return 0;
         }
@@ -251,11 +334,10 @@ private:
     {
         if (parameter.size() < 3)
             return 0;
-        auto &target = *static_cast<VstPublished::VstParameterProperties *>(pointer);
+        auto &target = *static_cast<vst::VstParameterProperties *>(pointer);
         target = {};
         fill(target.label, sizeof target.label, parameter[2], false);
-        fill(target.shortLabel, sizeof target.shortLabel, parameter[2], false);
-        return 1;
+        return fill(target.shortLabel, sizeof target.shortLabel, parameter[2], false);
     }
 
     VstIntPtr editorRect(void *pointer)
@@ -264,9 +346,8 @@ private:
             m_editor = {0, 0, static_cast<short>(numberOf(words.at(1))),
                         static_cast<short>(numberOf(words[0]))};
             *static_cast<ERect **>(pointer) = &m_editor;
-            return 1;
         }
-        return 0;
+        return has("editor") ? 1 : 0;
     }
 
     /// What comes after the listed children is not in the trace and no stage: a host that never stops asking
@@ -274,50 +355,19 @@ private:
     VstIntPtr nextChild(void *pointer)
     {
         const auto &subjects = script().subjects;
-        const std::string after = afterChildren();
-        const std::size_t place = ++m_listed;
-        if (place < subjects.size()) {
-            script().reach("shell-next", subjects[place]);
-            askHost("shell-next");
-            fill(pointer, 1024, subjects[place].name);
-            return answer("shell-next", subjects[place], subjects[place].number);
-        }
-        if (after == "repeat") {
-            const FixtureSubject &child = subjects[1 + (place - 1) % (subjects.size() - 1)];
-            fill(pointer, 1024, child.name);
-            return child.number;
-        }
-        if (after == "endless") {
-            const auto id = static_cast<std::int32_t>(1000000 + place - 1);
-            fill(pointer, 1024, "Endless " + std::to_string(id));
-            return id;
-        }
-        m_listed = 0;
-        reach("shell-next", "end");
-        return answer("shell-next", m_subject, 0);
-    }
-
-    VstIntPtr ask(const HostCall &call)
-    {
-        return m_host(&effect, call.opcode, call.index, call.value, nullptr, call.opt);
-    }
-
-    void noteAnswer(const HostCall &call, const std::string &text) const
-    {
-        script().note("host-" + std::to_string(call.opcode), m_subject, text);
-    }
-
-    /// Nests by way of the idle call, which the host hands back to the effect.
-    void askAtDepth(const HostCall &call, int depth)
-    {
-        if (depth == 1)
-            return noteAnswer(call, std::to_string(ask(call)));
-        nestedCall = &call;
-        nestedDepth = depth - 1;
-        m_host(&effect, VstPublished::audioMasterIdle, 0, 0, nullptr, 0);
-        if (nestedCall)
-            noteAnswer(call, "not reached");
-        nestedCall = nullptr;
+        const std::size_t count = subjects.size() - 1, place = m_listed++;
+        const auto madeUp = static_cast<std::int32_t>(1000000 + place);
+        FixtureSubject child = m_subject;
+        if (place < count)
+            script().reach("shell-next", child = subjects[1 + place]);
+        else if (afterChildren() == "repeat")
+            child = subjects[1 + place % count];
+        else if (afterChildren() == "endless")
+            child = {"Endless " + std::to_string(madeUp), madeUp};
+        else
+            script().reach("shell-next", child, "end");
+        fill(pointer, 1024, child.name);
+        return answer("shell-next", child, child.number);
     }
 
     FixtureSubject m_subject;
@@ -327,8 +377,9 @@ private:
     std::vector<float> m_values;
     std::optional<std::string> m_chunk;
     ERect m_editor = {};
-    std::size_t m_listed = 0; ///< children listed since the enumeration began
-    std::vector<RepeatingThread> m_threads;
+    std::size_t m_listed = 0; ///< children listed so far
+    std::shared_ptr<std::atomic<bool>> m_stopping = std::make_shared<std::atomic<bool>>(false);
+    std::vector<std::thread> m_threads;
 };
 
 /// What the module handed out, for the module's life.
@@ -338,19 +389,61 @@ std::vector<std::unique_ptr<Effect>> &handedOut()
     return effects;
 }
 
+/// Runs the script's first and last stage with the library's own start-up and shutdown code.
+struct ModuleLife {
+    ModuleLife()
+    {
+        handedOut(); // makes the list, so that it is still there at the end
+        script().reach("static-constructor");
+    }
+    ~ModuleLife()
+    {
+        const auto open = std::count_if(handedOut().begin(), handedOut().end(),
+                                        [](const auto &effect) { return !effect->isClosed; });
+        script().reach("static-destructor", {}, open ? std::to_string(open) + " open" : "");
+    }
+} moduleLife;
+
+/// A shell asks the host which of its children is wanted, as all do, without an effect; 0 is the shell
+/// itself.
+std::optional<FixtureSubject> wantedSubject(audioMasterCallback host)
+{
+    const auto id =
+        isShell() ? static_cast<std::int32_t>(host(nullptr, audioMasterCurrentId, 0, 0, nullptr, 0)) : 0;
+    for (const FixtureSubject &subject : script().subjects)
+        if (subject.number == id)
+            return subject;
+    if (afterChildren() == "endless") // of no subject in the script
+        return FixtureSubject{"Endless " + std::to_string(id), id, script().subjects.size()};
+    script().note("entry", {}, std::to_string(id) + " unknown");
+    return std::nullopt;
+}
+
+AEffect *enter(audioMasterCallback host, bool isSecondMain)
+{
+    if (!host)
+        reportMisuse("the entry is called without a callback");
+    const std::optional<FixtureSubject> subject = wantedSubject(host);
+    if (!subject)
+        return nullptr;
+    script().reach("entry", *subject, subject->number ? std::to_string(subject->number) : "");
+    handedOut().push_back(std::make_unique<Effect>(*subject, host, isSecondMain));
+    const std::string answer = script().answer("entry", *subject);
+    if (answer.empty())
+        return &handedOut().back()->effect;
+    handedOut().back()->close();
+    return answer == "null" ? nullptr : reinterpret_cast<AEffect *>(16); // "no-memory"
+}
+
 } // namespace
 
-AEffect *makeEffect(const FixtureSubject &subject, audioMasterCallback host, bool isOfSecondMain)
-{
-    handedOut().push_back(std::make_unique<Effect>(subject, host, isOfSecondMain));
-    handedOut().back()->askHost("entry");
-    return &handedOut().back()->effect;
-}
+// FIXTURE_ENTRIES: 1 exports VSTPluginMain, 2 main, 3 both.
+#if FIXTURE_ENTRIES & 1
+FIXTURE_EXPORT AEffect *VSTPluginMain(audioMasterCallback host) { return enter(host, false); }
+#endif
+#if FIXTURE_ENTRIES & 2
+// C++ has rules for a function of this name, so only its symbol has it.
+FIXTURE_EXPORT AEffect *olderEntry(audioMasterCallback host) __asm__("main");
 
-void takeBack(AEffect *effect) { static_cast<Effect *>(effect->object)->close(); }
-
-std::size_t openEffects()
-{
-    return static_cast<std::size_t>(std::count_if(handedOut().begin(), handedOut().end(),
-                                                  [](const auto &effect) { return !effect->isClosed; }));
-}
+AEffect *olderEntry(audioMasterCallback host) { return enter(host, FIXTURE_ENTRIES == 3); }
+#endif

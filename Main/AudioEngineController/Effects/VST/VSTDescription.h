@@ -18,15 +18,16 @@ struct VSTNaming {
 
 /// The name that a path gives where the plug-in is not asked or tells none.
 QString vstNameOfFile(const QString &path);
-/// Names an effect. `fields` are those of the effect at hand, `shellId` the sub-plug-in that it was made for.
-VSTNaming nameEffect(VSTEffect &effect, const VSTEffect::Fields &fields, const QString &path,
-                     VstInt32 shellId);
+/// Names an effect. `shellId` is the sub-plug-in that it was made for; 0: none.
+VSTNaming nameEffect(VSTEffect &effect, const QString &path, VstInt32 shellId);
 /// Names the effect that was made for a record's path and sub-plug-in, and reads into the record what the
-/// catalogue holds of it: name, identifier, category, vendor, width and latency.
+/// catalogue holds of it: name, identifier, category, vendor, width and latency; and its channels as stated.
+/// Each is read when its turn comes, since plug-ins change their fields in a call.
 void describeEffect(VSTEffect &effect, EffectRecord &record);
 
-/// More sub-plug-ins than any shell has: an enumeration that goes on beyond is cut.
-inline constexpr int kMaxSubPlugins = 4096;
+/// More sub-plug-ins than any shell has: an enumeration that goes on beyond, or repeats itself as often, is
+/// cut.
+inline constexpr std::size_t kMaxSubPlugins = 4096;
 
 /// A sub-plug-in that a shell names.
 struct VSTSubPlugin {

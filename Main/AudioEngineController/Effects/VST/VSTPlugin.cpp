@@ -46,8 +46,7 @@ bool VSTPlugin::load(const EffectRecord &record, VSTHostCallbackFunction callbac
         return false;
     }
     adopt(result.effect);
-    const VSTEffect::Fields fields = m_effect.fields().value_or(VSTEffect::Fields{});
-    m_naming = nameEffect(m_effect, fields, record.path, m_shellId);
+    m_naming = nameEffect(m_effect, record.path, m_shellId);
     return true;
 }
 
@@ -84,6 +83,7 @@ bool VSTPlugin::openPlugin(const AudioSettings &settings)
     if (!m_effectOpened && !m_effect.dispatchAt(effOpen, 0, 0, nullptr))
         return false;
     m_effectOpened = true;
+    m_toldSampleRate = 0;
     if (!applySettings(settings) || !m_effect.sendValue(vst::effSetEditKnobMode, kLinearKnobs))
         return false;
     m_takesMidi = canDo("receiveVstMidiEvent");
@@ -93,8 +93,10 @@ bool VSTPlugin::openPlugin(const AudioSettings &settings)
 
 bool VSTPlugin::applySettings(const AudioSettings &settings)
 {
-    if (m_effect.isCallable())
+    if (m_effect.isCallable() && settings.sampleRate != m_toldSampleRate) {
+        m_toldSampleRate = settings.sampleRate;
         m_effect.dispatchFloat(effSetSampleRate, static_cast<float>(settings.sampleRate));
+    }
     return m_effect.sendValue(effSetBlockSize, settings.blockSize);
 }
 

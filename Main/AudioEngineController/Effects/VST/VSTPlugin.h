@@ -98,6 +98,7 @@ private:
     QString m_requestedKey; ///< empty: its own
     std::atomic<bool> m_needsIdle{false};
     std::atomic<bool> m_wantsMidi{false};
+    int m_toldSampleRate = 0;    ///< since it was opened, in Hz; 0: none yet
     bool m_effectOpened = false; ///< `effOpen` was sent to the effect at hand
     bool m_canBypass = false;
     bool m_takesMidi = false;

@@ -139,7 +139,8 @@ void Run::listShell(VSTEffect &shell, const EffectRecord &file)
 EffectRecord Run::askChild(const EffectRecord &child)
 {
     EffectRecord record = child;
-    record.id.clear(); // the shell's
+    record.id.clear(); // these are the shell's
+    record.inputs = record.outputs = -1;
     record.working = false;
     record.enabled = m_job.leftOut.count(child.subId) == 0;
     if (!record.enabled)

@@ -3,27 +3,14 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
-#include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/PluginBench.h"
 #include "Tests/Support/VST2Fixture.h"
 
-#include <gtest/gtest.h>
-
-#include <thread>
-
-/// Loads scripted plug-ins for use and notes what they are called.
-class VSTInstanceBench : public testing::Test {
+/// Loads scripted plug-ins for use.
+class VSTInstanceBench : public PluginBench {
 protected:
-    /// With the first thread the thread sanitizer starts one of its own, which would count as the plug-in's.
-    static void SetUpTestSuite()
-    {
-        std::thread([] {}).join();
-    }
-
     static constexpr AudioSettings kSettings = {48000, 64};
 
-    /// The script's first statement.
-    QByteArray tracing() const { return "trace \"" + m_folder.path("trace").toUtf8() + "\"\n"; }
     EffectRecord record(const char *file, const QByteArray &script)
     {
         EffectRecord record;
@@ -39,13 +26,5 @@ protected:
         return plugin;
     }
     /// The calls since the last time, without the plug-in's name where it is "Comp".
-    QString takeTrace() const
-    {
-        const QStringList lines = m_folder.lines("trace");
-        m_folder.write("trace", {});
-        return lines.join("; ").remove(" Comp");
-    }
-
-    TestFolder m_folder;
-    const CapturedLog m_log;
+    QString takeTrace() const { return PluginBench::takeTrace().remove(" Comp"); }
 };

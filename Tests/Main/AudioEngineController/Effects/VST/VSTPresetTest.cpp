@@ -44,7 +44,7 @@ TEST_F(VSTPreset, StoresStateOrParametersByteForByte)
                  {"chunk a", {}, "FAILED"},                     // one byte is none
                  {"chunk abc\nanswer get-chunk -5", "kept", "FAILED"},
                  {"chunk abc\nanswer get-chunk 2147483647", "kept", "FAILED"}, // more than there is
-                 {"chunk abc\nnull-chunk", "kept", "FAILED"},
+                 {"flags 0x30\nanswer get-chunk 3", "kept", "FAILED"},         // a null pointer
                  {"chunk abc\nfault get-chunk segv", "kept", "FAILED"},
                  {"", list({}, {}), "Storing 0 Parameters", true},
                  {"parameter A -1.5\nparameter B nan",

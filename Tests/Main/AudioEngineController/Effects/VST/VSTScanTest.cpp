@@ -1,78 +1,55 @@
-#include "Tests/Main/AudioEngineController/Effects/VST/VSTScanBench.h"
 #include "Tests/Support/PlatformValues.h"
+#include "Tests/Support/ScanBench.h"
+#include "Tests/Support/VST2Fixture.h"
 
 #include <QDir>
 #include <QFile>
 
 namespace {
 
-using VSTScan = VSTScanBench;
+const QByteArray kThree = "child 1 One\nchild 2 Two\nchild 0x80000003 Three\n";
+
+class VSTScan : public ScanBench {
+protected:
+    VSTScan()
+        : ScanBench("FXConfiguration.xml", vst2Ending())
+    {}
+};
 
 } // namespace
 
-TEST_F(VSTScan, OrderOfTheCallsOfAProbe)
-{
-    const std::pair<const char *, const char *> rows[] = {
-        {"", "get-plug-category; get-effect-name; get-plug-category; get-vendor-string"},
-        {"inputs 0\n", "get-vendor-string"},
-        {"category 2\n", "get-plug-category; get-plug-category; get-vendor-string"}};
-    for (const auto &[script, calls] : rows) {
-        update("Comp", script);
-        scan();
-        EXPECT_EQ(traceOf("Comp").join("; ").remove(" Comp"),
-                  QLatin1String("static-constructor; entry; ") + calls + "; close; static-destructor");
-        ASSERT_TRUE(QFile::remove(m_folder.path("Effects/FXConfiguration.xml")));
-    }
-}
-
-TEST_F(VSTScan, WhatIsRecorded)
-{
-    add("A", "name \"R\\xF6hre\"\nvendor \"\\xDFound\"\nid 77\ncategory 3\noutputs 6\n");
-    add("B.x64", "inputs 0\noutputs 2147483647\nid -1\nname unasked\n");
-    add("C", "outputs -5\nname \"\"\nanswer get-effect-name 0\n");
-    add("D", {}, VST2Fixture::Main);
-    add("E", {}, VST2Fixture::Both);
-    scan();
-    EXPECT_EQ(records("Name ID Vendor Category Width Enabled Working"),
-              texts({"B|B:-1|Fixture Works|2|2147483647|1|1", "C|C:1000|Fixture Works|1|-5|1|1",
-                     "D|D:1000|Fixture Works|1|2|1|1", "E|E:1000|Fixture Works|1|2|1|1",
-                     "Röhre|Röhre:77|ßound|3|6|1|1"}));
-    expectSettled();
-}
-
 TEST_F(VSTScan, FilesThatFailAreRecordedAndFilesThatAreNoPluginsAreNot)
 {
-    add("Healthy");
-    add("Null", "answer entry null\n");
-    add("Wild", "answer entry no-memory\n");
-    add("NoEntry", {}, VST2Fixture::NoEntry);
+    put("Healthy.vst2");
+    put("Wild.vst2", "answer entry no-memory\n");
+    put("Childless.vst2", "category 10\n");
+    addVST2File(m_folder.plugins(), "NoEntry", {}, VST2Fixture::NoEntry);
     addRaw("Text", "hello\n");
     addRaw("Empty", "");
     const QString log = scan().log;
     EXPECT_EQ(records("Name ID Enabled Working"),
-              texts({"Empty|Empty|1|0", "Healthy|Healthy:1000|1|1", "Null|Null|1|0", "Wild|Wild|1|0"}));
-    for (const QString &reason :
-         {modulePath("Text") + ": it is not a program library", modulePath("Empty") + ": it is empty",
-          modulePath("Wild") + ": its entry point returned something"})
+              texts({"Childless|Childless|1|0", "Empty|Empty|1|0", "Healthy|Healthy:1000|1|1",
+                     "Text|Text|1|0", "Wild|Wild|1|0"}));
+    for (const QString &reason : {QString(kTextFileReason), modulePath("Empty") + ": ",
+                                  modulePath("Wild") + ": its entry point returned something"})
         EXPECT_TRUE(log.contains(reason)) << qPrintable(log);
     expectSettled();
 }
 
-TEST_F(VSTScan, MarksSurviveAnUpdate)
+TEST_F(VSTScan, MarksSurviveAnUpdateAndAMove)
 {
-    for (const char *name : {"A", "B", "C"})
-        add(name);
+    for (const char *name : {"A.vst2", "B.vst2", "C.vst2"})
+        put(name);
     scan();
     mark("A", "Favourite", "1");
     mark("A", "CategoryMask", "16");
     mark("B", "Enabled", "0");
-    for (const char *name : {"A", "B"})
-        update(name, "vendor New\n");
+    for (const char *name : {"A.vst2", "B.vst2"})
+        dateLater(put(name, "vendor New\n"));
     scan();
     EXPECT_EQ(loaded(), QStringList("A")) << "what is switched off is not probed";
     EXPECT_EQ(records("Name Vendor CategoryMask Favourite Enabled Working"),
               texts({"A|New|16|1|1|1", "B|Fixture Works|0|0|0|1", "C|Fixture Works|0|0|1|1"}));
-    // Moved, the file is probed again with its marks, also the switch-off.
     ASSERT_TRUE(QDir(m_folder.plugins()).mkdir("sub"));
     ASSERT_TRUE(QFile::rename(modulePath("B"), modulePath("sub/B")));
     ASSERT_TRUE(QFile::remove(modulePath("C")));
@@ -81,37 +58,63 @@ TEST_F(VSTScan, MarksSurviveAnUpdate)
     expectSettled();
 }
 
-TEST_F(VSTScan, FilesOfOneNameAreToldApartByTheirPaths)
-{
-    add("one/Comp", "name One\n");
-    add("two/Comp", "name Two\n");
-    add("three/Comp_64", "name One\nid 3\n");
-    scan();
-    EXPECT_EQ(records("Name ID"), texts({"One|One:1000", "Comp|One:3", "Two|Two:1000"}));
-    update("two/Comp", "name Two\nvendor New\n");
-    scan();
-    EXPECT_EQ(loaded(), QStringList("Comp"));
-    expectSettled();
-}
-
 TEST_F(VSTScan, WhatAPluginChangesIsPutBack)
 {
     // The mask comes first: the catalogue keeps the permissions that it was made with.
     const QByteArray locale = QByteArray("locale ") + kForeignLocale;
     int number = 0;
-    for (const QByteArray &effect :
-         {QByteArray("umask 077"), locale, QByteArray("chdir /"), QByteArray("rounding up"),
-          QByteArray("signal segv"), QByteArray("signal term"), QByteArray("alarm 1"),
-          QByteArray("repair keep")})
+    for (const char *effect : {"umask 077", locale.constData(), "chdir /", "rounding up", "signal segv",
+                               "signal term", "alarm 1", "repair keep"})
         for (const char *stage : {"entry", "get-vendor-string"}) {
             const QByteArray id = QByteArray::number(++number);
-            add("Spoiler " + id, QByteArray("effect ") + stage + ' ' + effect + "\nid " + id + '\n');
+            put("Spoiler " + id + ".vst2", QByteArray("effect ") + stage + ' ' + effect + "\nid " + id);
         }
-    add("Thread", "effect entry thread\n");
-    add("Zealous", "own-thread\nask-host entry 1 from-thread\nask-host get-vendor-string 7 until-close\n");
+    put("Thread.vst2", "effect entry thread\n");
+    put("Zealous.vst2",
+        "own-thread\nask-host entry 1 from-thread\nask-host get-vendor-string 7 until-close\n");
     const ScannerOutcome outcome = scan();
     EXPECT_EQ(records("Working").count("1"), number + 2);
     EXPECT_TRUE(outcome.log.contains("Thread" + vst2Ending() + " left threads running and stays in memory"));
-    EXPECT_TRUE(QFile::permissions(m_folder.path("Effects/FXConfiguration.xml")) & QFile::ReadOther);
+    EXPECT_TRUE(QFile::permissions(cataloguePath()) & QFile::ReadOther);
     expectSettled();
+}
+
+TEST_F(VSTScan, EveryChildOfAShellIsListedAndEveryEffectClosed)
+{
+    put("Shell.vst2", kThree);
+    put("Twice.vst2", "child 1 A\nchild 2 B\nanswer entry null 2\nafter-children repeat\n");
+    scan();
+    EXPECT_EQ(records("Name ID Working"),
+              texts({"A|A:1|1", "B|B|0", "One|One:1|1", "Three|Three:-2147483645|1", "Two|Two:2|1"}));
+    const QByteArray text = m_folder.catalogue("FXConfiguration.xml").replace("\r\n", "\n");
+    EXPECT_TRUE(text.contains(
+        "\t\t<SubEffect>\n\t\t\t<Name>Three</Name>\n\t\t\t<ID>2147483651</ID>\n\t\t</SubEffect>\n"));
+    const QStringList calls = traceOf("Shell");
+    EXPECT_EQ(calls.filter("close"), texts({"close Three", "close Two", "close One", "close Shell"}));
+    EXPECT_EQ(calls.last(), "static-destructor");
+    EXPECT_EQ(calls.filter("static-constructor").size(), 1) << "loaded once";
+    expectSettled();
+}
+
+TEST_F(VSTScan, ADeadlyChildDisablesOnlyItself)
+{
+    const char *const name = "WaveShell1-VST 9.3_x64.vst2"; // no exception for those
+    put(name, kThree + "fault entry kill 2\n");
+    EXPECT_EQ(scanUntilSettled(), 2);
+    EXPECT_EQ(records("Name ID Enabled Working"),
+              texts({"One|One:1|1|1", "Three|Three:-2147483645|1|1", "Two|Two|0|0"}));
+    expectSettled();
+    // Another version of the file gives it another chance.
+    mark("One", "Favourite", "1");
+    mark("Three", "Enabled", "0");
+    dateLater(put(name, kThree));
+    scan();
+    EXPECT_EQ(records("Name Enabled Working Favourite"), texts({"One|1|1|1", "Three|0|1|0", "Two|1|1|0"}));
+}
+
+TEST_F(VSTScan, AChildOfTheShellsNameLeavesTheShellsMarkerAlone)
+{
+    put("Shell.vst2", "child 1 Shell\nchild 2 \"../../Up\"\nfault static-destructor kill\n");
+    EXPECT_EQ(scanUntilSettled(), 2);
+    EXPECT_EQ(records("Enabled Working").count("0|0"), 1);
 }

@@ -1,4 +1,4 @@
-#include "Tests/Main/AudioEngineController/Effects/Host/ScanBench.h"
+#include "Tests/Support/ScanBench.h"
 #include "Tests/Support/PlatformValues.h"
 #include "Tests/Support/VST3Fixture.h"
 

@@ -1,1 +1,0 @@
-#include "Tests/Support/ScanBench.cpp"

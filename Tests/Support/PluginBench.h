@@ -1,0 +1,73 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
+#include "Tests/Support/CapturedLog.h"
+#include "Tests/Support/TestFolder.h"
+
+#include <QRegularExpression>
+
+#include <gtest/gtest.h>
+
+#include <thread>
+
+/// Notes what it hears of a probe, a word or two for each.
+struct NotingObserver final : IProbeObserver {
+    static const char *nameOf(ProbeStage stage)
+    {
+        const char *const names[] = {"load", "start", "ask", "close"};
+        return names[static_cast<int>(stage)];
+    }
+    void stageEntered(ProbeStage stage) override { heard << nameOf(stage); }
+    void classBegins(const QString &name) override { heard << name; }
+    void classAnnounced() override { heard << "!"; }
+    void childrenFound(std::size_t count) override { heard << QString::number(count); }
+    void childBegins(const EffectRecord &child) override { heard << '<' + child.subName; }
+    void childEnds(const ProbeOutcome &outcome) override
+    {
+        EXPECT_EQ(outcome.records.size(), 1u);
+        EXPECT_EQ(outcome.records[0].working, outcome.status == ProbeStatus::Listed);
+        heard << '>' + outcome.reason;
+    }
+    void childCloses(const EffectRecord &child) override { heard << '(' + child.subName; }
+    void childClosed() override { heard << ")"; }
+
+    QStringList heard;
+};
+
+/// Scripted plug-ins that the test itself probes and uses. Their calls are in a trace.
+class PluginBench : public testing::Test {
+protected:
+    /// With the first thread the thread sanitizer starts one of its own, which would count as the plug-in's.
+    static void SetUpTestSuite()
+    {
+        std::thread([] {}).join();
+    }
+
+    /// The script's first statement.
+    QByteArray tracing() const { return "trace \"" + m_folder.path("trace").toUtf8() + "\"\n"; }
+    /// The calls since the last time.
+    QString takeTrace() const
+    {
+        const QStringList lines = m_folder.lines("trace");
+        m_folder.write("trace", {});
+        return lines.join("; ");
+    }
+    ProbeOutcome probe(IPluginProbe &&format, const QString &path, const std::set<quint32> &leftOut = {})
+    {
+        m_observer.heard.clear();
+        m_folder.write("trace", {});
+        return format.run({PluginFormat::Unknown, path, "its time", leftOut, false}, m_observer);
+    }
+    /// The outcome's stage must be the last one, or that of the failure, after which a module is only closed.
+    void expectStage(const ProbeOutcome &outcome) const
+    {
+        const QRegularExpression stage(outcome.reason.isEmpty() ? "^(load|start|ask|close)$"
+                                                                : "^(load|start|ask)$");
+        const QStringList entered = QStringList("load") + m_observer.heard.filter(stage);
+        EXPECT_EQ(NotingObserver::nameOf(outcome.stage), entered.last());
+    }
+
+    TestFolder m_folder;
+    const CapturedLog m_log;
+    NotingObserver m_observer;
+};
