@@ -148,22 +148,14 @@ TEST_F(VSTHostCallbackTest, ReportsReachTheirRegisteredOwnerOnly)
 
 TEST_F(VSTHostCallbackTest, PinsAreConnectedUpToTheEffectsCount)
 {
-    const struct {
-        const char *name;
-        VstInt32 index;
-        VstIntPtr kind, answer;
-    } rows[] = {{"last input", 1, 0, 0},
-                {"input behind the last", 2, 0, 1},
-                {"last output", 2, 1, 0},
-                {"output behind the last", 3, 1, 1},
-                {"neither input nor output", 0, 2, 1},
-                {"a kind beyond 32 bits", 0, VstIntPtr{1} << 32, 1}};
-    for (const auto &row : rows) {
+    const std::tuple<VstInt32, VstIntPtr, VstIntPtr> rows[] = {
+        {1, 0, 0}, {2, 0, 1}, {2, 1, 0}, {3, 1, 1}, {0, 2, 1}, {0, VstIntPtr{1} << 32, 1}};
+    for (const auto &[index, kind, expected] : rows) {
         const CapturedLog log;
         debugLogSettings().trace = true;
-        EXPECT_EQ(call(&m_owner.effect, 4, row.index, row.kind), row.answer) << row.name;
-        EXPECT_EQ(log.count("returned"), row.answer) << row.name << ": a trace line or none";
-        EXPECT_EQ(call(nullptr, 4, row.index, row.kind), 1) << row.name;
+        EXPECT_EQ(call(&m_owner.effect, 4, index, kind), expected) << index << " of kind " << kind;
+        EXPECT_EQ(log.count("returned"), expected) << "a trace line or none";
+        EXPECT_EQ(call(nullptr, 4, index, kind), 1);
     }
 }
 

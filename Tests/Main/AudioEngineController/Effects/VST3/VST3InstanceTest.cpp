@@ -1,9 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
-#include "Tests/Support/CapturedLog.h"
-#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/PluginBench.h"
 #include "Tests/Support/VST3Fixture.h"
-
-#include <gtest/gtest.h>
 
 namespace {
 
@@ -11,14 +8,13 @@ const QString kId = "00112233445566778899AABBCCDDEEFF";
 const QByteArray kOwnState = "state \"a\\x00b\"\n"; // of the class of that identifier
 const QByteArray kPanel = "controller Panel\nclass Panel\ncategory \"Component Controller Class\"\n";
 
-class VST3InstanceTest : public testing::Test {
+class VST3InstanceTest : public PluginBench {
 protected:
     /// The record of a class of the known identifier, of which the script tells the rest.
     EffectRecord add(const QByteArray &script, const QString &file = "Comp",
                      VST3Fixture fixture = VST3Fixture::Scripted)
     {
-        const QByteArray start =
-            "trace \"" + m_folder.path("trace").toUtf8() + "\"\nclass Comp\nid " + kId.toUtf8() + '\n';
+        const QByteArray start = tracing() + "class Comp\nid " + kId.toUtf8() + '\n';
         EffectRecord record;
         record.path = addVST3File(m_folder.plugins(), file, start + script, fixture);
         record.vendor = "Own";
@@ -26,16 +22,6 @@ protected:
         record.name = "Listed";
         return record;
     }
-    /// The calls since the last time.
-    QString takeTrace() const
-    {
-        const QStringList lines = m_folder.lines("trace");
-        m_folder.write("trace", {});
-        return lines.join("; ");
-    }
-
-    TestFolder m_folder;
-    const CapturedLog m_log;
 };
 
 } // namespace

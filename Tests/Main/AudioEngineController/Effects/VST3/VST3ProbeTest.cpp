@@ -1,55 +1,25 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Probe.h"
-#include "Tests/Support/TestFolder.h"
+#include "Tests/Support/PluginBench.h"
 #include "Tests/Support/VST3Fixture.h"
 
-#include <QRegularExpression>
 #include <QtEndian>
-
-#include <gtest/gtest.h>
 
 namespace {
 
-const QStringList kStages = {"load", "start", "ask", "close"};
-
-/// Writes down what it hears: stages, classes that begin, and "!" for each that is announced.
-class NotingObserver : public IProbeObserver {
-public:
-    void stageEntered(ProbeStage stage) override { heard << kStages.at(static_cast<int>(stage)); }
-    void classBegins(const QString &name) override { heard << name; }
-    void classAnnounced() override { heard << "!"; }
-    void childrenFound(std::size_t) override {}
-    void childBegins(const EffectRecord &) override {}
-    void childEnds(const ProbeOutcome &) override {}
-    void childCloses(const EffectRecord &) override {}
-    void childClosed() override {}
-
-    QStringList heard;
-};
-
-class VST3ProbeTest : public testing::Test {
+class VST3ProbeTest : public PluginBench {
 protected:
-    /// Probes a module of that name and script.
     ProbeOutcome probe(const QString &name, const QByteArray &script,
                        VST3Fixture fixture = VST3Fixture::Scripted)
     {
-        return probe(addVST3File(m_folder.plugins(), name, script, fixture));
+        return PluginBench::probe(VST3Probe(),
+                                  addVST3File(m_folder.plugins(), name, tracing() + script + '\n', fixture));
     }
-    ProbeOutcome probe(const QString &path)
-    {
-        m_observer.heard.clear();
-        return m_probe.run({PluginFormat::Vst3, path, "its time", {}, false}, m_observer);
-    }
-
-    const TestFolder m_folder;
-    NotingObserver m_observer;
-    VST3Probe m_probe;
 };
 
 } // namespace
 
 TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
 {
-    const QRegularExpression isEarlier("^(load|start|ask)$");
     const QString thrown = "it threw: thrown by the fixture", none = "it lists no audio plug-in among its ";
     const struct {
         const char *name;
@@ -93,7 +63,7 @@ TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
         {"leaves a thread", "class A\neffect initialize thread", "load start ask A close",
          "A left threads: "}};
     for (const auto &row : rows) {
-        const ProbeOutcome outcome = probe(row.name, row.script + '\n', row.fixture);
+        const ProbeOutcome outcome = probe(row.name, row.script, row.fixture);
         EXPECT_EQ(m_observer.heard.join(' '), row.heard) << row.name;
         QStringList listed;
         for (const EffectRecord &record : outcome.records) {
@@ -103,9 +73,7 @@ TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
         EXPECT_EQ(outcome.status, listed.isEmpty() ? ProbeStatus::Failed : ProbeStatus::Listed) << row.name;
         if (listed.isEmpty())
             listed << QStringList{"record", "keep"}.at(static_cast<int>(outcome.ifFailed));
-        EXPECT_EQ(kStages.at(static_cast<int>(outcome.stage)),
-                  outcome.reason.isEmpty() ? "close" : m_observer.heard.filter(isEarlier).last())
-            << row.name;
+        expectStage(outcome);
         EXPECT_EQ(listed.join(' ') + (outcome.leftThreads ? " left threads: " : ": ") + outcome.reason,
                   row.outcome);
     }
@@ -114,25 +82,32 @@ TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
 TEST_F(VST3ProbeTest, AClassIsWhatTheFormsSayThatAreAnswered)
 {
     // In the older forms the bytes E9 are no UTF-8; in UTF-16 they are a letter.
-    const QByteArray described = "class \"A\xE9\"\nvendor \"V\xE9\"\nsubcategories Fx|EQ\n";
-    const QByteArray refused[] = {"answer class-info false\n", "answer class-info2 false\n",
-                                  "answer class-info-unicode false\n"};
+    const QByteArray accented = "class \"A\xE9\"\nvendor \"V\xE9\"\nsubcategories Fx|EQ\n";
+    const QByteArray no1 = accented + "answer class-info false\n", no2 = "answer class-info2 false\n",
+                     no3 = "answer class-info-unicode false\n", longText(64, 'n');
     const struct {
-        int answered; // 1, 2 and 4: the forms by their age
-        const char *record, *last = "";
-    } rows[] = {{7, "A\uFFFD|V\uFFFD|Fx|EQ"},  {1, "A\uFFFD|Fixture Works|"},
-                {2, "A\uFFFD|V\uFFFD|Fx|EQ"},  {4, "A\u00E9|V\u00E9|Fx|EQ"},
-                {5, "A\uFFFD|Fixture Works|"}, {6, "A\u00E9|V\u00E9|Fx|EQ"},
-                {6, "", "category Audio"},     {2, "A\uFFFD|V\uFFFD|Fx|EQ", "generation 2"},
-                {4, "", "generation 2"},       {0, ""}};
+        QByteArray script, record; ///< name, vendor and sub-categories; empty where nothing is listed
+    } rows[] = {{accented, "A\uFFFD|V\uFFFD|Fx|EQ"},
+                {accented + no2, "A\uFFFD|Fixture Works|"},
+                {no1, "A\u00E9|V\u00E9|Fx|EQ"},
+                {no1 + no2, "A\u00E9|V\u00E9|Fx|EQ"},
+                {no1 + no3, "A\uFFFD|V\uFFFD|Fx|EQ"},
+                {no1 + no2 + no3, ""},
+                {no1 + "generation 2", "A\uFFFD|V\uFFFD|Fx|EQ"},
+                {no1 + "generation 1", ""},
+                {no1 + "category Audio", ""},
+                {"generation 1\nclass A\nvendor Unasked", "A|Fixture Works|"},
+                {"factory-vendor \"\"\nclass A", "A||Fx"},
+                {"class A\nanswer factory-info false", "A||Fx"},
+                {"class \"\"", "|Fixture Works|Fx"},
+                {"class \"🎛 リバーブ\"", "🎛 リバーブ|Fixture Works|Fx"},
+                {"class " + longText + "\nvendor " + longText + "\nsubcategories " + longText + longText,
+                 longText + '|' + longText + '|' + longText + longText}};
     for (const auto &row : rows) {
-        QByteArray script = described + row.last + '\n';
-        for (int form = 0; form < 3; ++form)
-            script += (row.answered >> form & 1) != 0 ? QByteArray() : refused[form];
         QStringList found;
-        for (const EffectRecord &record : probe("Forms", script).records)
+        for (const EffectRecord &record : probe("Forms", row.script).records)
             found << record.name + '|' + record.vendor + '|' + record.categories;
-        EXPECT_EQ(found.join(' '), QString::fromUtf8(row.record)) << script.constData();
+        EXPECT_EQ(found.join(' '), QString::fromUtf8(row.record)) << row.script.constData();
     }
 }
 
@@ -144,8 +119,8 @@ TEST_F(VST3ProbeTest, AModuleForAnotherMachineIsNotLoaded)
     const int machine = isElf ? 18 : qFromLittleEndian<int>(module.constData() + 0x3C) + 4;
     qToLittleEndian<quint16>(isElf ? 183 : 0xAA64, module.data() + machine);
     m_folder.write("arm.vst3", module);
-    const ProbeOutcome outcome = probe(m_folder.path("arm.vst3"));
-    EXPECT_EQ(m_observer.heard, QStringList());
+    const ProbeOutcome outcome = PluginBench::probe(VST3Probe(), m_folder.path("arm.vst3"));
+    EXPECT_EQ(m_observer.heard, QStringList("load"));
     EXPECT_EQ(outcome.ifFailed, ProbeOutcome::IfFailed::Record);
     EXPECT_EQ(outcome.reason, "it is built for 64-bit ARM; this machine needs 64-bit x86");
 }
@@ -184,16 +159,14 @@ TEST_F(VST3ProbeTest, CallsComeInThisOrder)
          VST3Fixture::Scripted},
         {"no entry and exit", "", "", "", "class-info2 %1; class-info-unicode %1; ", VST3Fixture::Plain}};
     for (const auto &row : rows) {
-        m_folder.write("trace", {});
-        probe(row.name, "trace \"" + m_folder.path("trace").toUtf8() + "\"\nclass A\nclass B\n" + row.script,
-              row.fixture);
+        probe(row.name, QByteArray("class A\nclass B\nclass A\n") + row.script, row.fixture);
         const QString ofClass =
             QLatin1String("class-info %1; ") + row.information +
             "create-instance %1; initialize %1; bus-count %1: input; bus-info %1: input 0; "
             "bus-count %1: output; bus-info %1: output 0; terminate %1; release %1; ";
-        EXPECT_EQ(m_folder.lines("trace").join("; "),
-                  QLatin1String("static-constructor; ") + row.entry +
-                      "get-factory; factory-info; count-classes; " + ofClass.arg("A") + ofClass.arg("B") +
-                      "factory-release" + row.exit + "; static-destructor");
+        EXPECT_EQ(takeTrace(), QLatin1String("static-constructor; ") + row.entry +
+                                   "get-factory; factory-info; count-classes; " + ofClass.arg("A") +
+                                   ofClass.arg("B") + "class-info A; factory-release" + row.exit +
+                                   "; static-destructor");
     }
 }
