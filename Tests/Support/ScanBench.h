@@ -31,8 +31,6 @@ protected:
     /// Dates it as their updates are.
     void dateLater(const QString &path) const;
     QString modulePath(const QString &name) const { return m_folder.plugins() + '/' + name + m_ending; }
-    /// Puts something that is no module of ours under a module's name; returns its path.
-    QString addRaw(const QString &name, const QByteArray &content) const;
 
     /// One run, which must end by itself with 0 and leave no marker.
     ScannerOutcome scan() const;
@@ -59,7 +57,6 @@ protected:
     /// taken as it is, so that what no XML reader takes can be looked at too.
     QStringList records(const char *elements) const { return recordsOf(m_catalogue, elements); }
     QStringList recordsOf(const QString &file, const char *elements) const;
-    /// The same, sorted.
     QStringList sortedRecords(const char *elements) const;
     /// What the workstation does when the user marks a plug-in: changes one element of the record with the
     /// name, in whatever catalogue has one.

@@ -35,16 +35,6 @@ void settleSanitizers(QProcessEnvironment &environment)
     environment.insert("LSAN_OPTIONS", "print_suppressions=0:suppressions=" FXPROBE_LEAK_SUPPRESSIONS);
 }
 
-bool holdsSanitizerReport(const QByteArray &text)
-{
-    for (const char *sign :
-         {"ERROR: AddressSanitizer", "ERROR: LeakSanitizer", "WARNING: ThreadSanitizer", "runtime error: "}) {
-        if (text.contains(sign))
-            return true;
-    }
-    return false;
-}
-
 } // namespace
 
 ScannerRun::ScannerRun(const QString &program, const TestFolder &folder)
@@ -96,49 +86,22 @@ const ScannerOutcome &ScannerRun::wait()
 {
     if (!m_outcome.started)
         return m_outcome;
-    if (!waitUntil([this] { return m_process.state() == QProcess::NotRunning; })) {
-        m_outcome.timedOut = true;
+    const bool inTime = waitUntil([this] { return m_process.state() == QProcess::NotRunning; });
+    if (!inTime) {
         m_process.kill();
         m_process.waitForFinished(-1);
     }
-    readOutcome();
-    reportFaults();
-    return m_outcome;
-}
-
-const ScannerOutcome &ScannerRun::run()
-{
-    start();
-    return wait();
-}
-
-void ScannerRun::readOutcome()
-{
     m_outcome.standardOutput = m_process.readAllStandardOutput();
     m_outcome.standardError = m_process.readAllStandardError();
     m_outcome.log = QString::fromUtf8(m_folder.read(QLatin1String(kLogFile)));
     const bool bySignal = m_process.exitStatus() == QProcess::CrashExit;
     m_outcome.exitCode = bySignal ? -1 : m_process.exitCode();
     m_outcome.crashed = bySignal || m_outcome.exitCode == kSanitizerExit;
-}
-
-void ScannerRun::reportFaults() const
-{
-    EXPECT_FALSE(m_outcome.timedOut) << qPrintable(m_program)
-                                     << " overran its time limit and was killed; log:\n"
-                                     << qPrintable(m_outcome.log);
+    EXPECT_TRUE(inTime) << qPrintable(m_program) << " overran its time limit and was killed; log:\n"
+                        << qPrintable(m_outcome.log);
     EXPECT_NE(m_outcome.exitCode, kFixtureMisused) << m_outcome.standardError.constData();
-    EXPECT_FALSE(holdsSanitizerReport(m_outcome.standardError)) << m_outcome.standardError.constData();
-}
-
-std::vector<ScannerOutcome> runUntilSettled(const QString &program, const TestFolder &folder, int mostRuns)
-{
-    std::vector<ScannerOutcome> outcomes;
-    do {
-        ScannerRun run(program, folder);
-        outcomes.push_back(run.run());
-    } while (!folder.markers().isEmpty() && static_cast<int>(outcomes.size()) < mostRuns &&
-             outcomes.back().started);
-    EXPECT_TRUE(folder.markers().isEmpty()) << qPrintable(folder.markers().join(", "));
-    return outcomes;
+    for (const char *sign :
+         {"ERROR: AddressSanitizer", "ERROR: LeakSanitizer", "WARNING: ThreadSanitizer", "runtime error: "})
+        EXPECT_FALSE(m_outcome.standardError.contains(sign)) << m_outcome.standardError.constData();
+    return m_outcome;
 }

@@ -432,6 +432,8 @@ AEffect *enter(audioMasterCallback host, bool isSecondMain)
     if (answer.empty())
         return &handedOut().back()->effect;
     handedOut().back()->close();
+    if (answer == "same")
+        return &handedOut().front()->effect;
     return answer == "null" ? nullptr : reinterpret_cast<AEffect *>(16); // "no-memory"
 }
 

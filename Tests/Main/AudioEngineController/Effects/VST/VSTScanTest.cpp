@@ -24,8 +24,8 @@ TEST_F(VSTScan, FilesThatFailAreRecordedAndFilesThatAreNoPluginsAreNot)
     put("Wild.vst2", "answer entry no-memory\n");
     put("Childless.vst2", "category 10\n");
     addVST2File(m_folder.plugins(), "NoEntry", {}, VST2Fixture::NoEntry);
-    addRaw("Text", "hello\n");
-    addRaw("Empty", "");
+    m_folder.write(modulePath("Text"), "hello\n");
+    m_folder.write(modulePath("Empty"), "");
     const QString log = scan().log;
     EXPECT_EQ(records("Name ID Enabled Working"),
               texts({"Childless|Childless|1|0", "Empty|Empty|1|0", "Healthy|Healthy:1000|1|1",
