@@ -1,6 +1,5 @@
 #include "Tests/Fixtures/FixtureScript.h"
 
-#include "Tests/Fixtures/FixtureFaults.h"
 #include "Tests/Fixtures/FixturePlatform.h"
 
 #include <algorithm>

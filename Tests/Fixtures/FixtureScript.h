@@ -11,6 +11,11 @@ inline constexpr int kFixtureMisused = 86;
 /// Ends the process with kFixtureMisused and says why on the error output.
 [[noreturn]] void reportMisuse(const std::string &reason);
 
+/// Commits a fault as a broken plug-in would; most do not return. False where there is no such kind.
+bool commitFault(const std::string &kind);
+/// Changes the process's state as plug-ins do; false where there is no such kind or the value does not suit.
+bool causeSideEffect(const std::string &kind, const std::string &value);
+
 /// A 32-bit number, decimal or with 0x; a hexadecimal one may set the top bit. Anything else is a misuse.
 std::int32_t numberOf(const std::string &text);
 /// A decimal fraction, whatever the locale; "inf" and "nan" too.
