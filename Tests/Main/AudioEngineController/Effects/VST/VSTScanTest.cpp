@@ -2,7 +2,6 @@
 #include "Tests/Support/ScanBench.h"
 #include "Tests/Support/VST2Fixture.h"
 
-#include <QDir>
 #include <QFile>
 
 namespace {
@@ -33,28 +32,6 @@ TEST_F(VSTScan, FilesThatFailAreRecordedAndFilesThatAreNoPluginsAreNot)
     for (const QString &reason : {QString(kTextFileReason), modulePath("Empty") + ": ",
                                   modulePath("Wild") + ": its entry point returned something"})
         EXPECT_TRUE(log.contains(reason)) << qPrintable(log);
-    expectSettled();
-}
-
-TEST_F(VSTScan, MarksSurviveAnUpdateAndAMove)
-{
-    for (const char *name : {"A.vst2", "B.vst2", "C.vst2"})
-        put(name);
-    scan();
-    mark("A", "Favourite", "1");
-    mark("A", "CategoryMask", "16");
-    mark("B", "Enabled", "0");
-    for (const char *name : {"A.vst2", "B.vst2"})
-        dateLater(put(name, "vendor New\n"));
-    scan();
-    EXPECT_EQ(loaded(), QStringList("A")) << "what is switched off is not probed";
-    EXPECT_EQ(records("Name Vendor CategoryMask Favourite Enabled Working"),
-              texts({"A|New|16|1|1|1", "B|Fixture Works|0|0|0|1", "C|Fixture Works|0|0|1|1"}));
-    ASSERT_TRUE(QDir(m_folder.plugins()).mkdir("sub"));
-    ASSERT_TRUE(QFile::rename(modulePath("B"), modulePath("sub/B")));
-    ASSERT_TRUE(QFile::remove(modulePath("C")));
-    scan();
-    EXPECT_EQ(records("Name Enabled"), texts({"A|1", "B|0"}));
     expectSettled();
 }
 

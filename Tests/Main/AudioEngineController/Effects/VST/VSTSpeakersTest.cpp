@@ -23,14 +23,9 @@ using VSTSpeakers = VSTInstanceBench;
 TEST_F(VSTSpeakers, OfEveryBusFormat)
 {
     const std::map<int, const char *> told = {
-        {1, "0(-2)"},
-        {2, "1(1 2)"},
         {6, "15(1 2 3 4 5 6)"},
-        {8, "20(1 2 3 5 6 -2 -2)"},
-        {9, "21(1 2 3 10 11 5 6)"},
         {57, "-2(1 2 3 10 11 5 6 -2 -2 13 15 13 15 16 18)"},
         {64, "-2(1 2 3 4 5 6 -2 -2 -2 19 10 11 13 15 -2 12 16 18 13 15 -2 -2 -2 -2)"},
-        {65, "-2(-2 -2 -2 -2)"},
         {72, "-2(1 2 3 4 10 11 5 6 13 -2 15 16 18 12)"}};
     QStringList ready;
     testing::internal::CaptureStdout();

@@ -135,7 +135,7 @@ TEST_F(VST3ProbeTest, BusesGiveTheChannels)
                 {"none is main", "inputs 2:aux 1:aux\noutputs 2:7 3:-1\n", 3, 5},
                 {"a main bus without channels before a side chain", "inputs 0 2:aux\n", 0, 2},
                 {"no bus of an effect", "inputs\noutputs\n", 2, 2},
-                {"no bus of a synth", "subcategories Fx|Synth\ninputs\noutputs\n", 0, 2},
+                {"no bus of a synth", "subcategories \"Fx|EQ| Synth\"\ninputs\noutputs\n", 0, 2},
                 {"negative counts", "inputs -5 2\noutputs -2147483648\n", 2, 0},
                 {"a sum that is too large", "inputs 2147483647 2147483647 2\n", 2147483647, 2},
                 {"wrong numbers of buses", "stated-inputs 2147483647\nstated-outputs -2147483648\n", 2, 0},
