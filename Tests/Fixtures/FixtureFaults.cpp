@@ -106,7 +106,6 @@ bool causeSideEffect(const std::string &kind, const std::string &value)
         {"signal",
          [](Text name) { return std::signal(name == "segv" ? SIGSEGV : SIGTERM, [](int) {}) != SIG_ERR; }},
         {"alarm", startAlarm},
-        {"repair", repairOwnViolation},
         {"print", printMuch},
         {"thread", leaveThreadRunning}};
     const auto effect = effects.find(kind);

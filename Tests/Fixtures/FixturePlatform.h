@@ -18,8 +18,5 @@ void killProcess();
 void endThread();
 
 void setFileMask(int mask);
-/// Touches memory that is not there and repairs that in a handler of its own, as copy protection does, and
-/// leaves a handler behind, which ends the process at any other violation. The value says nothing.
-bool repairOwnViolation(const std::string &value);
 /// Lets an alarm signal arrive after so many seconds, where the system has one; false for none.
 bool startAlarm(const std::string &seconds);

@@ -40,17 +40,18 @@ TEST_F(VSTScan, WhatAPluginChangesIsPutBack)
     // The mask comes first: the catalogue keeps the permissions that it was made with.
     const QByteArray locale = QByteArray("locale ") + kForeignLocale;
     int number = 0;
-    for (const char *effect : {"umask 077", locale.constData(), "chdir /", "rounding up", "signal segv",
-                               "signal term", "alarm 1", "repair keep"})
+    for (const char *effect :
+         {"umask 077", locale.constData(), "chdir /", "rounding up", "signal segv", "signal term", "alarm 1"})
         for (const char *stage : {"entry", "get-vendor-string"}) {
             const QByteArray id = QByteArray::number(++number);
             put("Spoiler " + id + ".vst2", QByteArray("effect ") + stage + ' ' + effect + "\nid " + id);
         }
     put("Thread.vst2", "effect entry thread\n");
+    put("Handler.vst2", "effect get-effect-name signal segv\nfault get-vendor-string segv\n");
     put("Zealous.vst2",
         "own-thread\nask-host entry 1 from-thread\nask-host get-vendor-string 7 until-close\n");
     const ScannerOutcome outcome = scan();
-    EXPECT_EQ(records("Working").count("1"), number + 2);
+    EXPECT_EQ(records("Working").count("1"), number + 3);
     EXPECT_TRUE(outcome.log.contains("Thread" + vst2Ending() + " left threads running and stays in memory"));
     EXPECT_TRUE(QFile::permissions(cataloguePath()) & QFile::ReadOther);
     expectSettled();
