@@ -34,6 +34,20 @@ struct NotingObserver final : IProbeObserver {
     QStringList heard;
 };
 
+/// A table's lines, each as its cells between "~".
+inline std::vector<QStringList> rowsOf(const char *table)
+{
+    std::vector<QStringList> rows;
+    for (const QString &line : QString::fromUtf8(table).split('\n', Qt::SkipEmptyParts)) {
+        rows.emplace_back();
+        for (const QString &cell : line.split('~'))
+            rows.back() << cell.trimmed();
+    }
+    return rows;
+}
+/// The script in a cell, whose lines are between " / ".
+inline QByteArray scriptIn(QString cell) { return cell.replace(" / ", "\n").toUtf8() + '\n'; }
+
 /// Scripted plug-ins that the test itself probes and uses. Their calls are in a trace.
 class PluginBench : public testing::Test {
 protected:

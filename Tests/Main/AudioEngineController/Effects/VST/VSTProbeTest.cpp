@@ -41,42 +41,36 @@ QString textOf(const EffectRecord &record)
 
 TEST_F(VSTProbeTest, OutcomesAreToldApart)
 {
-    const char *const whole = "load start ask close", *const entered = "load start close";
-    const QString noEffect = "its entry point returned something that is not a VST 2 effect";
-    const struct {
-        const char *name;
-        QByteArray script; // null: no such file
-        QString reason, heard;
-        bool hasFaulted = false, leftThreads = false;
-    } rows[] = {{"good", "", "", whole},
-                {"NoEntry", "", "it exports no VST 2 entry point", ""},
-                {"missing", {}, "it could not be loaded: ", "load"},
-                {"null", "answer entry null", "its entry point returned null", entered},
-                {"wrong magic", "magic 1", noEffect, entered},
-                {"no memory", "answer entry no-memory", noEffect, entered},
-                {"entry throws", "fault entry throw-int",
-                 "its entry point threw something that is not a standard exception", entered},
-                {"entry faults", "fault entry segv", "its entry point failed: SE Exception: Access Violation",
-                 entered, true},
-                {"call throws", "fault get-vendor-string throw-std", "", whole},
-                {"call faults", "fault get-vendor-string segv", "", whole, true},
-                {"close faults", "fault close segv", "", whole, true},
-                {"thread", "effect entry thread", "", whole, false, true},
-                {"childless", "category 10", "it is a shell and lists no sub-plug-ins", whole}};
-    for (const auto &row : rows) {
-        SCOPED_TRACE(row.name);
-        const ProbeOutcome outcome = probe(row.script, row.name);
-        const bool isListed = row.reason.isEmpty(), isNoPlugin = row.heard.isEmpty();
+    // Name, script, reason, what the observer hears, and what else is told.
+    const char *const rows = R"(
+good ~ ~ ~ load start ask close
+NoEntry ~ ~ it exports no VST 2 entry point ~
+missing ~ - ~ it could not be loaded: ~ load
+null ~ answer entry null ~ its entry point returned null ~ load start close
+wrong magic ~ magic 1 ~ its entry point returned something that is not a VST 2 effect ~ load start close
+no memory ~ answer entry no-memory ~ its entry point returned something that is not a VST 2 effect ~ load start close
+entry throws ~ fault entry throw-int ~ its entry point threw something that is not a standard exception ~ load start close
+entry faults ~ fault entry segv ~ its entry point failed: SE Exception: Access Violation ~ load start close ~ faulted
+call throws ~ fault get-vendor-string throw-std ~ ~ load start ask close
+call faults ~ fault get-vendor-string segv ~ ~ load start ask close ~ faulted
+close faults ~ fault close segv ~ ~ load start ask close ~ faulted
+thread ~ effect entry thread ~ ~ load start ask close ~ left threads
+childless ~ category 10 ~ it is a shell and lists no sub-plug-ins ~ load start ask close
+)";
+    for (const QStringList &row : rowsOf(rows)) {
+        SCOPED_TRACE(row[0].toStdString());
+        const ProbeOutcome outcome = probe(row[1] == "-" ? QByteArray() : scriptIn(row[1]), row[0]);
+        const bool isListed = row[2].isEmpty(), isNoPlugin = row[3].isEmpty();
         EXPECT_EQ(outcome.status, isListed     ? ProbeStatus::Listed
                                   : isNoPlugin ? ProbeStatus::NoPlugin
                                                : ProbeStatus::Failed);
         expectStage(outcome);
-        EXPECT_TRUE(outcome.reason.contains(row.reason) && outcome.reason.isEmpty() == isListed)
+        EXPECT_TRUE(outcome.reason.contains(row[2]) && outcome.reason.isEmpty() == isListed)
             << qPrintable(outcome.reason);
-        EXPECT_EQ(m_observer.heard.join(' '), row.heard);
+        EXPECT_EQ(m_observer.heard.join(' '), row[3]);
         EXPECT_EQ(outcome.records.size(), isListed ? 1u : 0u);
-        EXPECT_EQ(outcome.faulted, row.hasFaulted);
-        EXPECT_EQ(outcome.leftThreads, row.leftThreads);
+        EXPECT_EQ(outcome.faulted, row.value(4) == "faulted");
+        EXPECT_EQ(outcome.leftThreads, row.value(4) == "left threads");
         EXPECT_GT(outcome.milliseconds, 0);
         EXPECT_FALSE(m_log.contains("VSTPlugin::Load")) << "that is said of known plug-ins";
     }
@@ -114,39 +108,32 @@ TEST_F(VSTProbeTest, SubPluginsFailAndAreLeftOutOneByOne)
 
 TEST_F(VSTProbeTest, WhatIsAskedAndReadAndWhen)
 {
-    const char *const all = "get-plug-category; get-effect-name; get-plug-category; get-vendor-string";
-    const char *const once = "get-plug-category; get-effect-name; get-vendor-string";
-    const struct {
-        const char *file, *script, *record, *calls;
-    } rows[] = {
-        {"Main", "", "Main:1000 1 2>2+0", all},
-        {"Both", "", "Both:1000 1 2>2+0", all},
-        {"Comp", "name \"R\\xF6hre\"\nvendor \"\\xDFound\"\nid 77\ncategory 3\noutputs 6",
-         "R\u00F6hre:77 3 2>6+0 \u00DFound", all},
-        {"My Synth.x64", "name Told\ncategory 2", "My Synth:1000 2 2>2+0", // an instrument with inputs
-         "get-plug-category; get-plug-category; get-vendor-string"},
-        {"Caf\u00E9", "inputs 0\noutputs 2147483647\nid -1", "Caf\u00E9:-1 2 0>2147483647+0",
-         "get-vendor-string"},
-        {"Comp", "name Told\ninputs -1\noutputs -5\nlatency -7", "Told:1000 1 -1>-5+-7", all},
-        {"Comp.64.x", "name \"\"\nanswer get-effect-name 0", "Comp:1000 1 2>2+0", all},
-        {"Comp", "name \"\"", ":1000 1 2>2+0", all},
-        {"Comp", "name Told\nanswer get-effect-name 0", "Told:1000 1 2>2+0", all},
-        {".Comp", "inputs 0", ":1000 2 0>2+0", "get-vendor-string"},
-        // What a call changes counts from then on.
-        {"Comp", "set get-plug-category inputs 0", "Comp:1000 2 0>2+0", once},
-        {"Comp", "set get-effect-name inputs 0\nset get-effect-name id 77", "Comp:77 2 0>2+0", once},
-        {"Comp", "set get-vendor-string inputs 0\nset get-vendor-string id 77", "Comp:1000 1 0>2+0", all},
-        {"Comp", "set get-vendor-string outputs 6\nset get-vendor-string latency 64", "Comp:1000 1 2>6+64",
-         all},
-        {"Comp", "inputs 0\nset get-vendor-string inputs 1", "Comp:1000 2 1>2+0", "get-vendor-string"}};
-    for (const auto &row : rows) {
-        SCOPED_TRACE(row.script);
-        const ProbeOutcome outcome = probe(row.script, QString::fromUtf8(row.file));
+    // File, script, record, and the calls.
+    const char *const rows = R"(
+Main ~ ~ Main:1000 1 2>2+0 ~ category; name; category; vendor
+Both ~ ~ Both:1000 1 2>2+0 ~ category; name; category; vendor
+Comp ~ name "R\xF6hre" / vendor "\xDFound" / id 77 / category 3 / outputs 6 ~ Röhre:77 3 2>6+0 ßound ~ category; name; category; vendor
+My Synth.x64 ~ name Told / category 2 ~ My Synth:1000 2 2>2+0 ~ category; category; vendor
+Café ~ inputs 0 / outputs 2147483647 / id -1 ~ Café:-1 2 0>2147483647+0 ~ vendor
+Comp ~ name Told / inputs -1 / outputs -5 / latency -7 ~ Told:1000 1 -1>-5+-7 ~ category; name; category; vendor
+Comp.64.x ~ name "" / answer get-effect-name 0 ~ Comp:1000 1 2>2+0 ~ category; name; category; vendor
+Comp ~ name "" ~ :1000 1 2>2+0 ~ category; name; category; vendor
+Comp ~ name Told / answer get-effect-name 0 ~ Told:1000 1 2>2+0 ~ category; name; category; vendor
+.Comp ~ inputs 0 ~ :1000 2 0>2+0 ~ vendor
+Comp ~ set get-plug-category inputs 0 ~ Comp:1000 2 0>2+0 ~ category; name; vendor
+Comp ~ set get-effect-name inputs 0 / set get-effect-name id 77 ~ Comp:77 2 0>2+0 ~ category; name; vendor
+Comp ~ set get-vendor-string inputs 0 / set get-vendor-string id 77 ~ Comp:1000 1 0>2+0 ~ category; name; category; vendor
+Comp ~ set get-vendor-string outputs 6 / set get-vendor-string latency 64 ~ Comp:1000 1 2>6+64 ~ category; name; category; vendor
+Comp ~ inputs 0 / set get-vendor-string inputs 1 ~ Comp:1000 2 1>2+0 ~ vendor
+)";
+    for (const QStringList &row : rowsOf(rows)) {
+        SCOPED_TRACE(row[1].toStdString());
+        const ProbeOutcome outcome = probe(scriptIn(row[1]), row[0]);
         ASSERT_EQ(outcome.records.size(), 1u);
-        EXPECT_EQ(textOf(outcome.records[0]), QString::fromUtf8(row.record));
-        QString trace = takeTrace();
-        EXPECT_EQ(trace.remove(QRegularExpression(" (?!clos|stat|entr|get-)[^;]*")).section("; ", 2, -3),
-                  row.calls);
+        EXPECT_EQ(textOf(outcome.records[0]), row[2]);
+        QStringList calls = takeTrace().split("; ").mid(2);
+        calls.replaceInStrings(QRegularExpression("^get-(plug-|effect-|)([a-z]+).*"), "\\2");
+        EXPECT_EQ(calls.mid(0, calls.size() - 2).join("; "), row[3]);
     }
     for (const char *script : {"child 11 Told\ninputs 0", "child -2 Told\ncategory 2"})
         EXPECT_EQ(probe(script, "Shell").records.at(0).name, "Told") << script;

@@ -20,94 +20,78 @@ protected:
 
 TEST_F(VST3ProbeTest, OutcomesAndWhatTheObserverHears)
 {
-    const QString thrown = "it threw: thrown by the fixture", none = "it lists no audio plug-in among its ";
-    const struct {
-        const char *name;
-        QByteArray script;
-        QString heard;
-        QString outcome; ///< the classes listed, or what becomes of the catalogue; and the reason
-        VST3Fixture fixture = VST3Fixture::Scripted;
-    } rows[] = {
-        {"six", "class 1\nclass 2\nclass 3\nclass 4\nclass 5\nclass 6", "load start ask 1 2 3 4 5 6 close",
-         "1 2 3 4 5 6: "},
-        {"seven are announced", "class A\nanswer count-classes 7", "load start ask A ! close", "A: "},
-        {"a name twice", "class A\nclass A\nclass C", "load start ask A C close", "A C: "},
-        {"a count too high", "class A\nanswer count-classes 2147483647", "load start ask A ! close", "A: "},
-        {"a negative count", "answer count-classes -5", "load start ask close",
-         "record: " + none + "-5 classes"},
-        {"not initialised", "class A\nclass B\nanswer initialize false A", "load start ask A B close",
-         "B: its class \"A\" could not be initialised (result 0x00000001)"},
-        {"not created", "class A\nclass B\nanswer create-instance null", "load start ask A B close",
-         "record: its class \"A\" could not be created (result 0x00000000)"},
-        {"other categories",
-         "class 1\ncategory \"Component Controller Class\"\nclass 2\ncategory \"Audio Module\"\n"
-         "class 3\ncategory \"Audio Module Class and 32 bytes!!\"\nclass 4\ncategory \"audio module class\"",
-         "load start ask close", "record: " + none + "4 classes"},
-        {"throws in the middle", "class A\nclass B\nclass C\nfault bus-count throw-std B",
-         "load start ask A B close", "A: " + thrown},
-        {"throws no exception", "fault count-classes throw-int", "load start ask close",
-         "record: it threw something other than a standard exception"},
-        {"throws while closed", "class A\nfault factory-release throw-int\nfault module-exit throw-std",
-         "load start ask A close", "A: "},
-        {"does not start", "answer module-entry false", "load start close",
-         "record: its entry function reports that it could not start"},
-        {"throws at its start", "fault module-entry throw-std", "load start close", "record: " + thrown},
-        {"WaveShell", "", "load start ask close", "keep: " + none + "0 classes"},
-        {"WaveShell without factory", "answer get-factory null", "load start ask close",
-         "keep: GetPluginFactory returned null"},
-        {"factory throws", "fault get-factory throw-std", "load start ask close", "keep: " + thrown},
-        {"another factory", "generation 0", "load start ask close",
-         "keep: its factory does not offer IPluginFactory"},
-        {"no export", "", "load start ask close", "keep: it does not export GetPluginFactory",
-         VST3Fixture::NoEntry},
-        {"leaves a thread", "class A\neffect initialize thread", "load start ask A close",
-         "A left threads: "}};
-    for (const auto &row : rows) {
-        const ProbeOutcome outcome = probe(row.name, row.script, row.fixture);
-        EXPECT_EQ(m_observer.heard.join(' '), row.heard) << row.name;
+    // Name, script, what the observer hears, and the classes listed, or what becomes of the catalogue; and
+    // the reason.
+    const char *const rows = R"(
+six ~ class 1 / class 2 / class 3 / class 4 / class 5 / class 6 ~ load start ask 1 2 3 4 5 6 close ~ 1 2 3 4 5 6:
+seven are announced ~ class A / answer count-classes 7 ~ load start ask A ! close ~ A:
+a name twice ~ class A / class A / class C ~ load start ask A C close ~ A C:
+a count too high ~ class A / answer count-classes 2147483647 ~ load start ask A ! close ~ A:
+a negative count ~ answer count-classes -5 ~ load start ask close ~ record: it lists no audio plug-in among its -5 classes
+not initialised ~ class A / class B / answer initialize false A ~ load start ask A B close ~ B: its class "A" could not be initialised (result 0x00000001)
+not created ~ class A / answer create-instance null ~ load start ask A close ~ record: its class "A" could not be created (result 0x00000000)
+controller ~ class 1 / category "Component Controller Class" ~ load start ask close ~ record: it lists no audio plug-in among its 1 classes
+other categories ~ class 2 / category "Audio Module" / class 3 / category "Audio Module Class and 32 bytes!!" ~ load start ask close ~ record: it lists no audio plug-in among its 2 classes
+throws in the middle ~ class A / class B / class C / fault bus-count throw-std B ~ load start ask A B close ~ A: it threw: thrown by the fixture
+throws no exception ~ fault count-classes throw-int ~ load start ask close ~ record: it threw something other than a standard exception
+throws while closed ~ class A / fault factory-release throw-int / fault module-exit throw-std ~ load start ask A close ~ A:
+does not start ~ answer module-entry false ~ load start close ~ record: its entry function reports that it could not start
+throws at its start ~ fault module-entry throw-std ~ load start close ~ record: it threw: thrown by the fixture
+WaveShell ~ ~ load start ask close ~ keep: it lists no audio plug-in among its 0 classes
+WaveShell without factory ~ answer get-factory null ~ load start ask close ~ keep: GetPluginFactory returned null
+factory throws ~ fault get-factory throw-std ~ load start ask close ~ keep: it threw: thrown by the fixture
+another factory ~ generation 0 ~ load start ask close ~ keep: its factory does not offer IPluginFactory
+no export ~ ~ load start ask close ~ keep: it does not export GetPluginFactory
+leaves a thread ~ class A / effect initialize thread ~ load start ask A close ~ A left threads:
+)";
+    for (const QStringList &row : rowsOf(rows)) {
+        SCOPED_TRACE(row[0].toStdString());
+        const bool isPlugin = row[0] != "no export";
+        const ProbeOutcome outcome =
+            probe(row[0], scriptIn(row[1]), isPlugin ? VST3Fixture::Scripted : VST3Fixture::NoEntry);
+        EXPECT_EQ(m_observer.heard.join(' '), row[2]);
         QStringList listed;
         for (const EffectRecord &record : outcome.records) {
             listed << record.name;
-            EXPECT_EQ(record.path + record.fileTime, m_folder.plugins() + '/' + row.name + ".vst3its time");
+            EXPECT_EQ(record.path + record.fileTime, m_folder.plugins() + '/' + row[0] + ".vst3its time");
         }
-        EXPECT_EQ(outcome.status, listed.isEmpty() ? ProbeStatus::Failed : ProbeStatus::Listed) << row.name;
+        EXPECT_EQ(outcome.status, listed.isEmpty() ? ProbeStatus::Failed : ProbeStatus::Listed);
         if (listed.isEmpty())
-            listed << QStringList{"record", "keep"}.at(static_cast<int>(outcome.ifFailed));
+            listed << (outcome.ifFailed == ProbeOutcome::IfFailed::Record ? "record" : "keep");
         expectStage(outcome);
-        EXPECT_EQ(listed.join(' ') + (outcome.leftThreads ? " left threads: " : ": ") + outcome.reason,
-                  row.outcome);
+        listed << (outcome.leftThreads ? "left threads: " : ": ") + outcome.reason;
+        EXPECT_EQ(listed.join(' ').replace(" : ", ": ").trimmed(), row[3]);
     }
 }
 
 TEST_F(VST3ProbeTest, AClassIsWhatTheFormsSayThatAreAnswered)
 {
-    // In the older forms the bytes E9 are no UTF-8; in UTF-16 they are a letter.
-    const QByteArray accented = "class \"A\xE9\"\nvendor \"V\xE9\"\nsubcategories Fx|EQ\n";
-    const QByteArray no1 = accented + "answer class-info false\n", no2 = "answer class-info2 false\n",
-                     no3 = "answer class-info-unicode false\n", longText(64, 'n');
-    const struct {
-        QByteArray script, record; ///< name, vendor and sub-categories; empty where nothing is listed
-    } rows[] = {{accented, "A\uFFFD|V\uFFFD|Fx|EQ"},
-                {accented + no2, "A\uFFFD|Fixture Works|"},
-                {no1, "A\u00E9|V\u00E9|Fx|EQ"},
-                {no1 + no2, "A\u00E9|V\u00E9|Fx|EQ"},
-                {no1 + no3, "A\uFFFD|V\uFFFD|Fx|EQ"},
-                {no1 + no2 + no3, ""},
-                {no1 + "generation 2", "A\uFFFD|V\uFFFD|Fx|EQ"},
-                {no1 + "generation 1", ""},
-                {no1 + "category Audio", ""},
-                {"generation 1\nclass A\nvendor Unasked", "A|Fixture Works|"},
-                {"factory-vendor \"\"\nclass A", "A||Fx"},
-                {"class A\nanswer factory-info false", "A||Fx"},
-                {"class \"\"", "|Fixture Works|Fx"},
-                {"class \"🎛 リバーブ\"", "🎛 リバーブ|Fixture Works|Fx"},
-                {"class " + longText + "\nvendor " + longText + "\nsubcategories " + longText + longText,
-                 longText + '|' + longText + '|' + longText + longText}};
-    for (const auto &row : rows) {
+    // Script, and name, vendor and sub-categories. In the older forms the byte E9 is no UTF-8; in UTF-16 it
+    // is a letter.
+    const char *const rows = R"(
+$ ~ A�|V�|Fx|EQ
+$ / answer class-info2 false ~ A�|Fixture Works|
+$ / answer class-info false ~ Aé|Vé|Fx|EQ
+$ / answer class-info false / answer class-info2 false ~ Aé|Vé|Fx|EQ
+$ / answer class-info false / answer class-info-unicode false ~ A�|V�|Fx|EQ
+$ / answer class-info false / answer class-info2 false / answer class-info-unicode false ~
+$ / answer class-info false / generation 2 ~ A�|V�|Fx|EQ
+$ / answer class-info false / generation 1 ~
+$ / answer class-info false / category Audio ~
+generation 1 / class A / vendor Unasked ~ A|Fixture Works|
+factory-vendor "" / class A ~ A||Fx
+class A / answer factory-info false ~ A||Fx
+class "" ~ |Fixture Works|Fx
+class "🎛 リバーブ" ~ 🎛 リバーブ|Fixture Works|Fx
+class * / vendor * / subcategories ** ~ *|*|**
+)";
+    for (const QStringList &row : rowsOf(QByteArray(rows).replace('*', QByteArray(64, 'n')))) {
+        QString script = row[0];
+        script.replace('$', "class \"A\\xE9\" / vendor \"V\\xE9\" / subcategories Fx|EQ");
         QStringList found;
-        for (const EffectRecord &record : probe("Forms", row.script).records)
+        for (const EffectRecord &record : probe("Forms", scriptIn(script)).records)
             found << record.name + '|' + record.vendor + '|' + record.categories;
-        EXPECT_EQ(found.join(' '), QString::fromUtf8(row.record)) << row.script.constData();
+        EXPECT_EQ(found.join(' '), row[1]) << qPrintable(script);
     }
 }
 
