@@ -17,17 +17,17 @@ const char *const kVst3Modules[] = {FXPROBE_SCRIPTED_VST3, FXPROBE_PLAIN_VST3, F
 
 /// Copies a module to a path, replacing what is there, so that a test can also update a plug-in. Its script
 /// goes beside it; a null script gives no script file.
-void putFixture(const QString &source, const QString &path, const QByteArray &script)
+QString put(const QString &source, const QString &path, const QByteArray &script)
 {
     QFile scriptFile(path + ".script");
     QDir().mkpath(QFileInfo(path).path());
     QFile::remove(path);
     scriptFile.remove();
     EXPECT_TRUE(QFile::copy(source, path)) << qPrintable(source) << " to " << qPrintable(path);
-    if (script.isNull())
-        return;
-    const bool written = scriptFile.open(QIODevice::WriteOnly) && scriptFile.write(script) == script.size();
-    EXPECT_TRUE(written) << qPrintable(scriptFile.errorString());
+    EXPECT_TRUE(script.isNull() ||
+                (scriptFile.open(QIODevice::WriteOnly) && scriptFile.write(script) == script.size()))
+        << qPrintable(scriptFile.errorString());
+    return path;
 }
 
 } // namespace
@@ -36,25 +36,20 @@ QString vst2Ending() { return kVst2Ending; }
 
 QString addVST2File(const QString &folder, const QString &name, const QByteArray &script, VST2Fixture fixture)
 {
-    const QString path = folder + '/' + name + vst2Ending();
-    putFixture(kVst2Modules[static_cast<int>(fixture)], path, script);
-    return path;
+    return put(kVst2Modules[static_cast<int>(fixture)], folder + '/' + name + vst2Ending(), script);
 }
 
 QString vst3FixturePath(VST3Fixture fixture) { return kVst3Modules[static_cast<int>(fixture)]; }
 
 QString addVST3File(const QString &folder, const QString &name, const QByteArray &script, VST3Fixture fixture)
 {
-    const QString path = folder + '/' + name + ".vst3";
-    putFixture(vst3FixturePath(fixture), path, script);
-    return path;
+    return put(vst3FixturePath(fixture), folder + '/' + name + ".vst3", script);
 }
 
-QString addVST3Bundle(const QString &folder, const QString &name, const QByteArray &script,
-                      VST3Fixture fixture)
+QString addVST3Bundle(const QString &folder, const QString &name, const QByteArray &script)
 {
     const QString bundle = folder + '/' + name + ".vst3";
-    putFixture(vst3FixturePath(fixture), vst3BundleBinary(bundle), script);
+    put(vst3FixturePath(), vst3BundleBinary(bundle), script);
     return bundle;
 }
 

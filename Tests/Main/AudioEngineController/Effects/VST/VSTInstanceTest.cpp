@@ -171,30 +171,18 @@ TEST_F(VSTInstance, ABlockGoesThroughTheBuffers)
 
 TEST_F(VSTInstance, ListenersHearWhatThePluginTells)
 {
-    const struct {
-        const char *name, *script;
-        bool inBlock;      // else when a program is set
-        const char *heard; // at each change: the calls before it, and the state
-        const char *rest;  // the calls after the last
-    } rows[] = {
-        {"channels changed in a block: after it", "set process outputs 5\nask-host process 13", true,
-         "process: 1; host-13: 0; opcode-72; mains-changed | 5 outputs", "mains-changed: 0 1; opcode-71"},
-        {"again while it is stopped for that",
-         "set opcode-2 outputs 5\nask-host opcode-2 13\nask-host opcode-72 13", false,
-         "opcode-67; opcode-2; opcode-72 | 5 outputs / host-13: 0; mains-changed | 5 outputs",
-         "mains-changed: 0 1; opcode-71; host-13: 0; opcode-68"},
-        {"to what nobody has", "set opcode-2 outputs 2147483647\nask-host opcode-2 13", false,
-         "opcode-67; opcode-2; opcode-72; mains-changed | 2147483647 outputs", "host-13: 0; opcode-68"},
-        {"no size without an editor",
-         "ask-host process 0 index 3 opt 0.5\nask-host process 43 index 3\nask-host process 44 index 3\n"
-         "ask-host process 42\nask-host process 15 index 640 value 480",
-         true, "parameter 3 0.5 / edit 3 1 / edit 3 0 / display",
-         "process: 1; host-0: 0; host-43: 1; host-44: 1; host-42: 1; host-15: 0"},
-        {"a size", "editor 300 200\nask-host process 15 index 640 value 480", true, "size 640 480",
-         "process: 1; host-15: 1"}};
-    for (const auto &row : rows) {
-        SCOPED_TRACE(row.name);
-        auto plugin = loaded(row.script);
+    // What happens; the script; whether in a block, else when a program is set; what is heard: at each change
+    // of channels the calls before it, and the state; the calls after the last.
+    const char *const rows = R"(
+channels changed in a block: after it ~ set process outputs 5 / ask-host process 13 ~ block ~ process: 1; host-13: 0; opcode-72; mains-changed | 5 outputs ~ mains-changed: 0 1; opcode-71
+again while it is stopped for that ~ set opcode-2 outputs 5 / ask-host opcode-2 13 / ask-host opcode-72 13 ~ ~ opcode-67; opcode-2; opcode-72 | 5 outputs / host-13: 0; mains-changed | 5 outputs ~ mains-changed: 0 1; opcode-71; host-13: 0; opcode-68
+to what nobody has ~ set opcode-2 outputs 2147483647 / ask-host opcode-2 13 ~ ~ opcode-67; opcode-2; opcode-72; mains-changed | 2147483647 outputs ~ host-13: 0; opcode-68
+no size without an editor ~ ask-host process 0 index 3 opt 0.5 / ask-host process 43 index 3 / ask-host process 44 index 3 / ask-host process 42 / ask-host process 15 index 640 value 480 ~ block ~ parameter 3 0.5 / edit 3 1 / edit 3 0 / display ~ process: 1; host-0: 0; host-43: 1; host-44: 1; host-42: 1; host-15: 0
+a size ~ editor 300 200 / ask-host process 15 index 640 value 480 ~ block ~ size 640 480 ~ process: 1; host-15: 1
+)";
+    for (const QStringList &row : rowsOf(rows)) {
+        SCOPED_TRACE(row[0].toStdString());
+        auto plugin = loaded(scriptIn(row[1]));
         Listener listener;
         listener.trace = [this] { return takeTrace(); };
         plugin->addListener(&listener);
@@ -202,9 +190,9 @@ TEST_F(VSTInstance, ListenersHearWhatThePluginTells)
         ASSERT_TRUE(plugin->open(kSettings) && plugin->start());
         plugin->openEditor(&listener);
         takeTrace();
-        EXPECT_TRUE(row.inBlock ? plugin->process(1) : plugin->programs().set(0));
-        EXPECT_EQ(takeTrace(), row.rest);
-        EXPECT_EQ(listener.heard.join(" / "), row.heard);
+        EXPECT_TRUE(row[2] == "block" ? plugin->process(1) : plugin->programs().set(0));
+        EXPECT_EQ(takeTrace(), row[4]);
+        EXPECT_EQ(listener.heard.join(" / "), row[3]);
         plugin->removeListener(&listener);
         listener.heard.clear();
         plugin->process(1);

@@ -53,59 +53,47 @@ TEST_F(VSTSpeakers, OfEveryBusFormat)
 
 TEST_F(VSTSpeakers, AreToldOnceAndAgainWhenTheChannelsChange)
 {
-    const char *const stereo = "1(1 2) -> 1(1 2)", *const usual = "2,2 | 2,2 | (2,2";
-    const struct {
-        const char *name;
-        const char *script; ///< null: the plug-in of the step before
-        int inputs, outputs;
-        bool accepted;
-        const char *calls, *printed = ""; ///< the line of the counts
-        bool force = false;
-    } steps[] = {
-        {"stereo", "", 2, 2, true, stereo, usual},
-        {"unchanged", nullptr, 2, 2, true, ""},
-        {"forced", nullptr, 2, 2, true, stereo, usual, true},
-        {"the plug-in's inputs where it has its own outputs", "inputs 1\noutputs 2", 2, 2, true,
-         "0(-2) -> 1(1 2)", "2,2 | 2,2 | (1,2"},
-        {"as asked where neither is", "inputs 1\noutputs 6", 2, 2, true, stereo, "2,2 | 2,2 | (1,6"},
-        {"an instrument", "inputs 0\noutputs 2", 2, 2, true, "-1() -> 1(1 2)", "2,2 | 2,2 | (0,2"},
-        {"a layout of its own", "name \"Comp VisLM\"\ninputs 10\noutputs 2", 2, 2, true,
-         "set-speaker-arrangement VisLM: 22(1 2 3 4 5 6 -2 -2) -> 1(1 2)", "2,2 | 8,2 | (10,2"},
-        {"no format of the inputs", "", 17, 2, false, "", "17,2 | 17,2 | (2,2"},
-        {"more than there is room for", "", 2, 37, false, "", "2,37 | 2,37 | (2,2"},
-        {"refuses all", "inputs 7\noutputs 7\nanswer set-speaker-arrangement 0", 7, 7, false,
-         "18(1 2 3 4 5 6 -2) -> 18(1 2 3 4 5 6 -2); 20(1 2 3 5 6 -2 -2) -> 20(1 2 3 5 6 -2 -2); "
-         "21(1 2 3 10 11 5 6) -> 21(1 2 3 10 11 5 6); -2(-2 -2 -2 -2 -2 -2 -2) -> -2(-2 -2 -2 -2 -2 -2 -2)",
-         "7,7 | 7,7 | (7,7"},
-        {"and is not asked again", nullptr, 7, 7, false, ""},
-        {"throws", "fault set-speaker-arrangement throw-std", 2, 2, false, stereo, usual},
-        {"says that they changed", "ask-host set-speaker-arrangement 13", 2, 2, true,
-         "1(1 2) -> 1(1 2); host-13: 0", usual},
-        {"said so only because it was told", nullptr, 2, 2, true, ""},
-        {"changes its channels", "set set-speaker-arrangement outputs 4", 2, 2, true, stereo, usual},
-        {"changed", nullptr, 2, 2, true, stereo, "2,2 | 2,2 | (2,4"},
-        {"told", "ask-host opcode-2 13", 2, 2, true, stereo, usual},
-        {"says so when a program is set", nullptr, 2, 2, true, stereo, usual}};
+    // Step; the script, or "-" for the plug-in of the step before; inputs, outputs, whether it is forced,
+    // whether it is accepted; the calls; the line of the counts.
+    const char *const steps = R"(
+stereo ~ ~ 2 2 0 1 ~ 1(1 2) -> 1(1 2) ~ 2,2 | 2,2 | (2,2
+unchanged ~ - ~ 2 2 0 1 ~ ~
+forced ~ - ~ 2 2 1 1 ~ 1(1 2) -> 1(1 2) ~ 2,2 | 2,2 | (2,2
+the plug-in's inputs where it has its own outputs ~ inputs 1 / outputs 2 ~ 2 2 0 1 ~ 0(-2) -> 1(1 2) ~ 2,2 | 2,2 | (1,2
+as asked where neither is ~ inputs 1 / outputs 6 ~ 2 2 0 1 ~ 1(1 2) -> 1(1 2) ~ 2,2 | 2,2 | (1,6
+an instrument ~ inputs 0 / outputs 2 ~ 2 2 0 1 ~ -1() -> 1(1 2) ~ 2,2 | 2,2 | (0,2
+a layout of its own ~ name "Comp VisLM" / inputs 10 / outputs 2 ~ 2 2 0 1 ~ 22(1 2 3 4 5 6 -2 -2) -> 1(1 2) ~ 2,2 | 8,2 | (10,2
+no format of the inputs ~ ~ 17 2 0 0 ~ ~ 17,2 | 17,2 | (2,2
+more than there is room for ~ ~ 2 37 0 0 ~ ~ 2,37 | 2,37 | (2,2
+refuses all ~ inputs 7 / outputs 7 / answer set-speaker-arrangement 0 ~ 7 7 0 0 ~ 18(1 2 3 4 5 6 -2) -> 18(1 2 3 4 5 6 -2); 20(1 2 3 5 6 -2 -2) -> 20(1 2 3 5 6 -2 -2); 21(1 2 3 10 11 5 6) -> 21(1 2 3 10 11 5 6); -2(-2 -2 -2 -2 -2 -2 -2) -> -2(-2 -2 -2 -2 -2 -2 -2) ~ 7,7 | 7,7 | (7,7
+and is not asked again ~ - ~ 7 7 0 0 ~ ~
+throws ~ fault set-speaker-arrangement throw-std ~ 2 2 0 0 ~ 1(1 2) -> 1(1 2) ~ 2,2 | 2,2 | (2,2
+says that they changed ~ ask-host set-speaker-arrangement 13 ~ 2 2 0 1 ~ 1(1 2) -> 1(1 2); host-13: 0 ~ 2,2 | 2,2 | (2,2
+said so only because it was told ~ - ~ 2 2 0 1 ~ ~
+changes its channels ~ set set-speaker-arrangement outputs 4 / ask-host opcode-2 13 ~ 2 2 0 1 ~ 1(1 2) -> 1(1 2) ~ 2,2 | 2,2 | (2,2
+changed ~ - ~ 2 2 0 1 ~ 1(1 2) -> 1(1 2) ~ 2,2 | 2,2 | (2,4
+says so when a program is set ~ - ~ 2 2 0 1 ~ 1(1 2) -> 1(1 2) ~ 2,2 | 2,2 | (2,4
+)";
     std::unique_ptr<VSTPlugin> plugin;
-    for (const auto &step : steps) {
-        SCOPED_TRACE(step.name);
-        if (step.script) {
+    for (const QStringList &step : rowsOf(steps)) {
+        SCOPED_TRACE(step[0].toStdString());
+        if (step[1] != "-") {
             plugin.reset(); // the file is written anew
-            plugin = loaded(step.script);
+            plugin = loaded(scriptIn(step[1]));
             ASSERT_TRUE(plugin->open(kSettings));
-        } else if (&step == std::end(steps) - 1) {
-            EXPECT_TRUE(plugin->programs().set(0));
         }
+        const bool setsProgram = step[0].contains("program");
+        EXPECT_EQ(setsProgram && plugin->programs().set(0), setsProgram);
         takeTrace();
+        const QStringList numbers = step[2].split(' ');
         testing::internal::CaptureStdout();
-        EXPECT_EQ(plugin->UpdateSpeakerArrangement(step.inputs, step.outputs, step.force), step.accepted);
+        EXPECT_EQ(plugin->UpdateSpeakerArrangement(numbers[0].toInt(), numbers[1].toInt(), numbers[2] == "1"),
+                  numbers[3] == "1");
         const QString printed = QString::fromStdString(testing::internal::GetCapturedStdout());
-        EXPECT_EQ(printed.section('\n', 0, 0).remove("USA: "), step.printed);
-        EXPECT_EQ(takeTrace().remove("set-speaker-arrangement: "), step.calls);
-        if (QString(step.name) == "changed") {
-            EXPECT_EQ(plugin->channels().outputs.span(), 4);
-        }
+        EXPECT_EQ(printed.section('\n', 0, 0).remove("USA: "), step[4]);
+        EXPECT_EQ(takeTrace().remove(QRegularExpression("set-speaker-arrangement[^:]*: ")), step[3]);
     }
+    EXPECT_EQ(plugin->channels().outputs.span(), 4);
     EXPECT_EQ(m_log.count("Exception Caught in VST Plugin"), 1);
     EXPECT_EQ(vstFallbackArrangements(36, 36).size(), 1u) << "large layouts have only numbers";
 }
