@@ -38,13 +38,18 @@ struct ClassInfo {
     QString vendor;        ///< neither
 };
 
-/// Zeroes an SDK structure and has the factory fill it. One that fills it and answers that it failed is
-/// believed.
-template <typename Info, typename Ask>
-bool isAnswered(Info &info, Ask &&ask)
+/// An SDK structure without anything in it.
+template <typename Info>
+void clear(Info &info)
 {
     std::memset(static_cast<void *>(&info), 0, sizeof info);
-    return ask() == kResultOk || info.category[0] != 0;
+}
+
+/// Whether a factory filled it. Some answer that they did where they did not, or the other way.
+template <typename Info>
+bool isFilled(const Info &info)
+{
+    return info.category[0] != 0;
 }
 
 template <typename Info>
@@ -66,7 +71,9 @@ ClassInfo classInfo(IPluginFactory &factory, int32 index)
 {
     ClassInfo read;
     PClassInfo info;
-    read.isOrdinary = isAnswered(info, [&] { return factory.getClassInfo(index, &info); });
+    clear(info);
+    const tresult result = factory.getClassInfo(index, &info);
+    read.isOrdinary = result == kResultOk || isFilled(info);
     readBasics(read, info);
     return read;
 }
@@ -77,14 +84,17 @@ void askNewerForms(ClassInfo &read, IPluginFactory &factory, int32 index)
 {
     if (const FUnknownPtr<IPluginFactory2> factory2(&factory); factory2) {
         PClassInfo2 info;
-        if (isAnswered(info, [&] { return factory2->getClassInfo2(index, &info); }) && !read.isOrdinary)
+        clear(info);
+        factory2->getClassInfo2(index, &info);
+        if (!read.isOrdinary && isFilled(info))
             readBasics(read, info);
         readDetails(read, info);
     }
     if (const FUnknownPtr<IPluginFactory3> factory3(&factory); factory3) {
         PClassInfoW info;
-        if (isAnswered(info, [&] { return factory3->getClassInfoUnicode(index, &info); }) &&
-            !read.isOrdinary) {
+        clear(info);
+        factory3->getClassInfoUnicode(index, &info);
+        if (!read.isOrdinary && isFilled(info)) {
             readBasics(read, info);
             readDetails(read, info);
         }
