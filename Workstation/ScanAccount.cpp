@@ -53,6 +53,9 @@ void ScanAccount::takeLine(const ReportLine &line)
                        .arg(line.path, line.reason));
         break;
     case Event::Stage:
+        if (!m_open.empty())
+            m_probes[m_open.back()].isLoaded = true;
+        break;
     case Event::Busy:
     case Event::Finished:
     case Event::Ended:
@@ -80,7 +83,6 @@ void ScanAccount::end(const ReportLine &line)
 {
     const bool isSkipped = line.event == ReportLine::Event::Skipped;
     ProbeAccount &account = m_probes[keyOf(line)];
-    account.isLoaded = account.stage.has_value();
     account.noPlugin = isSkipped || line.noPlugin;
     account.reason = line.reason;
     account.records = line.records;

@@ -284,7 +284,7 @@ void FolderScan::remember(const ProbeOutcome &outcome)
     m_remembered.status = outcome.status;
     m_remembered.stage = outcome.stage;
     m_remembered.reason = outcome.reason;
-    m_remembered.milliseconds = outcome.milliseconds;
+    m_remembered.milliseconds = m_isTouched ? outcome.milliseconds : 0; // looked at again at each scan
     m_remembered.plugins.clear();
     for (const EffectRecord &record : outcome.records)
         m_remembered.plugins.push_back(

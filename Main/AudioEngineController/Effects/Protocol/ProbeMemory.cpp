@@ -164,8 +164,12 @@ void ProbeMemory::forEach(PluginFormat format,
 
 void ProbeMemory::set(const RememberedProbe &probe)
 {
-    entries()[{probe.format, pathKey(probe.path)}] = {probe, {}};
-    m_changed = true;
+    Entry entry{probe, render(probe)};
+    Entry &present = entries()[{probe.format, pathKey(probe.path)}];
+    if (present.text.isNull() && !present.probe.path.isEmpty())
+        present.text = render(present.probe);
+    m_changed |= present.text != entry.text;
+    present = std::move(entry);
 }
 
 void ProbeMemory::setCrash(PluginFormat format, const EffectRecord &plugin, ProbeStatus status,

@@ -104,7 +104,7 @@ TEST_F(VST3ProbeTest, AModuleForAnotherMachineIsNotLoaded)
     qToLittleEndian<quint16>(isElf ? 183 : 0xAA64, module.data() + machine);
     m_folder.write("arm.vst3", module);
     const ProbeOutcome outcome = PluginBench::probe(VST3Probe(), m_folder.path("arm.vst3"));
-    EXPECT_EQ(m_observer.heard, QStringList("load"));
+    EXPECT_EQ(m_observer.heard, QStringList()) << "seen without loading it";
     EXPECT_EQ(outcome.ifFailed, ProbeOutcome::IfFailed::Record);
     EXPECT_EQ(outcome.reason, "it is built for 64-bit ARM; this machine needs 64-bit x86");
 }
