@@ -54,14 +54,14 @@ int reopen(std::vector<EffectRecord> &records, Chooser &chooser)
     // To the front: one that the user switched off would speak for the file, which would not be probed.
     const auto others = std::stable_partition(
         records.begin(), records.end(), [&](const EffectRecord &record) { return chooser.choose(record); });
-    for (auto record = records.begin(); record != others; ++record) {
-        record->enabled = true;
+    for (auto record = records.begin(); record != others; ++record)
         files.insert(record->path);
-    }
-    // Any of a file's records may be the one that speaks for it.
+    // Any of a file's records may be the one that speaks for it, and keep it from being touched.
     for (EffectRecord &record : records)
-        if (files.count(record.path) != 0)
+        if (files.count(record.path) != 0) {
             record.fileTime.clear();
+            record.enabled |= !record.working;
+        }
     return static_cast<int>(std::distance(records.begin(), others));
 }
 

@@ -1,29 +1,7 @@
-#include "Tests/Support/ScanBench.h"
-#include "Tests/Support/VST2Fixture.h"
-
-#include <QDir>
-#include <QFile>
-#include <QFileInfo>
-
-#include <functional>
+#include "Tests/Scanner/ScanTable.h"
 
 namespace {
 
-// Whole scans, each a few steps. Files of "put" lie in "Plugins", others in the data folder, which "@" stands
-// for; "\n" is a line's end and "." in a list an empty one.
-//   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated
-//   write FILE: TEXT; remove FILE; move FILE FILE; holds FILE: TEXT
-//   link FILE FILE                where it lies and where it leads; where there are links
-//   short FILE BYTES              ends a file after so many and dates it as updated
-//   folders FOLDER…               what the scan list names
-//   mark NAME ELEMENT VALUE       as the user does
-//   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
-//   scan [N]                      until no marker survives, which takes N runs (1)
-//   run; markers FILE…            one run, and the markers that survive it
-//   same                          a scan that loads nothing and writes nothing
-//   loaded MODULE…                what the scan loaded, in order
-//   log: TEXT                     what its log holds
-//   vst3, vst2 ELEMENTS: ROW, ROW what the catalogue lists, in any order
 const char kScans[] = R"(
 = A catalogue that cannot be used is replaced
 put Comp.vst3:
@@ -131,12 +109,12 @@ link Plugins/Also.vst3 Plugins/Named.vst3
 link Plugins/None.vst3 Plugins/none
 scan
 loaded Comp Far Echo
-vst3 Path: @/Plugins/z/Comp.vst3, @/Plugins/first/Far.vst3, @/Plugins/Also.vst3
+vst3 Path: z/Comp.vst3, first/Far.vst3, Also.vst3
 vst2 Name: Echo
 remove Plugins/first
 scan
 loaded Far
-vst3 Path: @/Plugins/z/Comp.vst3, @/Plugins/second/Far.vst3, @/Plugins/Also.vst3
+vst3 Path: z/Comp.vst3, second/Far.vst3, Also.vst3
 link Plugins/first Outside
 same
 folders @/Plugins/a @/Plugins
@@ -144,11 +122,11 @@ same
 folders @/Plugins/a
 scan
 loaded Comp Echo
-vst3 Path: @/Plugins/a/Comp.vst3
+vst3 Path: a/Comp.vst3
 folders @/Plugins @/Plugins/a
 scan
 loaded Far
-vst3 Path: @/Plugins/a/Comp.vst3, @/Plugins/first/Far.vst3, @/Plugins/Also.vst3
+vst3 Path: a/Comp.vst3, first/Far.vst3, Also.vst3
 
 = What a bundle holds is never a VST 2 module
 put Damaged.vst3/Left.vst2:
@@ -348,135 +326,8 @@ vst2 Name Working: Echo|1
 same
 )";
 
-struct ScanCase {
-    std::string name;
-    QStringList steps;
-
-    friend void PrintTo(const ScanCase &scan, std::ostream *out) { *out << scan.name; }
-};
-
-std::vector<ScanCase> scanCases()
-{
-    std::vector<ScanCase> cases;
-    for (const QString &line : QString::fromUtf8(kScans).split('\n', Qt::SkipEmptyParts)) {
-        if (line.startsWith("= "))
-            cases.push_back({line.mid(2).toStdString(), {}});
-        else
-            cases.back().steps.append(line);
-    }
-    return cases;
-}
-
-class ScanTable : public ScanBench, public testing::WithParamInterface<ScanCase> {
-protected:
-    void carryOut(const QString &step)
-    {
-        const QString head = step.section(':', 0, 0);
-        const QString text = resolved(step.section(':', 1)).trimmed();
-        const QString verb = head.section(' ', 0, 0);
-        const QString file = head.section(' ', 1);
-        const std::map<QString, std::function<void()>> verbs = {
-            {"put", [&] { put(file, script(text)); }},
-            {"new", [&] { dateLater(put(file, script(text))); }},
-            {"write", [&] { m_folder.write(file, text.toUtf8().replace("\\n", "\n")); }},
-            {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
-            {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(file))); }},
-            {"link", [&] { link(file.section(' ', 0, 0), file.section(' ', 1)); }},
-            {"short", [&] { cutShort(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
-            {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
-            {"mark", [&] { markAsUser(file); }},
-            {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
-            {"cut",
-             [&] { edit(file, m_folder.read(file).mid(m_folder.read(file).indexOf(text.toUtf8())), {}); }},
-            {"scan", [&] { scanWithRuns(file.isEmpty() ? 1 : file.toInt()); }},
-            {"run", [&] { m_last = scanOnce(); }},
-            {"same", [&] { expectNothingToDo(); }},
-            {"loaded", [&] { EXPECT_EQ(loaded().join(' '), file == "." ? "" : file); }},
-            {"markers", [&] { EXPECT_EQ(m_folder.markers().join(' '), file); }},
-            {"log", [&] { EXPECT_TRUE(m_last.log.contains(text)) << qPrintable(m_last.log); }},
-            {"vst3", [&] { expectRecords("VST3Configuration.xml", file, text); }},
-            {"vst2", [&] { expectRecords("FXConfiguration.xml", file, text); }}};
-        verbs.at(verb)();
-    }
-
-private:
-    QString resolved(QString text) const
-    {
-        return text.replace('@', m_folder.dataFolder()).replace(".vst2<", vst2Ending() + '<');
-    }
-    static QByteArray script(const QString &statements)
-    {
-        return QString(statements + '\n').replace(" | ", "\n").toUtf8();
-    }
-    void link(const QString &place, const QString &target)
-    {
-        if (!QFile::link(m_folder.path(target), m_folder.path(place)) ||
-            !QFileInfo(m_folder.path(place)).isSymbolicLink())
-            GTEST_SKIP() << "no links can be made here";
-    }
-    void cutShort(const QString &file, qint64 size)
-    {
-        const QString path = m_folder.path(resolved(file + '<').chopped(1));
-        EXPECT_TRUE(QFile::resize(path, size));
-        dateLater(path);
-    }
-    void markAsUser(const QString &words) const
-    {
-        mark(words.section(' ', 0, -3), words.section(' ', -2, -2).toUtf8(), words.section(' ', -1).toUtf8());
-    }
-    void edit(const QString &file, const QString &from, const QString &to) const
-    {
-        const QString text = QString::fromUtf8(m_folder.read(file));
-        EXPECT_TRUE(text.contains(from)) << qPrintable(text);
-        m_folder.write(file, QString(text).replace(from, to).toUtf8());
-    }
-    void scanWithRuns(int count)
-    {
-        if (count > 1) {
-            forgetTrace();
-            EXPECT_EQ(scanUntilSettled(), count);
-        } else {
-            m_last = scan();
-        }
-    }
-    void expectNothingToDo() const
-    {
-        for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"})
-            dateFirst("Effects/" + QString(file));
-        const auto before = effectsFolder();
-        const QDateTime modified = QFileInfo(cataloguePath()).lastModified();
-        scan();
-        EXPECT_EQ(loaded(), QStringList());
-        EXPECT_EQ(effectsFolder(), before);
-        EXPECT_EQ(QFileInfo(cataloguePath()).lastModified(), modified);
-    }
-    void expectRecords(const char *file, const QString &elements, const QString &rows) const
-    {
-        QStringList found = recordsOf(file, elements.toUtf8()), expected = rows.split(", ");
-        found.sort();
-        expected.sort();
-        EXPECT_EQ(found, rows == "." ? QStringList() : expected);
-    }
-
-    ScannerOutcome m_last;
-};
-
 } // namespace
 
-TEST_P(ScanTable, EndsAsItSays)
-{
-    for (const QString &step : GetParam().steps) {
-        SCOPED_TRACE(step.toStdString());
-        carryOut(step);
-        if (IsSkipped())
-            return;
-    }
-}
+TEST_P(ScanTable, EndsAsItSays) { carryOutAll(); }
 
-INSTANTIATE_TEST_SUITE_P(Of, ScanTable, testing::ValuesIn(scanCases()), [](const auto &row) {
-    std::string name;
-    for (const char character : row.param.name)
-        if (std::isalnum(static_cast<unsigned char>(character)))
-            name += character;
-    return name;
-});
+INSTANTIATE_TEST_SUITE_P(Of, ScanTable, testing::ValuesIn(scanCases(kScans)), nameOfScan);

@@ -37,6 +37,15 @@ void EffectList::setFavourite(const QString &id, bool favourite)
     entry->second.forgetText();
 }
 
+void EffectList::passMarks(const EffectRecord &old, const QString &id)
+{
+    const auto entry = m_entries.find(id);
+    if (entry == m_entries.end())
+        return;
+    takeMarks(entry->second.record, old);
+    entry->second.forgetText();
+}
+
 void EffectList::remove(const QString &id)
 {
     const auto entry = m_entries.find(id);

@@ -54,6 +54,8 @@ public:
     bool add(const EffectRecord &record);
     /// Sets the user's mark on a record; nothing for an identifier that is not there.
     void setFavourite(const QString &id, bool favourite);
+    /// Has a record take over the user's marks of an old one; nothing for an identifier that is not there.
+    void passMarks(const EffectRecord &old, const QString &id);
     /// Takes a record out, and its name.
     void remove(const QString &id);
 

@@ -69,14 +69,26 @@ EffectRecord &KnownList::applyCrash(const EffectRecord &marker)
     return *record;
 }
 
-void KnownList::disableOthers(const EffectRecord &crashed)
+bool KnownList::disableBesideCrashed()
 {
+    bool hasChanged = false;
+    for (const EffectRecord &record : m_records)
+        if (record.isCrashedFile() && record.standsForFile())
+            hasChanged |= disableOthers(record);
+    return hasChanged;
+}
+
+bool KnownList::disableOthers(const EffectRecord &crashed)
+{
+    bool hasChanged = false;
     const auto [first, last] = m_byFileName.equal_range(fileNameOf(crashed.path));
     for (auto entry = first; entry != last; ++entry)
         if (isSamePath(entry->second->path, crashed.path) && !entry->second->isSwitchedOff()) {
+            hasChanged |= entry->second->enabled;
             entry->second->fileTime = crashed.fileTime;
             markCrashed(*entry->second);
         }
+    return hasChanged;
 }
 
 KnownList::Records KnownList::recordsOfFileName(const QString &path) const

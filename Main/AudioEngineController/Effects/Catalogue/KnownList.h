@@ -42,6 +42,9 @@ public:
     /// switched off. Where there is no record, the marker becomes one; its identifier is the caller's to set.
     /// Records of other paths are never touched.
     EffectRecord &applyCrash(const EffectRecord &marker);
+    /// Has what is listed beside a file that crashed disabled and not working as well: a user, or an earlier
+    /// version of this program, may have left it usable. True when something changed.
+    bool disableBesideCrashed();
 
     /// All records of one full path, the one that speaks for the file first: what crashed as a whole comes
     /// before what failed as a whole, and both before the others, so that the file is not loaded again
@@ -61,7 +64,7 @@ public:
 
 private:
     EffectRecord *find(const EffectRecord &marker);
-    void disableOthers(const EffectRecord &crashed);
+    bool disableOthers(const EffectRecord &crashed);
 
     Identity m_identity;
     std::deque<EffectRecord> m_records;

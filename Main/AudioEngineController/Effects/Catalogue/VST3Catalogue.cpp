@@ -1,5 +1,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 
+#include <limits>
+
 namespace {
 
 using Content = std::optional<QByteArray>;
@@ -33,7 +35,7 @@ const CatalogueFormat &vst3CatalogueFormat()
         "1.1",
         false,
         1.1,
-        0.0,
+        std::numeric_limits<double>::lowest(), // masks in every version
         {".scan3", false, false},
         {kPath,
          kFileTime,

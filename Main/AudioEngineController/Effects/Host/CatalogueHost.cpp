@@ -68,6 +68,12 @@ bool CatalogueHost::isListed(const QString &id) const
     return m_effects.find(id) != nullptr;
 }
 
+void CatalogueHost::passMarks(const EffectRecord &old, const QString &id)
+{
+    const TAutoLockCS lock(&m_ks);
+    m_effects.passMarks(old, id);
+}
+
 QString CatalogueHost::moduleTime(const QString &path) const { return regularFileTimeText(path); }
 
 QString CatalogueHost::moduleFolder(const QString &path) const
@@ -124,6 +130,7 @@ void CatalogueHost::readKnownRecords()
     m_isKnownAsRead = contents.isAsWritten;
     for (const EffectRecord &record : contents.records)
         m_isKnownAsRead &= m_known.addRecord(record);
+    m_isKnownAsRead &= !m_known.disableBesideCrashed();
 }
 
 void CatalogueHost::absorbMarkers()

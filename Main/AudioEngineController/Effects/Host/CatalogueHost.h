@@ -66,6 +66,9 @@ public:
     /// Whether there is a catalogue that the system did not let us read. It is not replaced.
     bool isCatalogueUnread() const { return !m_unread.isEmpty(); }
 
+    /// Has a listed record take over the user's marks of an old one.
+    void passMarks(const EffectRecord &old, const QString &id);
+
     /// Empties the effect list.
     void clearEffects();
     /// Empties the effect list and fills it from the known list.

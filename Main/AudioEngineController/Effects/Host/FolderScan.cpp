@@ -17,14 +17,16 @@ namespace {
 constexpr std::size_t kMany = 3;
 
 /// What a file that fails keeps of a record: the marks. It is not working, and asked again when the file
-/// changes; what the user switched off stays as it is.
+/// changes, also where it crashed elsewhere; what the user switched off stays as it is.
 EffectRecord keptBesideFailure(const EffectRecord &old, const EffectRecord &file)
 {
     EffectRecord kept = old;
     kept.path = file.path;
     if (!old.isSwitchedOff()) {
-        if (!file.fileTime.isEmpty()) // else the file comes back as it was, with what crashed in it
+        if (!file.fileTime.isEmpty()) { // else the file comes back as it was, with what crashed in it
             kept.fileTime = file.fileTime;
+            kept.enabled = true;
+        }
         kept.working = false;
     }
     return kept;
@@ -121,8 +123,6 @@ void FolderScan::addKept()
 {
     for (const EffectRecord *record : m_plan->kept())
         m_host.AddEffect(*record);
-    for (const EffectRecord &record : m_plan->keptMoved())
-        m_host.AddEffect(record);
 }
 
 void FolderScan::showItemProgress()
@@ -196,6 +196,13 @@ void FolderScan::log(const ScanItem &item, const ProbeOutcome &outcome) const
 
 void FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
 {
+    for (const EffectRecord *record : item.known) {
+        const auto [first, last] = m_waiting.equal_range(record->id);
+        const auto entry = std::find_if(
+            first, last, [&](const auto &waiting) { return waiting.second.record.isSamePlugin(*record); });
+        if (entry != last)
+            m_waiting.erase(entry);
+    }
     bool added = false;
     if (outcome.ifFailed == ProbeOutcome::IfFailed::LookAgain)
         m_file.fileTime.clear();
@@ -208,15 +215,6 @@ void FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
     log(item, outcome);
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
-    for (const KnownList::Records &records : {item.known, item.moved})
-        for (const EffectRecord *record : records) {
-            const auto [first, last] = m_waiting.equal_range(record->id);
-            const auto entry = std::find_if(first, last, [&](const auto &waiting) {
-                return waiting.second.record.isSamePlugin(*record);
-            });
-            if (entry != last)
-                m_waiting.erase(entry);
-        }
     if (added)
         writeInterim();
 }
@@ -243,12 +241,22 @@ bool FolderScan::addListed(const ScanItem &item, const ProbeOutcome &outcome)
 bool FolderScan::addProbed(const ScanItem &item, EffectRecord record, bool isOnly)
 {
     for (const EffectRecord *old : item.known)
-        if (record.subId == old->subId && isDeadly(*old, item.fileTime))
-            return m_host.AddEffect(*old); // another version of the file gets another chance
+        if (record.subId == old->subId && isDeadly(*old, item.fileTime)) { // another version gets a chance
+            EffectRecord deadly = *old;
+            if (const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly)) {
+                deadly.category = source->category;
+                deadly.favourite = source->favourite;
+            }
+            return m_host.AddEffect(deadly);
+        }
     if (!record.working)
         m_host.completeFailedRecord(record);
-    if (const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly))
-        takeMarks(record, *source);
+    const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly);
+    const EffectRecord *likely = source ? nullptr : m_plan->likelySourceOfMarks(item, record);
+    if (likely && record.working)
+        m_likelyMarks.push_back({record.id, likely});
+    else if (source || likely)
+        takeMarks(record, source ? *source : *likely);
     if (m_host.AddEffect(record))
         return true;
     const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
@@ -312,7 +320,7 @@ bool FolderScan::addFailed(const ScanItem &item)
     for (const KnownList::Records &records : {item.known, item.moved})
         for (const EffectRecord *old : records)
             if (!m_host.known().isSameOfFile(*old, file) && !old->standsForFile())
-                added |= m_host.AddEffect(keptBesideFailure(*old, file));
+                addLater(keptBesideFailure(*old, file));
     return added;
 }
 
@@ -320,13 +328,23 @@ bool FolderScan::addFailed(const ScanItem &item)
 void FolderScan::keepUnchanged(const ScanItem &item)
 {
     for (const EffectRecord *record : item.known)
-        m_host.AddEffect(*record);
+        addLater(*record);
     for (const EffectRecord *record : item.moved) {
+        if (record->standsForFile())
+            continue;
         EffectRecord moved = *record;
         moved.path = item.path;
-        moved.fileTime.clear(); // that of another path's file says nothing
-        m_host.AddEffect(moved);
+        moved.fileTime.clear(); // what another path's file was, or did, says nothing
+        moved.enabled |= !moved.working;
+        addLater(moved);
     }
+}
+
+/// A file that lists the same plug-in goes before one that does not list it any more.
+void FolderScan::addLater(EffectRecord record)
+{
+    m_waiting.insert({record.id, ListedEffect(record)});
+    m_later.push_back(std::move(record));
 }
 
 void FolderScan::collectWaiting(std::size_t from)
@@ -334,11 +352,9 @@ void FolderScan::collectWaiting(std::size_t from)
     m_hasCollected = true;
     std::set<QString, PathLess> settled;
     const std::vector<ScanItem> &items = m_plan->items();
-    for (std::size_t index = 0; index < std::min(from, items.size()); ++index) {
+    // Not of files that are gone: another than the one that they were given to may list them.
+    for (std::size_t index = 0; index < std::min(from, items.size()); ++index)
         settled.insert(items[index].path);
-        if (!items[index].moved.empty())
-            settled.insert(items[index].moved.front()->path);
-    }
     for (const EffectRecord *record : m_host.known().all())
         if (!m_host.isListed(record->id) && settled.count(record->path) == 0)
             m_waiting.insert({record->id, ListedEffect(*record)});
@@ -349,7 +365,14 @@ void FolderScan::writeInterim() { m_written |= m_host.writeInterim(m_waiting, Du
 void FolderScan::finish(bool isWhole)
 {
     m_waiting.clear();
+    for (const EffectRecord &record : m_later)
+        m_host.AddEffect(record);
+    for (const auto &[id, old] : m_likelyMarks)
+        if (!m_host.isListed(old->id))
+            m_host.passMarks(*old, id);
     if (isWhole) {
+        for (const EffectRecord &record : m_plan->keptMoved())
+            m_host.AddEffect(record);
         for (const EffectRecord *record : m_plan->away())
             if (!m_host.isListed(record->id)) // else a file that is there lists it
                 m_host.AddEffect(*record);

@@ -37,6 +37,7 @@ private:
     bool addListed(const ScanItem &item, const ProbeOutcome &outcome);
     bool addFailed(const ScanItem &item);
     void keepUnchanged(const ScanItem &item);
+    void addLater(EffectRecord record);
     bool addProbed(const ScanItem &item, EffectRecord record, bool isOnly);
     void rememberCrashes();
     void remember(const ProbeOutcome &outcome);
@@ -67,8 +68,11 @@ private:
     QElapsedTimer m_sinceMemory; ///< since it was written
     QSet<QString> m_found;       ///< the modules, by `pathKey`
     WaitingRecords m_waiting;
-    bool m_hasCollected = false; ///< what waits, for the first interim write
-    std::size_t m_done = 0;      ///< items
+    bool m_hasCollected = false;       ///< what waits, for the first interim write
+    std::size_t m_done = 0;            ///< items
+    std::vector<EffectRecord> m_later; ///< what files keep that failed, unless another comes to list it
+    /// Identifiers, and the old records whose marks they get unless another file lists those.
+    std::vector<std::pair<QString, const EffectRecord *>> m_likelyMarks;
     bool m_written = false;
 
     RememberedProbe m_remembered;   ///< of the item at hand

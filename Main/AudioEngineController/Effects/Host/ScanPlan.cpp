@@ -42,6 +42,11 @@ const EffectRecord *findIn(const KnownList::Records &records,
     return found == records.end() ? nullptr : *found;
 }
 
+bool hasMarks(const EffectRecord &record)
+{
+    return record.favourite || record.category != 0 || record.isSwitchedOff();
+}
+
 /// A lone record that stands for a whole file, as catalogues of earlier versions hold; null when there is
 /// none.
 const EffectRecord *loneFileRecord(const KnownList::Records &records)
@@ -127,7 +132,7 @@ bool ScanPlan::isGone(const QString &path)
 }
 
 /// Gives the records of a gone file to one that may be the same: to one of its name of which nothing is
-/// known, else to one that is there because it crashed, else to one that is known, which is asked again.
+/// known. Else those that are known are asked again, and what none of them lists goes to one that crashed.
 void ScanPlan::settleGone(const KnownFile &gone, const QStringList &modules)
 {
     if (ScanItem *item = bestUnknown(gone)) {
@@ -138,8 +143,8 @@ void ScanPlan::settleGone(const KnownFile &gone, const QStringList &modules)
     for (const QString &path : modules)
         if (isSamePath(fileNameOf(path), fileNameOf(gone.path)))
             namesakes.append(path);
-    if (!namesakes.isEmpty() && !moveToCrashed(gone, namesakes))
-        askAgain(namesakes);
+    moveToCrashed(gone, namesakes);
+    askAgain(namesakes);
 }
 
 ScanItem *ScanPlan::bestUnknown(const KnownFile &gone)
@@ -157,7 +162,7 @@ ScanItem *ScanPlan::bestUnknown(const KnownFile &gone)
     return best;
 }
 
-bool ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes)
+void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes)
 {
     const auto isOnlyCrashed = [this](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
@@ -165,19 +170,23 @@ bool ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
     };
     const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);
     if (crashed == namesakes.end())
-        return false;
+        return;
     const EffectRecord &file = *m_host.known().recordsOfPath(*crashed).front();
     for (const EffectRecord *record : gone.records) {
-        if (m_host.known().isSameOfFile(*record, file) || record->standsForFile())
+        const bool isFile = m_host.known().isSameOfFile(*record, file);
+        if (isFile ? hasMarks(file) : record->standsForFile())
             continue;
-        m_keptMoved.push_back(*record);
+        if (isFile)
+            m_kept.erase(std::remove(m_kept.begin(), m_kept.end(), &file), m_kept.end());
+        m_keptMoved.push_back(isFile ? file : *record);
         EffectRecord &moved = m_keptMoved.back();
+        moved.category = record->category;
+        moved.favourite = record->favourite;
         moved.path = file.path;
         moved.fileTime = file.fileTime;
         if (!moved.isSwitchedOff())
             moved.enabled = moved.working = false;
     }
-    return true;
 }
 
 bool ScanPlan::isKept(const QString &path) const
@@ -242,20 +251,37 @@ const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRe
 {
     const auto isSame = [&](const EffectRecord &old) { return m_host.known().isSameOfFile(old, probed); };
     const auto hasId = [&](const EffectRecord &old) { return old.id == probed.id; };
-    if (const EffectRecord *own = findIn(item.known, isSame))
+    const EffectRecord *own = findIn(item.known, isSame);
+    if (own && (own->working || hasId(*own) || hasMarks(*own)))
         return own;
-    KnownList::Records gone = item.moved; // first: the likeliest
-    for (const KnownFile &file : m_gone)
-        if (isSamePath(fileNameOf(file.path), fileNameOf(item.path)))
-            gone.insert(gone.end(), file.records.begin(), file.records.end());
-    if (const EffectRecord *same = findIn(gone, hasId))
-        return same;
-    if (const EffectRecord *same = findIn(gone, isSame))
-        return same;
-    if (const EffectRecord *same = findIn(m_away, hasId))
-        return same;
-    if (!isOnly)
-        return nullptr;
+    // Also of a file that is there: its copy comes to list what it does not list any more.
+    const KnownList::Records namesakes = m_host.known().recordsOfFileName(item.path);
+    for (const KnownList::Records *records : {&namesakes, &m_away})
+        if (const EffectRecord *same = findIn(*records, hasId))
+            return same;
+    const EffectRecord *child = missingChild(item, probed);
+    if (child || own || !isOnly)
+        return child ? child : own;
     const EffectRecord *lone = loneFileRecord(item.known);
     return lone ? lone : loneFileRecord(item.moved);
+}
+
+/// The sub-plug-in of a missing namesake that crashed, and so lost its identifier.
+const EffectRecord *ScanPlan::missingChild(const ScanItem &item, const EffectRecord &probed) const
+{
+    if (probed.subName.isEmpty())
+        return nullptr;
+    KnownList::Records missing = m_away;
+    for (const KnownFile &file : m_gone)
+        missing.insert(missing.end(), file.records.begin(), file.records.end());
+    return findIn(missing, [&](const EffectRecord &old) {
+        return m_host.known().isSameOfFile(old, probed) && old.subName == probed.subName &&
+               isSamePath(fileNameOf(old.path), fileNameOf(item.path));
+    });
+}
+
+const EffectRecord *ScanPlan::likelySourceOfMarks(const ScanItem &item, const EffectRecord &probed) const
+{
+    return findIn(item.moved,
+                  [&](const EffectRecord &old) { return m_host.known().isSameOfFile(old, probed); });
 }

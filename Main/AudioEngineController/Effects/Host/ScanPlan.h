@@ -34,7 +34,8 @@ public:
 
     /// Records that stay as they are.
     const std::vector<const EffectRecord *> &kept() const { return m_kept; }
-    /// Records of gone files that moved to the path of a file that crashed: changed copies.
+    /// Records of gone files that move to the path of a file that crashed, unless a probed file lists them:
+    /// changed copies.
     const std::vector<EffectRecord> &keptMoved() const { return m_keptMoved; }
     /// What is to be probed: known files first, so that of two files with one identifier the known one wins.
     const std::vector<ScanItem> &items() const { return m_items; }
@@ -47,6 +48,9 @@ public:
     /// The old record whose marks a newly probed one takes over; null when there is none. `isOnly`: the
     /// file lists nothing else.
     const EffectRecord *sourceOfMarks(const ScanItem &item, const EffectRecord &probed, bool isOnly) const;
+    /// Where there is none: the record in whose place it came, in a file that moved. Another file may yet
+    /// come to list that plug-in.
+    const EffectRecord *likelySourceOfMarks(const ScanItem &item, const EffectRecord &probed) const;
 
 private:
     struct KnownFile {
@@ -59,12 +63,13 @@ private:
     bool isGone(const QString &path);
     void settleGone(const KnownFile &gone, const QStringList &modules);
     ScanItem *bestUnknown(const KnownFile &gone);
-    bool moveToCrashed(const KnownFile &gone, const QStringList &namesakes);
+    void moveToCrashed(const KnownFile &gone, const QStringList &namesakes);
     void askAgain(const QStringList &paths);
     bool isKept(const QString &path) const;
     bool isUnchangedCopy(const ScanItem &item) const;
     void leaveOutCopies();
     void askCopiesOfUnsettled();
+    const EffectRecord *missingChild(const ScanItem &item, const EffectRecord &probed) const;
     void keep(const KnownList::Records &records);
 
     const CatalogueHost &m_host;

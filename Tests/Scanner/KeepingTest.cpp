@@ -1,0 +1,226 @@
+#include "Tests/Scanner/ScanTable.h"
+
+namespace {
+
+// What a user has done and what ended the scanner, through updates, moves and accidents.
+const char kScans[] = R"(
+= A failed update costs and spreads no marks
+put Three.vst3: class A | #1 | class B | #2 | class C | #3
+put Shell.vst2: child 1 D | child 2 E | child 3 F
+scan
+mark A Favourite 1
+mark B CategoryMask 4
+mark C Enabled 0
+mark D Favourite 1
+mark E CategoryMask 4
+mark F Enabled 0
+new Three.vst3: answer module-entry false
+new Shell.vst2: answer entry null
+scan
+vst3 Name Favourite CategoryMask Enabled Working: Three|0|0|1|0, A|1|0|1|0, B|0|4|1|0, C|0|0|0|1
+vst2 Name Favourite CategoryMask Enabled Working: Shell|0|0|1|0, D|1|0|1|0, E|0|4|1|0, F|0|0|0|1
+same
+put Three.vst3: class A | #1 | class B | #2 | class C | #3
+put Shell.vst2: child 1 D | child 2 E | child 3 F
+scan
+vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
+vst2 Name Favourite CategoryMask Enabled Working: D|1|0|1|1, E|0|4|1|1, F|0|0|0|1
+new Three.vst3: class A | answer get-factory null
+scan
+vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
+put Three.vst3: class A | #1 | class B | #2 | class C | #3
+scan
+vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
+
+= What was retried after a crash has its own marks
+put Three.vst3: class A | #1 | class B | #2 | class C | #3
+put Shell.vst2: child 1 D | child 2 E
+scan
+mark A Favourite 1
+mark B CategoryMask 4
+mark D Favourite 1
+new Three.vst3: class A | #1 | fault module-entry kill
+new Shell.vst2: child 1 D | child 2 E | fault get-plug-category kill
+scan 3
+vst3 Name Favourite CategoryMask Enabled Working: Three|0|0|0|0, A|1|0|0|0, B|0|4|0|0, C|0|0|0|0
+vst2 Name Favourite Enabled Working: Shell|0|0|0, D|1|0|0, E|0|0|0
+same
+retry Three
+retry E
+put Three.vst3: class A | #1 | class B | #2 | class C | #3
+put Shell.vst2: child 1 D | child 2 E
+scan
+vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|1|1
+vst2 Name Favourite Enabled Working: D|1|1|1, E|0|1|1
+
+= What an earlier version left usable beside a crash is disabled
+put Multi.vst3: class A | #1 | class B | #2 | fault module-entry kill
+write Effects/VST3Configuration.xml: <Effects version="1.1"><Effect><Path>@/Plugins/Multi.vst3</Path><FileTime>2021-03-04 05:06</FileTime><Name>A</Name><ID>Multi</ID><Enabled>0</Enabled><Working>0</Working></Effect><Effect><Path>@/Plugins/Multi.vst3</Path><FileTime>2021-03-04 05:06</FileTime><Name>B</Name><ID>2</ID></Effect></Effects>
+scan
+loaded .
+vst3 Name Enabled Working: A|0|0, B|0|0
+
+= A failure in one folder gives nothing to the namesake in another
+put u/Comp.vst3: class U | #1
+put v/Comp.vst3: class V | #2
+scan
+mark U Favourite 1
+new u/Comp.vst3: answer module-entry false
+new v/Comp.vst3: class V | #2 | class W | #3
+scan
+vst3 Name Favourite Working: Comp|0|0, U|1|0, V|0|1, W|0|1
+put u/Comp.vst3: class U | #1
+scan
+vst3 Name Favourite Working: U|1|1, V|0|1, W|0|1
+
+= A renamed folder keeps the marks of VST 2 namesakes apart
+put old/x/Comp.vst2: name X | id 1
+put old/y/Comp.vst2: name Y | id 2
+scan
+mark X Favourite 1
+mark Y CategoryMask 4
+move Plugins/old Plugins/new
+scan
+vst2 Name Path Favourite CategoryMask: X|new/x/Comp.vst2|1|0, Y|new/y/Comp.vst2|0|4
+move Plugins/new Plugins/last
+new last/x/Comp.vst2: answer entry null
+scan
+put last/x/Comp.vst2: name X | id 1
+scan
+vst2 Name Favourite CategoryMask: X|1|0, Y|0|4
+same
+
+= A copy lists what the other file listed
+put a/Comp.vst3: class M | #1 | class N | #2
+put b/Comp.vst3: class N | #2 | class O | #3
+write Plugins/a/other: x
+scan
+vst3 Name Path: M|a/Comp.vst3, N|a/Comp.vst3, O|b/Comp.vst3
+mark N Favourite 1
+remove Plugins/a/Comp.vst3
+scan
+vst3 Name Path Favourite: N|b/Comp.vst3|1, O|b/Comp.vst3|0
+put a/Comp.vst3: class N | #2
+scan
+remove Plugins/b/Comp.vst3
+new a/Comp.vst3: class N | #2
+write Plugins/b/other: x
+scan
+vst3 Name Path Favourite: N|a/Comp.vst3|1
+
+= A namesake that kills gets nothing of a file that moved
+put a/Comp.vst3: class A | #1 | class B | #2
+put a/Shell.vst2: child 1 D | child 2 E
+write Plugins/a/other: x
+scan
+mark A Favourite 1
+mark D Favourite 1
+move Plugins/a/Comp.vst3 Plugins/f/Comp.vst3
+move Plugins/a/Shell.vst2 Plugins/f/Shell.vst2
+put b/Comp.vst3: class X | fault module-entry kill
+put b/Shell.vst2: fault get-plug-category kill
+scan 3
+vst3 Name Path Favourite Working: Comp|b/Comp.vst3|0|0, A|f/Comp.vst3|1|1, B|f/Comp.vst3|0|1
+vst2 Name Path Favourite Working: Shell|b/Shell.vst2|0|0, D|f/Shell.vst2|1|1, E|f/Shell.vst2|0|1
+same
+
+= An interrupted scan of moved files leaves each plug-in once
+put a/Comp.vst3: class A | #1
+put a/Echo.vst2: name E
+write Plugins/a/other: x
+scan
+mark A Favourite 1
+move Plugins/a/Comp.vst3 Plugins/f/Comp.vst3
+put z/Slow.vst3: fault initialize hang
+stop Slow
+vst3 Name Path Favourite: A|f/Comp.vst3|1
+scan
+vst3 Name Path Favourite Enabled: A|f/Comp.vst3|1|1, Slow|z/Slow.vst3|0|0
+double Effects/VST3Configuration.xml
+double Effects/FXConfiguration.xml
+scan
+vst3 Name Path Favourite Enabled: A|f/Comp.vst3|1|1, Slow|z/Slow.vst3|0|0
+vst2 Name Path: E|a/Echo.vst2
+same
+
+= Texts with angle brackets stay whole and keep their marks
+put A.vst2: name "Top <br/> Boost" | vendor "Jo <jo x.org>"
+put B.vst3: class "A &amp; B" | vendor "Jo <jo x.org>"
+scan
+mark Top <br/> Boost Favourite 1
+mark A &amp; B Favourite 1
+new A.vst2: name "Top <br/> Boost" | vendor "Jo <jo x.org>"
+new B.vst3: class "A &amp; B" | vendor "Jo <jo x.org>"
+scan
+loaded B A
+vst2 Name Vendor Favourite: Top <br/> Boost|Jo <jo x.org>|1
+vst3 Name Vendor Favourite: A &amp; B|Jo <jo x.org>|1
+same
+
+= A torn scan list costs nothing
+put Comp.vst3:
+scan
+write Effects/FXScan.xml: <?xml version="1.0" encoding="UTF-8"?>\n<Scan>\n\t<Path>@/Plug
+run
+exit 2
+vst3 Name: Comp
+
+= A folder that is away keeps its plug-ins and its killer until it leaves the list
+put b/Comp.vst3:
+put b/Bad.vst3: class X | fault module-entry kill
+put b/Echo.vst2:
+folders @/Plugins/b
+scan 2
+mark Comp Favourite 1
+move Plugins/b Away
+scan
+vst3 Name Favourite Enabled: Bad|0|0, Comp|1|1
+vst2 Name: Echo
+write Plugins/b/x: y
+remove Plugins/b/x
+same
+move Away Plugins/b
+same
+folders @/Plugins/c
+scan
+vst3 Name: .
+vst2 Name: .
+
+= A moved WaveShell that lists nothing leaves no dead path
+put a/WaveShell1-VST3 9.2.vst3: class Inner | #1
+write Plugins/a/other: x
+scan
+mark Inner Favourite 1
+put f/WaveShell1-VST3 9.2.vst3: class Controller | category "Component Controller Class"
+remove Plugins/a/WaveShell1-VST3 9.2.vst3
+scan
+vst3 Name Path Favourite: Inner|f/WaveShell1-VST3 9.2.vst3|1
+
+= A catalogue of a negative version keeps its categories
+put Comp.vst3:
+scan
+mark Comp CategoryMask 4
+edit Effects/VST3Configuration.xml: version="1.1" => version="-1"
+scan
+loaded .
+vst3 Name CategoryMask: Comp|4
+
+= A new file of a known name and time is asked
+put a/Comp.vst3: class A | #1
+put a/Comp.vst2: name D | id 1
+scan
+put b/Comp.vst3: class B | #2
+put b/Comp.vst2: name E | id 2
+scan
+loaded Comp Comp
+vst3 Name: A, B
+vst2 Name: D, E
+)";
+
+class Keeping : public ScanTable {};
+
+} // namespace
+
+TEST_P(Keeping, EndsAsItSays) { carryOutAll(); }
+
+INSTANTIATE_TEST_SUITE_P(Of, Keeping, testing::ValuesIn(scanCases(kScans)), nameOfScan);

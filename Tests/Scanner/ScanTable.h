@@ -1,0 +1,189 @@
+#pragma once
+
+#include "Tests/Support/ScanBench.h"
+#include "Tests/Support/VST2Fixture.h"
+#include "Workstation/Retry.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+#include <QRegularExpression>
+
+#include <functional>
+
+// Whole scans, each a few steps. Files of "put" lie in "Plugins", others in the data folder, which "@" stands
+// for; "\n" is a line's end and "." in a list an empty one.
+//   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated; "#1" is an id
+//   write FILE: TEXT; remove FILE; move FILE FILE (or folder); holds FILE: TEXT
+//   link FILE FILE                where it lies and where it leads; where there are links
+//   short FILE BYTES              ends a file after so many and dates it as updated
+//   folders FOLDER…               what the scan list names
+//   mark NAME ELEMENT VALUE       as the user does
+//   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
+//   scan [N]                      until no marker survives, which takes N runs (1)
+//   stop MODULE                   a scan that is ended by force while the module is initialised
+//   retry NAME                    has it asked again; exit N is how the last run ended
+//   double FILE                   appends a catalogue's records once more, as of another folder
+//   same                          a scan that loads nothing and writes nothing
+//   loaded MODULE…                what the scan loaded, in order
+//   log: TEXT                     what its log holds
+//   vst3, vst2 ELEMENTS: ROW, ROW what the catalogue lists, in any order
+struct ScanCase {
+    std::string name;
+    QStringList steps;
+
+    friend void PrintTo(const ScanCase &scan, std::ostream *out) { *out << scan.name; }
+};
+
+inline std::vector<ScanCase> scanCases(const char *table)
+{
+    std::vector<ScanCase> cases;
+    for (const QString &line : QString::fromUtf8(table).split('\n', Qt::SkipEmptyParts)) {
+        if (line.startsWith("= "))
+            cases.push_back({line.mid(2).toStdString(), {}});
+        else
+            cases.back().steps.append(line);
+    }
+    return cases;
+}
+
+inline std::string nameOfScan(const testing::TestParamInfo<ScanCase> &row)
+{
+    std::string name;
+    for (const char character : row.param.name)
+        if (std::isalnum(static_cast<unsigned char>(character)))
+            name += character;
+    return name;
+}
+
+class ScanTable : public ScanBench, public testing::WithParamInterface<ScanCase> {
+protected:
+    void carryOutAll()
+    {
+        for (const QString &step : GetParam().steps) {
+            SCOPED_TRACE(step.toStdString());
+            carryOut(step);
+        }
+    }
+
+private:
+    void carryOut(const QString &step)
+    {
+        const QString head = step.section(':', 0, 0);
+        const QString text = resolved(step.section(':', 1)).trimmed();
+        const QString verb = head.section(' ', 0, 0);
+        const QString file = head.section(' ', 1);
+        const std::map<QString, std::function<void()>> verbs = {
+            {"put", [&] { put(file, script(text)); }},
+            {"new", [&] { dateLater(put(file, script(text))); }},
+            {"write", [&] { m_folder.write(file, text.toUtf8().replace("\\n", "\n")); }},
+            {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
+            {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(spelt(file)))); }},
+            {"link", [&] { link(file.section(' ', 0, 0), file.section(' ', 1)); }},
+            {"short", [&] { cutShort(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
+            {"move", [&] { move(spelt(file).split(' ')); }},
+            {"double", [&] { doubleRecords(file); }},
+            {"stop", [&] { stopDuring(file); }},
+            {"retry", [&] { EXPECT_TRUE(retryPlugins(m_folder.effects(), {file}, {}).unknown.isEmpty()); }},
+            {"exit", [&] { EXPECT_EQ(m_last.exitCode, file.toInt()); }},
+            {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
+            {"mark", [&] { markAsUser(file); }},
+            {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
+            {"cut",
+             [&] { edit(file, m_folder.read(file).mid(m_folder.read(file).indexOf(text.toUtf8())), {}); }},
+            {"scan", [&] { scanWithRuns(file.isEmpty() ? 1 : file.toInt()); }},
+            {"run", [&] { m_last = scanOnce(); }},
+            {"same", [&] { expectNothingToDo(); }},
+            {"loaded", [&] { EXPECT_EQ(loaded().join(' '), file == "." ? "" : file); }},
+            {"markers", [&] { EXPECT_EQ(m_folder.markers().join(' '), file); }},
+            {"log", [&] { EXPECT_TRUE(m_last.log.contains(text)) << qPrintable(m_last.log); }},
+            {"vst3", [&] { expectRecords("VST3Configuration.xml", file, text); }},
+            {"vst2", [&] { expectRecords("FXConfiguration.xml", file, text); }}};
+        verbs.at(verb)();
+    }
+
+    QString resolved(QString text) const
+    {
+        return text.replace('@', m_folder.dataFolder()).replace(".vst2<", vst2Ending() + '<');
+    }
+    static QString spelt(QString file) { return file.replace(".vst2", vst2Ending()); }
+    static QByteArray script(QString statements)
+    {
+        statements.replace(QRegularExpression("#(\\d)"), "id " + QString(31, '0') + "\\1");
+        return QString(statements + '\n').replace(" | ", "\n").toUtf8();
+    }
+    void move(const QStringList &paths) const
+    {
+        QDir().mkpath(QFileInfo(m_folder.path(paths[1])).path());
+        QDir().rmdir(m_folder.path(paths[1])); // an empty folder
+        EXPECT_TRUE(QFile::rename(m_folder.path(paths[0]), m_folder.path(paths[1])));
+        QFile::rename(m_folder.path(paths[0]) + ".script", m_folder.path(paths[1]) + ".script");
+    }
+    void doubleRecords(const QString &file) const
+    {
+        QByteArray text = m_folder.read(file);
+        const int end = text.indexOf("</Effects>"), start = text.indexOf("\t<Effect>");
+        m_folder.write(file,
+                       text.insert(end, text.mid(start, end - start).replace("/Plugins/", "/Plugins/was/")));
+    }
+    void stopDuring(const QString &module) const
+    {
+        forgetTrace();
+        ScannerRun scanner(scannerProgram(), m_folder);
+        EXPECT_TRUE(scanner.start() && waitForStage(scanner, module, "initialize"));
+        scanner.kill();
+        scanner.wait();
+    }
+    void link(const QString &place, const QString &target)
+    {
+        if (!QFile::link(m_folder.path(target), m_folder.path(place)) ||
+            !QFileInfo(m_folder.path(place)).isSymbolicLink())
+            GTEST_SKIP() << "no links can be made here";
+    }
+    void cutShort(const QString &file, qint64 size) const
+    {
+        const QString path = m_folder.path(spelt(file));
+        EXPECT_TRUE(QFile::resize(path, size));
+        dateLater(path);
+    }
+    void markAsUser(const QString &words) const
+    {
+        mark(words.section(' ', 0, -3), words.section(' ', -2, -2).toUtf8(), words.section(' ', -1).toUtf8());
+    }
+    void edit(const QString &file, const QString &from, const QString &to) const
+    {
+        const QString text = QString::fromUtf8(m_folder.read(file));
+        EXPECT_TRUE(text.contains(from)) << qPrintable(text);
+        m_folder.write(file, QString(text).replace(from, to).toUtf8());
+    }
+    void scanWithRuns(int count)
+    {
+        if (count > 1) {
+            forgetTrace();
+            EXPECT_EQ(scanUntilSettled(), count);
+        } else {
+            m_last = scan();
+        }
+    }
+    void expectNothingToDo() const
+    {
+        for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"})
+            dateFirst("Effects/" + QString(file));
+        const auto before = effectsFolder();
+        const QDateTime modified = QFileInfo(cataloguePath()).lastModified();
+        scan();
+        EXPECT_EQ(loaded(), QStringList());
+        EXPECT_EQ(effectsFolder(), before);
+        EXPECT_EQ(QFileInfo(cataloguePath()).lastModified(), modified);
+    }
+    void expectRecords(const char *file, const QString &elements, const QString &rows) const
+    {
+        QStringList found = recordsOf(file, elements.toUtf8()), expected = spelt(rows).split(", ");
+        found.replaceInStrings(m_folder.plugins() + '/', "");
+        found.sort();
+        expected.sort();
+        EXPECT_EQ(found, rows == "." ? QStringList() : expected);
+    }
+
+    ScannerOutcome m_last;
+};
