@@ -69,7 +69,8 @@ CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString
     CatalogueLines lines = readCatalogueLines(format, text);
     contents.records = std::move(lines.records);
     std::optional<QString> version = lines.version;
-    contents.isAsWritten = lines.isWhole && lines.version == QLatin1String(format.version);
+    contents.isAsWritten =
+        lines.isWhole && lines.isAsWritten && lines.version == QLatin1String(format.version);
     if (!lines.isWhole)
         version = readAsXml(format, text, contents);
     upgrade(format, parseDecimal(version.value_or(lines.version)), fileTimeOf, contents);

@@ -1,5 +1,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueLines.h"
 
+#include "Core/BaseLib/Files/TextFile.h"
+
 #include <QStringList>
 
 #include <algorithm>
@@ -80,11 +82,13 @@ std::vector<ElementTags> tagsOf(const CatalogueFormat &format, std::string_view 
 }
 
 /// Reads the elements of a record, from the one after its first line to its last line.
-bool takeElements(Lines &lines, const std::vector<ElementTags> &tags, EffectRecord &record)
+bool takeElements(Lines &lines, const std::vector<ElementTags> &tags, EffectRecord &record, bool &hasAll)
 {
     for (auto tag = tags.begin(); tag != tags.end(); ++tag) {
-        if (!lines.take(tag->opening))
-            continue; // left out: only what a plug-in does not have is
+        if (!lines.take(tag->opening)) {
+            hasAll &= !tag->element->content(record).has_value(); // what a plug-in does not have is left out
+            continue;
+        }
         const auto isNext = [&] {
             const auto isOpened = [&](const ElementTags &later) { return lines.startsWith(later.opening); };
             return std::any_of(tag + 1, tags.end(), isOpened) || lines.startsWith(kRecordEnd);
@@ -111,10 +115,11 @@ CatalogueLines readCatalogueLines(const CatalogueFormat &format, const QByteArra
     if (!version)
         return read;
     read.version = version->text();
+    read.isAsWritten = lines.lineEnd() == kLineEnd;
     const std::vector<ElementTags> tags = tagsOf(format, lines.lineEnd());
     while (lines.takeLine("\t<Effect>")) {
         EffectRecord record;
-        if (!takeElements(lines, tags, record))
+        if (!takeElements(lines, tags, record, read.isAsWritten))
             return read;
         read.records.push_back(std::move(record));
     }

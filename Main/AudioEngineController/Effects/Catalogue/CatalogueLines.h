@@ -10,6 +10,7 @@
 struct CatalogueLines {
     QString version;
     std::vector<EffectRecord> records; ///< in the order of the file
+    bool isAsWritten = true;           ///< false: in the way of another system, or with elements left out
     bool isWhole = false; ///< false: some line is not as we write it; the records before it are there
 };
 

@@ -32,8 +32,9 @@ bool KnownList::addRecord(const EffectRecord &record)
 {
     const QString fileName = fileNameOf(record.path);
     const auto [first, last] = m_byFileName.equal_range(fileName);
-    const bool isThere =
-        std::any_of(first, last, [&](const auto &entry) { return entry.second->id == record.id; });
+    const bool isThere = std::any_of(first, last, [&](const auto &entry) {
+        return entry.second->id == record.id && isSamePath(entry.second->path, record.path);
+    });
     if (isThere)
         return false;
     m_records.push_back(record);

@@ -33,7 +33,7 @@ public:
         return m_identity == Identity::SubPlugin ? left.subId == right.subId : left.id == right.id;
     }
 
-    /// Adds a record, unless one with the same file name and identifier is there: the first wins.
+    /// Adds a record, unless one of the same path and identifier is there: the first wins.
     bool addRecord(const EffectRecord &record);
 
     /// Applies a crash marker. One of a sub-plug-in concerns the record of that path and identifier. One of a

@@ -73,7 +73,7 @@ RememberedPlugin pluginOf(const QJsonObject &object)
 {
     RememberedPlugin plugin;
     plugin.id = object.value(word(kId)).toString();
-    plugin.subId = static_cast<quint32>(object.value(word(kSubId)).toDouble());
+    plugin.subId = subIdOf(object.value(word(kSubId)));
     plugin.reason = object.value(word(kReason)).toString();
     plugin.inputs = object.value(word(kInputs)).toInt(-1);
     plugin.outputs = object.value(word(kOutputs)).toInt(-1);
@@ -93,7 +93,11 @@ Enum enumOf(const QString &text, const char *const (&texts)[Size])
 RememberedProbe probeOf(const QJsonObject &object)
 {
     RememberedProbe probe;
-    if (const PluginFormatInfo *format = formatOfKey(object.value(word(kFormat)).toString()))
+    const PluginFormatInfo *const format = formatOfKey(object.value(word(kFormat)).toString());
+    const bool isKnown = std::any_of(std::begin(kStatusTexts), std::end(kStatusTexts), [&](const char *text) {
+        return object.value(word(kStatus)).toString() == word(text);
+    });
+    if (format && isKnown) // else it is of another version, and nobody knows what it says
         probe.format = format->format;
     probe.path = object.value(word(kPath)).toString();
     probe.fileTime = object.value(word(kFileTime)).toString();

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <QJsonValue>
+
 /// The words of the report that its writer and its reader share; docs/report.md describes them.
 namespace ReportWord {
 inline constexpr char kEvent[] = "event";
@@ -20,4 +22,11 @@ inline constexpr const char *kEvents[] = {"start",   "busy",      "plan",       
                                           "skipped", "unwritten", "unreadList", "finished", "ended"};
 /// In the order of `ProbeStage`.
 inline constexpr const char *kStages[] = {"load", "start", "ask", "close"};
+
+/// A sub-plug-in's identifier; 0 for anything else.
+inline quint32 subIdOf(const QJsonValue &value)
+{
+    const double number = value.toDouble();
+    return number > 0 && number <= 4294967295.0 ? static_cast<quint32>(number) : 0;
+}
 } // namespace ReportWord

@@ -31,8 +31,10 @@ ReportLine lineOf(const QByteArray &text)
     line.event = static_cast<ReportLine::Event>(placeOf(textOf(kEvent), kEvents));
     if (const PluginFormatInfo *format = formatOfKey(textOf(kFormat)))
         line.format = format->format;
+    else if (json.contains(QLatin1String(kFormat)))
+        line.event = ReportLine::Event::Unknown; // of a format that this version does not know
     line.path = textOf(kPath);
-    line.subId = static_cast<quint32>(json.value(QLatin1String(kSubId)).toDouble());
+    line.subId = subIdOf(json.value(QLatin1String(kSubId)));
     line.subName = textOf(kSubName);
     if (const std::size_t stage = placeOf(textOf(kStage), kStages); stage < std::size(kStages))
         line.stage = static_cast<ProbeStage>(stage);
