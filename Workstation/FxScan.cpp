@@ -114,7 +114,7 @@ int retry(const ScanOptions &options, const QStringList &folders, PluginHost &re
     registry.ReadCatalogue(); // absorbs the markers: the newest crash may be the one that is meant
     const RetryOutcome outcome = retryPlugins(files.effects, options.retry, folders);
     for (const QString &name : outcome.unknown)
-        complain(QStringLiteral("no plug-in '%1' is disabled or failed").arg(name));
+        complain(QStringLiteral("no disabled or failed plug-in is named '%1'").arg(name));
     if (!outcome.written)
         complain(QStringLiteral("cannot write ") + outcome.written.reason);
     return !outcome.unknown.isEmpty() ? ScanExit::kUsage

@@ -56,12 +56,20 @@ int reopen(std::vector<EffectRecord> &records, Chooser &chooser)
         records.begin(), records.end(), [&](const EffectRecord &record) { return chooser.choose(record); });
     for (auto record = records.begin(); record != others; ++record)
         files.insert(record->path);
-    // Any of a file's records may be the one that speaks for it, and keep it from being touched.
-    for (EffectRecord &record : records)
-        if (files.count(record.path) != 0) {
-            record.fileTime.clear();
-            record.enabled |= !record.working;
-        }
+    // Any of a file's records may be the one that speaks for it, and keep it from being touched. But a
+    // sub-plug-in that killed the scanner is loaded again only when it, or its whole file, was meant.
+    std::set<QString> wholeFiles;
+    for (auto record = records.begin(); record != others; ++record)
+        if (record->subId == 0)
+            wholeFiles.insert(record->path);
+    for (auto record = records.begin(); record != records.end(); ++record) {
+        const bool isOtherChild = record >= others && record->subId != 0 && !record->enabled &&
+                                  !record->working && wholeFiles.count(record->path) == 0;
+        if (files.count(record->path) == 0 || isOtherChild)
+            continue;
+        record->fileTime.clear();
+        record->enabled |= !record->working;
+    }
     return static_cast<int>(std::distance(records.begin(), others));
 }
 

@@ -155,6 +155,7 @@ private:
     std::mt19937 m_random;
     TestFolder m_folder;
     std::map<QString, File> m_files;
+    std::set<QString> m_deadly;   ///< "file-name number stamp" of sub-plug-ins that killed, wherever it lay
     std::set<QString> m_culprits; ///< paths, and "path number stamp" of sub-plug-ins
     std::set<QString> m_asleep;   ///< the user switched off what speaks for the file: it is not asked
     QStringList m_left;           ///< paths that were given up since the last whole scan
@@ -226,7 +227,10 @@ ProbeOutcome World::probe(const ProbeJob &job, IProbeObserver &observer)
                 reach(job.path + QString(" %1 %2").arg(number).arg(job.fileTime), number,
                       number == file.deadly);
                 observer.childEnds(ProbeOutcome());
-            } else {
+            } else { // here, or where the file lay before
+                const QString child = job.path + QString(" %1 %2").arg(number).arg(job.fileTime);
+                EXPECT_TRUE(m_deadly.count(fileNameOf(child))) << qPrintable(child);
+                m_culprits.insert(child);
                 record.id.clear();
                 record.enabled = record.working = false;
             }
@@ -253,6 +257,7 @@ void World::reach(const QString &culprit, int number, bool kills)
             m_frozen[file.filePath()] = m_folder.read(file.filePath());
     if (isBlamed) {
         m_culprits.insert(culprit);
+        m_deadly.insert(fileNameOf(culprit));
         m_crashed.insert(number);
     }
     m_hasEnded = true;
@@ -444,6 +449,8 @@ void World::checkMark(int number, const EffectRecord *record)
     for (const auto &[other, mark] : m_marks) // nothing but its place tells what replaced a VST 2 plug-in
         isAllowed |= isVst2() && actual == mark && other % kPerProduct == number % kPerProduct &&
                      (countOf(other, false) == 0 || m_unsure.count(other));
+    // One that killed keeps its own while a copy is listed, and shows them again when the copy goes.
+    isAllowed |= record && isChildCulprit(record->path, number);
     EXPECT_TRUE(isAllowed) << "bears the mark " << actual.category << " of another";
 }
 

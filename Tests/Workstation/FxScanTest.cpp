@@ -338,7 +338,7 @@ TEST_F(FxScan, WrongUsage)
         {{"--timeout", "-1"}, "--timeout must be 0 to 86400 seconds, not '-1'"},
         {{"--list", "--retry-failed"}, "--list makes no scan"},
         {{nowhere}, "there is no folder"},
-        {{m_folder.plugins(), "--retry", "Nobody"}, "no plug-in 'Nobody'"},
+        {{m_folder.plugins(), "--retry", "Nobody"}, "no disabled or failed plug-in is named 'Nobody'"},
     };
     for (const auto &row : rows) {
         const ScannerOutcome outcome = run(row.options);

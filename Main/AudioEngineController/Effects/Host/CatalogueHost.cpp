@@ -7,9 +7,21 @@
 
 #include <QDir>
 #include <QFile>
+#include <QRegularExpression>
 
 #include <algorithm>
 #include <map>
+
+namespace {
+
+/// Whether a file's name could be a plug-in's identifier: a key of VST 2, or the id of a VST 3 class.
+bool looksLikeIdentifier(const QString &name)
+{
+    static const QRegularExpression pattern(QStringLiteral("\\A([^/]*:-?\\d+|[0-9A-Fa-f]{32})\\z"));
+    return pattern.match(name).hasMatch();
+}
+
+} // namespace
 
 CatalogueHost::CatalogueHost(PluginFormat format)
     : m_info(formatInfo(format))
@@ -281,8 +293,8 @@ QString CatalogueHost::freeIdentifier(const EffectRecord &plugin, const QString 
 {
     const auto isFree = [&](const QString &candidate) {
         const EffectRecord *listed = m_effects.find(candidate);
-        return !candidate.isEmpty() && !(listed && !listed->isSamePlugin(plugin)) &&
-               !m_known.isIdHeldByOther(candidate, plugin);
+        return !candidate.isEmpty() && !looksLikeIdentifier(candidate) &&
+               !(listed && !listed->isSamePlugin(plugin)) && !m_known.isIdHeldByOther(candidate, plugin);
     };
     const QString ofSubPlugin = plugin.path + QLatin1Char(':') + QString::number(plugin.subId);
     for (const QString &candidate : {name, plugin.path, ofSubPlugin})

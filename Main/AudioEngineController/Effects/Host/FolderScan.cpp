@@ -38,6 +38,25 @@ bool isDeadly(const EffectRecord &old, const QString &fileTime)
     return old.subId != 0 && !old.enabled && !old.working && old.fileTime == fileTime;
 }
 
+/// What is known of a sub-plug-in that must not be loaded; null when it may be.
+const EffectRecord *deadlyRecord(const ScanItem &item, const EffectRecord &child)
+{
+    for (const KnownList::Records *records : {&item.known, &item.moved})
+        for (const EffectRecord *old : *records)
+            if (old->subId == child.subId && isDeadly(*old, item.fileTime))
+                return old;
+    return nullptr;
+}
+
+/// A plug-in's texts as a catalogue takes them, whose lines they must not break.
+void replaceControls(EffectRecord &record)
+{
+    for (QString *text : {&record.name, &record.id, &record.vendor, &record.categories, &record.subName})
+        for (QChar &character : *text)
+            if (character < QLatin1Char(' '))
+                character = QLatin1Char(' ');
+}
+
 } // namespace
 
 FolderScan::FolderScan(CatalogueHost &host)
@@ -122,7 +141,10 @@ void FolderScan::keepKnownPaths(QStringList &paths) const
 void FolderScan::addKept()
 {
     for (const EffectRecord *record : m_plan->kept())
-        m_host.AddEffect(*record);
+        if (record->working || record->standsForFile())
+            m_host.AddEffect(*record);
+        else
+            m_later.push_back(*record); // a file that lists the same and works goes first
 }
 
 void FolderScan::showItemProgress()
@@ -154,9 +176,10 @@ ProbeJob FolderScan::jobOf(const ScanItem &item) const
     job.path = item.path;
     job.fileTime = item.fileTime;
     job.announceClasses = item.known.empty() && item.moved.empty();
-    for (const EffectRecord *old : item.known)
-        if (isDeadly(*old, item.fileTime))
-            job.leftOut.insert(old->subId);
+    for (const KnownList::Records *records : {&item.known, &item.moved})
+        for (const EffectRecord *old : *records)
+            if (isDeadly(*old, item.fileTime))
+                job.leftOut.insert(old->subId);
     return job;
 }
 
@@ -172,6 +195,7 @@ void FolderScan::probe(const ScanItem &item)
     m_childrenDone = 0;
     ProbeOutcome outcome = m_runner->run(jobOf(item), *this);
     outcome.reason.remove(item.path + QLatin1String(": ")); // the path stands beside it
+    std::for_each(outcome.records.begin(), outcome.records.end(), replaceControls);
     remember(outcome);
     keepOutcome(item, outcome);
     m_memory.set(m_remembered);
@@ -240,15 +264,15 @@ bool FolderScan::addListed(const ScanItem &item, const ProbeOutcome &outcome)
 
 bool FolderScan::addProbed(const ScanItem &item, EffectRecord record, bool isOnly)
 {
-    for (const EffectRecord *old : item.known)
-        if (record.subId == old->subId && isDeadly(*old, item.fileTime)) { // another version gets a chance
-            EffectRecord deadly = *old;
-            if (const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly)) {
-                deadly.category = source->category;
-                deadly.favourite = source->favourite;
-            }
-            return m_host.AddEffect(deadly);
+    if (const EffectRecord *old = deadlyRecord(item, record)) { // another version gets a chance
+        EffectRecord deadly = *old;
+        deadly.path = item.path;
+        if (const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly)) {
+            deadly.category = source->category;
+            deadly.favourite = source->favourite;
         }
+        return m_host.AddEffect(deadly);
+    }
     if (!record.working)
         m_host.completeFailedRecord(record);
     const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly);
@@ -261,7 +285,7 @@ bool FolderScan::addProbed(const ScanItem &item, EffectRecord record, bool isOnl
         return true;
     const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
     for (RememberedPlugin &plugin : m_remembered.plugins)
-        if (holder && plugin.id == record.id)
+        if (holder && plugin.id == record.id && !isSamePath(holder->path, record.path))
             plugin.heldBy = holder->path;
     return false;
 }
@@ -299,15 +323,18 @@ void FolderScan::remember(const ProbeOutcome &outcome)
             {record.id, record.subId, reasons[record.subId], record.inputs, record.outputs, QString()});
 }
 
-/// Failures at once, the rest now and then: what is lost with a process costs time only.
+/// Failures soon, the rest now and then: what is lost with a process costs time only.
 void FolderScan::writeMemory(bool isLast)
 {
     constexpr qint64 kPause = 100; // ms
-    const bool isDue = !m_sinceMemory.isValid() || m_sinceMemory.hasExpired(kPause);
-    if (!isDue && !isLast && m_remembered.reason.isEmpty())
+    constexpr qint64 kShare = 20;  // of the time goes into writing at most a twentieth
+    const qint64 pause = m_remembered.reason.isEmpty() ? std::max(kPause, m_memoryPause) : m_memoryPause;
+    if (!isLast && m_sinceMemory.isValid() && !m_sinceMemory.hasExpired(pause))
         return;
+    m_sinceMemory.start();
     if (const FileResult written = m_memory.write(); !written)
-        DebugLog(L"Cannot write what the probes came to: %ls", written.reason);
+        DebugLog(L"Cannot write %ls: %ls", QString::fromLatin1(kProbeMemoryFile + 1), written.reason);
+    m_memoryPause = kShare * m_sinceMemory.elapsed();
     m_sinceMemory.start();
 }
 

@@ -66,6 +66,7 @@ private:
     std::shared_ptr<VProgressDisplay> m_progress;
     ProbeMemory m_memory;
     QElapsedTimer m_sinceMemory; ///< since it was written
+    qint64 m_memoryPause = 0;    ///< ms until it may be written again
     QSet<QString> m_found;       ///< the modules, by `pathKey`
     WaitingRecords m_waiting;
     bool m_hasCollected = false;       ///< what waits, for the first interim write

@@ -80,9 +80,9 @@ void ScanPlan::decide(const QStringList &modules)
         decideModule(path);
     }
     sortMissing(found);
-    for (const KnownFile &gone : m_gone)
-        settleGone(gone, modules);
-    if (!m_items.empty() || !m_gone.empty()) { // else there is nothing that a copy may be of
+    if (!m_items.empty() || !m_gone.empty()) { // else there is nothing to settle, nor what a copy may be of
+        indexKept();
+        settleAllGone(modules);
         leaveOutCopies();
         askCopiesOfUnsettled();
     }
@@ -131,35 +131,53 @@ bool ScanPlan::isGone(const QString &path)
     return entry->second;
 }
 
-/// Gives the records of a gone file to one that may be the same: to one of its name of which nothing is
-/// known. Else those that are known are asked again, and what none of them lists goes to one that crashed.
-void ScanPlan::settleGone(const KnownFile &gone, const QStringList &modules)
+void ScanPlan::indexKept()
 {
-    if (ScanItem *item = bestUnknown(gone)) {
-        item->moved = gone.records;
-        return;
+    for (const EffectRecord *record : m_kept) {
+        m_keptPaths.insert(pathKey(record->path));
+        if (record->working)
+            m_keptPlugins.insert({pathKey(record->path), record->id});
     }
-    QStringList namesakes;
-    for (const QString &path : modules)
-        if (isSamePath(fileNameOf(path), fileNameOf(gone.path)))
-            namesakes.append(path);
-    moveToCrashed(gone, namesakes);
-    askAgain(namesakes);
 }
 
-ScanItem *ScanPlan::bestUnknown(const KnownFile &gone)
+void ScanPlan::settleAllGone(const QStringList &modules)
 {
+    if (m_gone.empty())
+        return;
+    QHash<QString, QStringList> namesakes;
+    for (const QString &path : modules)
+        namesakes[pathKey(fileNameOf(path))].append(path);
+    QMultiHash<QString, std::size_t> unknown;
+    for (std::size_t index = 0; index < m_items.size(); ++index)
+        if (m_items[index].known.empty())
+            unknown.insert(pathKey(fileNameOf(m_items[index].path)), index);
+    for (const KnownFile &gone : m_gone) {
+        const QString name = pathKey(fileNameOf(gone.path));
+        settleGone(gone, unknown.values(name), namesakes.value(name));
+    }
+}
+
+/// Gives the records of a gone file to one that may be the same: to one of its name of which nothing is
+/// known, by the place of its item. Else those that are known are asked again, and what none of them lists
+/// goes to one that crashed.
+void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes)
+{
+    std::sort(unknown.begin(), unknown.end());
     ScanItem *best = nullptr;
     int bestEnd = 0;
-    for (ScanItem &item : m_items) {
-        if (!item.known.empty() || !item.moved.empty())
-            continue;
-        if (const int end = commonEnd(item.path, gone.path); end > bestEnd) {
-            best = &item;
+    for (const std::size_t index : unknown) {
+        const int end = commonEnd(m_items[index].path, gone.path);
+        if (m_items[index].moved.empty() && end > bestEnd) {
+            best = &m_items[index];
             bestEnd = end;
         }
     }
-    return best;
+    if (best) {
+        best->moved = gone.records;
+        return;
+    }
+    moveToCrashed(gone, namesakes);
+    askAgain(namesakes);
 }
 
 void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes)
@@ -189,10 +207,12 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
     }
 }
 
-bool ScanPlan::isKept(const QString &path) const
+bool ScanPlan::isKept(const QString &path) const { return m_keptPaths.contains(pathKey(path)); }
+
+/// Whether a file that is kept has the record of the identifier, and the plug-in works.
+bool ScanPlan::isHeld(const RememberedPlugin &plugin) const
 {
-    return std::any_of(m_kept.begin(), m_kept.end(),
-                       [&](const EffectRecord *record) { return isSamePath(record->path, path); });
+    return m_keptPlugins.contains({pathKey(plugin.heldBy), plugin.id});
 }
 
 /// Has modules asked again that were to be kept: what a gone file listed may be theirs as well.
@@ -206,6 +226,9 @@ void ScanPlan::askAgain(const QStringList &paths)
             std::remove_if(m_kept.begin(), m_kept.end(),
                            [&](const EffectRecord *record) { return isSamePath(record->path, path); }),
             m_kept.end());
+        m_keptPaths.remove(pathKey(path));
+        for (const EffectRecord *record : known)
+            m_keptPlugins.remove({pathKey(path), record->id});
         m_items.push_back({path, m_host.moduleTime(path), known, {}});
     }
 }
@@ -218,10 +241,8 @@ bool ScanPlan::isUnchangedCopy(const ScanItem &item) const
     const RememberedProbe *last = m_memory.find(m_host.format(), item.path);
     if (!last || last->fileTime != item.fileTime || !last->isCopy())
         return false;
-    return std::all_of(last->plugins.begin(), last->plugins.end(), [this](const RememberedPlugin &plugin) {
-        const auto holds = [&](const EffectRecord &record) { return record.id == plugin.id; };
-        return isKept(plugin.heldBy) && findIn(m_host.known().recordsOfPath(plugin.heldBy), holds);
-    });
+    return std::all_of(last->plugins.begin(), last->plugins.end(),
+                       [this](const RememberedPlugin &plugin) { return isHeld(plugin); });
 }
 
 void ScanPlan::leaveOutCopies()
@@ -238,7 +259,7 @@ void ScanPlan::askCopiesOfUnsettled()
     m_memory.forEach(m_host.format(), [&](const RememberedProbe &last) {
         const bool isUnsettled =
             std::any_of(last.plugins.begin(), last.plugins.end(), [this](const RememberedPlugin &plugin) {
-                return !plugin.heldBy.isEmpty() && !isKept(plugin.heldBy);
+                return !plugin.heldBy.isEmpty() && !isHeld(plugin);
             });
         if (isUnsettled)
             copies.append(last.path);

@@ -3,6 +3,8 @@
 #include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 
+#include <QHash>
+#include <QPair>
 #include <QSet>
 
 #include <map>
@@ -61,11 +63,13 @@ private:
     void decideModule(const QString &path);
     void sortMissing(const QSet<QString> &found);
     bool isGone(const QString &path);
-    void settleGone(const KnownFile &gone, const QStringList &modules);
-    ScanItem *bestUnknown(const KnownFile &gone);
+    void indexKept();
+    void settleAllGone(const QStringList &modules);
+    void settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes);
     void moveToCrashed(const KnownFile &gone, const QStringList &namesakes);
     void askAgain(const QStringList &paths);
     bool isKept(const QString &path) const;
+    bool isHeld(const RememberedPlugin &plugin) const;
     bool isUnchangedCopy(const ScanItem &item) const;
     void leaveOutCopies();
     void askCopiesOfUnsettled();
@@ -78,6 +82,8 @@ private:
     QStringList m_unread;
     std::map<QString, bool> m_isFolderThere; ///< and searched, with some content
     std::vector<const EffectRecord *> m_kept;
+    QSet<QString> m_keptPaths;                   ///< by `pathKey`
+    QSet<QPair<QString, QString>> m_keptPlugins; ///< path and identifier of those that work
     std::vector<EffectRecord> m_keptMoved;
     std::vector<ScanItem> m_items;
     std::vector<KnownFile> m_gone;
