@@ -1,4 +1,4 @@
-# fxprobe_screenless(TARGET): a program that is linked with a static toolkit brings the platform along that needs no screen.
+# fxprobe_screenless(TARGET): a program that is linked with a static Qt brings the platform along that needs no screen.
 function(fxprobe_screenless target)
     qt5_import_plugins(${target} INCLUDE Qt5::QOffscreenIntegrationPlugin)
 endfunction()

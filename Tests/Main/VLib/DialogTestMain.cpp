@@ -4,7 +4,7 @@
 
 #include <gtest/gtest.h>
 
-// The toolkit is not built for the sanitizers: the locks in its event queue go unseen, and the system's font
+// Qt is not built for the sanitizers: the locks in its event queue go unseen, and the system's font
 // library keeps what it read. Nothing of ours is covered by these.
 #if defined(__SANITIZE_THREAD__)
 extern "C" __attribute__((visibility("default"))) const char *__tsan_default_suppressions()
