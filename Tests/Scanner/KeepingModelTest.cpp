@@ -21,7 +21,8 @@ namespace {
 constexpr int kProducts = 6; ///< three bear each file name
 constexpr int kPerProduct = 4;
 constexpr int kSteps = 9;
-constexpr int kSeedsPerBlock = 100;
+constexpr int kSeedsInMemory = 100; ///< of each block
+constexpr int kSeedsOnDisk = 10;
 constexpr int kBlocks = 5; ///< of each format
 constexpr char kMemoryFolder[] = "/dev/shm";
 
@@ -622,12 +623,14 @@ class KeepingModel : public testing::TestWithParam<std::tuple<PluginFormat, int>
 
 TEST_P(KeepingModel, LosesNothingAndBlamesNobodyElse)
 {
-    if (QDir(kMemoryFolder).exists()) // thousands of scans, each of which has its catalogue synced to disk
+    const bool isInMemory = QDir(kMemoryFolder).exists();
+    if (isInMemory) // thousands of scans, each of which has its catalogue synced to disk
         qputenv("TMPDIR", kMemoryFolder);
+    const int seeds = isInMemory ? kSeedsInMemory : kSeedsOnDisk;
     const auto [format, block] = GetParam();
     const int one = qEnvironmentVariableIntValue("FXPROBE_SEED");
-    const int last = one ? one : (block + 1) * kSeedsPerBlock;
-    for (int seed = one ? one : block * kSeedsPerBlock + 1; seed <= last && !HasFailure(); ++seed) {
+    const int last = one ? one : (block + 1) * seeds;
+    for (int seed = one ? one : block * seeds + 1; seed <= last && !HasFailure(); ++seed) {
         const CapturedLog log;
         World world(format, static_cast<unsigned>(seed));
         world.play();

@@ -63,6 +63,8 @@ protected:
         for (const QString &step : GetParam().steps) {
             SCOPED_TRACE(step.toStdString());
             carryOut(step);
+            if (IsSkipped())
+                return;
         }
     }
 

@@ -10,8 +10,10 @@
 
 namespace {
 
+constexpr DWORD64 kRepairable = 8; // no address of anybody
 constexpr DWORD kMicrosoftCode = 0xE06D7363;
 bool g_wasUnwound = false;
+DWORD g_written = 0;
 void (*volatile g_inner)() = nullptr;
 
 } // namespace
@@ -21,9 +23,14 @@ extern "C" {
 /// Calls `g_inner` from a frame whose handler is foreignFrameHandler, as a plug-in's own frame would be.
 void callFromForeignFrame();
 
-/// Leaves everything to others; notes that its frame was unwound.
-[[gnu::used]] EXCEPTION_DISPOSITION foreignFrameHandler(EXCEPTION_RECORD *record, void *, CONTEXT *, void *)
+/// Lets writeToBeRepaired write elsewhere, leaves the rest to others; notes that its frame was unwound.
+[[gnu::used]] EXCEPTION_DISPOSITION foreignFrameHandler(EXCEPTION_RECORD *record, void *, CONTEXT *context,
+                                                        void *)
 {
+    if (record->ExceptionCode == EXCEPTION_ACCESS_VIOLATION && context->Rax == kRepairable) {
+        context->Rax = reinterpret_cast<DWORD64>(&g_written);
+        return ExceptionContinueExecution;
+    }
     g_wasUnwound |= (record->ExceptionFlags & EXCEPTION_UNWINDING) != 0;
     return ExceptionContinueSearch;
 }
@@ -102,6 +109,12 @@ void throwAsMicrosoft(const char *(*what)(const void *))
     RaiseException(kMicrosoftCode, EXCEPTION_NONCONTINUABLE, 4, parameters);
 }
 
+void writeToBeRepaired()
+{
+    DWORD64 address = kRepairable;
+    asm volatile("movl $1, (%%rax)" : "+a"(address) : : "memory");
+}
+
 } // namespace
 
 TEST(FaultGuardFrames, OfPluginsComeFirstAndAreUnwoundForExceptionsOnly)
@@ -112,6 +125,7 @@ TEST(FaultGuardFrames, OfPluginsComeFirstAndAreUnwoundForExceptionsOnly)
         const char *outcome;
         bool unwinds;
     } rows[] = {
+        {"violation that the plug-in repairs", writeToBeRepaired, "returned", false},
         {"violation that it leaves alone", writeNowhere, "SE Exception: Access Violation", false},
         {"exception of this compiler", [] { throw std::runtime_error("x"); }, "exception x", true},
         {"std::runtime_error of Microsoft's compiler", [] { throwAsMicrosoft(licenceText); },
