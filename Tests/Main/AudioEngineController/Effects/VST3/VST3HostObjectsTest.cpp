@@ -75,6 +75,7 @@ TEST(VST3HostContext, AnswersItsInterfacesInTheOrderOfItsTables)
     }
     EXPECT_EQ(context->queryInterface(FUnknown::iid, &found), kResultOk);
     EXPECT_EQ(found, context.get());
+    EXPECT_EQ(context->release(), 1u);
     EXPECT_EQ(context->queryInterface(IMessage::iid, &found), kNotImplemented);
     EXPECT_EQ(found, nullptr);
     EXPECT_EQ(context->queryInterface(nullptr, &found), kNotImplemented);

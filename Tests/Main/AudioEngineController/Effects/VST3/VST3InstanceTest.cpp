@@ -124,7 +124,8 @@ TEST_F(VST3InstanceTest, StateIsStoredAndLoaded)
     preset.identifier.replace('0', '1');
     EXPECT_FALSE(plugin.LoadPreset(preset)) << "of another";
     EXPECT_EQ(takeTrace(), QString()) << "the plug-in heard of none";
-    ASSERT_TRUE(plugin.openClass(add("state x\nanswer get-state false\nfault set-state throw-int\n", "Liar")));
+    ASSERT_TRUE(
+        plugin.openClass(add("state x\nanswer get-state false\nfault set-state throw-int\n", "Liar")));
     EXPECT_FALSE(plugin.StorePreset(preset));
     EXPECT_EQ(preset.data, stored) << "as it was";
     preset.identifier = plugin.identifier();
