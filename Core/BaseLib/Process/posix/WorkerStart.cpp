@@ -62,7 +62,7 @@ int startError(Descriptor failure)
 /// This process's variables, with the mark of a worker in place of the one that it has itself.
 std::vector<char *> environmentWith(QByteArray &mark)
 {
-    const auto nameSize = static_cast<std::size_t>(mark.indexOf('=') + 1);
+    const std::size_t nameSize = std::strcspn(mark.constData(), "=") + 1;
     std::vector<char *> environment{mark.data()};
     for (char **entry = environ; *entry; ++entry)
         if (std::strncmp(*entry, mark.constData(), nameSize) != 0)
