@@ -2,9 +2,11 @@
 #include "Tests/Support/VST2Fixture.h"
 #include "Tests/Support/VST3Fixture.h"
 
+#include <QDeadlineTimer>
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QThread>
 
 #include <gtest/gtest.h>
 
@@ -15,15 +17,25 @@ const char *const kVst2Modules[] = {FXPROBE_SCRIPTED_VST2, FXPROBE_MAIN_VST2, FX
                                     FXPROBE_NO_ENTRY_VST3};
 const char *const kVst3Modules[] = {FXPROBE_SCRIPTED_VST3, FXPROBE_PLAIN_VST3, FXPROBE_NO_ENTRY_VST3};
 
+constexpr int kPatience = 10000; ///< ms
+
+/// Whether a path is free. Windows keeps a module until the last process that loaded it has wholly ended.
+bool clear(const QString &path)
+{
+    const QDeadlineTimer patience(kPatience);
+    while (QFile::exists(path) && !QFile::remove(path) && !patience.hasExpired())
+        QThread::msleep(20);
+    return !QFile::exists(path);
+}
+
 /// Copies a module to a path, replacing what is there, so that a test can also update a plug-in. Its script
 /// goes beside it; a null script gives no script file.
 QString put(const QString &source, const QString &path, const QByteArray &script)
 {
     QFile scriptFile(path + ".script");
     QDir().mkpath(QFileInfo(path).path());
-    QFile::remove(path);
     scriptFile.remove();
-    EXPECT_TRUE(QFile::copy(source, path)) << qPrintable(source) << " to " << qPrintable(path);
+    EXPECT_TRUE(clear(path) && QFile::copy(source, path)) << qPrintable(source) << " to " << qPrintable(path);
     EXPECT_TRUE(script.isNull() ||
                 (scriptFile.open(QIODevice::WriteOnly) && scriptFile.write(script) == script.size()))
         << qPrintable(scriptFile.errorString());
