@@ -13,7 +13,8 @@ void readAndWrite(const MarkerFormat &format, const QByteArray &input)
     require(!read.enabled && (format.hasSubId || read.subId == 0), "a marker names what is not enabled");
     if (anyHolds({read.path, read.fileTime, read.name}, "\r\n"))
         return; // markers are read by their lines where their texts make them no XML
-    const CrashMarker marker(format, ".", read, read.name);
+    const QString shown = read.name.isNull() ? "" : read.name; // a null one would be made from the path
+    const CrashMarker marker(format, ".", read, shown);
     const EffectRecord again = readMarkerFile(format, marker.path());
     require(again.path == read.path && again.fileTime == read.fileTime && again.name == read.name &&
                 again.subId == read.subId,
