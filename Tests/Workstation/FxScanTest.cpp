@@ -50,7 +50,8 @@ protected:
         const ScannerOutcome outcome = run(QStringList({"--format", "json", m_folder.plugins()}) + options);
         const QJsonDocument document = QJsonDocument::fromJson(outcome.standardOutput);
         EXPECT_TRUE(document.isObject() && outcome.exitCode == exitCode)
-            << outcome.exitCode << outcome.standardOutput.constData() << outcome.standardError.constData();
+            << outcome.exitCode << '\n'
+            << outcome.standardError.constData() << outcome.standardOutput.constData();
         return document.object();
     }
     /// Name to state of everything listed.
