@@ -1,15 +1,22 @@
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/ProcessSetup.h"
+#include "Scanner/ProbeWorker.h"
 #include "Scanner/ScannerEntry.h"
 
 #include <QApplication>
+
+#include <cstring>
 
 int main(int argc, char **argv)
 {
     prepareProcess();
     configureLogFromEnvironment();
     int exitCode = 0;
-    {
+    if (argc > 1 && std::strcmp(argv[1], kProbeWorkerArgument) == 0) {
+        QCoreApplication application(argc, argv);
+        settleLocale();
+        exitCode = runProbeWorker();
+    } else {
         // Sizes are those of an ordinary display; also 150% must give neither 100% nor 200%.
         QApplication::setAttribute(Qt::AA_EnableHighDpiScaling);
         QApplication::setHighDpiScaleFactorRoundingPolicy(Qt::HighDpiScaleFactorRoundingPolicy::PassThrough);

@@ -91,8 +91,16 @@ const std::vector<OptionRow> &optionTable()
         {"in-process", "", &ScanOptions::inProcess,
          "Load the plug-ins into this process. One that crashes takes it along.",
          "Its marker stays for the next scan. A plug-in that hangs is not ended."},
+        {"jobs", "number", NumberTarget{&ScanOptions::jobs, 0, 64, "plug-ins at once"},
+         "Probe this many plug-ins at once, each in a process of its own; 0 (the default): as many as suit "
+         "the "
+         "machine."},
         {"list", "", &ScanOptions::listOnly, "Print the catalogue as it is, without a scan.",
          "Nothing is changed."},
+        {"memory-limit", "MiB", NumberTarget{&ScanOptions::memoryLimit, 0, 1 << 20, "MiB"},
+         "Give up on a plug-in that takes more memory than this; 0 (the default): half of the machine's, "
+         "divided "
+         "by the number of jobs."},
         {"quiet", "", &ScanOptions::quiet, "Show no progress."},
         {"retry", "name", &ScanOptions::retry,
          "Probe a plug-in again that is disabled or does not work; its name, its file's name or its path. "
@@ -115,6 +123,8 @@ const std::vector<OptionConflict> &optionConflicts()
         {"list", "retry", "--list makes no scan"},
         {"list", "retry-failed", "--list makes no scan"},
         {"list", "in-process", "--list makes no scan"},
+        {"in-process", "jobs", "--in-process probes one plug-in after the other"},
+        {"in-process", "memory-limit", "--in-process cannot end a plug-in that takes too much"},
         {"in-process", "timeout", "--in-process cannot end a plug-in that hangs"},
         {"in-process", "show-window", "--in-process has no window"},
     };

@@ -30,8 +30,8 @@ void ScanAccount::takeLine(const ReportLine &line)
     m_busy = line.event == Event::Busy;
     switch (line.event) {
     case Event::Start:
-        m_done += static_cast<int>(
-            std::count_if(m_open.begin(), m_open.end(), [](const PluginKey &key) { return key.subId == 0; }));
+        m_done += static_cast<int>(std::count_if(m_open.begin(), m_open.end(),
+                                                 [](const Open &open) { return open.key.subId == 0; }));
         m_open.clear();
         m_planned = m_done; // what is left of the plan is planned anew
         break;
@@ -53,12 +53,13 @@ void ScanAccount::takeLine(const ReportLine &line)
                        .arg(line.path, line.reason));
         break;
     case Event::Stage:
-        if (!m_open.empty())
-            m_probes[m_open.back()].isLoaded = true;
+        if (const PluginKey *key = innermost(line.worker))
+            m_probes[*key].isLoaded = true;
         break;
     case Event::Busy:
     case Event::Finished:
     case Event::Ended:
+    case Event::WorkerEnd:
     case Event::Unknown:
         break;
     }
@@ -72,7 +73,7 @@ void ScanAccount::addProblem(const QString &problem)
 
 void ScanAccount::begin(const ReportLine &line)
 {
-    m_open.push_back(keyOf(line));
+    m_open.push_back({line.worker, keyOf(line)});
     m_begun.push_back(keyOf(line));
     ProbeAccount account;
     account.subName = line.subName;
@@ -87,8 +88,11 @@ void ScanAccount::end(const ReportLine &line)
     account.reason = line.reason;
     account.records = line.records;
     account.milliseconds = line.milliseconds;
-    const auto open = std::find(m_open.begin(), m_open.end(), keyOf(line));
-    m_open.erase(open, m_open.end());
+    // With a shell go its sub-plug-ins, also one that ended the worker.
+    const auto isOver = [&](const Open &open) {
+        return open.worker == line.worker && (line.subId == 0 || open.key == keyOf(line));
+    };
+    m_open.erase(std::remove_if(m_open.begin(), m_open.end(), isOver), m_open.end());
     if (line.subId == 0)
         ++m_done;
 }
@@ -101,6 +105,13 @@ void ScanAccount::scannerEnded(const ScannerRunEnd &end)
         account.reason = culprit.reason;
         account.records = 0;
     }
+}
+
+const PluginKey *ScanAccount::innermost(int worker) const
+{
+    const auto found = std::find_if(m_open.rbegin(), m_open.rend(),
+                                    [worker](const Open &open) { return open.worker == worker; });
+    return found == m_open.rend() ? nullptr : &found->key;
 }
 
 std::vector<PluginKey> ScanAccount::takeBegun()

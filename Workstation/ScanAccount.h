@@ -46,8 +46,8 @@ public:
     /// Takes in how a scanner ended: what it was busy with is to blame. The next one may be at work already.
     void scannerEnded(const ScannerRunEnd &end);
 
-    /// The innermost probe under way; null when there is none.
-    const PluginKey *current() const { return m_open.empty() ? nullptr : &m_open.back(); }
+    /// The probe under way for the longest, or what of it is asked now; null when there is none.
+    const PluginKey *current() const { return m_open.empty() ? nullptr : innermost(m_open.front().worker); }
     /// The probes that began since the last call, in order.
     std::vector<PluginKey> takeBegun();
     /// Files dealt with, and files planned, of all formats planned so far.
@@ -72,9 +72,15 @@ private:
     void begin(const ReportLine &line);
     void end(const ReportLine &line);
     void addProblem(const QString &problem);
+    const PluginKey *innermost(int worker) const;
 
     ReportReader m_report;
-    std::vector<PluginKey> m_open;
+    /// A probe under way.
+    struct Open {
+        int worker;
+        PluginKey key;
+    };
+    std::vector<Open> m_open; ///< the oldest first
     std::vector<PluginKey> m_begun;
     std::map<PluginKey, ProbeAccount> m_probes;
     QStringList m_problems;

@@ -20,6 +20,8 @@ struct ScanOptions {
     OutputFormat format = OutputFormat::Table;
     QStringList retry;        ///< names or paths of plug-ins that get another chance
     bool retryFailed = false; ///< all of them
+    int jobs = 0;             ///< plug-ins probed at once; 0: as many as suit the machine
+    int memoryLimit = 0;      ///< MiB that a plug-in may take; 0: a share of the machine's
     int timeout = 60;         ///< seconds that one plug-in may take; 0: for ever
     bool listOnly = false;
     bool inProcess = false;

@@ -35,6 +35,8 @@ ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const
 {
     TerminationSignal::install();
     registry.setProbeLimit(options.timeout);
+    registry.setScanJobs(options.jobs);
+    registry.setMemoryLimit(options.memoryLimit);
 }
 
 bool ScanSession::run()

@@ -39,6 +39,8 @@ public:
 
     /// The end of the names of the system's libraries, with its dot.
     static QString fileEnding();
+    /// Whether a library is mapped into this process that lies at the path, or in the bundle there.
+    static bool isMapped(const QString &path);
     /// Whether a file exists at the path.
     static bool exists(const QString &path);
 

@@ -50,6 +50,8 @@ public:
     void end(int worker);
     /// The last lines that a worker printed that has ended.
     QString output(int worker) const;
+    /// Whether processes run that a worker started.
+    bool hasChildren(int worker) const;
     /// Resident memory of a worker in bytes; 0 when the system does not tell.
     qint64 residentMemory(int worker) const;
 

@@ -2,10 +2,12 @@
 
 #include "Core/BaseLib/Files/FileFinder.h"
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/ProcessSetup.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/Host/AudioUnitHost.h"
 #include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Host/ProbePool.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
@@ -17,6 +19,7 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QThread>
 
 namespace {
 
@@ -44,6 +47,33 @@ std::unique_ptr<AudioPluginHost> makeHost(PluginFormat format)
 }
 
 IQuillonInterface *application() { return ApplicationContext::instance().quillonInterface; }
+
+/// Plug-ins mostly wait: twice the cores get through most of them soonest.
+int scanJobs(int wanted)
+{
+    constexpr int kMost = 8;
+    const int ofMachine = std::min(kMost, 2 * std::max(1, QThread::idealThreadCount()));
+    return wanted == 0 ? ofMachine : std::max(wanted, 0);
+}
+
+int memoryLimit(int wanted, int jobs)
+{
+    constexpr qint64 kLeast = 1024; // MiB
+    const qint64 share = machineMemory() / (1 << 20) / 2 / std::max(jobs, 1);
+    return wanted > 0 ? wanted : static_cast<int>(std::max(kLeast, share));
+}
+
+/// The workers that whoever started this process asked for; null when nobody did.
+std::shared_ptr<ProbePool> poolOfEnvironment()
+{
+    const int jobs = qEnvironmentVariableIntValue("FXPROBE_JOBS");
+    if (jobs <= 0 || !application() || !application()->isScanner())
+        return nullptr;
+    return std::make_shared<ProbePool>(
+        ProbePool::Settings{QCoreApplication::applicationFilePath(), jobs,
+                            std::chrono::seconds(qEnvironmentVariableIntValue("FXPROBE_PROBE_LIMIT")),
+                            qint64(qEnvironmentVariableIntValue("FXPROBE_MEMORY_LIMIT")) << 20});
+}
 
 bool isSameOrInside(const QString &folder, const QString &outer)
 {
@@ -193,14 +223,17 @@ bool PluginHost::scanHosts(bool scan)
         if (info.isScanned())
             endings.append(info.moduleEnding);
     const auto finder = std::make_shared<FileFinder>(endings);
+    const std::shared_ptr<ProbePool> pool = scan ? poolOfEnvironment() : nullptr;
     forEachHost([&](AudioPluginHost &host) {
         if (scan && m_launcher.isCancelled()) { // what the host knows stays in its catalogue
             ProbeReport::instance().cancelled();
             return;
         }
         host.setFileFinder(finder);
+        host.setProbePool(pool);
         written |= host.Scan(scan, true);
         host.setFileFinder(nullptr);
+        host.setProbePool(nullptr);
     });
     if (scan)
         forEachHost([](AudioPluginHost &host) { host.scansEnded(); });
@@ -232,8 +265,9 @@ void PluginHost::launch()
 {
     const TAutoLockCS lock(&m_ks);
     try {
+        const int jobs = scanJobs(m_scanJobs);
         m_launcher.run({m_scannerPath, effectsFolder() + QLatin1String(kScanListFile), effectsFolder(),
-                        m_probeLimit, [this] { WriteScanList(); }});
+                        m_probeLimit, [this] { WriteScanList(); }, jobs, memoryLimit(m_memoryLimit, jobs)});
         if (!m_launcher.isCancelled())
             reloadChanged();
     } catch (const std::exception &error) {

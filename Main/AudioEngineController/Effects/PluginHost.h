@@ -54,6 +54,13 @@ public:
     /// Seconds after which a scanner that is busy with one plug-in is ended, so that the next run records
     /// that plug-in as disabled; 0, the default: never. Set while no launcher runs.
     void setProbeLimit(int seconds) { m_probeLimit = seconds; }
+    /// How many plug-ins a scanner that is launched probes at once, each in a process of its own: 0, the
+    /// default, has the machine decide; negative: one after the other in the scanner's own process. Set while
+    /// no launcher runs.
+    void setScanJobs(int jobs) { m_scanJobs = jobs; }
+    /// MiB of resident memory that a plug-in's process may hold; 0, the default: half of the machine's memory
+    /// divided by the number of jobs, at least 1 GiB. Set while no launcher runs.
+    void setMemoryLimit(int mebibytes) { m_memoryLimit = mebibytes; }
     void setAudioSettings(int sampleRate, int blockSize) override;
     void setIntParameter(IntParameter parameter, int value) override;
 
@@ -106,6 +113,8 @@ private:
     int m_sampleRate = kDefaultSampleRate;
     int m_blockSize = kDefaultBlockSize;
     int m_probeLimit = 0; ///< seconds
+    int m_scanJobs = 0;
+    int m_memoryLimit = 0; ///< MiB
     ScannerLauncher m_launcher;
     std::atomic<bool> m_launching{false};
     std::thread m_launcherThread; ///< joined before the next launch, and at the end

@@ -1,10 +1,12 @@
 #include "Core/BaseLib/Binary/PluginLibrary.h"
 
 #include "Core/BaseLib/Binary/posix/ImportSearch.h"
+#include "Core/BaseLib/Files/NativeFile.h"
 
 #include <QFile>
 
 #include <dlfcn.h>
+#include <link.h>
 
 void *PluginLibrary::loadUncached(const QString &path) noexcept
 {
@@ -30,6 +32,17 @@ void PluginLibrary::free()
         return;
     dlclose(m_handle);
     m_handle = nullptr;
+}
+
+bool PluginLibrary::isMapped(const QString &path)
+{
+    QString wanted = path;
+    const auto isWanted = [](dl_phdr_info *library, std::size_t, void *data) {
+        const QString name = QFile::decodeName(library->dlpi_name);
+        const QString &of = *static_cast<const QString *>(data);
+        return !name.isEmpty() && (name == of || isBelow(name, of)) ? 1 : 0;
+    };
+    return dl_iterate_phdr(isWanted, &wanted) != 0;
 }
 
 QString PluginLibrary::fileEnding() { return QStringLiteral(".so"); }

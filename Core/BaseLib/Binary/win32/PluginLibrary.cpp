@@ -1,10 +1,15 @@
 #include "Core/BaseLib/Binary/PluginLibrary.h"
 
 #include "Core/BaseLib/Binary/win32/ImportSearch.h"
+#include "Core/BaseLib/Files/NativeFile.h"
 #include "Core/BaseLib/Files/win32/WindowsText.h"
 
+#include <QDir>
 #include <QFileInfo>
 #include <QScopeGuard>
+
+#include <algorithm>
+#include <iterator>
 
 void *PluginLibrary::loadUncached(const QString &path) noexcept
 {
@@ -43,6 +48,22 @@ void PluginLibrary::free()
         return;
     FreeLibrary(static_cast<HMODULE>(m_handle));
     m_handle = nullptr;
+}
+
+bool PluginLibrary::isMapped(const QString &path)
+{
+    HMODULE modules[1024]; // more than any process of ours has
+    DWORD size = 0;
+    if (!K32EnumProcessModules(GetCurrentProcess(), modules, sizeof modules, &size))
+        return false;
+    const DWORD count = std::min<DWORD>(size, sizeof modules) / sizeof(HMODULE);
+    return std::any_of(modules, modules + count, [&](HMODULE module) {
+        wchar_t name[32768]; // longest path (NTFS)
+        const DWORD length = GetModuleFileNameW(module, name, DWORD(std::size(name)));
+        const QString file =
+            QDir::fromNativeSeparators(QString::fromWCharArray(name, static_cast<int>(length)));
+        return isSamePath(file, path) || isBelow(file, path);
+    });
 }
 
 QString PluginLibrary::fileEnding() { return QStringLiteral(".dll"); }

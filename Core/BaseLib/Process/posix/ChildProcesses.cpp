@@ -7,17 +7,17 @@
 
 #include <csignal>
 
-std::set<pid_t> childrenOfThisProcess()
+std::set<pid_t> childrenOf(pid_t process)
 {
     std::set<pid_t> children;
-    for (const QString &task :
-         QDir(QStringLiteral("/proc/self/task")).entryList(QDir::Dirs | QDir::NoDotAndDotDot)) {
-        QFile file(QStringLiteral("/proc/self/task/%1/children").arg(task));
+    const QDir tasks(QStringLiteral("/proc/%1/task").arg(process));
+    for (const QString &task : tasks.entryList(QDir::Dirs | QDir::NoDotAndDotDot)) {
+        QFile file(tasks.filePath(task + QLatin1String("/children")));
         if (!file.open(QIODevice::ReadOnly))
             continue;
         for (const QByteArray &child : file.readAll().split(' '))
-            if (const int process = child.trimmed().toInt(); process > 0)
-                children.insert(process);
+            if (const int number = child.trimmed().toInt(); number > 0)
+                children.insert(number);
     }
     return children;
 }

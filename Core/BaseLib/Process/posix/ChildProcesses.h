@@ -4,8 +4,8 @@
 
 #include <sys/types.h>
 
-/// The processes whose parent this process is.
-std::set<pid_t> childrenOfThisProcess();
+/// The processes whose parent a process is, which is of this user.
+std::set<pid_t> childrenOf(pid_t process);
 
 /// Where SIGCHLD is ignored, which a program inherits from whoever started it, children vanish and take their
 /// exit status along. This changes that.

@@ -56,6 +56,8 @@ void prepareProcess()
 
 void settleLocale() { std::setlocale(LC_NUMERIC, "C"); }
 
+qint64 machineMemory() { return static_cast<qint64>(sysconf(_SC_PHYS_PAGES)) * sysconf(_SC_PAGESIZE); }
+
 void leaveProcess(int exitCode)
 {
     // Nothing to flush: what we write is flushed at once, and a plug-in that hangs inside a print call holds

@@ -122,7 +122,7 @@ WorkerGroup::WorkerGroup(const QString &program, const QStringList &arguments)
     m_private->program = QFile::encodeName(program);
     for (const QString &argument : arguments)
         m_private->arguments.append(QFile::encodeName(argument));
-    m_private->before = childrenOfThisProcess();
+    m_private->before = childrenOf(getpid());
     prctl(PR_SET_CHILD_SUBREAPER, 1); // what a worker leaves behind comes to us
     openStandardDescriptors();
     keepEndedChildren();
@@ -250,7 +250,7 @@ void WorkerGroup::Private::endOrphans()
     if (!mayHaveOrphans)
         return;
     mayHaveOrphans = false;
-    for (const pid_t child : childrenOfThisProcess()) {
+    for (const pid_t child : childrenOf(getpid())) {
         if (!isOrphan(child))
             continue;
         ::kill(child, SIGKILL);
@@ -287,6 +287,19 @@ QString WorkerGroup::output(int worker) const
 {
     const auto ended = m_private->outputs.find(worker);
     return ended == m_private->outputs.end() ? QString() : ended->second;
+}
+
+bool WorkerGroup::hasChildren(int worker) const
+{
+    const auto found = m_private->workers.find(worker);
+    if (found == m_private->workers.end())
+        return false;
+    const auto isOrphan = [&](pid_t child) { // which have come to this process
+        return m_private->before.count(child) == 0 && child != found->second.process &&
+               getsid(child) != getsid(0) && workerOf(child) == worker;
+    };
+    const std::set<pid_t> ours = childrenOf(getpid());
+    return !childrenOf(found->second.process).empty() || std::any_of(ours.begin(), ours.end(), isOrphan);
 }
 
 qint64 WorkerGroup::residentMemory(int worker) const

@@ -41,6 +41,8 @@ struct Start {
         sigset_t none;
         sigemptyset(&none);
         pthread_sigmask(SIG_SETMASK, &none, nullptr);
+        for (const int asking : {SIGTERM, SIGINT, SIGHUP}) // the one who started us is asked as well
+            std::signal(asking, SIG_IGN);
         execve(start.arguments[0], start.arguments, start.environment);
     }
     const int error = errno;

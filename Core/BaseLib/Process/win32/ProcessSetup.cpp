@@ -57,6 +57,13 @@ void prepareProcess()
 
 void settleLocale() { std::setlocale(LC_NUMERIC, "C"); }
 
+qint64 machineMemory()
+{
+    MEMORYSTATUSEX memory = {};
+    memory.dwLength = sizeof memory;
+    return GlobalMemoryStatusEx(&memory) ? static_cast<qint64>(memory.ullTotalPhys) : 0;
+}
+
 void leaveProcess(int exitCode)
 {
     if (consoleCodePage != 0)

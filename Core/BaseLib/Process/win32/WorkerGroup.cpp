@@ -326,6 +326,16 @@ QString WorkerGroup::output(int worker) const
     return ended == m_private->outputs.end() ? QString() : ended->second;
 }
 
+bool WorkerGroup::hasChildren(int worker) const
+{
+    const auto found = m_private->workers.find(worker);
+    JOBOBJECT_BASIC_ACCOUNTING_INFORMATION job = {};
+    return found != m_private->workers.end() &&
+           QueryInformationJobObject(found->second.job.get(), JobObjectBasicAccountingInformation, &job,
+                                     sizeof job, nullptr) &&
+           job.ActiveProcesses > 1;
+}
+
 qint64 WorkerGroup::residentMemory(int worker) const
 {
     const auto found = m_private->workers.find(worker);

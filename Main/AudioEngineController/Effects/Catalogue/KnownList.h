@@ -23,6 +23,7 @@ public:
         : m_identity(identity)
     {}
 
+    Identity identity() const { return m_identity; }
     void clear();
     std::size_t size() const { return m_records.size(); }
     bool isEmpty() const { return m_records.empty(); }

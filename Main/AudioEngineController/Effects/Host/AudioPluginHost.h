@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Files/FileFinder.h"
 #include "Core/BaseLib/Process/KriticalSection.h"
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
 
 #include <QStringList>
 
@@ -12,6 +13,7 @@
 #include <vector>
 
 struct LoadedPlugin;
+class ProbePool;
 
 /// Base of the per-format hosts and of their registry. By itself it has no catalogue: it reads, lists and
 /// writes nothing. `CatalogueHost` is the base of those that have one.
@@ -57,9 +59,15 @@ public:
     /// A copy of the effect list's records, in the order of their identifiers.
     virtual std::vector<EffectRecord> effects() const { return {}; }
 
+    /// What asks the format's modules; null for a format without any.
+    virtual std::unique_ptr<IPluginProbe> makeProbe() const { return nullptr; }
+
     /// Has scans of several formats walk through the folders once; null, as at first: each walks for itself.
     void setFileFinder(std::shared_ptr<FileFinder> finder) { m_fileFinder = std::move(finder); }
     const std::shared_ptr<FileFinder> &fileFinder() const { return m_fileFinder; }
+    /// Has scans ask plug-ins in worker processes; null, as at first: in this process.
+    void setProbePool(std::shared_ptr<ProbePool> pool) { m_probePool = std::move(pool); }
+    const std::shared_ptr<ProbePool> &probePool() const { return m_probePool; }
 
     /// Asks a running scan to stop after the current file; any thread. The request stands until it is
     /// cleared.
@@ -75,5 +83,6 @@ protected:
 private:
     QString m_catalogueFolder;
     std::shared_ptr<FileFinder> m_fileFinder;
+    std::shared_ptr<ProbePool> m_probePool;
     std::atomic<bool> m_cancelled{false};
 };

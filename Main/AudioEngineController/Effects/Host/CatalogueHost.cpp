@@ -112,6 +112,7 @@ void CatalogueHost::ReadCatalogue()
     m_known.clear();
     m_leftAlone.clear();
     m_absorbed.clear();
+    m_suspects.clear();
     m_heldMarkers.clear();
     m_unwrittenMarkers.clear();
     m_written.clear();
@@ -160,6 +161,10 @@ void CatalogueHost::absorbMarkers()
     QStringList absorbed;
     const std::vector<FoundMarker> markers = readMarkers(files);
     for (const FoundMarker &marker : markers) {
+        if (marker.isSuspect) { // stays until the plug-in was asked alone
+            m_suspects[marker.plugin.path] = marker.file;
+            continue;
+        }
         (isMarkerWithoutRecord(marker.plugin) ? m_heldMarkers : absorbed).append(marker.file);
         if (!isExcused(marker, markers))
             absorbMarker(marker.plugin);
@@ -195,9 +200,36 @@ EffectRecord CatalogueHost::ReadCrashMarker(const QString &marker) const
 
 CrashMarker CatalogueHost::WriteCrashMarker(const EffectRecord &plugin, const QString &name) const
 {
-    // The markers that are there must stay as they are: they still have something to tell.
-    return CrashMarker(m_info.catalogue->marker, catalogueFolder(), plugin, name,
-                       m_heldMarkers + m_unwrittenMarkers);
+    return CrashMarker(m_info.catalogue->marker, catalogueFolder(), plugin, name, takenMarkers());
+}
+
+/// The markers that are there must stay as they are: they still have something to tell.
+QStringList CatalogueHost::takenMarkers() const
+{
+    QStringList taken = m_heldMarkers + m_unwrittenMarkers;
+    for (const auto &suspect : m_suspects)
+        taken.append(suspect.second);
+    return taken;
+}
+
+CrashMarker CatalogueHost::writeSuspectMarker(const EffectRecord &plugin) const
+{
+    return CrashMarker(m_info.catalogue->marker, catalogueFolder(), plugin, QString(), takenMarkers(), true);
+}
+
+void CatalogueHost::clearSuspect(const QString &path)
+{
+    const auto suspect = m_suspects.find(path);
+    if (suspect == m_suspects.end())
+        return;
+    removeMarkerFile(suspect->second);
+    m_suspects.erase(suspect);
+}
+
+void CatalogueHost::clearSuspects()
+{
+    while (!m_suspects.empty())
+        clearSuspect(m_suspects.begin()->first);
 }
 
 void CatalogueHost::scansEnded()

@@ -8,8 +8,8 @@
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
-#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
 
+#include <map>
 #include <memory>
 #include <set>
 
@@ -45,6 +45,15 @@ public:
     /// Writes the crash marker for a plug-in that is about to be touched. A null name is made from the
     /// record's path.
     CrashMarker WriteCrashMarker(const EffectRecord &plugin, const QString &name = QString()) const;
+    /// The same for one of several plug-ins that are probed at once.
+    CrashMarker writeSuspectMarker(const EffectRecord &plugin) const;
+    /// True for a file that was being probed, with others, when a scanner ended: it is asked first, and
+    /// alone.
+    bool isSuspect(const QString &path) const { return m_suspects.count(path) != 0; }
+    /// Deletes the marker of a suspect that was asked.
+    void clearSuspect(const QString &path);
+    /// Deletes the markers of all suspects: none of them is there to be asked any more.
+    void clearSuspects();
     /// Reads a crash marker into a fresh record that is not enabled. The file stays: it is deleted once the
     /// catalogue holds what it said.
     EffectRecord ReadCrashMarker(const QString &marker) const;
@@ -53,6 +62,10 @@ public:
     /// the file (a sub-plug-in keeps its name), enabled, not working, so that it is shown and not probed
     /// again until it changes.
     void completeFailedRecord(EffectRecord &record) const;
+
+    /// An identifier for the record of a plug-in that crashed or failed: the name, or its path where another
+    /// plug-in holds that.
+    QString freeIdentifier(const EffectRecord &plugin, const QString &name) const;
 
     PluginFormat format() const { return m_info.format; }
     const PluginFormatInfo &info() const { return m_info; }
@@ -93,8 +106,8 @@ public:
     virtual bool probesInPathOrder() const { return true; }
     /// Whether the user interface hears of each record that is added, or once of each file.
     virtual bool announcesEachRecord() const { return true; }
-    /// What asks the modules; null for a format without any.
-    virtual std::unique_ptr<IPluginProbe> makeProbe() const { return nullptr; }
+    /// Whether a crash marker only keeps its file from being touched in this run, without a record.
+    virtual bool isMarkerWithoutRecord(const EffectRecord & /*marker*/) const { return false; }
 
 protected:
     explicit CatalogueHost(PluginFormat format);
@@ -104,18 +117,15 @@ protected:
     QString cataloguePath() const;
     EffectList &effectList() { return m_effects; }
 
-    /// Whether a crash marker only keeps its file from being touched in this run, without a record.
-    virtual bool isMarkerWithoutRecord(const EffectRecord & /*marker*/) const { return false; }
-
 private:
     void readKnownRecords();
+    QStringList takenMarkers() const;
     void absorbMarkers();
     void absorbMarker(const EffectRecord &marker);
     bool writeKnownRecords();
     QByteArray render(WaitingRecords &waiting);
     bool writeText(const QByteArray &text, Durability durability);
     bool matchesFile() const;
-    QString freeIdentifier(const EffectRecord &plugin, const QString &name) const;
 
     const PluginFormatInfo &m_info;
     FileStamp m_lastSeen;
@@ -123,7 +133,8 @@ private:
     EffectList m_effects;
     std::set<QString, PathLess> m_leftAlone;
     std::vector<EffectRecord> m_absorbed;
-    QStringList m_heldMarkers;      ///< of files left alone
+    std::map<QString, QString, PathLess> m_suspects; ///< path to marker
+    QStringList m_heldMarkers;                       ///< of files left alone
     QStringList m_unwrittenMarkers; ///< absorbed, but what they say could not be written down
     QByteArray m_written; ///< what this process wrote to the file last; null: nothing since it was read
     bool m_isKnownAsRead = false; ///< the file holds exactly the known list, in our layout

@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/Host/FolderScan.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/Host/OutcomeRecords.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
@@ -15,38 +16,6 @@ namespace {
 
 /// From this many records of a file, or files of a scan, on the user interface hears of them once in advance.
 constexpr std::size_t kMany = 3;
-
-/// What a file that fails keeps of a record: the marks. It is not working, and asked again when the file
-/// changes, also where it crashed elsewhere; what the user switched off stays as it is.
-EffectRecord keptBesideFailure(const EffectRecord &old, const EffectRecord &file)
-{
-    EffectRecord kept = old;
-    kept.path = file.path;
-    if (!old.isSwitchedOff()) {
-        if (!file.fileTime.isEmpty()) { // else the file comes back as it was, with what crashed in it
-            kept.fileTime = file.fileTime;
-            kept.enabled = true;
-        }
-        kept.working = false;
-    }
-    return kept;
-}
-
-/// True for a sub-plug-in that killed the scanner, in the version of the file that is there.
-bool isDeadly(const EffectRecord &old, const QString &fileTime)
-{
-    return old.subId != 0 && !old.enabled && !old.working && old.fileTime == fileTime;
-}
-
-/// What is known of a sub-plug-in that must not be loaded; null when it may be.
-const EffectRecord *deadlyRecord(const ScanItem &item, const EffectRecord &child)
-{
-    for (const KnownList::Records *records : {&item.known, &item.moved})
-        for (const EffectRecord *old : *records)
-            if (old->subId == child.subId && isDeadly(*old, item.fileTime))
-                return old;
-    return nullptr;
-}
 
 /// A plug-in's texts as a catalogue takes them, whose lines they must not break.
 void replaceControls(EffectRecord &record)
@@ -158,6 +127,8 @@ void FolderScan::showItemProgress()
 bool FolderScan::probeItems()
 {
     showItemProgress();
+    if (!m_plan->items().empty() && m_host.probePool())
+        return probeInPool();
     for (const ScanItem &item : m_plan->items()) {
         if (isCancelled())
             return false;
@@ -167,6 +138,13 @@ bool FolderScan::probeItems()
             m_progress->setValue(static_cast<int>(m_done));
     }
     return !isCancelled();
+}
+
+ProbeOutcome FolderScan::readable(const ScanItem &item, ProbeOutcome outcome)
+{
+    outcome.reason.remove(item.path + QLatin1String(": ")); // the path stands beside it
+    std::for_each(outcome.records.begin(), outcome.records.end(), replaceControls);
+    return outcome;
 }
 
 ProbeJob FolderScan::jobOf(const ScanItem &item) const
@@ -183,28 +161,34 @@ ProbeJob FolderScan::jobOf(const ScanItem &item) const
     return job;
 }
 
-void FolderScan::probe(const ScanItem &item)
+void FolderScan::beginItem(const ScanItem &item)
 {
-    if (!m_runner)
-        m_runner = std::make_unique<ProbeRunner>(m_host);
     m_file = EffectRecord();
     m_file.path = item.path;
     m_file.fileTime = item.fileTime;
     m_remembered = RememberedProbe();
     m_isTouched = false;
     m_childrenDone = 0;
-    ProbeOutcome outcome = m_runner->run(jobOf(item), *this);
-    outcome.reason.remove(item.path + QLatin1String(": ")); // the path stands beside it
-    std::for_each(outcome.records.begin(), outcome.records.end(), replaceControls);
+}
+
+void FolderScan::probe(const ScanItem &item)
+{
+    if (!m_runner)
+        m_runner = std::make_unique<ProbeRunner>(m_host);
+    beginItem(item);
+    const ProbeOutcome outcome = readable(item, m_runner->run(jobOf(item), *this));
     remember(outcome);
-    keepOutcome(item, outcome);
-    m_memory.set(m_remembered);
+    const bool added = keepOutcome(item, outcome);
+    log(item, outcome, 0);
+    if (added)
+        writeInterim(m_waiting);
     writeMemory(false);
+    m_host.clearSuspect(item.path);
     if (m_childrenDone != 0)
         showItemProgress();
 }
 
-void FolderScan::log(const ScanItem &item, const ProbeOutcome &outcome) const
+void FolderScan::log(const ScanItem &item, const ProbeOutcome &outcome, int worker) const
 {
     if (!outcome.reason.isEmpty())
         DebugLog(L"%ls: %ls", item.path, outcome.reason);
@@ -214,45 +198,54 @@ void FolderScan::log(const ScanItem &item, const ProbeOutcome &outcome) const
         return;
     }
     if (!m_isTouched)
-        report.begin(m_host.format(), m_file);
-    report.end(m_host.format(), m_file, outcome);
+        report.begin(m_host.format(), m_file, worker);
+    report.end(m_host.format(), m_file, outcome, worker);
 }
 
-void FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
+/// True when there is something to be written before the end.
+bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
 {
-    for (const EffectRecord *record : item.known) {
-        const auto [first, last] = m_waiting.equal_range(record->id);
-        const auto entry = std::find_if(
-            first, last, [&](const auto &waiting) { return waiting.second.record.isSamePlugin(*record); });
-        if (entry != last)
-            m_waiting.erase(entry);
-    }
-    bool added = false;
-    if (outcome.ifFailed == ProbeOutcome::IfFailed::LookAgain)
-        m_file.fileTime.clear();
-    if (outcome.status == ProbeStatus::Listed)
-        added = addListed(item, outcome);
-    else if (outcome.status == ProbeStatus::Failed && outcome.ifFailed == ProbeOutcome::IfFailed::KeepKnown)
-        keepUnchanged(item);
-    else if (outcome.status == ProbeStatus::Failed) // what was only looked at can wait for the last write
-        added = addFailed(item) && m_isTouched;
-    log(item, outcome);
+    removeWaiting(item, m_waiting);
+    OutcomeRecords records = recordsOfOutcome(m_host, *m_plan, item, outcome);
+    bool added = outcome.status == ProbeStatus::Listed ? addListed(records.listed) : false;
+    if (outcome.status != ProbeStatus::Listed) // what was only looked at can wait for the last write
+        for (const EffectRecord &record : records.listed)
+            added |= add(record) && m_isTouched;
+    for (EffectRecord &record : records.kept)
+        addLater(std::move(record));
+    m_likelyMarks.insert(m_likelyMarks.end(), records.likelyMarks.begin(), records.likelyMarks.end());
+    m_memory.set(m_remembered);
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
-    if (added)
-        writeInterim();
+    return added;
 }
 
-bool FolderScan::addListed(const ScanItem &item, const ProbeOutcome &outcome)
+void FolderScan::takeOut(const EffectRecord &record, WaitingRecords &waiting)
+{
+    const auto [first, last] = waiting.equal_range(record.id);
+    const auto entry =
+        std::find_if(first, last, [&](const auto &each) { return each.second.record.isSamePlugin(record); });
+    if (entry != last)
+        waiting.erase(entry);
+}
+
+/// Takes out what was known of an item, when it has been dealt with.
+void FolderScan::removeWaiting(const ScanItem &item, WaitingRecords &waiting)
+{
+    for (const EffectRecord *record : item.known)
+        takeOut(*record, waiting);
+}
+
+bool FolderScan::addListed(const std::vector<EffectRecord> &records)
 {
     const bool announcesEach = m_host.announcesEachRecord();
     const bool announcesFirst =
-        !announcesEach && (outcome.records.size() >= kMany || m_plan->items().size() >= kMany);
+        !announcesEach && (records.size() >= kMany || m_plan->items().size() >= kMany);
     if (announcesFirst)
         notifyUI(MessageCode::kEntryAdded);
     bool added = false;
-    for (const EffectRecord &record : outcome.records) {
-        const bool isAdded = addProbed(item, record, outcome.records.size() == 1);
+    for (const EffectRecord &record : records) {
+        const bool isAdded = add(record);
         added |= isAdded;
         if (isAdded && announcesEach)
             notifyUI(MessageCode::kEntryAdded);
@@ -262,25 +255,9 @@ bool FolderScan::addListed(const ScanItem &item, const ProbeOutcome &outcome)
     return added;
 }
 
-bool FolderScan::addProbed(const ScanItem &item, EffectRecord record, bool isOnly)
+/// Adds a record; where another file holds its identifier, that is remembered.
+bool FolderScan::add(const EffectRecord &record)
 {
-    if (const EffectRecord *old = deadlyRecord(item, record)) { // another version gets a chance
-        EffectRecord deadly = *old;
-        deadly.path = item.path;
-        if (const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly)) {
-            deadly.category = source->category;
-            deadly.favourite = source->favourite;
-        }
-        return m_host.AddEffect(deadly);
-    }
-    if (!record.working)
-        m_host.completeFailedRecord(record);
-    const EffectRecord *source = m_plan->sourceOfMarks(item, record, isOnly);
-    const EffectRecord *likely = source ? nullptr : m_plan->likelySourceOfMarks(item, record);
-    if (likely && record.working)
-        m_likelyMarks.push_back({record.id, likely});
-    else if (source || likely)
-        takeMarks(record, source ? *source : *likely);
     if (m_host.AddEffect(record))
         return true;
     const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
@@ -338,35 +315,6 @@ void FolderScan::writeMemory(bool isLast)
     m_sinceMemory.start();
 }
 
-bool FolderScan::addFailed(const ScanItem &item)
-{
-    EffectRecord file = m_file;
-    file.working = false;
-    bool added = addProbed(item, file, false);
-    m_host.completeFailedRecord(file);
-    for (const KnownList::Records &records : {item.known, item.moved})
-        for (const EffectRecord *old : records)
-            if (!m_host.known().isSameOfFile(*old, file) && !old->standsForFile())
-                addLater(keptBesideFailure(*old, file));
-    return added;
-}
-
-/// Keeps what is known of a file that is asked again next time.
-void FolderScan::keepUnchanged(const ScanItem &item)
-{
-    for (const EffectRecord *record : item.known)
-        addLater(*record);
-    for (const EffectRecord *record : item.moved) {
-        if (record->standsForFile())
-            continue;
-        EffectRecord moved = *record;
-        moved.path = item.path;
-        moved.fileTime.clear(); // what another path's file was, or did, says nothing
-        moved.enabled |= !moved.working;
-        addLater(moved);
-    }
-}
-
 /// A file that lists the same plug-in goes before one that does not list it any more.
 void FolderScan::addLater(EffectRecord record)
 {
@@ -387,7 +335,10 @@ void FolderScan::collectWaiting(std::size_t from)
             m_waiting.insert({record->id, ListedEffect(*record)});
 }
 
-void FolderScan::writeInterim() { m_written |= m_host.writeInterim(m_waiting, Durability::Buffered); }
+void FolderScan::writeInterim(WaitingRecords &waiting)
+{
+    m_written |= m_host.writeInterim(waiting, Durability::Buffered);
+}
 
 void FolderScan::finish(bool isWhole)
 {
@@ -404,6 +355,7 @@ void FolderScan::finish(bool isWhole)
             if (!m_host.isListed(record->id)) // else a file that is there lists it
                 m_host.AddEffect(*record);
         forgetGone();
+        m_host.clearSuspects();
     } else {
         ProbeReport::instance().cancelled();
         collectWaiting(m_done);

@@ -15,6 +15,8 @@ class VProgressDisplay;
 /// they say: passes marks on, adds records, writes catalogues, logs and reports each outcome once. Used once,
 /// on the scan worker.
 class FolderScan : private IProbeObserver {
+    class PooledScan;
+
 public:
     explicit FolderScan(CatalogueHost &host);
     ~FolderScan() override;
@@ -28,17 +30,19 @@ private:
     void keepKnownPaths(QStringList &paths) const;
     void addKept();
     bool probeItems();
+    void beginItem(const ScanItem &item);
     void probe(const ScanItem &item);
+    bool probeInPool();
+    /// An outcome as lists and people take it.
+    static ProbeOutcome readable(const ScanItem &item, ProbeOutcome outcome);
     ProbeJob jobOf(const ScanItem &item) const;
     void finish(bool isWhole);
 
-    void keepOutcome(const ScanItem &item, const ProbeOutcome &outcome);
-    void log(const ScanItem &item, const ProbeOutcome &outcome) const;
-    bool addListed(const ScanItem &item, const ProbeOutcome &outcome);
-    bool addFailed(const ScanItem &item);
-    void keepUnchanged(const ScanItem &item);
+    bool keepOutcome(const ScanItem &item, const ProbeOutcome &outcome);
+    void log(const ScanItem &item, const ProbeOutcome &outcome, int worker) const;
+    bool addListed(const std::vector<EffectRecord> &records);
+    bool add(const EffectRecord &record);
     void addLater(EffectRecord record);
-    bool addProbed(const ScanItem &item, EffectRecord record, bool isOnly);
     void rememberCrashes();
     void remember(const ProbeOutcome &outcome);
     void writeMemory(bool isLast);
@@ -46,7 +50,9 @@ private:
 
     /// Has interim writes carry what is known of the items from one on.
     void collectWaiting(std::size_t from);
-    void writeInterim();
+    static void takeOut(const EffectRecord &record, WaitingRecords &waiting);
+    static void removeWaiting(const ScanItem &item, WaitingRecords &waiting);
+    void writeInterim(WaitingRecords &waiting);
     bool isCancelled() const;
     void showItemProgress();
 

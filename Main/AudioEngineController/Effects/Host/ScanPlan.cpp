@@ -88,6 +88,8 @@ void ScanPlan::decide(const QStringList &modules)
     }
     std::stable_partition(m_items.begin(), m_items.end(),
                           [](const ScanItem &item) { return !item.known.empty(); });
+    std::stable_partition(m_items.begin(), m_items.end(),
+                          [this](const ScanItem &item) { return m_host.isSuspect(item.path); });
 }
 
 void ScanPlan::decideModule(const QString &path)

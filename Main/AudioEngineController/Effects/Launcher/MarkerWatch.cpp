@@ -40,7 +40,10 @@ void MarkerWatch::look()
     const Stamps changed = ofRun(stampsOf(allPatterns()));
     const Stamps marker = newestMarker(changed);
     m_hasBegun |= !changed.empty();
-    for (const ReportLine &line : m_report.takeNewLines()) {
+    const std::vector<ReportLine> news = m_report.takeNewLines();
+    m_silent = news.empty() && changed == m_lastSeen ? m_silent + 1 : 0;
+    m_lastSeen = changed;
+    for (const ReportLine &line : news) {
         m_hasReportedItsEnd = line.isLast();
         if (line.event == ReportLine::Event::Begin)
             m_lastStage.reset();

@@ -24,6 +24,8 @@ public:
     /// has changed in the folder since it began to work.
     int looksWithoutChange() const { return m_unchanged; }
 
+    /// For how many looks in a row neither the report nor anything in the folder has changed.
+    int looksWithoutNews() const { return m_silent; }
     /// The last stage that the run reported; none before the first.
     std::optional<ProbeStage> lastStage() const { return m_lastStage; }
 
@@ -47,4 +49,6 @@ private:
     bool m_hasReportedItsEnd = false;
     std::optional<ProbeStage> m_lastStage;
     int m_unchanged = 0;
+    int m_silent = 0;
+    Stamps m_lastSeen;
 };

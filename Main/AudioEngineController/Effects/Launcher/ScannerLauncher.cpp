@@ -103,6 +103,11 @@ bool ScannerLauncher::runOnce(const Job &job)
 {
     MarkerWatch watch(job.effectsFolder, qEnvironmentVariable("FXPROBE_REPORT"));
     ScannerProcess scanner;
+    if (job.jobs > 0) {
+        scanner.setEnvironment("FXPROBE_JOBS", job.jobs);
+        scanner.setEnvironment("FXPROBE_PROBE_LIMIT", job.probeLimit);
+        scanner.setEnvironment("FXPROBE_MEMORY_LIMIT", job.memoryLimit);
+    }
     ScannerRunEnd end;
     if (!scanner.start(job.program, QStringList(job.scanList), kStartPatience)) {
         DebugLog(L"Scanner failed to Start: %d", scanner.errorCode());
@@ -154,7 +159,12 @@ void ScannerLauncher::waitForEnd(const Job &job, ScannerProcess &scanner, Marker
 bool ScannerLauncher::isOverLimit(const Job &job, const MarkerWatch &watch) const
 {
     // In steps, not by a clock: the time a machine sleeps does not count.
-    return job.probeLimit > 0 && watch.looksWithoutChange() >= job.probeLimit;
+    if (job.probeLimit <= 0)
+        return false;
+    // A scanner with workers ends those that give no answer by itself, and asks once more.
+    constexpr int kPatience = 10; // s
+    return job.jobs > 0 ? watch.looksWithoutNews() >= 2 * job.probeLimit + kPatience
+                        : watch.looksWithoutChange() >= job.probeLimit;
 }
 
 void ScannerLauncher::reset()

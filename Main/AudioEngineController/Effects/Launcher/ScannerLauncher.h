@@ -53,6 +53,8 @@ public:
         QString effectsFolder;
         int probeLimit = 0;                  ///< seconds that one plug-in may take; 0: for ever
         std::function<void()> writeScanList; ///< called before each run
+        int jobs = 0;        ///< workers that the scanner has; 0: it probes in its own process
+        int memoryLimit = 0; ///< MiB that a worker may hold; 0: any
     };
 
     /// Runs until a run leaves no marker, the runs are used up, or somebody cancels. On the thread that

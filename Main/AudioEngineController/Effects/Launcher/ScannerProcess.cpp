@@ -31,6 +31,13 @@ ScannerProcess::ScannerProcess()
 
 ScannerProcess::~ScannerProcess() { end(); }
 
+void ScannerProcess::setEnvironment(const char *variable, int value)
+{
+    QProcessEnvironment environment = m_child->processEnvironment();
+    environment.insert(QLatin1String(variable), QString::number(value));
+    m_child->setProcessEnvironment(environment);
+}
+
 bool ScannerProcess::start(const QString &program, const QStringList &arguments,
                            std::chrono::milliseconds timeout)
 {

@@ -21,6 +21,8 @@ public:
     ScannerProcess(const ScannerProcess &) = delete;
     ScannerProcess &operator=(const ScannerProcess &) = delete;
 
+    /// Sets a variable of the scanner's environment, before it is started.
+    void setEnvironment(const char *variable, int value);
     /// Starts the program with the system's environment. False when it does not start in time.
     bool start(const QString &program, const QStringList &arguments, std::chrono::milliseconds timeout);
     /// Waits for the end; false when it did not come in time. A process that never started never ends.

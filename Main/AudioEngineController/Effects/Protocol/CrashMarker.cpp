@@ -82,7 +82,9 @@ EffectRecord rawRecord(const MarkerFormat &format, const QByteArray &content)
     return record;
 }
 
-QByteArray markerText(const MarkerFormat &format, const EffectRecord &record)
+constexpr char kSuspect[] = "Suspect";
+
+QByteArray markerText(const MarkerFormat &format, const EffectRecord &record, bool isSuspect)
 {
     QByteArray text = xmlHeaderLine() + "<CrashedPlugin>" + kLineEnd;
     if (!format.leavesOutEmpty || !record.path.isEmpty())
@@ -93,7 +95,14 @@ QByteArray markerText(const MarkerFormat &format, const EffectRecord &record)
     // Signed, unlike the catalogue's: markers of earlier versions carry it so.
     if (format.hasSubId && record.subId != 0)
         text += elementLine(1, "SubID", QByteArray::number(static_cast<qint32>(record.subId)));
+    if (isSuspect)
+        text += elementLine(1, kSuspect, "1");
     return text + "</CrashedPlugin>" + kLineEnd;
+}
+
+bool namesSuspect(const QByteArray &content)
+{
+    return content.endsWith(elementLine(1, kSuspect, "1") + "</CrashedPlugin>" + kLineEnd);
 }
 
 QString markerPath(const MarkerFormat &format, const QString &folder, const QString &name)
@@ -119,9 +128,10 @@ QString freeMarkerPath(const MarkerFormat &format, const QString &folder, const 
     return marker;
 }
 
-FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, const EffectRecord &record)
+FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, const EffectRecord &record,
+                           bool isSuspect)
 {
-    const QByteArray text = markerText(format, record);
+    const QByteArray text = markerText(format, record, isSuspect);
     QFile file(marker);
     if (file.open(QIODevice::WriteOnly | QIODevice::Truncate) && file.write(text) == text.size() &&
         file.flush())
@@ -132,7 +142,7 @@ FileResult writeMarkerFile(const MarkerFormat &format, const QString &marker, co
 } // namespace
 
 CrashMarker::CrashMarker(const MarkerFormat &format, const QString &folder, EffectRecord plugin,
-                         const QString &name, const QStringList &taken)
+                         const QString &name, const QStringList &taken, bool isSuspect)
 {
     plugin.name = name;
     if (name.isNull())
@@ -143,7 +153,7 @@ CrashMarker::CrashMarker(const MarkerFormat &format, const QString &folder, Effe
         m_path = freeMarkerPath(format, folder, plugin, taken);
         activeMarkers().paths.insert(m_path);
     }
-    if (const FileResult written = writeMarkerFile(format, m_path, plugin); !written)
+    if (const FileResult written = writeMarkerFile(format, m_path, plugin, isSuspect); !written)
         DebugLog(L"Cannot write the crash marker %ls: %ls", m_path, written.reason);
 }
 
@@ -200,7 +210,7 @@ EffectRecord readMarkerFile(const MarkerFormat &format, const QString &marker)
     // Markers are not escaped: a path with "<" makes one no XML, or XML that says something else. What we
     // wrote is read by its lines; its plug-in would crash every run otherwise.
     const EffectRecord raw = rawRecord(format, content);
-    if (markerText(format, raw) == content)
+    if (markerText(format, raw, namesSuspect(content)) == content)
         return raw;
     XMLDocument document(XMLDocument::Entities::Literal);
     if (!document.parse(content)) {
@@ -248,8 +258,12 @@ std::vector<FoundMarker> readMarkers(const QStringList &files)
 {
     std::vector<FoundMarker> markers;
     for (const QString &file : files)
-        if (const PluginFormatInfo *info = formatOfMarker(file))
-            markers.push_back({file, info->format, readMarkerFile(info->catalogue->marker, file)});
+        if (const PluginFormatInfo *info = formatOfMarker(file)) {
+            QByteArray content;
+            readWholeFile(file, content);
+            markers.push_back(
+                {file, info->format, readMarkerFile(info->catalogue->marker, file), namesSuspect(content)});
+        }
     return markers;
 }
 
@@ -259,5 +273,5 @@ bool isExcused(const FoundMarker &marker, const std::vector<FoundMarker> &all)
         return other.format == marker.format && other.plugin.subId != 0 &&
                isSamePath(other.plugin.path, marker.plugin.path);
     };
-    return marker.plugin.subId == 0 && std::any_of(all.begin(), all.end(), isChild);
+    return marker.isSuspect || (marker.plugin.subId == 0 && std::any_of(all.begin(), all.end(), isChild));
 }

@@ -19,9 +19,10 @@ public:
     /// null name is made from the path. The file bears the name, with what a file system does not take
     /// replaced, cut where it is too long; where it is taken by a marker of this process or by one of
     /// `taken`, a sub-plug-in's gets its identifier behind, any other a number in front. A marker that cannot
-    /// be written is logged: the plug-in is probed unprotected.
+    /// be written is logged: the plug-in is probed unprotected. A suspect's marker blames nobody: it says
+    /// that the plug-in was being probed when the scanner ended, which asked others at the same time.
     CrashMarker(const MarkerFormat &format, const QString &folder, EffectRecord plugin,
-                const QString &name = QString(), const QStringList &taken = {});
+                const QString &name = QString(), const QStringList &taken = {}, bool isSuspect = false);
     /// Deletes the file; one that stays would name a culprit to the next run, and is logged.
     ~CrashMarker();
     CrashMarker(CrashMarker &&other) noexcept;
@@ -50,6 +51,7 @@ struct FoundMarker {
     QString file;
     PluginFormat format;
     EffectRecord plugin;
+    bool isSuspect; ///< it names one of several that were being probed at once: no culprit, but asked first
 };
 
 /// Reads a marker of a format. The file stays: it is deleted once the catalogue holds what it said.
@@ -60,8 +62,8 @@ const PluginFormatInfo *formatOfMarker(const QString &file);
 QStringList markerPatterns();
 /// Reads the markers of these files, all formats.
 std::vector<FoundMarker> readMarkers(const QStringList &files);
-/// Whether a marker among others names no culprit: that of a whole shell is there beside its child's, and the
-/// child is the culprit.
+/// Whether a marker among others names no culprit: it names a suspect only, or that of a whole shell is there
+/// beside its child's, and the child is the culprit.
 bool isExcused(const FoundMarker &marker, const std::vector<FoundMarker> &all);
 /// Deletes a marker's file; a failure is logged.
 void removeMarkerFile(const QString &marker);

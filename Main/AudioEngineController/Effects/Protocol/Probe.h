@@ -47,6 +47,7 @@ struct ProbeOutcome {
     std::vector<EffectRecord> records;
     double milliseconds = 0;  ///< from before the module was touched until it was unloaded
     bool leftThreads = false; ///< more threads run than before, and the module stays mapped
+    bool leftModule = false;  ///< it stays mapped in its process although it was unloaded
     bool faulted = false;     ///< a call committed a hardware fault that was contained
 
     /// The first reason counts: what fails later follows from it.

@@ -23,6 +23,13 @@ QJsonObject identity(PluginFormat format, const QString &path, quint32 subId)
     return line;
 }
 
+QJsonObject withWorker(QJsonObject line, int worker)
+{
+    if (worker != 0)
+        line.insert(QLatin1String(kWorker), worker);
+    return line;
+}
+
 /// To a thousandth.
 double rounded(double milliseconds) { return std::round(milliseconds * 1000.0) / 1000.0; }
 
@@ -71,23 +78,26 @@ void ProbeReport::plan(PluginFormat format, std::size_t files, std::size_t probe
                    {QLatin1String(kProbes), static_cast<qint64>(probes)}});
 }
 
-void ProbeReport::begin(PluginFormat format, const EffectRecord &plugin)
+void ProbeReport::begin(PluginFormat format, const EffectRecord &plugin, int worker)
 {
     if (!m_file)
         return;
     QJsonObject line = identity(format, plugin.path, plugin.subId);
     if (plugin.subId != 0)
         line.insert(QLatin1String(kSubName), plugin.subName);
-    write("begin", line);
+    write("begin", withWorker(line, worker));
 }
 
-void ProbeReport::stage(ProbeStage stage)
+void ProbeReport::stage(ProbeStage stage, int worker)
 {
     if (m_file)
-        write("stage", {{QLatin1String(kStage), QLatin1String(kStages[static_cast<std::size_t>(stage)])}});
+        write("stage",
+              withWorker({{QLatin1String(kStage), QLatin1String(kStages[static_cast<std::size_t>(stage)])}},
+                         worker));
 }
 
-void ProbeReport::end(PluginFormat format, const EffectRecord &plugin, const ProbeOutcome &outcome)
+void ProbeReport::end(PluginFormat format, const EffectRecord &plugin, const ProbeOutcome &outcome,
+                      int worker)
 {
     if (!m_file)
         return;
@@ -100,7 +110,13 @@ void ProbeReport::end(PluginFormat format, const EffectRecord &plugin, const Pro
         line.insert(QLatin1String(kNoPlugin), true);
     if (!outcome.reason.isEmpty())
         line.insert(QLatin1String(kReason), outcome.reason);
-    write("end", line);
+    write("end", withWorker(line, worker));
+}
+
+void ProbeReport::workerEnded(int worker, const QString &reason)
+{
+    if (m_file)
+        write("workerEnd", withWorker({{QLatin1String(kReason), reason}}, worker));
 }
 
 void ProbeReport::skipped(PluginFormat format, const QString &path, const QString &reason)

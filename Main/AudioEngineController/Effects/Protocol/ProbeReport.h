@@ -30,12 +30,14 @@ public:
 
     /// A format found so many files and will probe so many of them.
     void plan(PluginFormat format, std::size_t files, std::size_t probes);
-    /// A plug-in, or a sub-plug-in, is about to be touched.
-    void begin(PluginFormat format, const EffectRecord &plugin);
-    /// The probe begun last enters a stage.
-    void stage(ProbeStage stage);
+    /// A plug-in, or a sub-plug-in, is about to be touched; by a worker of that number, where there are any.
+    void begin(PluginFormat format, const EffectRecord &plugin, int worker = 0);
+    /// The probe begun last, or the one that the worker began last, enters a stage.
+    void stage(ProbeStage stage, int worker = 0);
     /// What came of a probe.
-    void end(PluginFormat format, const EffectRecord &plugin, const ProbeOutcome &outcome);
+    void end(PluginFormat format, const EffectRecord &plugin, const ProbeOutcome &outcome, int worker = 0);
+    /// A worker has ended, and why.
+    void workerEnded(int worker, const QString &reason);
     /// A file is not a plug-in, which was seen without loading it.
     void skipped(PluginFormat format, const QString &path, const QString &reason);
     /// The scan was cancelled: it does not count as finished.

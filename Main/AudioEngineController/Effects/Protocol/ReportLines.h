@@ -10,6 +10,7 @@ inline constexpr char kPath[] = "path";
 inline constexpr char kSubId[] = "subId";
 inline constexpr char kSubName[] = "subName";
 inline constexpr char kStage[] = "stage";
+inline constexpr char kWorker[] = "worker";
 inline constexpr char kReason[] = "reason";
 inline constexpr char kMilliseconds[] = "milliseconds";
 inline constexpr char kRecords[] = "records";
@@ -18,8 +19,9 @@ inline constexpr char kFiles[] = "files";
 inline constexpr char kProbes[] = "probes";
 
 /// In the order of `ReportLine::Event`.
-inline constexpr const char *kEvents[] = {"start",   "busy",      "plan",       "begin",    "stage", "end",
-                                          "skipped", "unwritten", "unreadList", "finished", "ended"};
+inline constexpr const char *kEvents[] = {"start",      "busy",     "plan",    "begin",
+                                          "stage",      "end",      "skipped", "unwritten",
+                                          "unreadList", "finished", "ended",   "workerEnd"};
 /// In the order of `ProbeStage`.
 inline constexpr const char *kStages[] = {"load", "start", "ask", "close"};
 

@@ -43,6 +43,7 @@ ReportLine lineOf(const QByteArray &text)
     line.records = json.value(QLatin1String(kRecords)).toInt();
     line.noPlugin = json.value(QLatin1String(kNoPlugin)).toBool();
     line.probes = json.value(QLatin1String(kProbes)).toInt();
+    line.worker = json.value(QLatin1String(kWorker)).toInt();
     return line;
 }
 

@@ -21,6 +21,7 @@ struct ReportLine {
         UnreadList,
         Finished,
         Ended,
+        WorkerEnd,
         Unknown, ///< of a later version, or damaged
     };
 
@@ -35,6 +36,7 @@ struct ReportLine {
     int records = 0;
     bool noPlugin = false;
     int probes = 0; ///< planned
+    int worker = 0; ///< that it is about; 0: the scanner itself
 
     /// The last line of a scan that came to its end, cancelled or not.
     bool isLast() const { return event == Event::Finished || event == Event::Ended; }

@@ -16,7 +16,5 @@ public:
     bool probesInPathOrder() const override { return false; }
     bool announcesEachRecord() const override { return false; }
     std::unique_ptr<IPluginProbe> makeProbe() const override;
-
-protected:
     bool isMarkerWithoutRecord(const EffectRecord &marker) const override;
 };

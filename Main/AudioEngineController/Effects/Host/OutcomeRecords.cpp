@@ -1,0 +1,210 @@
+#include "Main/AudioEngineController/Effects/Host/OutcomeRecords.h"
+
+namespace {
+
+/// What a file that fails keeps of a record: the marks. It is not working, and asked again when the file
+/// changes, also where it crashed elsewhere; what the user switched off stays as it is.
+EffectRecord keptBesideFailure(const EffectRecord &old, const EffectRecord &file)
+{
+    EffectRecord kept = old;
+    kept.path = file.path;
+    if (!old.isSwitchedOff()) {
+        if (!file.fileTime.isEmpty()) { // else the file comes back as it was, with what crashed in it
+            kept.fileTime = file.fileTime;
+            kept.enabled = true;
+        }
+        kept.working = false;
+    }
+    return kept;
+}
+
+/// Makes the records of one outcome.
+class Maker {
+public:
+    Maker(const CatalogueHost &host, const ScanPlan &plan, const ScanItem &item)
+        : m_host(host)
+        , m_plan(plan)
+        , m_item(item)
+    {}
+
+    void addListed(const std::vector<EffectRecord> &listed)
+    {
+        for (const EffectRecord &record : listed)
+            add(record, listed.size() == 1);
+    }
+    void addFailed(const QString &fileTime);
+    void addCrashed();
+    void keepUnchanged();
+
+    OutcomeRecords made;
+
+private:
+    void add(EffectRecord record, bool isOnly);
+    void addDeadly(const EffectRecord &child, EffectRecord deadly, bool isOnly);
+    const EffectRecord *deadlyRecord(const EffectRecord &child) const;
+    EffectRecord crashedChild(const EffectRecord &child) const;
+    KnownList afterCrash(const EffectRecord &marker) const;
+    EffectRecord file(const QString &fileTime) const;
+
+    const CatalogueHost &m_host;
+    const ScanPlan &m_plan;
+    const ScanItem &m_item;
+};
+
+/// What is known of a sub-plug-in that must not be loaded; null when it may be.
+const EffectRecord *Maker::deadlyRecord(const EffectRecord &child) const
+{
+    for (const KnownList::Records *records : {&m_item.known, &m_item.moved})
+        for (const EffectRecord *old : *records)
+            if (old->subId == child.subId && isDeadly(*old, m_item.fileTime))
+                return old;
+    return nullptr;
+}
+
+/// What is known of the item's file, with what a crash marker would say.
+KnownList Maker::afterCrash(const EffectRecord &marker) const
+{
+    KnownList known(m_host.known().identity());
+    for (const EffectRecord *old : m_item.known)
+        known.addRecord(*old);
+    EffectRecord &crashed = known.applyCrash(marker);
+    crashed.id = m_host.freeIdentifier(crashed, marker.name);
+    return known;
+}
+
+EffectRecord Maker::crashedChild(const EffectRecord &child) const
+{
+    EffectRecord marker;
+    marker.path = child.path;
+    marker.fileTime = child.fileTime;
+    marker.name = marker.subName = child.subName;
+    marker.subId = child.subId;
+    const KnownList known = afterCrash(marker);
+    for (const EffectRecord &record : known.inOrder())
+        if (record.subId == child.subId)
+            marker = record;
+    return marker;
+}
+
+EffectRecord Maker::file(const QString &fileTime) const
+{
+    EffectRecord file;
+    file.path = m_item.path;
+    file.fileTime = fileTime;
+    return file;
+}
+
+/// A sub-plug-in that was left out because it ended the process that probed it; another version of the file
+/// gets another chance.
+void Maker::addDeadly(const EffectRecord &child, EffectRecord deadly, bool isOnly)
+{
+    deadly.path = m_item.path;
+    if (const EffectRecord *source = m_plan.sourceOfMarks(m_item, child, isOnly)) {
+        deadly.category = source->category;
+        deadly.favourite = source->favourite;
+    }
+    made.listed.push_back(deadly);
+}
+
+void Maker::add(EffectRecord record, bool isOnly)
+{
+    if (const EffectRecord *old = deadlyRecord(record))
+        return addDeadly(record, *old, isOnly);
+    if (!record.enabled)
+        return addDeadly(record, crashedChild(record), isOnly);
+    if (!record.working)
+        m_host.completeFailedRecord(record);
+    const EffectRecord *source = m_plan.sourceOfMarks(m_item, record, isOnly);
+    const EffectRecord *likely = source ? nullptr : m_plan.likelySourceOfMarks(m_item, record);
+    if (likely && record.working)
+        made.likelyMarks.push_back({record.id, likely});
+    else if (source || likely)
+        takeMarks(record, source ? *source : *likely);
+    made.listed.push_back(record);
+}
+
+/// One record stands for the file; what was known of it stays beside it, with its marks.
+void Maker::addFailed(const QString &fileTime)
+{
+    EffectRecord failed = file(fileTime);
+    failed.working = false;
+    add(failed, false);
+    m_host.completeFailedRecord(failed);
+    for (const KnownList::Records &records : {m_item.known, m_item.moved})
+        for (const EffectRecord *old : records)
+            if (!m_host.known().isSameOfFile(*old, failed) && !old->standsForFile())
+                made.kept.push_back(keptBesideFailure(*old, failed));
+}
+
+/// As a crash marker has it that the next run finds; so has what moved here, with its marks.
+void Maker::addCrashed()
+{
+    EffectRecord marker = file(m_item.fileTime);
+    marker.enabled = false;
+    NameFromPath(marker);
+    if (m_host.isMarkerWithoutRecord(marker))
+        return keepUnchanged();
+    const KnownList known = afterCrash(marker);
+    for (const EffectRecord *record : known.recordsOfPath(m_item.path))
+        made.listed.push_back(*record);
+    EffectRecord &crashed = made.listed.front();
+    for (const EffectRecord *old : m_item.moved) {
+        const bool isFile = m_host.known().isSameOfFile(*old, crashed);
+        if (isFile) {
+            crashed.category = old->category;
+            crashed.favourite = old->favourite;
+        } else if (!old->standsForFile()) {
+            made.kept.push_back(keptBesideFailure(*old, crashed));
+            made.kept.back().enabled = false;
+        }
+    }
+}
+
+/// Keeps what is known of a file that is asked again next time.
+void Maker::keepUnchanged()
+{
+    for (const EffectRecord *record : m_item.known)
+        made.kept.push_back(*record);
+    for (const EffectRecord *record : m_item.moved) {
+        if (record->standsForFile())
+            continue;
+        EffectRecord moved = *record;
+        moved.path = m_item.path;
+        moved.fileTime.clear(); // what another path's file was, or did, says nothing
+        moved.enabled |= !moved.working;
+        made.kept.push_back(moved);
+    }
+}
+
+} // namespace
+
+bool isDeadly(const EffectRecord &old, const QString &fileTime)
+{
+    return old.subId != 0 && !old.enabled && !old.working && old.fileTime == fileTime;
+}
+
+OutcomeRecords recordsOfOutcome(const CatalogueHost &host, const ScanPlan &plan, const ScanItem &item,
+                                const ProbeOutcome &outcome)
+{
+    using IfFailed = ProbeOutcome::IfFailed;
+    Maker maker(host, plan, item);
+    switch (outcome.status) {
+    case ProbeStatus::Listed:
+        maker.addListed(outcome.records);
+        break;
+    case ProbeStatus::Failed:
+        if (outcome.ifFailed == IfFailed::KeepKnown)
+            maker.keepUnchanged();
+        else
+            maker.addFailed(outcome.ifFailed == IfFailed::LookAgain ? QString() : item.fileTime);
+        break;
+    case ProbeStatus::Crashed:
+    case ProbeStatus::NoAnswer:
+        maker.addCrashed();
+        break;
+    case ProbeStatus::NoPlugin:
+    case ProbeStatus::Cancelled:
+        break;
+    }
+    return maker.made;
+}

@@ -1,0 +1,348 @@
+#include "Main/AudioEngineController/Effects/Host/ProbePool.h"
+
+#include "Core/BaseLib/Log/DebugLog.h"
+
+#include <algorithm>
+
+namespace {
+
+constexpr char kWorkerArgument[] = "-probe_worker";
+constexpr std::chrono::milliseconds kLook(50);
+/// What plug-ins at work get to end by themselves after a cancel.
+constexpr qint64 kPatience = 2000; // ms
+/// A worker that holds so much more memory than a fresh one is replaced.
+constexpr qint64 kMaxGrowth = 256 << 20; // bytes
+/// So many modules are asked in one worker: what they leave in the process adds up.
+constexpr int kMaxModules = 50;
+/// Far more than the largest shell or module has to tell.
+constexpr int kMaxMessages = 1 << 20;
+/// Starts in a row that may fail.
+constexpr int kMaxFailedStarts = 3;
+
+const char *stageText(ProbeStage stage)
+{
+    switch (stage) {
+    case ProbeStage::Load:
+        return " while it was being loaded";
+    case ProbeStage::Start:
+        return " while it was starting";
+    case ProbeStage::Ask:
+        return " while it was asked for its data";
+    case ProbeStage::Close:
+        return " while it was being closed and unloaded";
+    }
+    return "";
+}
+
+} // namespace
+
+ProbePool::ProbePool(Settings settings)
+    : m_settings(std::move(settings))
+    , m_group(m_settings.program, QStringList(QLatin1String(kWorkerArgument)))
+{}
+
+ProbePool::~ProbePool() = default;
+
+bool ProbePool::isBusy() const
+{
+    return std::any_of(m_workers.begin(), m_workers.end(),
+                       [](const auto &entry) { return entry.second.job.has_value(); });
+}
+
+bool ProbePool::run(std::vector<ProbeJob> jobs, IPoolListener &listener)
+{
+    m_listener = &listener;
+    m_jobs = std::move(jobs);
+    m_waiting.clear();
+    for (std::size_t job = 0; job < m_jobs.size(); ++job)
+        m_waiting.push_back({job, false});
+    QElapsedTimer sinceCancel;
+    bool canStart = true;
+    while (canStart && (isBusy() || !m_waiting.empty())) {
+        if (!sinceCancel.isValid() && listener.isCancelled()) {
+            sinceCancel.start();
+            m_waiting.clear();
+        }
+        if (sinceCancel.isValid() && sinceCancel.hasExpired(kPatience))
+            cancelJobs();
+        canStart = startWorkers();
+        handOut();
+        for (const WorkerEvent &event : m_group.wait(kLook))
+            take(event);
+        endOverdue();
+        endOversized();
+    }
+    m_listener = nullptr;
+    return canStart;
+}
+
+/// Those at work had their time, and nobody is to blame.
+void ProbePool::cancelJobs()
+{
+    ProbeOutcome cancelled;
+    cancelled.status = ProbeStatus::Cancelled;
+    for (auto &[number, worker] : m_workers) {
+        if (!worker.job)
+            continue;
+        m_listener->jobEnds(*worker.job, number, cancelled);
+        worker.job.reset();
+        worker.isLeaving = true;
+        endWorker(number, worker, QStringLiteral("the scan was cancelled"));
+    }
+}
+
+/// As many as there are jobs for, ahead of time: a worker that is being replaced costs its start otherwise.
+/// False when the system gives none.
+bool ProbePool::startWorkers()
+{
+    const auto count = [this](bool Worker::*flag) {
+        return static_cast<std::size_t>(std::count_if(
+            m_workers.begin(), m_workers.end(), [flag](const auto &entry) { return entry.second.*flag; }));
+    };
+    const auto busy = static_cast<std::size_t>(std::count_if(
+        m_workers.begin(), m_workers.end(), [](const auto &entry) { return entry.second.job.has_value(); }));
+    const std::size_t wanted =
+        std::min(static_cast<std::size_t>(m_settings.workers), m_waiting.size() + busy);
+    while (m_workers.size() - count(&Worker::isLeaving) < wanted && m_failedStarts < kMaxFailedStarts) {
+        QString reason;
+        const std::optional<int> number = m_group.start(reason);
+        if (!number) {
+            ++m_failedStarts;
+            DebugLog(L"A worker could not be started: %ls", reason);
+            continue;
+        }
+        m_workers[*number].silent.start();
+    }
+    return m_failedStarts < kMaxFailedStarts || isBusy();
+}
+
+void ProbePool::handOut()
+{
+    for (auto &[number, worker] : m_workers) {
+        if (!worker.isReady || worker.job || worker.isLeaving || m_waiting.empty())
+            continue;
+        const bool isFresh = worker.probed == 0;
+        // The first that fits; one that needs a fresh worker gets the next fresh one.
+        const auto fits = [isFresh](const Waiting &waiting) { return isFresh || !waiting.needsFreshWorker; };
+        const auto next = std::find_if(m_waiting.begin(), m_waiting.end(), fits);
+        if (next != m_waiting.end()) {
+            handOut(number, worker, static_cast<std::size_t>(next - m_waiting.begin()));
+        } else {
+            worker.isLeaving = true;
+            endWorker(number, worker, QStringLiteral("a fresh one takes its place"));
+        }
+    }
+}
+
+void ProbePool::handOut(int number, Worker &worker, std::size_t index)
+{
+    const std::size_t job = m_waiting[index].job;
+    m_waiting.erase(m_waiting.begin() + static_cast<std::ptrdiff_t>(index));
+    worker.job = job;
+    worker.outcome = ProbeOutcome();
+    worker.messages = 0;
+    worker.child.reset();
+    worker.silent.start();
+    m_listener->jobBegins(job, number);
+    ChannelMessage message;
+    message.kind = ChannelMessage::Kind::Job;
+    message.job = m_jobs[job];
+    m_group.send(number,
+                 encodeMessage(message)); // one that takes nothing has ended, which is told by an event
+}
+
+void ProbePool::take(const WorkerEvent &event)
+{
+    if (event.end) {
+        takeEnd(event.worker, *event.end);
+        return;
+    }
+    const auto found = m_workers.find(event.worker);
+    if (found == m_workers.end() || found->second.isLeaving)
+        return;
+    Worker &worker = found->second;
+    worker.reader.feed(event.data);
+    while (const std::optional<ChannelMessage> message = worker.reader.next())
+        takeMessage(event.worker, worker, *message);
+    if ((worker.reader.isBroken() || worker.messages > kMaxMessages) && worker.endedFor.isEmpty())
+        endWorker(event.worker, worker, QStringLiteral("it wrote into the channel of its worker"));
+}
+
+void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &message)
+{
+    using Kind = ChannelMessage::Kind;
+    if (message.kind == Kind::Ready) {
+        worker.isReady = true;
+        worker.freshMemory = m_group.residentMemory(number);
+        m_failedStarts = 0;
+        return;
+    }
+    if (!worker.job || ++worker.messages > kMaxMessages)
+        return; // a plug-in speaks in its worker's name
+    worker.silent.start();
+    const std::size_t job = *worker.job;
+    switch (message.kind) {
+    case Kind::Stage:
+        worker.outcome.stage = message.stage;
+        m_listener->stageEntered(job, number, message.stage);
+        break;
+    case Kind::Class:
+        m_listener->classBegins(job, number, message.text);
+        break;
+    case Kind::Announced:
+        m_listener->classAnnounced();
+        break;
+    case Kind::Child:
+        worker.child = message.record;
+        m_listener->childBegins(job, number, message.record);
+        break;
+    case Kind::ChildEnd:
+        m_listener->childEnds(job, number, message.outcome);
+        worker.child.reset();
+        break;
+    case Kind::ChildCloses:
+        worker.child = message.record;
+        break;
+    case Kind::ChildClosed:
+        worker.child.reset();
+        break;
+    case Kind::Record:
+        worker.outcome.records.push_back(message.record);
+        break;
+    case Kind::Done: {
+        ProbeOutcome outcome = message.outcome;
+        outcome.records = std::move(worker.outcome.records);
+        finishJob(number, worker, outcome);
+        break;
+    }
+    case Kind::Ready:
+    case Kind::Job:
+    case Kind::Children:
+        break;
+    }
+}
+
+void ProbePool::endWorker(int number, Worker &worker, const QString &reason)
+{
+    worker.endedFor = reason;
+    m_group.end(number);
+}
+
+/// Why a worker asks nobody else; empty when it may. What a plug-in left behind would meet a stranger's
+/// probe.
+QString ProbePool::whySpent(int number, const Worker &worker, const ProbeOutcome &outcome) const
+{
+    if (outcome.faulted)
+        return QStringLiteral("a plug-in crashed in it");
+    if (outcome.leftThreads)
+        return QStringLiteral("a plug-in left threads in it");
+    if (outcome.leftModule)
+        return QStringLiteral("a plug-in stayed in it");
+    if (m_group.hasChildren(number))
+        return QStringLiteral("a plug-in left processes in it");
+    if (m_group.residentMemory(number) - worker.freshMemory > kMaxGrowth)
+        return QStringLiteral("it holds too much memory");
+    if (worker.probed >= kMaxModules)
+        return QStringLiteral("it asked %1 plug-ins").arg(worker.probed);
+    return QString();
+}
+
+void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcome)
+{
+    const std::size_t job = *worker.job;
+    worker.job.reset();
+    worker.child.reset();
+    ++worker.probed;
+    worker.lastProbed = m_jobs[job].path;
+    if (const QString why = whySpent(number, worker, outcome); !why.isEmpty()) {
+        worker.isLeaving = true;
+        endWorker(number, worker, why);
+    }
+    m_listener->jobEnds(job, number, outcome);
+}
+
+QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int number) const
+{
+    const QString when = QLatin1String(stageText(worker.outcome.stage));
+    if (!worker.endedFor.isEmpty())
+        return worker.endedFor + when;
+    if (!end.crashed && end.code == kChannelLost)
+        return QStringLiteral("it closed the channel of its worker") + when;
+    QString text = end.crashed
+                       ? QStringLiteral("it crashed%1: %2").arg(when, end.text)
+                       : QStringLiteral("it ended its process with exit code %1%2").arg(end.code).arg(when);
+    const QString printed = m_group.output(number).section(QLatin1Char('\n'), -1).trimmed();
+    return printed.isEmpty() ? text : text + QStringLiteral("; it printed: ") + printed;
+}
+
+/// What a worker was busy with when it ended is to blame, if it asked nobody before.
+void ProbePool::takeEnd(int number, const WorkerEnd &end)
+{
+    const auto found = m_workers.find(number);
+    if (found == m_workers.end())
+        return;
+    const Worker worker = std::move(found->second);
+    m_workers.erase(found);
+    if (!worker.isReady) {
+        ++m_failedStarts;
+        DebugLog(L"A worker ended at its start: %ls", describe(worker, end, number));
+    }
+    if (!worker.job) {
+        if (!worker.isLeaving)
+            DebugLog(L"A worker ended after it had asked %ls", worker.lastProbed);
+        m_listener->workerEnds(number, worker.isLeaving ? worker.endedFor : describe(worker, end, number));
+        return;
+    }
+    const std::size_t job = *worker.job;
+    const QString reason = describe(worker, end, number);
+    if (worker.probed == 0) {
+        giveVerdict(job, number, worker, reason);
+    } else { // somebody who went before may be to blame
+        DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as %ls went before", m_jobs[job].path,
+                 reason, worker.lastProbed);
+        m_waiting.push_front({job, true});
+    }
+    m_listener->workerEnds(number, reason);
+}
+
+void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, const QString &reason)
+{
+    ProbeOutcome outcome;
+    outcome.status = worker.isOverdue ? ProbeStatus::NoAnswer : ProbeStatus::Crashed;
+    outcome.stage = worker.outcome.stage;
+    outcome.reason = reason;
+    if (worker.child && m_jobs[job].leftOut.insert(worker.child->subId).second) {
+        // One sub-plug-in's crash is not its shell's: the others are asked without it.
+        outcome.records.push_back(*worker.child);
+        m_listener->childEnds(job, number, outcome);
+        m_waiting.push_front({job, true});
+        return;
+    }
+    m_listener->jobEnds(job, number, outcome);
+}
+
+void ProbePool::endOverdue()
+{
+    for (auto &[number, worker] : m_workers) {
+        const bool isOverdue = worker.job && m_settings.limit.count() > 0 && worker.endedFor.isEmpty() &&
+                               worker.silent.hasExpired(m_settings.limit.count());
+        if (!isOverdue)
+            continue;
+        worker.isOverdue = true;
+        endWorker(number, worker,
+                  QStringLiteral("it gave no answer for %1 s").arg(m_settings.limit.count() / 1000));
+    }
+}
+
+void ProbePool::endOversized()
+{
+    constexpr qint64 kPause = 50; // ms
+    if (m_settings.memoryLimit <= 0 || (m_sinceMemory.isValid() && !m_sinceMemory.hasExpired(kPause)))
+        return;
+    m_sinceMemory.start();
+    for (auto &[number, worker] : m_workers)
+        if (worker.job && worker.endedFor.isEmpty() &&
+            m_group.residentMemory(number) > m_settings.memoryLimit)
+            endWorker(number, worker,
+                      QStringLiteral("it took more than %1 MiB of memory").arg(m_settings.memoryLimit >> 20));
+}

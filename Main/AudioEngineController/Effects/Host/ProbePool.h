@@ -1,0 +1,99 @@
+#pragma once
+
+#include "Core/BaseLib/Process/WorkerGroup.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeChannel.h"
+
+#include <QElapsedTimer>
+
+#include <deque>
+#include <map>
+#include <set>
+#include <vector>
+
+/// Hears what a pool does, on the thread that runs it.
+class IPoolListener {
+public:
+    virtual ~IPoolListener() = default;
+
+    /// A worker begins with a job, or begins again with it.
+    virtual void jobBegins(std::size_t job, int worker) = 0;
+    virtual void stageEntered(std::size_t job, int worker, ProbeStage stage) = 0;
+    virtual void childBegins(std::size_t job, int worker, const EffectRecord &child) = 0;
+    virtual void childEnds(std::size_t job, int worker, const ProbeOutcome &outcome) = 0;
+    virtual void classBegins(std::size_t job, int worker, const QString &name) = 0;
+    virtual void classAnnounced() = 0;
+    /// What came of a job, in whatever order they end; each once, but those that a cancel left waiting.
+    virtual void jobEnds(std::size_t job, int worker, const ProbeOutcome &outcome) = 0;
+    /// A worker has ended, which comes after what became of its job.
+    virtual void workerEnds(int worker, const QString &reason) = 0;
+    /// True when no more jobs are to be begun.
+    virtual bool isCancelled() = 0;
+};
+
+/// Makes outcomes of jobs in worker processes, several at once. A plug-in that ends its worker, or gives no
+/// answer, costs nobody else anything: it is asked once more in a worker that asked nobody before it, and
+/// only what happens there is held against it.
+class ProbePool {
+public:
+    struct Settings {
+        QString program;                    ///< full path of the scanner, which is its own worker
+        int workers = 1;                    ///< at most so many at once
+        std::chrono::milliseconds limit{0}; ///< that a plug-in may be silent; 0: for ever
+        qint64 memoryLimit = 0;             ///< bytes of resident memory that a worker may hold; 0: any
+    };
+
+    explicit ProbePool(Settings settings);
+    ~ProbePool();
+
+    /// Runs the jobs, beginning with the first. Returns when all have ended, or some time after a cancel.
+    /// False, with the reason in the log, when no worker can be had: the jobs that did not end are left.
+    bool run(std::vector<ProbeJob> jobs, IPoolListener &listener);
+
+private:
+    /// A worker process, and what it does.
+    struct Worker {
+        ChannelReader reader;
+        bool isReady = false;
+        int probed = 0;                    ///< jobs that it has ended
+        std::optional<std::size_t> job;    ///< the one that it is busy with
+        ProbeOutcome outcome;              ///< of that one, as far as it came
+        int messages = 0;                  ///< about that one
+        std::optional<EffectRecord> child; ///< the sub-plug-in that is asked or closed
+        QString lastProbed;                ///< path of the job before
+        QElapsedTimer silent;              ///< since it last said something
+        qint64 freshMemory = 0;            ///< bytes of resident memory before its first job
+        QString endedFor;                  ///< why we ended it; empty: we did not
+        bool isOverdue = false;            ///< ended by us for want of an answer
+        bool isLeaving = false;            ///< ended by us; what it had to say was said
+    };
+    /// A job that waits for a worker.
+    struct Waiting {
+        std::size_t job;
+        bool needsFreshWorker;
+    };
+
+    bool isBusy() const;
+    void cancelJobs();
+    bool startWorkers();
+    void handOut();
+    void handOut(int number, Worker &worker, std::size_t index);
+    void take(const WorkerEvent &event);
+    void takeMessage(int number, Worker &worker, const ChannelMessage &message);
+    void finishJob(int number, Worker &worker, const ProbeOutcome &outcome);
+    void takeEnd(int number, const WorkerEnd &end);
+    void endOverdue();
+    void endOversized();
+    void endWorker(int number, Worker &worker, const QString &reason);
+    QString whySpent(int number, const Worker &worker, const ProbeOutcome &outcome) const;
+    QString describe(const Worker &worker, const WorkerEnd &end, int number) const;
+    void giveVerdict(std::size_t job, int number, const Worker &worker, const QString &reason);
+
+    const Settings m_settings;
+    WorkerGroup m_group;
+    std::map<int, Worker> m_workers;
+    std::deque<Waiting> m_waiting;
+    std::vector<ProbeJob> m_jobs; ///< with what must be left out by now
+    IPoolListener *m_listener = nullptr;
+    int m_failedStarts = 0;
+    QElapsedTimer m_sinceMemory; ///< since the workers' memory was looked at
+};
