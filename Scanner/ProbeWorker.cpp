@@ -1,6 +1,7 @@
 #include "Scanner/ProbeWorker.h"
 
 #include "Core/BaseLib/Binary/PluginLibrary.h"
+#include "Core/BaseLib/Process/CrashReport.h"
 #include "Core/BaseLib/Process/PluginThread.h"
 #include "Core/BaseLib/Process/ProcessSetup.h"
 #include "Core/BaseLib/Process/ProcessState.h"
@@ -106,6 +107,7 @@ void work(const ProbeJob &job, Teller &teller)
 {
     QElapsedTimer timer;
     timer.start();
+    CrashReport::setPlugin(job.path);
     const std::unique_ptr<IPluginProbe> probe = PluginHost::instance().host(job.format).makeProbe();
     ChannelMessage done;
     done.kind = Kind::Done;
@@ -129,7 +131,8 @@ int runProbeWorker()
     WorkerChannel channel;
     const PluginThread thread;
     AudioPlugins::setRegistry(&PluginHost::instance());
-    const ProcessState state;
+    CrashReport::install();
+    const ProcessState state; // after it: what plug-ins change comes back to this
     Teller teller(channel, state);
     teller.tell(Kind::Ready);
     ChannelReader reader;

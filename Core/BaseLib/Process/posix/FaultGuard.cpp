@@ -1,5 +1,7 @@
 #include "Core/BaseLib/Process/FaultGuard.h"
 
+#include "Core/BaseLib/Process/posix/CrashHandler.h"
+
 #include <csetjmp>
 #include <csignal>
 #include <cstddef>
@@ -68,13 +70,14 @@ quint32 codeOf(int signalNumber)
     }
 }
 
-void onFault(int signalNumber, siginfo_t *, void *)
+void onFault(int signalNumber, siginfo_t *info, void *context)
 {
     if (Guard *guard = t_innermost) {
         guard->code = codeOf(signalNumber);
         siglongjmp(guard->context, 1);
     }
     // No guard on this thread: end the process as usual.
+    describeCrash(signalNumber, info, context);
     std::signal(signalNumber, SIG_DFL);
     raise(signalNumber);
 }

@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/Host/ProbePool.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Process/CrashReport.h"
 
 #include <algorithm>
 
@@ -261,6 +262,7 @@ void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcom
     m_listener->jobEnds(job, number, outcome);
 }
 
+/// Why a worker ended, in words; what it told of a crash goes to the log.
 QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int number) const
 {
     const QString when = QLatin1String(stageText(worker.outcome.stage));
@@ -268,11 +270,19 @@ QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int numb
         return worker.endedFor + when;
     if (!end.crashed && end.code == kChannelLost)
         return QStringLiteral("it closed the channel of its worker") + when;
-    QString text = end.crashed
-                       ? QStringLiteral("it crashed%1: %2").arg(when, end.text)
-                       : QStringLiteral("it ended its process with exit code %1%2").arg(end.code).arg(when);
-    const QString printed = m_group.output(number).section(QLatin1Char('\n'), -1).trimmed();
-    return printed.isEmpty() ? text : text + QStringLiteral("; it printed: ") + printed;
+    QString printed = m_group.output(number);
+    const CrashReport crash = CrashReport::take(printed);
+    if (worker.job && !crash.frames.isEmpty())
+        DebugLog(L"%ls crashed at %ls", m_jobs[*worker.job].path, crash.frames.join(QStringLiteral(" < ")));
+    QString text;
+    if (!crash.summary.isEmpty())
+        text = QStringLiteral("it crashed%1: %2").arg(when, crash.summary);
+    else if (end.crashed)
+        text = QStringLiteral("it crashed%1: %2").arg(when, end.text);
+    else
+        text = QStringLiteral("it ended its process with exit code %1%2").arg(end.code).arg(when);
+    const QString last = printed.section(QLatin1Char('\n'), -1).trimmed();
+    return last.isEmpty() ? text : text + QStringLiteral("; it printed: ") + last;
 }
 
 /// What a worker was busy with when it ended is to blame, if it asked nobody before.
