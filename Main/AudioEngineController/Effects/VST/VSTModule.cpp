@@ -26,7 +26,6 @@ VSTLoadResult noEntryPoint()
 
 VSTLoadResult entryFailed(Status status, const QString &how)
 {
-    DebugLog(L"The VST plug-in's entry point %ls", how);
     return failed(status, QStringLiteral("its entry point ") + how);
 }
 
@@ -65,17 +64,12 @@ ModuleInspection VSTModule::inspect(const QString &path)
 
 VSTLoadResult VSTModule::load(const QString &path)
 {
-    if (!m_library.isLoaded() && !m_library.load(path)) {
-        DebugLog(L"Cannot load the module %ls: %ls", path, m_library.errorText());
+    if (!m_library.isLoaded() && !m_library.load(path))
         return failed(Status::NotLoaded, m_library.errorText());
-    }
     m_entryPoint = m_library.symbol(kEntryPoint);
     if (!m_entryPoint)
         m_entryPoint = m_library.symbol(kOldEntryPoint);
-    if (m_entryPoint)
-        return {};
-    DebugLog(L"The module %ls exports neither 'VSTPluginMain' nor 'main'", path);
-    return noEntryPoint();
+    return m_entryPoint ? VSTLoadResult() : noEntryPoint();
 }
 
 VSTLoadResult VSTModule::enter(VSTHostCallbackFunction callback, IVSTEffectOwner &owner)

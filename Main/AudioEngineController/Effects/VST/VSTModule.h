@@ -81,5 +81,5 @@ private:
     bool m_faulted = false;             ///< in the entry point, or in an effect that is closed
 };
 
-/// Logs that a plug-in of the catalogue could not be loaded.
+/// Logs that a plug-in of the catalogue could not be loaded; the reason is the caller's to tell.
 void logFailedLoad(const QString &path, const VSTLoadResult &result);

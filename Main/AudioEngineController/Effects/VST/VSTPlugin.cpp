@@ -42,6 +42,7 @@ bool VSTPlugin::load(const EffectRecord &record, VSTHostCallbackFunction callbac
     if (!result.isDone()) {
         if (result.status == VSTLoadResult::Status::EntryFailed)
             unload();
+        DebugLog(L"%ls: %ls", record.path, result.reason);
         logFailedLoad(record.path, result);
         return false;
     }

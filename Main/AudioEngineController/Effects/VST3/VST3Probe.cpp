@@ -122,8 +122,9 @@ EffectRecord describe(Vst::IComponent &component, const ClassInfo &info, const Q
 /// One module while it is listed.
 class ModuleListing {
 public:
-    ModuleListing(ProbeOutcome &outcome, IProbeObserver &observer)
-        : m_outcome(outcome)
+    ModuleListing(const QString &path, ProbeOutcome &outcome, IProbeObserver &observer)
+        : m_path(path)
+        , m_outcome(outcome)
         , m_observer(observer)
     {}
 
@@ -131,7 +132,7 @@ public:
     /// open. What the module throws ends the listing, and the classes listed so far stay. `factoryFound`
     /// becomes false when the module loaded but has no usable factory, and keeps the caller's value when it
     /// did not load. With `notifyEachClass`, or for a module of more than six classes, each is announced.
-    void listClasses(ClassListing &records, const QString &path, bool notifyEachClass, bool &factoryFound);
+    void listClasses(ClassListing &records, bool notifyEachClass, bool &factoryFound);
     /// Ends and unloads the module; true when it left threads running.
     bool close() { return m_module.close(); }
 
@@ -141,10 +142,10 @@ private:
     bool isNew(const ClassInfo &info) const { return info.isAudio && m_names.count(info.name) == 0; }
     void listClass(ClassListing &records, IPluginFactory &factory, const ClassInfo &info);
     void enter(ProbeStage stage);
-    /// The step that failed goes to the log, the cause into the outcome.
-    void fail(const VST3Failure &failure);
+    void fail(const QString &reason);
     void failClass(const QString &name, const char *what, tresult result);
 
+    const QString m_path;
     ProbeOutcome &m_outcome;
     IProbeObserver &m_observer;
     VST3Owned<VST3HostContext> m_hostContext = VST3HostContext::createOwned(nullptr); ///< outlives the module
@@ -153,13 +154,12 @@ private:
     std::set<QString> m_names; ///< of the classes met so far
 };
 
-void ModuleListing::listClasses(ClassListing &records, const QString &path, bool notifyEachClass,
-                                bool &factoryFound)
+void ModuleListing::listClasses(ClassListing &records, bool notifyEachClass, bool &factoryFound)
 {
     records.clear();
     try {
-        if (const auto failure = m_module.open(path)) {
-            fail(*failure);
+        if (const auto failure = m_module.open(m_path)) {
+            fail(failure->reason);
             return;
         }
         factoryFound = false;
@@ -167,7 +167,7 @@ void ModuleListing::listClasses(ClassListing &records, const QString &path, bool
         // Not around the loading as well: what passes the system's loader ends the process.
         callTranslated([&] { listFactory(records, notifyEachClass, factoryFound); });
     } catch (...) {
-        m_outcome.fail(thrownText());
+        fail(thrownText());
     }
 }
 
@@ -175,7 +175,7 @@ void ModuleListing::listFactory(ClassListing &records, bool notifyEachClass, boo
 {
     IPluginFactory *factory = nullptr;
     if (const auto failure = m_module.queryFactory(factory)) {
-        fail(*failure);
+        fail(failure->reason);
         return;
     }
     factoryFound = true;
@@ -225,19 +225,18 @@ void ModuleListing::enter(ProbeStage stage)
     m_observer.stageEntered(stage);
 }
 
-void ModuleListing::fail(const VST3Failure &failure)
+/// The outcome holds the first reason, which whoever reads it logs; the others go to the log here.
+void ModuleListing::fail(const QString &reason)
 {
-    DebugLog(L"%ls", failure.step);
-    m_outcome.fail(failure.reason);
+    if (!m_outcome.reason.isEmpty())
+        DebugLog(L"%ls: %ls", m_path, reason);
+    m_outcome.fail(reason);
 }
 
-/// A class that failed is left out; of several the outcome tells the first, the log all.
+/// A class that failed is left out.
 void ModuleListing::failClass(const QString &name, const char *what, tresult result)
 {
-    const QString reason =
-        formatText(L"its class \"%ls\" could not be %s (result 0x%08X)", name, what, result);
-    DebugLog(L"%ls", reason);
-    m_outcome.fail(reason);
+    fail(formatText(L"its class \"%ls\" could not be %s (result 0x%08X)", name, what, result));
 }
 
 ProbeOutcome::IfFailed ifFailed(const QString &path, bool factoryFound)
@@ -260,8 +259,8 @@ ProbeOutcome VST3Probe::run(const ProbeJob &job, IProbeObserver &observer)
         outcome.milliseconds = static_cast<double>(timer.nsecsElapsed()) / 1e6;
         return outcome;
     }
-    ModuleListing module(outcome, observer);
-    module.listClasses(outcome.records, job.path, job.announceClasses, factoryFound);
+    ModuleListing module(job.path, outcome, observer);
+    module.listClasses(outcome.records, job.announceClasses, factoryFound);
     outcome.leftThreads = module.close();
     for (EffectRecord &record : outcome.records) {
         record.path = job.path;
