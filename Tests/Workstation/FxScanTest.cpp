@@ -134,6 +134,7 @@ TEST_F(FxScan, EveryGoodOneIsListedAndEveryBadOneNamedWithItsReason)
                   "</Path>\n</Scan>\n");
     EXPECT_EQ(reason(first, "Empty3"), "it is empty");
     EXPECT_TRUE(first["scan"]["finished"].toBool());
+    EXPECT_GT(first["scan"]["slowest"][0]["milliseconds"].toDouble(), 0);
 
     const QByteArray csv = run({"--list", "--format", "csv"}).standardOutput;
     EXPECT_EQ(csv.count("\r\n"), 1 + static_cast<int>(states(first).size())) << csv.constData();

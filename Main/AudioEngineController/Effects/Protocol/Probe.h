@@ -45,7 +45,7 @@ struct ProbeOutcome {
     /// In the module's order, with path and file time. A sub-plug-in that failed or was left out has its name
     /// and identifier, and `working` is false; a file that failed as a whole has no record here.
     std::vector<EffectRecord> records;
-    double milliseconds = 0;  ///< from before the module was touched until it was unloaded
+    double milliseconds = 0;  ///< how long the job took; whoever runs the probe measures it
     bool leftThreads = false; ///< more threads run than before, and the module stays mapped
     bool leftModule = false;  ///< it stays mapped in its process although it was unloaded
     bool faulted = false;     ///< a call committed a hardware fault that was contained

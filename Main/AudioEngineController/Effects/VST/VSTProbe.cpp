@@ -6,8 +6,6 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTModule.h"
 
-#include <QElapsedTimer>
-
 #include <algorithm>
 #include <atomic>
 
@@ -201,8 +199,6 @@ void Run::closeEffect()
 
 ProbeOutcome VSTProbe::run(const ProbeJob &job, IProbeObserver &observer)
 {
-    QElapsedTimer timer;
-    timer.start();
     Run run(job, observer);
     try {
         run.ask();
@@ -210,6 +206,5 @@ ProbeOutcome VSTProbe::run(const ProbeJob &job, IProbeObserver &observer)
         run.outcome.fail(failureOf(error));
     }
     run.close();
-    run.outcome.milliseconds = static_cast<double>(timer.nsecsElapsed()) / 1e6;
     return run.outcome;
 }

@@ -10,8 +10,6 @@
 
 #include <pluginterfaces/vst/ivstaudioprocessor.h>
 
-#include <QElapsedTimer>
-
 #include <algorithm>
 #include <set>
 
@@ -250,15 +248,11 @@ ProbeOutcome::IfFailed ifFailed(const QString &path, bool factoryFound)
 
 ProbeOutcome VST3Probe::run(const ProbeJob &job, IProbeObserver &observer)
 {
-    QElapsedTimer timer;
-    timer.start();
     ProbeOutcome outcome;
     bool factoryFound = true;
     outcome.ifFailed = ifFailed(job.path, true);
-    if (!outcome.accept(VST3Module::inspect(job.path))) {
-        outcome.milliseconds = static_cast<double>(timer.nsecsElapsed()) / 1e6;
+    if (!outcome.accept(VST3Module::inspect(job.path)))
         return outcome;
-    }
     ModuleListing module(job.path, outcome, observer);
     module.listClasses(outcome.records, job.announceClasses, factoryFound);
     outcome.leftThreads = module.close();
@@ -268,6 +262,5 @@ ProbeOutcome VST3Probe::run(const ProbeJob &job, IProbeObserver &observer)
     }
     outcome.status = outcome.records.empty() ? ProbeStatus::Failed : ProbeStatus::Listed;
     outcome.ifFailed = ifFailed(job.path, factoryFound);
-    outcome.milliseconds = static_cast<double>(timer.nsecsElapsed()) / 1e6;
     return outcome;
 }
