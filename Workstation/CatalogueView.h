@@ -33,7 +33,7 @@ struct CataloguedPlugin {
 
     PluginState state() const;
     /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
-    bool hasWidth() const { return format->catalogue->marker.hasSubId; }
+    bool hasWidth() const { return format->catalogue->hasWidth; }
     bool isUsable() const { return record.working && !isOfCrashedFile && !isAway; }
     /// The categories' names, else what the plug-in says of itself.
     QStringList categories() const;

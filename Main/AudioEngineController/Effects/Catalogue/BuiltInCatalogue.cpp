@@ -8,8 +8,14 @@ const CatalogueFormat &builtInEffectsFormat()
     static const CatalogueElement writtenMask = {kCategoryMask.name, nullptr, kCategoryMask.content};
     // There are no files whose times could be read: no version, not even a negative one, is upgraded.
     constexpr double kEveryVersion = -std::numeric_limits<double>::infinity();
-    static const CatalogueFormat format = {
-        "/TesselFXConfiguration.xml",  "1.2", false, kEveryVersion, kEveryVersion, {},
-        {kId, kFavourite, writtenMask}};
+    static const CatalogueFormat format = {"/TesselFXConfiguration.xml",
+                                           "1.2",
+                                           false,
+                                           kEveryVersion,
+                                           kEveryVersion,
+                                           KnownList::Identity::Identifier,
+                                           false, // no channels at all
+                                           {},
+                                           {kId, kFavourite, writtenMask}};
     return format;
 }

@@ -2,6 +2,7 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/Catalogue/ElementContent.h"
+#include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
 
 #include <QByteArray>
 
@@ -32,6 +33,10 @@ struct CatalogueFormat {
     bool versionRequired;        ///< a file without a version yields no records; otherwise it counts as 1.0
     double fileTimesTrustedFrom; ///< files of earlier versions carry time stamps of another form
     double categoryMasksFrom;    ///< in files of earlier versions the mask is not one yet
+    /// What tells the plug-ins of one file apart.
+    KnownList::Identity identity;
+    /// A record tells the output channels, as the width; otherwise the input channels, if any.
+    bool hasWidth;
     MarkerFormat marker;
     std::vector<CatalogueElement> elements;
 };

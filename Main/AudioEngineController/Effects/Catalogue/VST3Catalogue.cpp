@@ -36,6 +36,8 @@ const CatalogueFormat &vst3CatalogueFormat()
         false,
         1.1,
         std::numeric_limits<double>::lowest(), // masks in every version
+        KnownList::Identity::Identifier,
+        false, // the input channels
         {".scan3", false, false},
         {kPath,
          kFileTime,

@@ -44,6 +44,8 @@ const CatalogueFormat &vstCatalogueFormat()
         true, // a file that states no version is older than any that can be read
         1.4,
         1.3,
+        KnownList::Identity::SubPlugin,
+        true, // the output channels
         {".scan", true, true},
         {kPath,
          kFileTime,

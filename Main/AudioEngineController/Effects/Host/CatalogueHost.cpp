@@ -25,8 +25,7 @@ bool looksLikeIdentifier(const QString &name)
 
 CatalogueHost::CatalogueHost(PluginFormat format)
     : m_info(formatInfo(format))
-    , m_known(m_info.catalogue->marker.hasSubId ? KnownList::Identity::SubPlugin
-                                                : KnownList::Identity::Identifier)
+    , m_known(m_info.catalogue->identity)
 {}
 
 QString CatalogueHost::cataloguePath() const
