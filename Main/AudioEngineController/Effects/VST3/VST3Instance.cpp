@@ -34,17 +34,12 @@ bool VST3Instance::create(IPluginFactory *factory, const FUID &classId, VST3Host
 
 bool VST3Instance::startComponent(IPluginFactory *factory, const FUID &classId, VST3HostContext &context)
 {
-    tresult result = kResultOk;
-    auto *const component = createObject<Vst::IComponent>(factory, classId, result);
-    if (!component) {
-        DebugLog(L"The component could not be created: 0x%08X", result);
-        return false;
-    }
-    component->setIoMode(Vst::kAdvanced);
-    result = component->initialize(context.unknown());
-    if (result != kResultOk) {
-        // Neither terminated nor released: a component that could not start is not called again.
-        DebugLog(L"The component could not be initialised: 0x%08X", result);
+    QString reason;
+    auto *const component = createObject<Vst::IComponent>(factory, classId, reason);
+    if (component)
+        component->setIoMode(Vst::kAdvanced);
+    if (!component || !initialise(*component, context.unknown(), reason)) {
+        DebugLog(L"The component %ls", reason);
         return false;
     }
     m_component = component;
@@ -68,17 +63,12 @@ void VST3Instance::findController(IPluginFactory *factory, VST3HostContext &cont
 void VST3Instance::startOwnController(IPluginFactory *factory, VST3HostContext &context)
 {
     TUID classId = {};
-    tresult result = m_component->getControllerClassId(classId);
-    if (result != kResultOk)
+    if (m_component->getControllerClassId(classId) != kResultOk)
         return; // a plug-in without parameters needs none
-    auto *const controller = createObject<Vst::IEditController>(factory, FUID::fromTUID(classId), result);
-    if (!controller) {
-        DebugLog(L"The edit controller could not be created: 0x%08X", result);
-        return;
-    }
-    result = controller->initialize(context.unknown());
-    if (result != kResultOk) {
-        DebugLog(L"The edit controller could not be initialised: 0x%08X", result); // as for a component
+    QString reason;
+    auto *const controller = createObject<Vst::IEditController>(factory, FUID::fromTUID(classId), reason);
+    if (!controller || !initialise(*controller, context.unknown(), reason)) {
+        DebugLog(L"The edit controller %ls", reason);
         return;
     }
     m_controller = controller;

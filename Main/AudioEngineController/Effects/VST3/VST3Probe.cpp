@@ -141,7 +141,6 @@ private:
     void listClass(ClassListing &records, IPluginFactory &factory, const ClassInfo &info);
     void enter(ProbeStage stage);
     void fail(const QString &reason);
-    void failClass(const QString &name, const char *what, tresult result);
 
     const QString m_path;
     ProbeOutcome &m_outcome;
@@ -198,16 +197,10 @@ void ModuleListing::listClass(ClassListing &records, IPluginFactory &factory, co
 {
     m_names.insert(info.name);
     m_observer.classBegins(info.name);
-    tresult result = kResultOk;
-    auto *const component = createObject<Vst::IComponent>(&factory, info.id, result);
-    if (!component) {
-        failClass(info.name, "created", result);
-        return;
-    }
-    result = component->initialize(m_hostContext->unknown());
-    if (result != kResultOk) {
-        failClass(info.name, "initialised",
-                  result); // neither terminated nor released: it is not called again
+    QString reason;
+    auto *const component = createObject<Vst::IComponent>(&factory, info.id, reason);
+    if (!component || !initialise(*component, m_hostContext->unknown(), reason)) {
+        fail(QStringLiteral("its class \"%1\" %2").arg(info.name, reason)); // it is left out
         return;
     }
     records.push_back(describe(*component, info, m_factoryVendor));
@@ -229,12 +222,6 @@ void ModuleListing::fail(const QString &reason)
     if (!m_outcome.reason.isEmpty())
         DebugLog(L"%ls: %ls", m_path, reason);
     m_outcome.fail(reason);
-}
-
-/// A class that failed is left out.
-void ModuleListing::failClass(const QString &name, const char *what, tresult result)
-{
-    fail(formatText(L"its class \"%ls\" could not be %s (result 0x%08X)", name, what, result));
 }
 
 ProbeOutcome::IfFailed ifFailed(const QString &path, bool factoryFound)

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Core/BaseLib/Log/FormatText.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
 
 #include <QString>
@@ -63,12 +64,24 @@ inline QString vendorOf(Steinberg::IPluginFactory &factory)
 }
 
 /// Has a factory make an object of a class, with one reference for the caller; null when it gives none, with
-/// its answer in `result`.
+/// the reason: "could not be created".
 template <typename Interface>
-Interface *createObject(Steinberg::IPluginFactory *factory, const Steinberg::FUID &classId,
-                        Steinberg::tresult &result)
+Interface *createObject(Steinberg::IPluginFactory *factory, const Steinberg::FUID &classId, QString &reason)
 {
     void *made = nullptr;
-    result = factory->createInstance(classId.toTUID(), Interface::iid, &made);
-    return result == Steinberg::kResultOk ? static_cast<Interface *>(made) : nullptr;
+    const Steinberg::tresult result = factory->createInstance(classId.toTUID(), Interface::iid, &made);
+    if (result == Steinberg::kResultOk && made)
+        return static_cast<Interface *>(made);
+    reason = formatText(L"could not be created (result 0x%08X)", result);
+    return nullptr;
+}
+
+/// Initialises an object; false when it refuses, with the reason: "could not be initialised". Such an object
+/// is not called again: it is neither terminated nor released.
+inline bool initialise(Steinberg::IPluginBase &object, Steinberg::FUnknown *context, QString &reason)
+{
+    const Steinberg::tresult result = object.initialize(context);
+    if (result != Steinberg::kResultOk)
+        reason = formatText(L"could not be initialised (result 0x%08X)", result);
+    return result == Steinberg::kResultOk;
 }

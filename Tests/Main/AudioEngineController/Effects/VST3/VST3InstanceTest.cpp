@@ -76,8 +76,9 @@ TEST_F(VST3InstanceTest, FailuresHaveTheirLinesAndLeaveTheObjectUsable)
         {"", noFactory, kId, VST3Fixture::NoEntry},
         {"answer module-entry false", noModule + m_folder.plugins()},
         {"", "'0x112233445566778899AABBCCDDEEFF' is not a class", "0x112233445566778899AABBCCDDEEFF"},
-        {"answer create-instance null", "The component could not be created: 0x00000000"},
-        {"controller self\nanswer initialize false", "The component could not be initialised: 0x00000001"},
+        {"answer create-instance null", "The component could not be created (result 0x00000000)"},
+        {"controller self\nanswer initialize false",
+         "The component could not be initialised (result 0x00000001)"},
         {"fault initialize throw-std", "thrown by the fixture"},
         {kPanel + "fault connect throw-std Panel", "thrown by the fixture"}};
     for (const auto &row : cases) {
