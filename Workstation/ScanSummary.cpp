@@ -68,7 +68,7 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
         if (probe.reason.isEmpty() || recorded.count({key.format, key.path}) != 0)
             continue;
         // Nobody takes what lies in a bundle of the other format for a plug-in of this one.
-        if (probe.noPlugin && key.path.contains(QLatin1String(".vst3/Contents/"), Qt::CaseInsensitive))
+        if (probe.noPlugin && !bundleOf(key.path).isEmpty())
             continue;
         const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;
         (probe.noPlugin ? summary.noPlugins : summary.failures)

@@ -51,6 +51,14 @@ const PluginFormatInfo *formatOfKey(const QString &key)
     return find([&](const PluginFormatInfo &info) { return key == QLatin1String(info.key); });
 }
 
+QString bundleOf(const QString &path)
+{
+    static const QString ending = formatInfo(PluginFormat::Vst3).moduleEnding;
+    static const QString boundary = ending + QLatin1String(kBundleContents) + QLatin1Char('/');
+    const int place = path.lastIndexOf(boundary, -1, Qt::CaseInsensitive);
+    return place < 0 ? QString() : path.left(place + ending.size());
+}
+
 PluginFormat formatOfPrefix(const QString &prefix)
 {
     const PluginFormatInfo *const info = infoOfPrefix(prefix);

@@ -42,6 +42,11 @@ const PluginFormatInfo &formatInfo(PluginFormat format);
 /// The format of that key; null for a key that the table does not have.
 const PluginFormatInfo *formatOfKey(const QString &key);
 
+/// The folder of a VST 3 bundle that holds all of it, appended to the bundle's path.
+inline constexpr char kBundleContents[] = "/Contents";
+/// The path of the VST 3 bundle in whose contents a file lies, the innermost one; empty when it lies in none.
+QString bundleOf(const QString &path);
+
 /// The format that a prefix names; the prefix is compared whole and case-sensitively.
 PluginFormat formatOfPrefix(const QString &prefix);
 /// The identifier's part up to and with its first ":"; empty when it has none.

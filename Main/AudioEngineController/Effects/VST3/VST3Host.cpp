@@ -16,8 +16,8 @@ QString VST3Host::moduleTime(const QString &path) const { return VST3ModuleFile:
 
 QString VST3Host::moduleFolder(const QString &path) const
 {
-    const int bundle = path.lastIndexOf(QLatin1String(".vst3/Contents/"), -1, Qt::CaseInsensitive);
-    return CatalogueHost::moduleFolder(bundle < 0 ? path : path.left(bundle));
+    const QString bundle = bundleOf(path);
+    return CatalogueHost::moduleFolder(bundle.isEmpty() ? path : bundle);
 }
 
 QString VST3Host::displayName(const QString &path) const

@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
 #include "Core/BaseLib/Files/FolderListing.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <QRegularExpression>
 
@@ -20,15 +21,20 @@ QStringList otherMachines(const FolderContent &contents, const QString &path)
 
 } // namespace
 
-QString VST3ModuleFile::whyNoBinary(const QString &bundle, const QString &folder)
+QString VST3ModuleFile::machineFolder(const QString &bundle, const char *machine)
 {
-    const QString path = bundle + QLatin1String("/Contents");
+    return bundle + QLatin1String(kBundleContents) + QLatin1Char('/') + QLatin1String(machine);
+}
+
+QString VST3ModuleFile::whyNoBinary(const QString &bundle, const char *machine)
+{
+    const QString path = bundle + QLatin1String(kBundleContents);
     const FolderContent contents = listFolder(path);
-    for (const QString &problem : {contents.problem, listFolder(path + QLatin1Char('/') + folder).problem})
+    for (const QString &problem : {contents.problem, listFolder(machineFolder(bundle, machine)).problem})
         if (!problem.isEmpty())
             return QStringLiteral("its folder Contents cannot be searched: ") + problem;
     const QStringList machines = otherMachines(contents, path);
     if (!machines.isEmpty())
         return QStringLiteral("the bundle has modules for %1 only").arg(machines.join(QLatin1String(", ")));
-    return QStringLiteral("the bundle has no module in Contents/") + folder;
+    return QStringLiteral("the bundle has no module in Contents/") + QLatin1String(machine);
 }

@@ -11,9 +11,10 @@ namespace VST3ModuleFile {
 bool isModule(const QString &path);
 /// The file to load for a module's path; empty, with a reason, when the bundle holds none for this platform.
 QString binary(const QString &path, QString &reason);
-/// Why a bundle holds no module in this folder of its "Contents": what it holds instead, or the system's
-/// words.
-QString whyNoBinary(const QString &bundle, const QString &folder);
+/// The folder of a bundle that holds the module for a machine ("x86_64-linux").
+QString machineFolder(const QString &bundle, const char *machine);
+/// Why a bundle holds no module for a machine: what it holds instead, or the system's words.
+QString whyNoBinary(const QString &bundle, const char *machine);
 /// The time stamp of the file that an update of the module replaces.
 QString fileTime(const QString &path);
 /// Calls the module's start function, if it exports one. False when the function reports failure.

@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
 #include "Core/BaseLib/Files/FileTime.h"
-#include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <QDir>
 #include <QFileInfo>
@@ -10,7 +10,6 @@ namespace {
 
 // Bundle layout, module name and entry functions are those of the VST 3 documentation, "Plug-in format
 // structure" (Linux).
-constexpr char kBinaryFolder[] = "/Contents/x86_64-linux";
 constexpr char kMachine[] = "x86_64-linux";
 
 using EntryFunction = bool (*)(void *libraryHandle);
@@ -19,8 +18,8 @@ using ExitFunction = bool (*)();
 /// The module in a bundle that is as it should be.
 QString usualBinary(const QString &bundle)
 {
-    return bundle + QLatin1String(kBinaryFolder) + QLatin1Char('/') + QFileInfo(bundle).completeBaseName() +
-           QLatin1String(".so");
+    return VST3ModuleFile::machineFolder(bundle, kMachine) + QLatin1Char('/') +
+           QFileInfo(bundle).completeBaseName() + QLatin1String(".so");
 }
 
 /// The path, unless what it leads to exists and is not a regular file: reading a pipe would block.
@@ -38,21 +37,21 @@ QString unlessSpecial(const QString &path, QString &reason)
 bool VST3ModuleFile::isModule(const QString &path)
 {
     // A bundle for several systems holds another system's module, which bears the same ending.
-    return !path.contains(QLatin1String(".vst3/Contents/"), Qt::CaseInsensitive);
+    return bundleOf(path).isEmpty();
 }
 
 QString VST3ModuleFile::binary(const QString &path, QString &reason)
 {
     if (!QFileInfo(path).isDir())
         return unlessSpecial(path, reason);
-    const QString folder = path + QLatin1String(kBinaryFolder);
+    const QString folder = machineFolder(path, kMachine);
     const QString usual = usualBinary(path);
     if (QFileInfo::exists(usual))
         return unlessSpecial(usual, reason);
     const QStringList found = QDir(folder).entryList({QStringLiteral("*.so")}, QDir::Files);
     if (found.size() == 1)
         return folder + QLatin1Char('/') + found.first();
-    reason = found.isEmpty() ? whyNoBinary(path, QLatin1String(kMachine))
+    reason = found.isEmpty() ? whyNoBinary(path, kMachine)
                              : QStringLiteral("the bundle has several modules and none of its own name");
     return QString();
 }

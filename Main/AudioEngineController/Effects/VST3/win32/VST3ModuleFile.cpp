@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
 #include "Core/BaseLib/Files/FileTime.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <pluginterfaces/base/ftypes.h>
 
@@ -11,14 +12,13 @@ namespace {
 
 // Bundle layout, module name and entry functions are those of the VST 3 documentation, "Plug-in format
 // structure" (Windows).
-constexpr char kContents[] = ".vst3/Contents/";
-constexpr char kBinaryFolder[] = "x86_64-win/";
+constexpr char kMachine[] = "x86_64-win";
 
 using EntryFunction = bool(PLUGIN_API *)();
 
 bool holdsModuleForUs(const QString &bundle)
 {
-    const QDir folder(bundle + QLatin1String("/Contents/") + QLatin1String(kBinaryFolder));
+    const QDir folder(VST3ModuleFile::machineFolder(bundle, kMachine));
     return !folder.entryList({QStringLiteral("*.vst3")}, QDir::Files).isEmpty();
 }
 
@@ -26,11 +26,9 @@ bool holdsModuleForUs(const QString &bundle)
 
 bool VST3ModuleFile::isModule(const QString &path)
 {
-    const int contents = path.lastIndexOf(QLatin1String(kContents), -1, Qt::CaseInsensitive);
-    if (contents >= 0) { // beside ours, a bundle may hold the modules of other systems and machines
-        const QString inside = path.mid(contents + static_cast<int>(sizeof kContents) - 1);
-        return inside.startsWith(QLatin1String(kBinaryFolder), Qt::CaseInsensitive);
-    }
+    const QString bundle = bundleOf(path);
+    if (!bundle.isEmpty()) // beside ours, it may hold the modules of other systems and machines
+        return path.startsWith(machineFolder(bundle, kMachine) + QLatin1Char('/'), Qt::CaseInsensitive);
     // The search enters a bundle and finds the module inside.
     return !QFileInfo(path).isDir() || !holdsModuleForUs(path);
 }
@@ -39,7 +37,7 @@ QString VST3ModuleFile::binary(const QString &path, QString &reason)
 {
     if (!QFileInfo(path).isDir())
         return path;
-    reason = whyNoBinary(path, QStringLiteral("x86_64-win"));
+    reason = whyNoBinary(path, kMachine);
     return QString();
 }
 
