@@ -16,6 +16,22 @@ std::string describe(quint32 code)
 
 } // namespace
 
+QString FaultCode::name(quint32 code)
+{
+    switch (code) {
+    case kAccessViolation:
+        return QStringLiteral("invalid memory access");
+    case kIllegalInstruction:
+        return QStringLiteral("illegal instruction");
+    case kIntegerDivideByZero:
+        return QStringLiteral("division by zero");
+    case kStackOverflow:
+        return QStringLiteral("stack overflow");
+    default:
+        return QString();
+    }
+}
+
 SEException::SEException(quint32 code)
     : std::runtime_error(describe(code))
     , m_code(code)

@@ -12,6 +12,9 @@ inline constexpr quint32 kAccessViolation = 0xC0000005;
 inline constexpr quint32 kIllegalInstruction = 0xC000001D;
 inline constexpr quint32 kIntegerDivideByZero = 0xC0000094;
 inline constexpr quint32 kStackOverflow = 0xC00000FD;
+
+/// For people: "invalid memory access"; empty for other codes than these.
+QString name(quint32 code);
 } // namespace FaultCode
 
 /// A hardware fault in guarded code, as an ordinary exception: "SE Exception: " with "Access

@@ -162,30 +162,22 @@ bool startProcess(Worker &worker, const std::wstring &program, std::wstring comm
     return false;
 }
 
-/// What the status of a crash means; null when it has no name here.
-const wchar_t *nameOf(DWORD status)
+/// What the status of a crash means; empty when it has no name here.
+QString nameOf(DWORD status)
 {
     switch (status) {
-    case FaultCode::kAccessViolation:
-        return L"access violation";
-    case FaultCode::kIllegalInstruction:
-        return L"illegal instruction";
-    case FaultCode::kIntegerDivideByZero:
-        return L"division by zero";
-    case FaultCode::kStackOverflow:
-        return L"stack overflow";
     case 0x80000003:
-        return L"breakpoint";
+        return QStringLiteral("breakpoint");
     case 0xC0000374:
-        return L"heap corruption";
+        return QStringLiteral("heap corruption");
     case 0xC0000409:
-        return L"failed security check";
+        return QStringLiteral("failed security check");
     case 0xE06D7363:
-        return L"unhandled C++ exception";
+        return QStringLiteral("unhandled C++ exception");
     case kEndedByUs:
-        return L"ended from outside";
+        return QStringLiteral("ended from outside");
     default:
-        return nullptr;
+        return FaultCode::name(status);
     }
 }
 
@@ -195,11 +187,11 @@ WorkerEnd endOf(HANDLE process)
     GetExitCodeProcess(process, &status);
     WorkerEnd end;
     end.code = static_cast<int>(status);
-    const wchar_t *name = nameOf(status);
+    const QString name = nameOf(status);
     // A status of the kind "error"; the bit that is always clear in one tells it from a negative exit code.
-    end.crashed = (status & 0xD0000000) == 0xC0000000 || name;
+    end.crashed = (status & 0xD0000000) == 0xC0000000 || !name.isEmpty();
     if (end.crashed)
-        end.text = formatText(L"%ls (0x%08lX)", name ? name : L"exception", status);
+        end.text = formatText(L"%ls (0x%08lX)", name.isEmpty() ? QStringLiteral("exception") : name, status);
     return end;
 }
 

@@ -29,21 +29,10 @@ VSTLoadResult entryFailed(Status status, const QString &how)
     return failed(status, QStringLiteral("its entry point ") + how);
 }
 
-/// What a hardware fault is for people.
 QString inWords(const SEException &fault)
 {
-    switch (fault.code()) {
-    case FaultCode::kAccessViolation:
-        return QStringLiteral("invalid memory access");
-    case FaultCode::kIllegalInstruction:
-        return QStringLiteral("invalid instruction");
-    case FaultCode::kIntegerDivideByZero:
-        return QStringLiteral("division by zero");
-    case FaultCode::kStackOverflow:
-        return QStringLiteral("stack overflow");
-    default:
-        return formatText(L"fault 0x%08X", fault.code());
-    }
+    const QString name = FaultCode::name(fault.code());
+    return name.isEmpty() ? formatText(L"fault 0x%08X", fault.code()) : name;
 }
 
 VSTLoadResult invalidEffect()
