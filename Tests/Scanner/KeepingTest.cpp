@@ -132,7 +132,7 @@ scan
 mark A Favourite 1
 move Plugins/a/Comp.vst3 Plugins/f/Comp.vst3
 put z/Slow.vst3: fault initialize hang
-stop Slow
+during Slow: kill
 vst3 Name Path Favourite: A|f/Comp.vst3|1
 scan
 vst3 Name Path Favourite Enabled: A|f/Comp.vst3|1|1, Slow|z/Slow.vst3|0|0

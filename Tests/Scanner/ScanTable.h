@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Tests/Support/PlatformValues.h"
 #include "Tests/Support/ScanBench.h"
 #include "Tests/Support/VST2Fixture.h"
 #include "Workstation/Retry.h"
@@ -16,17 +17,18 @@
 //   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated; "#1" is an id
 //   write FILE: TEXT; remove FILE; move FILE FILE (or folder); holds FILE: TEXT
 //   link FILE FILE                where it lies and where it leads; where there are links
-//   short FILE BYTES              ends a file after so many and dates it as updated
+//   short FILE BYTES              ends a file after so many and dates it as updated; date FILE TIME
 //   folders FOLDER…               what the scan list names
 //   mark NAME ELEMENT VALUE       as the user does
 //   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
 //   scan [N]                      until no marker survives, which takes N runs (1)
-//   stop MODULE                   a scan that is ended by force while the module is initialised
-//   retry NAME                    has it asked again; exit N is how the last run ended
+//   during MODULE: STEP           a scan, and a step while the module is initialised; kill ends it by force
+//   run                           one run, however it ends; exit N and markers NAME… say how it ended
+//   retry NAME                    has it asked again
 //   double FILE                   appends a catalogue's records once more, as of another folder
 //   same                          a scan that loads nothing and writes nothing
-//   loaded MODULE…                what the scan loaded, in order
-//   log: TEXT                     what its log holds
+//   loaded MODULE…                what the scan loaded, in order; closed MODULE: CALL, CALL
+//   log: TEXT                     what its log holds; readable FILE, for everybody
 //   vst3, vst2 ELEMENTS: ROW, ROW what the catalogue lists, in any order
 struct ScanCase {
     std::string name;
@@ -85,7 +87,11 @@ private:
             {"short", [&] { cutShort(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
             {"move", [&] { move(spelt(file).split(' ')); }},
             {"double", [&] { doubleRecords(file); }},
-            {"stop", [&] { stopDuring(file); }},
+            {"date", [&] { date(file.section(' ', 0, -2), file.section(' ', -1) + ':' + text); }},
+            {"during", [&] { during(file, step.section(": ", 1)); }},
+            {"readable", [&] { EXPECT_TRUE(QFile::permissions(m_folder.path(file)) & QFile::ReadOther); }},
+            {"closed",
+             [&] { EXPECT_EQ(traceOf(file).filter(QRegularExpression("^close|destr")).join(", "), text); }},
             {"retry", [&] { EXPECT_TRUE(retryPlugins(m_folder.effects(), {file}, {}).unknown.isEmpty()); }},
             {"exit", [&] { EXPECT_EQ(m_last.exitCode, file.toInt()); }},
             {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
@@ -106,12 +112,18 @@ private:
 
     QString resolved(QString text) const
     {
-        return text.replace('@', m_folder.dataFolder()).replace(".vst2<", vst2Ending() + '<');
+        return text.replace('@', m_folder.dataFolder())
+            .replace(QRegularExpression("\\.vst2\\b"), vst2Ending());
     }
-    static QString spelt(QString file) { return file.replace(".vst2", vst2Ending()); }
+    static QString spelt(QString file)
+    {
+        const QString path = QString(kBundlePath).replace("%1", "\\1");
+        return file.replace(".vst2", vst2Ending()).replace(QRegularExpression("(\\w+)\\.bundle"), path);
+    }
     static QByteArray script(QString statements)
     {
-        statements.replace(QRegularExpression("#(\\d)"), "id " + QString(31, '0') + "\\1");
+        statements.replace('%', kForeignLocale)
+            .replace(QRegularExpression("#(\\d)"), "id " + QString(31, '0') + "\\1");
         return QString(statements + '\n').replace(" | ", "\n").toUtf8();
     }
     void move(const QStringList &paths) const
@@ -128,13 +140,17 @@ private:
         m_folder.write(file,
                        text.insert(end, text.mid(start, end - start).replace("/Plugins/", "/Plugins/was/")));
     }
-    void stopDuring(const QString &module) const
+    void during(const QString &module, const QString &step)
     {
         forgetTrace();
         ScannerRun scanner(scannerProgram(), m_folder);
         EXPECT_TRUE(scanner.start() && waitForStage(scanner, module, "initialize"));
-        scanner.kill();
-        scanner.wait();
+        step == "kill" ? scanner.kill() : carryOut(step);
+        m_last = scanner.wait();
+    }
+    void date(const QString &file, const QString &time) const
+    {
+        m_folder.setModified(spelt(file), QDateTime::fromString(time, Qt::ISODate));
     }
     void link(const QString &place, const QString &target)
     {
@@ -180,7 +196,9 @@ private:
     }
     void expectRecords(const char *file, const QString &elements, const QString &rows) const
     {
-        QStringList found = recordsOf(file, elements.toUtf8()), expected = spelt(rows).split(", ");
+        const QStringList ofSystems = spelt(rows).split(" / ");
+        QStringList found = recordsOf(file, elements.toUtf8());
+        QStringList expected = ofSystems.value(kSystemsPlace, ofSystems.first()).split(", ");
         found.replaceInStrings(m_folder.plugins() + '/', "");
         found.sort();
         expected.sort();

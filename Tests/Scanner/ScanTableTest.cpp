@@ -312,12 +312,139 @@ loaded Comp
 vst3 Name: A
 same
 
+= A renamed class keeps its marks and what is switched off is not asked
+put Comp.vst3: class Liked | #1 | class Gone
+put Off.vst3:
+scan
+mark Liked Favourite 1
+mark Liked CategoryMask 16384
+mark Off Enabled 0
+new Comp.vst3: class New | subcategories Fx|EQ | class Renamed | subcategories Fx|EQ | #1
+new Off.vst3: class Changed
+scan
+loaded Comp
+vst3 Name FileTime CategoryMask Favourite Enabled: New|2022-03-04 05:06|16|0|1, Renamed|2022-03-04 05:06|16384|1|1, Off|2021-03-04 05:06|0|0|0
+same
+
+= A WaveShell that crashed is left alone for one run and an empty one keeps its records
+put WaveShell1.vst3: class W | fault initialize kill
+put a Healthy.vst3:
+run
+markers WaveShell1.scan3
+scan
+loaded .
+vst3 Name: a Healthy
+run
+loaded WaveShell1
+put WaveShell1.vst3: class W
+scan
+scan
+new WaveShell1.vst3: class W | category None
+scan
+scan
+loaded WaveShell1
+vst3 Name Enabled Working: W|1|1, a Healthy|1|1
+
+= Bundles are found under all sorts of names
+put Several.bundle:
+write Plugins/Several.vst3/Contents/aarch64-other/Several.so: for another system
+put Before.bundle:
+move Plugins/Before.vst3 Plugins/After.vst3
+put Loud.bundle:
+move Plugins/Loud.vst3 Plugins/Loud.VST3
+scan
+vst3 Name Working: Before|1, Loud|1, Several|1
+same
+
+= A bundle has the time of its module
+put Usual.bundle:
+scan
+write Plugins/Usual.vst3/Contents/moduleinfo.json: {}
+same
+new Usual.bundle:
+scan
+loaded Usual
+vst3 Path FileTime: Usual.bundle|2022-03-04 05:06
+
+= What a plug-in changes is put back
+put A.vst2: effect entry umask 077 | effect entry locale % | effect entry chdir / | effect entry rounding up
+put B.vst2: id 2 | effect entry signal segv | effect entry signal term | effect entry alarm 1
+put C.vst2: id 3 | effect get-vendor-string umask 077 | effect get-vendor-string locale %
+put D.vst2: id 4 | effect get-vendor-string signal term | effect get-vendor-string alarm 1
+put E.vst2: id 5 | effect get-effect-name signal segv | fault get-vendor-string segv
+put F.vst2: id 6 | effect entry thread
+put G.vst2: id 7 | own-thread | ask-host entry 1 from-thread | ask-host get-vendor-string 7 until-close
+scan
+vst2 Name Working: A|1, B|1, C|1, D|1, E|1, F|1, G|1
+log: F.vst2 left threads running and stays in memory
+readable Effects/FXConfiguration.xml
+same
+
+= Every child of a shell is listed and every effect closed
+put Shell.vst2: child 1 One | child 2 Two | child 0x80000003 Three
+put Twice.vst2: child 1 A | child 2 B | answer entry null 2 | after-children repeat
+scan
+loaded Shell Twice
+vst2 Name ID Working: A|A:1|1, B|B|0, One|One:1|1, Three|Three:-2147483645|1, Two|Two:2|1
+closed Shell: close Three, close Two, close One, close Shell, static-destructor
+same
+
+= A deadly child disables only itself until its shell changes
+put WaveShell1-VST 9.3_x64.vst2: child 1 One | child 2 Two | child 0x80000003 Three | fault entry kill 2
+scan 2
+vst2 Name ID Enabled Working: One|One:1|1|1, Three|Three:-2147483645|1|1, Two|Two|0|0
+same
+mark One Favourite 1
+mark Three Enabled 0
+new WaveShell1-VST 9.3_x64.vst2: child 1 One | child 2 Two | child 0x80000003 Three
+scan
+vst2 Name Enabled Working Favourite: One|1|1|1, Three|0|1|0, Two|1|1|0
+
+= A child of its shell's name leaves the shell's marker alone
+put Shell.vst2: child 1 Shell | child 2 "../../Up" | fault static-destructor kill
+scan 2
+vst2 Name Enabled Working: Shell|0|0
+
+= Files of any date are asked once and those touched within a minute are not
+put Old.vst3:
+put New.vst2:
+put Touched.vst3:
+date Plugins/Old.vst3 1970-01-02T00:00:00
+date Plugins/New.vst2 2099-12-31T23:59:59
+scan
+vst3 Name FileTime: Old|1970-01-02 00:00, Touched|2021-03-04 05:06
+vst2 Name FileTime: New|2099-12-31 23:59
+date Plugins/Touched.vst3 2021-03-04T05:06:59
+same
+
+= Names that differ only in case are those of two files where the system says so
+put Comp.vst3: class A
+put comp.vst3: class B
+put Echo.vst2: name C
+put echo.vst2: name D | id 2
+scan
+vst3 Name: A, B / B
+vst2 Name: C, D / D
+same
+
+= Folders that change during a scan
+put a/Slow.vst3: delay initialize 400
+put b/Gone.vst3:
+put b/Gone.vst2:
+during Slow: move Plugins/b Plugins/c
+write Plugins/b/other: x
+scan
+loaded Gone Gone
+vst3 Path Working: a/Slow.vst3|1, c/Gone.vst3|1
+vst2 Path Working: c/Gone.vst2|1
+same
+
 = A plug-in without a record is listed when its fault is gone
 put Comp.vst3: class Comp | answer get-factory null
 put Echo.vst2: answer entry null
 scan
 vst3 Name: .
-vst2 Name Working: Echo|0
+vst2 Name ID Enabled Working: Echo|Echo|1|0
 new Comp.vst3:
 new Echo.vst2:
 scan

@@ -1,18 +1,16 @@
 #pragma once
 
+#include <QString>
+
 #include <array>
 
 // What tests of both systems expect, where the systems differ.
 
 /// What the names of VST 2 modules end in.
 extern const char *const kVst2Ending;
-/// The folder of a bundle that holds the module, and what the module's name ends in.
-extern const char *const kBundleFolder;
-extern const char *const kBundleEnding;
-/// Whether the scan takes the bundle for the plug-in, or the module in it.
-extern const bool kBundleIsThePlugin;
-/// Where a bundle "Several" holds the module for the other system.
-extern const char *const kForeignModule;
+/// Where a bundle "%1" holds its module, and the path that a scan records.
+extern const QString kBundleBinary;
+extern const QString kBundlePath;
 
 /// A locale that every machine has and that is not "C".
 extern const char *const kForeignLocale;

@@ -60,17 +60,5 @@ QString addVST3File(const QString &folder, const QString &name, const QByteArray
 
 QString addVST3Bundle(const QString &folder, const QString &name, const QByteArray &script)
 {
-    const QString bundle = folder + '/' + name + ".vst3";
-    put(vst3FixturePath(), vst3BundleBinary(bundle), script);
-    return bundle;
-}
-
-QString vst3BundleBinary(const QString &bundle)
-{
-    return bundle + "/Contents/" + kBundleFolder + '/' + QFileInfo(bundle).completeBaseName() + kBundleEnding;
-}
-
-QString vst3BundlePath(const QString &bundle)
-{
-    return kBundleIsThePlugin ? bundle : vst3BundleBinary(bundle);
+    return put(vst3FixturePath(), folder + '/' + kBundleBinary.arg(name), script);
 }

@@ -22,38 +22,19 @@ QByteArray elementOf(const QByteArray &block, const QByteArray &name)
 
 } // namespace
 
-QStringList texts(std::initializer_list<const char *> utf8)
-{
-    QStringList result;
-    for (const char *text : utf8)
-        result.append(QString::fromUtf8(text));
-    return result;
-}
-
-ScanBench::ScanBench(const char *catalogue, const QString &ending)
-    : m_catalogue(QString::fromLatin1(catalogue))
-    , m_ending(ending)
-{
-    m_folder.writeScanList();
-}
-
 QString ScanBench::scannerProgram() { return QStringLiteral(FXPROBE); }
-
-QByteArray ScanBench::traceStatement(const QString &name) const
-{
-    return "trace \"" + m_folder.path("trace").toUtf8() + "\" \"" + QFileInfo(name).fileName().toUtf8() +
-           "\"\n";
-}
 
 QString ScanBench::put(const QString &file, const QByteArray &script) const
 {
     const QString name = file.section('.', 0, -2);
-    const QByteArray traced = traceStatement(name) + script;
+    const QByteArray quoted = '"' + QFileInfo(name).fileName().toUtf8() + "\"\n";
+    QByteArray whole = "trace \"" + m_folder.path("trace").toUtf8() + "\" " + quoted + script;
     if (file.endsWith(".vst2"))
-        return dateFirst(addVST2File(m_folder.plugins(), name, traced));
-    const QByteArray own = "class \"" + QFileInfo(name).fileName().toUtf8() + "\"\n";
-    return dateFirst(
-        addVST3File(m_folder.plugins(), name, traced + (script.contains("class ") ? QByteArray() : own)));
+        return dateFirst(addVST2File(m_folder.plugins(), name, whole));
+    if (!script.contains("class "))
+        whole += "class " + quoted;
+    return dateFirst(file.endsWith(".bundle") ? addVST3Bundle(m_folder.plugins(), name, whole)
+                                              : addVST3File(m_folder.plugins(), name, whole));
 }
 
 QString ScanBench::dateFirst(const QString &path) const
@@ -92,14 +73,6 @@ int ScanBench::scanUntilSettled() const
             return run;
     ADD_FAILURE() << qPrintable(m_folder.markers().join(", "));
     return most;
-}
-
-void ScanBench::expectSettled() const
-{
-    const QByteArray before = m_folder.catalogue(m_catalogue);
-    scan();
-    EXPECT_EQ(loaded(), QStringList());
-    EXPECT_EQ(m_folder.catalogue(m_catalogue), before);
 }
 
 QStringList ScanBench::traceOf(const QString &name) const

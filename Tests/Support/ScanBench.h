@@ -5,32 +5,24 @@
 
 #include <gtest/gtest.h>
 
-#include <initializer_list>
 #include <map>
-
-/// UTF-8 texts as Qt ones, for tables.
-QStringList texts(std::initializer_list<const char *> utf8);
 
 /// A data folder with scripted plug-ins, and the real scanner on it. Modules are dated, so that no test
 /// depends on the minute in which it runs, and write their calls to one trace.
 class ScanBench : public testing::Test {
 protected:
-    /// `catalogue` is the file that `records` looks at, `ending` that of a module's name.
-    explicit ScanBench(const char *catalogue = "VST3Configuration.xml", const QString &ending = ".vst3");
+    ScanBench() { m_folder.writeScanList(); }
 
     /// The program under test.
     static QString scannerProgram();
-    /// The script's first statement: where a module's calls go, under its name.
-    QByteArray traceStatement(const QString &name) const;
     /// Puts a module into "Plugins", or into a folder below it when the file has one ("sub/Comp.vst3"); the
-    /// ending ".vst2" is spelt as the system spells it. A VST 3 script without classes gets one of the file's
-    /// name. Returns the module's full path.
+    /// ending ".vst2" is spelt as the system spells it, and ".bundle" makes a VST 3 bundle. A VST 3 script
+    /// without classes gets one of the file's name. Returns the module's full path.
     QString put(const QString &file, const QByteArray &script = {}) const;
     /// Dates a file as plug-ins of the first scan are, and gives its path back.
     QString dateFirst(const QString &path) const;
     /// Dates it as their updates are.
     void dateLater(const QString &path) const;
-    QString modulePath(const QString &name) const { return m_folder.plugins() + '/' + name + m_ending; }
 
     /// One run, which must end by itself with 0 and leave no marker.
     ScannerOutcome scan() const;
@@ -39,8 +31,6 @@ protected:
     ScannerOutcome scanOnce(const std::map<QString, QString> &environment = {}) const;
     /// Runs until no marker survives; gives the number of runs.
     int scanUntilSettled() const;
-    /// A run in which everything is known: it must load nothing and leave the catalogue as it is.
-    void expectSettled() const;
 
     /// The calls since the last run began, "NAME CALL" with the module's name.
     QStringList trace() const { return m_folder.lines("trace"); }
@@ -52,11 +42,12 @@ protected:
     /// Waits until a module has got as far as a stage of its trace.
     bool waitForStage(ScannerRun &scanner, const QString &module, const QString &stage) const;
 
-    QString cataloguePath() const { return m_folder.effects() + '/' + m_catalogue; }
-    /// The catalogue's records in their order, each as the values of some elements, "A|B|C". The text is
-    /// taken as it is, so that what no XML reader takes can be looked at too.
-    QStringList records(const char *elements) const { return recordsOf(m_catalogue, elements); }
+    QString cataloguePath() const { return m_folder.path("Effects/VST3Configuration.xml"); }
+    /// A catalogue's records in their order, each as the values of some elements, "A|B|C". The text is taken
+    /// as it is, so that what no XML reader takes can be looked at too.
     QStringList recordsOf(const QString &file, const char *elements) const;
+    /// Those of VST 3.
+    QStringList records(const char *elements) const { return recordsOf("VST3Configuration.xml", elements); }
     QStringList sortedRecords(const char *elements) const;
     /// What the workstation does when the user marks a plug-in: changes one element of the record with the
     /// name, in whatever catalogue has one.
@@ -65,7 +56,4 @@ protected:
     std::map<QString, QByteArray> effectsFolder() const;
 
     TestFolder m_folder;
-
-private:
-    QString m_catalogue, m_ending;
 };

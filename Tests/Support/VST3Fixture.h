@@ -19,9 +19,5 @@ QString vst3FixturePath(VST3Fixture fixture = VST3Fixture::Scripted);
 QString addVST3File(const QString &folder, const QString &name, const QByteArray &script = {},
                     VST3Fixture fixture = VST3Fixture::Scripted);
 
-/// The same as a bundle folder "NAME.vst3"; returns the bundle's full path.
+/// The same as a bundle folder "NAME.vst3"; returns the full path of the module in it.
 QString addVST3Bundle(const QString &folder, const QString &name, const QByteArray &script = {});
-/// The binary inside such a bundle.
-QString vst3BundleBinary(const QString &bundle);
-/// The path under which a scan records such a bundle.
-QString vst3BundlePath(const QString &bundle);
