@@ -38,19 +38,20 @@ put Shell.vst2: child 1 D | child 2 E
 scan
 mark A Favourite 1
 mark B CategoryMask 4
+mark C Enabled 0
 mark D Favourite 1
 new Three.vst3: class A | #1 | fault module-entry kill
 new Shell.vst2: child 1 D | child 2 E | fault get-plug-category kill
 scan 3
-vst3 Name Favourite CategoryMask Enabled Working: Three|0|0|0|0, A|1|0|0|0, B|0|4|0|0, C|0|0|0|0
+vst3 Name Favourite CategoryMask Enabled Working: Three|0|0|0|0, A|1|0|0|0, B|0|4|0|0, C|0|0|0|1
 vst2 Name Favourite Enabled Working: Shell|0|0|0, D|1|0|0, E|0|0|0
 same
-retry Three
+retry A
 retry E
 put Three.vst3: class A | #1 | class B | #2 | class C | #3
 put Shell.vst2: child 1 D | child 2 E
 scan
-vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|1|1
+vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
 vst2 Name Favourite Enabled Working: D|1|1|1, E|0|1|1
 
 = What an earlier version left usable beside a crash is disabled
@@ -143,18 +144,19 @@ vst3 Name Path Favourite Enabled: A|f/Comp.vst3|1|1, Slow|z/Slow.vst3|0|0
 vst2 Name Path: E|a/Echo.vst2
 same
 
-= Texts with angle brackets stay whole and keep their marks
-put A.vst2: name "Top <br/> Boost" | vendor "Jo <jo x.org>"
-put B.vst3: class "A &amp; B" | vendor "Jo <jo x.org>"
+= Texts that look like markup stay whole and keep their marks
+put A.vst2: name "Top <br/> Boost &amp; &lt;" | vendor "Jo <jo x.org> & Co"
+put B.vst3: class "A &amp; B" | vendor "Jo <jo x.org> & Co"
 scan
-mark Top <br/> Boost Favourite 1
+mark Top <br/> Boost &amp; &lt; Favourite 1
 mark A &amp; B Favourite 1
-new A.vst2: name "Top <br/> Boost" | vendor "Jo <jo x.org>"
-new B.vst3: class "A &amp; B" | vendor "Jo <jo x.org>"
+new B.vst3: class "A &amp; B" | vendor V
+put C.vst3:
+put C.vst2: id 2
 scan
-loaded B A
-vst2 Name Vendor Favourite: Top <br/> Boost|Jo <jo x.org>|1
-vst3 Name Vendor Favourite: A &amp; B|Jo <jo x.org>|1
+loaded B C C
+vst2 Name Vendor Favourite: Top <br/> Boost &amp; &lt;|Jo <jo x.org> & Co|1, C|Fixture Works|0
+vst3 Name Vendor Favourite: A &amp; B|V|1, C|Fixture Works|0
 same
 
 = A torn scan list costs nothing
@@ -205,16 +207,19 @@ scan
 loaded .
 vst3 Name CategoryMask: Comp|4
 
-= A new file of a known name and time is asked
+= A new file of a known name and time is asked and starts without marks
 put a/Comp.vst3: class A | #1
 put a/Comp.vst2: name D | id 1
 scan
+mark A Favourite 1
+mark D Favourite 1
 put b/Comp.vst3: class B | #2
 put b/Comp.vst2: name E | id 2
 scan
 loaded Comp Comp
-vst3 Name: A, B
-vst2 Name: D, E
+vst3 Name Favourite: A|1, B|0
+vst2 Name Favourite: D|1, E|0
+same
 )";
 
 class Keeping : public ScanTable {};

@@ -202,24 +202,6 @@ vst3 Name Enabled Working: Three1|1|1, Three2|1|1, Foreign|1|1, 致命的💥|0|
 vst2 Name Enabled Working: Two1|1|1, Two2|1|1, Latin ö|1|1, 致命的💥|0|0
 same
 
-= Texts that look like markup keep their marks
-put A.vst3: class "A &amp; B &lt;" | vendor "C & D"
-put B.vst2: name "E &amp; F"
-scan
-mark A &amp; B &lt; Favourite 1
-vst3 Name Vendor: A &amp; B &lt;|C & D
-new A.vst3: class "A &amp; B &lt;" | vendor V
-scan
-loaded A
-vst3 Name Vendor Favourite: A &amp; B &lt;|V|1
-put C.vst3:
-put C.vst2:
-scan
-loaded C C
-vst3 Name Vendor: A &amp; B &lt;|V, C|Fixture Works
-vst2 Name: E &amp; F, C
-same
-
 = Several killers of both formats need one run each and one more
 put a/WaveShell1-VST3 9.2.vst3: class Inner | fault module-entry kill
 put b/WaveShell1-VST3 9.2.vst3: class Inner | fault module-entry kill
@@ -230,17 +212,6 @@ put Good.vst2:
 scan 5
 vst3 Name: Good
 vst2 Name Enabled Working: Bad1|0|0, Bad2|0|0, Good|1|1
-
-= A namesake starts without marks
-put a/Comp.vst2: name One
-put Other.vst3:
-scan
-mark One Favourite 1
-put b/Comp.vst2: name Two | id 2
-scan
-loaded Comp
-vst2 Name Favourite: One|1, Two|0
-same
 
 = The marker of a child speaks for the child alone
 put Shell.vst2: child 1 One | child 2 Two
@@ -261,15 +232,6 @@ write Effects/2.scan3: <CrashedPlugin><Path>@/gone/Same.vst3</Path><Created>2021
 scan
 vst3 Name Enabled Working: Comp|0|0, Comp|0|0, B|1|1
 same
-
-= A child that is switched off does not speak for its shell
-put Shell.vst2: child 1 One | child 2 Two
-scan
-mark One Enabled 0
-new Shell.vst2: child 1 One | child 2 Two | vendor New
-scan
-loaded Shell
-vst2 Name Vendor Enabled: One|Fixture Works|0, Two|New|1
 
 = A crash follows the file and says nothing of a namesake
 put old/Moved.vst3:
