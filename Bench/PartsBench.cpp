@@ -2,14 +2,12 @@
 // how the time grows.
 
 #include "Core/BaseLib/Binary/BinaryExports.h"
-#include "Core/BaseLib/Files/FileFinder.h"
 #include "Core/BaseLib/Files/FileTime.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 
-#include <QDir>
 #include <QFile>
 #include <QTemporaryDir>
 
@@ -82,46 +80,16 @@ void catalogueWrite(benchmark::State &state)
 }
 BENCHMARK(catalogueWrite)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oN);
 
-/// A file replaced as a whole, with as many bytes.
-void fileReplace(benchmark::State &state)
-{
-    const QByteArray content(static_cast<int>(state.range(0)), 'x');
-    const QTemporaryDir folder;
-    const QString path = folder.filePath(QStringLiteral("catalogue.xml"));
-    while (state.KeepRunning())
-        benchmark::DoNotOptimize(replaceFile(path, content, Durability::Buffered));
-}
-BENCHMARK(fileReplace)->Arg(1)->Arg(1000000);
-
 /// The marker's part of the bracket around a probe.
 void markerBracket(benchmark::State &state)
 {
     const QTemporaryDir folder;
     const MarkerFormat &format = vst3CatalogueFormat().marker;
     const EffectRecord record = recordOf(1);
-    while (state.KeepRunning()) {
-        const QString marker = markerPath(format, folder.path(), record.path, QString());
-        ActiveMarkers::add(marker);
-        benchmark::DoNotOptimize(writeMarkerFile(format, marker, record));
-        ActiveMarkers::remove(marker);
-    }
+    while (state.KeepRunning())
+        const CrashMarker marker(format, folder.path(), record);
 }
 BENCHMARK(markerBracket);
-
-/// A folder of as many bundles, each of three folders and a file.
-void fileFinder(benchmark::State &state)
-{
-    const QTemporaryDir folder;
-    for (int number = 0; number < state.range(0); ++number) {
-        const QString inside = folder.filePath(QStringLiteral("%1.vst3/Contents/x86_64-linux").arg(number));
-        QDir().mkpath(inside);
-        write(inside + QStringLiteral("/%1.so").arg(number), QByteArray("x"));
-    }
-    while (state.KeepRunning())
-        benchmark::DoNotOptimize(findFiles(folder.path(), QStringLiteral(".vst3")));
-    state.SetComplexityN(state.range(0));
-}
-BENCHMARK(fileFinder)->RangeMultiplier(10)->Range(kFew, 1000)->Complexity(benchmark::oNLogN);
 
 void fileTime(benchmark::State &state)
 {
@@ -130,31 +98,24 @@ void fileTime(benchmark::State &state)
 }
 BENCHMARK(fileTime);
 
-void elfExports(benchmark::State &state)
+/// Of a module of this system, and of Windows.
+void exports(benchmark::State &state, const char *module)
 {
     while (state.KeepRunning())
-        benchmark::DoNotOptimize(
-            findExports(QStringLiteral(FXPROBE_BENCH_MODULE), {"VSTPluginMain", "main"}));
+        benchmark::DoNotOptimize(findExports(QString::fromUtf8(module), {"VSTPluginMain", "main"}));
 }
-BENCHMARK(elfExports);
-
-void peExports(benchmark::State &state)
-{
-    const QString path = QStringLiteral(FXPROBE_BENCH_WINDOWS_MODULE);
-    while (state.KeepRunning())
-        benchmark::DoNotOptimize(findExports(path, {"VSTPluginMain", "main"}));
-}
-BENCHMARK(peExports);
+BENCHMARK_CAPTURE(exports, elf, FXPROBE_BENCH_MODULE);
+BENCHMARK_CAPTURE(exports, pe, FXPROBE_BENCH_WINDOWS_MODULE);
 
 /// Finding a file in a catalogue of as many records.
 void knownLookUp(benchmark::State &state)
 {
     KnownList known;
     for (const EffectRecord &record : recordsOf(state))
-        known.file(record);
+        known.addRecord(record);
     const QString path = recordOf(static_cast<int>(state.range(0)) / 2).path;
     while (state.KeepRunning())
-        benchmark::DoNotOptimize(known.lookUp(path));
+        benchmark::DoNotOptimize(known.recordsOfPath(path));
 }
 BENCHMARK(knownLookUp)->RangeMultiplier(10)->Range(kFew, kMost)->Complexity(benchmark::oLogN);
 
