@@ -9,6 +9,8 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <iomanip>
+#include <sstream>
 #include <thread>
 
 namespace {
@@ -21,36 +23,27 @@ bool holdsWord(const std::string &words, const std::string &word)
     return (' ' + words + ' ').find(' ' + word + ' ') != std::string::npos;
 }
 
-/// The byte that an escape at a place stands for; moves the place to its last character.
-char escapedByte(const std::string &line, std::size_t &place)
+/// What stands for bytes that a script cannot hold otherwise.
+std::string unescaped(const std::string &word)
 {
-    const char kind = place + 1 < line.size() ? line[++place] : '\\';
-    if (kind != 'x')
-        return kind == 'n' ? '\n' : kind == 't' ? '\t' : kind;
-    place += 2;
-    return static_cast<char>(std::strtoul(line.substr(place - 1, 2).c_str(), nullptr, 16));
+    std::string text;
+    for (std::size_t place = 0; place < word.size(); ++place) {
+        const char kind = word[place] == '\\' && place + 1 < word.size() ? word[++place] : '\0';
+        if (kind == 'x')
+            text += static_cast<char>(std::strtoul(word.substr((place += 2) - 1, 2).c_str(), nullptr, 16));
+        else
+            text += kind == '\0' ? word[place] : kind;
+    }
+    return text;
 }
 
 /// Splits a line at its blanks.
 FixtureScript::Words wordsOf(const std::string &line)
 {
     FixtureScript::Words words;
-    bool quoted = false, inWord = false;
-    for (std::size_t place = 0; place < line.size(); ++place) {
-        const char character = line[place];
-        const bool isBlank = !quoted && (character == ' ' || character == '\t' || character == '\r');
-        if (!inWord && character == '#')
-            break;
-        if (!inWord && !isBlank)
-            words.emplace_back();
-        inWord = !isBlank;
-        if (character == '"')
-            quoted = !quoted;
-        else if (inWord)
-            words.back() += character == '\\' ? escapedByte(line, place) : character;
-    }
-    if (quoted)
-        reportMisuse("a quotation mark is missing: " + line);
+    std::istringstream rest(line);
+    for (std::string word; rest >> std::quoted(word, '"', '\0') && word[0] != '#';)
+        words.push_back(unescaped(word));
     return words;
 }
 

@@ -22,6 +22,18 @@ std::int32_t numberOf(const std::string &text);
 float floatOf(const std::string &text);
 std::string textOf(float value);
 
+/// Copies a text into a field of a plug-in interface. A text that fills the field gets no terminator; what
+/// lies behind a shorter one is left as it was. 1, as a plug-in answers that has written one.
+template <typename Character, std::size_t Size>
+int fill(Character (&field)[Size], const std::string &text)
+{
+    for (std::size_t place = 0; place < Size && place < text.size(); ++place)
+        field[place] = static_cast<Character>(static_cast<unsigned char>(text[place]));
+    if (text.size() < Size)
+        field[text.size()] = 0;
+    return 1;
+}
+
 /// What a call concerns: the module, one of its classes or one of its sub-plug-ins.
 struct FixtureSubject {
     std::string name;

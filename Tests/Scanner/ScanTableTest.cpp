@@ -335,7 +335,7 @@ put C.vst2: id 3 | effect get-vendor-string umask 077 | effect get-vendor-string
 put D.vst2: id 4 | effect get-vendor-string signal term | effect get-vendor-string alarm 1
 put E.vst2: id 5 | effect get-effect-name signal segv | fault get-vendor-string segv
 put F.vst2: id 6 | effect entry thread
-put G.vst2: id 7 | own-thread | ask-host entry 1 from-thread | ask-host get-vendor-string 7 until-close
+put G.vst2: id 7 | ask-host entry 1 until-close | ask-host get-vendor-string 7 until-close
 scan
 vst2 Name Working: A|1, B|1, C|1, D|1, E|1, F|1, G|1
 log: F.vst2 left threads running and stays in memory

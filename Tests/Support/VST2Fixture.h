@@ -7,7 +7,7 @@
 enum class VST2Fixture {
     Scripted, ///< exports "VSTPluginMain" and does what its script says
     Main,     ///< the same with "main" in its place
-    Both,     ///< exports both; what "main" gives is called "NAME by main" and has the next higher unique id
+    Both,     ///< exports both, and "main" answers null
     NoEntry   ///< a library that exports nothing of a plug-in
 };
 

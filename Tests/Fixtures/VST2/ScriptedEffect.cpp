@@ -73,7 +73,7 @@ const FixtureScript &script()
         std::string stages = "static-constructor entry get-parameter set-parameter process static-destructor";
         for (int opcode = 0; opcode < kOpcodes; ++opcode)
             stages += ' ' + stageOf(opcode);
-        std::string keys = "name vendor category flags parameter chunk editor set own-thread";
+        std::string keys = "name vendor category flags parameter chunk editor set";
         for (const auto &[key, field] : kFields)
             keys += ' ' + std::string(key);
         return FixtureScript({"child", true, keys, "after-children", stages});
@@ -111,23 +111,14 @@ std::string detailOf(int opcode, int index, VstIntPtr value, const void *pointer
     return detail;
 }
 
-/// A text that fills the buffer gets no terminator; what lies behind a shorter one is left as it was.
-VstIntPtr fill(void *buffer, std::size_t size, const std::string &text, bool terminate = true)
-{
-    std::memcpy(buffer, text.data(), std::min(size, text.size()));
-    if (terminate && text.size() < size)
-        static_cast<char *>(buffer)[text.size()] = '\0';
-    return 1;
-}
-
 /// One effect that the module handed out. It stays in memory when it is closed, so that a call after that is
 /// found out.
 class Effect {
 public:
-    Effect(const FixtureSubject &subject, audioMasterCallback host, bool isOfSecondMain)
+    Effect(const FixtureSubject &subject, audioMasterCallback host)
         : m_subject(subject)
         , m_host(host)
-        , m_name(script().text("name", subject.place, subject.name) + (isOfSecondMain ? " by main" : ""))
+        , m_name(script().text("name", subject.place, subject.name))
         , m_parameters(script().all("parameter", subject.place))
     {
         if (has("chunk"))
@@ -148,12 +139,9 @@ public:
         effect.uniqueID = subject.number ? subject.number : 1000;
         for (const auto &[key, field] : kFields)
             effect.*field = number(key, effect.*field);
-        effect.uniqueID += isOfSecondMain ? 1 : 0;
         const int usualFlags = effFlagsCanReplacing | (m_chunk ? effFlagsProgramChunks : 0) |
                                (has("editor") ? effFlagsHasEditor : 0);
         effect.flags = kFlagsPadding | static_cast<std::uint32_t>(number("flags", usualFlags));
-        if (has("own-thread"))
-            repeatUntilClose([] {});
         askHost("entry");
     }
     /// Threads that nobody stopped outlive the effect, as in a plug-in that nobody closed: they die when the
@@ -240,15 +228,6 @@ private:
         askHost(stage);
     }
 
-    template <typename Step>
-    void repeatUntilClose(Step step)
-    {
-        m_threads.emplace_back([stopping = m_stopping, step] {
-            for (; !*stopping; std::this_thread::sleep_for(std::chrono::milliseconds(1)))
-                step();
-        });
-    }
-
     /// Makes the host calls that the script has for a stage.
     void askHost(const std::string &stage)
     {
@@ -265,13 +244,12 @@ private:
                               value = numberOf(after("value")), opt = floatOf(after("opt"))] {
                 return m_host(&effect, opcode, index, value, nullptr, opt);
             };
-            const auto note = [&] { script().note("host-" + words[1], m_subject, std::to_string(ask())); };
-            if (has("from-thread"))
-                std::thread(note).join();
-            else
-                note();
+            script().note("host-" + words[1], m_subject, std::to_string(ask()));
             if (has("until-close"))
-                repeatUntilClose(ask);
+                m_threads.emplace_back([stopping = m_stopping, ask] {
+                    for (; !*stopping; std::this_thread::sleep_for(std::chrono::milliseconds(1)))
+                        ask();
+                });
         }
     }
 
@@ -305,7 +283,8 @@ private:
             close();
             return 0;
         case effGetParamName:
-            return fill(pointer, 128, m_parameters[static_cast<std::size_t>(index)].at(0));
+            return fill(*static_cast<char(*)[128]>(pointer),
+                        m_parameters[static_cast<std::size_t>(index)].at(0));
         case effGetChunk:
             if (m_chunk)
                 *static_cast<const void **>(pointer) = m_chunk->data();
@@ -320,9 +299,10 @@ private:
         case effEditGetRect:
             return editorRect(pointer);
         case effGetEffectName:
-            return fill(pointer, 1024, m_name);
+            return fill(*static_cast<char(*)[1024]>(pointer), m_name);
         case effGetVendorString:
-            return fill(pointer, 256, script().text("vendor", m_subject.place, "Fixture Works"));
+            return fill(*static_cast<char(*)[256]>(pointer),
+                        script().text("vendor", m_subject.place, "Fixture Works"));
         case vst::effGetParameterProperties:
             return properties(m_parameters[static_cast<std::size_t>(index)], pointer);
         default:
@@ -336,8 +316,8 @@ private:
             return 0;
         auto &target = *static_cast<vst::VstParameterProperties *>(pointer);
         target = {};
-        fill(target.label, sizeof target.label, parameter[2], false);
-        return fill(target.shortLabel, sizeof target.shortLabel, parameter[2], false);
+        fill(target.label, parameter[2]);
+        return fill(target.shortLabel, parameter[2]);
     }
 
     VstIntPtr editorRect(void *pointer)
@@ -366,7 +346,7 @@ private:
             child = {"Endless " + std::to_string(madeUp), madeUp};
         else
             script().reach("shell-next", child, "end");
-        fill(pointer, 1024, child.name);
+        fill(*static_cast<char(*)[1024]>(pointer), child.name);
         return answer("shell-next", child, child.number);
     }
 
@@ -419,7 +399,7 @@ std::optional<FixtureSubject> wantedSubject(audioMasterCallback host)
     return std::nullopt;
 }
 
-AEffect *enter(audioMasterCallback host, bool isSecondMain)
+AEffect *enter(audioMasterCallback host)
 {
     if (!host)
         reportMisuse("the entry is called without a callback");
@@ -427,7 +407,7 @@ AEffect *enter(audioMasterCallback host, bool isSecondMain)
     if (!subject)
         return nullptr;
     script().reach("entry", *subject, subject->number ? std::to_string(subject->number) : "");
-    handedOut().push_back(std::make_unique<Effect>(*subject, host, isSecondMain));
+    handedOut().push_back(std::make_unique<Effect>(*subject, host));
     const std::string answer = script().answer("entry", *subject);
     if (answer.empty())
         return &handedOut().back()->effect;
@@ -441,11 +421,11 @@ AEffect *enter(audioMasterCallback host, bool isSecondMain)
 
 // FIXTURE_ENTRIES: 1 exports VSTPluginMain, 2 main, 3 both.
 #if FIXTURE_ENTRIES & 1
-FIXTURE_EXPORT AEffect *VSTPluginMain(audioMasterCallback host) { return enter(host, false); }
+FIXTURE_EXPORT AEffect *VSTPluginMain(audioMasterCallback host) { return enter(host); }
 #endif
 #if FIXTURE_ENTRIES & 2
 // C++ has rules for a function of this name, so only its symbol has it.
 FIXTURE_EXPORT AEffect *olderEntry(audioMasterCallback host) __asm__("main");
 
-AEffect *olderEntry(audioMasterCallback host) { return enter(host, FIXTURE_ENTRIES == 3); }
+AEffect *olderEntry(audioMasterCallback host) { return FIXTURE_ENTRIES == 3 ? nullptr : enter(host); }
 #endif

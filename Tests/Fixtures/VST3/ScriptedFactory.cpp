@@ -2,7 +2,6 @@
 
 #include <pluginterfaces/base/ipluginbase.h>
 
-#include <algorithm>
 #include <map>
 #include <type_traits>
 
@@ -72,17 +71,6 @@ FUID idOf(const FixtureSubject &described)
 }
 
 namespace {
-
-/// Copies a text into a field of the SDK. A text that fills the field gets no terminator; what lies behind a
-/// shorter one is left as it was.
-template <typename Character, std::size_t Size>
-void fill(Character (&field)[Size], const std::string &text)
-{
-    for (std::size_t place = 0; place < std::min(Size, text.size()); ++place)
-        field[place] = static_cast<Character>(static_cast<unsigned char>(text[place]));
-    if (text.size() < Size)
-        field[text.size()] = 0;
-}
 
 /// Answers a request for the information on a class. An index out of range is not in the trace: a host that
 /// believes a huge count would fill the disk.

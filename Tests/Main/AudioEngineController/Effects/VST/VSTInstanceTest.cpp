@@ -200,7 +200,7 @@ a size ~ editor 300 200 / ask-host process 15 index 640 value 480 ~ block ~ size
     }
     // Also all the time, from a thread of the plug-in, but not while it is torn down.
     auto plugin =
-        loaded("set opcode-71 outputs 5\nask-host open 13 until-close\nown-thread\nask-host close 13");
+        loaded("set opcode-71 outputs 5\nask-host open 13 until-close\nask-host close 13");
     ASSERT_TRUE(plugin->open(kSettings));
     for (int round = 0; round < 50; ++round) {
         ASSERT_TRUE(plugin->start());
