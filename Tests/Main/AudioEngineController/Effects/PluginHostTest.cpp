@@ -1,10 +1,13 @@
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 
 #include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
+#include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/TestApplication.h"
 #include "Tests/Support/TestFolder.h"
+#include "Tests/Support/VST2Fixture.h"
+#include "Tests/Support/VST3Fixture.h"
 
 #include <QDir>
 
@@ -115,4 +118,104 @@ TEST(PluginHost, MarksOnBuiltInEffectsAreReadAndWritten)
               start + block("a", "1", "4") + block("b", "0", "0") + "</Effects>\n");
     host.setBuiltInEffects(effects);
     EXPECT_TRUE(host.findEffect("a")->favourite) << "the marks outlive new effects";
+}
+
+TEST(PluginHostLoading, ThePrefixDecidesTheHostAndTheKeyThePlugin)
+{
+    const TestFolder folder;
+    PluginHost registry;
+    const auto list = [&](PluginFormat format, const char *id, const QByteArray &script = "",
+                          bool isEnabled = true, qint32 category = 1) {
+        EffectRecord record;
+        const QString file = QString(id).remove(':');
+        record.path = format == PluginFormat::Vst3 ? addVST3File(folder.plugins(), file, script)
+                                                   : addVST2File(folder.plugins(), file, script);
+        record.name = record.id = id;
+        record.enabled = isEnabled;
+        record.vstCategory = category;
+        EXPECT_TRUE(registry.host(format).AddEffect(record)) << id;
+    };
+    list(PluginFormat::Vst3, "00112233445566778899AABBCCDDEEFF",
+         "class C\nid 00112233445566778899AABBCCDDEEFF\n");
+    list(PluginFormat::Vst3, "EE112233445566778899AABBCCDDEEFF",
+         "class T\nid EE112233445566778899AABBCCDDEEFF\nfault initialize throw-int\n");
+    list(PluginFormat::Vst3, "FF112233445566778899AABBCCDDEEFF");
+    list(PluginFormat::Vst3, "Off", "", false);
+    list(PluginFormat::BuiltIn, "a");
+    list(PluginFormat::Vst2, "Q10:7", "name Q10\nid 7\n");
+    list(PluginFormat::Vst2, "ves Q10:8", "name \"ves Q10\"\nid 8\n");
+    list(PluginFormat::Vst2, "Off", "", false);
+    list(PluginFormat::Vst2, "Line", "", true, 9);
+    list(PluginFormat::Vst2, "Broken", "answer entry null");
+    const struct {
+        const char *identifier;
+        const char *loaded; // the identifier of what came; null: nothing
+        bool isKnown;
+    } rows[] = {{"vst3:00112233445566778899AABBCCDDEEFF", "vst3:00112233445566778899AABBCCDDEEFF", true},
+                {"vst2:Q10:7", "vst2:Q10:7", true},
+                {"vst2:Waves Waves Q10:7", "vst2:Q10:7", true},
+                {"vst2:Old Waves Q10:8", "vst2:ves Q10:8", true},
+                {"placeholder:vst2:Gone:1", "placeholder:vst2:Gone:1", true},
+                {"vst3:FF112233445566778899AABBCCDDEEFF", nullptr, true},
+                {"vst3:EE112233445566778899AABBCCDDEEFF", nullptr, true},
+                {"vst3:Off", nullptr, true},
+                {"vst2:Off", nullptr, true},
+                {"vst2:Line", nullptr, true},
+                {"vst2:Broken", nullptr, true},
+                {"mrl:a", nullptr, true},
+                {"vst2:Waves ", nullptr, false},
+                {"vst2:Waves", nullptr, false},
+                {"vst3:Q10:7", nullptr, false},
+                {"vst2:00112233445566778899AABBCCDDEEFF", nullptr, false},
+                {"Q10:7", nullptr, false},
+                {"mrl:Q10:7", nullptr, false},
+                {"placeholder:", nullptr, false},
+                {"", nullptr, false}};
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.identifier);
+        const CapturedLog log;
+        const auto plugin = registry.LoadPlugin(row.identifier);
+        EXPECT_EQ(plugin ? plugin->identifier() : QString(), row.loaded);
+        EXPECT_EQ(log.lines().contains(QLatin1String("PluginHost::LoadPlugin - Failed to Find Effect: ") +
+                                       row.identifier),
+                  !row.isKnown);
+        EXPECT_TRUE(plugin || !log.lines().isEmpty()) << "the log says why";
+        PluginPreset preset;
+        if (plugin && plugin->StorePreset(preset)) {
+            preset.identifier = row.identifier;
+            EXPECT_TRUE(plugin->LoadPreset(preset)) << "one of the name asked for goes in";
+        }
+    }
+    const auto first = registry.LoadPlugin("vst2:ves Q10:8"), second = registry.LoadPlugin("vst2:Q10:7");
+    const CapturedLog log;
+    VSTHostContext::instance().logLoadedPlugins();
+    EXPECT_EQ(log.lines(), QStringList({"VSTs ", "vst: ves Q10: ", "vst: Q10: "}));
+}
+
+TEST(PluginHostLoading, APlaceholderKeepsTheStateOfWhatIsMissing)
+{
+    PluginHost registry;
+    const auto plugin = registry.LoadPlugin("placeholder:vst2:Gone:1");
+    ASSERT_TRUE(plugin);
+    PluginPreset preset;
+    EXPECT_FALSE(plugin->StorePreset(preset)) << "nothing was given to keep";
+    preset.identifier = "vst2:Gone:2";
+    EXPECT_FALSE(plugin->LoadPreset(preset)) << "of another";
+    preset.identifier = "vst2:Gone:1";
+    preset.data = QByteArray("a\0b", 3);
+    preset.name = "Gone";
+    preset.flags = 0x12C0007;
+    preset.firstChannels = {2, -5};
+    preset.channelSpans = {4, 2147483647};
+    EXPECT_TRUE(plugin->LoadPreset(preset));
+    PluginPreset kept;
+    EXPECT_TRUE(plugin->StorePreset(kept));
+    EXPECT_EQ(kept.data, preset.data);
+    EXPECT_EQ(kept.identifier, preset.identifier);
+    EXPECT_EQ(kept.flags, preset.flags);
+    EXPECT_EQ(kept.channelSpans, preset.channelSpans);
+    EXPECT_EQ(plugin->name(), "Gone");
+    EXPECT_EQ(plugin->channels().inputs.first, 2);
+    EXPECT_EQ(plugin->channels().inputs.span(), 4);
+    EXPECT_EQ(plugin->channels().outputs.span(), AudioPlugin::kMaxChannels) << "what a file says is checked";
 }

@@ -1,8 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 
 #include "Core/BaseLib/Binary/PluginLibrary.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
-#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/NotingUI.h"
@@ -24,47 +22,6 @@ protected:
 };
 
 } // namespace
-
-TEST_F(VSTHostTest, LoadsByKey)
-{
-    const struct {
-        const char *id, *script;
-        bool enabled = true;
-        qint32 category = 1;
-    } listed[] = {{"Comp", ""}, {"Off", "", false}, {"Line", "", true, 9},
-                  {"Q10", ""},  {"ves Q10", ""},    {"Broken", "answer entry null"}};
-    for (const auto &row : listed) {
-        EffectRecord record;
-        record.name = record.id = row.id;
-        record.path = addVST2File(m_folder.plugins(), row.id, row.script);
-        record.vstCategory = row.category;
-        record.enabled = row.enabled;
-        EXPECT_TRUE(m_host.AddEffect(record));
-    }
-    const struct {
-        const char *key, *loaded; // name, or null
-        int retries = 0;
-    } rows[] = {{"Comp", "Comp"},
-                {"Off", nullptr},
-                {"Line", nullptr},
-                {"Broken", nullptr},
-                {"Waves Waves Q10", "Q10", 2},
-                {"Old Waves Q10", "ves Q10", 1},
-                {"Waves ", nullptr, 1},
-                {"Waves", nullptr}};
-    for (const auto &row : rows) {
-        const CapturedLog log;
-        const auto plugin = m_host.loadByKey(row.key);
-        EXPECT_EQ(plugin ? plugin->name() : QString(), QString(row.loaded)) << row.key;
-        EXPECT_EQ(log.count("Found an old Waves plug-in, retrying as:"), row.retries) << row.key;
-        EXPECT_EQ(log.count(", Didn't manage it"), QString(row.key) == "Broken" ? 1 : 0) << row.key;
-    }
-    const auto first = m_host.loadByKey("Comp");
-    const auto second = m_host.loadByKey("Q10");
-    const CapturedLog log;
-    VSTHostContext::instance().logLoadedPlugins();
-    EXPECT_EQ(log.lines(), QStringList({"VSTs ", "vst: Comp: ", "vst: Q10: "}));
-}
 
 TEST_F(VSTHostTest, ARefreshCleansNamesUp)
 {
