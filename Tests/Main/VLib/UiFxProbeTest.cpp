@@ -209,6 +209,7 @@ TEST(UiFxProbeTick, ATextThatIsTooLongKeepsItsEnd)
 TEST(UiFxProbeTick, ShowsTheWindowOnceWhenAsked)
 {
     HeldScan scan;
+    EXPECT_TRUE(scan.dialog.windowFlags() & Qt::WindowStaysOnTopHint);
     scan.dialog.setWindowState(Qt::WindowMinimized);
     scan.tick();
     EXPECT_FALSE(scan.dialog.isVisible());

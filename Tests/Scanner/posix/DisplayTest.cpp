@@ -97,16 +97,6 @@ TEST_F(OnScreen, WithNothingToProbeNoWindowAppears)
     EXPECT_EQ(m_screen.takeAppeared(), 0);
 }
 
-TEST_F(OnScreen, TheWindowStaysOnTopOfOthers)
-{
-    if (!m_screen.startWindowManager())
-        GTEST_SKIP() << "IceWM did not start";
-    put(kComp + ".vst3", "delay initialize 3000\n");
-    ASSERT_TRUE(m_scanner.start());
-    EXPECT_TRUE(
-        m_scanner.waitUntil([this] { return m_screen.isFocusedOnTop(m_screen.windowTitled(kTitle)); }));
-}
-
 TEST_P(OnScaledScreen, TheWindowFollowsTheResolution)
 {
     m_screen.setResolution(GetParam().dotsPerInch);

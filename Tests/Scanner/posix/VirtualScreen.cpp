@@ -1,7 +1,5 @@
 #include "Tests/Scanner/posix/VirtualScreen.h"
 
-#include <QDeadlineTimer>
-
 #include <cstdlib>
 #include <cstring>
 #include <memory>
@@ -58,8 +56,6 @@ bool VirtualScreen::startServer()
 
 void VirtualScreen::kill()
 {
-    m_windowManager.kill();
-    m_windowManager.waitForFinished(-1);
     m_server.kill();
     m_server.waitForFinished(-1);
 }
@@ -90,36 +86,12 @@ QByteArray VirtualScreen::property(xcb_window_t window, const char *name) const
             xcb_get_property_value_length(answer.get())};
 }
 
-bool VirtualScreen::isFocusedOnTop(xcb_window_t window) const
-{
-    // Only the window manager adds the focus: what the program wrote before is not enough.
-    const QByteArray states = property(window, "_NET_WM_STATE");
-    const auto has = [&](const char *name) {
-        const xcb_atom_t state = atom(name);
-        return states.contains(QByteArray(reinterpret_cast<const char *>(&state), sizeof state));
-    };
-    return has("_NET_WM_STATE_FOCUSED") && has("_NET_WM_STATE_ABOVE");
-}
-
 void VirtualScreen::setResolution(int dotsPerInch) const
 {
     const QByteArray resources = "Xft.dpi:\t" + QByteArray::number(dotsPerInch) + '\n';
     xcb_change_property(m_connection, XCB_PROP_MODE_REPLACE, m_root, atom("RESOURCE_MANAGER"),
                         XCB_ATOM_STRING, 8, static_cast<quint32>(resources.size()), resources.constData());
     xcb_flush(m_connection);
-}
-
-bool VirtualScreen::startWindowManager()
-{
-    // Its settings are its own, not those of the user.
-    m_windowManager.setProgram("env");
-    m_windowManager.setArguments({"HOME=/nonexistent", "icewm", "--display=" + m_name});
-    m_windowManager.start();
-    const QDeadlineTimer deadline(20000);
-    while (property(m_root, "_NET_SUPPORTING_WM_CHECK").isEmpty())
-        if (m_windowManager.waitForFinished(10) || deadline.hasExpired())
-            return false;
-    return true;
 }
 
 QSize VirtualScreen::sizeOf(xcb_window_t window) const

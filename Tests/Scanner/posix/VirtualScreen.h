@@ -21,15 +21,11 @@ public:
     QString name() const { return m_name; }
     /// The display's resolution as programs learn of it, in dots per inch.
     void setResolution(int dotsPerInch) const;
-    /// Starts a window manager (IceWM) and waits until it is at work.
-    bool startWindowManager();
     /// How many windows appeared since the last call.
     int takeAppeared();
     /// The window with this title that can be seen now; 0 when there is none.
     xcb_window_t windowTitled(const QString &title) const;
     QSize sizeOf(xcb_window_t window) const;
-    /// Whether the window manager shows the window as the focused one and as one that stays on top.
-    bool isFocusedOnTop(xcb_window_t window) const;
     /// Asks a window to close, as its close button does.
     void requestClose(const QString &title) const;
     /// Ends the server under its programs.
@@ -44,7 +40,6 @@ private:
     bool isVisible(xcb_window_t window) const;
 
     ChildProcess m_server;
-    ChildProcess m_windowManager;
     QString m_reason;
     QString m_name;
     xcb_connection_t *m_connection = nullptr;
