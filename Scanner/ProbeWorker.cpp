@@ -111,8 +111,10 @@ void work(const ProbeJob &job, Teller &teller)
     const std::unique_ptr<IPluginProbe> probe = PluginHost::instance().host(job.format).makeProbe();
     ChannelMessage done;
     done.kind = Kind::Done;
+    ProbeJob loadable = job;
+    loadable.isLookedAt = true;
     if (probe)
-        done.outcome = probe->run(job, teller);
+        done.outcome = probe->run(loadable, teller);
     teller.settle();
     done.outcome.leftModule = PluginLibrary::isMapped(job.path);
     for (const EffectRecord &record : done.outcome.records)

@@ -20,6 +20,8 @@ struct ModuleInspection {
 
     Verdict verdict = Verdict::Loadable;
     QString reason; ///< a phrase about "it", with what helps, without the path; empty when it is loadable
+
+    bool isLoadable() const { return verdict == Verdict::Loadable; }
 };
 
 /// Looks at a file: one open and a few reads. With names, a library that surely exports none of them is told

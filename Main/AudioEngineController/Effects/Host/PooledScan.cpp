@@ -23,11 +23,16 @@ public:
         : m_scan(scan)
         , m_items(scan.m_plan->items())
         , m_states(m_items.size())
+        , m_probe(scan.m_host.makeProbe())
     {}
 
     /// False when the scan was cancelled.
     bool run();
 
+    std::optional<ProbeOutcome> look(std::size_t index) override
+    {
+        return m_probe->look(m_scan.jobOf(m_items[m_first + index]));
+    }
     void jobBegins(std::size_t index, int worker) override;
     void stageEntered(std::size_t index, int worker, ProbeStage stage) override;
     void classBegins(std::size_t index, int worker, const QString &name) override;
@@ -65,7 +70,8 @@ private:
     FolderScan &m_scan;
     const std::vector<ScanItem> &m_items;
     std::vector<State> m_states;
-    std::size_t m_first = 0; ///< item that the pool knows as its job 0
+    const std::unique_ptr<IPluginProbe> m_probe; ///< looks at files; workers ask plug-ins
+    std::size_t m_first = 0;                     ///< item that the pool knows as its job 0
     std::size_t m_ended = 0;
     bool m_isAlone = true;           ///< one job at a time
     std::vector<std::size_t> m_busy; ///< items, the longest at work first
@@ -74,7 +80,6 @@ private:
 
 bool FolderScan::PooledScan::run()
 {
-    m_scan.collectWaiting(0);
     // Those that were at work when a scanner ended come first, one after the other: what ends a scanner that
     // asks nobody else is the culprit.
     std::size_t suspects = 0;
@@ -136,6 +141,8 @@ void FolderScan::PooledScan::jobBegins(std::size_t index, int)
 {
     const std::size_t item = m_first + index;
     State &state = m_states[item];
+    if (!m_scan.m_hasCollected) // most scans find nothing to ask
+        m_scan.collectWaiting(m_scan.m_done);
     if (state.marker.path().isEmpty())
         state.marker = m_isAlone ? m_scan.m_host.WriteCrashMarker(fileOf(item))
                                  : m_scan.m_host.writeSuspectMarker(fileOf(item));
@@ -201,7 +208,8 @@ void FolderScan::PooledScan::jobEnds(std::size_t index, int worker, const ProbeO
     if (m_scan.m_progress)
         m_scan.m_progress->setValue(static_cast<int>(m_ended));
     showLongest();
-    writeInterim(outcome.status == ProbeStatus::Crashed || outcome.status == ProbeStatus::NoAnswer);
+    if (state.isTouched) // what was only looked at can wait for the last write
+        writeInterim(outcome.status == ProbeStatus::Crashed || outcome.status == ProbeStatus::NoAnswer);
     state.marker.remove(); // the catalogue holds what came of it
     m_scan.m_host.clearSuspect(m_items[item].path);
 }

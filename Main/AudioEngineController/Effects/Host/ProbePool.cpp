@@ -56,7 +56,7 @@ bool ProbePool::run(std::vector<ProbeJob> jobs, IPoolListener &listener)
     m_jobs = std::move(jobs);
     m_waiting.clear();
     for (std::size_t job = 0; job < m_jobs.size(); ++job)
-        m_waiting.push_back({job, false});
+        m_waiting.push_back({job});
     QElapsedTimer sinceCancel;
     bool canStart = true;
     while (canStart && (isBusy() || !m_waiting.empty())) {
@@ -66,6 +66,9 @@ bool ProbePool::run(std::vector<ProbeJob> jobs, IPoolListener &listener)
         }
         if (sinceCancel.isValid() && sinceCancel.hasExpired(kPatience))
             cancelJobs();
+        lookAhead();
+        if (m_waiting.empty() && !isBusy())
+            break;
         canStart = startWorkers();
         handOut();
         for (const WorkerEvent &event : m_group.wait(kLook))
@@ -89,6 +92,24 @@ void ProbePool::cancelJobs()
         worker.job.reset();
         worker.isLeaving = true;
         endWorker(number, worker, QStringLiteral("the scan was cancelled"));
+    }
+}
+
+/// Looks at the files that come next, in this process and while workers are busy.
+void ProbePool::lookAhead()
+{
+    const auto ahead = static_cast<std::size_t>(2 * m_settings.workers);
+    for (std::size_t place = 0; place < std::min(ahead, m_waiting.size());) {
+        Waiting &waiting = m_waiting[place];
+        const std::size_t job = waiting.job;
+        const std::optional<ProbeOutcome> seen = waiting.isLookedAt ? std::nullopt : m_listener->look(job);
+        waiting.isLookedAt = true;
+        if (!seen) {
+            ++place;
+            continue;
+        }
+        m_waiting.erase(m_waiting.begin() + static_cast<std::ptrdiff_t>(place));
+        m_listener->jobEnds(job, 0, *seen);
     }
 }
 
@@ -310,7 +331,7 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
     } else { // somebody who went before may be to blame
         DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as %ls went before", m_jobs[job].path,
                  reason, worker.lastProbed);
-        m_waiting.push_front({job, true});
+        m_waiting.push_front({job, true, true});
     }
     m_listener->workerEnds(number, reason);
 }
@@ -325,7 +346,7 @@ void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, c
         // One sub-plug-in's crash is not its shell's: the others are asked without it.
         outcome.records.push_back(*worker.child);
         m_listener->childEnds(job, number, outcome);
-        m_waiting.push_front({job, true});
+        m_waiting.push_front({job, true, true});
         return;
     }
     m_listener->jobEnds(job, number, outcome);

@@ -15,6 +15,8 @@ class IPoolListener {
 public:
     virtual ~IPoolListener() = default;
 
+    /// What comes of a job without the module being loaded; nothing when a worker has to ask it.
+    virtual std::optional<ProbeOutcome> look(std::size_t job) = 0;
     /// A worker begins with a job, or begins again with it.
     virtual void jobBegins(std::size_t job, int worker) = 0;
     virtual void stageEntered(std::size_t job, int worker, ProbeStage stage) = 0;
@@ -69,11 +71,13 @@ private:
     /// A job that waits for a worker.
     struct Waiting {
         std::size_t job;
-        bool needsFreshWorker;
+        bool needsFreshWorker = false;
+        bool isLookedAt = false;
     };
 
     bool isBusy() const;
     void cancelJobs();
+    void lookAhead();
     bool startWorkers();
     void handOut();
     void handOut(int number, Worker &worker, std::size_t index);

@@ -7,6 +7,7 @@
 
 #include <QString>
 
+#include <optional>
 #include <set>
 #include <vector>
 
@@ -26,6 +27,7 @@ struct ProbeJob {
     QString path;                 ///< the module: a file or a bundle
     QString fileTime;             ///< its time stamp; every record of the outcome carries it
     std::set<quint32> leftOut;    ///< sub-plug-ins of a shell that are listed by name and never loaded
+    bool isLookedAt = false;      ///< `look` found nothing that speaks against loading it
     bool announceClasses = false; ///< each class is announced as it is listed, however few there are
 };
 
@@ -57,8 +59,8 @@ struct ProbeOutcome {
             reason = why;
     }
 
-    /// Takes over what the file tells before it is loaded. True when it may be.
-    bool accept(const ModuleInspection &file)
+    /// Takes over what the file tells before it is loaded.
+    void take(const ModuleInspection &file)
     {
         using Verdict = ModuleInspection::Verdict;
         fail(file.reason);
@@ -66,7 +68,6 @@ struct ProbeOutcome {
             status = ProbeStatus::NoPlugin;
         if (file.verdict == Verdict::CutShort || file.verdict == Verdict::Unopened)
             ifFailed = IfFailed::LookAgain;
-        return file.verdict == Verdict::Loadable;
     }
 };
 
@@ -97,7 +98,10 @@ class IPluginProbe {
 public:
     virtual ~IPluginProbe() = default;
 
-    /// Loads the job's module, asks it and unloads it again. Never throws: whatever the plug-in throws is
-    /// part of the outcome.
+    /// What comes of a job without the module being loaded, by what its file tells; nothing when it is to be
+    /// loaded. Any thread.
+    virtual std::optional<ProbeOutcome> look(const ProbeJob & /*job*/) const { return std::nullopt; }
+    /// Looks at the job's module, if nobody did, loads it, asks it and unloads it again. Never throws:
+    /// whatever the plug-in throws is part of the outcome.
     virtual ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) = 0;
 };

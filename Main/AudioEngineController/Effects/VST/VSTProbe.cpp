@@ -100,8 +100,6 @@ VSTLoadResult Run::enter()
 
 void Run::ask()
 {
-    if (!outcome.accept(VSTModule::inspect(m_job.path)))
-        return;
     VSTLoadResult result = enter();
     outcome.fail(result.reason);
     if (result.status == VSTLoadResult::Status::NoEntryPoint)
@@ -197,8 +195,18 @@ void Run::closeEffect()
 
 } // namespace
 
+std::optional<ProbeOutcome> VSTProbe::look(const ProbeJob &job) const
+{
+    const ModuleInspection file = VSTModule::inspect(job.path);
+    ProbeOutcome outcome;
+    outcome.take(file);
+    return file.isLoadable() ? std::nullopt : std::make_optional(outcome);
+}
+
 ProbeOutcome VSTProbe::run(const ProbeJob &job, IProbeObserver &observer)
 {
+    if (const std::optional<ProbeOutcome> seen = job.isLookedAt ? std::nullopt : look(job))
+        return *seen;
     Run run(job, observer);
     try {
         run.ask();

@@ -5,5 +5,6 @@
 /// Asks VST 2 modules. A shell is entered once for itself and once for each of its sub-plug-ins.
 class VSTProbe : public IPluginProbe {
 public:
+    std::optional<ProbeOutcome> look(const ProbeJob &job) const override;
     ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) override;
 };

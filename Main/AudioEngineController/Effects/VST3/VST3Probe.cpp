@@ -233,13 +233,21 @@ ProbeOutcome::IfFailed ifFailed(const QString &path, bool factoryFound)
 
 } // namespace
 
+std::optional<ProbeOutcome> VST3Probe::look(const ProbeJob &job) const
+{
+    const ModuleInspection file = VST3Module::inspect(job.path);
+    ProbeOutcome outcome;
+    outcome.ifFailed = ifFailed(job.path, true);
+    outcome.take(file);
+    return file.isLoadable() ? std::nullopt : std::make_optional(outcome);
+}
+
 ProbeOutcome VST3Probe::run(const ProbeJob &job, IProbeObserver &observer)
 {
+    if (const std::optional<ProbeOutcome> seen = job.isLookedAt ? std::nullopt : look(job))
+        return *seen;
     ProbeOutcome outcome;
     bool factoryFound = true;
-    outcome.ifFailed = ifFailed(job.path, true);
-    if (!outcome.accept(VST3Module::inspect(job.path)))
-        return outcome;
     ModuleListing module(job.path, outcome, observer);
     module.listClasses(outcome.records, job.announceClasses, factoryFound);
     outcome.leftThreads = module.close();

@@ -9,5 +9,6 @@
 /// classes were listed, the outcome's reason says what.
 class VST3Probe : public IPluginProbe {
 public:
+    std::optional<ProbeOutcome> look(const ProbeJob &job) const override;
     ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) override;
 };
