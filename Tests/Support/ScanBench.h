@@ -13,6 +13,8 @@ class ScanBench : public testing::Test {
 protected:
     ScanBench() { m_folder.writeScanList(); }
 
+    /// Whether plug-ins are asked by workers: a killer ends one of them, not the scanner.
+    static bool hasWorkers() { return qEnvironmentVariableIsSet("FXPROBE_JOBS"); }
     /// The program under test.
     static QString scannerProgram();
     /// Puts a module into "Plugins", or into a folder below it when the file has one ("sub/Comp.vst3"); the
