@@ -18,6 +18,8 @@ void fuzzElf(const QByteArray &input);
 void fuzzKnown(const QByteArray &input);
 void fuzzMarker(const QByteArray &input);
 void fuzzPe(const QByteArray &input);
+void fuzzProbes(const QByteArray &input);
+void fuzzReport(const QByteArray &input);
 void fuzzScanList(const QByteArray &input);
 
 inline constexpr FuzzTarget kFuzzTargets[] = {
@@ -28,6 +30,8 @@ inline constexpr FuzzTarget kFuzzTargets[] = {
     {"known", fuzzKnown},
     {"marker", fuzzMarker},
     {"pe", fuzzPe},
+    {"probes", fuzzProbes},
+    {"report", fuzzReport},
     {"scanlist", fuzzScanList},
 };
 

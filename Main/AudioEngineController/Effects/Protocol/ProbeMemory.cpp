@@ -69,14 +69,17 @@ QByteArray render(const RememberedProbe &probe)
     return QJsonDocument(object).toJson(QJsonDocument::Compact);
 }
 
+/// A number of channels; -1 for anything else.
+qint32 channelsOf(const QJsonValue &value) { return std::max(value.toInt(-1), -1); }
+
 RememberedPlugin pluginOf(const QJsonObject &object)
 {
     RememberedPlugin plugin;
     plugin.id = object.value(word(kId)).toString();
     plugin.subId = subIdOf(object.value(word(kSubId)));
     plugin.reason = object.value(word(kReason)).toString();
-    plugin.inputs = object.value(word(kInputs)).toInt(-1);
-    plugin.outputs = object.value(word(kOutputs)).toInt(-1);
+    plugin.inputs = channelsOf(object.value(word(kInputs)));
+    plugin.outputs = channelsOf(object.value(word(kOutputs)));
     plugin.heldBy = object.value(word(kHeldBy)).toString();
     return plugin;
 }
