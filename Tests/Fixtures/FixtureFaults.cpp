@@ -51,6 +51,26 @@ bool leaveThreadRunning(const std::string &)
     return true;
 }
 
+bool faultLater(const std::string &milliseconds)
+{
+    std::thread([pause = std::chrono::milliseconds(std::stoi(milliseconds))] {
+        std::this_thread::sleep_for(pause);
+        writeToInvalidAddress();
+    }).detach();
+    return true;
+}
+
+void takeAllMemory()
+{
+    constexpr std::size_t kBlock = std::size_t(16) << 20;
+    for (;;) {
+        volatile char *block = new char[kBlock];
+        for (std::size_t place = 0; place < kBlock; place += 4096)
+            block[place] = 1;
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    }
+}
+
 bool printMuch(const std::string &kibibytes)
 {
     const std::string text = std::string(1023, '.') + '\n';
@@ -84,6 +104,7 @@ bool commitFault(const std::string &kind)
         {"terminate", [] { std::terminate(); }},
         {"kill", killProcess},
         {"hang", sleepForEver},
+        {"memory", takeAllMemory},
         {"pthread-exit", endThread}};
     const auto fault = faults.find(kind);
     if (fault != faults.end())
@@ -107,7 +128,9 @@ bool causeSideEffect(const std::string &kind, const std::string &value)
          [](Text name) { return std::signal(name == "segv" ? SIGSEGV : SIGTERM, [](int) {}) != SIG_ERR; }},
         {"alarm", startAlarm},
         {"print", printMuch},
+        {"input", [](Text) { return std::getchar() == EOF; }},
+        {"late-fault", faultLater},
         {"thread", leaveThreadRunning}};
     const auto effect = effects.find(kind);
-    return effect != effects.end() && effect->second(value);
+    return effect != effects.end() ? effect->second(value) : causePlatformEffect(kind, value);
 }

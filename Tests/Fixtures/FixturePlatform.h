@@ -17,6 +17,8 @@ void killProcess();
 /// Ends the calling thread only.
 void endThread();
 
+/// What only some systems have plug-ins do; false elsewhere, and for no such kind.
+bool causePlatformEffect(const std::string &kind, const std::string &value);
 void setFileMask(int mask);
 /// Lets an alarm signal arrive after so many seconds, where the system has one; false for none.
 bool startAlarm(const std::string &seconds);

@@ -7,6 +7,7 @@
 #include <fcntl.h>
 #include <pthread.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 std::string modulePath()
@@ -31,6 +32,50 @@ void endProcess(int exitCode) { _exit(exitCode); }
 void killProcess() { kill(getpid(), SIGKILL); }
 
 void endThread() { pthread_exit(nullptr); }
+
+namespace {
+
+/// Starts a process that stays until it is ended, and leaves its number in a file.
+bool leaveChild(const std::string &file)
+{
+    const pid_t child = fork();
+    if (child != 0)
+        return child > 0 && appendToFile(file, std::to_string(child) + '\n');
+    for (;;)
+        pause();
+}
+
+/// The same in a session of its own, and nobody's child.
+bool leaveDaemon(const std::string &file)
+{
+    const pid_t child = fork();
+    if (child != 0)
+        return waitpid(child, nullptr, 0) == child;
+    setsid();
+    _exit(leaveChild(file) ? 0 : 1);
+}
+
+bool writeEverywhere()
+{
+    for (int number = 3; number < 256; ++number)
+        [[maybe_unused]] const ssize_t count = write(number, "garbage garbage ", 16);
+    return true;
+}
+
+} // namespace
+
+bool causePlatformEffect(const std::string &kind, const std::string &value)
+{
+    if (kind == "fork" || kind == "daemon")
+        return kind == "fork" ? leaveChild(value) : leaveDaemon(value);
+    if (kind == "garbage")
+        return writeEverywhere();
+    if (kind == "close-all")
+        return close_range(0, ~0U, 0) == 0;
+    if (kind == "terminal") // there must be none
+        return open("/dev/tty", O_RDWR) < 0;
+    return kind == "kill-group" && kill(-getpgid(getppid()), SIGKILL) == 0;
+}
 
 void setFileMask(int mask) { umask(static_cast<mode_t>(mask)); }
 

@@ -40,6 +40,8 @@ void killProcess() { TerminateProcess(GetCurrentProcess(), 1); }
 
 void endThread() { ExitThread(0); }
 
+bool causePlatformEffect(const std::string &, const std::string &) { return false; }
+
 void setFileMask(int mask) { _umask(mask); }
 
 bool startAlarm(const std::string &seconds) { return std::strtol(seconds.c_str(), nullptr, 10) > 0; }

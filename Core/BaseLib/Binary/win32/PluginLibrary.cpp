@@ -11,6 +11,10 @@
 #include <algorithm>
 #include <iterator>
 
+#include <windows.h>
+
+#include <psapi.h>
+
 void *PluginLibrary::loadUncached(const QString &path) noexcept
 {
     if (path.isEmpty()) {
