@@ -19,6 +19,7 @@ void fuzzKnown(const QByteArray &input);
 void fuzzMarker(const QByteArray &input);
 void fuzzPe(const QByteArray &input);
 void fuzzProbes(const QByteArray &input);
+void fuzzChannel(const QByteArray &input);
 void fuzzReport(const QByteArray &input);
 void fuzzScanList(const QByteArray &input);
 
@@ -31,6 +32,7 @@ inline constexpr FuzzTarget kFuzzTargets[] = {
     {"marker", fuzzMarker},
     {"pe", fuzzPe},
     {"probes", fuzzProbes},
+    {"channel", fuzzChannel},
     {"report", fuzzReport},
     {"scanlist", fuzzScanList},
 };
