@@ -65,8 +65,10 @@ class Case:
         for catalogue in self.effects.glob("*Configuration.xml"):
             catalogue.unlink()
 
-    def first_scan(self):
-        return Process(self.program, self.list, prepare=self.forget)
+    def first_scan(self, jobs=None):
+        """In the scanner's own process, or with so many workers."""
+        environment = {"FXPROBE_JOBS": str(jobs)} if jobs else {}
+        return Process(self.program, self.list, environment=environment, prepare=self.forget)
 
     def next_scan(self):
         return Process(self.program, self.list)
@@ -153,7 +155,7 @@ class Bench:
             head, block, tail = re.fullmatch("(.*?)(\t<Effect>.*</Effect>\n)(.*)", text, re.DOTALL).groups()
             records = [self.renumbered(block, number) for number in range(count)]
             (case.effects / catalogue.name).write_text(head + "".join(sorted(records, key=self.identifier)) + tail)
-        case.check(files=3 * count, probes=count)  # the binaries in the bundles are looked at as VST 2 modules
+        case.check(files=2 * count, probes=0)
         return case.next_scan()
 
     @staticmethod
@@ -174,6 +176,27 @@ class Bench:
             case = Case(self, f"real {kinds}", folders.values())
             self.row(f"first scan, real {' and '.join(kinds)}, against the floor", case.first_scan(), self.floor(folders),
                      "1.05")
+
+    def pool(self):
+        """Workers against the floor, which is one process."""
+        plain = self.work / "plain vst2"
+        plain.mkdir()
+        for module in LIBRARIES["vst2"].glob("*.so"):
+            (plain / module.name).symlink_to(module)
+        packages = {"zam-plugins and dpf-plugins": ({"vst3": LIBRARIES["vst3"], "vst2": plain}, "0.7"),
+                    "lsp-plugins": ({"vst2": LIBRARIES["vst2"] / "lsp-plugins"}, "0.45")}
+        for name, (folders, aim) in packages.items():
+            case, floor = Case(self, f"pool {name}", folders.values()), self.floor(folders)
+            for jobs in (None, 1, 2, 4, 8):
+                workers = f"{jobs} workers" if jobs else "no workers"
+                self.row(f"first scan, {name}, {workers}, against the floor", case.first_scan(jobs), floor, aim if jobs == 4 else "",
+                         share=3)
+        for kind in LIBRARIES:
+            count = 1000
+            folders = {kind: self.fixtures(f"pool {kind}", count)[kind]}
+            scan, floor = Case(self, f"pool {kind} case", folders.values()).first_scan(4), self.floor(folders)
+            net, least = self.row(f"first scan, {count:,} fixtures, {kind}, 4 workers", scan, floor, "", share=4)
+            print(f"| … our own for each file | {(net - least) / count * 1e6:.0f} µs | | | | 500 µs |")
 
     def peers(self):
         libraries = next(iter(Path("/usr/lib").glob("ardour*/")), None)
@@ -220,7 +243,7 @@ class Bench:
 
 
 def main():
-    rows = {"start": Bench.start_and_end, "real": Bench.real, "peers": Bench.peers, "unchanged": Bench.unchanged_scans,
+    rows = {"start": Bench.start_and_end, "real": Bench.real, "pool": Bench.pool, "peers": Bench.peers, "unchanged": Bench.unchanged_scans,
             "first": Bench.first_scans}
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("programs", type=Path, help="the folder of the built programs")
