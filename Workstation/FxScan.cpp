@@ -107,6 +107,14 @@ int listOnly(const ScanOptions &options, const DataFiles &files)
                     {});
 }
 
+int printUsualFolders()
+{
+    QString lines;
+    for (const QString &folder : existingUsualFolders())
+        lines += folder + QLatin1Char('\n');
+    return Terminal::printData(lines) ? ScanExit::kDone : ScanExit::kNotFinished;
+}
+
 /// Gives plug-ins another chance; the exit code when that cannot be done.
 int retry(const ScanOptions &options, const QStringList &folders, PluginHost &registry,
           const DataFiles &files)
@@ -163,6 +171,8 @@ bool waitForScanner(const QString &effectsFolder)
 
 int runFxScan(ScanOptions options)
 {
+    if (options.foldersOnly)
+        return printUsualFolders();
     const DataFiles files(options.dataFolder);
     if (options.listOnly)
         return listOnly(options, files);

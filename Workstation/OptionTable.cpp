@@ -86,6 +86,8 @@ const std::vector<OptionRow> &optionTable()
     static const std::vector<OptionRow> rows = {
         {"data-folder", "folder", &ScanOptions::dataFolder,
          "Keep the catalogues in the folder Effects of this folder."},
+        {"folders", "", &ScanOptions::foldersOnly,
+         "Print the usual plug-in folders that exist, one a line, without a scan."},
         {"format", "format", ChoiceTarget{{"table", "json", "csv"}, setFormat},
          "Print the result as table (the default), json or csv."},
         {"in-process", "", &ScanOptions::inProcess,
@@ -120,6 +122,9 @@ const std::vector<OptionRow> &optionTable()
 const std::vector<OptionConflict> &optionConflicts()
 {
     static const std::vector<OptionConflict> conflicts = {
+        {"folders", "list", "--folders makes no scan"},
+        {"folders", "retry", "--folders makes no scan"},
+        {"folders", "retry-failed", "--folders makes no scan"},
         {"list", "retry", "--list makes no scan"},
         {"list", "retry-failed", "--list makes no scan"},
         {"list", "in-process", "--list makes no scan"},

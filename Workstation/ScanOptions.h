@@ -24,6 +24,7 @@ struct ScanOptions {
     int memoryLimit = 0;      ///< MiB that a plug-in may take; 0: a share of the machine's
     int timeout = 60;         ///< seconds that one plug-in may take; 0: for ever
     bool listOnly = false;
+    bool foldersOnly = false; ///< prints the usual folders, and nothing else
     bool inProcess = false;
     bool quiet = false;
     bool showWindow = false;

@@ -2,6 +2,7 @@
 #include "Tests/Support/ScanBench.h"
 
 #include <QDeadlineTimer>
+#include <QDir>
 #include <QFile>
 #include <QFileInfo>
 #include <QJsonArray>
@@ -270,6 +271,17 @@ TEST_F(FxScan, NamesThatBreakTheCatalogueAreNamed)
     const QByteArray problems = QJsonDocument(result["problems"].toArray()).toJson();
     EXPECT_TRUE(problems.contains("the name of 'A < B'")) << problems.constData();
     EXPECT_EQ(states(result).size(), 1u) << "shown all the same";
+}
+
+TEST_F(FxScan, TheUsualFoldersAreThoseThatExist)
+{
+    addVst3("Any", "");
+    ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
+    fxscan.setEnvironment("VST3_PATH", m_folder.plugins() + QDir::listSeparator() + m_folder.path("nowhere"));
+    prepare(fxscan, {"--folders"});
+    const QByteArray folders = fxscan.run().standardOutput;
+    EXPECT_TRUE(folders.startsWith(m_folder.plugins().toUtf8())) << folders.constData();
+    EXPECT_FALSE(folders.contains("nowhere")) << folders.constData();
 }
 
 TEST_F(FxScan, WrongUsage)

@@ -56,6 +56,7 @@ TEST(Options, WrongOnesAreNamedWithWhatToDo)
         {{"--data-folder="}, "--data-folder needs a folder"},
         {{"--quiet=yes"}, "Unexpected value after '--quiet'."},
         {{"--list", "/plug-ins"}, "--list makes no scan; it takes no folders"},
+        {{"--folders", "/plug-ins"}, "--folders makes no scan; it takes no folders"},
         {{"--timeout", "5", "--in-process"},
          "--in-process cannot end a plug-in that hangs; it cannot be combined with --timeout"},
     };
