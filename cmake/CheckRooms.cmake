@@ -1,5 +1,5 @@
 # Run by a test (cmake -P): fails for each source that includes a header of a room that does not lie below its own. The linker
-# sees calls only, and a header may hold all that it offers.
+# finds calls upwards, but not the use of a header that needs no library.
 cmake_minimum_required(VERSION 3.22)
 
 set(effects Main/AudioEngineController/Effects)

@@ -13,7 +13,7 @@ inline constexpr quint32 kIllegalInstruction = 0xC000001D;
 inline constexpr quint32 kIntegerDivideByZero = 0xC0000094;
 inline constexpr quint32 kStackOverflow = 0xC00000FD;
 
-/// For people: "invalid memory access"; empty for other codes than these.
+/// The fault in words, for example "invalid memory access"; empty for any other code.
 QString name(quint32 code);
 } // namespace FaultCode
 

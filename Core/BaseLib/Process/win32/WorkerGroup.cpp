@@ -162,7 +162,7 @@ bool startProcess(Worker &worker, const std::wstring &program, std::wstring comm
     return false;
 }
 
-/// What the status of a crash means; empty when it has no name here.
+/// The status of a crash in words; empty for one that is not known here.
 QString nameOf(DWORD status)
 {
     switch (status) {

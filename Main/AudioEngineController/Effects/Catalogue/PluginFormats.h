@@ -42,9 +42,9 @@ const PluginFormatInfo &formatInfo(PluginFormat format);
 /// The format of that key; null for a key that the table does not have.
 const PluginFormatInfo *formatOfKey(const QString &key);
 
-/// The folder of a VST 3 bundle that holds all of it, appended to the bundle's path.
+/// The folder that holds everything in a VST 3 bundle, appended to the bundle's path.
 inline constexpr char kBundleContents[] = "/Contents";
-/// The path of the VST 3 bundle in whose contents a file lies, the innermost one; empty when it lies in none.
+/// The path of the innermost VST 3 bundle that holds a file; empty when the file is not in a bundle.
 QString bundleOf(const QString &path);
 
 /// The format that a prefix names; the prefix is compared whole and case-sensitively.

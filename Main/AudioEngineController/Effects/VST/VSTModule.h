@@ -21,7 +21,7 @@ struct VSTLoadResult {
         NoEntryPoint,  ///< it is not a VST 2 module
         EntryFailed,   ///< the entry point threw or faulted; the module is to be unloaded
         NoEffect,      ///< the entry point returned null
-        InvalidEffect, ///< the entry point returned something else than an effect
+        InvalidEffect, ///< the entry point returned something other than an effect
     };
 
     Status status = Status::Done;
@@ -81,5 +81,5 @@ private:
     bool m_faulted = false;             ///< in the entry point, or in an effect that is closed
 };
 
-/// Logs that a plug-in of the catalogue could not be loaded; the reason is the caller's to tell.
+/// Logs that a plug-in of the catalogue could not be loaded. The caller logs why.
 void logFailedLoad(const QString &path, const VSTLoadResult &result);

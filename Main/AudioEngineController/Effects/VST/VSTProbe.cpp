@@ -11,7 +11,7 @@
 
 namespace {
 
-/// Stands for the plug-in that is probed. What it reports is of no interest.
+/// Stands for the plug-in that is probed. What it reports is ignored.
 class ProbedPlugin final : public IVSTEffectOwner {
 public:
     explicit ProbedPlugin(const QString &path)
@@ -32,7 +32,7 @@ private:
     std::atomic<VstInt32> m_shellId{0}; ///< plug-ins ask for it on threads of their own
 };
 
-/// The reason where something throws that no call of the plug-in is known to throw.
+/// The reason for an exception that did not come from the plug-in.
 QString failureOf(const std::exception &error)
 {
     return QStringLiteral("asking it failed: ") + QString::fromLocal8Bit(error.what());

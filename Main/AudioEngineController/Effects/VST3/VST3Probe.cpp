@@ -22,7 +22,7 @@ using ClassListing = std::vector<EffectRecord>;
 
 /// Each class of a module with more classes than this is announced as it is listed.
 constexpr int32 kManyClasses = 6;
-/// More classes than any module has. A factory that states more is only asked for these: two thousand million
+/// More classes than any module has. A factory that states more is asked for this many only: two billion
 /// calls for classes that do not exist take minutes.
 constexpr int32 kMaxClasses = 0x10000;
 
@@ -33,7 +33,7 @@ struct ClassInfo {
     QString name;
     FUID id;
     QString subCategories; ///< not in the oldest form
-    QString vendor;        ///< neither
+    QString vendor;        ///< not in the oldest form either
 };
 
 /// An SDK structure without anything in it.
@@ -200,7 +200,7 @@ void ModuleListing::listClass(ClassListing &records, IPluginFactory &factory, co
     QString reason;
     auto *const component = createObject<Vst::IComponent>(&factory, info.id, reason);
     if (!component || !initialise(*component, m_hostContext->unknown(), reason)) {
-        fail(QStringLiteral("its class \"%1\" %2").arg(info.name, reason)); // it is left out
+        fail(QStringLiteral("its class \"%1\" %2").arg(info.name, reason)); // the class is left out
         return;
     }
     records.push_back(describe(*component, info, m_factoryVendor));
@@ -216,7 +216,7 @@ void ModuleListing::enter(ProbeStage stage)
     m_observer.stageEntered(stage);
 }
 
-/// The outcome holds the first reason, which whoever reads it logs; the others go to the log here.
+/// The outcome holds the first reason only, and its reader logs that one. Further reasons are logged here.
 void ModuleListing::fail(const QString &reason)
 {
     if (!m_outcome.reason.isEmpty())
