@@ -275,11 +275,10 @@ TEST_F(FxScan, NamesThatBreakTheCatalogueAreNamed)
 
 TEST_F(FxScan, TheUsualFoldersAreThoseThatExist)
 {
-    addVst3("Any", "");
-    ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
-    fxscan.setEnvironment("VST3_PATH", m_folder.plugins() + QDir::listSeparator() + m_folder.path("nowhere"));
-    prepare(fxscan, {"--folders"});
-    const QByteArray folders = fxscan.run().standardOutput;
+    put("Any.vst3");
+    m_fxscan.setEnvironment("VST3_PATH",
+                            m_folder.plugins() + QDir::listSeparator() + m_folder.path("nowhere"));
+    const QByteArray folders = run({"--folders"}).standardOutput;
     EXPECT_TRUE(folders.startsWith(m_folder.plugins().toUtf8())) << folders.constData();
     EXPECT_FALSE(folders.contains("nowhere")) << folders.constData();
 }

@@ -36,6 +36,14 @@ public:
         if (m_size < m_text.size())
             m_text[m_size++] = character;
     }
+    /// Copies the text, cut where it does not fit, with a zero behind it.
+    void copyTo(char *target, std::size_t size) const
+    {
+        const std::size_t count = m_size < size ? m_size : size - 1;
+        for (std::size_t index = 0; index < count; ++index)
+            target[index] = m_text[index];
+        target[count] = 0;
+    }
     const char *data() const { return m_text.data(); }
     std::size_t size() const { return m_size; }
 
@@ -74,22 +82,18 @@ inline void setName(CrashPlace &place, const char *path)
         place.name[index] = *name++;
 }
 
-/// The lines of a description: what happened, where, and the frames that led there.
-inline CrashText crashText(const char *what, const CrashPlace *place, const CrashPlaces &frames,
-                           std::size_t count, bool isOwnThread)
+/// The lines of a description: what happened and where, and the frames that led there.
+inline CrashText crashText(const char *words, const CrashPlaces &frames, std::size_t count, bool isOwnThread)
 {
     CrashText text;
     text << "\n";
     text.add(CrashText::kFirst);
-    text << what;
-    if (place)
-        text << " in " << *place;
-    const CrashPlace *caller = nullptr;
-    for (std::size_t index = count; index-- > 0;)
-        if (frames[index].isPlugin)
-            caller = &frames[index];
-    if (caller && (!place || !place->isPlugin))
-        text << ", called from " << *caller;
+    text << words;
+    std::size_t caller = 0;
+    while (caller < count && !frames[caller].isPlugin)
+        ++caller;
+    if (caller > 0 && caller < count) // the fault came up in another's code
+        text << ", called from " << frames[caller];
     if (isOwnThread)
         text << ", in a thread of its own";
     text << "\n";

@@ -32,10 +32,19 @@ QString FaultCode::name(quint32 code)
     }
 }
 
-SEException::SEException(quint32 code)
+SEException::SEException(quint32 code, const char *words)
     : std::runtime_error(describe(code))
     , m_code(code)
+    , m_words(QString::fromUtf8(words))
 {}
+
+QString SEException::words() const
+{
+    if (!m_words.isEmpty())
+        return m_words;
+    const QString name = FaultCode::name(m_code);
+    return name.isEmpty() ? formatText(L"fault 0x%08X", m_code) : name;
+}
 
 QString guardedText(const std::exception &exception)
 {

@@ -21,11 +21,15 @@ QString name(quint32 code);
 /// Violation" or the code.
 class SEException : public std::runtime_error {
 public:
-    explicit SEException(quint32 code);
+    /// `words` say what happened and where, as far as that is known (UTF-8).
+    explicit SEException(quint32 code, const char *words = "");
     quint32 code() const { return m_code; }
+    /// For people: "invalid memory access at 0x10 in Name.so+0x12A", or the name or number of the code.
+    QString words() const;
 
 private:
     quint32 m_code;
+    QString m_words;
 };
 
 /// A C++ exception of another compiler's run-time library, which this program's `catch` does not see, as an

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <atomic>
+#include <climits>
 #include <cstring>
 
 #include <execinfo.h>
@@ -25,7 +26,7 @@ constexpr std::size_t kHandlerStack = std::size_t(256) * 1024;
 
 int s_output = -1;
 pid_t s_thread = 0;
-char s_plugin[4096] = {}; ///< PATH_MAX (limits.h)
+char s_plugin[PATH_MAX] = {};
 std::atomic_flag s_isDescribing = ATOMIC_FLAG_INIT;
 
 quint64 registerOf(const void *context, int number)
@@ -48,9 +49,9 @@ const char *wordsOf(int signalNumber, const siginfo_t *info, const void *context
     case SIGBUS:
         return "access to memory that is not there";
     case SIGFPE:
-        return "arithmetic fault";
+        return info->si_code == FPE_INTDIV ? "division by zero" : "arithmetic fault";
     case SIGILL:
-        return "invalid instruction";
+        return "illegal instruction";
     case SIGABRT:
         return "it gave up (abort)";
     case SIGTRAP:
@@ -113,8 +114,8 @@ quint64 hexadecimal(const char *&text)
 /// Tells of each place which module it lies in (proc(5): /proc/pid/maps).
 void locate(CrashPlaces &places, std::size_t count)
 {
-    static char line[8192];
-    static char module[sizeof line];
+    char line[PATH_MAX + 128]; // the other columns are shorter
+    char module[PATH_MAX] = {};
     quint64 base = 0;
     Lines maps("/proc/self/maps");
     while (maps.next(line, sizeof line)) {
@@ -125,7 +126,7 @@ void locate(CrashPlaces &places, std::size_t count)
         const char *const path = std::strchr(rest, '/');
         if (!path || std::strcmp(path, module) != 0) {
             base = start;
-            std::strcpy(module, path ? path : "");
+            qstrncpy(module, path ? path : "", sizeof module);
         }
         for (std::size_t index = 0; index < count; ++index) {
             CrashPlace &place = places[index];
@@ -167,29 +168,37 @@ void onSignal(int signalNumber, siginfo_t *info, void *context)
 
 } // namespace
 
-void describeCrash(int signalNumber, siginfo_t *info, void *context)
+void describeFault(int signalNumber, const siginfo_t *info, const void *context, char *words,
+                   std::size_t size)
+{
+    CrashText text;
+    text << wordsOf(signalNumber, info, context);
+    const bool isFault = info->si_code > 0; // not sent by a process (sigaction(2))
+    if (isFault && (signalNumber == SIGSEGV || signalNumber == SIGBUS))
+        text << " at " << reinterpret_cast<quint64>(info->si_addr);
+    CrashPlaces places;
+    places[0].address = registerOf(context, REG_RIP);
+    if (isFault) {
+        locate(places, 1);
+        text << " in " << places[0];
+    }
+    text.copyTo(words, size);
+}
+
+void describeCrash(int signalNumber, const siginfo_t *info, const void *context)
 {
     if (s_output < 0 || s_isDescribing.test_and_set())
         return;
-    static CrashText what;
-    what << wordsOf(signalNumber, info, context);
-    const bool isFault = info->si_code > 0; // not sent by a process (sigaction(2))
-    if (isFault && (signalNumber == SIGSEGV || signalNumber == SIGBUS))
-        what << " at " << reinterpret_cast<quint64>(info->si_addr);
-    what.add(0);
-    static CrashPlaces frames;
-    frames[0].address = registerOf(context, REG_RIP);
-    locate(frames, 1);
-    static CrashPlace place;
-    place = frames[0];
+    static char words[512];
+    describeFault(signalNumber, info, context, words, sizeof words);
     const bool isOwnThread = gettid() != s_thread;
-    const CrashPlace *const where = isFault ? &place : nullptr;
+    static CrashPlaces frames;
     // Before the frames are looked for, which may be a fault of its own in a stack that is damaged.
-    print(crashText(what.data(), where, frames, 0, isOwnThread));
-    const std::size_t count = framesFrom(frames[0].address, frames);
+    print(crashText(words, frames, 0, isOwnThread));
+    const std::size_t count = framesFrom(registerOf(context, REG_RIP), frames);
     locate(frames, count);
     if (count > 0)
-        print(crashText(what.data(), where, frames, count, isOwnThread));
+        print(crashText(words, frames, count, isOwnThread));
 }
 
 void CrashReport::install()

@@ -24,6 +24,7 @@ struct Guard {
 
     sigjmp_buf context;
     volatile quint32 code = 0; ///< of the fault that came, or 0
+    char words[256] = {};      ///< about it
     Guard *outer;
 };
 
@@ -74,6 +75,7 @@ void onFault(int signalNumber, siginfo_t *info, void *context)
 {
     if (Guard *guard = t_innermost) {
         guard->code = codeOf(signalNumber);
+        describeFault(signalNumber, info, context, guard->words, sizeof guard->words);
         siglongjmp(guard->context, 1);
     }
     // No guard on this thread: end the process as usual.
@@ -116,5 +118,5 @@ void FaultGuardDetail::run(Watch watch, void (*function)(void *), void *argument
     if (sigsetjmp(guard.context, 1) == 0)
         function(argument);
     else
-        throw SEException(guard.code);
+        throw SEException(guard.code, guard.words);
 }

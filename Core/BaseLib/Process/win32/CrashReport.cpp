@@ -1,6 +1,7 @@
 #include "Core/BaseLib/Process/CrashReport.h"
 
 #include "Core/BaseLib/Process/CrashText.h"
+#include "Core/BaseLib/Process/win32/CrashHandler.h"
 
 #include <QDir>
 
@@ -28,7 +29,7 @@ const char *wordsOf(DWORD code)
         return "division by zero";
     case EXCEPTION_ILLEGAL_INSTRUCTION:
     case EXCEPTION_PRIV_INSTRUCTION:
-        return "invalid instruction";
+        return "illegal instruction";
     case EXCEPTION_STACK_OVERFLOW:
         return "stack overflow";
     case EXCEPTION_BREAKPOINT:
@@ -83,27 +84,38 @@ LONG WINAPI describe(EXCEPTION_POINTERS *fault)
 {
     if (s_isDescribing.test_and_set())
         return EXCEPTION_CONTINUE_SEARCH;
-    const EXCEPTION_RECORD &record = *fault->ExceptionRecord;
-    static CrashText what;
-    what << wordsOf(record.ExceptionCode);
-    if (record.ExceptionCode == EXCEPTION_ACCESS_VIOLATION && record.NumberParameters > 1)
-        what << " at " << static_cast<quint64>(record.ExceptionInformation[1]);
-    else if (wordsOf(record.ExceptionCode) == wordsOf(0))
-        what << " " << static_cast<quint64>(record.ExceptionCode);
-    what.add(0);
-    static CrashPlace place;
-    place.address = reinterpret_cast<quint64>(record.ExceptionAddress);
-    locate(place);
+    static char words[512];
+    describeFault(*fault->ExceptionRecord, words, sizeof words);
     static CrashPlaces frames;
     const bool isOwnThread = GetCurrentThreadId() != s_thread;
     // Before the frames are looked for, which may be a fault of its own in a stack that is damaged.
-    print(crashText(what.data(), &place, frames, 0, isOwnThread));
+    print(crashText(words, frames, 0, isOwnThread));
     const std::size_t count = framesFrom(*fault->ContextRecord, frames);
-    print(crashText(what.data(), &place, frames, count, isOwnThread));
+    print(crashText(words, frames, count, isOwnThread));
     return EXCEPTION_CONTINUE_SEARCH;
 }
 
 } // namespace
+
+void describeFault(const EXCEPTION_RECORD &record, char *words, std::size_t size)
+{
+    static std::atomic_flag isAtWork = ATOMIC_FLAG_INIT; // of several threads one is described whole
+    const DWORD code = record.ExceptionCode;
+    CrashText text;
+    text << wordsOf(code);
+    if (code == EXCEPTION_ACCESS_VIOLATION && record.NumberParameters > 1)
+        text << " at " << static_cast<quint64>(record.ExceptionInformation[1]);
+    else if (wordsOf(code) == wordsOf(0))
+        text << " " << static_cast<quint64>(code);
+    if (!isAtWork.test_and_set()) {
+        CrashPlace place;
+        place.address = reinterpret_cast<quint64>(record.ExceptionAddress);
+        locate(place);
+        text << " in " << place;
+        isAtWork.clear();
+    }
+    text.copyTo(words, size);
+}
 
 void CrashReport::install()
 {

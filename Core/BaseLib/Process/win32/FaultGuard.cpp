@@ -1,5 +1,6 @@
 #include "Core/BaseLib/Process/FaultGuard.h"
 
+#include "Core/BaseLib/Process/win32/CrashHandler.h"
 #include "Core/BaseLib/Process/win32/MicrosoftException.h"
 
 #include <cstddef>
@@ -23,8 +24,8 @@ constexpr std::size_t kGuardPlace = 32;
 struct Guard {
     CONTEXT context;
     FaultGuardDetail::Watch watch;
-    volatile DWORD code = 0;    ///< of what ended the call, or 0
-    char foreignText[512] = {}; ///< of an exception of another compiler
+    volatile DWORD code = 0; ///< of what ended the call, or 0
+    char text[512] = {};     ///< about it: of an exception of another compiler its own
 };
 
 } // namespace
@@ -47,13 +48,14 @@ void fxprobeGuardReturn();
         return ExceptionContinueSearch;
     Guard *guard = *reinterpret_cast<Guard **>(static_cast<std::byte *>(frame) + kGuardPlace);
     if (record->ExceptionCode == MicrosoftException::kCode) {
-        MicrosoftException::describe(*record, guard->foreignText, sizeof guard->foreignText);
+        MicrosoftException::describe(*record, guard->text, sizeof guard->text);
         guard->code = record->ExceptionCode;
         // Its frames expect to be unwound, as for a `catch` of their own.
         RtlUnwindEx(frame, reinterpret_cast<void *>(fxprobeGuardReturn), record, nullptr, context,
                     dispatcher->HistoryTable);
     } else if (guard->watch == FaultGuardDetail::Watch::FaultsAndForeignExceptions) {
         guard->code = record->ExceptionCode;
+        describeFault(*record, guard->text, sizeof guard->text);
         // Not unwound: after a fault the plug-in's state is unknown, and an overflowed stack has no room.
         RtlRestoreContext(&guard->context, nullptr);
     }
@@ -132,8 +134,8 @@ void FaultGuardDetail::run(Watch watch, void (*function)(void *), void *argument
     if (guard.code == 0)
         return;
     if (guard.code == MicrosoftException::kCode)
-        throw ForeignException(guard.foreignText);
+        throw ForeignException(guard.text);
     if (guard.code == FaultCode::kStackOverflow)
         _resetstkoflw(); // else the next one ends the process
-    throw SEException(guard.code);
+    throw SEException(guard.code, guard.text);
 }

@@ -179,7 +179,7 @@ bool VSTEffect::guard(const char *what, int number, Call &&call)
         return true;
     } catch (const SEException &fault) {
         *m_faulted = true;
-        DebugLog(L"VST plug-in %s %d: %s", what, number, fault.what());
+        DebugLog(L"VST plug-in %s %d: %s, %ls", what, number, fault.what(), fault.words());
     } catch (const std::exception &exception) {
         DebugLog(L"VST plug-in %s %d threw: %ls", what, number, guardedText(exception));
     } catch (...) {

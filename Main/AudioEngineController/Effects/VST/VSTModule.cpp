@@ -29,12 +29,6 @@ VSTLoadResult entryFailed(Status status, const QString &how)
     return failed(status, QStringLiteral("its entry point ") + how);
 }
 
-QString inWords(const SEException &fault)
-{
-    const QString name = FaultCode::name(fault.code());
-    return name.isEmpty() ? formatText(L"fault 0x%08X", fault.code()) : name;
-}
-
 VSTLoadResult invalidEffect()
 {
     return entryFailed(Status::InvalidEffect,
@@ -72,9 +66,9 @@ VSTLoadResult VSTModule::enter(VSTHostCallbackFunction callback, IVSTEffectOwner
         return takeOver(callGuarded([&] { return entryPoint(callback); }), owner);
     } catch (const SEException &fault) {
         m_faulted = true;
-        DebugLog(L"The VST plug-in's entry point failed: %s", fault.what());
+        DebugLog(L"The VST plug-in's entry point failed: %s, %ls", fault.what(), fault.words());
         return failed(Status::EntryFailed,
-                      QStringLiteral("it crashed when it was started (%1)").arg(inWords(fault)));
+                      QStringLiteral("it crashed when it was started (%1)").arg(fault.words()));
     } catch (const std::exception &exception) {
         return entryFailed(Status::EntryFailed, QStringLiteral("threw: ") + guardedText(exception));
     } catch (...) {
