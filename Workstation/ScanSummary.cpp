@@ -67,9 +67,6 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
     for (const auto &[key, probe] : account.probes()) {
         if (probe.reason.isEmpty() || recorded.count({key.format, key.path}) != 0)
             continue;
-        // Nobody takes what lies in a bundle of the other format for a plug-in of this one.
-        if (probe.noPlugin && !bundleOf(key.path).isEmpty())
-            continue;
         const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;
         (probe.noPlugin ? summary.noPlugins : summary.failures)
             .push_back({&formatInfo(key.format), PluginState::Failed, name, key.path, key.subId, probe.reason,
