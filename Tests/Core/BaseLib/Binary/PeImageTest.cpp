@@ -118,42 +118,42 @@ TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
 
 TEST(ModuleFile, TellsBeforeLoadingWhatCannotBeLoaded)
 {
-    using Verdict = ModuleInspection::Verdict;
+    using Is = ModuleInspection::Verdict;
     const struct {
         const char *name, *file;
         int offset, width;
         quint64 value;
-        Verdict ofElf, ofPe; ///< where these are the system's own
+        Is ofElf, ofPe; ///< where these are the system's own
     } rows[] = {
-        {"ELF", "elf/exported-gnu", 0, 1, 0x7f, Verdict::Loadable, Verdict::Foreign},
-        {"ELF of 32 bits, all headers there", "elf/exported-gnu", 4, 1, 1, Verdict::Loadable,
-         Verdict::Foreign},
-        {"ELF for ARM", "elf/exported-gnu", 18, 2, 183, Verdict::Foreign, Verdict::Foreign},
-        {"ELF of the other byte order", "elf/exported-gnu", 5, 1, 2, Verdict::Loadable, Verdict::Foreign},
-        {"segment behind the end", "elf/exported-gnu", 0x40 + 32, 8, 1 << 30, Verdict::CutShort,
-         Verdict::CutShort},
-        {"segment that wraps around", "elf/exported-gnu", 0x40 + 32, 8, ~0ULL, Verdict::CutShort,
-         Verdict::CutShort},
-        {"section headers behind the end", "elf/exported-gnu", 40, 8, 1 << 30, Verdict::CutShort,
-         Verdict::CutShort},
-        {"ELF magic that is none", "elf/exported-gnu", 1, 1, 'e', Verdict::NoLibrary, Verdict::NoLibrary},
-        {"PE", "pe/64-bit.dll", 0, 1, 'M', Verdict::Foreign, Verdict::Loadable},
-        {"PE of 32 bits", "pe/32-bit.dll", 0, 1, 'M', Verdict::Foreign, Verdict::Foreign},
-        {"section behind the end", "pe/64-bit.dll", kSection + 16, 4, ~0U, Verdict::CutShort,
-         Verdict::CutShort},
-        {"program of DOS", "pe/64-bit.dll", 0x40, 1, 'N', Verdict::NoLibrary, Verdict::NoLibrary},
+        {"ELF", "elf/exported-gnu", 0, 1, 0x7f, Is::Loadable, Is::Foreign},
+        {"ELF of 32 bits, all headers there", "elf/exported-gnu", 4, 1, 1, Is::Loadable, Is::Foreign},
+        {"ELF for ARM", "elf/exported-gnu", 18, 2, 183, Is::Foreign, Is::Foreign},
+        {"ELF of the other byte order", "elf/exported-gnu", 5, 1, 2, Is::Loadable, Is::Foreign},
+        {"segment behind the end", "elf/exported-gnu", 0x40 + 32, 8, 1 << 30, Is::CutShort, Is::CutShort},
+        {"segment that wraps around", "elf/exported-gnu", 0x40 + 32, 8, ~0ULL, Is::CutShort, Is::CutShort},
+        {"section headers behind the end", "elf/exported-gnu", 40, 8, 1 << 30, Is::CutShort, Is::CutShort},
+        {"ELF magic that is none", "elf/exported-gnu", 1, 1, 'e', Is::NoLibrary, Is::NoLibrary},
+        {"PE", "pe/64-bit.dll", 0, 1, 'M', Is::Foreign, Is::Loadable},
+        {"PE of 32 bits", "pe/32-bit.dll", 0, 1, 'M', Is::Foreign, Is::Foreign},
+        {"section behind the end", "pe/64-bit.dll", kSection + 16, 4, ~0U, Is::CutShort, Is::CutShort},
+        {"program of DOS", "pe/64-bit.dll", 0x40, 1, 'N', Is::NoLibrary, Is::NoLibrary},
     };
     for (const auto &row : rows) {
         CorpusFile file(row.file);
         file.put(row.offset, row.width, row.value);
         const ModuleInspection seen = inspectContent(file.view());
         EXPECT_EQ(seen.verdict, kOwnForm == LibraryForm::Elf ? row.ofElf : row.ofPe) << row.name;
-        EXPECT_EQ(seen.reason.isEmpty(), seen.verdict == Verdict::Loadable) << row.name;
+        EXPECT_EQ(seen.reason.isEmpty(), seen.verdict == Is::Loadable) << row.name;
     }
+    CorpusFile arm("elf/exported-gnu");
+    arm.put(18, 2, 183);
+    const QString needed =
+        kOwnForm == LibraryForm::Elf ? "64-bit ARM; this machine needs 64-bit x86" : "Linux";
+    EXPECT_TRUE(inspectContent(arm.view()).reason.startsWith("it is built for " + needed));
     for (const char *name : {"elf/exported-gnu", "elf/needs-two", "pe/64-bit.dll", "pe/32-bit.dll"})
         for (CorpusFile part(name); !part.content.isEmpty();) {
             part.content.chop(1);
-            ASSERT_EQ(inspectContent(part.view()).verdict, Verdict::CutShort)
+            ASSERT_EQ(inspectContent(part.view()).verdict, Is::CutShort)
                 << name << ", " << part.content.size() << " bytes";
         }
 }

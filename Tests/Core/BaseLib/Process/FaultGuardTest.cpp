@@ -67,12 +67,3 @@ TEST(FaultGuard, GuardsNestAndATranslatedCallLetsFaultsOut)
     EXPECT_EQ(translated, "not ended");
     EXPECT_EQ(callTranslated([] { return 17; }), 17);
 }
-
-TEST(FaultGuardDeathTest, OutsideAGuardTheProcessDies)
-{
-    const auto die = [] {
-        outcome(writeNowhere); // handlers are armed now
-        writeNowhere();
-    };
-    EXPECT_DEATH(die(), "");
-}

@@ -1,5 +1,4 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
-#include "Core/BaseLib/Files/FileTime.h"
 
 #include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
@@ -11,7 +10,20 @@
 
 namespace {
 
-EffectRecord sampleRecord()
+class CatalogueReading : public testing::Test {
+protected:
+    CatalogueContents read(const CatalogueFormat &format, const QByteArray &text)
+    {
+        const QString path = m_folder.filePath("catalogue.xml");
+        EXPECT_TRUE(replaceFile(path, text, Durability::Buffered));
+        return readCatalogueFile(format, path, [](const QString &module) { return "of " + module; });
+    }
+    QTemporaryDir m_folder;
+};
+
+} // namespace
+
+TEST(CatalogueText, OfVst2)
 {
     EffectRecord record;
     record.path = "/fx/Röhre & Co.vst3";
@@ -27,25 +39,6 @@ EffectRecord sampleRecord()
     record.vstCategory = -3;
     record.width = 8;
     record.latency = 64;
-    return record;
-}
-
-class CatalogueReading : public testing::Test {
-protected:
-    CatalogueContents read(const CatalogueFormat &format, const QByteArray &text)
-    {
-        const QString path = m_folder.filePath("catalogue.xml");
-        EXPECT_TRUE(replaceFile(path, text, Durability::Buffered));
-        return readCatalogueFile(format, path, fileTimeText);
-    }
-    QTemporaryDir m_folder;
-};
-
-} // namespace
-
-TEST(CatalogueText, OfVst2)
-{
-    EffectRecord record = sampleRecord();
     record.subName = "Child";
     record.subId = 4294967295u;
     record.enabled = record.working = false;
@@ -70,7 +63,7 @@ TEST(CatalogueText, OfVst2)
               "\t\t</SubEffect>\n"
               "\t</Effect>\n"
               "</Effects>\n");
-    EXPECT_FALSE(renderRecord(vstCatalogueFormat(), sampleRecord()).contains("SubEffect"));
+    EXPECT_FALSE(renderRecord(vstCatalogueFormat(), EffectRecord()).contains("SubEffect"));
 }
 
 TEST_F(CatalogueReading, ValuesThatAreAbsentOrNoNumbers)
@@ -90,9 +83,6 @@ TEST_F(CatalogueReading, ValuesThatAreAbsentOrNoNumbers)
 
 TEST_F(CatalogueReading, EarlierVersionsAreUpgraded)
 {
-    const QString plugin = m_folder.filePath("Old.vst3");
-    ASSERT_TRUE(replaceFile(plugin, "x", Durability::Buffered));
-    const QString now = fileTimeText(plugin);
     const struct {
         const CatalogueFormat &format;
         const char *version;
@@ -111,11 +101,11 @@ TEST_F(CatalogueReading, EarlierVersionsAreUpgraded)
     for (const auto &row : rows) {
         SCOPED_TRACE(&row - rows);
         const CatalogueContents contents =
-            read(row.format,
-                 QByteArray("<Effects") + row.version + "><Effect><Path>" + plugin.toUtf8() +
-                     "</Path><FileTime>other</FileTime><CategoryMask>2</CategoryMask></Effect></Effects>");
+            read(row.format, QByteArray("<Effects") + row.version +
+                                 "><Effect><Path>a</Path><FileTime>other</FileTime>"
+                                 "<CategoryMask>2</CategoryMask></Effect></Effects>");
         ASSERT_EQ(contents.records.size(), 1u);
-        EXPECT_EQ(contents.records[0].fileTime, row.keepsTime ? "other" : now);
+        EXPECT_EQ(contents.records[0].fileTime, row.keepsTime ? "other" : "of a");
         EXPECT_EQ(contents.records[0].category, row.mask);
     }
 }

@@ -2,8 +2,6 @@
 #include "Tests/Support/PluginBench.h"
 #include "Tests/Support/VST3Fixture.h"
 
-#include <QtEndian>
-
 namespace {
 
 class VST3ProbeTest : public PluginBench {
@@ -93,20 +91,6 @@ class * / vendor * / subcategories ** ~ *|*|**
             found << record.name + '|' + record.vendor + '|' + record.categories;
         EXPECT_EQ(found.join(' '), row[1]) << qPrintable(script);
     }
-}
-
-TEST_F(VST3ProbeTest, AModuleForAnotherMachineIsNotLoaded)
-{
-    QByteArray module = m_folder.read(vst3FixturePath());
-    const bool isElf = module.startsWith("\x7F"
-                                         "ELF");
-    const int machine = isElf ? 18 : qFromLittleEndian<int>(module.constData() + 0x3C) + 4;
-    qToLittleEndian<quint16>(isElf ? 183 : 0xAA64, module.data() + machine);
-    m_folder.write("arm.vst3", module);
-    const ProbeOutcome outcome = PluginBench::probe(VST3Probe(), m_folder.path("arm.vst3"));
-    EXPECT_EQ(m_observer.heard, QStringList()) << "seen without loading it";
-    EXPECT_EQ(outcome.ifFailed, ProbeOutcome::IfFailed::Record);
-    EXPECT_EQ(outcome.reason, "it is built for 64-bit ARM; this machine needs 64-bit x86");
 }
 
 TEST_F(VST3ProbeTest, BusesGiveTheChannels)
