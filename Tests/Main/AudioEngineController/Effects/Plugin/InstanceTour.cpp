@@ -1,10 +1,7 @@
 #include "Core/BaseLib/Binary/PluginLibrary.h"
-#include "Main/AudioEngineController/Effects/BusFormats/BusFormat.h"
 #include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
-#include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3Plugin.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/RealPlugins.h"
 #include "Tests/Support/TestApplication.h"
@@ -16,12 +13,10 @@
 
 #include <cmath>
 
-// Takes Debian's plug-ins through their use: loaded by identifier, opened, told their speakers, run, their
+// Takes Debian's plug-ins through their use: loaded by identifier, opened, run, their
 // state stored and loaded, closed. Plug-ins of other folders: FXPROBE_TOUR_VST3 and FXPROBE_TOUR_VST.
 
 namespace {
-
-constexpr int kManyChannels = 12;
 
 class InstanceTour : public testing::Test {
 protected:
@@ -59,7 +54,6 @@ protected:
     void use(AudioPlugin &plugin)
     {
         ASSERT_TRUE(plugin.open({48000, 256}));
-        setSpeakers(plugin);
         ASSERT_TRUE(plugin.start());
         process(plugin);
         PluginPreset stored;
@@ -73,33 +67,6 @@ protected:
         process(plugin);
         plugin.close();
         EXPECT_FALSE(plugin.isRunning());
-    }
-
-    /// Tells a plug-in the speakers of more channels than most have, then those of its own.
-    static void setSpeakers(AudioPlugin &plugin)
-    {
-        const ChannelSetup before = plugin.channels();
-        testing::internal::CaptureStdout();
-        tellSpeakers(plugin, kManyChannels, kManyChannels);
-        const bool accepted = tellSpeakers(plugin, before.inputs.span(), before.outputs.span());
-        testing::internal::GetCapturedStdout();
-        EXPECT_TRUE(accepted || plugin.identifier().startsWith("vst2:"))
-            << "only plug-ins of the older format may know no speakers at all";
-        EXPECT_EQ(plugin.channels().inputs.span(), before.inputs.span());
-        EXPECT_EQ(plugin.channels().outputs.span(), before.outputs.span());
-    }
-
-    static bool tellSpeakers(AudioPlugin &plugin, int inputs, int outputs)
-    {
-        if (auto *vst2 = dynamic_cast<VSTPlugin *>(&plugin))
-            return vst2->UpdateSpeakerArrangement(inputs, outputs, true);
-        return dynamic_cast<VST3Plugin &>(plugin).setBusFormats(usualFormat(inputs), usualFormat(outputs));
-    }
-
-    static int usualFormat(int channels)
-    {
-        const std::vector<const BusFormat *> formats = busFormatsOfChannels(channels);
-        return formats.empty() ? kDiscreteChannels + channels : formats.front()->code;
     }
 
     /// A block of one loud sample; what comes out must be numbers.
