@@ -10,6 +10,7 @@
 #include <cstdio>
 #include <cstring>
 #include <fstream>
+#include <map>
 #include <set>
 #include <string>
 #include <vector>
@@ -30,21 +31,13 @@ VstInt32 shellId = 0; ///< of the sub-plug-in whose entry point is being called
 
 VstIntPtr answerPlugin(AEffect *, VstInt32 opcode, VstInt32, VstIntPtr, void *, float)
 {
-    switch (opcode) {
-    case audioMasterVersion:
-        return 2400;
-    case audioMasterCurrentId:
-        return shellId;
-    case audioMasterGetSampleRate:
-        return 44100;
-    case audioMasterGetBlockSize:
-        return 256;
-    case audioMasterWantMidi:
-    case audioMasterGetVendorVersion:
-        return 1;
-    default:
-        return 0;
-    }
+    static const std::map<int, VstIntPtr> answers = {{audioMasterVersion, 2400},
+                                                     {audioMasterGetSampleRate, 44100},
+                                                     {audioMasterGetBlockSize, 256},
+                                                     {audioMasterWantMidi, 1},
+                                                     {audioMasterGetVendorVersion, 1}};
+    const auto answer = answers.find(opcode);
+    return opcode == audioMasterCurrentId ? shellId : answer == answers.end() ? 0 : answer->second;
 }
 
 VstIntPtr dispatch(AEffect &effect, VstInt32 opcode, void *text = nullptr)
@@ -91,17 +84,6 @@ int list(EntryPoint enter)
     return static_cast<int>(entered.size());
 }
 
-template <typename Interface, typename Call>
-void withInterface(FUnknown *object, Call call)
-{
-    void *found = nullptr;
-    if (object->queryInterface(Interface::iid, &found) != kResultOk)
-        return;
-    auto *known = static_cast<Interface *>(found);
-    call(*known);
-    known->release();
-}
-
 void askForBuses(Vst::IComponent &component)
 {
     for (const Vst::BusDirection direction : {Vst::kInput, Vst::kOutput}) {
@@ -139,14 +121,12 @@ int listClasses(IPluginFactory *factory, FUnknown *host)
         factory->getClassInfo(index, &info);
         if (std::strcmp(info.category, "Audio Module Class") != 0 || !names.insert(info.name).second)
             continue;
-        withInterface<IPluginFactory2>(factory, [&](IPluginFactory2 &factory2) {
-            PClassInfo2 more;
-            factory2.getClassInfo2(index, &more);
-        });
-        withInterface<IPluginFactory3>(factory, [&](IPluginFactory3 &factory3) {
-            PClassInfoW unicode;
-            factory3.getClassInfoUnicode(index, &unicode);
-        });
+        PClassInfo2 more;
+        if (const FUnknownPtr<IPluginFactory2> factory2{factory})
+            factory2->getClassInfo2(index, &more);
+        PClassInfoW unicode;
+        if (const FUnknownPtr<IPluginFactory3> factory3{factory})
+            factory3->getClassInfoUnicode(index, &unicode);
         listed += instantiate(factory, info.cid, host) ? 1 : 0;
     }
     return listed;
@@ -158,10 +138,8 @@ int listModule(void *library)
     IPluginFactory *const owned = getFactory ? getFactory() : nullptr;
     if (!owned)
         return 0;
-    int listed = 0;
     const auto host = VST3HostContext::createOwned(nullptr);
-    withInterface<IPluginFactory>(
-        owned, [&](IPluginFactory &factory) { listed = listClasses(&factory, host->unknown()); });
+    const int listed = listClasses(owned, host->unknown());
     owned->release();
     return listed;
 }

@@ -25,12 +25,6 @@ put Shell.vst2: child 1 D | child 2 E | child 3 F
 scan
 vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
 vst2 Name Favourite CategoryMask Enabled Working: D|1|0|1|1, E|0|4|1|1, F|0|0|0|1
-new Three.vst3: class A | answer get-factory null
-scan
-vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
-put Three.vst3: class A | #1 | class B | #2 | class C | #3
-scan
-vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
 
 = What was retried after a crash has its own marks
 put Three.vst3: class A | #1 | class B | #2 | class C | #3
@@ -61,36 +55,6 @@ scan
 loaded .
 vst3 Name Enabled Working: A|0|0, B|0|0
 
-= A failure in one folder gives nothing to the namesake in another
-put u/Comp.vst3: class U | #1
-put v/Comp.vst3: class V | #2
-scan
-mark U Favourite 1
-new u/Comp.vst3: answer module-entry false
-new v/Comp.vst3: class V | #2 | class W | #3
-scan
-vst3 Name Favourite Working: Comp|0|0, U|1|0, V|0|1, W|0|1
-put u/Comp.vst3: class U | #1
-scan
-vst3 Name Favourite Working: U|1|1, V|0|1, W|0|1
-
-= A renamed folder keeps the marks of VST 2 namesakes apart
-put old/x/Comp.vst2: name X | id 1
-put old/y/Comp.vst2: name Y | id 2
-scan
-mark X Favourite 1
-mark Y CategoryMask 4
-move Plugins/old Plugins/new
-scan
-vst2 Name Path Favourite CategoryMask: X|new/x/Comp.vst2|1|0, Y|new/y/Comp.vst2|0|4
-move Plugins/new Plugins/last
-new last/x/Comp.vst2: answer entry null
-scan
-put last/x/Comp.vst2: name X | id 1
-scan
-vst2 Name Favourite CategoryMask: X|1|0, Y|0|4
-same
-
 = A copy lists what the other file listed
 put a/Comp.vst3: class M | #1 | class N | #2
 put b/Comp.vst3: class N | #2 | class O | #3
@@ -108,22 +72,6 @@ new a/Comp.vst3: class N | #2
 write Plugins/b/other: x
 scan
 vst3 Name Path Favourite: N|a/Comp.vst3|1
-
-= A namesake that kills gets nothing of a file that moved
-put a/Comp.vst3: class A | #1 | class B | #2
-put a/Shell.vst2: child 1 D | child 2 E
-write Plugins/a/other: x
-scan
-mark A Favourite 1
-mark D Favourite 1
-move Plugins/a/Comp.vst3 Plugins/f/Comp.vst3
-move Plugins/a/Shell.vst2 Plugins/f/Shell.vst2
-put b/Comp.vst3: class X | fault module-entry kill
-put b/Shell.vst2: fault get-plug-category kill
-scan 3
-vst3 Name Path Favourite Working: Comp|b/Comp.vst3|0|0, A|f/Comp.vst3|1|1, B|f/Comp.vst3|0|1
-vst2 Name Path Favourite Working: Shell|b/Shell.vst2|0|0, D|f/Shell.vst2|1|1, E|f/Shell.vst2|0|1
-same
 
 = An interrupted scan of moved files leaves each plug-in once
 put a/Comp.vst3: class A | #1

@@ -35,7 +35,6 @@ public:
     int count(const QString &text) const { return lines().filter(text).size(); }
     bool contains(const QString &text) const { return count(text) > 0; }
 
-private:
     struct Sink : LogSink {
         void write(int, const QString &line) override
         {
@@ -45,5 +44,7 @@ private:
         std::mutex mutex;
         QStringList lines;
     };
+
+private:
     const std::shared_ptr<Sink> m_sink = std::make_shared<Sink>();
 };

@@ -297,7 +297,8 @@ private:
         case effSetSpeakerArrangement:
             return 1;
         case effEditGetRect:
-            return editorRect(pointer);
+            *static_cast<ERect **>(pointer) = has("editor") ? &m_editor : nullptr;
+            return has("editor") ? 1 : 0;
         case effGetEffectName:
             return fill(*static_cast<char(*)[1024]>(pointer), m_name);
         case effGetVendorString:
@@ -318,16 +319,6 @@ private:
         target = {};
         fill(target.label, parameter[2]);
         return fill(target.shortLabel, parameter[2]);
-    }
-
-    VstIntPtr editorRect(void *pointer)
-    {
-        for (const FixtureScript::Words &words : script().all("editor", m_subject.place)) {
-            m_editor = {0, 0, static_cast<short>(numberOf(words.at(1))),
-                        static_cast<short>(numberOf(words[0]))};
-            *static_cast<ERect **>(pointer) = &m_editor;
-        }
-        return has("editor") ? 1 : 0;
     }
 
     /// What comes after the listed children is not in the trace and no stage: a host that never stops asking
@@ -356,8 +347,8 @@ private:
     std::vector<FixtureScript::Words> m_parameters;
     std::vector<float> m_values;
     std::optional<std::string> m_chunk;
-    ERect m_editor = {};
-    std::size_t m_listed = 0; ///< children listed so far
+    ERect m_editor = {0, 0, 200, 300}; ///< from the top to the right
+    std::size_t m_listed = 0;          ///< children listed so far
     std::shared_ptr<std::atomic<bool>> m_stopping = std::make_shared<std::atomic<bool>>(false);
     std::vector<std::thread> m_threads;
 };

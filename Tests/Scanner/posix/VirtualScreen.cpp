@@ -75,10 +75,10 @@ int VirtualScreen::takeAppeared()
     return count;
 }
 
-QByteArray VirtualScreen::property(xcb_window_t window, const char *name) const
+QByteArray VirtualScreen::titleOf(xcb_window_t window) const
 {
     const auto request =
-        xcb_get_property(m_connection, 0, window, atom(name), XCB_GET_PROPERTY_TYPE_ANY, 0, 256);
+        xcb_get_property(m_connection, 0, window, atom("_NET_WM_NAME"), XCB_GET_PROPERTY_TYPE_ANY, 0, 256);
     const auto answer = owned(xcb_get_property_reply(m_connection, request, nullptr));
     if (!answer)
         return QByteArray();
@@ -108,19 +108,14 @@ bool VirtualScreen::isVisible(xcb_window_t window) const
     return answer && answer->map_state == XCB_MAP_STATE_VIEWABLE;
 }
 
-xcb_window_t VirtualScreen::windowTitled(const QString &title) const { return windowTitled(title, m_root); }
-
-xcb_window_t VirtualScreen::windowTitled(const QString &title, xcb_window_t parent) const
+xcb_window_t VirtualScreen::windowTitled(const QString &title) const
 {
     const auto tree =
-        owned(xcb_query_tree_reply(m_connection, xcb_query_tree(m_connection, parent), nullptr));
-    for (int i = 0; tree && i < xcb_query_tree_children_length(tree.get()); ++i) {
-        const xcb_window_t window = xcb_query_tree_children(tree.get())[i];
-        if (isVisible(window) && property(window, "_NET_WM_NAME") == title.toUtf8())
-            return window;
-        if (const xcb_window_t framed = windowTitled(title, window))
-            return framed;
-    }
+        owned(xcb_query_tree_reply(m_connection, xcb_query_tree(m_connection, m_root), nullptr));
+    const xcb_window_t *const windows = tree ? xcb_query_tree_children(tree.get()) : nullptr;
+    for (int i = 0; tree && i < xcb_query_tree_children_length(tree.get()); ++i)
+        if (isVisible(windows[i]) && titleOf(windows[i]) == title.toUtf8())
+            return windows[i];
     return 0;
 }
 

@@ -34,9 +34,7 @@ public:
 private:
     bool startServer();
     xcb_atom_t atom(const char *name) const;
-    /// Of a window, or of the root; empty when it is not set.
-    QByteArray property(xcb_window_t window, const char *name) const;
-    xcb_window_t windowTitled(const QString &title, xcb_window_t parent) const;
+    QByteArray titleOf(xcb_window_t window) const;
     bool isVisible(xcb_window_t window) const;
 
     ChildProcess m_server;

@@ -11,12 +11,6 @@
 
 namespace {
 
-class NotingSink : public LogSink {
-public:
-    void write(int, const QString &line) override { lines.append(line); }
-    QStringList lines;
-};
-
 struct ThrowingText {
     operator QString() const { throw std::runtime_error("no text"); }
 };
@@ -44,7 +38,7 @@ TEST(DebugLog, SwitchesDecideWhereALineGoes)
 {
     for (const bool isDirect : {false, true}) {
         const CapturedLog log; // puts the switches back
-        const auto direct = std::make_shared<NotingSink>();
+        const auto direct = std::make_shared<CapturedLog::Sink>();
         setDirectLogSink(direct);
         debugLogSettings().directOutput = isDirect;
         DebugLog(L"%ls", QString("100% Fuzz"));

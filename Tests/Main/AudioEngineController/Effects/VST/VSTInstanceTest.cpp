@@ -73,7 +73,7 @@ TEST_F(VSTInstance, LoadingClosesWhatWasHeldOrLogsWhyItFails)
 
 TEST_F(VSTInstance, IsSentWhatItsUseForAudioTakes)
 {
-    auto plugin = loaded("inputs 1\neditor 300 200\nanswer opcode-51 1\nparameter Gain 0.5\n"
+    auto plugin = loaded("inputs 1\neditor\nanswer opcode-51 1\nparameter Gain 0.5\n"
                          "ask-host process 14\nanswer opcode-53 1\n");
     const auto expect = [this](bool succeeds, const QString &calls) {
         EXPECT_TRUE(succeeds) << calls.toStdString();
@@ -140,7 +140,7 @@ channels changed in a block: after it ~ set process outputs 5 / ask-host process
 again while it is stopped for that ~ set opcode-2 outputs 5 / ask-host opcode-2 13 / ask-host opcode-72 13 ~ ~ opcode-67; opcode-2; opcode-72 | 5 outputs / host-13: 0; mains-changed | 5 outputs ~ mains-changed: 0 1; opcode-71; host-13: 0; opcode-68
 to what nobody has ~ set opcode-2 outputs 2147483647 / ask-host opcode-2 13 ~ ~ opcode-67; opcode-2; opcode-72; mains-changed | 2147483647 outputs ~ host-13: 0; opcode-68
 no size without an editor ~ ask-host process 0 index 3 opt 0.5 / ask-host process 43 index 3 / ask-host process 44 index 3 / ask-host process 42 / ask-host process 15 index 640 value 480 ~ block ~ parameter 3 0.5 / edit 3 1 / edit 3 0 / display ~ process: 1; host-0: 0; host-43: 1; host-44: 1; host-42: 1; host-15: 0
-a size ~ editor 300 200 / ask-host process 15 index 640 value 480 ~ block ~ size 640 480 ~ process: 1; host-15: 1
+a size ~ editor / ask-host process 15 index 640 value 480 ~ block ~ size 640 480 ~ process: 1; host-15: 1
 )";
     for (const QStringList &row : rowsOf(rows)) {
         SCOPED_TRACE(row[0].toStdString());
