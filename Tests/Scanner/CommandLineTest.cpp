@@ -73,36 +73,34 @@ TEST_F(CommandLine, ThePathDecidesWhereTheCatalogueLands)
 {
     if (QDir("/Effects").exists())
         GTEST_SKIP() << "the file system's root has a folder \"Effects\"";
-    const QString there = m_folder.dataFolder() + '/';
     const QString foreign = "効果 🎛 Ünï";
     const struct {
         const char *name;
-        QString scanList; ///< where it lies below the data folder
-        QString argument; ///< as given; null: none
+        QString argument; ///< in the data folder, which "@" stands for; null: none
         QString effects;  ///< the folder that the catalogue lands in; null: nowhere
     } rows[] = {
-        {"no argument", kBelowHome + "Effects/FXScan.xml", {}, kBelowHome + "Effects"},
-        {"full path, another file name", "a/Effects/x", there + "a/Effects/x", "a/Effects"},
-        {"the last Effects counts", "a/Effects/b/Effects/f", there + "a/Effects/b/Effects/f",
-         "a/Effects/b/Effects"},
-        {"a folder below Effects", "a/Effects/b/f", there + "a/Effects/b/f", "a/Effects"},
-        {"lower case is another folder", "a/effects/f", there + "a/effects/f", {}},
-        {"a longer name is another folder", "a/MyEffects/f", there + "a/MyEffects/f", {}},
-        {"relative path with dots", "a/Effects/f", "./a/../a/Effects/f", "a/Effects"},
-        {"relative path without a data folder", "Effects/f", "Effects/f", {}},
-        {"the slash wins over a later backslash", "a/Effects/b\\Effects\\f",
-         there + "a/Effects/b\\Effects\\f", "a/Effects"},
-        {"Japanese and emoji", foreign + "/Effects/f", there + foreign + "/Effects/f", foreign + "/Effects"},
-        {"500 characters", longFolder() + "/Effects/f", there + longFolder() + "/Effects/f",
-         longFolder() + "/Effects"},
+        {"no argument", {}, kBelowHome + "Effects"},
+        {"full path, another file name", "@a/Effects/x", "a/Effects"},
+        {"the last Effects counts", "@a/Effects/b/Effects/f", "a/Effects/b/Effects"},
+        {"a folder below Effects", "@a/Effects/b/f", "a/Effects"},
+        {"lower case is another folder", "@a/effects/f", {}},
+        {"a longer name is another folder", "@a/MyEffects/f", {}},
+        {"relative path with dots", "./a/../a/Effects/f", "a/Effects"},
+        {"relative path without a data folder", "Effects/f", {}},
+        {"the slash wins over a later backslash", "@a/Effects/b\\Effects\\f", "a/Effects"},
+        {"Japanese and emoji", '@' + foreign + "/Effects/f", foreign + "/Effects"},
+        {"500 characters", '@' + longFolder() + "/Effects/f", longFolder() + "/Effects"},
     };
     const QString module = put(foreign + ".vst3");
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
-        if (row.argument.isNull() && !kHomeFollowsEnvironment)
+        const bool isGiven = !row.argument.isNull();
+        if (!isGiven && !kHomeFollowsEnvironment)
             continue;
-        m_folder.write(row.scanList, m_folder.read(m_folder.scanList()));
-        const ScannerOutcome outcome = runWith(QStringList(row.argument).mid(row.argument.isNull() ? 1 : 0));
+        const QString argument = QString(row.argument).replace('@', m_folder.dataFolder() + '/');
+        const QString scanList = m_folder.path(isGiven ? argument : row.effects + "/FXScan.xml");
+        m_folder.write(scanList, m_folder.read(m_folder.scanList()));
+        const ScannerOutcome outcome = runWith(isGiven ? QStringList(argument) : QStringList());
         const QString catalogue = row.effects + "/VST3Configuration.xml";
         const bool isWritten = !row.effects.isNull();
         EXPECT_TRUE(outcome.succeeded());
@@ -111,6 +109,6 @@ TEST_F(CommandLine, ThePathDecidesWhereTheCatalogueLands)
         EXPECT_EQ(m_folder.read(catalogue).contains(module.toUtf8()), isWritten);
         EXPECT_EQ(outcome.log.contains("Cannot write the"), !isWritten) << qPrintable(outcome.log);
         QFile::remove(m_folder.path(catalogue));
-        QFile::remove(m_folder.path(row.scanList));
+        QFile::remove(scanList);
     }
 }

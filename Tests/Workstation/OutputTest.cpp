@@ -3,12 +3,6 @@
 
 #include <gtest/gtest.h>
 
-namespace {
-
-QString utf8(const char *text) { return QString::fromUtf8(text); }
-
-} // namespace
-
 TEST(Output, CellsHaveTheirWidthInColumns)
 {
     const struct {
@@ -25,16 +19,16 @@ TEST(Output, CellsHaveTheirWidthInColumns)
         {"🎹", 3, "🎹 "},
     };
     for (const auto &row : rows)
-        EXPECT_EQ(Terminal::cell(utf8(row.text), row.columns), utf8(row.cell)) << row.text;
+        EXPECT_EQ(Terminal::cell(row.text, row.columns), row.cell) << row.text;
 }
 
 TEST(Output, NothingInATextSteersTheTerminal)
 {
-    EXPECT_EQ(Terminal::harmless(utf8("a\x1b[2Jb\nc\xC2\x9B"
-                                      "d\xE2\x80\xAE"
-                                      "e\xE2\x81\xA6")),
-              utf8("a?[2Jb?c?d?e?"));
-    EXPECT_EQ(Terminal::harmless(utf8("Ünï 🎹 日本")), utf8("Ünï 🎹 日本"));
+    EXPECT_EQ(Terminal::harmless("a\x1b[2Jb\nc\xC2\x9B"
+                                 "d\xE2\x80\xAE"
+                                 "e\xE2\x81\xA6"),
+              "a?[2Jb?c?d?e?");
+    EXPECT_EQ(Terminal::harmless("Ünï 🎹 日本"), "Ünï 🎹 日本");
 }
 
 TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)

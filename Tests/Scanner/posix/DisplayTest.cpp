@@ -33,15 +33,6 @@ protected:
     ScannerRun m_scanner{scannerProgram(), m_folder};
 };
 
-struct Resolution {
-    int dotsPerInch;
-    QSize size;
-
-    friend void PrintTo(const Resolution &row, std::ostream *out) { *out << row.dotsPerInch << " dpi"; }
-};
-
-class OnScaledScreen : public OnScreen, public testing::WithParamInterface<Resolution> {};
-
 class LosingTheScreen : public OnScreen, public testing::WithParamInterface<const char *> {};
 
 } // namespace
@@ -97,18 +88,19 @@ TEST_F(OnScreen, WithNothingToProbeNoWindowAppears)
     EXPECT_EQ(m_screen.takeAppeared(), 0);
 }
 
-TEST_P(OnScaledScreen, TheWindowFollowsTheResolution)
+TEST_F(OnScreen, TheWindowFollowsTheResolution)
 {
-    m_screen.setResolution(GetParam().dotsPerInch);
-    put(kComp + ".vst3", "delay initialize 1000\n");
-    ASSERT_TRUE(waitForWindow());
-    EXPECT_EQ(m_screen.sizeOf(m_screen.windowTitled(kTitle)), GetParam().size);
+    put(kComp + ".vst3", "delay initialize 500\n");
+    const std::pair<int, QSize> rows[] = {
+        {96, {333, 80}}, {100, {333, 80}}, {144, {500, 120}}, {192, {666, 160}}};
+    for (const auto &[dotsPerInch, size] : rows) {
+        m_screen.setResolution(dotsPerInch);
+        QFile::remove(cataloguePath());
+        ASSERT_TRUE(waitForWindow());
+        EXPECT_EQ(m_screen.sizeOf(m_screen.windowTitled(kTitle)), size) << dotsPerInch;
+        m_scanner.wait();
+    }
 }
-
-INSTANTIATE_TEST_SUITE_P(Of, OnScaledScreen,
-                         testing::Values(Resolution{96, {333, 80}}, Resolution{100, {333, 80}},
-                                         Resolution{144, {500, 120}}, Resolution{192, {666, 160}}),
-                         [](const auto &row) { return std::to_string(row.param.dotsPerInch) + "Dpi"; });
 
 TEST_P(LosingTheScreen, BlamesNobody)
 {
