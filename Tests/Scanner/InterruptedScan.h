@@ -17,11 +17,11 @@ protected:
             mark(name, "Favourite", "1");
         m_listed = m_folder.read(cataloguePath());
     }
-    /// Updates all, one of them with this script.
-    void update(const QByteArray &script, const QString &module = "B") const
+    /// Updates all, the second one with this script.
+    void update(const QByteArray &script) const
     {
         for (const QString &name : m_names)
-            dateLater(put(name + ".vst3", name == module ? script : QByteArray()));
+            dateLater(put(name + ".vst3", name == "B" ? script : QByteArray()));
         forgetTrace();
     }
     /// Makes the requests, one after the other, once the second module is being probed.
@@ -33,16 +33,13 @@ protected:
             scanner.requestTermination(way);
         return scanner.wait();
     }
-    /// The modules whose records hold their new time stamp. All must be there with their marks, working but
-    /// for the culprit.
-    QStringList renewed(const QString &culprit = {}) const
+    /// The modules whose records hold their new time stamp. All must be there with their marks, and work.
+    QStringList renewed() const
     {
         QStringList names, listed;
         for (const QString &row : sortedRecords("Name FileTime Favourite Enabled Working")) {
             const QString name = row.section('|', 0, 0);
-            if (name == culprit && row.endsWith("|0|0|0"))
-                continue; // stands for the file
-            EXPECT_TRUE(row.endsWith(name == culprit ? "|1|0|0" : "|1|1|1")) << qPrintable(row);
+            EXPECT_TRUE(row.endsWith("|1|1|1")) << qPrintable(row);
             listed.append(name);
             if (row.contains("|2022-"))
                 names.append(name);

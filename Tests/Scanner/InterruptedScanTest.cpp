@@ -55,24 +55,6 @@ TEST_P(Termination, APluginThatHangsIsLeftAndNotBlamed)
 INSTANTIATE_TEST_SUITE_P(By, Termination, testing::ValuesIn(terminationWays()),
                          [](const auto &row) { return std::string(row.param.name); });
 
-TEST_F(InterruptedScan, AKilledScannerCostsNoMarks)
-{
-    for (int number = 0; number < m_names.size(); ++number) {
-        SCOPED_TRACE(number);
-        const QString &culprit = m_names[number];
-        update("fault initialize hang\n", culprit);
-        m_folder.write(cataloguePath(), m_listed);
-        ScannerRun scanner(scannerProgram(), m_folder);
-        ASSERT_TRUE(scanner.start() && waitForStage(scanner, culprit, "initialize"));
-        scanner.kill();
-        scanner.wait();
-        EXPECT_EQ(renewed(), m_names.mid(0, number));
-        EXPECT_EQ(m_folder.markers(), QStringList(culprit + ".scan3"));
-        scan();
-        EXPECT_EQ(renewed(culprit), m_names);
-    }
-}
-
 TEST_F(SecondScanner, LeavesABusyFolderAlone)
 {
     const QString link = m_folder.path("Link");

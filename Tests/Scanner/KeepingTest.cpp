@@ -8,12 +8,7 @@ const char kScans[] = R"(
 put Three.vst3: class A | #1 | class B | #2 | class C | #3
 put Shell.vst2: child 1 D | child 2 E | child 3 F
 scan
-mark A Favourite 1
-mark B CategoryMask 4
-mark C Enabled 0
-mark D Favourite 1
-mark E CategoryMask 4
-mark F Enabled 0
+mark A Favourite 1, B CategoryMask 4, C Enabled 0, D Favourite 1, E CategoryMask 4, F Enabled 0
 new Three.vst3: answer module-entry false
 new Shell.vst2: answer entry null
 scan
@@ -30,10 +25,7 @@ vst2 Name Favourite CategoryMask Enabled Working: D|1|0|1|1, E|0|4|1|1, F|0|0|0|
 put Three.vst3: class A | #1 | class B | #2 | class C | #3
 put Shell.vst2: child 1 D | child 2 E
 scan
-mark A Favourite 1
-mark B CategoryMask 4
-mark C Enabled 0
-mark D Favourite 1
+mark A Favourite 1, B CategoryMask 4, C Enabled 0, D Favourite 1
 new Three.vst3: class A | #1 | fault module-entry kill
 new Shell.vst2: child 1 D | child 2 E | fault get-plug-category kill
 scan 3
@@ -96,8 +88,7 @@ same
 put A.vst2: name "Top <br/> Boost &amp; &lt;" | vendor "Jo <jo x.org> & Co"
 put B.vst3: class "A &amp; B" | vendor "Jo <jo x.org> & Co"
 scan
-mark Top <br/> Boost &amp; &lt; Favourite 1
-mark A &amp; B Favourite 1
+mark Top <br/> Boost &amp; &lt; Favourite 1, A &amp; B Favourite 1
 new B.vst3: class "A &amp; B" | vendor V
 put C.vst3:
 put C.vst2: id 2
@@ -159,8 +150,7 @@ vst3 Name CategoryMask: Comp|4
 put a/Comp.vst3: class A | #1
 put a/Comp.vst2: name D | id 1
 scan
-mark A Favourite 1
-mark D Favourite 1
+mark A Favourite 1, D Favourite 1
 put b/Comp.vst3: class B | #2
 put b/Comp.vst2: name E | id 2
 scan

@@ -14,12 +14,12 @@
 
 // Whole scans, each a few steps. Files of "put" lie in "Plugins", others in the data folder, which "@" stands
 // for; "\n" is a line's end and "." in a list an empty one.
-//   put, new FILE: STATEMENT | …   a scripted module, dated as of the first scan or as updated; "#1" is an id
+//   put, new FILE, …: STATEMENT | … scripted modules, dated as of the first scan or as updated; "#1" is an id
 //   write FILE: TEXT; remove FILE; move FILE FILE (or folder); holds FILE: TEXT
 //   link FILE FILE                where it lies and where it leads; where there are links
 //   short FILE BYTES              ends a file after so many and dates it as updated; date FILE TIME
 //   folders FOLDER…               what the scan list names
-//   mark NAME ELEMENT VALUE       as the user does
+//   mark NAME ELEMENT VALUE, …    as the user does
 //   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
 //   scan [N]                      until no marker survives, which takes N runs (1)
 //   during MODULE: STEP           a scan, and a step while the module is initialised; kill ends it by force
@@ -77,9 +77,13 @@ private:
         const QString text = resolved(step.section(':', 1)).trimmed();
         const QString verb = head.section(' ', 0, 0);
         const QString file = head.section(' ', 1);
+        const auto each = [&](const std::function<void(const QString &)> &act) {
+            for (const QString &one : file.split(", "))
+                act(one);
+        };
         const std::map<QString, std::function<void()>> verbs = {
-            {"put", [&] { put(file, script(text)); }},
-            {"new", [&] { dateLater(put(file, script(text))); }},
+            {"put", [&] { each([&](const QString &one) { put(one, script(text)); }); }},
+            {"new", [&] { each([&](const QString &one) { dateLater(put(one, script(text))); }); }},
             {"write", [&] { m_folder.write(file, text.toUtf8().replace("\\n", "\n")); }},
             {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
             {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(spelt(file)))); }},
@@ -95,7 +99,7 @@ private:
             {"retry", [&] { EXPECT_TRUE(retryPlugins(m_folder.effects(), {file}, {}).unknown.isEmpty()); }},
             {"exit", [&] { EXPECT_EQ(m_last.exitCode, file.toInt()); }},
             {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
-            {"mark", [&] { markAsUser(file); }},
+            {"mark", [&] { each([this](const QString &one) { markAsUser(one); }); }},
             {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
             {"cut",
              [&] { edit(file, m_folder.read(file).mid(m_folder.read(file).indexOf(text.toUtf8())), {}); }},

@@ -24,8 +24,7 @@ same
 = What crashed is salvaged from a damaged catalogue
 put Comp.vst3:
 scan
-mark Comp Enabled 0
-mark Comp Working 0
+mark Comp Enabled 0, Comp Working 0
 cut Effects/VST3Configuration.xml: </Effects>
 scan
 loaded .
@@ -60,8 +59,7 @@ vst3 Name FileTime: Comp|2021-03-04 05:06
 same
 
 = A scan list without folders empties the catalogues
-put Comp.vst3:
-put Echo.vst2:
+put Comp.vst3, Echo.vst2:
 scan
 write Effects/FXScan.xml: <Scan><Folder>@/Plugins</Folder><Group><Path>@/Plugins</Path></Group></Scan>
 scan
@@ -79,8 +77,7 @@ log: Cannot search the folder "@/File": it is not a folder
 vst3 Name: Comp
 
 = A folder that is listed twice is searched once
-put Comp.vst3:
-put Inner/Deep.vst3:
+put Comp.vst3, Inner/Deep.vst3:
 folders @/Plugins @/Plugins/ @/Plugins/Inner @/Plugins/Inner/..
 scan
 loaded Comp Deep
@@ -93,11 +90,7 @@ loaded Deep Comp
 vst3 Name: C, D
 
 = Linked folders are searched once and a file stays where it is known
-put z/Comp.vst3:
-put z/Echo.vst2:
-put ../Outside/Far.vst3:
-put ../Store/Odd.vst3:
-put ../Loose.vst3:
+put z/Comp.vst3, z/Echo.vst2, ../Outside/Far.vst3, ../Store/Odd.vst3, ../Loose.vst3:
 link Plugins/a Plugins/z
 link Plugins/z/loop Plugins
 link Plugins/z/top .
@@ -129,16 +122,13 @@ loaded Far
 vst3 Path: a/Comp.vst3, first/Far.vst3, Also.vst3
 
 = What a bundle holds is never a VST 2 module
-put Damaged.vst3/Left.vst2:
-put Other.VST3/Contents/aarch64-other/Other.vst2:
-put Good.vst2:
+put Damaged.vst3/Left.vst2, Other.VST3/Contents/aarch64-other/Other.vst2, Good.vst2:
 scan
 vst2 Name: Good
 same
 
 = A module that is cut short is looked at until it is whole again
-put A.vst3:
-put B.vst2:
+put A.vst3, B.vst2:
 put Shell.vst2: child 1 One | child 2 Two | fault entry kill Two
 put Late.vst3: class New
 short Plugins/Late.vst3 1000
@@ -153,8 +143,7 @@ log: Late.vst3: it is cut short: 1000 of at least
 log: it is empty
 vst3 Name FileTime Enabled Working: A||1|0, A|2021-03-04 05:06|1|0, Late||1|0
 same
-put A.vst3:
-put B.vst2:
+put A.vst3, B.vst2:
 put Shell.vst2: child 1 One | child 2 Two | fault entry kill Two
 put Late.vst3: class New
 scan
@@ -203,12 +192,9 @@ vst2 Name Enabled Working: Two1|1|1, Two2|1|1, Latin ö|1|1, 致命的💥|0|0
 same
 
 = Several killers of both formats need one run each and one more
-put a/WaveShell1-VST3 9.2.vst3: class Inner | fault module-entry kill
-put b/WaveShell1-VST3 9.2.vst3: class Inner | fault module-entry kill
-put Bad1.vst2: fault get-vendor-string kill
-put Bad2.vst2: fault get-vendor-string kill
-put Good.vst3:
-put Good.vst2:
+put a/WaveShell1-VST3 9.2.vst3, b/WaveShell1-VST3 9.2.vst3: class Inner | fault module-entry kill
+put Bad1.vst2, Bad2.vst2: fault get-vendor-string kill
+put Good.vst3, Good.vst2:
 scan 5
 vst3 Name: Good
 vst2 Name Enabled Working: Bad1|0|0, Bad2|0|0, Good|1|1
@@ -261,8 +247,7 @@ run
 markers Comp.scan3
 
 = A copy is not loaded again while the file that holds its identifiers is there
-put a/Comp.vst3: class A
-put b/Comp.vst3: class A
+put a/Comp.vst3, b/Comp.vst3: class A
 scan
 vst3 Name: A
 scan
@@ -278,9 +263,7 @@ same
 put Comp.vst3: class Liked | #1 | class Gone
 put Off.vst3:
 scan
-mark Liked Favourite 1
-mark Liked CategoryMask 16384
-mark Off Enabled 0
+mark Liked Favourite 1, Liked CategoryMask 16384, Off Enabled 0
 new Comp.vst3: class New | subcategories Fx|EQ | class Renamed | subcategories Fx|EQ | #1
 new Off.vst3: class Changed
 scan
@@ -356,8 +339,7 @@ put WaveShell1-VST 9.3_x64.vst2: child 1 One | child 2 Two | child 0x80000003 Th
 scan 2
 vst2 Name ID Enabled Working: One|One:1|1|1, Three|Three:-2147483645|1|1, Two|Two|0|0
 same
-mark One Favourite 1
-mark Three Enabled 0
+mark One Favourite 1, Three Enabled 0
 new WaveShell1-VST 9.3_x64.vst2: child 1 One | child 2 Two | child 0x80000003 Three
 scan
 vst2 Name Enabled Working Favourite: One|1|1|1, Three|0|1|0, Two|1|1|0
@@ -368,9 +350,7 @@ scan 2
 vst2 Name Enabled Working: Shell|0|0
 
 = Files of any date are asked once and those touched within a minute are not
-put Old.vst3:
-put New.vst2:
-put Touched.vst3:
+put Old.vst3, New.vst2, Touched.vst3:
 date Plugins/Old.vst3 1970-01-02T00:00:00
 date Plugins/New.vst2 2099-12-31T23:59:59
 scan
@@ -391,8 +371,7 @@ same
 
 = Folders that change during a scan
 put a/Slow.vst3: delay initialize 400
-put b/Gone.vst3:
-put b/Gone.vst2:
+put b/Gone.vst3, b/Gone.vst2:
 during Slow: move Plugins/b Plugins/c
 write Plugins/b/other: x
 scan
@@ -407,8 +386,7 @@ put Echo.vst2: answer entry null
 scan
 vst3 Name: .
 vst2 Name ID Enabled Working: Echo|Echo|1|0
-new Comp.vst3:
-new Echo.vst2:
+new Comp.vst3, Echo.vst2:
 scan
 vst3 Name Working: Comp|1
 vst2 Name Working: Echo|1
