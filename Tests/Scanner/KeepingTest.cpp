@@ -47,24 +47,6 @@ scan
 loaded .
 vst3 Name Enabled Working: A|0|0, B|0|0
 
-= A copy lists what the other file listed
-put a/Comp.vst3: class M | #1 | class N | #2
-put b/Comp.vst3: class N | #2 | class O | #3
-write Plugins/a/other: x
-scan
-vst3 Name Path: M|a/Comp.vst3, N|a/Comp.vst3, O|b/Comp.vst3
-mark N Favourite 1
-remove Plugins/a/Comp.vst3
-scan
-vst3 Name Path Favourite: N|b/Comp.vst3|1, O|b/Comp.vst3|0
-put a/Comp.vst3: class N | #2
-scan
-remove Plugins/b/Comp.vst3
-new a/Comp.vst3: class N | #2
-write Plugins/b/other: x
-scan
-vst3 Name Path Favourite: N|a/Comp.vst3|1
-
 = An interrupted scan of moved files leaves each plug-in once
 put a/Comp.vst3: class A | #1
 put a/Echo.vst2: name E

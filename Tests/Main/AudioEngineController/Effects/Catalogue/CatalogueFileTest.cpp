@@ -23,46 +23,23 @@ protected:
 
 } // namespace
 
-TEST(CatalogueText, OfVst2)
+TEST(CatalogueText, IsWrittenAsItWasRead)
 {
-    EffectRecord record;
-    record.path = "/fx/Röhre & Co.vst3";
-    record.fileTime = "2024-02-29 23:59";
-    record.name = "A & B 真空管 🎛";
-    record.id = "0123456789ABCDEF0123456789ABCDEF";
-    record.vendor = "Müller";
-    record.categories = "Fx|EQ";
-    record.inputs = 2;
-    record.outputs = 6;
-    record.category = 0x400; // EQ
-    record.favourite = true;
-    record.vstCategory = -3;
-    record.width = 8;
-    record.latency = 64;
-    record.subName = "Child";
-    record.subId = 4294967295u;
-    record.enabled = record.working = false;
-    EXPECT_EQ(renderCatalogue(vstCatalogueFormat(), std::vector{record}).replace(kLineEnd, "\n"),
-              "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n"
-              "<Effects version=\"1.4\">\n"
-              "\t<Effect>\n"
-              "\t\t<Path>/fx/Röhre & Co.vst3</Path>\n"
-              "\t\t<FileTime>2024-02-29 23:59</FileTime>\n"
-              "\t\t<Name>A & B 真空管 🎛</Name>\n"
-              "\t\t<ID>0123456789ABCDEF0123456789ABCDEF</ID>\n"
-              "\t\t<Category>-3</Category>\n"
-              "\t\t<CategoryMask>16</CategoryMask>\n"
-              "\t\t<Favourite>1</Favourite>\n"
-              "\t\t<Vendor>Müller</Vendor>\n"
-              "\t\t<Width>8</Width>\n"
-              "\t\t<Enabled>0</Enabled>\n"
-              "\t\t<Working>0</Working>\n"
-              "\t\t<SubEffect>\n"
-              "\t\t\t<Name>Child</Name>\n"
-              "\t\t\t<ID>4294967295</ID>\n"
-              "\t\t</SubEffect>\n"
-              "\t</Effect>\n"
-              "</Effects>\n");
+    for (const CatalogueFormat *format : {&vstCatalogueFormat(), &vst3CatalogueFormat()}) {
+        const bool isVst3 = format == &vst3CatalogueFormat();
+        const QString path =
+            QStringLiteral(FXPROBE_FUZZ_CORPUS "/catalogue/every-element-vst%1.xml").arg(isVst3 ? 3 : 2);
+        QByteArray text;
+        ASSERT_TRUE(bool(readWholeFile(path, text)));
+        std::vector<EffectRecord> records = readCatalogueFile(*format, path).records;
+        ASSERT_EQ(records.size(), 1u);
+        records[0].outputs = 7; // the number of inputs is written in its place
+        EXPECT_EQ(renderCatalogue(*format, records), text.replace("\n", kLineEnd));
+        EXPECT_EQ(records[0].category, 0x400u) << "EQ";
+        EXPECT_TRUE(records[0].favourite && !records[0].enabled && records[0].working == isVst3);
+        EXPECT_EQ(records[0].subId, isVst3 ? 0u : 4294967295u);
+        EXPECT_EQ(records[0].vstCategory, isVst3 ? 0 : -3);
+    }
     EXPECT_FALSE(renderRecord(vstCatalogueFormat(), EffectRecord()).contains("SubEffect"));
 }
 
