@@ -292,7 +292,7 @@ vst3 Name Enabled Working: W|1|1, a Healthy|1|1
 
 = Bundles are found under all sorts of names
 put Several.bundle:
-write Plugins/Several.vst3/Contents/arm64-win/Several.vst3: for another system
+put Several.vst3/Contents/arm64-win/Foreign.vst3:
 put Before.bundle:
 move Plugins/Before.vst3 Plugins/After.vst3
 put Loud.bundle:
