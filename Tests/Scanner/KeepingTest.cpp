@@ -47,25 +47,6 @@ scan
 loaded .
 vst3 Name Enabled Working: A|0|0, B|0|0
 
-= An interrupted scan of moved files leaves each plug-in once
-put a/Comp.vst3: class A | #1
-put a/Echo.vst2: name E
-write Plugins/a/other: x
-scan
-mark A Favourite 1
-move Plugins/a/Comp.vst3 Plugins/f/Comp.vst3
-put z/Slow.vst3: fault initialize hang
-during Slow: kill
-vst3 Name Path Favourite: A|f/Comp.vst3|1
-scan
-vst3 Name Path Favourite Enabled: A|f/Comp.vst3|1|1, Slow|z/Slow.vst3|0|0
-double Effects/VST3Configuration.xml
-double Effects/FXConfiguration.xml
-scan
-vst3 Name Path Favourite Enabled: A|f/Comp.vst3|1|1, Slow|z/Slow.vst3|0|0
-vst2 Name Path: E|a/Echo.vst2
-same
-
 = Texts that look like markup stay whole and keep their marks
 put A.vst2: name "Top <br/> Boost &amp; &lt;" | vendor "Jo <jo x.org> & Co"
 put B.vst3: class "A &amp; B" | vendor "Jo <jo x.org> & Co"

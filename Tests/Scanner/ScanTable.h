@@ -25,7 +25,6 @@
 //   during MODULE: STEP           a scan, and a step while the module is initialised; kill ends it by force
 //   run                           one run, however it ends; exit N and markers NAME… say how it ended
 //   retry NAME                    has it asked again
-//   double FILE                   appends a catalogue's records once more, as of another folder
 //   same                          a scan that loads nothing and writes nothing
 //   loaded MODULE…                what the scan loaded, in order; closed MODULE: CALL, CALL
 //   log: TEXT                     what its log holds; readable FILE, for everybody
@@ -90,7 +89,6 @@ private:
             {"link", [&] { link(file.section(' ', 0, 0), file.section(' ', 1)); }},
             {"short", [&] { cutShort(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
             {"move", [&] { move(spelt(file).split(' ')); }},
-            {"double", [&] { doubleRecords(file); }},
             {"date", [&] { date(file.section(' ', 0, -2), file.section(' ', -1) + ':' + text); }},
             {"during", [&] { during(file, step.section(": ", 1)); }},
             {"readable", [&] { EXPECT_TRUE(QFile::permissions(m_folder.path(file)) & QFile::ReadOther); }},
@@ -136,13 +134,6 @@ private:
         QDir().rmdir(m_folder.path(paths[1])); // an empty folder
         EXPECT_TRUE(QFile::rename(m_folder.path(paths[0]), m_folder.path(paths[1])));
         QFile::rename(m_folder.path(paths[0]) + ".script", m_folder.path(paths[1]) + ".script");
-    }
-    void doubleRecords(const QString &file) const
-    {
-        QByteArray text = m_folder.read(file);
-        const int end = text.indexOf("</Effects>"), start = text.indexOf("\t<Effect>");
-        m_folder.write(file,
-                       text.insert(end, text.mid(start, end - start).replace("/Plugins/", "/Plugins/was/")));
     }
     void during(const QString &module, const QString &step)
     {

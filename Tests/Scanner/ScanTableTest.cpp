@@ -199,16 +199,6 @@ scan 5
 vst3 Name: Good
 vst2 Name Enabled Working: Bad1|0|0, Bad2|0|0, Good|1|1
 
-= The marker of a child speaks for the child alone
-put Shell.vst2: child 1 One | child 2 Two
-put Other.vst2:
-scan
-write Effects/Shell.scan: <CrashedPlugin><Path>@/Plugins/Shell.vst2</Path><Created>2021-03-04 05:06</Created><Name>Shell</Name></CrashedPlugin>
-write Effects/Two.scan: <CrashedPlugin><Path>@/Plugins/Shell.vst2</Path><Created>2021-03-04 05:06</Created><Name>Two</Name><SubID>2</SubID></CrashedPlugin>
-scan
-loaded .
-vst2 Name Enabled Working: One|1|1, Two|0|0, Other|1|1
-
 = A marker of a file that was moved follows it and one of a file that is there stays there
 put a/Comp.vst3:
 put b/Same.vst3: class B
@@ -217,25 +207,6 @@ write Effects/1.scan3: <CrashedPlugin><Path>@/Plugins/a/Comp.vst3</Path><Created
 write Effects/2.scan3: <CrashedPlugin><Path>@/gone/Same.vst3</Path><Created>2021-03-04 05:06</Created><Name>Same</Name></CrashedPlugin>
 scan
 vst3 Name Enabled Working: Comp|0|0, Comp|0|0, B|1|1
-same
-
-= A crash follows the file and says nothing of a namesake
-put old/Moved.vst3:
-put Pair.vst3: class A | class B | id 00000000000000000000000000000001
-put a/Comp.vst3: class One | fault initialize kill
-put b/Comp.vst3: class Two
-scan 2
-mark Moved Favourite 1
-new Pair.vst3: class A | class B | fault module-entry kill
-scan 2
-remove Plugins/old/Moved.vst3
-put new/Moved.vst3:
-write Effects/1.scan3: <CrashedPlugin><Path>@/Plugins/new/Moved.vst3</Path><Created>2021-03-04 05:06</Created><Name>Moved</Name></CrashedPlugin>
-scan
-loaded .
-remove Plugins/Pair.vst3
-scan
-vst3 Name Enabled Favourite: Comp|0|0, Two|1|0, Moved|0|0, Moved|0|1
 same
 
 = Markers outlive a catalogue that cannot be written and those of no use do not

@@ -130,12 +130,15 @@ TEST_F(FxScan, ARetryAsksWhatItNamesOrAll)
 {
     put("Crash.vst3", "fault initialize abort\n");
     put("Other.vst3", "fault initialize abort\n");
-    put("Shell.vst2", "child 1 One\nchild 2 Two\nfault entry abort Two\n");
+    const QByteArray children = "child 1 One\nchild 2 Two\nchild 3 Three\n";
+    put("Shell.vst2", children + "fault entry abort Two\nfault entry abort Three\n");
     scan();
     put("Crash.vst3");
-    put("Shell.vst2", "child 1 One\nchild 2 Two\n");
-    EXPECT_EQ(states(scan({"--retry", "crash", "--retry", "Two"})),
-              (States{{"Crash", "ok"}, {"Other", "disabled"}, {"One", "ok"}, {"Two", "ok"}}));
+    put("Shell.vst2", children);
+    EXPECT_EQ(
+        states(scan({"--retry", "crash", "--retry", "Two"})),
+        (States{
+            {"Crash", "ok"}, {"Other", "disabled"}, {"One", "ok"}, {"Two", "ok"}, {"Three", "disabled"}}));
     const QByteArray before = m_folder.catalogue();
     EXPECT_EQ(run({"--retry", "Other", "--retry", "One"}).exitCode, 2) << "One works";
     EXPECT_EQ(m_folder.catalogue(), before) << "nothing is changed then";

@@ -2,6 +2,8 @@
 
 #include "Tests/Support/TestFolder.h"
 
+#include <QFile>
+
 #include <gtest/gtest.h>
 
 namespace {
@@ -29,4 +31,19 @@ TEST(FileTime, IsLocalTimeInMinutesAndTheStampIsFiner)
     EXPECT_EQ(fileTimeText(folder.path("none")), QString());
     EXPECT_NE(fileTimeText(folder.plugins()), QString());
     EXPECT_EQ(regularFileTimeText(folder.plugins()), QString());
+}
+
+TEST(TouchFile, ChangesTheTimeOfAnExistingFileAndNothingElse)
+{
+    const TestFolder folder;
+    folder.write("残響.scan3", "marker");
+    const QString path = folder.path("残響.scan3");
+    folder.setModified(path, localTime("2300-01-01T12:00:00"));
+    const QDateTime before = QDateTime::currentDateTime().addSecs(-10);
+    touchFile(path);
+    EXPECT_GE(fileTimeText(path), before.toString("yyyy-MM-dd hh:mm"));
+    EXPECT_LT(fileTimeText(path), "2300");
+    EXPECT_EQ(folder.read("残響.scan3"), "marker");
+    touchFile(folder.path("none"));
+    EXPECT_FALSE(QFile::exists(folder.path("none")));
 }
