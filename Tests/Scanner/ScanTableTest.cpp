@@ -315,6 +315,12 @@ new WaveShell1-VST 9.3_x64.vst2: child 1 One | child 2 Two | child 0x80000003 Th
 scan
 vst2 Name Enabled Working Favourite: One|1|1|1, Three|0|1|0, Two|1|1|0
 
+= Of two versions of a shell the older is not asked again
+put WaveShell1-VST 9.2_x64.vst2, WaveShell1-VST 9.3_x64.vst2: child 1 One
+scan
+vst2 Name Path: One|WaveShell1-VST 9.3_x64.vst2
+same
+
 = A child of its shell's name leaves the shell's marker alone
 put Shell.vst2: child 1 Shell | child 2 "../../Up" | fault static-destructor kill
 scan 2

@@ -255,16 +255,27 @@ bool FolderScan::addListed(const std::vector<EffectRecord> &records)
     return added;
 }
 
-/// Adds a record; where another file holds its identifier, that is remembered.
+/// Adds a record. Where two files offer one identifier, the memory of the one that loses it says who holds it:
+/// its file is not loaded again for that.
 bool FolderScan::add(const EffectRecord &record)
 {
-    if (m_host.AddEffect(record))
-        return true;
     const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
-    for (RememberedPlugin &plugin : m_remembered.plugins)
-        if (holder && plugin.id == record.id && !isSamePath(holder->path, record.path))
-            plugin.heldBy = holder->path;
-    return false;
+    const bool isAdded = m_host.AddEffect(record);
+    if (!holder || isSamePath(holder->path, record.path))
+        return isAdded;
+    const auto setHolder = [&](RememberedProbe &probe, const QString &path) {
+        for (RememberedPlugin &plugin : probe.plugins)
+            if (plugin.id == record.id)
+                plugin.heldBy = path;
+    };
+    if (!isAdded) {
+        setHolder(m_remembered, holder->path);
+    } else if (const RememberedProbe *loser = m_memory.find(m_host.format(), holder->path)) {
+        RememberedProbe changed = *loser; // an older version, which this one replaces
+        setHolder(changed, record.path);
+        m_memory.set(changed);
+    }
+    return isAdded;
 }
 
 /// What a crash marker said that this run absorbed. The launcher, which saw the end, knows more.
