@@ -88,6 +88,16 @@ TEST_F(OnScreen, WithNothingToProbeNoWindowAppears)
     EXPECT_EQ(m_screen.takeAppeared(), 0);
 }
 
+TEST_F(OnScreen, TheWindowStaysOnTopOfOthers)
+{
+    if (!m_screen.startWindowManager())
+        GTEST_SKIP() << "IceWM did not start";
+    put(kComp + ".vst3", "delay initialize 3000\n");
+    ASSERT_TRUE(m_scanner.start());
+    EXPECT_TRUE(
+        m_scanner.waitUntil([this] { return m_screen.isFocusedOnTop(m_screen.windowTitled(kTitle)); }));
+}
+
 TEST_F(OnScreen, TheWindowFollowsTheResolution)
 {
     put(kComp + ".vst3", "delay initialize 500\n");

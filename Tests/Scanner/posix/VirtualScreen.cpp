@@ -1,5 +1,7 @@
 #include "Tests/Scanner/posix/VirtualScreen.h"
 
+#include <QDeadlineTimer>
+
 #include <cstdlib>
 #include <cstring>
 #include <memory>
@@ -56,6 +58,8 @@ bool VirtualScreen::startServer()
 
 void VirtualScreen::kill()
 {
+    m_windowManager.kill();
+    m_windowManager.waitForFinished(-1);
     m_server.kill();
     m_server.waitForFinished(-1);
 }
@@ -75,15 +79,26 @@ int VirtualScreen::takeAppeared()
     return count;
 }
 
-QByteArray VirtualScreen::titleOf(xcb_window_t window) const
+QByteArray VirtualScreen::property(xcb_window_t window, const char *name) const
 {
     const auto request =
-        xcb_get_property(m_connection, 0, window, atom("_NET_WM_NAME"), XCB_GET_PROPERTY_TYPE_ANY, 0, 256);
+        xcb_get_property(m_connection, 0, window, atom(name), XCB_GET_PROPERTY_TYPE_ANY, 0, 256);
     const auto answer = owned(xcb_get_property_reply(m_connection, request, nullptr));
     if (!answer)
         return QByteArray();
     return {static_cast<const char *>(xcb_get_property_value(answer.get())),
             xcb_get_property_value_length(answer.get())};
+}
+
+bool VirtualScreen::isFocusedOnTop(xcb_window_t window) const
+{
+    // Only the window manager adds the focus: what the program wrote before is not enough.
+    const QByteArray states = property(window, "_NET_WM_STATE");
+    const auto has = [&](const char *name) {
+        const xcb_atom_t state = atom(name);
+        return states.contains(QByteArray(reinterpret_cast<const char *>(&state), sizeof state));
+    };
+    return has("_NET_WM_STATE_FOCUSED") && has("_NET_WM_STATE_ABOVE");
 }
 
 void VirtualScreen::setResolution(int dotsPerInch) const
@@ -92,6 +107,19 @@ void VirtualScreen::setResolution(int dotsPerInch) const
     xcb_change_property(m_connection, XCB_PROP_MODE_REPLACE, m_root, atom("RESOURCE_MANAGER"),
                         XCB_ATOM_STRING, 8, static_cast<quint32>(resources.size()), resources.constData());
     xcb_flush(m_connection);
+}
+
+bool VirtualScreen::startWindowManager()
+{
+    // Its settings are its own, not those of the user.
+    m_windowManager.setProgram("env");
+    m_windowManager.setArguments({"HOME=/nonexistent", "icewm", "--display=" + m_name});
+    m_windowManager.start();
+    const QDeadlineTimer deadline(20000);
+    while (property(m_root, "_NET_SUPPORTING_WM_CHECK").isEmpty())
+        if (m_windowManager.waitForFinished(10) || deadline.hasExpired())
+            return false;
+    return true;
 }
 
 QSize VirtualScreen::sizeOf(xcb_window_t window) const
@@ -108,14 +136,19 @@ bool VirtualScreen::isVisible(xcb_window_t window) const
     return answer && answer->map_state == XCB_MAP_STATE_VIEWABLE;
 }
 
-xcb_window_t VirtualScreen::windowTitled(const QString &title) const
+xcb_window_t VirtualScreen::windowTitled(const QString &title) const { return windowTitled(title, m_root); }
+
+xcb_window_t VirtualScreen::windowTitled(const QString &title, xcb_window_t parent) const
 {
     const auto tree =
-        owned(xcb_query_tree_reply(m_connection, xcb_query_tree(m_connection, m_root), nullptr));
-    const xcb_window_t *const windows = tree ? xcb_query_tree_children(tree.get()) : nullptr;
-    for (int i = 0; tree && i < xcb_query_tree_children_length(tree.get()); ++i)
-        if (isVisible(windows[i]) && titleOf(windows[i]) == title.toUtf8())
-            return windows[i];
+        owned(xcb_query_tree_reply(m_connection, xcb_query_tree(m_connection, parent), nullptr));
+    for (int i = 0; tree && i < xcb_query_tree_children_length(tree.get()); ++i) {
+        const xcb_window_t window = xcb_query_tree_children(tree.get())[i];
+        if (isVisible(window) && property(window, "_NET_WM_NAME") == title.toUtf8())
+            return window;
+        if (const xcb_window_t framed = windowTitled(title, window))
+            return framed;
+    }
     return 0;
 }
 

@@ -21,11 +21,15 @@ public:
     QString name() const { return m_name; }
     /// The display's resolution as programs learn of it, in dots per inch.
     void setResolution(int dotsPerInch) const;
+    /// Starts a window manager (IceWM) and waits until it is at work.
+    bool startWindowManager();
     /// How many windows appeared since the last call.
     int takeAppeared();
     /// The window with this title that can be seen now; 0 when there is none.
     xcb_window_t windowTitled(const QString &title) const;
     QSize sizeOf(xcb_window_t window) const;
+    /// Whether the window manager shows the window as the focused one and as one that stays on top.
+    bool isFocusedOnTop(xcb_window_t window) const;
     /// Asks a window to close, as its close button does.
     void requestClose(const QString &title) const;
     /// Ends the server under its programs.
@@ -34,10 +38,13 @@ public:
 private:
     bool startServer();
     xcb_atom_t atom(const char *name) const;
-    QByteArray titleOf(xcb_window_t window) const;
+    /// Of a window, or of the root; empty when it is not set.
+    QByteArray property(xcb_window_t window, const char *name) const;
+    xcb_window_t windowTitled(const QString &title, xcb_window_t parent) const;
     bool isVisible(xcb_window_t window) const;
 
     ChildProcess m_server;
+    ChildProcess m_windowManager;
     QString m_reason;
     QString m_name;
     xcb_connection_t *m_connection = nullptr;

@@ -33,7 +33,8 @@ TEST(CatalogueText, IsWrittenAsItWasRead)
         ASSERT_TRUE(bool(readWholeFile(path, text)));
         std::vector<EffectRecord> records = readCatalogueFile(*format, path).records;
         ASSERT_EQ(records.size(), 1u);
-        records[0].outputs = 7; // the number of inputs is written in its place
+        records[0].outputs = records[0].latency =
+            7; // for the one the inputs are written, for the other nothing
         EXPECT_EQ(renderCatalogue(*format, records), text.replace("\n", kLineEnd));
         EXPECT_EQ(records[0].category, 0x400u) << "EQ";
         EXPECT_TRUE(records[0].favourite && !records[0].enabled && records[0].working == isVst3);
