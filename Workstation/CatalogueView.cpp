@@ -95,6 +95,8 @@ const char *stateText(PluginState state)
         return "disabled";
     case PluginState::SwitchedOff:
         return "switched off";
+    case PluginState::NoPlugin:
+        return "no plug-in";
     case PluginState::FolderAway:
         return "folder away";
     }

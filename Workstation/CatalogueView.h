@@ -14,6 +14,7 @@ enum class PluginState {
     Failed,      ///< it does not work
     Disabled,    ///< it ended the scanner; it is not loaded any more
     SwitchedOff, ///< by the user
+    NoPlugin,    ///< a file named like a plug-in that is none
     FolderAway,  ///< the folder that it lay in is not there, or is empty: on a drive that is unplugged
 };
 
@@ -32,6 +33,8 @@ struct CataloguedPlugin {
     bool isAway = false; ///< see `PluginState::FolderAway`
 
     PluginState state() const;
+    qint32 inputs = -1;  ///< audio channels as far as catalogue and last probe tell; -1: unknown
+    qint32 outputs = -1; ///< the same
     /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
     bool hasWidth() const { return format->catalogue->hasWidth; }
     bool isUsable() const { return record.working && !isOfCrashedFile && !isAway; }

@@ -8,15 +8,9 @@
 
 namespace {
 
-constexpr int kSchema = 1;
+constexpr int kSchema = 2;
 
 QJsonValue channels(qint32 count) { return count < 0 ? QJsonValue() : QJsonValue(count); }
-
-/// The catalogue of VST 2 tells the outputs, that of VST 3 the inputs.
-QJsonValue outputsOf(const CataloguedPlugin &plugin)
-{
-    return plugin.hasWidth() ? channels(plugin.record.width) : QJsonValue();
-}
 
 QJsonObject identityOf(const PluginFormatInfo &format, const QString &name, const QString &path,
                        quint32 subId)
@@ -36,8 +30,8 @@ QJsonObject pluginObject(const CataloguedPlugin &plugin)
     object.insert(QStringLiteral("id"), record.id);
     object.insert(QStringLiteral("vendor"), record.vendor);
     object.insert(QStringLiteral("categories"), QJsonArray::fromStringList(plugin.categories()));
-    object.insert(QStringLiteral("inputs"), channels(record.inputs));
-    object.insert(QStringLiteral("outputs"), outputsOf(plugin));
+    object.insert(QStringLiteral("inputs"), channels(plugin.inputs));
+    object.insert(QStringLiteral("outputs"), channels(plugin.outputs));
     object.insert(QStringLiteral("state"), QLatin1String(stateText(plugin.state())));
     object.insert(QStringLiteral("favourite"), record.favourite);
     object.insert(QStringLiteral("fileTime"), record.fileTime);
@@ -111,19 +105,21 @@ QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, con
 
 QByteArray renderCsv(const ScanSummary &summary)
 {
-    QByteArray text =
-        csvLine({QStringLiteral("format"), QStringLiteral("name"), QStringLiteral("vendor"),
-                 QStringLiteral("categories"), QStringLiteral("channels"), QStringLiteral("state"),
-                 QStringLiteral("reason"), QStringLiteral("id"), QStringLiteral("path")});
+    const auto number = [](qint64 value) { return value < 0 ? QString() : QString::number(value); };
+    const auto subId = [&](quint32 id) { return number(id == 0 ? -1 : qint64(id)); };
+    QByteArray text = csvLine({QStringLiteral("format"), QStringLiteral("name"), QStringLiteral("vendor"),
+                               QStringLiteral("categories"), QStringLiteral("inputs"),
+                               QStringLiteral("outputs"), QStringLiteral("state"), QStringLiteral("reason"),
+                               QStringLiteral("id"), QStringLiteral("path"), QStringLiteral("subId")});
     for (const CataloguedPlugin &plugin : summary.plugins)
         text += csvLine({QString::fromLatin1(plugin.format->key), plugin.record.name, plugin.record.vendor,
-                         plugin.categories().join(QLatin1Char(';')), channelsText(plugin),
-                         QString::fromLatin1(stateText(plugin.state())), plugin.reason, plugin.record.id,
-                         plugin.record.path});
+                         plugin.categories().join(QLatin1Char(';')), number(plugin.inputs),
+                         number(plugin.outputs), QString::fromLatin1(stateText(plugin.state())),
+                         plugin.reason, plugin.record.id, plugin.record.path, subId(plugin.record.subId)});
     for (const PluginFailure &failure : summary.failures)
         if (!failure.isCatalogued)
             text += csvLine({QString::fromLatin1(failure.format->key), failure.name, QString(), QString(),
-                             QString(), QString::fromLatin1(stateText(failure.state)), failure.reason,
-                             QString(), failure.path});
+                             QString(), QString(), QString::fromLatin1(stateText(failure.state)),
+                             failure.reason, QString(), failure.path, subId(failure.subId)});
     return text;
 }

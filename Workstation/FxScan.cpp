@@ -70,6 +70,9 @@ QStringList foldersToScan(const ScanOptions &options, const DataFiles &files)
             !last.isEmpty())
             return last;
     if (options.folders.isEmpty())
+        for (const QString &reason : settleFolders(foldersOfEnvironment()).leftOut)
+            complain(QStringLiteral("left out: ") + reason);
+    if (options.folders.isEmpty())
         return existingUsualFolders();
     const SettledFolders settled = settleFolders(options.folders);
     for (const QString &reason : settled.leftOut)
@@ -103,6 +106,10 @@ int conclude(const ScanOptions &options, const ScanSummary &summary, const QStri
 
 int listOnly(const ScanOptions &options, const DataFiles &files)
 {
+    if (!QFileInfo(files.effects).isDir()) {
+        complain(QStringLiteral("nothing was scanned into %1 yet").arg(options.dataFolder));
+        return ScanExit::kUsage;
+    }
     return conclude(options, summariseCatalogue(readCatalogues(files.effects), ProbeMemory(files.effects)),
                     {});
 }
@@ -138,6 +145,12 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
     registry.initialise(options.dataFolder, QString(), PluginHost::kDefaultSampleRate,
                         PluginHost::kDefaultBlockSize);
     const CatalogueView before = readCatalogues(files.effects);
+    const QString list = files.effects + QLatin1String(kScanListFile);
+    if (const FileResult written = WriteScanList(list, workstation.scanFolders());
+        !written) { // else an old one is scanned
+        complain(QStringLiteral("cannot write the scan list %1: %2").arg(list, written.reason));
+        return ScanExit::kNotFinished;
+    }
     if (options.isRetry())
         if (const int failed = retry(options, folders, registry, files); failed != ScanExit::kDone)
             return failed;
@@ -169,17 +182,13 @@ bool waitForScanner(const QString &effectsFolder)
 
 } // namespace
 
-int runFxScan(ScanOptions options)
+int runFxScan(const ScanOptions &options)
 {
     if (options.foldersOnly)
         return printUsualFolders();
     const DataFiles files(options.dataFolder);
     if (options.listOnly)
         return listOnly(options, files);
-    if (!QDir().mkpath(files.effects)) {
-        complain(QStringLiteral("cannot make the folder %1").arg(files.effects));
-        return ScanExit::kNotFinished;
-    }
     const QStringList folders = foldersToScan(options, files);
     if (folders.isEmpty()) {
         complain(options.folders.isEmpty()
@@ -188,9 +197,13 @@ int runFxScan(ScanOptions options)
         return ScanExit::kUsage;
     }
     if (!options.inProcess && !QFile::exists(PluginHost::usualScannerPath())) {
-        complain(QStringLiteral("there is no scanner program %1; scanning in this process")
+        complain(QStringLiteral("there is no scanner program %1; --in-process does without")
                      .arg(PluginHost::usualScannerPath()));
-        options.inProcess = true;
+        return ScanExit::kNotFinished;
+    }
+    if (!QDir().mkpath(files.effects)) {
+        complain(QStringLiteral("cannot make the folder %1").arg(files.effects));
+        return ScanExit::kNotFinished;
     }
     const ScanLock lock(files.effects, ScanLock::Role::Workstation);
     if (lock.isHeldByOther() || !waitForScanner(files.effects)) {

@@ -3,4 +3,4 @@
 #include "Workstation/ScanOptions.h"
 
 /// fxscan, from its options to its exit code. Returns when everything is printed.
-int runFxScan(ScanOptions options);
+int runFxScan(const ScanOptions &options);

@@ -21,11 +21,12 @@ QStringList foldersOfVariable(const char *name)
 
 } // namespace
 
-QStringList usualPluginFolders()
+QStringList foldersOfEnvironment()
 {
-    return foldersOfVariable("VST3_PATH") + foldersOfVariable("VST_PATH") + foldersOfVariable("LXVST_PATH") +
-           platformPluginFolders();
+    return foldersOfVariable("VST3_PATH") + foldersOfVariable("VST_PATH") + foldersOfVariable("LXVST_PATH");
 }
+
+QStringList usualPluginFolders() { return foldersOfEnvironment() + platformPluginFolders(); }
 
 QString userDataFolder()
 {

@@ -7,6 +7,9 @@
 /// environment variables "VST3_PATH", "VST_PATH" and "LXVST_PATH" name.
 QStringList usualPluginFolders();
 
+/// Those that the variables name alone.
+QStringList foldersOfEnvironment();
+
 /// Where fxscan keeps its files when no folder is given: below the platform's place for user data.
 QString userDataFolder();
 

@@ -24,14 +24,13 @@ QString nameOf(const ScanAccount &account, const PluginKey &key)
 
 } // namespace
 
-Progress::Progress(bool isQuiet)
+Progress::Progress(bool isQuiet, int limit)
     : m_isQuiet(isQuiet)
     , m_isTerminal(Terminal::errorIsTerminal())
+    , m_limit(limit)
 {}
 
-Progress::~Progress() { clearLine(); }
-
-void Progress::clearLine()
+void Progress::end()
 {
     if (!m_line.isEmpty())
         Terminal::printError(QStringLiteral("\r\x1b[K"));
@@ -42,7 +41,7 @@ void Progress::say(const QString &text)
 {
     if (m_isQuiet)
         return;
-    clearLine();
+    end();
     Terminal::printError(Terminal::harmless(text) + QLatin1Char('\n'));
 }
 
@@ -59,7 +58,8 @@ void Progress::show(ScanAccount &account)
 void Progress::showLines(ScanAccount &account)
 {
     for (const PluginKey &key : account.takeBegun())
-        Terminal::printError(Terminal::harmless(nameOf(account, key)) + QLatin1Char('\n'));
+        Terminal::printError(Terminal::harmless(countOf(account) + QLatin1Char(' ') + nameOf(account, key)) +
+                             QLatin1Char('\n'));
 }
 
 void Progress::showLine(const ScanAccount &account, const PluginKey &key)
@@ -67,8 +67,10 @@ void Progress::showLine(const ScanAccount &account, const PluginKey &key)
     if (!(key == m_shown))
         m_since.start();
     m_shown = key;
-    const QString time =
-        m_since.elapsed() < kSlow ? QString() : QStringLiteral("  (%1 s)").arg(m_since.elapsed() / 1000);
+    const QString limit = m_limit > 0 ? QStringLiteral(" of %1").arg(m_limit) : QString();
+    const QString time = m_since.elapsed() < kSlow
+                             ? QString()
+                             : QStringLiteral("  (%1 s%2)").arg(m_since.elapsed() / 1000).arg(limit);
     const QString text =
         Terminal::harmless(countOf(account) + QLatin1Char(' ') + nameOf(account, key) + time);
     const QString line = Terminal::cell(text, Terminal::errorWidth() - 1).trimmed();

@@ -8,9 +8,10 @@
 /// Shows how a scan gets on, on the error output: on a terminal one line that lives, else a line per file.
 class Progress {
 public:
-    explicit Progress(bool isQuiet);
+    /// `limit`: the seconds that one plug-in may take; 0: any.
+    Progress(bool isQuiet, int limit);
     /// Takes the live line away.
-    ~Progress();
+    ~Progress() { end(); }
     Progress(const Progress &) = delete;
     Progress &operator=(const Progress &) = delete;
 
@@ -18,15 +19,16 @@ public:
     void show(ScanAccount &account);
     /// A line that stays.
     void say(const QString &text);
+    /// Takes the live line away: what comes after it begins a line.
+    void end();
 
 private:
-    void clearLine();
     void showLines(ScanAccount &account);
     void showLine(const ScanAccount &account, const PluginKey &key);
 
     bool m_isQuiet;
     bool m_isTerminal;
-    bool m_hasLine = false;
+    int m_limit;
     QString m_line;    ///< as it stands on the terminal
     PluginKey m_shown; ///< what it is about
     QElapsedTimer m_since;

@@ -7,6 +7,8 @@
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Workstation/Terminal.h"
 
+#include <QScopeGuard>
+
 #include <atomic>
 #include <cstdlib>
 #include <thread>
@@ -31,7 +33,7 @@ ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const
     : m_options(options)
     , m_registry(registry)
     , m_account(report)
-    , m_progress(options.quiet)
+    , m_progress(options.quiet, options.inProcess ? 0 : options.timeout)
 {
     TerminationSignal::install();
     registry.setProbeLimit(options.timeout);
@@ -41,6 +43,7 @@ ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const
 
 bool ScanSession::run()
 {
+    const auto endLine = qScopeGuard([this] { m_progress.end(); });
     // A launch is over after so many runs. Where it got on, the next one goes on; a plug-in that ends the
     // scanner although it was blamed before would do so for ever.
     while (!scanOnce())

@@ -53,6 +53,25 @@ void addFailures(ScanSummary &summary, const ScanAccount *account, const ProbeMe
     }
 }
 
+/// Each catalogue tells one direction only, the last probe both.
+void fillChannels(std::vector<CataloguedPlugin> &plugins, const ProbeMemory &memory)
+{
+    for (CataloguedPlugin &plugin : plugins) {
+        if (!plugin.isUsable())
+            continue;
+        (plugin.hasWidth() ? plugin.outputs : plugin.inputs) =
+            plugin.hasWidth() ? plugin.record.width : plugin.record.inputs;
+        const RememberedProbe *last = memory.find(plugin.format->format, plugin.record.path);
+        if (!last || last->fileTime != plugin.record.fileTime)
+            continue;
+        for (const RememberedPlugin &each : last->plugins)
+            if (each.id == plugin.record.id) {
+                plugin.inputs = each.inputs;
+                plugin.outputs = each.outputs;
+            }
+    }
+}
+
 /// Format and path of a file.
 using FileIdentity = std::pair<PluginFormat, QString>;
 
@@ -69,8 +88,8 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
             continue;
         const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;
         (probe.noPlugin ? summary.noPlugins : summary.failures)
-            .push_back({&formatInfo(key.format), PluginState::Failed, name, key.path, key.subId, probe.reason,
-                        false});
+            .push_back({&formatInfo(key.format), probe.noPlugin ? PluginState::NoPlugin : PluginState::Failed,
+                        name, key.path, key.subId, probe.reason, false});
     }
 }
 
@@ -122,6 +141,7 @@ ScanSummary summariseCatalogue(CatalogueView now, const ProbeMemory &memory)
     ScanSummary summary;
     summary.plugins = std::move(now.plugins);
     summary.problems = std::move(now.problems);
+    fillChannels(summary.plugins, memory);
     addFailures(summary, nullptr, memory);
     return summary;
 }
@@ -134,6 +154,7 @@ ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const 
     summary.finished = account.isFinished();
     summary.plugins = std::move(now.plugins);
     summary.problems = account.problems() + now.problems;
+    fillChannels(summary.plugins, memory);
     addFailures(summary, &account, memory);
     addUnrecorded(summary, account);
     count(summary, before, account);

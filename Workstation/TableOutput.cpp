@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <array>
+#include <map>
 
 namespace {
 
@@ -46,7 +47,7 @@ QString renderPlugins(const ScanSummary &summary)
     if (summary.plugins.empty())
         return QString();
     std::vector<Row> rows{{QStringLiteral("FORMAT"), QStringLiteral("NAME"), QStringLiteral("VENDOR"),
-                           QStringLiteral("CATEGORY"), QStringLiteral("CHANNELS"), QStringLiteral("STATE")}};
+                           QStringLiteral("CATEGORY"), QStringLiteral("IN/OUT"), QStringLiteral("STATE")}};
     for (const CataloguedPlugin &plugin : summary.plugins)
         rows.push_back(rowOf(plugin));
     return renderRows(rows) + QLatin1Char('\n');
@@ -81,18 +82,44 @@ QString renderSlowest(const ScanSummary &summary)
     return text.isEmpty() ? text : QStringLiteral("Slowest:\n") + text + QLatin1Char('\n');
 }
 
+/// "3 new", or nothing for none.
+void addCount(QStringList &parts, std::size_t count, const char *what)
+{
+    if (count != 0)
+        parts.append(QStringLiteral("%1 %2").arg(count).arg(QLatin1String(what)));
+}
+
 QString renderCounts(const ScanSummary &summary)
 {
-    QString text = QStringLiteral("%1 plug-ins").arg(summary.plugins.size());
-    if (summary.isScan)
-        text += QStringLiteral(": %1 new, %2 updated, %3 unchanged, %4 removed")
-                    .arg(summary.added)
-                    .arg(summary.updated)
-                    .arg(summary.unchanged)
-                    .arg(summary.removed.size());
-    text += QStringLiteral(", %1 failed").arg(summary.failures.size());
-    if (!summary.noPlugins.empty())
-        text += QStringLiteral("; other files without a plug-in: %1").arg(summary.noPlugins.size());
+    std::map<PluginState, std::size_t> states;
+    for (const CataloguedPlugin &plugin : summary.plugins)
+        ++states[plugin.state()];
+    for (const PluginFailure &failure : summary.failures)
+        states[failure.state] += failure.isCatalogued ? 0 : 1;
+    QStringList now;
+    addCount(now, states[PluginState::Ok], "usable");
+    for (const PluginState state :
+         {PluginState::Failed, PluginState::Disabled, PluginState::SwitchedOff, PluginState::FolderAway})
+        addCount(now, states[state], stateText(state));
+    QStringList changes;
+    if (summary.isScan) {
+        addCount(changes, static_cast<std::size_t>(summary.added), "new");
+        addCount(changes, static_cast<std::size_t>(summary.updated), "updated");
+        if (!summary.removed.isEmpty())
+            changes.append(QStringLiteral("%1 gone: %2")
+                               .arg(summary.removed.size())
+                               .arg(Terminal::harmless(summary.removed.join(QLatin1String(", ")))));
+    }
+    const std::size_t count = summary.plugins.size();
+    QString text = QStringLiteral("%1 plug-in%2").arg(count).arg(QLatin1String(count == 1 ? "" : "s"));
+    if (!now.isEmpty())
+        text += QLatin1String(": ") + now.join(QLatin1String(", "));
+    for (const QStringList &part :
+         {changes, summary.noPlugins.empty() ? QStringList()
+                                             : QStringList(QStringLiteral("other files without a plug-in: %1")
+                                                               .arg(summary.noPlugins.size()))})
+        if (!part.isEmpty())
+            text += QLatin1String("; ") + part.join(QLatin1String(", "));
     return text + QLatin1Char('\n');
 }
 
@@ -100,10 +127,10 @@ QString renderCounts(const ScanSummary &summary)
 
 QString channelsText(const CataloguedPlugin &plugin)
 {
-    const qint32 channels = plugin.hasWidth() ? plugin.record.width : plugin.record.inputs;
-    if (!plugin.isUsable() || channels < 0)
+    const auto text = [](qint32 count) { return count < 0 ? QStringLiteral("?") : QString::number(count); };
+    if (plugin.inputs < 0 && plugin.outputs < 0)
         return QStringLiteral("-");
-    return QString::number(channels) + (plugin.hasWidth() ? QLatin1String(" out") : QLatin1String(" in"));
+    return text(plugin.inputs) + QLatin1Char('/') + text(plugin.outputs);
 }
 
 QString renderTable(const ScanSummary &summary)

@@ -8,6 +8,7 @@
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <QJsonObject>
+#include <QStandardPaths>
 #include <QThread>
 
 namespace {
@@ -227,8 +228,8 @@ TEST_F(FxScan, AScannerThatIsMissingOrCannotStartIsSaidAtOnce)
     put("Comp.vst3");
     ScannerRun fxscan(m_folder.path(program.fileName()), m_folder);
     prepare(fxscan, {m_folder.plugins()});
+    EXPECT_TRUE(fxscan.run().exitCode == 3 && trace().isEmpty()) << "no plug-in gets into it unasked";
     EXPECT_TRUE(fxscan.run().standardError.contains("there is no scanner program"));
-    EXPECT_TRUE(m_folder.catalogue().contains("<Name>Comp<")) << "scanned in its own process";
     m_folder.write(program.fileName().replace("fxscan", "FxProbe"), "not a program");
     const ScannerOutcome &outcome = fxscan.run();
     EXPECT_EQ(outcome.exitCode, 3);
@@ -286,6 +287,21 @@ TEST_F(FxScan, TheUsualFoldersAreThoseThatExist)
     EXPECT_FALSE(folders.contains("nowhere")) << folders.constData();
 }
 
+TEST_F(FxScan, OnATerminalTheResultBeginsALine)
+{
+    const QString script = QStandardPaths::findExecutable("script");
+    if (script.isEmpty())
+        GTEST_SKIP() << "there is no program that makes a terminal";
+    put("Comp.vst3", "delay initialize 300\n");
+    ScannerRun terminal(script, m_folder);
+    terminal.removeEnvironment("FXPROBE_LOG");
+    const QStringList words{FXPROBE_FXSCAN, "--data-folder", m_folder.dataFolder(), m_folder.plugins()};
+    terminal.setArguments({"-qec", words.join(' '), "/dev/null"});
+    const QByteArray output = terminal.run().standardOutput;
+    EXPECT_TRUE(output.contains("[0/1] VST 3  Comp.vst3")) << output.constData();
+    EXPECT_TRUE(output.contains("\r\x1b[KFORMAT")) << output.constData();
+}
+
 TEST_F(FxScan, WrongUsage)
 {
     const QString nowhere = m_folder.path("nowhere");
@@ -296,6 +312,7 @@ TEST_F(FxScan, WrongUsage)
         {{"--no-such-option"}, "no-such-option"},
         {{"--timeout", "-1"}, "--timeout must be 0 to 86400 seconds, not '-1'"},
         {{nowhere}, "there is no folder"},
+        {{"--list", "--data-folder", nowhere}, "nothing was scanned into"},
         {{m_folder.plugins(), "--retry", "Nobody"}, "no disabled or failed plug-in is named 'Nobody'"},
     };
     for (const auto &row : rows) {

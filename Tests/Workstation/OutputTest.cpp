@@ -33,14 +33,13 @@ TEST(Output, NothingInATextSteersTheTerminal)
 
 TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)
 {
-    CataloguedPlugin plugin{&pluginFormats().front(), {}, {}, false, false};
+    CataloguedPlugin plugin{&pluginFormats().front(), {}, {}, false, false, 2};
     plugin.record.name = "A \"B\", C";
     plugin.record.vendor = "two\nlines";
-    plugin.record.inputs = 2;
     plugin.record.path = "/p/A.vst3";
     ScanSummary summary;
     summary.plugins.push_back(plugin);
     const QByteArray csv = renderCsv(summary);
     EXPECT_EQ(csv.mid(csv.indexOf("\r\n") + 2),
-              "vst3,\"A \"\"B\"\", C\",\"two\nlines\",,2 in,ok,,,/p/A.vst3\r\n");
+              "vst3,\"A \"\"B\"\", C\",\"two\nlines\",,2,,ok,,,/p/A.vst3,\r\n");
 }

@@ -6,6 +6,7 @@
 #include <clocale>
 #include <csignal>
 
+#include <pwd.h>
 #include <sys/resource.h>
 #include <unistd.h>
 
@@ -43,10 +44,19 @@ void chooseDisplayPlatform()
     qputenv("QT_QPA_PLATFORM", platforms + "offscreen");
 }
 
+/// A service may run without the variable: what is looked for at home must not land at the root.
+void giveHome()
+{
+    const passwd *account = getenv("HOME") ? nullptr : getpwuid(getuid());
+    if (account && account->pw_dir)
+        setenv("HOME", account->pw_dir, 1);
+}
+
 } // namespace
 
 void prepareProcess()
 {
+    giveHome();
     suppressCoreDumps();
     std::signal(SIGPIPE, SIG_IGN);
     // File names are bytes; read as UTF-8 they also survive where the locale is "C".
