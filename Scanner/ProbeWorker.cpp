@@ -73,6 +73,8 @@ public:
         message.kind = Kind::ChildEnd;
         message.outcome = outcome;
         message.outcome.milliseconds = milliseconds(m_childTimer);
+        if (!outcome.records.empty())
+            message.record = outcome.records.front();
         tell(message);
     }
     void childCloses(const EffectRecord &child) override { tellRecord(Kind::ChildCloses, child); }

@@ -30,6 +30,8 @@ constexpr int kUnusableList = 2;
 constexpr char kReWireArgument[] = "-rewire_version";
 /// How long a plug-in may go on after somebody asked the process to end.
 constexpr std::chrono::seconds kTerminationGrace(2);
+/// The same with workers: the scan ends them by itself, and writes what there is.
+constexpr std::chrono::seconds kGraceWithWorkers(3);
 
 int reportReWireVersion()
 {
@@ -57,7 +59,8 @@ void runDialog(QApplication &application, const QString &dataFolder, bool isDefa
         [&application] {
             QMetaObject::invokeMethod(&application, &QApplication::quit, Qt::QueuedConnection);
         },
-        [] { CrashMarker::abandonAll([] { leaveProcess(0); }); }, kTerminationGrace);
+        [] { CrashMarker::abandonAll([] { leaveProcess(0); }); },
+        qEnvironmentVariableIntValue("FXPROBE_JOBS") > 0 ? kGraceWithWorkers : kTerminationGrace);
     QObject::connect(
         &application, &QGuiApplication::commitDataRequest, &application,
         [](QSessionManager &) { TerminationSignal::raise(); }, Qt::DirectConnection);

@@ -58,8 +58,12 @@ void ScanAccount::takeLine(const ReportLine &line)
         break;
     case Event::Busy:
     case Event::Finished:
+    case Event::WorkerEnd: // what it was busy with is begun again, or has ended
+        m_open.erase(std::remove_if(m_open.begin(), m_open.end(),
+                                    [&](const Open &open) { return open.worker == line.worker; }),
+                     m_open.end());
+        break;
     case Event::Ended:
-    case Event::WorkerEnd:
     case Event::Unknown:
         break;
     }

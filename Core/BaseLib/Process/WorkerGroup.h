@@ -11,9 +11,10 @@
 
 /// How a worker process ended.
 struct WorkerEnd {
-    bool crashed = false; ///< something from outside its own code ended it: a signal, an unhandled fault
-    int code = 0;         ///< exit code; of a crash the signal (POSIX) or the status code (Windows)
-    QString text;         ///< in words, as far as the system has any
+    bool crashed = false;  ///< something from outside its own code ended it: a signal, an unhandled fault
+    bool isKilled = false; ///< ended by force, from outside: no fault of its own says so
+    int code = 0;          ///< exit code; of a crash the signal (POSIX) or the status code (Windows)
+    QString text;          ///< in words, as far as the system has any
 };
 
 /// Something that came from a worker.

@@ -63,16 +63,26 @@ int memoryLimit(int wanted, int jobs)
     return wanted > 0 ? wanted : static_cast<int>(std::max(kLeast, share));
 }
 
+/// The program that runs, also where its file was replaced meanwhile.
+QString thisProgram()
+{
+#ifdef __linux__
+    return QStringLiteral("/proc/self/exe");
+#else
+    return QCoreApplication::applicationFilePath();
+#endif
+}
+
 /// The workers that whoever started this process asked for; null when nobody did.
 std::shared_ptr<ProbePool> poolOfEnvironment()
 {
-    const int jobs = qEnvironmentVariableIntValue("FXPROBE_JOBS");
+    constexpr int kMost = 64;
+    const int jobs = std::min(kMost, qEnvironmentVariableIntValue("FXPROBE_JOBS"));
     if (jobs <= 0 || !application() || !application()->isScanner())
         return nullptr;
-    return std::make_shared<ProbePool>(
-        ProbePool::Settings{QCoreApplication::applicationFilePath(), jobs,
-                            std::chrono::seconds(qEnvironmentVariableIntValue("FXPROBE_PROBE_LIMIT")),
-                            qint64(qEnvironmentVariableIntValue("FXPROBE_MEMORY_LIMIT")) << 20});
+    return std::make_shared<ProbePool>(ProbePool::Settings{
+        thisProgram(), jobs, std::chrono::seconds(qEnvironmentVariableIntValue("FXPROBE_PROBE_LIMIT")),
+        qint64(qEnvironmentVariableIntValue("FXPROBE_MEMORY_LIMIT")) << 20});
 }
 
 bool isSameOrInside(const QString &folder, const QString &outer)

@@ -93,6 +93,7 @@ WorkerEnd endOf(int status)
 {
     WorkerEnd end;
     end.crashed = WIFSIGNALED(status);
+    end.isKilled = end.crashed && WTERMSIG(status) == SIGKILL;
     end.code = end.crashed ? WTERMSIG(status) : WEXITSTATUS(status);
     if (end.crashed)
         end.text =

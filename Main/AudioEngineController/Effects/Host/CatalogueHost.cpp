@@ -225,10 +225,15 @@ void CatalogueHost::clearSuspect(const QString &path)
     m_suspects.erase(suspect);
 }
 
-void CatalogueHost::clearSuspects()
+void CatalogueHost::clearSuspects(const KnownList::Records &away)
 {
-    while (!m_suspects.empty())
-        clearSuspect(m_suspects.begin()->first);
+    QStringList paths;
+    for (const auto &suspect : m_suspects)
+        if (std::none_of(away.begin(), away.end(),
+                         [&](const EffectRecord *record) { return isSamePath(record->path, suspect.first); }))
+            paths.append(suspect.first);
+    for (const QString &path : paths)
+        clearSuspect(path);
 }
 
 void CatalogueHost::scansEnded()

@@ -52,8 +52,8 @@ public:
     bool isSuspect(const QString &path) const { return m_suspects.count(path) != 0; }
     /// Deletes the marker of a suspect that was asked.
     void clearSuspect(const QString &path);
-    /// Deletes the markers of all suspects: none of them is there to be asked any more.
-    void clearSuspects();
+    /// Deletes the markers of suspects that cannot be asked any more: of all but those that are away.
+    void clearSuspects(const KnownList::Records &away);
     /// Reads a crash marker into a fresh record that is not enabled. The file stays: it is deleted once the
     /// catalogue holds what it said.
     EffectRecord ReadCrashMarker(const QString &marker) const;

@@ -181,7 +181,7 @@ void FolderScan::probe(const ScanItem &item)
     const bool added = keepOutcome(item, outcome);
     log(item, outcome, 0);
     if (added)
-        writeInterim(m_waiting);
+        writeInterim();
     writeMemory(false);
     m_host.clearSuspect(item.path);
     if (m_childrenDone != 0)
@@ -220,6 +220,13 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
     return added;
 }
 
+/// Of several waiting records of one identifier the first is written: what came of a probe goes before what
+/// was known.
+void FolderScan::insertFirst(const EffectRecord &record)
+{
+    m_waiting.insert(m_waiting.lower_bound(record.id), {record.id, ListedEffect(record)});
+}
+
 void FolderScan::takeOut(const EffectRecord &record, WaitingRecords &waiting)
 {
     const auto [first, last] = waiting.equal_range(record.id);
@@ -255,8 +262,8 @@ bool FolderScan::addListed(const std::vector<EffectRecord> &records)
     return added;
 }
 
-/// Adds a record. Where two files offer one identifier, the memory of the one that loses it says who holds it:
-/// its file is not loaded again for that.
+/// Adds a record. Where two files offer one identifier, the memory of the one that loses it says who holds
+/// it: its file is not loaded again for that.
 bool FolderScan::add(const EffectRecord &record)
 {
     const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
@@ -329,7 +336,7 @@ void FolderScan::writeMemory(bool isLast)
 /// A file that lists the same plug-in goes before one that does not list it any more.
 void FolderScan::addLater(EffectRecord record)
 {
-    m_waiting.insert({record.id, ListedEffect(record)});
+    insertFirst(record);
     m_later.push_back(std::move(record));
 }
 
@@ -346,9 +353,11 @@ void FolderScan::collectWaiting(std::size_t from)
             m_waiting.insert({record->id, ListedEffect(*record)});
 }
 
-void FolderScan::writeInterim(WaitingRecords &waiting)
+bool FolderScan::writeInterim()
 {
-    m_written |= m_host.writeInterim(waiting, Durability::Buffered);
+    const bool isWritten = m_host.writeInterim(m_waiting, Durability::Buffered);
+    m_written |= isWritten;
+    return isWritten;
 }
 
 void FolderScan::finish(bool isWhole)
@@ -366,7 +375,7 @@ void FolderScan::finish(bool isWhole)
             if (!m_host.isListed(record->id)) // else a file that is there lists it
                 m_host.AddEffect(*record);
         forgetGone();
-        m_host.clearSuspects();
+        m_host.clearSuspects(m_plan->away());
     } else {
         ProbeReport::instance().cancelled();
         collectWaiting(m_done);

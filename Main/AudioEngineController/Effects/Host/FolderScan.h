@@ -50,9 +50,10 @@ private:
 
     /// Has interim writes carry what is known of the items from one on.
     void collectWaiting(std::size_t from);
+    void insertFirst(const EffectRecord &record);
     static void takeOut(const EffectRecord &record, WaitingRecords &waiting);
     static void removeWaiting(const ScanItem &item, WaitingRecords &waiting);
-    void writeInterim(WaitingRecords &waiting);
+    bool writeInterim();
     bool isCancelled() const;
     void showItemProgress();
 

@@ -1,5 +1,7 @@
 #include "Main/AudioEngineController/Effects/Host/OutcomeRecords.h"
 
+#include <algorithm>
+
 namespace {
 
 /// What a file that fails keeps of a record: the marks. It is not working, and asked again when the file
@@ -33,7 +35,8 @@ public:
             add(record, listed.size() == 1);
     }
     void addFailed(const QString &fileTime);
-    void addCrashed();
+    /// `children`: the sub-plug-ins that ended processes of their own before.
+    void addCrashed(const std::vector<EffectRecord> &children);
     void keepUnchanged();
 
     OutcomeRecords made;
@@ -43,7 +46,8 @@ private:
     void addDeadly(const EffectRecord &child, EffectRecord deadly, bool isOnly);
     const EffectRecord *deadlyRecord(const EffectRecord &child) const;
     EffectRecord crashedChild(const EffectRecord &child) const;
-    KnownList afterCrash(const EffectRecord &marker) const;
+    KnownList knownOfFile() const;
+    void applyCrash(KnownList &known, const EffectRecord &marker) const;
     EffectRecord file(const QString &fileTime) const;
 
     const CatalogueHost &m_host;
@@ -61,29 +65,39 @@ const EffectRecord *Maker::deadlyRecord(const EffectRecord &child) const
     return nullptr;
 }
 
-/// What is known of the item's file, with what a crash marker would say.
-KnownList Maker::afterCrash(const EffectRecord &marker) const
+KnownList Maker::knownOfFile() const
 {
     KnownList known(m_host.known().identity());
     for (const EffectRecord *old : m_item.known)
         known.addRecord(*old);
-    EffectRecord &crashed = known.applyCrash(marker);
-    crashed.id = m_host.freeIdentifier(crashed, marker.name);
     return known;
 }
 
-EffectRecord Maker::crashedChild(const EffectRecord &child) const
+void Maker::applyCrash(KnownList &known, const EffectRecord &marker) const
+{
+    EffectRecord &crashed = known.applyCrash(marker);
+    crashed.id = m_host.freeIdentifier(crashed, marker.name);
+}
+
+/// What a crash marker says of a sub-plug-in.
+EffectRecord markerOf(const EffectRecord &child)
 {
     EffectRecord marker;
     marker.path = child.path;
     marker.fileTime = child.fileTime;
     marker.name = marker.subName = child.subName;
     marker.subId = child.subId;
-    const KnownList known = afterCrash(marker);
-    for (const EffectRecord &record : known.inOrder())
-        if (record.subId == child.subId)
-            marker = record;
+    marker.enabled = false;
     return marker;
+}
+
+EffectRecord Maker::crashedChild(const EffectRecord &child) const
+{
+    KnownList known = knownOfFile();
+    applyCrash(known, markerOf(child));
+    const auto &records = known.inOrder();
+    return *std::find_if(records.begin(), records.end(),
+                         [&](const EffectRecord &record) { return record.subId == child.subId; });
 }
 
 EffectRecord Maker::file(const QString &fileTime) const
@@ -137,16 +151,21 @@ void Maker::addFailed(const QString &fileTime)
 }
 
 /// As a crash marker has it that the next run finds; so has what moved here, with its marks.
-void Maker::addCrashed()
+void Maker::addCrashed(const std::vector<EffectRecord> &children)
 {
     EffectRecord marker = file(m_item.fileTime);
     marker.enabled = false;
     NameFromPath(marker);
     if (m_host.isMarkerWithoutRecord(marker))
         return keepUnchanged();
-    const KnownList known = afterCrash(marker);
-    for (const EffectRecord *record : known.recordsOfPath(m_item.path))
-        made.listed.push_back(*record);
+    KnownList known = knownOfFile();
+    for (const EffectRecord &child : children)
+        applyCrash(known, markerOf(child));
+    applyCrash(known, marker);
+    // The record for the file, and what it had besides, which gives way to another file that lists it.
+    const KnownList::Records records = known.recordsOfPath(m_item.path);
+    for (const EffectRecord *record : records)
+        (record == records.front() || record->working ? made.listed : made.kept).push_back(*record);
     EffectRecord &crashed = made.listed.front();
     for (const EffectRecord *old : m_item.moved) {
         const bool isFile = m_host.known().isSameOfFile(*old, crashed);
@@ -200,7 +219,7 @@ OutcomeRecords recordsOfOutcome(const CatalogueHost &host, const ScanPlan &plan,
         break;
     case ProbeStatus::Crashed:
     case ProbeStatus::NoAnswer:
-        maker.addCrashed();
+        maker.addCrashed(outcome.records);
         break;
     case ProbeStatus::NoPlugin:
     case ProbeStatus::Cancelled:

@@ -40,6 +40,11 @@ public:
     void childBegins(std::size_t index, int worker, const EffectRecord &child) override;
     void childEnds(std::size_t index, int worker, const ProbeOutcome &outcome) override;
     void jobEnds(std::size_t index, int worker, const ProbeOutcome &outcome) override;
+    void turn() override
+    {
+        if (m_owesWrite)
+            writeInterim(false);
+    }
     void workerEnds(int worker, const QString &reason) override
     {
         ProbeReport::instance().workerEnded(worker, reason);
@@ -65,7 +70,7 @@ private:
     void holdBack(std::size_t item);
     void keepInOrder();
     void probeRest();
-    void writeInterim(bool isUrgent);
+    bool writeInterim(bool isUrgent);
 
     FolderScan &m_scan;
     const std::vector<ScanItem> &m_items;
@@ -76,6 +81,7 @@ private:
     bool m_isAlone = true;           ///< one job at a time
     std::vector<std::size_t> m_busy; ///< items, the longest at work first
     QElapsedTimer m_sinceWrite;
+    bool m_owesWrite = false; ///< something came since
 };
 
 bool FolderScan::PooledScan::run()
@@ -183,7 +189,9 @@ void FolderScan::PooledScan::childEnds(std::size_t index, int worker, const Prob
     const EffectRecord child = outcome.records.empty() ? state.child : outcome.records.front();
     if (!outcome.reason.isEmpty())
         DebugLog(L"%ls, %ls: %ls", child.path, child.subName, outcome.reason);
-    ProbeReport::instance().end(m_scan.m_host.format(), child, outcome, worker);
+    // One that ends its worker while it is being closed has ended before.
+    if (state.childReasons.count(child.subId) == 0 || !outcome.reason.isEmpty())
+        ProbeReport::instance().end(m_scan.m_host.format(), child, outcome, worker);
     state.childReasons[child.subId] = outcome.reason;
 }
 
@@ -208,9 +216,14 @@ void FolderScan::PooledScan::jobEnds(std::size_t index, int worker, const ProbeO
     if (m_scan.m_progress)
         m_scan.m_progress->setValue(static_cast<int>(m_ended));
     showLongest();
-    if (state.isTouched) // what was only looked at can wait for the last write
-        writeInterim(outcome.status == ProbeStatus::Crashed || outcome.status == ProbeStatus::NoAnswer);
-    state.marker.remove(); // the catalogue holds what came of it
+    const bool isVerdict = outcome.status == ProbeStatus::Crashed || outcome.status == ProbeStatus::NoAnswer;
+    const bool isKept =
+        (!state.isTouched && !isVerdict) // what was only looked at can wait for the last write
+        || writeInterim(isVerdict);
+    if (isVerdict && !isKept)
+        state.marker.leave(); // nothing else holds it
+    else
+        state.marker.remove();
     m_scan.m_host.clearSuspect(m_items[item].path);
 }
 
@@ -223,7 +236,7 @@ void FolderScan::PooledScan::holdBack(std::size_t item)
     state.pending = std::move(records.listed);
     state.pending.insert(state.pending.end(), records.kept.begin(), records.kept.end());
     for (const EffectRecord &record : state.pending)
-        m_scan.m_waiting.insert({record.id, ListedEffect(record)});
+        m_scan.insertFirst(record);
 }
 
 /// Keeps the outcomes up to the first item that has none yet.
@@ -247,13 +260,15 @@ void FolderScan::PooledScan::keepInOrder()
 
 /// Writes what there is, also behind an item that takes long; now and then, and before a marker goes that
 /// names a culprit.
-void FolderScan::PooledScan::writeInterim(bool isUrgent)
+bool FolderScan::PooledScan::writeInterim(bool isUrgent)
 {
-    if (!isUrgent && m_sinceWrite.isValid() && !m_sinceWrite.hasExpired(kWritePause))
-        return;
-    m_scan.writeInterim(m_scan.m_waiting);
+    m_owesWrite = !isUrgent && m_sinceWrite.isValid() && !m_sinceWrite.hasExpired(kWritePause);
+    if (m_owesWrite)
+        return true;
+    const bool isWritten = m_scan.writeInterim();
     m_scan.writeMemory(isUrgent);
     m_sinceWrite.start();
+    return isWritten;
 }
 
 bool FolderScan::probeInPool() { return PooledScan(*this).run(); }

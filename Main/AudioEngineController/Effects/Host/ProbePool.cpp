@@ -17,6 +17,12 @@ constexpr qint64 kMaxGrowth = 256 << 20; // bytes
 constexpr int kMaxModules = 50;
 /// Far more than the largest shell or module has to tell.
 constexpr int kMaxMessages = 1 << 20;
+constexpr std::size_t kMaxRecords = 1
+                                    << 16; ///< classes of a module that are asked for, and more than children
+/// A turn that takes longer was held up.
+constexpr qint64 kLongTurn = 500; // ms
+/// What a worker gets to say that it is there.
+constexpr qint64 kStartPatience = 30000; // ms
 /// Starts in a row that may fail.
 constexpr int kMaxFailedStarts = 3;
 
@@ -57,38 +63,55 @@ bool ProbePool::run(std::vector<ProbeJob> jobs, IPoolListener &listener)
     m_waiting.clear();
     for (std::size_t job = 0; job < m_jobs.size(); ++job)
         m_waiting.push_back({job});
+    m_crashedChildren.clear();
+    m_killed.clear();
+    m_failedStarts = 0;
+    m_isCancelled = false;
     QElapsedTimer sinceCancel;
-    bool canStart = true;
-    while (canStart && (isBusy() || !m_waiting.empty())) {
-        if (!sinceCancel.isValid() && listener.isCancelled()) {
+    bool canGoOn = true;
+    while (canGoOn && (isBusy() || !m_waiting.empty())) {
+        QElapsedTimer sinceTurn;
+        sinceTurn.start();
+        if (!m_isCancelled && listener.isCancelled()) {
+            m_isCancelled = true;
             sinceCancel.start();
             m_waiting.clear();
         }
-        if (sinceCancel.isValid() && sinceCancel.hasExpired(kPatience))
+        if (m_isCancelled && sinceCancel.hasExpired(kPatience))
             cancelJobs();
         lookAhead();
         if (m_waiting.empty() && !isBusy())
             break;
-        canStart = startWorkers();
+        startWorkers();
         handOut();
         for (const WorkerEvent &event : m_group.wait(kLook))
             take(event);
+        listener.turn();
+        forgiveWait(sinceTurn.elapsed());
         endOverdue();
         endOversized();
+        canGoOn = hasWorkers();
     }
     m_listener = nullptr;
-    return canStart;
+    return canGoOn;
+}
+
+/// Where this process was held up, by a slow disk for example, what workers said meanwhile was not heard yet.
+void ProbePool::forgiveWait(qint64 turn)
+{
+    if (turn < kLongTurn)
+        return;
+    for (auto &entry : m_workers)
+        entry.second.silent.start();
 }
 
 /// Those at work had their time, and nobody is to blame.
 void ProbePool::cancelJobs()
 {
-    ProbeOutcome cancelled;
-    cancelled.status = ProbeStatus::Cancelled;
     for (auto &[number, worker] : m_workers) {
         if (!worker.job)
             continue;
-        m_listener->jobEnds(*worker.job, number, cancelled);
+        cancelJob(*worker.job, number);
         worker.job.reset();
         worker.isLeaving = true;
         endWorker(number, worker, QStringLiteral("the scan was cancelled"));
@@ -114,18 +137,17 @@ void ProbePool::lookAhead()
 }
 
 /// As many as there are jobs for, ahead of time: a worker that is being replaced costs its start otherwise.
-/// False when the system gives none.
-bool ProbePool::startWorkers()
+void ProbePool::startWorkers()
 {
-    const auto count = [this](bool Worker::*flag) {
-        return static_cast<std::size_t>(std::count_if(
-            m_workers.begin(), m_workers.end(), [flag](const auto &entry) { return entry.second.*flag; }));
+    const auto count = [this](auto &&has) {
+        return static_cast<std::size_t>(std::count_if(m_workers.begin(), m_workers.end(),
+                                                      [&](const auto &entry) { return has(entry.second); }));
     };
-    const auto busy = static_cast<std::size_t>(std::count_if(
-        m_workers.begin(), m_workers.end(), [](const auto &entry) { return entry.second.job.has_value(); }));
+    const std::size_t busy = count([](const Worker &worker) { return worker.job.has_value(); });
     const std::size_t wanted =
         std::min(static_cast<std::size_t>(m_settings.workers), m_waiting.size() + busy);
-    while (m_workers.size() - count(&Worker::isLeaving) < wanted && m_failedStarts < kMaxFailedStarts) {
+    while (count([](const Worker &worker) { return !worker.isLeaving; }) < wanted &&
+           m_failedStarts < kMaxFailedStarts) {
         QString reason;
         const std::optional<int> number = m_group.start(reason);
         if (!number) {
@@ -135,7 +157,15 @@ bool ProbePool::startWorkers()
         }
         m_workers[*number].silent.start();
     }
-    return m_failedStarts < kMaxFailedStarts || isBusy();
+}
+
+/// False when the system gives no worker and none is left.
+bool ProbePool::hasWorkers() const
+{
+    return m_failedStarts < kMaxFailedStarts ||
+           std::any_of(m_workers.begin(), m_workers.end(), [](const auto &entry) {
+               return entry.second.job || (entry.second.isReady && !entry.second.isLeaving);
+           });
 }
 
 void ProbePool::handOut()
@@ -165,6 +195,7 @@ void ProbePool::handOut(int number, Worker &worker, std::size_t index)
     worker.messages = 0;
     worker.child.reset();
     worker.silent.start();
+    worker.sinceJob.start();
     m_listener->jobBegins(job, number);
     ChannelMessage message;
     message.kind = ChannelMessage::Kind::Job;
@@ -199,8 +230,11 @@ void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &me
         m_failedStarts = 0;
         return;
     }
-    if (!worker.job || ++worker.messages > kMaxMessages)
+    if (!worker.job || worker.messages > kMaxMessages)
         return; // a plug-in speaks in its worker's name
+    worker.messages = isBelievable(worker, message) ? worker.messages + 1 : kMaxMessages + 1;
+    if (worker.messages > kMaxMessages)
+        return;
     worker.silent.start();
     const std::size_t job = *worker.job;
     switch (message.kind) {
@@ -218,10 +252,13 @@ void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &me
         worker.child = message.record;
         m_listener->childBegins(job, number, message.record);
         break;
-    case Kind::ChildEnd:
-        m_listener->childEnds(job, number, message.outcome);
+    case Kind::ChildEnd: {
+        ProbeOutcome ended = message.outcome;
+        ended.records.push_back(message.record);
+        m_listener->childEnds(job, number, ended);
         worker.child.reset();
         break;
+    }
     case Kind::ChildCloses:
         worker.child = message.record;
         break;
@@ -242,6 +279,21 @@ void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &me
     case Kind::Children:
         break;
     }
+}
+
+/// What a probe can have said of the job at hand. A plug-in may write anything.
+bool ProbePool::isBelievable(const Worker &worker, const ChannelMessage &message) const
+{
+    using Kind = ChannelMessage::Kind;
+    const bool isOver = message.outcome.status == ProbeStatus::Listed ||
+                        message.outcome.status == ProbeStatus::Failed ||
+                        message.outcome.status == ProbeStatus::NoPlugin;
+    if (message.kind == Kind::Done || message.kind == Kind::ChildEnd)
+        return isOver;
+    const bool hasRecord =
+        message.kind == Kind::Record || message.kind == Kind::Child || message.kind == Kind::ChildCloses;
+    return !hasRecord ||
+           (message.record.path == m_jobs[*worker.job].path && worker.outcome.records.size() < kMaxRecords);
 }
 
 void ProbePool::endWorker(int number, Worker &worker, const QString &reason)
@@ -326,14 +378,30 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
     }
     const std::size_t job = *worker.job;
     const QString reason = describe(worker, end, number);
-    if (worker.probed == 0) {
+    const bool isKilled = end.isKilled && worker.endedFor.isEmpty(); // by whoever needed memory, or a user
+    if (m_isCancelled)
+        cancelJob(job, number);
+    else if (worker.probed != 0 || (isKilled && m_killed.insert(job).second))
+        askAgain(job, reason, worker);
+    else
         giveVerdict(job, number, worker, reason);
-    } else { // somebody who went before may be to blame
-        DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as %ls went before", m_jobs[job].path,
-                 reason, worker.lastProbed);
-        m_waiting.push_front({job, true, true});
-    }
     m_listener->workerEnds(number, reason);
+}
+
+/// Somebody who went before may be to blame.
+void ProbePool::askAgain(std::size_t job, const QString &reason, const Worker &worker)
+{
+    const QString before = worker.lastProbed.isEmpty() ? QStringLiteral("nobody") : worker.lastProbed;
+    DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as %ls went before", m_jobs[job].path, reason,
+             before);
+    m_waiting.push_front({job, true, true});
+}
+
+void ProbePool::cancelJob(std::size_t job, int number)
+{
+    ProbeOutcome cancelled;
+    cancelled.status = ProbeStatus::Cancelled;
+    m_listener->jobEnds(job, number, cancelled);
 }
 
 void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, const QString &reason)
@@ -342,19 +410,25 @@ void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, c
     outcome.status = worker.isOverdue ? ProbeStatus::NoAnswer : ProbeStatus::Crashed;
     outcome.stage = worker.outcome.stage;
     outcome.reason = reason;
+    outcome.milliseconds = static_cast<double>(worker.sinceJob.nsecsElapsed()) / 1e6;
     if (worker.child && m_jobs[job].leftOut.insert(worker.child->subId).second) {
         // One sub-plug-in's crash is not its shell's: the others are asked without it.
         outcome.records.push_back(*worker.child);
+        outcome.records.back().enabled = outcome.records.back().working = false;
+        m_crashedChildren[job].push_back(outcome.records.back());
         m_listener->childEnds(job, number, outcome);
         m_waiting.push_front({job, true, true});
         return;
     }
+    outcome.records = m_crashedChildren[job];
     m_listener->jobEnds(job, number, outcome);
 }
 
 void ProbePool::endOverdue()
 {
     for (auto &[number, worker] : m_workers) {
+        if (!worker.isReady && worker.endedFor.isEmpty() && worker.silent.hasExpired(kStartPatience))
+            endWorker(number, worker, QStringLiteral("it did not begin to work"));
         const bool isOverdue = worker.job && m_settings.limit.count() > 0 && worker.endedFor.isEmpty() &&
                                worker.silent.hasExpired(m_settings.limit.count());
         if (!isOverdue)

@@ -28,6 +28,8 @@ public:
     virtual void jobEnds(std::size_t job, int worker, const ProbeOutcome &outcome) = 0;
     /// A worker has ended, which comes after what became of its job.
     virtual void workerEnds(int worker, const QString &reason) = 0;
+    /// Called now and then.
+    virtual void turn() = 0;
     /// True when no more jobs are to be begun.
     virtual bool isCancelled() = 0;
 };
@@ -60,6 +62,7 @@ private:
         std::optional<std::size_t> job;    ///< the one that it is busy with
         ProbeOutcome outcome;              ///< of that one, as far as it came
         int messages = 0;                  ///< about that one
+        QElapsedTimer sinceJob;            ///< since it was handed out
         std::optional<EffectRecord> child; ///< the sub-plug-in that is asked or closed
         QString lastProbed;                ///< path of the job before
         QElapsedTimer silent;              ///< since it last said something
@@ -77,8 +80,11 @@ private:
 
     bool isBusy() const;
     void cancelJobs();
+    void cancelJob(std::size_t job, int number);
+    void forgiveWait(qint64 turn);
     void lookAhead();
-    bool startWorkers();
+    void startWorkers();
+    bool hasWorkers() const;
     void handOut();
     void handOut(int number, Worker &worker, std::size_t index);
     void take(const WorkerEvent &event);
@@ -90,6 +96,8 @@ private:
     void endWorker(int number, Worker &worker, const QString &reason);
     QString whySpent(int number, const Worker &worker, const ProbeOutcome &outcome) const;
     QString describe(const Worker &worker, const WorkerEnd &end, int number) const;
+    bool isBelievable(const Worker &worker, const ChannelMessage &message) const;
+    void askAgain(std::size_t job, const QString &reason, const Worker &worker);
     void giveVerdict(std::size_t job, int number, const Worker &worker, const QString &reason);
 
     const Settings m_settings;
@@ -97,6 +105,10 @@ private:
     std::map<int, Worker> m_workers;
     std::deque<Waiting> m_waiting;
     std::vector<ProbeJob> m_jobs; ///< with what must be left out by now
+    /// The sub-plug-ins of a job that ended a worker each.
+    std::map<std::size_t, std::vector<EffectRecord>> m_crashedChildren;
+    std::set<std::size_t> m_killed; ///< jobs whose fresh worker was killed from outside
+    bool m_isCancelled = false;
     IPoolListener *m_listener = nullptr;
     int m_failedStarts = 0;
     QElapsedTimer m_sinceMemory; ///< since the workers' memory was looked at

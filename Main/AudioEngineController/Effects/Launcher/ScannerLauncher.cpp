@@ -103,8 +103,8 @@ bool ScannerLauncher::runOnce(const Job &job)
 {
     MarkerWatch watch(job.effectsFolder, qEnvironmentVariable("FXPROBE_REPORT"));
     ScannerProcess scanner;
+    scanner.setEnvironment("FXPROBE_JOBS", std::max(job.jobs, 0)); // whatever this process has
     if (job.jobs > 0) {
-        scanner.setEnvironment("FXPROBE_JOBS", job.jobs);
         scanner.setEnvironment("FXPROBE_PROBE_LIMIT", job.probeLimit);
         scanner.setEnvironment("FXPROBE_MEMORY_LIMIT", job.memoryLimit);
     }

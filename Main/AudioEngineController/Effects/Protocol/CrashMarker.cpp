@@ -188,6 +188,13 @@ void CrashMarker::remove()
     m_path.clear();
 }
 
+void CrashMarker::leave()
+{
+    const std::lock_guard<std::mutex> lock(activeMarkers().mutex);
+    activeMarkers().paths.erase(m_path);
+    m_path.clear();
+}
+
 void CrashMarker::abandonAll(const std::function<void()> &then)
 {
     const std::lock_guard<std::mutex> lock(activeMarkers().mutex);

@@ -36,6 +36,8 @@ public:
     void refresh() const;
     /// Deletes the file now.
     void remove();
+    /// Leaves the file to the next run.
+    void leave();
 
     /// When a plug-in is being probed: deletes the markers of this process, so that nobody is blamed, and
     /// calls `then` while no new marker can appear. Any thread.

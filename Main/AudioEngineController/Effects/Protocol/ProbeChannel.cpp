@@ -141,6 +141,9 @@ void visitMessage(Visitor &fields, Message &message)
         visitRecord(fields, message.record);
         break;
     case Kind::ChildEnd:
+        visitRecord(fields, message.record);
+        visitOutcome(fields, message.outcome);
+        break;
     case Kind::Done:
         visitOutcome(fields, message.outcome);
         break;

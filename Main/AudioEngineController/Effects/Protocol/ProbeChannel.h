@@ -16,7 +16,7 @@ struct ChannelMessage {
         Announced,   ///< worker: a class that is to be announced was dealt with
         Children,    ///< worker: the shell has `number` sub-plug-ins
         Child,       ///< worker: the sub-plug-in `record` is loaded next
-        ChildEnd,    ///< worker: what came of it: `outcome`, and the record follows
+        ChildEnd,    ///< worker: what came of it: `outcome` and `record`
         ChildCloses, ///< worker: the sub-plug-in `record` is closed
         ChildClosed, ///< worker: it has been
         Record,      ///< worker: `record` is listed
