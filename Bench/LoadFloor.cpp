@@ -2,7 +2,7 @@
 // it, and it is unloaded. Nothing is checked, and a plug-in that misbehaves takes the process along.
 
 #include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3HostContext.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostContext.h"
 
 #include <pluginterfaces/base/ipluginbase.h>
 #include <pluginterfaces/vst/ivstcomponent.h>

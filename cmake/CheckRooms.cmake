@@ -9,12 +9,14 @@ set(rows
     "Core/BaseLib/Files"
     "Core/BaseLib/Process"
     "Core/BaseLib/Binary"
-    "Main/ReWire Main/VLib ${effects}/BusFormats ${effects}/Catalogue"
+    "Main/ReWire Main/VLib ${effects}/BusFormats ${effects}/Catalogue ${effects}/VST3/HostObjects"
     "${effects}/Plugin ${effects}/Protocol"
     "${effects}/Host"
     "${effects}/Launcher ${effects}/VST ${effects}/VST3"
     "${effects} Core/BaseLib/WorkstationServices"
     "Scanner Workstation")
+# What lies in the folder of one of these is known there only.
+set(closed_rooms "${effects}/VST3")
 set(height 0)
 foreach(row IN LISTS rows)
     string(REPLACE " " ";" rooms "${row}")
@@ -35,6 +37,16 @@ function(room_of file room height)
     endif()
 endfunction()
 
+# is_open(ROOM TO IS_OPEN): whether a room may be known to another, wherever that lies.
+function(is_open room to is_open)
+    get_filename_component(parent "${room}" DIRECTORY)
+    string(FIND "${to}/" "${parent}/" place)
+    set(${is_open} TRUE PARENT_SCOPE)
+    if(parent IN_LIST closed_rooms AND NOT place EQUAL 0)
+        set(${is_open} FALSE PARENT_SCOPE)
+    endif()
+endfunction()
+
 get_filename_component(root "${CMAKE_CURRENT_LIST_DIR}" DIRECTORY)
 foreach(folder Core Main Scanner Workstation)
     file(GLOB_RECURSE sources RELATIVE "${root}" "${root}/${folder}/*.h" "${root}/${folder}/*.cpp")
@@ -46,6 +58,10 @@ foreach(folder Core Main Scanner Workstation)
             room_of("${header}" other other_height)
             if(NOT own STREQUAL other AND (other_height LESS 0 OR NOT other_height LESS own_height))
                 message(SEND_ERROR "${source} includes ${header}, which does not lie below it")
+            endif()
+            is_open("${other}" "${own}" other_is_open)
+            if(NOT other_is_open)
+                message(SEND_ERROR "${source} includes ${header}, which is for the folder around it only")
             endif()
         endforeach()
     endforeach()

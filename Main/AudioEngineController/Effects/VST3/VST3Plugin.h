@@ -2,8 +2,8 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
-#include "Main/AudioEngineController/Effects/VST3/IVST3EditOwner.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3HostContext.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/IVST3EditOwner.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostContext.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Instance.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Module.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Processor.h"

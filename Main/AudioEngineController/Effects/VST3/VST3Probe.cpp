@@ -1,9 +1,9 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3Probe.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostContext.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3ClassId.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3HostContext.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Module.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Query.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"

@@ -1,8 +1,8 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Plugin/ChannelBuffers.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3NoParameterChanges.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Buses.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3NoParameterChanges.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Speakers.h"
 
 #include <pluginterfaces/base/smartpointer.h>

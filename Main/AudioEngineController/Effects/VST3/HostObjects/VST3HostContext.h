@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST3/VST3HostAttributeList.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostAttributeList.h"
 
 #include <pluginterfaces/vst/ivstcontextmenu.h>
 #include <pluginterfaces/vst/ivsteditcontroller.h>

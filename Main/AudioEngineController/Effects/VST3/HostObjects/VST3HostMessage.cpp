@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/VST3/VST3HostMessage.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostMessage.h"
 
 #include <cstring>
 #include <exception>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST3/VST3HostObject.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostObject.h"
 
 #include <pluginterfaces/vst/ivstparameterchanges.h>
 

@@ -1,7 +1,7 @@
-#include "Main/AudioEngineController/Effects/VST3/VST3HostContext.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostContext.h"
 
-#include "Main/AudioEngineController/Effects/VST3/IVST3EditOwner.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3HostMessage.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/IVST3EditOwner.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostMessage.h"
 
 #include <algorithm>
 #include <iterator>

@@ -1,6 +1,6 @@
-#include "Main/AudioEngineController/Effects/VST3/IVST3EditOwner.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3HostContext.h"
-#include "Main/AudioEngineController/Effects/VST3/VST3HostMessage.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/IVST3EditOwner.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostContext.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostMessage.h"
 
 #include <gtest/gtest.h>
 

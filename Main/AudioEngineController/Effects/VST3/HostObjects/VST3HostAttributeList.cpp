@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/VST3/VST3HostAttributeList.h"
+#include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostAttributeList.h"
 
 #include <algorithm>
 #include <exception>
