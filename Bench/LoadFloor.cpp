@@ -1,7 +1,7 @@
 // The least that a scan of these files can cost: each is loaded, the calls that a scan makes are made into
 // it, and it is unloaded. Nothing is checked, and a plug-in that misbehaves takes the process along.
 
-#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTInterface.h"
 #include "Main/AudioEngineController/Effects/VST3/HostObjects/VST3HostContext.h"
 
 #include <pluginterfaces/base/ipluginbase.h>

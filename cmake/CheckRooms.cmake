@@ -11,12 +11,12 @@ set(rows
     "Core/BaseLib/Binary"
     "Main/ReWire Main/VLib ${effects}/BusFormats ${effects}/Catalogue ${effects}/VST3/HostObjects"
     "${effects}/Plugin ${effects}/Protocol"
-    "${effects}/Host"
+    "${effects}/Host ${effects}/VST/Interface"
     "${effects}/Launcher ${effects}/VST ${effects}/VST3"
     "${effects} Core/BaseLib/WorkstationServices"
     "Scanner Workstation")
 # What lies in the folder of one of these is known there only.
-set(closed_rooms "${effects}/VST3")
+set(closed_rooms "${effects}/VST" "${effects}/VST3")
 set(height 0)
 foreach(row IN LISTS rows)
     string(REPLACE " " ";" rooms "${row}")

@@ -1,6 +1,6 @@
 #include "Tests/Fixtures/FixtureScript.h"
 
-#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTInterface.h"
 
 #include <algorithm>
 #include <atomic>

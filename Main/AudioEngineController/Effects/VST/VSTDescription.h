@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
-#include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTEffect.h"
 
 #include <QString>
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTEffect.h"
 
 #include <atomic>
 

@@ -2,8 +2,8 @@
 
 #include "Core/BaseLib/Binary/PluginLibrary.h"
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Main/AudioEngineController/Effects/VST/VSTProbe.h"
 

@@ -3,9 +3,9 @@
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Log/FormatText.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/VST/IVSTEffectOwner.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/IVSTEffectOwner.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTCallbackNesting.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 
 #include <algorithm>
 

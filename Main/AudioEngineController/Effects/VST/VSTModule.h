@@ -2,7 +2,7 @@
 
 #include "Core/BaseLib/Binary/ModuleFile.h"
 #include "Core/BaseLib/Binary/PluginLibrary.h"
-#include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTEffect.h"
 
 #include <QString>
 

@@ -2,7 +2,7 @@
 
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 #include "Main/VLib/SimpleGUI.h"
 
 #include <algorithm>

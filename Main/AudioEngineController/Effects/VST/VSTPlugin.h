@@ -2,7 +2,7 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
-#include "Main/AudioEngineController/Effects/VST/IVSTEffectOwner.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/IVSTEffectOwner.h"
 #include "Main/AudioEngineController/Effects/VST/VSTEditor.h"
 #include "Main/AudioEngineController/Effects/VST/VSTModule.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPresets.h"

@@ -1,9 +1,9 @@
 #include "Main/AudioEngineController/Effects/VST/VSTProbe.h"
 
-#include "Main/AudioEngineController/Effects/VST/IVSTEffectOwner.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/IVSTEffectOwner.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTDescription.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTModule.h"
 
 #include <algorithm>

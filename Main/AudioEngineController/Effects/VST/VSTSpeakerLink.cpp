@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/VST/VSTSpeakerLink.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 
 #include <algorithm>
 #include <cstdio>

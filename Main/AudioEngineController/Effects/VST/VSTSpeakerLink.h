@@ -1,8 +1,8 @@
 #pragma once
 
 #include "Core/BaseLib/Process/KriticalSection.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTSpeakers.h"
 #include "Main/AudioEngineController/Effects/VST/VSTDescription.h"
-#include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
 
 #include <atomic>
 

@@ -2,7 +2,7 @@
 
 #include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Plugin/AudioPlugin.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/TestApplication.h"
 #include "Tests/Support/TestFolder.h"

@@ -1,7 +1,7 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 #include "Main/AudioEngineController/Effects/VST/VSTPlugin.h"
 #include "Tests/Support/PluginBench.h"
 #include "Tests/Support/VST2Fixture.h"

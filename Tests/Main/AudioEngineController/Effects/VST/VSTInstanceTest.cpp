@@ -1,6 +1,6 @@
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 
-#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTCallbackNesting.h"
 
 #include <functional>
 #include <future>

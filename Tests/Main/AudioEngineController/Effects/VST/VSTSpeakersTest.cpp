@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTSpeakers.h"
 #include "Tests/Main/AudioEngineController/Effects/VST/VSTInstanceBench.h"
 #include "Tests/Support/QtPrinters.h"
 

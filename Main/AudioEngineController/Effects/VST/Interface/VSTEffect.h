@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Plugin/ChannelBuffers.h"
-#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTInterface.h"
 
 #include <QByteArray>
 #include <QRect>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTSpeakers.h"
 
 #include <QScopeGuard>
 

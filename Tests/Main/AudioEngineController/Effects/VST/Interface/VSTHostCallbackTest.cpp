@@ -1,8 +1,8 @@
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostCallback.h"
 
-#include "Main/AudioEngineController/Effects/VST/IVSTEffectOwner.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/IVSTEffectOwner.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTCallbackNesting.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 #include "Tests/Support/CapturedLog.h"
 #include "Tests/Support/QtPrinters.h"
 

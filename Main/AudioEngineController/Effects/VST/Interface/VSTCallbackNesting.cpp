@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTCallbackNesting.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
 

@@ -1,10 +1,10 @@
-#include "Main/AudioEngineController/Effects/VST/VSTHostCallback.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostCallback.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Main/AudioEngineController/Effects/VST/IVSTEffectOwner.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
-#include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
-#include "Main/AudioEngineController/Effects/VST/VSTHostContext.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/IVSTEffectOwner.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTCallbackNesting.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTEffect.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTHostContext.h"
 
 #include <cstring>
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTInterface.h"
 
 #include <QString>
 

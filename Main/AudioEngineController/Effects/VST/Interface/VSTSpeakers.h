@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/BusFormats/BusFormat.h"
-#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTInterface.h"
 
 #include <map>
 #include <string>

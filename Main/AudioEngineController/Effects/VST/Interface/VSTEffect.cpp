@@ -1,9 +1,9 @@
-#include "Main/AudioEngineController/Effects/VST/VSTEffect.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTEffect.h"
 
 #include "Core/BaseLib/Log/Assertion.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/FaultGuard.h"
-#include "Main/AudioEngineController/Effects/VST/VSTCallbackNesting.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTCallbackNesting.h"
 
 #include <algorithm>
 #include <cstring>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Main/AudioEngineController/Effects/VST/VSTInterface.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTInterface.h"
 
 /// The one function through which every VST 2 plug-in talks to the host (the `audioMasterCallback` of the
 /// interface). Any thread. Answers from `VSTHostContext`; checks pointers of the plug-in for null and uses

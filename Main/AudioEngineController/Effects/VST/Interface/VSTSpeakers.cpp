@@ -1,4 +1,4 @@
-#include "Main/AudioEngineController/Effects/VST/VSTSpeakers.h"
+#include "Main/AudioEngineController/Effects/VST/Interface/VSTSpeakers.h"
 
 #include <algorithm>
 #include <cstddef>
