@@ -7,7 +7,7 @@
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
 #include "Main/VLib/ApplicationContext.h"
-#include "Workstation/PluginFolders.h"
+#include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Retry.h"
 #include "Workstation/ScanSession.h"
 #include "Workstation/SummaryOutput.h"

@@ -14,9 +14,10 @@ set(rows
     "${effects}/Host ${effects}/VST/Interface"
     "${effects}/Launcher ${effects}/VST ${effects}/VST3"
     "${effects} Core/BaseLib/WorkstationServices"
+    "Workstation/Options"
     "Scanner Workstation")
 # What lies in the folder of one of these is known there only.
-set(closed_rooms "${effects}/VST" "${effects}/VST3")
+set(closed_rooms "${effects}/VST" "${effects}/VST3" Workstation)
 set(height 0)
 foreach(row IN LISTS rows)
     string(REPLACE " " ";" rooms "${row}")

@@ -1,6 +1,6 @@
-#include "Workstation/OptionTexts.h"
+#include "Workstation/Options/OptionTexts.h"
 
-#include "Workstation/OptionTable.h"
+#include "Workstation/Options/OptionTable.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "Workstation/OptionTexts.h"
+#include "Workstation/Options/OptionTexts.h"
 
 #include <QFile>
 

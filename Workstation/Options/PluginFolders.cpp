@@ -1,4 +1,4 @@
-#include "Workstation/PluginFolders.h"
+#include "Workstation/Options/PluginFolders.h"
 
 #include <QDir>
 #include <QFileInfo>

@@ -1,7 +1,7 @@
-#include "Workstation/ScanOptions.h"
+#include "Workstation/Options/ScanOptions.h"
 
-#include "Workstation/OptionTable.h"
-#include "Workstation/PluginFolders.h"
+#include "Workstation/Options/OptionTable.h"
+#include "Workstation/Options/PluginFolders.h"
 
 #include <QCommandLineParser>
 #include <QDir>

@@ -1,5 +1,5 @@
-#include "Workstation/OptionTable.h"
-#include "Workstation/OptionTexts.h"
+#include "Workstation/Options/OptionTable.h"
+#include "Workstation/Options/OptionTexts.h"
 
 #include <QProcess>
 #include <QStandardPaths>

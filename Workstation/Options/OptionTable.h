@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Workstation/ScanOptions.h"
+#include "Workstation/Options/ScanOptions.h"
 
 #include <QCommandLineOption>
 #include <QList>

@@ -1,4 +1,4 @@
-#include "Workstation/OptionTable.h"
+#include "Workstation/Options/OptionTable.h"
 
 namespace {
 
