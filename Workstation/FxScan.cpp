@@ -8,10 +8,10 @@
 #include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
 #include "Main/VLib/ApplicationContext.h"
 #include "Workstation/Options/PluginFolders.h"
+#include "Workstation/Output/SummaryOutput.h"
+#include "Workstation/Output/Terminal.h"
 #include "Workstation/Retry.h"
 #include "Workstation/ScanSession.h"
-#include "Workstation/SummaryOutput.h"
-#include "Workstation/Terminal.h"
 
 #include <QDeadlineTimer>
 #include <QDir>

@@ -2,7 +2,7 @@
 
 #include "Core/BaseLib/Files/FileFinder.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
-#include "Workstation/CatalogueView.h"
+#include "Workstation/Summary/CatalogueView.h"
 
 #include <QDir>
 #include <QFile>

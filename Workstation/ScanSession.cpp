@@ -5,7 +5,7 @@
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
-#include "Workstation/Terminal.h"
+#include "Workstation/Output/Terminal.h"
 
 #include <QScopeGuard>
 

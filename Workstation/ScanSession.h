@@ -1,8 +1,8 @@
 #pragma once
 
 #include "Workstation/Options/ScanOptions.h"
-#include "Workstation/Progress.h"
-#include "Workstation/ScanAccount.h"
+#include "Workstation/Output/Progress.h"
+#include "Workstation/Summary/ScanAccount.h"
 
 #include <QElapsedTimer>
 

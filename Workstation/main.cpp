@@ -1,6 +1,6 @@
 #include "Core/BaseLib/Process/ProcessSetup.h"
 #include "Workstation/FxScan.h"
-#include "Workstation/Terminal.h"
+#include "Workstation/Output/Terminal.h"
 
 #include <QCoreApplication>
 

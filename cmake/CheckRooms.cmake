@@ -14,7 +14,8 @@ set(rows
     "${effects}/Host ${effects}/VST/Interface"
     "${effects}/Launcher ${effects}/VST ${effects}/VST3"
     "${effects} Core/BaseLib/WorkstationServices"
-    "Workstation/Options"
+    "Workstation/Options Workstation/Summary"
+    "Workstation/Output"
     "Scanner Workstation")
 # What lies in the folder of one of these is known there only.
 set(closed_rooms "${effects}/VST" "${effects}/VST3" Workstation)

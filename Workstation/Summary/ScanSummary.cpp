@@ -1,4 +1,4 @@
-#include "Workstation/ScanSummary.h"
+#include "Workstation/Summary/ScanSummary.h"
 
 #include <algorithm>
 #include <set>

@@ -1,4 +1,4 @@
-#include "Workstation/CatalogueView.h"
+#include "Workstation/Summary/CatalogueView.h"
 
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"

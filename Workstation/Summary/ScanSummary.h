@@ -1,8 +1,8 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
-#include "Workstation/CatalogueView.h"
-#include "Workstation/ScanAccount.h"
+#include "Workstation/Summary/CatalogueView.h"
+#include "Workstation/Summary/ScanAccount.h"
 
 /// A plug-in, or a file that was taken for one, that cannot be used.
 struct PluginFailure {

@@ -1,5 +1,5 @@
-#include "Workstation/Terminal.h"
-#include "Workstation/TerminalStream.h"
+#include "Workstation/Output/Terminal.h"
+#include "Workstation/Output/TerminalStream.h"
 
 #include <fcntl.h>
 #include <sys/ioctl.h>

@@ -1,6 +1,6 @@
-#include "Workstation/Terminal.h"
+#include "Workstation/Output/Terminal.h"
 
-#include "Workstation/TerminalStream.h"
+#include "Workstation/Output/TerminalStream.h"
 
 #include <QStringList>
 #include <QVector>

@@ -1,5 +1,5 @@
-#include "Workstation/SummaryOutput.h"
-#include "Workstation/Terminal.h"
+#include "Workstation/Output/SummaryOutput.h"
+#include "Workstation/Output/Terminal.h"
 
 #include <gtest/gtest.h>
 

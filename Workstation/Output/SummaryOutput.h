@@ -1,7 +1,10 @@
 #pragma once
 
-#include "Workstation/Options/ScanOptions.h"
-#include "Workstation/ScanSummary.h"
+#include "Workstation/Summary/ScanSummary.h"
+
+#include <QByteArray>
+#include <QString>
+#include <QStringList>
 
 /// The summary as text for people.
 QString renderTable(const ScanSummary &summary);

@@ -1,4 +1,4 @@
-#include "Workstation/SummaryOutput.h"
+#include "Workstation/Output/SummaryOutput.h"
 
 #include <QJsonArray>
 #include <QJsonDocument>

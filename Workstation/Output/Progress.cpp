@@ -1,8 +1,8 @@
-#include "Workstation/Progress.h"
+#include "Workstation/Output/Progress.h"
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
-#include "Workstation/ScanAccount.h"
-#include "Workstation/Terminal.h"
+#include "Workstation/Output/Terminal.h"
+#include "Workstation/Summary/ScanAccount.h"
 
 namespace {
 

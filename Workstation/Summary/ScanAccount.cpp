@@ -1,4 +1,4 @@
-#include "Workstation/ScanAccount.h"
+#include "Workstation/Summary/ScanAccount.h"
 
 #include <algorithm>
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "Workstation/ScanAccount.h"
+#include "Workstation/Summary/ScanAccount.h"
 
 #include <QElapsedTimer>
 #include <QString>
