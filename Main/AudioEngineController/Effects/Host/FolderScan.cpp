@@ -10,7 +10,6 @@
 
 #include <algorithm>
 #include <exception>
-#include <map>
 
 namespace {
 
@@ -32,7 +31,7 @@ FolderScan::FolderScan(CatalogueHost &host)
     : m_host(host)
     , m_finder(host.fileFinder() ? host.fileFinder()
                                  : std::make_shared<FileFinder>(QStringList(host.info().moduleEnding)))
-    , m_memory(host.catalogueFolder())
+    , m_memory(host)
 {}
 
 FolderScan::~FolderScan() = default;
@@ -65,9 +64,9 @@ void FolderScan::scan()
     }
     for (const QString &path : modules)
         m_found.insert(pathKey(path));
-    m_plan = std::make_unique<ScanPlan>(m_host, m_memory, m_host.folders(), m_finder->unread());
+    m_plan = std::make_unique<ScanPlan>(m_host, m_memory.probes(), m_host.folders(), m_finder->unread());
     m_plan->decide(modules);
-    rememberCrashes();
+    m_memory.addCrashes();
     ProbeReport::instance().plan(m_host.format(), static_cast<std::size_t>(modules.size()),
                                  m_plan->items().size());
     addKept();
@@ -166,7 +165,7 @@ void FolderScan::beginItem(const ScanItem &item)
     m_file = EffectRecord();
     m_file.path = item.path;
     m_file.fileTime = item.fileTime;
-    m_remembered = RememberedProbe();
+    m_memory.begin();
     m_isTouched = false;
     m_childrenDone = 0;
 }
@@ -177,12 +176,12 @@ void FolderScan::probe(const ScanItem &item)
         m_runner = std::make_unique<ProbeRunner>(m_host);
     beginItem(item);
     const ProbeOutcome outcome = readable(item, m_runner->run(jobOf(item), *this));
-    remember(outcome);
+    m_memory.end(m_file, outcome, m_isTouched);
     const bool added = keepOutcome(item, outcome);
     log(item, outcome, 0);
     if (added)
         writeInterim();
-    writeMemory(false);
+    m_memory.write(false);
     m_host.clearSuspect(item.path);
     if (m_childrenDone != 0)
         showItemProgress();
@@ -214,7 +213,7 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
     for (EffectRecord &record : records.kept)
         addLater(std::move(record));
     m_likelyMarks.insert(m_likelyMarks.end(), records.likelyMarks.begin(), records.likelyMarks.end());
-    m_memory.set(m_remembered);
+    m_memory.keep();
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
     return added;
@@ -270,67 +269,11 @@ bool FolderScan::add(const EffectRecord &record)
     const bool isAdded = m_host.AddEffect(record);
     if (!holder || isSamePath(holder->path, record.path))
         return isAdded;
-    const auto setHolder = [&](RememberedProbe &probe, const QString &path) {
-        for (RememberedPlugin &plugin : probe.plugins)
-            if (plugin.id == record.id)
-                plugin.heldBy = path;
-    };
-    if (!isAdded) {
-        setHolder(m_remembered, holder->path);
-    } else if (const RememberedProbe *loser = m_memory.find(m_host.format(), holder->path)) {
-        RememberedProbe changed = *loser; // an older version, which this one replaces
-        setHolder(changed, record.path);
-        m_memory.set(changed);
-    }
+    if (isAdded) // the holder has an older version, which this one replaces
+        m_memory.setHolder(holder->path, record.id, record.path);
+    else
+        m_memory.setHolder(record.id, holder->path);
     return isAdded;
-}
-
-/// What a crash marker said that this run absorbed. The launcher, which saw the end, knows more.
-void FolderScan::rememberCrashes()
-{
-    for (const EffectRecord &marker : m_host.absorbed()) {
-        const RememberedProbe *last = m_memory.find(m_host.format(), marker.path);
-        const bool isKnown =
-            last && last->fileTime == marker.fileTime &&
-            (marker.subId == 0 ? last->status == ProbeStatus::Crashed || last->status == ProbeStatus::NoAnswer
-                               : last->reasonOf(marker.subId) != last->reason);
-        if (!isKnown)
-            m_memory.setCrash(m_host.format(), marker, ProbeStatus::Crashed,
-                              QStringLiteral("it ended the scanner"));
-    }
-}
-
-void FolderScan::remember(const ProbeOutcome &outcome)
-{
-    std::map<quint32, QString> reasons;
-    for (const RememberedPlugin &child : m_remembered.plugins)
-        reasons[child.subId] = child.reason;
-    m_remembered.format = m_host.format();
-    m_remembered.path = m_file.path;
-    m_remembered.fileTime = m_file.fileTime;
-    m_remembered.status = outcome.status;
-    m_remembered.stage = outcome.stage;
-    m_remembered.reason = outcome.reason;
-    m_remembered.milliseconds = m_isTouched ? outcome.milliseconds : 0; // looked at again at each scan
-    m_remembered.plugins.clear();
-    for (const EffectRecord &record : outcome.records)
-        m_remembered.plugins.push_back(
-            {record.id, record.subId, reasons[record.subId], record.inputs, record.outputs, QString()});
-}
-
-/// Failures soon, the rest now and then: what is lost with a process costs time only.
-void FolderScan::writeMemory(bool isLast)
-{
-    constexpr qint64 kPause = 100; // ms
-    constexpr qint64 kShare = 20;  // of the time goes into writing at most a twentieth
-    const qint64 pause = m_remembered.reason.isEmpty() ? std::max(kPause, m_memoryPause) : m_memoryPause;
-    if (!isLast && m_sinceMemory.isValid() && !m_sinceMemory.hasExpired(pause))
-        return;
-    m_sinceMemory.start();
-    if (const FileResult written = m_memory.write(); !written)
-        DebugLog(L"Cannot write %ls: %ls", QString::fromLatin1(kProbeMemoryFile + 1), written.reason);
-    m_memoryPause = kShare * m_sinceMemory.elapsed();
-    m_sinceMemory.start();
 }
 
 /// A file that lists the same plug-in goes before one that does not list it any more.
@@ -381,7 +324,7 @@ void FolderScan::finish(bool isWhole)
         collectWaiting(m_done);
     }
     m_written |= m_host.writeIfChanged(m_waiting);
-    writeMemory(true);
+    m_memory.write(true);
 }
 
 void FolderScan::forgetGone()
@@ -391,7 +334,7 @@ void FolderScan::forgetGone()
     QSet<QString> there = m_found;
     for (const EffectRecord *record : m_plan->away())
         there.insert(pathKey(record->path));
-    m_memory.keepOnly(m_host.format(), [&](const QString &path) { return there.contains(pathKey(path)); });
+    m_memory.keepOnly(there);
 }
 
 void FolderScan::stageEntered(ProbeStage stage)
@@ -427,7 +370,7 @@ void FolderScan::childEnds(const ProbeOutcome &outcome)
     if (!outcome.reason.isEmpty())
         DebugLog(L"%ls, %ls: %ls", m_child.path, m_child.subName, outcome.reason);
     ProbeReport::instance().end(m_host.format(), m_child, outcome);
-    m_remembered.plugins.push_back({QString(), m_child.subId, outcome.reason, -1, -1, QString()});
+    m_memory.childEnded(m_child.subId, outcome.reason);
     ++m_childrenDone;
     if (m_progress)
         m_progress->setValue(static_cast<int>(m_childrenDone));

@@ -2,9 +2,9 @@
 
 #include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
 #include "Main/AudioEngineController/Effects/Host/ProbeRunner.h"
+#include "Main/AudioEngineController/Effects/Host/ScanMemory.h"
 #include "Main/AudioEngineController/Effects/Host/ScanPlan.h"
 
-#include <QElapsedTimer>
 #include <QSet>
 
 #include <memory>
@@ -43,9 +43,6 @@ private:
     bool addListed(const std::vector<EffectRecord> &records);
     bool add(const EffectRecord &record);
     void addLater(EffectRecord record);
-    void rememberCrashes();
-    void remember(const ProbeOutcome &outcome);
-    void writeMemory(bool isLast);
     void forgetGone();
 
     /// Has interim writes carry what is known of the items from one on.
@@ -71,10 +68,8 @@ private:
     std::unique_ptr<ScanPlan> m_plan;
     std::unique_ptr<ProbeRunner> m_runner; ///< made for the first item: most scans find nothing new
     std::shared_ptr<VProgressDisplay> m_progress;
-    ProbeMemory m_memory;
-    QElapsedTimer m_sinceMemory; ///< since it was written
-    qint64 m_memoryPause = 0;    ///< ms until it may be written again
-    QSet<QString> m_found;       ///< the modules, by `pathKey`
+    ScanMemory m_memory;
+    QSet<QString> m_found; ///< the modules, by `pathKey`
     WaitingRecords m_waiting;
     bool m_hasCollected = false;       ///< what waits, for the first interim write
     std::size_t m_done = 0;            ///< items
@@ -83,7 +78,6 @@ private:
     std::vector<std::pair<QString, const EffectRecord *>> m_likelyMarks;
     bool m_written = false;
 
-    RememberedProbe m_remembered;   ///< of the item at hand
     EffectRecord m_file;            ///< of the item at hand: path and time
     EffectRecord m_child;           ///< the sub-plug-in at hand
     bool m_isTouched = false;       ///< the item at hand has entered its first stage

@@ -6,7 +6,10 @@
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
+#include <QElapsedTimer>
+
 #include <algorithm>
+#include <map>
 
 // A scan whose plug-ins are asked by workers, several at once. What is kept is decided in the order of the
 // items, whatever the order in which they end.
@@ -250,8 +253,8 @@ void FolderScan::PooledScan::keepInOrder()
         m_scan.beginItem(item);
         m_scan.m_isTouched = state.isTouched;
         for (const auto &[subId, reason] : state.childReasons)
-            m_scan.m_remembered.plugins.push_back({QString(), subId, reason, -1, -1, QString()});
-        m_scan.remember(*state.outcome);
+            m_scan.m_memory.childEnded(subId, reason);
+        m_scan.m_memory.end(m_scan.m_file, *state.outcome, m_scan.m_isTouched);
         m_scan.keepOutcome(item, *state.outcome);
         state.outcome.reset();
         state.pending.clear();
@@ -266,7 +269,7 @@ bool FolderScan::PooledScan::writeInterim(bool isUrgent)
     if (m_owesWrite)
         return true;
     const bool isWritten = m_scan.writeInterim();
-    m_scan.writeMemory(isUrgent);
+    m_scan.m_memory.write(isUrgent);
     m_sinceWrite.start();
     return isWritten;
 }

@@ -1,0 +1,48 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
+
+#include <QElapsedTimer>
+#include <QSet>
+
+/// What one scan of a format's folders puts into the memory of probes, item by item, and when that is
+/// written. Used on the scan worker.
+class ScanMemory {
+public:
+    /// The host must outlive it.
+    explicit ScanMemory(const CatalogueHost &host);
+
+    /// All that is remembered.
+    const ProbeMemory &probes() const { return m_probes; }
+
+    /// Remembers what the crash markers said that this run absorbed. The launcher, which saw the end, knows
+    /// more.
+    void addCrashes();
+    /// Forgets the files of this format that are not among these, by `pathKey`.
+    void keepOnly(const QSet<QString> &files);
+
+    /// Begins an item, of which nothing is known yet.
+    void begin() { m_item = RememberedProbe(); }
+    /// What came of a sub-plug-in of the item.
+    void childEnded(quint32 subId, const QString &reason);
+    /// What came of the item. Its time counts only when it was asked: what was only looked at is looked at
+    /// again at each scan.
+    void end(const EffectRecord &file, const ProbeOutcome &outcome, bool isAsked);
+    /// Another file than the item holds an identifier that it lists.
+    void setHolder(const QString &id, const QString &holder);
+    /// The same of an identifier that a file listed which was probed before.
+    void setHolder(const QString &file, const QString &id, const QString &holder);
+    /// Remembers the item.
+    void keep() { m_probes.set(m_item); }
+
+    /// Writes the file, failures soon, the rest now and then: what is lost with a process costs time only.
+    void write(bool isLast);
+
+private:
+    const CatalogueHost &m_host;
+    ProbeMemory m_probes;
+    RememberedProbe m_item;     ///< at hand
+    QElapsedTimer m_sinceWrite; ///< invalid before the first
+    qint64 m_pause = 0;         ///< ms until it may be written again
+};
