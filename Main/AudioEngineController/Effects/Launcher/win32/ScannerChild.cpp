@@ -1,6 +1,7 @@
 #include "Main/AudioEngineController/Effects/Launcher/ScannerChild.h"
 
 #include "Core/BaseLib/Log/FormatText.h"
+#include "Core/BaseLib/Process/FaultGuard.h"
 
 #include <qt_windows.h>
 
@@ -15,8 +16,7 @@ void ScannerChild::setupChildProcess() {}
 QString ScannerChild::crashText(int code)
 {
     const auto status = static_cast<quint32>(code);
-    const char *const text = status == EXCEPTION_ACCESS_VIOLATION ? " (access violation)"
-                             : status == EXCEPTION_STACK_OVERFLOW ? " (stack overflow)"
-                                                                  : "";
-    return formatText(L"unhandled fault 0x%08X%s", status, text);
+    const QString number = formatText(L"unhandled fault 0x%08X", status);
+    const QString name = FaultCode::name(status);
+    return name.isEmpty() ? number : QStringLiteral("%1 (%2)").arg(number, name);
 }
