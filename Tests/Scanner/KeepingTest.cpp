@@ -40,6 +40,17 @@ scan
 vst3 Name Favourite CategoryMask Enabled Working: A|1|0|1|1, B|0|4|1|1, C|0|0|0|1
 vst2 Name Favourite Enabled Working: D|1|1|1, E|0|1|1
 
+= A shell that crashed as a whole is asked for each child where it moved
+put a/Shell.vst2: child 1 D | child 2 E
+write Plugins/a/other: x
+scan
+new a/Shell.vst2: child 1 D | child 2 E | fault get-plug-category kill
+scan 2
+remove Plugins/a/Shell.vst2
+new b/Shell.vst2: child 1 D | child 2 E
+scan
+vst2 Name Enabled Working: D|1|1, E|1|1
+
 = What an earlier version left usable beside a crash is disabled
 put Multi.vst3: class A | #1 | class B | #2 | fault module-entry kill
 write Effects/VST3Configuration.xml: <Effects version="1.1"><Effect><Path>@/Plugins/Multi.vst3</Path><FileTime>2021-03-04 05:06</FileTime><Name>A</Name><ID>Multi</ID><Enabled>0</Enabled><Working>0</Working></Effect><Effect><Path>@/Plugins/Multi.vst3</Path><FileTime>2021-03-04 05:06</FileTime><Name>B</Name><ID>2</ID></Effect></Effects>

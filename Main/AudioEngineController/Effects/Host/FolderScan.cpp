@@ -153,10 +153,8 @@ ProbeJob FolderScan::jobOf(const ScanItem &item) const
     job.path = item.path;
     job.fileTime = item.fileTime;
     job.announceClasses = item.known.empty() && item.moved.empty();
-    for (const KnownList::Records *records : {&item.known, &item.moved})
-        for (const EffectRecord *old : *records)
-            if (isDeadly(*old, item.fileTime))
-                job.leftOut.insert(old->subId);
+    for (const EffectRecord *old : m_plan->deadly(item))
+        job.leftOut.insert(old->subId);
     return job;
 }
 

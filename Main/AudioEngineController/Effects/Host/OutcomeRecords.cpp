@@ -27,6 +27,7 @@ public:
         : m_host(host)
         , m_plan(plan)
         , m_item(item)
+        , m_deadly(plan.deadly(item))
     {}
 
     void addListed(const std::vector<EffectRecord> &listed)
@@ -53,15 +54,15 @@ private:
     const CatalogueHost &m_host;
     const ScanPlan &m_plan;
     const ScanItem &m_item;
+    const KnownList::Records m_deadly;
 };
 
 /// What is known of a sub-plug-in that must not be loaded; null when it may be.
 const EffectRecord *Maker::deadlyRecord(const EffectRecord &child) const
 {
-    for (const KnownList::Records *records : {&m_item.known, &m_item.moved})
-        for (const EffectRecord *old : *records)
-            if (old->subId == child.subId && isDeadly(*old, m_item.fileTime))
-                return old;
+    for (const EffectRecord *old : m_deadly)
+        if (old->subId == child.subId)
+            return old;
     return nullptr;
 }
 
@@ -146,8 +147,10 @@ void Maker::addFailed(const QString &fileTime)
     m_host.completeFailedRecord(failed);
     for (const KnownList::Records &records : {m_item.known, m_item.moved})
         for (const EffectRecord *old : records)
-            if (!m_host.known().isSameOfFile(*old, failed) && !old->standsForFile())
+            if (!m_host.known().isSameOfFile(*old, failed) && !old->standsForFile()) {
                 made.kept.push_back(keptBesideFailure(*old, failed));
+                made.kept.back().enabled |= records.front()->isCrashedFile() && !old->isSwitchedOff();
+            }
 }
 
 /// As a crash marker has it that the next run finds; so has what moved here, with its marks.
@@ -196,11 +199,6 @@ void Maker::keepUnchanged()
 }
 
 } // namespace
-
-bool isDeadly(const EffectRecord &old, const QString &fileTime)
-{
-    return old.subId != 0 && !old.enabled && !old.working && old.fileTime == fileTime;
-}
 
 OutcomeRecords recordsOfOutcome(const CatalogueHost &host, const ScanPlan &plan, const ScanItem &item,
                                 const ProbeOutcome &outcome)

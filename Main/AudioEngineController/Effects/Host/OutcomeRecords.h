@@ -13,10 +13,6 @@ struct OutcomeRecords {
     std::vector<std::pair<QString, const EffectRecord *>> likelyMarks;
 };
 
-/// Whether a known sub-plug-in ended the process that probed it, in the version of the file that is there: it
-/// must not be loaded.
-bool isDeadly(const EffectRecord &old, const QString &fileTime);
-
 /// The records of an item of the plan when its probe came to this. Changes nothing; the order in which
 /// outcomes are kept decides which of two records gets an identifier.
 OutcomeRecords recordsOfOutcome(const CatalogueHost &host, const ScanPlan &plan, const ScanItem &item,

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <functional>
+#include <iterator>
 
 namespace {
 
@@ -267,6 +268,19 @@ void ScanPlan::askCopiesOfUnsettled()
             copies.append(last.path);
     });
     askAgain(copies);
+}
+
+KnownList::Records ScanPlan::deadly(const ScanItem &item) const
+{
+    KnownList::Records deadly;
+    for (const KnownList::Records &records : {item.known, item.moved})
+        if (!records.empty() && !records.front()->isCrashedFile())
+            std::copy_if(records.begin(), records.end(), std::back_inserter(deadly),
+                         [&](const EffectRecord *old) {
+                             return old->subId != 0 && !old->enabled && !old->working &&
+                                    old->fileTime == item.fileTime;
+                         });
+    return deadly;
 }
 
 const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRecord &probed,

@@ -44,6 +44,11 @@ public:
     /// Records of files that are away. One whose identifier a probed file lists gives way to it.
     const KnownList::Records &away() const { return m_away; }
 
+    /// The sub-plug-ins of an item that are known to have ended the process that probed them, in the version
+    /// of the file that is there: they must not be loaded. None where a file ended it as a whole and moved
+    /// since: what was disabled beside it did nothing.
+    KnownList::Records deadly(const ScanItem &item) const;
+
     /// Whether files are gone that were known.
     bool hasGone() const { return !m_gone.empty(); }
 
