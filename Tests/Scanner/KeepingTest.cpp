@@ -51,6 +51,15 @@ new b/Shell.vst2: child 1 D | child 2 E
 scan
 vst2 Name Enabled Working: D|1|1, E|1|1
 
+= A child that killed is not loaded where its file moved and another child kills
+put a/Shell.vst2: child 1 D | child 2 E | fault entry kill D
+write Plugins/a/other: x
+scan 2
+remove Plugins/a/Shell.vst2
+put b/Shell.vst2: child 1 D | child 2 E | fault entry kill E
+scan 2
+vst2 Name Enabled Working: D|0|0, E|0|0
+
 = What an earlier version left usable beside a crash is disabled
 put Multi.vst3: class A | #1 | class B | #2 | fault module-entry kill
 write Effects/VST3Configuration.xml: <Effects version="1.1"><Effect><Path>@/Plugins/Multi.vst3</Path><FileTime>2021-03-04 05:06</FileTime><Name>A</Name><ID>Multi</ID><Enabled>0</Enabled><Working>0</Working></Effect><Effect><Path>@/Plugins/Multi.vst3</Path><FileTime>2021-03-04 05:06</FileTime><Name>B</Name><ID>2</ID></Effect></Effects>

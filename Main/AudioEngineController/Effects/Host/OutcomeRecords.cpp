@@ -45,6 +45,7 @@ public:
 private:
     void add(EffectRecord record, bool isOnly);
     void addDeadly(const EffectRecord &child, EffectRecord deadly, bool isOnly);
+    void keepBeside(const EffectRecord &kept);
     const EffectRecord *deadlyRecord(const EffectRecord &child) const;
     EffectRecord crashedChild(const EffectRecord &child) const;
     KnownList knownOfFile() const;
@@ -148,9 +149,25 @@ void Maker::addFailed(const QString &fileTime)
     for (const KnownList::Records &records : {m_item.known, m_item.moved})
         for (const EffectRecord *old : records)
             if (!m_host.known().isSameOfFile(*old, failed) && !old->standsForFile()) {
-                made.kept.push_back(keptBesideFailure(*old, failed));
-                made.kept.back().enabled |= records.front()->isCrashedFile() && !old->isSwitchedOff();
+                EffectRecord kept = keptBesideFailure(*old, failed);
+                kept.enabled |= records.front()->isCrashedFile() && !old->isSwitchedOff();
+                keepBeside(kept);
             }
+}
+
+/// Keeps a record beside that of the file. Where the file has one of the same plug-in already, from before
+/// what was known of it moved here, only the marks.
+void Maker::keepBeside(const EffectRecord &kept)
+{
+    for (std::vector<EffectRecord> *records : {&made.listed, &made.kept})
+        for (EffectRecord &present : *records)
+            if (m_host.known().isSameOfFile(present, kept)) {
+                if (kept.category != 0)
+                    present.category = kept.category;
+                present.favourite |= kept.favourite;
+                return;
+            }
+    made.kept.push_back(kept);
 }
 
 /// As a crash marker has it that the next run finds; so has what moved here, with its marks.
@@ -169,16 +186,13 @@ void Maker::addCrashed(const std::vector<EffectRecord> &children)
     const KnownList::Records records = known.recordsOfPath(m_item.path);
     for (const EffectRecord *record : records)
         (record == records.front() || record->working ? made.listed : made.kept).push_back(*record);
-    EffectRecord &crashed = made.listed.front();
+    const EffectRecord crashed = made.listed.front();
     for (const EffectRecord *old : m_item.moved) {
-        const bool isFile = m_host.known().isSameOfFile(*old, crashed);
-        if (isFile) {
-            crashed.category = old->category;
-            crashed.favourite = old->favourite;
-        } else if (!old->standsForFile()) {
-            made.kept.push_back(keptBesideFailure(*old, crashed));
-            made.kept.back().enabled = false;
-        }
+        if (old->standsForFile() && !m_host.known().isSameOfFile(*old, crashed))
+            continue;
+        EffectRecord kept = keptBesideFailure(*old, crashed);
+        kept.enabled = false;
+        keepBeside(kept);
     }
 }
 

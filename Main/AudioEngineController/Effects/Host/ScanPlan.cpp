@@ -35,6 +35,15 @@ int commonEnd(const QString &left, const QString &right)
     return common;
 }
 
+/// True for a file of which nothing is known, or only that sub-plug-ins crashed: a marker may have come
+/// before the records of the file that moved there.
+bool isHardlyKnown(const KnownList::Records &records)
+{
+    return std::all_of(records.begin(), records.end(), [](const EffectRecord *record) {
+        return record->subId != 0 && !record->enabled && !record->working;
+    });
+}
+
 const EffectRecord *findIn(const KnownList::Records &records,
                            const std::function<bool(const EffectRecord &)> &matches)
 {
@@ -152,7 +161,7 @@ void ScanPlan::settleAllGone(const QStringList &modules)
         namesakes[pathKey(fileNameOf(path))].append(path);
     QMultiHash<QString, std::size_t> unknown;
     for (std::size_t index = 0; index < m_items.size(); ++index)
-        if (m_items[index].known.empty())
+        if (isHardlyKnown(m_items[index].known))
             unknown.insert(pathKey(fileNameOf(m_items[index].path)), index);
     for (const KnownFile &gone : m_gone) {
         const QString name = pathKey(fileNameOf(gone.path));
@@ -160,8 +169,8 @@ void ScanPlan::settleAllGone(const QStringList &modules)
     }
 }
 
-/// Gives the records of a gone file to one that may be the same: to one of its name of which nothing is
-/// known, by the place of its item. Else those that are known are asked again, and what none of them lists
+/// Gives the records of a gone file to one that may be the same: to one of its name of which hardly anything
+/// is known, by the place of its item. Else those that are known are asked again, and what none of them lists
 /// goes to one that crashed.
 void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes)
 {
