@@ -301,13 +301,22 @@ bool FolderScan::writeInterim()
     return isWritten;
 }
 
+/// Whether a file that a cancelled scan did not reach may be the one in which the plug-in was.
+bool FolderScan::mayYetBeListed(const EffectRecord &old) const
+{
+    const auto first = m_plan->items().begin() + static_cast<std::ptrdiff_t>(m_done);
+    return std::any_of(first, m_plan->items().end(), [&](const ScanItem &item) {
+        return isSamePath(fileNameOf(item.path), fileNameOf(old.path));
+    });
+}
+
 void FolderScan::finish(bool isWhole)
 {
     m_waiting.clear();
     for (const EffectRecord &record : m_later)
         m_host.AddEffect(record);
     for (const auto &[id, old] : m_likelyMarks)
-        if (!m_host.isListed(old->id))
+        if (!m_host.isListed(old->id) && !mayYetBeListed(*old))
             m_host.passMarks(*old, id);
     if (isWhole) {
         for (const EffectRecord &record : m_plan->keptMoved())

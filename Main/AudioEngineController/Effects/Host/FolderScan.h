@@ -36,6 +36,7 @@ private:
     /// An outcome as lists and people take it.
     static ProbeOutcome readable(const ScanItem &item, ProbeOutcome outcome);
     ProbeJob jobOf(const ScanItem &item) const;
+    bool mayYetBeListed(const EffectRecord &old) const;
     void finish(bool isWhole);
 
     bool keepOutcome(const ScanItem &item, const ProbeOutcome &outcome);
