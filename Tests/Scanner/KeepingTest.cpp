@@ -81,6 +81,39 @@ vst2 Name Vendor Favourite: Top <br/> Boost &amp; &lt;|Jo <jo x.org> & Co|1, C|F
 vst3 Name Vendor Favourite: A &amp; B|V|1, C|Fixture Works|0
 same
 
+= A link whose drive is away keeps its plug-in
+put Comp.vst3:
+write drive/here: x
+move Plugins/Comp.vst3 drive/Comp.vst3
+link Plugins/Comp.vst3 drive/Comp.vst3
+scan
+mark Comp Favourite 1
+move drive away
+scan
+move away drive
+scan
+vst3 Name Favourite Working: Comp|1|1
+
+= An old killer gets nothing of a namesake that is uninstalled
+put a/C.vst3: class C | fault module-entry kill
+scan 2
+put b/C.vst3: class X | #1
+write Plugins/b/other: x
+scan
+mark X Favourite 1
+remove Plugins/b/C.vst3
+scan
+vst3 Name Favourite Enabled: C|0|0
+
+= A copy that goes on with what a failed update lists no more has its marks
+put a/M.vst3: class P | #1
+scan
+mark P Favourite 1
+new a/M.vst3: class P | answer module-entry false
+put b/N.vst3: class P | #1
+scan
+vst3 Name Path Favourite: M|a/M.vst3|0, P|b/N.vst3|1
+
 = A torn scan list costs nothing
 put Comp.vst3:
 scan

@@ -45,11 +45,13 @@ QString badText(const EffectRecord &record)
     return QString();
 }
 
-/// Whether a file is not there because its folder is not, or is empty.
+/// Whether a file is not there because its folder is not, or is empty, or because what it is a link to is
+/// not.
 bool isAway(const QString &path)
 {
     const QFileInfo file(path);
-    return !file.exists() && (!file.dir().exists() || file.dir().isEmpty());
+    return !file.exists() && (!file.dir().exists() || file.dir().isEmpty() || leadsNowhere(path) ||
+                              leadsNowhere(bundleOf(path)));
 }
 
 void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder, CatalogueView &view)

@@ -55,6 +55,8 @@ void syncToDisk(int fileDescriptor);
 std::optional<QString> realPath(const QString &path);
 /// True when the system does not let us see whether the file exists, or what kind it is.
 bool cannotBeExamined(const QString &path);
+/// True for a link to something that is not there, on a drive that is unplugged for example.
+bool leadsNowhere(const QString &path);
 /// Whether the system reads the name as a device, in any folder and with any ending.
 bool isDeviceName(const QString &name);
 /// A time in the local time zone.

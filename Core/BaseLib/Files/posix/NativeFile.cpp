@@ -1,6 +1,7 @@
 #include "Core/BaseLib/Files/NativeFile.h"
 
 #include <QFile>
+#include <QFileInfo>
 
 #include <algorithm>
 #include <cerrno>
@@ -41,6 +42,12 @@ bool cannotBeExamined(const QString &path)
 {
     struct stat status = {};
     return stat(QFile::encodeName(path).constData(), &status) != 0 && errno != ENOENT && errno != ENOTDIR;
+}
+
+bool leadsNowhere(const QString &path)
+{
+    const QFileInfo file(path);
+    return file.isSymLink() && !file.exists();
 }
 
 bool isDeviceName(const QString &) { return false; } // devices are files

@@ -109,6 +109,12 @@ bool cannotBeExamined(const QString &path)
     return GetFileAttributesW(nativePath(path).c_str()) == INVALID_FILE_ATTRIBUTES && !isGone(GetLastError());
 }
 
+bool leadsNowhere(const QString &path)
+{
+    const QFileInfo file(path);
+    return file.isSymLink() && !file.exists();
+}
+
 bool isDeviceName(const QString &name)
 {
     static const QRegularExpression devices(QStringLiteral("^(con|prn|aux|nul|com[0-9]|lpt[0-9]) *(\\.|$)"),

@@ -314,7 +314,8 @@ void FolderScan::finish(bool isWhole)
 {
     m_waiting.clear();
     for (const EffectRecord &record : m_later)
-        m_host.AddEffect(record);
+        if (!m_host.AddEffect(record))
+            passMarksToHolder(record);
     for (const auto &[id, old] : m_likelyMarks)
         if (!m_host.isListed(old->id) && !mayYetBeListed(*old))
             m_host.passMarks(*old, id);
@@ -332,6 +333,18 @@ void FolderScan::finish(bool isWhole)
     }
     m_written |= m_host.writeIfChanged(m_waiting);
     m_memory.write(true);
+}
+
+/// A file that came to list what another one lists no more has that one's marks, unless it had its own.
+void FolderScan::passMarksToHolder(const EffectRecord &record)
+{
+    const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
+    if (!holder || !holder->working || isSamePath(holder->path, record.path))
+        return;
+    const KnownList::Records known = m_host.known().recordsOfPath(holder->path);
+    if (std::none_of(known.begin(), known.end(),
+                     [&](const EffectRecord *old) { return old->id == record.id; }))
+        m_host.passMarks(record, record.id);
 }
 
 void FolderScan::forgetGone()

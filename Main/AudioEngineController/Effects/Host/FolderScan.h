@@ -44,6 +44,7 @@ private:
     bool addListed(const std::vector<EffectRecord> &records);
     bool add(const EffectRecord &record);
     void addLater(EffectRecord record);
+    void passMarksToHolder(const EffectRecord &record);
     void forgetGone();
 
     /// Has interim writes carry what is known of the items from one on.

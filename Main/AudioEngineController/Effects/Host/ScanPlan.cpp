@@ -107,7 +107,7 @@ void ScanPlan::decideModule(const QString &path)
     KnownList::Records known = m_host.known().recordsOfPath(path);
     const QString fileTime = m_host.moduleTime(path);
     const bool isAbsent = fileTime.isEmpty(); // not a module after all; unless nobody lets us see
-    if (m_host.isLeftAlone(path) || (isAbsent && cannotBeExamined(path)) ||
+    if (m_host.isLeftAlone(path) || (isAbsent && (cannotBeExamined(path) || leadsNowhere(path))) ||
         (!isAbsent && !known.empty() && !isOutdated(*known.front(), fileTime)))
         keep(known);
     else if (!isAbsent)
@@ -132,6 +132,8 @@ void ScanPlan::sortMissing(const QSet<QString> &found)
 
 bool ScanPlan::isGone(const QString &path)
 {
+    if (leadsNowhere(path) || leadsNowhere(bundleOf(path)))
+        return false;
     const QString folder = m_host.moduleFolder(path);
     if (!isBelowAny(folder, m_folders))
         return true;
@@ -196,7 +198,7 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
 {
     const auto isOnlyCrashed = [this](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
-        return known.size() == 1 && known.front()->isCrashedFile();
+        return known.size() == 1 && known.front()->isCrashedFile() && m_host.hasJustCrashed(path);
     };
     const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);
     if (crashed == namesakes.end())
