@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <functional>
 #include <iterator>
+#include <utility>
 
 namespace {
 
@@ -178,12 +179,13 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
 {
     std::sort(unknown.begin(), unknown.end());
     ScanItem *best = nullptr;
-    int bestEnd = 0;
+    auto bestPlace = std::make_pair(false, 0);
     for (const std::size_t index : unknown) {
-        const int end = commonEnd(m_items[index].path, gone.path);
-        if (m_items[index].moved.empty() && end > bestEnd) {
-            best = &m_items[index];
-            bestEnd = end;
+        ScanItem &item = m_items[index];
+        const auto place = std::make_pair(item.known.empty(), commonEnd(item.path, gone.path));
+        if (item.moved.empty() && place > bestPlace) {
+            best = &item;
+            bestPlace = place;
         }
     }
     if (best) {
