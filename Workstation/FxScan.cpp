@@ -7,6 +7,7 @@
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
 #include "Main/VLib/ApplicationContext.h"
+#include "Workstation/Forget.h"
 #include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
@@ -137,6 +138,17 @@ int retry(const ScanOptions &options, const QStringList &folders, PluginHost &re
                                       : ScanExit::kDone;
 }
 
+int forget(const ScanOptions &options, const DataFiles &files)
+{
+    const ForgetOutcome outcome = forgetFolder(files.effects, options.forget);
+    if (!outcome.written)
+        complain(QStringLiteral("cannot write ") + outcome.written.reason);
+    Terminal::print(QStringLiteral("%1 plug-in%2 dropped\n")
+                        .arg(outcome.records)
+                        .arg(QLatin1String(outcome.records == 1 ? "" : "s")));
+    return outcome.written ? ScanExit::kDone : ScanExit::kNotFinished;
+}
+
 int scan(const ScanOptions &options, const DataFiles &files, const QStringList &folders)
 {
     const HostApplication workstation(options.dataFolder, folders);
@@ -189,14 +201,14 @@ int runFxScan(const ScanOptions &options)
     const DataFiles files(options.dataFolder);
     if (options.listOnly)
         return listOnly(options, files);
-    const QStringList folders = foldersToScan(options, files);
-    if (folders.isEmpty()) {
+    const QStringList folders = options.forget.isEmpty() ? foldersToScan(options, files) : QStringList();
+    if (folders.isEmpty() && options.forget.isEmpty()) {
         complain(options.folders.isEmpty()
                      ? QStringLiteral("none of the usual plug-in folders exists; name one")
                      : QStringLiteral("none of the folders given can be scanned"));
         return ScanExit::kUsage;
     }
-    if (!options.inProcess && !QFile::exists(PluginHost::usualScannerPath())) {
+    if (options.forget.isEmpty() && !options.inProcess && !QFile::exists(PluginHost::usualScannerPath())) {
         complain(QStringLiteral("there is no scanner program %1; --in-process does without")
                      .arg(PluginHost::usualScannerPath()));
         return ScanExit::kNotFinished;
@@ -211,6 +223,8 @@ int runFxScan(const ScanOptions &options)
                      .arg(files.effects, ScanLock::holder(files.effects)));
         return ScanExit::kNotFinished;
     }
+    if (!options.forget.isEmpty())
+        return forget(options, files);
     std::unique_ptr<ScanLock> ownScanner;
     if (options.inProcess)
         ownScanner = std::make_unique<ScanLock>(files.effects);

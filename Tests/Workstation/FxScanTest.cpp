@@ -302,6 +302,18 @@ TEST_F(FxScan, OnATerminalTheResultBeginsALine)
     EXPECT_TRUE(output.contains("\r\x1b[KFORMAT")) << output.constData();
 }
 
+TEST_F(FxScan, WhatIsAwayIsDroppedOnRequest)
+{
+    put("drive/Comp.vst3");
+    put("Stays.vst3");
+    scan();
+    QDir(m_folder.path("Plugins/drive")).removeRecursively();
+    EXPECT_EQ(states(scan())["Comp"], "folder away");
+    const ScannerOutcome outcome = run({"--forget", m_folder.path("Plugins/drive")});
+    EXPECT_TRUE(outcome.exitCode == 0 && outcome.standardOutput.startsWith("1 plug-in dropped"));
+    EXPECT_EQ(states(scan()), (States{{"Stays", "ok"}}));
+}
+
 TEST_F(FxScan, WrongUsage)
 {
     const QString nowhere = m_folder.path("nowhere");

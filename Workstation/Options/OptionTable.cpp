@@ -88,6 +88,11 @@ const std::vector<OptionRow> &optionTable()
          "Keep the catalogues in the folder Effects of this folder."},
         {"folders", "", &ScanOptions::foldersOnly,
          "Print the usual plug-in folders that exist, one a line, without a scan."},
+        {"forget", "folder", &ScanOptions::forget,
+         "Drop what is known of the plug-ins below a folder, with categories and favourites; makes no scan.",
+         "For a drive that is gone for good: what is known of one that is away is kept otherwise. A folder "
+         "that "
+         "is there still is scanned anew next time."},
         {"format", "format", ChoiceTarget{{"table", "json", "csv"}, setFormat},
          "Print the result as table (the default), json or csv."},
         {"in-process", "", &ScanOptions::inProcess,
@@ -125,6 +130,10 @@ const std::vector<OptionConflict> &optionConflicts()
         {"folders", "list", "--folders makes no scan"},
         {"folders", "retry", "--folders makes no scan"},
         {"folders", "retry-failed", "--folders makes no scan"},
+        {"forget", "folders", "--folders changes nothing"},
+        {"forget", "list", "--list changes nothing"},
+        {"forget", "retry", "--forget makes no scan"},
+        {"forget", "retry-failed", "--forget makes no scan"},
         {"list", "retry", "--list makes no scan"},
         {"list", "retry-failed", "--list makes no scan"},
         {"list", "in-process", "--list makes no scan"},

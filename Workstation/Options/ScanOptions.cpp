@@ -29,7 +29,8 @@ QString checkTogether(const QCommandLineParser &parser)
             parser.isSet(QString::fromLatin1(conflict.other)))
             return QStringLiteral("%1; it cannot be combined with --%2")
                 .arg(QLatin1String(conflict.reason), QLatin1String(conflict.other));
-    for (const QString &option : {QStringLiteral("folders"), QStringLiteral("list")})
+    for (const QString &option :
+         {QStringLiteral("folders"), QStringLiteral("forget"), QStringLiteral("list")})
         if (parser.isSet(option) && !parser.positionalArguments().isEmpty())
             return QStringLiteral("--%1 makes no scan; it takes no folders").arg(option);
     return QString();

@@ -18,6 +18,7 @@ struct ScanOptions {
     QStringList folders; ///< as given; none: the usual ones
     QString dataFolder;  ///< absolute, without a separator at its end
     OutputFormat format = OutputFormat::Table;
+    QString forget;           ///< folder whose plug-ins are dropped from the catalogues; empty: none
     QStringList retry;        ///< names or paths of plug-ins that get another chance
     bool retryFailed = false; ///< all of them
     int jobs = 0;             ///< plug-ins probed at once; 0: as many as suit the machine

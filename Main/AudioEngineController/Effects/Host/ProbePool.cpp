@@ -19,6 +19,7 @@ constexpr int kMaxModules = 50;
 constexpr int kMaxMessages = 1 << 20;
 constexpr std::size_t kMaxRecords = 1
                                     << 16; ///< classes of a module that are asked for, and more than children
+constexpr int kLastLines = 3;              ///< of what a worker printed, in the reason
 /// A turn that takes longer was held up.
 constexpr qint64 kLongTurn = 500; // ms
 /// What a worker gets to say that it is there.
@@ -39,6 +40,11 @@ const char *stageText(ProbeStage stage)
         return " while it was being closed and unloaded";
     }
     return "";
+}
+
+QString namesOf(const QStringList &paths)
+{
+    return paths.isEmpty() ? QStringLiteral("nobody") : paths.join(QStringLiteral(", "));
 }
 
 } // namespace
@@ -327,7 +333,7 @@ void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcom
     worker.job.reset();
     worker.child.reset();
     ++worker.probed;
-    worker.lastProbed = m_jobs[job].path;
+    worker.probedPaths.append(m_jobs[job].path);
     if (const QString why = whySpent(number, worker, outcome); !why.isEmpty()) {
         worker.isLeaving = true;
         endWorker(number, worker, why);
@@ -338,24 +344,23 @@ void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcom
 /// Why a worker ended, in words; what it told of a crash goes to the log.
 QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int number) const
 {
-    const QString when = QLatin1String(stageText(worker.outcome.stage));
-    if (!worker.endedFor.isEmpty())
-        return worker.endedFor + when;
-    if (!end.crashed && end.code == kChannelLost)
-        return QStringLiteral("it closed the channel of its worker") + when;
+    const QString when = worker.job ? QLatin1String(stageText(worker.outcome.stage)) : QLatin1String();
     QString printed = m_group.output(number);
     const CrashReport crash = CrashReport::take(printed);
     if (worker.job && !crash.frames.isEmpty())
         DebugLog(L"%ls crashed at %ls", m_jobs[*worker.job].path, crash.frames.join(QStringLiteral(" < ")));
-    QString text;
-    if (!crash.summary.isEmpty())
+    QString text = worker.endedFor + when;
+    if (worker.endedFor.isEmpty() && !crash.summary.isEmpty())
         text = QStringLiteral("it crashed%1: %2").arg(when, crash.summary);
-    else if (end.crashed)
+    else if (worker.endedFor.isEmpty() && end.crashed)
         text = QStringLiteral("it crashed%1: %2").arg(when, end.text);
-    else
+    else if (worker.endedFor.isEmpty() && end.code == kChannelLost)
+        text = QStringLiteral("it closed the channel of its worker") + when;
+    else if (worker.endedFor.isEmpty())
         text = QStringLiteral("it ended its process with exit code %1%2").arg(end.code).arg(when);
-    const QString last = printed.section(QLatin1Char('\n'), -1).trimmed();
-    return last.isEmpty() ? text : text + QStringLiteral("; it printed: ") + last;
+    const QStringList lines = printed.split(QLatin1Char('\n'), Qt::SkipEmptyParts).mid(-kLastLines);
+    return lines.isEmpty() ? text
+                           : text + QStringLiteral("; it printed: ") + lines.join(QStringLiteral(" / "));
 }
 
 /// What a worker was busy with when it ended is to blame, if it asked nobody before.
@@ -372,7 +377,7 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
     }
     if (!worker.job) {
         if (!worker.isLeaving)
-            DebugLog(L"A worker ended after it had asked %ls", worker.lastProbed);
+            DebugLog(L"A worker ended after it had asked %ls", namesOf(worker.probedPaths));
         m_listener->workerEnds(number, worker.isLeaving ? worker.endedFor : describe(worker, end, number));
         return;
     }
@@ -391,9 +396,8 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
 /// Somebody who went before may be to blame.
 void ProbePool::askAgain(std::size_t job, const QString &reason, const Worker &worker)
 {
-    const QString before = worker.lastProbed.isEmpty() ? QStringLiteral("nobody") : worker.lastProbed;
-    DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as %ls went before", m_jobs[job].path, reason,
-             before);
+    DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as before it went %ls", m_jobs[job].path,
+             reason, namesOf(worker.probedPaths));
     m_waiting.push_front({job, true, true});
 }
 

@@ -64,7 +64,7 @@ private:
         int messages = 0;                  ///< about that one
         QElapsedTimer sinceJob;            ///< since it was handed out
         std::optional<EffectRecord> child; ///< the sub-plug-in that is asked or closed
-        QString lastProbed;                ///< path of the job before
+        QStringList probedPaths;           ///< of the jobs before
         QElapsedTimer silent;              ///< since it last said something
         qint64 freshMemory = 0;            ///< bytes of resident memory before its first job
         QString endedFor;                  ///< why we ended it; empty: we did not
