@@ -22,7 +22,7 @@ namespace {
 constexpr int kProducts = 6; ///< three bear each file name
 constexpr int kPerProduct = 4;
 constexpr int kSteps = 9;
-constexpr int kSeedsInMemory = 100; ///< of each block
+constexpr int kSeedsInMemory = 250; ///< of each block
 constexpr int kSeedsOnDisk = 10;
 constexpr int kBlocks = 5; ///< of each format
 constexpr char kMemoryFolder[] = "/dev/shm";
