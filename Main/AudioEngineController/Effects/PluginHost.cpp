@@ -48,11 +48,11 @@ std::unique_ptr<AudioPluginHost> makeHost(PluginFormat format)
 
 IQuillonInterface *application() { return ApplicationContext::instance().quillonInterface; }
 
-/// Plug-ins mostly wait: twice the cores get through most of them soonest.
+/// Plug-ins mostly wait: four for each core get through most of them soonest, see docs/performance.md.
 int scanJobs(int wanted)
 {
     constexpr int kMost = 8;
-    const int ofMachine = std::min(kMost, 2 * std::max(1, QThread::idealThreadCount()));
+    const int ofMachine = std::min(kMost, 4 * std::max(1, QThread::idealThreadCount()));
     return wanted == 0 ? ofMachine : std::max(wanted, 0);
 }
 
