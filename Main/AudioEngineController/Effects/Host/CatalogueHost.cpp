@@ -92,13 +92,6 @@ QString CatalogueHost::moduleFolder(const QString &path) const
     return path.left(path.lastIndexOf(QLatin1Char('/')));
 }
 
-bool CatalogueHost::hasJustCrashed(const QString &path) const
-{
-    return std::any_of(m_absorbed.begin(), m_absorbed.end(), [&](const EffectRecord &marker) {
-        return marker.subId == 0 && isSamePath(marker.path, path);
-    });
-}
-
 void CatalogueHost::clearEffects()
 {
     const TAutoLockCS lock(&m_ks);

@@ -72,8 +72,6 @@ public:
     const KnownList &known() const { return m_known; }
     /// What the crash markers said that the last reading absorbed.
     const std::vector<EffectRecord> &absorbed() const { return m_absorbed; }
-    /// True for a file of which such a marker says that it ended the scanner: nobody knew before.
-    bool hasJustCrashed(const QString &path) const;
     /// True for a file that this run must not touch although nothing is recorded about it.
     bool isLeftAlone(const QString &path) const { return m_leftAlone.count(path) != 0; }
     /// True when the effect list holds the identifier.

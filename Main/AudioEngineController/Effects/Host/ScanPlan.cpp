@@ -198,9 +198,12 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
 
 void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes)
 {
+    // Only while a scan goes on that was ended: what crashed long ago is none that has moved just now.
+    if (m_host.absorbed().empty())
+        return;
     const auto isOnlyCrashed = [this](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
-        return known.size() == 1 && known.front()->isCrashedFile() && m_host.hasJustCrashed(path);
+        return known.size() == 1 && known.front()->isCrashedFile();
     };
     const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);
     if (crashed == namesakes.end())
