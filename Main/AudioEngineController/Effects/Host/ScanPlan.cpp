@@ -220,9 +220,10 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
         moved.category = record->category;
         moved.favourite = record->favourite;
         moved.path = file.path;
+        if (moved.isSwitchedOff())
+            continue;
         moved.fileTime = file.fileTime;
-        if (!moved.isSwitchedOff())
-            moved.enabled = moved.working = false;
+        moved.enabled = moved.working = false;
     }
 }
 
