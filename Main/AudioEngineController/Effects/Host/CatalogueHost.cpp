@@ -188,8 +188,14 @@ void CatalogueHost::absorbMarker(const EffectRecord &marker)
         return;
     }
     m_absorbed.push_back(marker);
+    applyCrash(marker);
+}
+
+void CatalogueHost::applyCrash(const EffectRecord &marker)
+{
     EffectRecord &crashed = m_known.applyCrash(marker);
     crashed.id = freeIdentifier(crashed, marker.name);
+    m_isKnownAsRead = false;
 }
 
 EffectRecord CatalogueHost::ReadCrashMarker(const QString &marker) const

@@ -70,6 +70,8 @@ public:
     PluginFormat format() const { return m_info.format; }
     const PluginFormatInfo &info() const { return m_info; }
     const KnownList &known() const { return m_known; }
+    /// Has the known list hold what a crash marker says.
+    void applyCrash(const EffectRecord &marker);
     /// What the crash markers said that the last reading absorbed.
     const std::vector<EffectRecord> &absorbed() const { return m_absorbed; }
     /// True for a file that this run must not touch although nothing is recorded about it.

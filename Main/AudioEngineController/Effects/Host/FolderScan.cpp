@@ -210,6 +210,8 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
             added |= add(record) && m_isTouched;
     for (EffectRecord &record : records.kept)
         addLater(std::move(record));
+    for (const EffectRecord &marker : records.crashes)
+        m_host.applyCrash(marker);
     m_likelyMarks.insert(m_likelyMarks.end(), records.likelyMarks.begin(), records.likelyMarks.end());
     m_memory.keep();
     if (!m_hasCollected && added)

@@ -47,9 +47,9 @@ private:
     void addDeadly(const EffectRecord &child, EffectRecord deadly, bool isOnly);
     void keepBeside(const EffectRecord &kept);
     const EffectRecord *deadlyRecord(const EffectRecord &child) const;
-    EffectRecord crashedChild(const EffectRecord &child) const;
+    EffectRecord crashedChild(const EffectRecord &child);
     KnownList knownOfFile() const;
-    void applyCrash(KnownList &known, const EffectRecord &marker) const;
+    void applyCrash(KnownList &known, const EffectRecord &marker);
     EffectRecord file(const QString &fileTime) const;
 
     const CatalogueHost &m_host;
@@ -75,8 +75,9 @@ KnownList Maker::knownOfFile() const
     return known;
 }
 
-void Maker::applyCrash(KnownList &known, const EffectRecord &marker) const
+void Maker::applyCrash(KnownList &known, const EffectRecord &marker)
 {
+    made.crashes.push_back(marker);
     EffectRecord &crashed = known.applyCrash(marker);
     crashed.id = m_host.freeIdentifier(crashed, marker.name);
 }
@@ -93,7 +94,7 @@ EffectRecord markerOf(const EffectRecord &child)
     return marker;
 }
 
-EffectRecord Maker::crashedChild(const EffectRecord &child) const
+EffectRecord Maker::crashedChild(const EffectRecord &child)
 {
     KnownList known = knownOfFile();
     applyCrash(known, markerOf(child));

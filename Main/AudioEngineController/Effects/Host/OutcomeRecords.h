@@ -9,6 +9,9 @@
 struct OutcomeRecords {
     std::vector<EffectRecord> listed; ///< in the outcome's order
     std::vector<EffectRecord> kept;   ///< what the file had before, unless another comes to list it
+    /// What crash markers would say. The known list takes it over: what is kept afterwards is decided as if
+    /// the next run had read them.
+    std::vector<EffectRecord> crashes;
     /// Identifiers of listed ones, and the old records whose marks they get unless another file lists those.
     std::vector<std::pair<QString, const EffectRecord *>> likelyMarks;
 };

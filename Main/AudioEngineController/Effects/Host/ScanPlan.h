@@ -26,7 +26,7 @@ struct ScanItem {
 /// empty: drives are unplugged.
 class ScanPlan {
 public:
-    /// The host's known list must not change while the plan is used. `unread` are the folders below `folders`
+    /// While the plan is used the host's known list must not change but by crashes. `unread` are the folders below `folders`
     /// of which not all could be read. `memory` tells which files are copies of others.
     ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const QStringList &folders,
              const QStringList &unread);
