@@ -111,6 +111,7 @@ void CatalogueHost::ReadCatalogue()
     m_known.clear();
     m_leftAlone.clear();
     m_absorbed.clear();
+    m_hasNewCrashes = false;
     m_suspects.clear();
     m_heldMarkers.clear();
     m_unwrittenMarkers.clear();
@@ -193,6 +194,7 @@ void CatalogueHost::absorbMarker(const EffectRecord &marker)
 
 void CatalogueHost::applyCrash(const EffectRecord &marker)
 {
+    m_hasNewCrashes = true;
     EffectRecord &crashed = m_known.applyCrash(marker);
     crashed.id = freeIdentifier(crashed, marker.name);
     m_isKnownAsRead = false;

@@ -72,6 +72,8 @@ public:
     const KnownList &known() const { return m_known; }
     /// Has the known list hold what a crash marker says.
     void applyCrash(const EffectRecord &marker);
+    /// Whether the known list took over any since it was read.
+    bool hasNewCrashes() const { return m_hasNewCrashes; }
     /// What the crash markers said that the last reading absorbed.
     const std::vector<EffectRecord> &absorbed() const { return m_absorbed; }
     /// True for a file that this run must not touch although nothing is recorded about it.
@@ -139,6 +141,7 @@ private:
     QStringList m_heldMarkers;                       ///< of files left alone
     QStringList m_unwrittenMarkers; ///< absorbed, but what they say could not be written down
     QByteArray m_written; ///< what this process wrote to the file last; null: nothing since it was read
+    bool m_hasNewCrashes = false;
     bool m_isKnownAsRead = false; ///< the file holds exactly the known list, in our layout
     QString m_unread;             ///< why the catalogue that is there could not be read
 };

@@ -322,8 +322,11 @@ void FolderScan::finish(bool isWhole)
         if (!m_host.isListed(old->id) && !mayYetBeListed(*old))
             m_host.passMarks(*old, id);
     if (isWhole) {
-        for (const EffectRecord &record : m_plan->keptMoved())
+        const ScanPlan::MovedToCrashed moved = m_plan->movedToCrashed();
+        for (const EffectRecord &record : moved.records)
             m_host.AddEffect(record);
+        for (const auto &[id, old] : moved.marks)
+            m_host.passMarks(old, id);
         for (const EffectRecord *record : m_plan->away())
             if (!m_host.isListed(record->id)) // else a file that is there lists it
                 m_host.AddEffect(*record);

@@ -171,7 +171,7 @@ void Maker::keepBeside(const EffectRecord &kept)
     made.kept.push_back(kept);
 }
 
-/// As a crash marker has it that the next run finds; so has what moved here, with its marks.
+/// As a crash marker has it that the next run finds.
 void Maker::addCrashed(const std::vector<EffectRecord> &children)
 {
     EffectRecord marker = file(m_item.fileTime);
@@ -187,14 +187,6 @@ void Maker::addCrashed(const std::vector<EffectRecord> &children)
     const KnownList::Records records = known.recordsOfPath(m_item.path);
     for (const EffectRecord *record : records)
         (record == records.front() || record->working ? made.listed : made.kept).push_back(*record);
-    const EffectRecord crashed = made.listed.front();
-    for (const EffectRecord *old : m_item.moved) {
-        if (old->standsForFile() && !m_host.known().isSameOfFile(*old, crashed))
-            continue;
-        EffectRecord kept = keptBesideFailure(*old, crashed);
-        kept.enabled = false;
-        keepBeside(kept);
-    }
 }
 
 /// Keeps what is known of a file that is asked again next time.

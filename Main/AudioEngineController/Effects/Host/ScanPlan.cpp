@@ -173,8 +173,7 @@ void ScanPlan::settleAllGone(const QStringList &modules)
 }
 
 /// Gives the records of a gone file to one that may be the same: to one of its name of which hardly anything
-/// is known, by the place of its item. Else those that are known are asked again, and what none of them lists
-/// goes to one that crashed.
+/// is known, by the place of its item. Else those that are known are asked again.
 void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes)
 {
     std::sort(unknown.begin(), unknown.end());
@@ -188,19 +187,28 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
             bestPlace = place;
         }
     }
-    if (best) {
+    m_settled.push_back({&gone, namesakes, best ? best->path : QString()});
+    if (best)
         best->moved = gone.records;
-        return;
-    }
-    moveToCrashed(gone, namesakes);
-    askAgain(namesakes);
+    else
+        askAgain(namesakes);
 }
 
-void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes)
+ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
 {
-    // Only while a scan goes on that was ended: what crashed long ago is none that has moved just now.
-    if (m_host.absorbed().empty())
-        return;
+    MovedToCrashed moved;
+    if (!m_host.hasNewCrashes()) // what crashed long ago is none that has moved just now
+        return moved;
+    for (const SettledFile &settled : m_settled) {
+        const KnownList::Records heir = m_host.known().recordsOfPath(settled.heir);
+        if (settled.heir.isEmpty() || (!heir.empty() && heir.front()->isCrashedFile()))
+            moveToCrashed(*settled.gone, settled.namesakes, moved);
+    }
+    return moved;
+}
+
+void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes, MovedToCrashed &all) const
+{
     const auto isOnlyCrashed = [this](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
         return known.size() == 1 && known.front()->isCrashedFile();
@@ -210,15 +218,15 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
         return;
     const EffectRecord &file = *m_host.known().recordsOfPath(*crashed).front();
     for (const EffectRecord *record : gone.records) {
-        const bool isFile = m_host.known().isSameOfFile(*record, file);
-        if (isFile ? hasMarks(file) : record->standsForFile())
+        if (m_host.known().isSameOfFile(*record, file)) {
+            if (!hasMarks(file))
+                all.marks.try_emplace(file.id, *record).first->second.enabled = true; // it stays disabled
             continue;
-        if (isFile)
-            m_kept.erase(std::remove(m_kept.begin(), m_kept.end(), &file), m_kept.end());
-        m_keptMoved.push_back(isFile ? file : *record);
-        EffectRecord &moved = m_keptMoved.back();
-        moved.category = record->category;
-        moved.favourite = record->favourite;
+        }
+        if (record->standsForFile())
+            continue;
+        all.records.push_back(*record);
+        EffectRecord &moved = all.records.back();
         moved.path = file.path;
         if (moved.isSwitchedOff())
             continue;

@@ -36,9 +36,13 @@ public:
 
     /// Records that stay as they are.
     const std::vector<const EffectRecord *> &kept() const { return m_kept; }
-    /// Records of gone files that move to the path of a file that crashed, unless a probed file lists them:
-    /// changed copies.
-    const std::vector<EffectRecord> &keptMoved() const { return m_keptMoved; }
+    /// What moves from gone files to files that crashed, in this scan too.
+    struct MovedToCrashed {
+        std::vector<EffectRecord> records;     ///< changed copies, unless a probed file lists them
+        std::map<QString, EffectRecord> marks; ///< by the identifier of the record that gets them
+    };
+    /// The same, when the known list holds how the probes ended.
+    MovedToCrashed movedToCrashed() const;
     /// What is to be probed: known files first, so that of two files with one identifier the known one wins.
     const std::vector<ScanItem> &items() const { return m_items; }
     /// Records of files that are away. One whose identifier a probed file lists gives way to it.
@@ -65,13 +69,20 @@ private:
         KnownList::Records records;
     };
 
+    /// What became of a gone file.
+    struct SettledFile {
+        const KnownFile *gone;
+        QStringList namesakes;
+        QString heir; ///< that its records move to; empty when nothing new has its name
+    };
+
     void decideModule(const QString &path);
     void sortMissing(const QSet<QString> &found);
     bool isGone(const QString &path);
     void indexKept();
     void settleAllGone(const QStringList &modules);
     void settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes);
-    void moveToCrashed(const KnownFile &gone, const QStringList &namesakes);
+    void moveToCrashed(const KnownFile &gone, const QStringList &namesakes, MovedToCrashed &all) const;
     void askAgain(const QStringList &paths);
     bool isKept(const QString &path) const;
     bool isHeld(const RememberedPlugin &plugin) const;
@@ -89,8 +100,8 @@ private:
     std::vector<const EffectRecord *> m_kept;
     QSet<QString> m_keptPaths;                   ///< by `pathKey`
     QSet<QPair<QString, QString>> m_keptPlugins; ///< path and identifier of those that work
-    std::vector<EffectRecord> m_keptMoved;
     std::vector<ScanItem> m_items;
     std::vector<KnownFile> m_gone;
+    std::vector<SettledFile> m_settled;
     KnownList::Records m_away;
 };
