@@ -113,6 +113,7 @@ void CatalogueHost::ReadCatalogue()
     m_absorbed.clear();
     m_hasNewCrashes = false;
     m_suspects.clear();
+    m_givenUp.clear();
     m_heldMarkers.clear();
     m_unwrittenMarkers.clear();
     m_written.clear();
@@ -338,7 +339,8 @@ QString CatalogueHost::freeIdentifier(const EffectRecord &plugin, const QString 
     const auto isFree = [&](const QString &candidate) {
         const EffectRecord *listed = m_effects.find(candidate);
         return !candidate.isEmpty() && !looksLikeIdentifier(candidate) &&
-               !(listed && !listed->isSamePlugin(plugin)) && !m_known.isIdHeldByOther(candidate, plugin);
+               !(listed && !listed->isSamePlugin(plugin)) &&
+               (m_givenUp.count(candidate) != 0 || !m_known.isIdHeldByOther(candidate, plugin));
     };
     const QString ofSubPlugin = plugin.path + QLatin1Char(':') + QString::number(plugin.subId);
     for (const QString &candidate : {name, plugin.path, ofSubPlugin})

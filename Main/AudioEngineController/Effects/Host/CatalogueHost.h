@@ -67,6 +67,9 @@ public:
     /// plug-in holds that.
     QString freeIdentifier(const EffectRecord &plugin, const QString &name) const;
 
+    /// Has a known identifier count as free, unless it is listed: its file was asked and does not keep it.
+    void giveUp(const QString &id) { m_givenUp.insert(id); }
+
     PluginFormat format() const { return m_info.format; }
     const PluginFormatInfo &info() const { return m_info; }
     const KnownList &known() const { return m_known; }
@@ -138,6 +141,7 @@ private:
     std::set<QString, PathLess> m_leftAlone;
     std::vector<EffectRecord> m_absorbed;
     std::map<QString, QString, PathLess> m_suspects; ///< path to marker
+    std::set<QString> m_givenUp;                     ///< known identifiers
     QStringList m_heldMarkers;                       ///< of files left alone
     QStringList m_unwrittenMarkers; ///< absorbed, but what they say could not be written down
     QByteArray m_written; ///< what this process wrote to the file last; null: nothing since it was read

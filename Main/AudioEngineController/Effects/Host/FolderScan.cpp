@@ -208,6 +208,7 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
     if (outcome.status != ProbeStatus::Listed) // what was only looked at can wait for the last write
         for (const EffectRecord &record : records.listed)
             added |= add(record) && m_isTouched;
+    giveUpOthers(item, records);
     for (EffectRecord &record : records.kept)
         addLater(std::move(record));
     for (const EffectRecord &marker : records.crashes)
@@ -217,6 +218,18 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
     return added;
+}
+
+/// What was known of an item and is not kept gives its identifier up, as if it had been read without it.
+void FolderScan::giveUpOthers(const ScanItem &item, const OutcomeRecords &records)
+{
+    const auto hasId = [](const std::vector<EffectRecord> &all, const QString &id) {
+        return std::any_of(all.begin(), all.end(),
+                           [&](const EffectRecord &record) { return record.id == id; });
+    };
+    for (const EffectRecord *old : item.known)
+        if (!hasId(records.listed, old->id) && !hasId(records.kept, old->id))
+            m_host.giveUp(old->id);
 }
 
 /// Of several waiting records of one identifier the first is written: what came of a probe goes before what

@@ -10,6 +10,7 @@
 #include <memory>
 
 class VProgressDisplay;
+struct OutcomeRecords;
 
 /// One scan of a host's folders: finds the modules, has those probed that are new or changed, and keeps what
 /// they say: passes marks on, adds records, writes catalogues, logs and reports each outcome once. Used once,
@@ -45,6 +46,10 @@ private:
     bool add(const EffectRecord &record);
     void addLater(EffectRecord record);
     void passMarksToHolder(const EffectRecord &record);
+    void giveUpOthers(const ScanItem &item, const OutcomeRecords &records);
+    void rememberCrashes();
+    void remember(const ProbeOutcome &outcome);
+    void writeMemory(bool isLast);
     void forgetGone();
 
     /// Has interim writes carry what is known of the items from one on.
