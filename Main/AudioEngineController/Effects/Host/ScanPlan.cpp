@@ -313,13 +313,14 @@ const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRe
 {
     const auto isSame = [&](const EffectRecord &old) { return m_host.known().isSameOfFile(old, probed); };
     const auto hasId = [&](const EffectRecord &old) { return old.id == probed.id; };
+    const auto isSamePlugin = [&](const EffectRecord &old) { return hasId(old) && !old.standsForFile(); };
     const EffectRecord *own = findIn(item.known, isSame);
     if (own && (own->working || hasId(*own) || hasMarks(*own)))
         return own;
     // Also of a file that is there: its copy comes to list what it does not list any more.
     const KnownList::Records namesakes = m_host.known().recordsOfFileName(item.path);
     for (const KnownList::Records *records : {&namesakes, &m_away})
-        if (const EffectRecord *same = findIn(*records, hasId))
+        if (const EffectRecord *same = findIn(*records, isSamePlugin))
             return same;
     const EffectRecord *child = missingChild(item, probed);
     if (child || own || !isOnly)
