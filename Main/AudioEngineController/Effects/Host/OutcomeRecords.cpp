@@ -67,11 +67,15 @@ const EffectRecord *Maker::deadlyRecord(const EffectRecord &child) const
     return nullptr;
 }
 
+/// What the next run would read of the file: no catalogue holds what another file came to list.
 KnownList Maker::knownOfFile() const
 {
     KnownList known(m_host.known().identity());
-    for (const EffectRecord *old : m_item.known)
-        known.addRecord(*old);
+    for (const EffectRecord *old : m_item.known) {
+        const std::optional<EffectRecord> listed = m_host.findEffect(old->id);
+        if (!listed || isSamePath(listed->path, old->path))
+            known.addRecord(*old);
+    }
     return known;
 }
 
