@@ -179,15 +179,19 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
     std::sort(unknown.begin(), unknown.end());
     ScanItem *best = nullptr;
     auto bestPlace = std::make_pair(false, 0);
+    QStringList heirs;
     for (const std::size_t index : unknown) {
         ScanItem &item = m_items[index];
+        if (!item.moved.empty())
+            continue;
+        heirs.append(item.path);
         const auto place = std::make_pair(item.known.empty(), commonEnd(item.path, gone.path));
-        if (item.moved.empty() && place > bestPlace) {
+        if (place > bestPlace) {
             best = &item;
             bestPlace = place;
         }
     }
-    m_settled.push_back({&gone, namesakes, best ? best->path : QString()});
+    m_settled.push_back({&gone, namesakes, heirs});
     if (best)
         best->moved = gone.records;
     else
@@ -196,14 +200,16 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
 
 ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
 {
+    const auto hasCrashed = [this](const QString &path) {
+        const KnownList::Records known = m_host.known().recordsOfPath(path);
+        return !known.empty() && known.front()->isCrashedFile();
+    };
     MovedToCrashed moved;
     if (!m_host.hasNewCrashes()) // what crashed long ago is none that has moved just now
         return moved;
-    for (const SettledFile &settled : m_settled) {
-        const KnownList::Records heir = m_host.known().recordsOfPath(settled.heir);
-        if (settled.heir.isEmpty() || (!heir.empty() && heir.front()->isCrashedFile()))
+    for (const SettledFile &settled : m_settled)
+        if (std::all_of(settled.heirs.begin(), settled.heirs.end(), hasCrashed))
             moveToCrashed(*settled.gone, settled.namesakes, moved);
-    }
     return moved;
 }
 

@@ -26,8 +26,8 @@ struct ScanItem {
 /// empty: drives are unplugged.
 class ScanPlan {
 public:
-    /// While the plan is used the host's known list must not change but by crashes. `unread` are the folders below `folders`
-    /// of which not all could be read. `memory` tells which files are copies of others.
+    /// While the plan is used the host's known list must not change but by crashes. `unread` are the folders
+    /// below `folders` of which not all could be read. `memory` tells which files are copies of others.
     ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const QStringList &folders,
              const QStringList &unread);
 
@@ -73,7 +73,7 @@ private:
     struct SettledFile {
         const KnownFile *gone;
         QStringList namesakes;
-        QString heir; ///< that its records move to; empty when nothing new has its name
+        QStringList heirs; ///< new files of its name, one of which its records move to
     };
 
     void decideModule(const QString &path);
