@@ -47,9 +47,6 @@ private:
     void addLater(EffectRecord record);
     void passMarksToHolder(const EffectRecord &record);
     void giveUpOthers(const ScanItem &item, const OutcomeRecords &records);
-    void rememberCrashes();
-    void remember(const ProbeOutcome &outcome);
-    void writeMemory(bool isLast);
     void forgetGone();
 
     /// Has interim writes carry what is known of the items from one on.
