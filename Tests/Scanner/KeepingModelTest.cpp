@@ -507,21 +507,20 @@ private:
         }
         m_folder.write(folder() + m_info.catalogue->fileName, renderCatalogue(*m_info.catalogue, records));
     }
-    /// Notes the files for which a plug-in speaks that the user switched off.
+    /// Notes the files of which the user switched everything off.
     void noteAsleep()
     {
         m_asleep.clear();
-        std::set<QString> spokenFor;
+        std::set<QString> awake;
         const std::vector<EffectRecord> records = catalogue();
         for (const EffectRecord &record : records)
-            if (record.standsForFile())
-                spokenFor.insert(record.path);
-        for (const EffectRecord &record : records)
-            if (spokenFor.insert(record.path).second && record.isSwitchedOff() && record.subId == 0) {
-                m_asleep.insert(record.path);
-                if (const auto file = m_files.find(record.path); file != m_files.end())
-                    file->second.kept.insert(numberOf(record)); // as an interrupted scan listed it
-            }
+            if (!record.isSwitchedOff() || record.subId != 0)
+                awake.insert(record.path);
+        for (const EffectRecord &record : records) {
+            const auto file = m_files.find(record.path);
+            if (awake.count(record.path) == 0 && m_asleep.insert(record.path).second && file != m_files.end())
+                file->second.kept.insert(numberOf(record)); // as an interrupted scan listed it
+        }
     }
 
     const PluginFormatInfo &m_info;
@@ -530,7 +529,7 @@ private:
     std::map<QString, File> m_files;
     std::set<QString> m_deadly;   ///< "file-name number stamp" of sub-plug-ins that killed, wherever it lay
     std::set<QString> m_culprits; ///< paths, and "path number stamp" of sub-plug-ins
-    std::set<QString> m_asleep;   ///< the user switched off what speaks for the file: it is not asked
+    std::set<QString> m_asleep;   ///< the user switched off all that the file lists: it is not asked
     QStringList m_left;           ///< paths that were given up since the last whole scan
     Numbers m_unsure;             ///< what cannot be told from its namesakes until the next whole scan
     Numbers m_crashed;            ///< since the last whole scan

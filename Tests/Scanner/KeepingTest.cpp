@@ -81,6 +81,20 @@ vst2 Name Vendor Favourite: Top <br/> Boost &amp; &lt;|Jo <jo x.org> & Co|1, C|F
 vst3 Name Vendor Favourite: A &amp; B|V|1, C|Fixture Works|0
 same
 
+= What the user switched off speaks for no file while others are on
+put Two.vst3: class A | #1 | class B | #2
+put Shell.vst2: child 1 D | child 2 E
+scan
+mark A Enabled 0
+mark D Enabled 0
+mark E Enabled 0
+same
+new Two.vst3: class A | #1 | class C | #3
+new Shell.vst2: child 1 D | child 3 F
+scan
+vst3 Name Enabled: A|0, C|1
+vst2 Name Enabled: D|0, F|1
+
 = A link whose drive is away keeps its plug-in
 put Comp.vst3:
 write drive/here: x

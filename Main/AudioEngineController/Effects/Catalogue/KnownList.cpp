@@ -11,7 +11,7 @@ int rankOf(const EffectRecord &record)
         return record.standsForFile() ? 0 : 1;
     if (record.standsForFile())
         return 2;
-    return record.subId != 0 && !record.enabled ? 4 : 3;
+    return record.enabled ? 3 : 4;
 }
 
 void markCrashed(EffectRecord &record)

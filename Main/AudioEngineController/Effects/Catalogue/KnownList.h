@@ -49,8 +49,9 @@ public:
 
     /// All records of one full path, the one that speaks for the file first: what crashed as a whole comes
     /// before what failed as a whole, and both before the others, so that the file is not loaded again
-    /// because another of its classes sorts before it; sub-plug-ins that are disabled come last, so that one
-    /// bad child does not have an unchanged shell loaded at every scan.
+    /// because another of its classes sorts before it; what else is disabled comes last, so that one bad
+    /// child does not have an unchanged shell loaded at every scan, and one class that the user switched off
+    /// does not keep an updated module from being asked.
     Records recordsOfPath(const QString &path) const;
     /// The same for all records of a file name, those of the full path before the others.
     Records recordsOfFileName(const QString &path) const;

@@ -20,7 +20,8 @@ bool isBelowAny(const QString &path, const QStringList &folders)
 bool isOutdated(const EffectRecord &first, const QString &fileTime)
 {
     if (!first.enabled)
-        return first.subId != 0; // all sub-plug-ins of a shell are disabled
+        return first.subId != 0 && // all sub-plug-ins of a shell are disabled
+               (!first.isSwitchedOff() || first.fileTime != fileTime);
     return first.fileTime != fileTime;
 }
 
