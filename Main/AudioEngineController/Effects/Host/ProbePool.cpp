@@ -27,21 +27,6 @@ constexpr qint64 kStartPatience = 30000; // ms
 /// Starts in a row that may fail.
 constexpr int kMaxFailedStarts = 3;
 
-const char *stageText(ProbeStage stage)
-{
-    switch (stage) {
-    case ProbeStage::Load:
-        return " while it was being loaded";
-    case ProbeStage::Start:
-        return " while it was starting";
-    case ProbeStage::Ask:
-        return " while it was asked for its data";
-    case ProbeStage::Close:
-        return " while it was being closed and unloaded";
-    }
-    return "";
-}
-
 QString namesOf(const QStringList &paths)
 {
     return paths.isEmpty() ? QStringLiteral("nobody") : paths.join(QStringLiteral(", "));
@@ -344,7 +329,7 @@ void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcom
 /// Why a worker ended, in words; what it told of a crash goes to the log.
 QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int number) const
 {
-    const QString when = worker.job ? QLatin1String(stageText(worker.outcome.stage)) : QLatin1String();
+    const QString when = worker.job ? QLatin1String(duringStage(worker.outcome.stage)) : QLatin1String();
     QString printed = m_group.output(number);
     const CrashReport crash = CrashReport::take(printed);
     if (worker.job && !crash.frames.isEmpty())

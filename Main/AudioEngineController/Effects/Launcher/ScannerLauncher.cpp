@@ -14,27 +14,9 @@ namespace {
 constexpr std::chrono::milliseconds kStartPatience(30000);
 constexpr std::chrono::milliseconds kStep(1000);
 
-/// What a plug-in was doing in the stage that the report told last.
-QString stageText(std::optional<ProbeStage> stage)
-{
-    if (!stage)
-        return QString();
-    switch (*stage) {
-    case ProbeStage::Load:
-        return QStringLiteral(" while it was being loaded");
-    case ProbeStage::Start:
-        return QStringLiteral(" while it was starting");
-    case ProbeStage::Ask:
-        return QStringLiteral(" while it was asked for its data");
-    case ProbeStage::Close:
-        return QStringLiteral(" while it was being closed and unloaded");
-    }
-    return QString();
-}
-
 QString blame(const ScannerRunEnd &end, std::optional<ProbeStage> stage)
 {
-    const QString when = stageText(stage);
+    const QString when = stage ? QLatin1String(duringStage(*stage)) : QLatin1String();
     switch (end.how) {
     case ScannerRunEnd::How::Crashed:
         return QStringLiteral("it crashed the scanner%1: %2").arg(when, end.text);

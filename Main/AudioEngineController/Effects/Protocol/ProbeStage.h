@@ -8,3 +8,19 @@ enum class ProbeStage {
     Ask,   ///< it is asked for its data
     Close, ///< it is released and unloaded
 };
+
+/// What the plug-in was doing, behind "it crashed" and the like.
+inline const char *duringStage(ProbeStage stage)
+{
+    switch (stage) {
+    case ProbeStage::Load:
+        return " while it was being loaded";
+    case ProbeStage::Start:
+        return " while it was starting";
+    case ProbeStage::Ask:
+        return " while it was asked for its data";
+    case ProbeStage::Close:
+        return " while it was being closed and unloaded";
+    }
+    return "";
+}
