@@ -3,7 +3,9 @@
 #include <thread>
 
 /// Makes the calling thread one that plug-ins can run on, for as long as the object lives: on Windows they
-/// rely on a COM apartment of a single thread.
+/// rely on a COM apartment of a single thread, and a plug-in that ends the thread while its library is being
+/// loaded keeps the loader's lock, for which every thread may wait that should end the process. So it ends
+/// some seconds later in any case.
 class PluginThread {
 public:
     PluginThread();
@@ -21,5 +23,6 @@ public:
 
 private:
     bool m_prepared = false;
-    unsigned m_timer = 0; ///< the system's number of a timer that keeps its thread running
+    unsigned m_timer = 0;     ///< the system's number of a timer that keeps its thread running
+    void *m_leaves = nullptr; ///< the system's event that says that this object goes
 };
