@@ -37,7 +37,8 @@ quint64 registerOf(const void *context, int number)
 /// Whether a fault came up where the stack would have grown to.
 bool isStackOverflow(const siginfo_t *info, const void *context)
 {
-    constexpr quint64 kNear = 64 * 1024; // more than any frame that is entered without a look at its end
+    constexpr quint64 kNear =
+        quint64(64) * 1024; // more than any frame that is entered without a look at its end
     return reinterpret_cast<quint64>(info->si_addr) + kNear - registerOf(context, REG_RSP) < 2 * kNear;
 }
 
@@ -94,7 +95,7 @@ public:
 
 private:
     int m_file;
-    char m_block[4096];
+    char m_block[4096] = {};
     ssize_t m_count = 0;
     ssize_t m_next = 0;
 };
@@ -114,7 +115,7 @@ quint64 hexadecimal(const char *&text)
 /// Tells of each place which module it lies in (proc(5): /proc/pid/maps).
 void locate(CrashPlaces &places, std::size_t count)
 {
-    char line[PATH_MAX + 128]; // the other columns are shorter
+    char line[PATH_MAX + 128] = {}; // the other columns are shorter
     char module[PATH_MAX] = {};
     quint64 base = 0;
     Lines maps("/proc/self/maps");

@@ -112,7 +112,7 @@ void ProbePool::cancelJobs()
 /// Looks at the files that come next, in this process and while workers are busy.
 void ProbePool::lookAhead()
 {
-    const auto ahead = static_cast<std::size_t>(2 * m_settings.workers);
+    const std::size_t ahead = 2 * static_cast<std::size_t>(m_settings.workers);
     for (std::size_t place = 0; place < std::min(ahead, m_waiting.size());) {
         Waiting &waiting = m_waiting[place];
         const std::size_t job = waiting.job;
