@@ -1,5 +1,6 @@
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/ProcessSetup.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeChannel.h"
 #include "Scanner/ProbeWorker.h"
 #include "Scanner/ScannerEntry.h"
 

@@ -7,7 +7,6 @@
 
 namespace {
 
-constexpr char kWorkerArgument[] = "-probe_worker";
 constexpr std::chrono::milliseconds kLook(50);
 /// What plug-ins at work get to end by themselves after a cancel.
 constexpr qint64 kPatience = 2000; // ms
@@ -36,7 +35,7 @@ QString namesOf(const QStringList &paths)
 
 ProbePool::ProbePool(Settings settings)
     : m_settings(std::move(settings))
-    , m_group(m_settings.program, QStringList(QLatin1String(kWorkerArgument)))
+    , m_group(m_settings.program, QStringList(QLatin1String(kProbeWorkerArgument)))
 {}
 
 ProbePool::~ProbePool() = default;

@@ -32,6 +32,8 @@ struct ChannelMessage {
     ProbeOutcome outcome;
 };
 
+/// The argument with which the scanner program is a worker of another scanner.
+inline constexpr char kProbeWorkerArgument[] = "-probe_worker";
 /// The exit code of a worker whose channel is gone.
 inline constexpr int kChannelLost = 3;
 
