@@ -17,6 +17,7 @@
 #include <QApplication>
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
 
 #include <cstdio>
 
@@ -76,11 +77,14 @@ int runScanner(QApplication &application)
 {
     const QStringList arguments = application.arguments();
     const bool isDefaultPath = arguments.size() < 2;
-    const QString path = isDefaultPath ? QDir::homePath() + QLatin1String(kDefaultScanList) : arguments.at(1);
-    if (path == QLatin1String(kReWireArgument))
+    const QString given =
+        isDefaultPath ? QDir::homePath() + QLatin1String(kDefaultScanList) : arguments.at(1);
+    if (given == QLatin1String(kReWireArgument))
         return reportReWireVersion();
-    if (!QFile::exists(path))
+    if (!QFile::exists(given))
         return 0;
+    // The data folder is a part of it, which a path from the working folder need not have.
+    const QString path = QDir::isAbsolutePath(given) ? given : QFileInfo(given).absoluteFilePath();
     const QString dataFolder = dataFolderOf(path);
     ProbeReport::instance().openFromEnvironment();
     const ScanLock lock(dataFolder + QStringLiteral("/Effects"));

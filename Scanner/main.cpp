@@ -3,6 +3,7 @@
 #include "Main/AudioEngineController/Effects/Protocol/ProbeChannel.h"
 #include "Scanner/ProbeWorker.h"
 #include "Scanner/ScannerEntry.h"
+#include "Scanner/ScannerHelp.h"
 
 #include <QApplication>
 
@@ -11,6 +12,8 @@
 int main(int argc, char **argv)
 {
     prepareProcess();
+    if (argc > 1 && printHelp(argv[1]))
+        leaveProcess(0);
     configureLogFromEnvironment();
     int exitCode = 0;
     if (argc > 1 && std::strcmp(argv[1], kProbeWorkerArgument) == 0) {

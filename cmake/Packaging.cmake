@@ -13,19 +13,15 @@ endfunction()
 # To pack the programs, only they need be built.
 set(CMAKE_SKIP_INSTALL_ALL_DEPENDENCY ON)
 
-set(document_folder "${CMAKE_INSTALL_DATADIR}/doc/fxprobe")
-set(licence_name copyright) # where Debian's users look for it
-if(WIN32)
-    set(document_folder .)
-    set(licence_name LICENSE.txt)
-endif()
-install(FILES "${PROJECT_SOURCE_DIR}/LICENSE" DESTINATION "${document_folder}" RENAME ${licence_name})
-install(FILES "${PROJECT_SOURCE_DIR}/README.md" "${PROJECT_SOURCE_DIR}/CHANGELOG.md" DESTINATION "${document_folder}")
-
 set(CPACK_PACKAGE_NAME fxprobe)
 set(CPACK_PACKAGE_VENDOR "The FxProbe authors")
 set(CPACK_PACKAGE_CONTACT "The FxProbe authors <fxprobe@localhost>")
 set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "${PROJECT_DESCRIPTION}")
+set(CPACK_PACKAGE_DESCRIPTION
+    "FxProbe loads the VST 3 and VST 2 plug-ins of a machine, asks each for its
+name, vendor and channels, and writes a catalogue that a workstation reads.
+A plug-in that crashes or hangs is named with the reason and costs the
+others nothing. fxscan does it from the command line.")
 set(CPACK_PACKAGE_DIRECTORY "${PROJECT_BINARY_DIR}/packages")
 set(CPACK_STRIP_FILES ON)
 if(WIN32)
@@ -38,5 +34,26 @@ else()
     set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
     set(CPACK_INSTALL_DEFAULT_DIRECTORY_PERMISSIONS
         OWNER_READ OWNER_WRITE OWNER_EXECUTE GROUP_READ GROUP_EXECUTE WORLD_READ WORLD_EXECUTE)
+endif()
+
+# The README and what it links, so that its links lead somewhere.
+set(document_folder "${CMAKE_INSTALL_DATADIR}/doc/fxprobe")
+if(WIN32)
+    set(document_folder .)
+    install(FILES "${PROJECT_SOURCE_DIR}/LICENSE" DESTINATION .)
+endif()
+install(FILES "${PROJECT_SOURCE_DIR}/README.md" "${PROJECT_SOURCE_DIR}/CHANGELOG.md"
+    "${PROJECT_SOURCE_DIR}/cmake/debian/copyright" DESTINATION "${document_folder}")
+install(DIRECTORY "${PROJECT_SOURCE_DIR}/docs" DESTINATION "${document_folder}"
+    FILES_MATCHING PATTERN "*.md" PATTERN "*.png")
+
+if(NOT WIN32)
+    # What Debian's tools look for. The text of the licence is on every Debian system; the link is the README's.
+    set(debian_folder "${PROJECT_BINARY_DIR}/debian")
+    configure_file("${PROJECT_SOURCE_DIR}/cmake/debian/changelog.in" "${debian_folder}/changelog" @ONLY)
+    find_program(GZIP_PROGRAM gzip REQUIRED)
+    execute_process(COMMAND "${GZIP_PROGRAM}" -fn9 "${debian_folder}/changelog" COMMAND_ERROR_IS_FATAL ANY)
+    file(CREATE_LINK copyright "${debian_folder}/LICENSE" SYMBOLIC)
+    install(FILES "${debian_folder}/changelog.gz" "${debian_folder}/LICENSE" DESTINATION "${document_folder}")
 endif()
 include(CPack)

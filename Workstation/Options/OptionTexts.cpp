@@ -1,5 +1,6 @@
 #include "Workstation/Options/OptionTexts.h"
 
+#include "Main/AudioEngineController/Effects/Protocol/ScannerUsage.h"
 #include "Workstation/Options/OptionTable.h"
 
 namespace {
@@ -48,6 +49,15 @@ QString manualEntry(const OptionRow &row)
     return entry;
 }
 
+template <std::size_t Count>
+QString manualEntries(const UsageRow (&rows)[Count])
+{
+    QString entries;
+    for (const UsageRow &row : rows)
+        entries += QStringLiteral(".TP\n.B %1\n%2\n").arg(escaped(row.name), escaped(row.text));
+    return entries;
+}
+
 } // namespace
 
 QString bashCompletion()
@@ -89,5 +99,8 @@ QString manualPage(QString manualTemplate)
     QString entries;
     for (const OptionRow &row : optionTable())
         entries += manualEntry(row);
-    return manualTemplate.replace(QLatin1String("@OPTIONS@\n"), entries);
+    return manualTemplate.replace(QLatin1String("@OPTIONS@\n"), entries)
+        .replace(QLatin1String("@SCANNER_ARGUMENTS@\n"), manualEntries(kScannerArguments))
+        .replace(QLatin1String("@SCANNER_VARIABLES@\n"), manualEntries(kScannerVariables))
+        .replace(QLatin1String("@SCANNER_EXITS@\n"), manualEntries(kScannerExits));
 }

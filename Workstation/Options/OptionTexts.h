@@ -9,5 +9,7 @@
 /// Completion for bash.
 QString bashCompletion();
 
-/// The manual page: the template (troff), with its line "@OPTIONS@" replaced by an entry for each option.
+/// A manual page: the template (troff), with its line "@OPTIONS@" replaced by an entry for each option, and
+/// its lines "@SCANNER_ARGUMENTS@", "@SCANNER_VARIABLES@" and "@SCANNER_EXITS@" by those of the scanner's
+/// usage.
 QString manualPage(QString manualTemplate);
