@@ -27,13 +27,21 @@ void leaveUnfinished()
         leaveProcess(ScanExit::kNotFinished);
 }
 
+/// What the live line says of them.
+QString keysInWords(const ScanOptions &options, const TerminalKeys &keys)
+{
+    if (!keys.areThere())
+        return QString();
+    return options.inProcess ? QStringLiteral("; q cancels") : QStringLiteral("; s skips it, q cancels");
+}
+
 } // namespace
 
 ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report)
     : m_options(options)
     , m_registry(registry)
     , m_account(report)
-    , m_progress(options.quiet, options.inProcess ? 0 : options.timeout)
+    , m_progress(options.quiet, options.inProcess ? 0 : options.timeout, keysInWords(options, m_keys))
 {
     TerminationSignal::install();
     registry.setProbeLimit(options.timeout);
@@ -119,8 +127,38 @@ void ScanSession::look()
         m_progress.say(QStringLiteral("Cancelling"));
         cancel();
     }
+    takeKeys();
     m_account.update();
     m_progress.show(m_account);
+}
+
+void ScanSession::takeKeys()
+{
+    switch (m_keys.take()) {
+    case 's':
+        skip();
+        break;
+    case 'q':
+        m_progress.say(QStringLiteral("Cancelling"));
+        cancel();
+        break;
+    default:
+        break;
+    }
+}
+
+/// Gives up on the plug-in that has been at work for the longest.
+void ScanSession::skip()
+{
+    const PluginKey *plugin = m_account.current();
+    if (!plugin)
+        return;
+    if (m_options.inProcess) {
+        m_progress.say(QStringLiteral("A plug-in in this process cannot be skipped"));
+        return;
+    }
+    m_progress.say(QStringLiteral("Skipping %1").arg(plugin->path));
+    m_registry.skipProbe(plugin->path);
 }
 
 void ScanSession::cancel()
@@ -149,7 +187,8 @@ void ScanSession::takeEnd(const ScannerRunEnd &end)
         m_reason =
             QStringLiteral("the scanner %1 could not be started: %2").arg(m_registry.scannerPath(), end.text);
         cancel(); // nothing else would end the launcher
-    } else if (end.culprits.empty() && (end.how != ScannerRunEnd::How::Exited || end.code != 0)) {
+    } else if (end.how != ScannerRunEnd::How::Skipped && end.how != ScannerRunEnd::How::Cancelled &&
+               end.culprits.empty() && (end.how != ScannerRunEnd::How::Exited || end.code != 0)) {
         m_reason = QStringLiteral("the scanner did not finish: ") + end.description();
     }
 }

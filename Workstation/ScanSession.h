@@ -2,6 +2,7 @@
 
 #include "Workstation/Options/ScanOptions.h"
 #include "Workstation/Output/Progress.h"
+#include "Workstation/Output/TerminalKeys.h"
 #include "Workstation/Summary/ScanAccount.h"
 
 #include <QElapsedTimer>
@@ -29,12 +30,15 @@ private:
     void takeEnds();
     void takeEnd(const ScannerRunEnd &end);
     void cancel();
+    void skip();
+    void takeKeys();
     void look();
     void endOverdueProbe() const;
 
     const ScanOptions &m_options;
     PluginHost &m_registry;
     ScanAccount m_account;
+    TerminalKeys m_keys;
     Progress m_progress;
     std::size_t m_ends = 0;       ///< of scanners, in the present launch
     std::set<PluginKey> m_blamed; ///< in the whole session

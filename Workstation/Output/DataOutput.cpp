@@ -63,6 +63,7 @@ QJsonObject scanObject(const ScanSummary &summary)
             {QStringLiteral("updated"), summary.updated},
             {QStringLiteral("unchanged"), summary.unchanged},
             {QStringLiteral("removed"), QJsonArray::fromStringList(summary.removed)},
+            {QStringLiteral("skipped"), QJsonArray::fromStringList(summary.skipped)},
             {QStringLiteral("slowest"), slowest}};
 }
 

@@ -24,10 +24,11 @@ QString nameOf(const ScanAccount &account, const PluginKey &key)
 
 } // namespace
 
-Progress::Progress(bool isQuiet, int limit)
+Progress::Progress(bool isQuiet, int limit, QString keys)
     : m_isQuiet(isQuiet)
     , m_isTerminal(Terminal::errorIsTerminal())
     , m_limit(limit)
+    , m_keys(std::move(keys))
 {}
 
 void Progress::end()
@@ -68,9 +69,10 @@ void Progress::showLine(const ScanAccount &account, const PluginKey &key)
         m_since.start();
     m_shown = key;
     const QString limit = m_limit > 0 ? QStringLiteral(" of %1").arg(m_limit) : QString();
-    const QString time = m_since.elapsed() < kSlow
-                             ? QString()
-                             : QStringLiteral("  (%1 s%2)").arg(m_since.elapsed() / 1000).arg(limit);
+    const QString time =
+        m_since.elapsed() < kSlow
+            ? QString()
+            : QStringLiteral("  (%1 s%2%3)").arg(m_since.elapsed() / 1000).arg(limit, m_keys);
     const QString text =
         Terminal::harmless(countOf(account) + QLatin1Char(' ') + nameOf(account, key) + time);
     const QString line = Terminal::cell(text, Terminal::errorWidth() - 1).trimmed();

@@ -8,8 +8,9 @@
 /// Shows how a scan gets on, on the error output: on a terminal one line that lives, else a line per file.
 class Progress {
 public:
-    /// `limit`: the seconds that one plug-in may take; 0: any.
-    Progress(bool isQuiet, int limit);
+    /// `limit`: the seconds that one plug-in may take; 0: any. `keys`: what the live line says of the keys
+    /// that a user can press.
+    Progress(bool isQuiet, int limit, QString keys = QString());
     /// Takes the live line away.
     ~Progress() { end(); }
     Progress(const Progress &) = delete;
@@ -29,6 +30,7 @@ private:
     bool m_isQuiet;
     bool m_isTerminal;
     int m_limit;
+    QString m_keys;
     QString m_line;    ///< as it stands on the terminal
     PluginKey m_shown; ///< what it is about
     QElapsedTimer m_since;

@@ -109,6 +109,12 @@ QString renderCounts(const ScanSummary &summary)
             changes.append(QStringLiteral("%1 gone: %2")
                                .arg(summary.removed.size())
                                .arg(Terminal::harmless(summary.removed.join(QLatin1String(", ")))));
+        QStringList skipped;
+        for (const QString &path : summary.skipped)
+            skipped.append(Terminal::harmless(fileNameOf(path)));
+        if (!skipped.isEmpty())
+            changes.append(
+                QStringLiteral("%1 skipped: %2").arg(skipped.size()).arg(skipped.join(QLatin1String(", "))));
     }
     const std::size_t count = summary.plugins.size();
     QString text = QStringLiteral("%1 plug-in%2").arg(count).arg(QLatin1String(count == 1 ? "" : "s"));

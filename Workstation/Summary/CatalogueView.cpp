@@ -99,6 +99,8 @@ const char *stateText(PluginState state)
         return "switched off";
     case PluginState::NoPlugin:
         return "no plug-in";
+    case PluginState::Skipped:
+        return "skipped";
     case PluginState::FolderAway:
         return "folder away";
     }

@@ -15,6 +15,7 @@ enum class PluginState {
     Disabled,    ///< it ended the scanner; it is not loaded any more
     SwitchedOff, ///< by the user
     NoPlugin,    ///< a file named like a plug-in that is none
+    Skipped,     ///< by the user, in the last scan, and nothing is known of it
     FolderAway,  ///< the folder that it lay in is not there, or is empty: on a drive that is unplugged
 };
 

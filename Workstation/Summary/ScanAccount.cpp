@@ -89,6 +89,7 @@ void ScanAccount::end(const ReportLine &line)
     const bool isSkipped = line.event == ReportLine::Event::Skipped;
     ProbeAccount &account = m_probes[keyOf(line)];
     account.noPlugin = isSkipped || line.noPlugin;
+    account.isSkipped = line.isSkipped;
     account.reason = line.reason;
     account.records = line.records;
     account.milliseconds = line.milliseconds;

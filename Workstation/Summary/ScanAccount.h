@@ -32,6 +32,7 @@ struct ProbeAccount {
     double milliseconds = -1; ///< -1: it did not come to its end
     int records = 0;          ///< so many plug-ins of it work
     bool noPlugin = false;    ///< no plug-in of its format
+    bool isSkipped = false;   ///< by the user
     bool isLoaded = false;    ///< it entered a stage; else it was seen without loading it
 };
 

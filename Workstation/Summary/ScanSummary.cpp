@@ -87,9 +87,11 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
         if (probe.reason.isEmpty() || recorded.count({key.format, key.path}) != 0)
             continue;
         const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;
+        const PluginState state = probe.noPlugin    ? PluginState::NoPlugin
+                                  : probe.isSkipped ? PluginState::Skipped
+                                                    : PluginState::Failed;
         (probe.noPlugin ? summary.noPlugins : summary.failures)
-            .push_back({&formatInfo(key.format), probe.noPlugin ? PluginState::NoPlugin : PluginState::Failed,
-                        name, key.path, key.subId, probe.reason, false});
+            .push_back({&formatInfo(key.format), state, name, key.path, key.subId, probe.reason, false});
     }
 }
 
@@ -119,6 +121,13 @@ void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount 
     for (const auto &[identity, name] : gone)
         if (failedNow.count({std::get<0>(identity), std::get<1>(identity)}) == 0)
             summary.removed.append(name);
+}
+
+void addSkipped(ScanSummary &summary, const ScanAccount &account)
+{
+    for (const auto &[key, probe] : account.probes())
+        if (probe.isSkipped)
+            summary.skipped.append(key.path);
 }
 
 void addSlowest(ScanSummary &summary, const ScanAccount &account)
@@ -158,6 +167,7 @@ ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const 
     addFailures(summary, &account, memory);
     addUnrecorded(summary, account);
     count(summary, before, account);
+    addSkipped(summary, account);
     addSlowest(summary, account);
     return summary;
 }

@@ -29,6 +29,7 @@ struct ScanSummary {
     QStringList problems;                 ///< one sentence each
     std::vector<ProbeTime> slowest;       ///< the slowest first
     QStringList removed;                  ///< names of what is gone
+    QStringList skipped;                  ///< paths that the user passed over in this scan
     int added = 0;
     int updated = 0; ///< were known and probed again
     int unchanged = 0;

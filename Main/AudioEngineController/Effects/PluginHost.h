@@ -47,6 +47,9 @@ public:
     /// Asks a running scan to end, in this process or the scanner's; any thread. The next scan starts without
     /// the request.
     void cancelScan();
+    /// Asks a launched scanner to give up on the plug-in file that it is busy with. Nobody is blamed: what is
+    /// known of the file is kept, and the next scan asks it again. Any thread.
+    void skipProbe(const QString &path) { m_launcher.skip(path); }
     /// True while the launcher runs scanners. It holds `m_ks` all the while.
     bool isLauncherRunning() const { return m_launching; }
     /// How the scanners of the last launch ended so far; any thread.

@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/Host/OutcomeRecords.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
+#include "Main/AudioEngineController/Effects/Protocol/ScanControl.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
@@ -173,7 +174,9 @@ void FolderScan::probe(const ScanItem &item)
     if (!m_runner)
         m_runner = std::make_unique<ProbeRunner>(m_host);
     beginItem(item);
-    const ProbeOutcome outcome = readable(item, m_runner->run(jobOf(item), *this));
+    const ProbeOutcome outcome = ScanControl::instance().isSkipped(item.path)
+                                     ? ProbeOutcome::skipped()
+                                     : readable(item, m_runner->run(jobOf(item), *this));
     m_memory.end(m_file, outcome, m_isTouched);
     const bool added = keepOutcome(item, outcome);
     log(item, outcome, 0);

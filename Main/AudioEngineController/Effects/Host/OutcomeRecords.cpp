@@ -230,6 +230,9 @@ OutcomeRecords recordsOfOutcome(const CatalogueHost &host, const ScanPlan &plan,
     case ProbeStatus::NoAnswer:
         maker.addCrashed(outcome.records);
         break;
+    case ProbeStatus::Skipped:
+        maker.keepUnchanged();
+        break;
     case ProbeStatus::NoPlugin:
     case ProbeStatus::Cancelled:
         break;

@@ -3,6 +3,7 @@
 #include "Main/AudioEngineController/Effects/Host/OutcomeRecords.h"
 #include "Main/AudioEngineController/Effects/Host/ProbePool.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
+#include "Main/AudioEngineController/Effects/Protocol/ScanControl.h"
 #include "Main/VLib/SimpleGUI.h"
 #include "Main/VLib/VProgressDisplay.h"
 
@@ -34,7 +35,10 @@ public:
 
     std::optional<ProbeOutcome> look(std::size_t index) override
     {
-        return m_probe->look(m_scan.jobOf(m_items[m_first + index]));
+        const ScanItem &item = m_items[m_first + index];
+        if (ScanControl::instance().isSkipped(item.path))
+            return ProbeOutcome::skipped();
+        return m_probe->look(m_scan.jobOf(item));
     }
     void jobBegins(std::size_t index, int worker) override;
     void stageEntered(std::size_t index, int worker, ProbeStage stage) override;
@@ -53,6 +57,10 @@ public:
         ProbeReport::instance().workerEnded(worker, reason);
     }
     bool isCancelled() override { return m_scan.isCancelled(); }
+    bool isSkipped(std::size_t index) override
+    {
+        return ScanControl::instance().isSkipped(m_items[m_first + index].path);
+    }
 
 private:
     /// An item, as far as it came.

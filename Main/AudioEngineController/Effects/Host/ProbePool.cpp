@@ -69,6 +69,7 @@ bool ProbePool::run(std::vector<ProbeJob> jobs, IPoolListener &listener)
         }
         if (m_isCancelled && sinceCancel.hasExpired(kPatience))
             cancelJobs();
+        skipJobs();
         lookAhead();
         if (m_waiting.empty() && !isBusy())
             break;
@@ -105,6 +106,23 @@ void ProbePool::cancelJobs()
         worker.job.reset();
         worker.isLeaving = true;
         endWorker(number, worker, QStringLiteral("the scan was cancelled"));
+    }
+}
+
+/// A user waits for none of these any more.
+void ProbePool::skipJobs()
+{
+    for (auto &[number, worker] : m_workers) {
+        if (!worker.job || worker.isLeaving || !m_listener->isSkipped(*worker.job))
+            continue;
+        ProbeOutcome skipped = ProbeOutcome::skipped();
+        skipped.stage = worker.outcome.stage;
+        skipped.milliseconds = static_cast<double>(worker.sinceJob.nsecsElapsed()) / 1e6;
+        const std::size_t job = *worker.job;
+        worker.job.reset();
+        worker.isLeaving = true;
+        endWorker(number, worker, QStringLiteral("its plug-in was skipped"));
+        m_listener->jobEnds(job, number, skipped);
     }
 }
 

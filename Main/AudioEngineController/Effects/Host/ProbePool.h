@@ -32,6 +32,8 @@ public:
     virtual void turn() = 0;
     /// True when no more jobs are to be begun.
     virtual bool isCancelled() = 0;
+    /// True when a job that is at work is to be given up, which blames nobody.
+    virtual bool isSkipped(std::size_t job) = 0;
 };
 
 /// Makes outcomes of jobs in worker processes, several at once. A plug-in that ends its worker, or gives no
@@ -80,6 +82,7 @@ private:
 
     bool isBusy() const;
     void cancelJobs();
+    void skipJobs();
     void cancelJob(std::size_t job, int number);
     void forgiveWait(qint64 turn);
     void lookAhead();

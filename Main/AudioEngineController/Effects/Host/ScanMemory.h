@@ -33,8 +33,12 @@ public:
     void setHolder(const QString &id, const QString &holder);
     /// The same of an identifier that a file listed which was probed before.
     void setHolder(const QString &file, const QString &id, const QString &holder);
-    /// Remembers the item.
-    void keep() { m_probes.set(m_item); }
+    /// Remembers the item, unless a user passed over it: what its last probe came to holds.
+    void keep()
+    {
+        if (m_item.status != ProbeStatus::Skipped)
+            m_probes.set(m_item);
+    }
 
     /// Writes the file, failures soon, the rest now and then: what is lost with a process costs time only.
     void write(bool isLast);

@@ -6,13 +6,17 @@
 #include "Main/AudioEngineController/Effects/Launcher/ScannerProcess.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
+#include "Main/AudioEngineController/Effects/Protocol/ScanControl.h"
 
+#include <algorithm>
 #include <chrono>
 
 namespace {
 
 constexpr std::chrono::milliseconds kStartPatience(30000);
 constexpr std::chrono::milliseconds kStep(1000);
+/// How often in a step somebody's requests are looked for.
+constexpr int kLooks = 10;
 
 QString blame(const ScannerRunEnd &end, std::optional<ProbeStage> stage)
 {
@@ -67,22 +71,27 @@ QString ScannerRunEnd::description() const
         return QStringLiteral("it was ended after %1 s without an answer").arg(code);
     case How::Cancelled:
         return QStringLiteral("it was ended because the scan was cancelled");
+    case How::Skipped:
+        return QStringLiteral("it was ended to pass over the plug-in that it was busy with");
     }
     return QString();
 }
 
 void ScannerLauncher::run(const Job &job)
 {
-    for (int run = 0; run < kMaxRuns && !m_cancelled; ++run) {
+    for (int run = 0; run < kMaxRuns && !m_cancelled;) {
         job.writeScanList();
-        if (!runOnce(job))
+        const std::optional<ScannerRunEnd::How> end = runOnce(job);
+        if (!end)
             return;
+        run += *end == ScannerRunEnd::How::Skipped ? 0 : 1; // a user may skip as many as there are
     }
 }
 
-/// One run; true when a plug-in ended it, so that another run has to follow.
-bool ScannerLauncher::runOnce(const Job &job)
+/// One run; how it ended when another run has to follow.
+std::optional<ScannerRunEnd::How> ScannerLauncher::runOnce(const Job &job)
 {
+    using How = ScannerRunEnd::How;
     MarkerWatch watch(job.effectsFolder, qEnvironmentVariable("FXPROBE_REPORT"));
     ScannerProcess scanner;
     scanner.setEnvironment("FXPROBE_JOBS", std::max(job.jobs, 0)); // whatever this process has
@@ -90,6 +99,8 @@ bool ScannerLauncher::runOnce(const Job &job)
         scanner.setEnvironment("FXPROBE_PROBE_LIMIT", job.probeLimit);
         scanner.setEnvironment("FXPROBE_MEMORY_LIMIT", job.memoryLimit);
     }
+    scanner.setEnvironment(ScanControl::kVariable, 1);
+    m_passedOn = 0;
     ScannerRunEnd end;
     if (!scanner.start(job.program, QStringList(job.scanList), kStartPatience)) {
         DebugLog(L"Scanner failed to Start: %d", scanner.errorCode());
@@ -103,20 +114,24 @@ bool ScannerLauncher::runOnce(const Job &job)
         DebugLog(L"The scanner has ended: %ls", end.description());
         add(end);
     }
-    return end.how != ScannerRunEnd::How::Cancelled && !watch.markers().isEmpty();
+    if (end.how == How::Cancelled || (end.how != How::Skipped && watch.markers().isEmpty()))
+        return std::nullopt;
+    return end.how;
 }
 
 void ScannerLauncher::waitForEnd(const Job &job, ScannerProcess &scanner, MarkerWatch &watch,
                                  ScannerRunEnd &end)
 {
     using How = ScannerRunEnd::How;
-    while (!scanner.waitForFinished(kStep)) {
+    while (!waitStep(scanner)) {
         logOutput(scanner);
         watch.look();
-        if (m_cancelled) {
-            const bool isOverdue = isOverLimit(job, watch);
+        // A scanner with workers gives a plug-in up by itself.
+        const bool endsForSkip = job.jobs <= 0 && isSkipAtHand(watch);
+        if (m_cancelled || endsForSkip) {
+            const bool isOverdue = !endsForSkip && isOverLimit(job, watch);
             scanner.end();
-            end.how = How::Cancelled;
+            end.how = endsForSkip ? How::Skipped : How::Cancelled;
             // Nobody is to blame, unless the plug-in had its time. Markers that the run found are not ours.
             for (const QString &marker : isOverdue ? QStringList() : watch.markersOfRun())
                 removeMarkerFile(marker);
@@ -138,6 +153,42 @@ void ScannerLauncher::waitForEnd(const Job &job, ScannerProcess &scanner, Marker
     findCulprits(job.effectsFolder, watch, end);
 }
 
+/// Waits for a step, or until somebody asks for something; true when the scanner has ended.
+bool ScannerLauncher::waitStep(ScannerProcess &scanner)
+{
+    for (int look = 0; look < kLooks && !m_cancelled && !passSkipsOn(scanner); ++look)
+        if (scanner.waitForFinished(kStep / kLooks))
+            return true;
+    return false;
+}
+
+/// Tells the scanner what to pass over; true when there is news.
+bool ScannerLauncher::passSkipsOn(ScannerProcess &scanner)
+{
+    const std::lock_guard<std::mutex> lock(m_mutex);
+    const bool isNews = m_passedOn < m_skips.size();
+    for (; m_passedOn < m_skips.size(); ++m_passedOn)
+        scanner.write(ScanControl::skipLine(m_skips.at(m_passedOn)));
+    return isNews;
+}
+
+/// Whether the run is busy with a file that is to be passed over.
+bool ScannerLauncher::isSkipAtHand(const MarkerWatch &watch) const
+{
+    const std::lock_guard<std::mutex> lock(m_mutex);
+    if (m_skips.isEmpty())
+        return false;
+    const std::vector<FoundMarker> markers = readMarkers(watch.markersOfRun());
+    return std::any_of(markers.begin(), markers.end(),
+                       [this](const FoundMarker &marker) { return m_skips.contains(marker.plugin.path); });
+}
+
+void ScannerLauncher::skip(const QString &path)
+{
+    const std::lock_guard<std::mutex> lock(m_mutex);
+    m_skips.append(path);
+}
+
 bool ScannerLauncher::isOverLimit(const Job &job, const MarkerWatch &watch) const
 {
     // In steps, not by a clock: the time a machine sleeps does not count.
@@ -154,6 +205,7 @@ void ScannerLauncher::reset()
     m_cancelled = false;
     const std::lock_guard<std::mutex> lock(m_mutex);
     m_ends.clear();
+    m_skips.clear();
 }
 
 std::vector<ScannerRunEnd> ScannerLauncher::ends() const

@@ -9,6 +9,7 @@
 #include <atomic>
 #include <functional>
 #include <mutex>
+#include <optional>
 #include <vector>
 
 class MarkerWatch;
@@ -29,6 +30,7 @@ struct ScannerRunEnd {
         Crashed,    ///< by a signal (POSIX) or an unhandled fault; `code` is its number
         TimeLimit,  ///< by us: it was busy with one plug-in for too long
         Cancelled,  ///< by us: the user wants no scan any more
+        Skipped,    ///< by us: the user waits no longer for the plug-in that it was busy with
     };
     How how = How::NotStarted;
     int code = 0;
@@ -64,19 +66,27 @@ public:
     /// Asks `run` to end at its next look, which is a second away at most. Any thread.
     void cancel() { m_cancelled = true; }
     bool isCancelled() const { return m_cancelled; }
-    /// Forgets an earlier request and earlier runs.
+    /// Asks the scanner at work to give up on a file, which blames nobody: the next scan asks it again. One
+    /// that has no workers is ended for it, and another run goes on. Any thread.
+    void skip(const QString &path);
+    /// Forgets earlier requests and earlier runs.
     void reset();
 
     /// How the runs ended so far. Any thread.
     std::vector<ScannerRunEnd> ends() const;
 
 private:
-    bool runOnce(const Job &job);
+    std::optional<ScannerRunEnd::How> runOnce(const Job &job);
+    bool waitStep(ScannerProcess &scanner);
+    bool passSkipsOn(ScannerProcess &scanner);
+    bool isSkipAtHand(const MarkerWatch &watch) const;
     void waitForEnd(const Job &job, ScannerProcess &scanner, MarkerWatch &watch, ScannerRunEnd &end);
     bool isOverLimit(const Job &job, const MarkerWatch &watch) const;
     void add(const ScannerRunEnd &end);
 
     std::atomic<bool> m_cancelled{false};
-    mutable std::mutex m_mutex; ///< of the ends
+    mutable std::mutex m_mutex; ///< of the ends and the skips
     std::vector<ScannerRunEnd> m_ends;
+    QStringList m_skips; ///< files to give up on, in this launch
+    int m_passedOn = 0;  ///< so many of them the present run was told
 };

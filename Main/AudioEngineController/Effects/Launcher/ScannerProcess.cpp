@@ -61,6 +61,12 @@ bool ScannerProcess::waitForFinished(std::chrono::milliseconds timeout)
     return m_child->state() == QProcess::NotRunning;
 }
 
+bool ScannerProcess::write(const QByteArray &bytes)
+{
+    constexpr int kWritePatience = 1000; // ms
+    return m_child->write(bytes) == bytes.size() && m_child->waitForBytesWritten(kWritePatience);
+}
+
 void ScannerProcess::end()
 {
     if (m_child->state() == QProcess::NotRunning)

@@ -27,6 +27,8 @@ public:
     bool start(const QString &program, const QStringList &arguments, std::chrono::milliseconds timeout);
     /// Waits for the end; false when it did not come in time. A process that never started never ends.
     bool waitForFinished(std::chrono::milliseconds timeout);
+    /// Writes to the scanner's standard input; false when it takes nothing any more.
+    bool write(const QByteArray &bytes);
     /// Asks the scanner to end, which blames no plug-in; by force when it does not in time.
     void end();
     /// Ends the scanner at once, in the middle of what it does.

@@ -19,6 +19,7 @@ enum class ProbeStatus {
     Crashed,   ///< it ended the process that probed it
     NoAnswer,  ///< it gave no answer within the limit
     Cancelled, ///< the scan was cancelled while it was probed
+    Skipped,   ///< a user passed over it
 };
 
 /// One file to ask: everything that a format's probe needs to know.
@@ -51,6 +52,15 @@ struct ProbeOutcome {
     bool leftThreads = false; ///< more threads run than before, and the module stays mapped
     bool leftModule = false;  ///< it stays mapped in its process although it was unloaded
     bool faulted = false;     ///< a call committed a hardware fault that was contained
+
+    /// Of a file that a user passed over: what is known stays as it is, and the next scan asks.
+    static ProbeOutcome skipped()
+    {
+        ProbeOutcome outcome;
+        outcome.status = ProbeStatus::Skipped;
+        outcome.reason = QStringLiteral("skipped by you");
+        return outcome;
+    }
 
     /// The first reason counts: what fails later follows from it.
     void fail(const QString &why)

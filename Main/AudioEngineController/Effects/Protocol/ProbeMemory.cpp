@@ -25,8 +25,8 @@ constexpr char kOutputs[] = "outputs";
 constexpr char kHeldBy[] = "heldBy";
 
 /// In the order of `ProbeStatus`.
-constexpr const char *kStatusTexts[] = {"listed",  "failed",    "no plug-in",
-                                        "crashed", "no answer", "cancelled"};
+constexpr const char *kStatusTexts[] = {"listed",    "failed",    "no plug-in", "crashed",
+                                        "no answer", "cancelled", "skipped"};
 
 QLatin1String word(const char *text) { return QLatin1String(text); }
 

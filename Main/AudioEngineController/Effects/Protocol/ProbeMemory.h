@@ -76,5 +76,6 @@ private:
     bool m_changed = false;
 };
 
-/// For reports, files and people: "listed", "failed", "no plug-in", "crashed", "no answer", "cancelled".
+/// For reports, files and people: "listed", "failed", "no plug-in", "crashed", "no answer", "cancelled",
+/// "skipped".
 const char *statusText(ProbeStatus status);

@@ -108,6 +108,8 @@ void ProbeReport::end(PluginFormat format, const EffectRecord &plugin, const Pro
                 static_cast<qint64>(std::count_if(outcome.records.begin(), outcome.records.end(), works)));
     if (outcome.status == ProbeStatus::NoPlugin)
         line.insert(QLatin1String(kNoPlugin), true);
+    if (outcome.status == ProbeStatus::Skipped)
+        line.insert(QLatin1String(kIsSkipped), true);
     if (!outcome.reason.isEmpty())
         line.insert(QLatin1String(kReason), outcome.reason);
     write("end", withWorker(line, worker));

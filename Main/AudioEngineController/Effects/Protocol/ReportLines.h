@@ -15,6 +15,7 @@ inline constexpr char kReason[] = "reason";
 inline constexpr char kMilliseconds[] = "milliseconds";
 inline constexpr char kRecords[] = "records";
 inline constexpr char kNoPlugin[] = "noPlugin";
+inline constexpr char kIsSkipped[] = "skipped";
 inline constexpr char kFiles[] = "files";
 inline constexpr char kProbes[] = "probes";
 

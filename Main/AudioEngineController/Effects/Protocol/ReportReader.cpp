@@ -42,6 +42,7 @@ ReportLine lineOf(const QByteArray &text)
     line.milliseconds = json.value(QLatin1String(kMilliseconds)).toDouble(-1);
     line.records = json.value(QLatin1String(kRecords)).toInt();
     line.noPlugin = json.value(QLatin1String(kNoPlugin)).toBool();
+    line.isSkipped = json.value(QLatin1String(kIsSkipped)).toBool();
     line.probes = json.value(QLatin1String(kProbes)).toInt();
     line.worker = json.value(QLatin1String(kWorker)).toInt();
     return line;

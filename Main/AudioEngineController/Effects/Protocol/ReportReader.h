@@ -35,8 +35,9 @@ struct ReportLine {
     double milliseconds = -1;
     int records = 0;
     bool noPlugin = false;
-    int probes = 0; ///< planned
-    int worker = 0; ///< that it is about; 0: the scanner itself
+    bool isSkipped = false; ///< by a user
+    int probes = 0;         ///< planned
+    int worker = 0;         ///< that it is about; 0: the scanner itself
 
     /// The last line of a scan that came to its end, cancelled or not.
     bool isLast() const { return event == Event::Finished || event == Event::Ended; }

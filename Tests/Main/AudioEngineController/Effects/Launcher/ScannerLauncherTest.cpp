@@ -163,3 +163,44 @@ TEST_F(Launcher, TheRegistryScansOutOfProcessAndReloadsWhatChanged)
     EXPECT_LT(time.elapsed(), 20000) << "it ends its launcher";
     EXPECT_TRUE(m_folder.markers().isEmpty()) << "a cancel blames nobody";
 }
+
+TEST_F(Launcher, APluginThatAUserSkipsIsNotBlamedAndAskedAgain)
+{
+    for (const int jobs : {-1, 1, 3}) {
+        SCOPED_TRACE(jobs);
+        const TestFolder folder;
+        const TestApplication workstation({folder.plugins()});
+        addVST3File(folder.plugins(), "Before");
+        addVST3File(folder.plugins(), "Later");
+        const QString hanging = addVST3File(folder.plugins(), "Hang", "class Hang\nfault initialize hang\n");
+        const QString known = addVST3File(folder.plugins(), "Known");
+        PluginHost registry;
+        registry.initialise(folder.dataFolder(), QString(), 48000, 1024);
+        registry.setScanJobs(jobs);
+        registry.Scan(true, false);
+        waitFor([&] { return folder.markers().contains("Hang.scan3"); });
+        registry.skipProbe(hanging);
+        waitFor([&] { return !registry.isLauncherRunning(); });
+        EXPECT_EQ(folder.markers(), QStringList());
+        QStringList names;
+        for (const EffectRecord &record : registry.host(PluginFormat::Vst3).effects())
+            names.append(record.name);
+        EXPECT_EQ(names.join(' '), "Before Known Later");
+        EXPECT_EQ(registry.scannerEnds().size(), jobs < 0 ? 2u : 1u);
+
+        // What is known of a file that is skipped stays, with its old time: it is asked again.
+        QFile::remove(hanging);
+        QFile::remove(hanging + ".script");
+        folder.write("Plugins/Known.vst3.script", "class Known\nfault initialize hang\n");
+        folder.setModified(known, QDateTime({2022, 3, 4}, {5, 6, 7}));
+        registry.Scan(true, false);
+        waitFor([&] { return folder.markers().contains("Known.scan3"); });
+        registry.skipProbe(known);
+        waitFor([&] { return !registry.isLauncherRunning(); });
+        EXPECT_EQ(folder.read("Effects/VST3Configuration.xml").count("<Working>1</Working>"), 3);
+        folder.write("Plugins/Known.vst3.script", "class Again\n");
+        registry.Scan(true, false);
+        waitFor([&] { return !registry.isLauncherRunning(); });
+        EXPECT_EQ(folder.read("Effects/VST3Configuration.xml").count("<Name>Again<"), 1);
+    }
+}

@@ -1,0 +1,89 @@
+#include "Tests/Support/ScanBench.h"
+
+#include <QDeadlineTimer>
+#include <QRegularExpression>
+
+#include <array>
+
+#include <poll.h>
+#include <pty.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace {
+
+/// fxscan on a terminal of 70 columns, with a user at its keys.
+class FxScanOnTerminal : public ScanBench {
+protected:
+    /// Runs it; `key` is pressed when `at` has been shown. Gives the exit code.
+    int run(const QByteArray &at, char key)
+    {
+        const std::array<QByteArray, 6> words = {FXPROBE_FXSCAN,
+                                                 "--data-folder",
+                                                 m_folder.dataFolder().toUtf8(),
+                                                 "--timeout",
+                                                 "60",
+                                                 m_folder.plugins().toUtf8()};
+        std::array<char *, words.size() + 1> arguments = {};
+        for (std::size_t word = 0; word < words.size(); ++word)
+            arguments[word] = const_cast<char *>(words[word].constData());
+        winsize size = {24, 70, 0, 0};
+        int terminal = -1;
+        const pid_t child = forkpty(&terminal, nullptr, nullptr, &size);
+        if (child == 0) {
+            execv(arguments[0], arguments.data());
+            _exit(127);
+        }
+        m_shown.clear();
+        const QDeadlineTimer deadline(30000);
+        bool isPressed = false;
+        while (child > 0 && readSome(terminal) && !deadline.hasExpired())
+            if (!isPressed && m_shown.contains(at))
+                isPressed = write(terminal, &key, 1) == 1;
+        EXPECT_TRUE(isPressed) << m_shown.constData();
+        close(terminal);
+        int status = -1;
+        waitpid(child, &status, 0);
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+    /// What stands on the terminal in the end, without what was taken away again.
+    QString remains() const
+    {
+        return QString::fromUtf8(m_shown).remove('\r').remove(QRegularExpression("[^\n]*\x1b\\[K"));
+    }
+
+    QByteArray m_shown;
+
+private:
+    /// False when nobody has the terminal any more.
+    bool readSome(int terminal)
+    {
+        constexpr int kLook = 100; // ms
+        pollfd output = {terminal, POLLIN, 0};
+        if (poll(&output, 1, kLook) == 0)
+            return true;
+        std::array<char, 4096> buffer;
+        const ssize_t read = ::read(terminal, buffer.data(), buffer.size());
+        m_shown.append(buffer.data(), static_cast<int>(std::max<ssize_t>(read, 0)));
+        return read > 0;
+    }
+};
+
+} // namespace
+
+TEST_F(FxScanOnTerminal, ShowsALiveLineAndListensToKeys)
+{
+    put("Good.vst3");
+    put("Hang.vst3", "fault initialize hang\n");
+    EXPECT_EQ(run("(2 s of 60; s skips it, q cancels)", 'S'), 0);
+    EXPECT_TRUE(remains().startsWith("Skipping " + m_folder.plugins() + "/Hang.vst3\nFORMAT  NAME"))
+        << qPrintable(remains());
+    EXPECT_TRUE(remains().endsWith("1 usable; 1 new, 1 skipped: Hang.vst3\n")) << qPrintable(remains());
+
+    EXPECT_EQ(run("] VST 3  Hang.vst3", 'q'), 3);
+    EXPECT_TRUE(remains().startsWith("Cancelling\nfxscan: the scan was cancelled; what was found until then "
+                                     "is kept\nFORMAT"))
+        << qPrintable(remains());
+    EXPECT_EQ(recordsOf("VST3Configuration.xml", "Name Enabled Working"), QStringList("Good|1|1"));
+    EXPECT_EQ(m_folder.markers(), QStringList());
+}
