@@ -48,7 +48,7 @@ function(fxprobe_target target)
     file(RELATIVE_PATH source_from_build "${PROJECT_BINARY_DIR}" "${PROJECT_SOURCE_DIR}/")
     target_compile_options(${target} PRIVATE "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/="
                            "-fmacro-prefix-map=${source_from_build}=")
-    target_include_directories(${target} PUBLIC "${PROJECT_SOURCE_DIR}")
+    target_include_directories(${target} PUBLIC "$<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>")
     if(FXPROBE_SANITIZE)
         target_compile_options(${target} PRIVATE -fsanitize=${FXPROBE_SANITIZE}
                                -fno-sanitize-recover=all -fno-omit-frame-pointer)

@@ -7,19 +7,19 @@
 
 namespace {
 
-/// The list is written without escaping, one folder a line, and read as XML.
-bool canStandInScanList(const QString &folder)
-{
-    static const QRegularExpression bad(QStringLiteral("[<\\x00-\\x1f]|&[#a-zA-Z0-9]+;"));
-    return !bad.match(folder).hasMatch();
-}
-
 QStringList foldersOfVariable(const char *name)
 {
     return qEnvironmentVariable(name).split(QDir::listSeparator(), Qt::SkipEmptyParts);
 }
 
 } // namespace
+
+bool canStandInScanList(const QString &folder)
+{
+    // The list is written without escaping, one folder a line, and read as XML.
+    static const QRegularExpression bad(QStringLiteral("[<\\x00-\\x1f]|&[#a-zA-Z0-9]+;"));
+    return !bad.match(folder).hasMatch();
+}
 
 QStringList foldersOfEnvironment()
 {

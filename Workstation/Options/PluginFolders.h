@@ -19,6 +19,9 @@ struct SettledFolders {
     QStringList leftOut; ///< one sentence each
 };
 
+/// Whether a scan list can hold the name of a folder.
+bool canStandInScanList(const QString &folder);
+
 /// Settles folders that a user gave: those that do not exist, or whose names cannot stand in a scan list, are
 /// left out with a reason.
 SettledFolders settleFolders(const QStringList &folders);

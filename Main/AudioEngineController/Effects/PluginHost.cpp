@@ -194,6 +194,11 @@ QString PluginHost::usualScannerPath()
     return QCoreApplication::applicationDirPath() + QLatin1String(kScannerProgram);
 }
 
+QString PluginHost::scannerProgram() const
+{
+    return m_scannerProgram.isEmpty() ? usualScannerPath() : m_scannerProgram;
+}
+
 void PluginHost::notifyWorkstation() const
 {
     if (application())
@@ -211,7 +216,7 @@ bool PluginHost::Scan(bool scan, bool inProcess)
     forEachHost([](AudioPluginHost &host) { host.clearCancel(); });
     FileFinder::forgetReports();
     ReadCatalogue();
-    m_scannerPath = usualScannerPath();
+    m_scannerPath = scannerProgram();
     WriteScanList();
     const bool isLaunched = scan && !inProcess && QFile::exists(m_scannerPath);
     const bool written = scanHosts(scan && !isLaunched);
@@ -277,7 +282,8 @@ void PluginHost::launch()
     try {
         const int jobs = scanJobs(m_scanJobs);
         m_launcher.run({m_scannerPath, effectsFolder() + QLatin1String(kScanListFile), effectsFolder(),
-                        m_probeLimit, [this] { WriteScanList(); }, jobs, memoryLimit(m_memoryLimit, jobs)});
+                        m_probeLimit, [this] { WriteScanList(); }, jobs, memoryLimit(m_memoryLimit, jobs),
+                        m_scannerEnvironment});
         if (!m_launcher.isCancelled())
             reloadChanged();
     } catch (const std::exception &error) {

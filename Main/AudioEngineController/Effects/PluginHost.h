@@ -82,8 +82,19 @@ public:
     const QString &effectsFolder() const { return catalogueFolder(); }
     /// The data folder plus "/Plugin Metadata".
     const QString &pluginMetadataFolder() const { return m_pluginMetadataFolder; }
-    /// Where the scanner program lies: beside this program.
+    /// Where the scanner program lies unless set: beside this program.
     static QString usualScannerPath();
+    /// Sets the full path of the scanner program; empty, the default: the usual one. Set while no launcher
+    /// runs.
+    void setScannerProgram(const QString &path) { m_scannerProgram = path; }
+    /// The program that the next launch starts.
+    QString scannerProgram() const;
+    /// Sets environment variables that launched scanners get besides those of this process. Set while no
+    /// launcher runs.
+    void setScannerEnvironment(const std::map<QString, QString> &variables)
+    {
+        m_scannerEnvironment = variables;
+    }
     /// Full path of the scanner program, known once a scan was asked for.
     const QString &scannerPath() const { return m_scannerPath; }
 
@@ -108,7 +119,9 @@ private:
 
     std::map<PluginFormat, std::unique_ptr<AudioPluginHost>> m_hosts; ///< one for each row of the table
     QString m_pluginMetadataFolder;
+    QString m_scannerProgram; ///< empty: the usual one
     QString m_scannerPath;
+    std::map<QString, QString> m_scannerEnvironment;
     std::unique_ptr<ManualResetEvent> m_completed;
     QStringList m_sortedCategoryNames;
     int m_instrumentPosition;

@@ -92,8 +92,13 @@ void ScannerLauncher::run(const Job &job)
 std::optional<ScannerRunEnd::How> ScannerLauncher::runOnce(const Job &job)
 {
     using How = ScannerRunEnd::How;
-    MarkerWatch watch(job.effectsFolder, qEnvironmentVariable("FXPROBE_REPORT"));
+    const auto report = job.environment.find(QStringLiteral("FXPROBE_REPORT"));
+    MarkerWatch watch(job.effectsFolder, report != job.environment.end()
+                                             ? report->second
+                                             : qEnvironmentVariable("FXPROBE_REPORT"));
     ScannerProcess scanner;
+    for (const auto &[variable, value] : job.environment)
+        scanner.setEnvironment(variable, value);
     scanner.setEnvironment("FXPROBE_JOBS", std::max(job.jobs, 0)); // whatever this process has
     if (job.jobs > 0) {
         scanner.setEnvironment("FXPROBE_PROBE_LIMIT", job.probeLimit);

@@ -8,6 +8,7 @@
 
 #include <atomic>
 #include <functional>
+#include <map>
 #include <mutex>
 #include <optional>
 #include <vector>
@@ -57,6 +58,7 @@ public:
         std::function<void()> writeScanList; ///< called before each run
         int jobs = 0;        ///< workers that the scanner has; 0: it probes in its own process
         int memoryLimit = 0; ///< MiB that a worker may hold; 0: any
+        std::map<QString, QString> environment = {}; ///< what the scanner gets besides this process's
     };
 
     /// Runs until a run leaves no marker, the runs are used up, or somebody cancels. On the thread that

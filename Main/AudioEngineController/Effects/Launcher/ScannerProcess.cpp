@@ -31,11 +31,16 @@ ScannerProcess::ScannerProcess()
 
 ScannerProcess::~ScannerProcess() { end(); }
 
-void ScannerProcess::setEnvironment(const char *variable, int value)
+void ScannerProcess::setEnvironment(const QString &variable, const QString &value)
 {
     QProcessEnvironment environment = m_child->processEnvironment();
-    environment.insert(QLatin1String(variable), QString::number(value));
+    environment.insert(variable, value);
     m_child->setProcessEnvironment(environment);
+}
+
+void ScannerProcess::setEnvironment(const char *variable, int value)
+{
+    setEnvironment(QString::fromLatin1(variable), QString::number(value));
 }
 
 bool ScannerProcess::start(const QString &program, const QStringList &arguments,

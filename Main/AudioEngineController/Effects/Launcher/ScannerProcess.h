@@ -22,6 +22,7 @@ public:
     ScannerProcess &operator=(const ScannerProcess &) = delete;
 
     /// Sets a variable of the scanner's environment, before it is started.
+    void setEnvironment(const QString &variable, const QString &value);
     void setEnvironment(const char *variable, int value);
     /// Starts the program with the system's environment. False when it does not start in time.
     bool start(const QString &program, const QStringList &arguments, std::chrono::milliseconds timeout);

@@ -1,0 +1,30 @@
+#pragma once
+
+#include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
+
+#include <QString>
+#include <QStringList>
+
+#include <memory>
+
+/// The Effects folder that this process scans into: made where it is not there, and kept from other
+/// workstations for as long as the object lives.
+class ScanPlace {
+public:
+    /// Waits up to five seconds for a scanner whose workstation was killed: its markers must not be taken for
+    /// crashes.
+    explicit ScanPlace(const QString &effectsFolder);
+
+    /// Why the folder cannot be used; empty when it can. One sentence without a full stop.
+    const QString &reason() const { return m_reason; }
+    /// False when the folder cannot be used.
+    explicit operator bool() const { return m_reason.isEmpty(); }
+
+    /// Writes the scan list; false, with the reason, when it cannot: an old list would be scanned.
+    bool writeList(const QStringList &folders);
+
+private:
+    QString m_effectsFolder;
+    std::unique_ptr<ScanLock> m_lock;
+    QString m_reason;
+};

@@ -1,0 +1,29 @@
+# The library for a workstation: one archive of all rooms that it needs, its headers, and a CMake package.
+include(CMakePackageConfigHelpers)
+
+# Where the headers lie in the tree. They are installed below include/FxProbe, the first ones right there.
+set(FXPROBE_FACE Workstation/Library/Scan.h)
+
+# Everything below the command line. The VST 3 SDK is in it: who links the library needs no SDK.
+set(rooms baselib vlib catalogue protocol plugin host busformats vstinterface vst vst3sdk vst3hostobjects vst3 effects
+    workstation_options workstation_summary workstation_library)
+list(TRANSFORM rooms REPLACE "(.+)" "$<TARGET_OBJECTS:\\1>" OUTPUT_VARIABLE objects)
+add_library(library STATIC ${objects})
+set_target_properties(library PROPERTIES OUTPUT_NAME fxprobe EXPORT_NAME FxProbe LINKER_LANGUAGE CXX)
+target_compile_features(library INTERFACE cxx_std_17)
+target_include_directories(library INTERFACE "$<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>")
+target_link_libraries(library PUBLIC Qt5::Core Threads::Threads PRIVATE FxProbe::pugixml ${CMAKE_DL_LIBS})
+if(WIN32)
+    target_link_libraries(library PRIVATE mpr ntdll ole32 winmm)
+endif()
+
+set(package_folder "${CMAKE_INSTALL_LIBDIR}/cmake/FxProbe")
+configure_package_config_file("${PROJECT_SOURCE_DIR}/cmake/FxProbeConfig.cmake.in" "${PROJECT_BINARY_DIR}/FxProbeConfig.cmake"
+    INSTALL_DESTINATION "${package_folder}" NO_SET_AND_CHECK_MACRO)
+# Until 1.0 any release may change what is declared.
+write_basic_package_version_file("${PROJECT_BINARY_DIR}/FxProbeConfigVersion.cmake" COMPATIBILITY SameMinorVersion)
+install(TARGETS library EXPORT FxProbeTargets ARCHIVE DESTINATION "${CMAKE_INSTALL_LIBDIR}" COMPONENT dev)
+install(EXPORT FxProbeTargets NAMESPACE FxProbe:: DESTINATION "${package_folder}" COMPONENT dev)
+install(FILES "${PROJECT_BINARY_DIR}/FxProbeConfig.cmake" "${PROJECT_BINARY_DIR}/FxProbeConfigVersion.cmake"
+    "${PROJECT_SOURCE_DIR}/cmake/Pugixml.cmake" DESTINATION "${package_folder}" COMPONENT dev)
+install(FILES ${FXPROBE_FACE} DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}/FxProbe" COMPONENT dev)
