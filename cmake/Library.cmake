@@ -27,3 +27,20 @@ install(EXPORT FxProbeTargets NAMESPACE FxProbe:: DESTINATION "${package_folder}
 install(FILES "${PROJECT_BINARY_DIR}/FxProbeConfig.cmake" "${PROJECT_BINARY_DIR}/FxProbeConfigVersion.cmake"
     "${PROJECT_SOURCE_DIR}/cmake/Pugixml.cmake" DESTINATION "${package_folder}" COMPONENT dev)
 install(FILES ${FXPROBE_FACE} DESTINATION "${CMAKE_INSTALL_INCLUDEDIR}/FxProbe" COMPONENT dev)
+
+# The pages that describe the headers. A public declaration without a comment is an error.
+find_package(Doxygen QUIET)
+if(DOXYGEN_FOUND)
+    set(DOXYGEN_OUTPUT_DIRECTORY "${PROJECT_BINARY_DIR}/api")
+    set(DOXYGEN_HTML_OUTPUT .)
+    set(DOXYGEN_USE_MDFILE_AS_MAINPAGE "${PROJECT_SOURCE_DIR}/docs/api.md")
+    set(DOXYGEN_EXAMPLE_PATH "${PROJECT_SOURCE_DIR}/examples")
+    set(DOXYGEN_STRIP_FROM_INC_PATH "${PROJECT_SOURCE_DIR}/Workstation/Library")
+    set(DOXYGEN_EXTRACT_ALL NO)
+    set(DOXYGEN_WARN_AS_ERROR FAIL_ON_WARNINGS)
+    set(DOXYGEN_JAVADOC_AUTOBRIEF YES)
+    set(DOXYGEN_HAVE_DOT NO)
+    set(DOXYGEN_QUIET YES)
+    list(TRANSFORM FXPROBE_FACE PREPEND "${PROJECT_SOURCE_DIR}/" OUTPUT_VARIABLE documented)
+    doxygen_add_docs(api ${documented} "${PROJECT_SOURCE_DIR}/docs/api.md")
+endif()
