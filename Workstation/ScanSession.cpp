@@ -38,9 +38,8 @@ QString keysInWords(const ScanOptions &options, const TerminalKeys &keys)
 } // namespace
 
 ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report)
-    : m_options(options)
-    , m_registry(registry)
-    , m_account(report)
+    : ScanRun(registry, report)
+    , m_options(options)
     , m_progress(options.quiet, options.inProcess ? 0 : options.timeout, keysInWords(options, m_keys))
 {
     TerminationSignal::install();
@@ -52,47 +51,21 @@ ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const
 bool ScanSession::run()
 {
     const auto endLine = qScopeGuard([this] { m_progress.end(); });
-    // A launch is over after so many runs. Where it got on, the next one goes on; a plug-in that ends the
-    // scanner although it was blamed before would do so for ever.
-    while (!scanOnce())
-        if (m_cancelled || !m_hasNewCulprit)
-            return false;
-    return true;
+    return ScanRun::run();
 }
 
-/// True when the scan came to its end.
-bool ScanSession::scanOnce()
+void ScanSession::scanOnce()
 {
-    m_ends = 0;
-    m_hasNewCulprit = false;
-    m_reason.clear();
-    if (m_options.inProcess) {
-        scanHere();
-    } else {
-        m_registry.Scan(true, false);
-        waitForLauncher();
+    if (!m_options.inProcess) {
+        ScanRun::scanOnce();
+        return;
     }
-    m_account.update();
-    if (m_account.isFinished() && !m_cancelled)
-        return true;
-    if (m_cancelled && m_reason.isEmpty())
-        m_reason = QStringLiteral("the scan was cancelled; what was found until then is kept");
-    else if (m_account.isBusy())
-        m_reason = QStringLiteral("another scanner is at work on the same folder");
-    else if (m_reason.isEmpty())
-        m_reason = m_account.problems().value(
-            0, QStringLiteral("the scanner did not write its last catalogue; see its log"));
-    return false;
-}
-
-void ScanSession::scanHere()
-{
     Terminal::keepOutputForResult();
     s_isScanningHere = true;
     std::atexit(leaveUnfinished);
     std::atomic<bool> isDone{false};
     std::thread worker([&] {
-        m_registry.Scan(true, true);
+        registry().Scan(true, true);
         ProbeReport::instance().finish();
         isDone = true;
     });
@@ -107,29 +80,16 @@ void ScanSession::scanHere()
 /// Nobody else can end a plug-in that does not return.
 void ScanSession::endOverdueProbe() const
 {
-    if (m_cancelled && m_sinceCancel.hasExpired(kPatience))
+    if (isCancelled() && m_sinceCancel.hasExpired(kPatience))
         CrashMarker::abandonAll([] { leaveProcess(ScanExit::kNotFinished); });
 }
 
-void ScanSession::waitForLauncher()
+/// Waits a moment, and passes on what asks us to end.
+void ScanSession::wait()
 {
-    while (m_registry.isLauncherRunning()) {
-        look();
-        takeEnds();
-    }
-    takeEnds();
-}
-
-/// Waits a moment, looks at the report, and passes on what asks us to end.
-void ScanSession::look()
-{
-    if (TerminationSignal::wait(kLook)) {
-        m_progress.say(QStringLiteral("Cancelling"));
-        cancel();
-    }
+    if (TerminationSignal::wait(kLook))
+        cancelForUser();
     takeKeys();
-    m_account.update();
-    m_progress.show(m_account);
 }
 
 void ScanSession::takeKeys()
@@ -139,8 +99,7 @@ void ScanSession::takeKeys()
         skip();
         break;
     case 'q':
-        m_progress.say(QStringLiteral("Cancelling"));
-        cancel();
+        cancelForUser();
         break;
     default:
         break;
@@ -150,7 +109,7 @@ void ScanSession::takeKeys()
 /// Gives up on the plug-in that has been at work for the longest.
 void ScanSession::skip()
 {
-    const PluginKey *plugin = m_account.current();
+    const PluginKey *plugin = account().current();
     if (!plugin)
         return;
     if (m_options.inProcess) {
@@ -158,37 +117,18 @@ void ScanSession::skip()
         return;
     }
     m_progress.say(QStringLiteral("Skipping %1").arg(plugin->path));
-    m_registry.skipProbe(plugin->path);
+    registry().skipProbe(plugin->path);
 }
 
-void ScanSession::cancel()
+void ScanSession::cancelForUser()
 {
-    if (!m_cancelled)
+    m_progress.say(QStringLiteral("Cancelling"));
+    if (!isCancelled())
         m_sinceCancel.start();
-    m_cancelled = true;
-    m_registry.cancelScan();
+    cancel();
 }
 
-void ScanSession::takeEnds()
+void ScanSession::culpritFound(const ScanCulprit &culprit)
 {
-    const std::vector<ScannerRunEnd> ends = m_registry.scannerEnds();
-    for (; m_ends < ends.size(); ++m_ends)
-        takeEnd(ends[m_ends]);
-}
-
-void ScanSession::takeEnd(const ScannerRunEnd &end)
-{
-    m_account.scannerEnded(end);
-    for (const ScanCulprit &culprit : end.culprits) {
-        m_hasNewCulprit |= m_blamed.insert(pluginKey(culprit)).second;
-        m_progress.say(QStringLiteral("%1: %2").arg(culprit.plugin.path, culprit.reason));
-    }
-    if (end.how == ScannerRunEnd::How::NotStarted) {
-        m_reason =
-            QStringLiteral("the scanner %1 could not be started: %2").arg(m_registry.scannerPath(), end.text);
-        cancel(); // nothing else would end the launcher
-    } else if (end.how != ScannerRunEnd::How::Skipped && end.how != ScannerRunEnd::How::Cancelled &&
-               end.culprits.empty() && (end.how != ScannerRunEnd::How::Exited || end.code != 0)) {
-        m_reason = QStringLiteral("the scanner did not finish: ") + end.description();
-    }
+    m_progress.say(QStringLiteral("%1: %2").arg(culprit.plugin.path, culprit.reason));
 }

@@ -25,26 +25,25 @@ public:
     {}
 
 protected:
-    void look(ScanAccount &account) override
+    void wait() override
     {
         constexpr std::chrono::milliseconds kPause(50);
-        show(account);
+        std::this_thread::sleep_for(kPause);
         if (!isCancelled() && m_settings.isCancelled && m_settings.isCancelled())
             cancel();
-        std::this_thread::sleep_for(kPause);
     }
-
-private:
-    void show(const ScanAccount &account)
+    void show(ScanAccount &account) override
     {
         FxProbe::Progress progress;
         progress.done = account.done();
         progress.planned = account.planned();
-        if (const PluginKey *key = account.current()) {
-            const ProbeAccount *probe = account.find(*key);
-            progress.path = key->path;
-            progress.name = probe && !probe->subName.isEmpty() ? probe->subName : fileNameOf(key->path);
-        }
+        if (const std::vector<PluginKey> begun = account.takeBegun(); !begun.empty())
+            m_last = begun.back();
+        if (const PluginKey *key = account.current())
+            m_last = *key;
+        const ProbeAccount *probe = account.find(m_last);
+        progress.path = m_last.path;
+        progress.name = probe && !probe->subName.isEmpty() ? probe->subName : fileNameOf(m_last.path);
         const bool isSame = progress.done == m_shown.done && progress.planned == m_shown.planned &&
                             progress.path == m_shown.path && progress.name == m_shown.name;
         if (isSame || !m_settings.progress)
@@ -53,8 +52,10 @@ private:
         m_settings.progress(progress);
     }
 
+private:
     const FxProbe::ScanSettings &m_settings;
     FxProbe::Progress m_shown;
+    PluginKey m_last; ///< what was shown
 };
 
 FxProbe::Plugin describe(const CataloguedPlugin &plugin)

@@ -37,7 +37,7 @@ struct Plugin {
 struct Progress {
     int done = 0;    ///< files dealt with
     int planned = 0; ///< files to deal with; 0 until the folders were searched, and it grows with each format
-    QString path;    ///< the file that has been at work for the longest; empty when there is none
+    QString path;    ///< the file that has been at work for the longest; when none is, the last one
     QString name;    ///< name of that file, or of the sub-plug-in in it
 };
 

@@ -25,6 +25,7 @@ bool ScanRun::isDoneAfterOnce()
     m_reason.clear();
     scanOnce();
     m_account.update();
+    show(m_account);
     if (m_account.isFinished() && !m_cancelled)
         return true;
     if (m_cancelled && m_reason.isEmpty())
@@ -41,16 +42,17 @@ void ScanRun::scanOnce()
 {
     m_registry.Scan(true, false);
     while (m_registry.isLauncherRunning()) {
-        lookAgain();
+        look();
         takeEnds();
     }
     takeEnds();
 }
 
-void ScanRun::lookAgain()
+void ScanRun::look()
 {
+    wait();
     m_account.update();
-    look(m_account);
+    show(m_account);
 }
 
 void ScanRun::cancel()
@@ -77,7 +79,8 @@ void ScanRun::takeEnd(const ScannerRunEnd &end)
         m_reason =
             QStringLiteral("the scanner %1 could not be started: %2").arg(m_registry.scannerPath(), end.text);
         cancel(); // nothing else would end the launcher
-    } else if (end.culprits.empty() && (end.how != ScannerRunEnd::How::Exited || end.code != 0)) {
+    } else if (end.how != ScannerRunEnd::How::Skipped && end.how != ScannerRunEnd::How::Cancelled &&
+               end.culprits.empty() && (end.how != ScannerRunEnd::How::Exited || end.code != 0)) {
         m_reason = QStringLiteral("the scanner did not finish: ") + end.description();
     }
 }

@@ -26,8 +26,10 @@ public:
     const ScanAccount &account() const { return m_account; }
 
 protected:
-    /// Called all the while: waits for a moment, and shows how the scan gets on. May cancel it.
-    virtual void look(ScanAccount &account) = 0;
+    /// Called all the while: waits for a moment. May cancel the scan.
+    virtual void wait() = 0;
+    /// Called after each wait: shows how the scan gets on.
+    virtual void show(ScanAccount &account) = 0;
     /// A plug-in ended a scanner.
     virtual void culpritFound(const ScanCulprit & /*culprit*/) {}
     /// Scans once, until no scanner is at work any more.
@@ -37,8 +39,8 @@ protected:
     void cancel();
     bool isCancelled() const { return m_cancelled; }
     PluginHost &registry() const { return m_registry; }
-    /// Takes in what was reported since the last call, and looks.
-    void lookAgain();
+    /// Waits, takes in what was reported meanwhile, and shows it.
+    void look();
 
 private:
     bool isDoneAfterOnce();
