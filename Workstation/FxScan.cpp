@@ -8,10 +8,10 @@
 #include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
 #include "Main/VLib/ApplicationContext.h"
 #include "Workstation/Forget.h"
+#include "Workstation/ManageCommands.h"
 #include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
-#include "Workstation/Retry.h"
 #include "Workstation/ScanSession.h"
 
 #include <QDeadlineTimer>
@@ -37,10 +37,7 @@ struct DataFiles {
     QString report;
 };
 
-void complain(const QString &text)
-{
-    Terminal::printError(QStringLiteral("fxscan: %1\n").arg(Terminal::harmless(text)));
-}
+using Terminal::complain;
 
 /// Puts the variable into the environment with a file of our own, begun anew, unless the user has set it:
 /// what that names is appended to.
@@ -65,7 +62,7 @@ void prepareEnvironment(const ScanOptions &options, const DataFiles &files)
 /// listed.
 QStringList foldersToScan(const ScanOptions &options, const DataFiles &files)
 {
-    if (options.folders.isEmpty() && options.isRetry())
+    if (options.folders.isEmpty() && options.asksAgain())
         if (const QStringList last =
                 settleFolders(ReadScanList(files.effects + QLatin1String(kScanListFile)).folders).folders;
             !last.isEmpty())
@@ -107,10 +104,6 @@ int conclude(const ScanOptions &options, const ScanSummary &summary, const QStri
 
 int listOnly(const ScanOptions &options, const DataFiles &files)
 {
-    if (!QFileInfo(files.effects).isDir()) {
-        complain(QStringLiteral("nothing was scanned into %1 yet").arg(options.dataFolder));
-        return ScanExit::kUsage;
-    }
     return conclude(options, summariseCatalogue(readCatalogues(files.effects), ProbeMemory(files.effects)),
                     {});
 }
@@ -121,21 +114,6 @@ int printUsualFolders()
     for (const QString &folder : existingUsualFolders())
         lines += folder + QLatin1Char('\n');
     return Terminal::printData(lines) ? ScanExit::kDone : ScanExit::kNotFinished;
-}
-
-/// Gives plug-ins another chance; the exit code when that cannot be done.
-int retry(const ScanOptions &options, const QStringList &folders, PluginHost &registry,
-          const DataFiles &files)
-{
-    registry.ReadCatalogue(); // absorbs the markers: the newest crash may be the one that is meant
-    const RetryOutcome outcome = retryPlugins(files.effects, options.retry, folders);
-    for (const QString &name : outcome.unknown)
-        complain(QStringLiteral("no disabled or failed plug-in is named '%1'").arg(name));
-    if (!outcome.written)
-        complain(QStringLiteral("cannot write ") + outcome.written.reason);
-    return !outcome.unknown.isEmpty() ? ScanExit::kUsage
-           : !outcome.written         ? ScanExit::kNotFinished
-                                      : ScanExit::kDone;
 }
 
 int forget(const ScanOptions &options, const DataFiles &files)
@@ -163,8 +141,8 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
         complain(QStringLiteral("cannot write the scan list %1: %2").arg(list, written.reason));
         return ScanExit::kNotFinished;
     }
-    if (options.isRetry())
-        if (const int failed = retry(options, folders, registry, files); failed != ScanExit::kDone)
+    if (options.asksAgain())
+        if (const int failed = prepareAskAgain(options, folders, registry); failed != ScanExit::kDone)
             return failed;
     if (options.inProcess)
         ProbeReport::instance().openFromEnvironment();
@@ -192,23 +170,46 @@ bool waitForScanner(const QString &effectsFolder)
     return true;
 }
 
-} // namespace
-
-int runFxScan(const ScanOptions &options)
+/// Says so when another workstation, or a scanner, is at work on the folder.
+bool isBusy(const ScanLock &lock, const DataFiles &files)
 {
-    if (options.foldersOnly)
-        return printUsualFolders();
-    const DataFiles files(options.dataFolder);
-    if (options.listOnly)
-        return listOnly(options, files);
-    const QStringList folders = options.forget.isEmpty() ? foldersToScan(options, files) : QStringList();
-    if (folders.isEmpty() && options.forget.isEmpty()) {
+    if (!lock.isHeldByOther() && waitForScanner(files.effects))
+        return false;
+    complain(QStringLiteral("another scan is at work on %1 (%2)")
+                 .arg(files.effects, ScanLock::holder(files.effects)));
+    return true;
+}
+
+bool isScanned(const ScanOptions &options, const DataFiles &files)
+{
+    if (QFileInfo(files.effects).isDir())
+        return true;
+    complain(QStringLiteral("nothing was scanned into %1 yet").arg(options.dataFolder));
+    return false;
+}
+
+/// What changes the catalogues without a scan.
+int edit(const ScanOptions &options, const DataFiles &files)
+{
+    const ScanLock lock(files.effects, ScanLock::Role::Workstation);
+    if (isBusy(lock, files))
+        return ScanExit::kNotFinished;
+    const ScanLock scanner(files.effects); // a workstation of another kind may start one
+    if (scanner.isHeldByOther() && isBusy(scanner, files))
+        return ScanExit::kNotFinished;
+    return options.changesMarks() ? changeMarks(options, files.effects) : forget(options, files);
+}
+
+int prepareAndScan(const ScanOptions &options, const DataFiles &files)
+{
+    const QStringList folders = foldersToScan(options, files);
+    if (folders.isEmpty()) {
         complain(options.folders.isEmpty()
                      ? QStringLiteral("none of the usual plug-in folders exists; name one")
                      : QStringLiteral("none of the folders given can be scanned"));
         return ScanExit::kUsage;
     }
-    if (options.forget.isEmpty() && !options.inProcess && !QFile::exists(PluginHost::usualScannerPath())) {
+    if (!options.inProcess && !QFile::exists(PluginHost::usualScannerPath())) {
         complain(QStringLiteral("there is no scanner program %1; --in-process does without")
                      .arg(PluginHost::usualScannerPath()));
         return ScanExit::kNotFinished;
@@ -218,13 +219,8 @@ int runFxScan(const ScanOptions &options)
         return ScanExit::kNotFinished;
     }
     const ScanLock lock(files.effects, ScanLock::Role::Workstation);
-    if (lock.isHeldByOther() || !waitForScanner(files.effects)) {
-        complain(QStringLiteral("another scan is at work on %1 (%2)")
-                     .arg(files.effects, ScanLock::holder(files.effects)));
+    if (isBusy(lock, files))
         return ScanExit::kNotFinished;
-    }
-    if (!options.forget.isEmpty())
-        return forget(options, files);
     std::unique_ptr<ScanLock> ownScanner;
     if (options.inProcess)
         ownScanner = std::make_unique<ScanLock>(files.effects);
@@ -234,4 +230,19 @@ int runFxScan(const ScanOptions &options)
         return ScanExit::kUsage;
     }
     return scan(options, files, folders);
+}
+
+} // namespace
+
+int runFxScan(const ScanOptions &options)
+{
+    if (options.foldersOnly)
+        return printUsualFolders();
+    const DataFiles files(options.dataFolder);
+    const bool isEdit = options.changesMarks() || !options.forget.isEmpty();
+    if ((isEdit || options.listOnly) && !isScanned(options, files))
+        return ScanExit::kUsage;
+    if (options.listOnly)
+        return listOnly(options, files);
+    return isEdit ? edit(options, files) : prepareAndScan(options, files);
 }

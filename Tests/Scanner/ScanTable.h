@@ -3,7 +3,7 @@
 #include "Tests/Support/PlatformValues.h"
 #include "Tests/Support/ScanBench.h"
 #include "Tests/Support/VST2Fixture.h"
-#include "Workstation/Retry.h"
+#include "Workstation/Manage/AskAgain.h"
 
 #include <QDir>
 #include <QFile>
@@ -94,7 +94,8 @@ private:
             {"readable", [&] { EXPECT_TRUE(QFile::permissions(m_folder.path(file)) & QFile::ReadOther); }},
             {"closed",
              [&] { EXPECT_EQ(traceOf(file).filter(QRegularExpression("^close|destr")).join(", "), text); }},
-            {"retry", [&] { EXPECT_TRUE(retryPlugins(m_folder.effects(), {file}, {}).unknown.isEmpty()); }},
+            {"retry",
+             [&] { EXPECT_EQ(askAgain(m_folder.effects(), {{file}}, {}, {}).wrong, QStringList()); }},
             {"exit", [&] { EXPECT_EQ(m_last.exitCode, file.toInt()); }},
             {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
             {"mark", [&] { each([this](const QString &one) { markAsUser(one); }); }},

@@ -86,6 +86,10 @@ const std::vector<OptionRow> &optionTable()
     static const std::vector<OptionRow> rows = {
         {"data-folder", "folder", &ScanOptions::dataFolder,
          "Keep the catalogues in the folder Effects of this folder."},
+        {"favourite", "name", &ScanOptions::favourite,
+         "Mark a plug-in as a favourite; its name, its file's name (all plug-ins in it) or its path. Can be "
+         "given several times.",
+         "Makes no scan. Where several files have plug-ins of that name, give the path."},
         {"folders", "", &ScanOptions::foldersOnly,
          "Print the usual plug-in folders that exist, one a line, without a scan."},
         {"forget", "folder", &ScanOptions::forget,
@@ -108,40 +112,67 @@ const std::vector<OptionRow> &optionTable()
          "Give up on a plug-in that takes more memory than this; 0 (the default): half of the machine's, "
          "divided "
          "by the number of jobs."},
+        {"no-favourite", "name", &ScanOptions::noFavourite, "Take the mark of a favourite away."},
         {"quiet", "", &ScanOptions::quiet, "Show no progress."},
+        {"rescan", "name", &ScanOptions::rescan,
+         "Probe a plug-in again although its file did not change. Can be given several times.",
+         "Categories and favourites are kept. One that is disabled needs --retry."},
+        {"rescan-all", "", &ScanOptions::rescanAll,
+         "Probe all plug-ins again, but for those that are disabled or switched off.",
+         "With --retry-failed those that are disabled as well."},
         {"retry", "name", &ScanOptions::retry,
          "Probe a plug-in again that is disabled or does not work; its name, its file's name or its path. "
          "Can be given several times.",
-         "Without a folder the folders of the last scan are scanned. What the user switched off stays so; "
-         "categories and favourites are kept."},
+         "Where several files have plug-ins of that name, give the path. Without a folder the folders of "
+         "the last scan are scanned. What the user switched off stays so; categories and favourites are "
+         "kept."},
+        {"retry-changed", "", &ScanOptions::retryChanged,
+         "Probe those again that are disabled and whose file changed since, and those that lacked a library "
+         "which is there now."},
         {"retry-failed", "", &ScanOptions::retryFailed,
          "Probe all plug-ins again that are disabled or do not work."},
         {"show-window", "", &ScanOptions::showWindow, "Let the scanner show its window."},
         {"strict", "", &ScanOptions::strict, "Exit with 1 when a plug-in cannot be used."},
+        {"switch-off", "name", &ScanOptions::switchOff,
+         "Switch a plug-in off: it stays in the catalogue, but the workstation does not offer it. Can be "
+         "given several times.",
+         "Makes no scan. The name of a file means all plug-ins in it."},
+        {"switch-on", "name", &ScanOptions::switchOn, "Switch a plug-in on again."},
         {"timeout", "seconds", NumberTarget{&ScanOptions::timeout, 0, 86400, "seconds"},
          "Give up on a plug-in that does not answer for this many seconds (default 60); 0: never."},
     };
     return rows;
 }
 
+const std::vector<const char *> &optionsWithoutScan()
+{
+    static const std::vector<const char *> names = {"folders",   "forget",    "list",        "switch-off",
+                                                    "switch-on", "favourite", "no-favourite"};
+    return names;
+}
+
 const std::vector<OptionConflict> &optionConflicts()
 {
-    static const std::vector<OptionConflict> conflicts = {
-        {"folders", "list", "--folders makes no scan"},
-        {"folders", "retry", "--folders makes no scan"},
-        {"folders", "retry-failed", "--folders makes no scan"},
-        {"forget", "folders", "--folders changes nothing"},
-        {"forget", "list", "--list changes nothing"},
-        {"forget", "retry", "--forget makes no scan"},
-        {"forget", "retry-failed", "--forget makes no scan"},
-        {"list", "retry", "--list makes no scan"},
-        {"list", "retry-failed", "--list makes no scan"},
-        {"list", "in-process", "--list makes no scan"},
-        {"in-process", "jobs", "--in-process probes one plug-in after the other"},
-        {"in-process", "memory-limit", "--in-process cannot end a plug-in that takes too much"},
-        {"in-process", "timeout", "--in-process cannot end a plug-in that hangs"},
-        {"in-process", "show-window", "--in-process has no window"},
-    };
+    static const std::vector<OptionConflict> conflicts = [] {
+        std::vector<OptionConflict> all = {
+            {"in-process", "jobs", "--in-process probes one plug-in after the other"},
+            {"in-process", "memory-limit", "--in-process cannot end a plug-in that takes too much"},
+            {"in-process", "timeout", "--in-process cannot end a plug-in that hangs"},
+            {"in-process", "show-window", "--in-process has no window"},
+        };
+        for (const char *option : optionsWithoutScan()) {
+            const QString reason = QStringLiteral("--%1 makes no scan").arg(QLatin1String(option));
+            for (const char *ofScan :
+                 {"retry", "retry-changed", "retry-failed", "rescan", "rescan-all", "in-process"})
+                all.push_back({option, ofScan, reason});
+        }
+        for (const char *first : {"folders", "forget", "list"})
+            for (const char *other : optionsWithoutScan())
+                if (qstrcmp(first, other) != 0)
+                    all.push_back(
+                        {first, other, QStringLiteral("--%1 stands alone").arg(QLatin1String(first))});
+        return all;
+    }();
     return conflicts;
 }
 

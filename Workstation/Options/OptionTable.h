@@ -42,12 +42,14 @@ struct OptionRow {
 struct OptionConflict {
     const char *option;
     const char *other;
-    const char *reason; ///< the beginning of the message
+    QString reason; ///< the beginning of the message
 };
 
 /// All options but `--help` and `--version`, in the order in which they are shown.
 const std::vector<OptionRow> &optionTable();
 const std::vector<OptionConflict> &optionConflicts();
+/// The options that do something else than a scan. They take no folders to scan.
+const std::vector<const char *> &optionsWithoutScan();
 
 /// The table for a `QCommandLineParser`.
 QList<QCommandLineOption> commandLineOptions();

@@ -28,11 +28,12 @@ QString checkTogether(const QCommandLineParser &parser)
         if (parser.isSet(QString::fromLatin1(conflict.option)) &&
             parser.isSet(QString::fromLatin1(conflict.other)))
             return QStringLiteral("%1; it cannot be combined with --%2")
-                .arg(QLatin1String(conflict.reason), QLatin1String(conflict.other));
-    for (const QString &option :
-         {QStringLiteral("folders"), QStringLiteral("forget"), QStringLiteral("list")})
+                .arg(conflict.reason, QLatin1String(conflict.other));
+    for (const char *name : optionsWithoutScan()) {
+        const QString option = QString::fromLatin1(name);
         if (parser.isSet(option) && !parser.positionalArguments().isEmpty())
             return QStringLiteral("--%1 makes no scan; it takes no folders").arg(option);
+    }
     return QString();
 }
 

@@ -18,12 +18,19 @@ struct ScanOptions {
     QStringList folders; ///< as given; none: the usual ones
     QString dataFolder;  ///< absolute, without a separator at its end
     OutputFormat format = OutputFormat::Table;
-    QString forget;           ///< folder whose plug-ins are dropped from the catalogues; empty: none
-    QStringList retry;        ///< names or paths of plug-ins that get another chance
-    bool retryFailed = false; ///< all of them
-    int jobs = 0;             ///< plug-ins probed at once; 0: as many as suit the machine
-    int memoryLimit = 0;      ///< MiB that a plug-in may take; 0: a share of the machine's
-    int timeout = 60;         ///< seconds that one plug-in may take; 0: for ever
+    QString forget;            ///< folder whose plug-ins are dropped from the catalogues; empty: none
+    QStringList retry;         ///< names or paths of plug-ins that get another chance
+    bool retryFailed = false;  ///< all of them
+    bool retryChanged = false; ///< those of them that may work now
+    QStringList rescan;        ///< names or paths of plug-ins that are asked although they did not change
+    bool rescanAll = false;
+    QStringList switchOff; ///< names or paths of plug-ins whose marks change
+    QStringList switchOn;
+    QStringList favourite;
+    QStringList noFavourite;
+    int jobs = 0;        ///< plug-ins probed at once; 0: as many as suit the machine
+    int memoryLimit = 0; ///< MiB that a plug-in may take; 0: a share of the machine's
+    int timeout = 60;    ///< seconds that one plug-in may take; 0: for ever
     bool listOnly = false;
     bool foldersOnly = false; ///< prints the usual folders, and nothing else
     bool inProcess = false;
@@ -31,7 +38,15 @@ struct ScanOptions {
     bool showWindow = false;
     bool strict = false;
 
-    bool isRetry() const { return retryFailed || !retry.isEmpty(); }
+    /// Plug-ins are asked that a scan leaves alone otherwise.
+    bool asksAgain() const
+    {
+        return retryFailed || retryChanged || rescanAll || !retry.isEmpty() || !rescan.isEmpty();
+    }
+    bool changesMarks() const
+    {
+        return !(switchOff.isEmpty() && switchOn.isEmpty() && favourite.isEmpty() && noFavourite.isEmpty());
+    }
 };
 
 /// A command line, read.

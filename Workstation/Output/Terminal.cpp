@@ -55,6 +55,14 @@ bool Terminal::print(const QString &text) { return write(s_result, text); }
 
 bool Terminal::printError(const QString &text) { return write(stderr, text); }
 
+void Terminal::complain(const QString &text)
+{
+    QStringList lines = text.split(QLatin1Char('\n'));
+    for (QString &line : lines)
+        line = harmless(line);
+    printError(QStringLiteral("fxscan: %1\n").arg(lines.join(QLatin1Char('\n'))));
+}
+
 bool Terminal::outputIsTerminal() { return TerminalStream::isTerminal(s_result); }
 
 void Terminal::keepOutputForResult()

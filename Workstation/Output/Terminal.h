@@ -9,6 +9,8 @@ namespace Terminal {
 /// could not be written.
 bool print(const QString &text);
 bool printError(const QString &text);
+/// Says on the error output what is wrong, after the program's name.
+void complain(const QString &text);
 /// The same as `print` for data whose texts come from plug-ins: on a terminal they must not steer it.
 bool printData(const QString &text);
 /// True when the error output is a terminal that understands the usual control sequences.

@@ -30,8 +30,8 @@ public:
     {
         lookAt(path);
         if (!m_missing.isEmpty())
-            return QStringLiteral("it needs %1, which %2 not installed")
-                .arg(inWords(m_missing),
+            return QStringLiteral("%1%2, which %3 not installed")
+                .arg(QLatin1String(kNeedsLibrary), inWords(m_missing),
                      m_missing.size() == 1 ? QStringLiteral("is") : QStringLiteral("are"));
         return m_unusable;
     }
@@ -62,7 +62,8 @@ private:
         if (library.verdict == ModuleInspection::Verdict::Loadable)
             lookAt(path);
         else if (m_unusable.isEmpty())
-            m_unusable = QStringLiteral("it needs %1, and ").arg(name) + library.reason;
+            m_unusable =
+                QStringLiteral("%1%2, and %3").arg(QLatin1String(kNeedsLibrary), name, library.reason);
     }
 
     const LibrarySearch &m_search;

@@ -9,6 +9,9 @@
 /// when the loader would find nothing; an empty path when it is there and known to load.
 using LibrarySearch = std::function<std::optional<QString>(const QString &name)>;
 
+/// How every text of `whyNotLoadable` begins.
+inline constexpr char kNeedsLibrary[] = "it needs ";
+
 /// Tells why the loader refuses a library that is built for this machine, which its own message does not say
 /// or only in part: libraries that it needs, or that those need, are not there or not for this machine. "it
 /// needs drums.dll and bass.dll, which are not installed". Empty when nothing of this kind is wrong.

@@ -41,6 +41,8 @@ public:
     static QString fileEnding();
     /// Whether a library is mapped into this process that lies at the path, or in the bundle there.
     static bool isMapped(const QString &path);
+    /// Whether all libraries that one needs are there and can be loaded; nothing is loaded to find out.
+    static bool hasNeededLibraries(const QString &path);
     /// Whether a file exists at the path.
     static bool exists(const QString &path);
 

@@ -45,4 +45,9 @@ bool PluginLibrary::isMapped(const QString &path)
     return dl_iterate_phdr(isWanted, &wanted) != 0;
 }
 
+bool PluginLibrary::hasNeededLibraries(const QString &path)
+{
+    return whyNotLoadable(path, importSearch(path)).isEmpty();
+}
+
 QString PluginLibrary::fileEnding() { return QStringLiteral(".so"); }

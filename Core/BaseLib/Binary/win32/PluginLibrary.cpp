@@ -70,4 +70,9 @@ bool PluginLibrary::isMapped(const QString &path)
     });
 }
 
+bool PluginLibrary::hasNeededLibraries(const QString &path)
+{
+    return whyNotLoadable(path, importSearch(QFileInfo(path).path())).isEmpty();
+}
+
 QString PluginLibrary::fileEnding() { return QStringLiteral(".dll"); }

@@ -59,6 +59,11 @@ public:
     /// A copy of the effect list's records, in the order of their identifiers.
     virtual std::vector<EffectRecord> effects() const { return {}; }
 
+    /// The time stamp of the file that an update of the module replaces; empty when there is no such module.
+    virtual QString moduleTime(const QString & /*path*/) const { return QString(); }
+    /// The program library that the system loads for a module; empty when there is none.
+    virtual QString moduleLibrary(const QString &path) const { return path; }
+
     /// What asks the format's modules; null for a format without any.
     virtual std::unique_ptr<IPluginProbe> makeProbe() const { return nullptr; }
 

@@ -103,8 +103,7 @@ public:
         // In a bundle, whole or not, lie modules of the bundle's format.
         return !path.contains(QLatin1String(".vst3/"), Qt::CaseInsensitive);
     }
-    /// The time stamp of the file that an update of the module replaces; empty when there is no such module.
-    virtual QString moduleTime(const QString &path) const;
+    QString moduleTime(const QString &path) const override;
     /// The folder in which a module lies: that of its bundle, if it is inside one.
     virtual QString moduleFolder(const QString &path) const;
     /// What a user reads while it is probed.

@@ -14,6 +14,12 @@ bool VST3Host::isModule(const QString &path) const { return VST3ModuleFile::isMo
 
 QString VST3Host::moduleTime(const QString &path) const { return VST3ModuleFile::fileTime(path); }
 
+QString VST3Host::moduleLibrary(const QString &path) const
+{
+    QString reason;
+    return VST3ModuleFile::binary(path, reason);
+}
+
 QString VST3Host::moduleFolder(const QString &path) const
 {
     const QString bundle = bundleOf(path);

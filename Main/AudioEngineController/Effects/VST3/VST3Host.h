@@ -11,6 +11,7 @@ public:
 
     bool isModule(const QString &path) const override;
     QString moduleTime(const QString &path) const override;
+    QString moduleLibrary(const QString &path) const override;
     QString moduleFolder(const QString &path) const override;
     QString displayName(const QString &path) const override;
     bool probesInPathOrder() const override { return false; }
