@@ -31,8 +31,10 @@ endforeach()
 
 set(options -G "${GENERATOR}" -DCMAKE_BUILD_TYPE=Release "-DCMAKE_PREFIX_PATH=${folder}/prefix")
 if(TOOLCHAIN)
+    # The toolchain looks for packages below its own folders only.
+    file(GLOB package "${folder}/prefix/*/cmake/FxProbe")
     list(APPEND options "-DCMAKE_TOOLCHAIN_FILE=${TOOLCHAIN}" "-DFXPROBE_WINDOWS_PREFIX=${WINDOWS_PREFIX}"
-         "-DCMAKE_FIND_ROOT_PATH=${folder}/prefix")
+         "-DFxProbe_DIR=${package}")
 endif()
 run("Configuring the example" "${CMAKE_COMMAND}" -S "${SOURCE_FOLDER}/examples/scan" -B "${folder}/example" ${options})
 run("Building the example" "${CMAKE_COMMAND}" --build "${folder}/example")

@@ -17,8 +17,8 @@ struct Plugin {
     QString name;   ///< display name
     QString vendor; ///< as the plug-in states it; may be empty
     QString format; ///< "vst3" or "vst2", the key of `PluginFormatInfo`
-    /// With the prefix of its format, as `PluginHost::LoadPlugin` takes it. Empty where the plug-in cannot be
-    /// loaded.
+    /// With the prefix of its format ("vst3:", "vst2:"); tells it from all others. Empty where the plug-in
+    /// cannot be used.
     QString identifier;
     QString path;             ///< full path of the module's file, with "/"
     quint32 subId = 0;        ///< identifier of a sub-plug-in in the shell at `path`; 0: it is not one
