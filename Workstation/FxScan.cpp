@@ -5,22 +5,17 @@
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
-#include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
 #include "Main/VLib/ApplicationContext.h"
 #include "Workstation/Forget.h"
+#include "Workstation/Library/ScanPlace.h"
 #include "Workstation/ManageCommands.h"
 #include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
 #include "Workstation/ScanSession.h"
 
-#include <QDeadlineTimer>
-#include <QDir>
 #include <QFile>
 #include <QFileInfo>
-#include <QThread>
-
-#include <memory>
 
 namespace {
 
@@ -127,7 +122,7 @@ int forget(const ScanOptions &options, const DataFiles &files)
     return outcome.written ? ScanExit::kDone : ScanExit::kNotFinished;
 }
 
-int scan(const ScanOptions &options, const DataFiles &files, const QStringList &folders)
+int scan(const ScanOptions &options, const DataFiles &files, const QStringList &folders, ScanPlace &place)
 {
     const HostApplication workstation(options.dataFolder, folders);
     PluginHost &registry = PluginHost::instance();
@@ -135,10 +130,8 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
     registry.initialise(options.dataFolder, QString(), PluginHost::kDefaultSampleRate,
                         PluginHost::kDefaultBlockSize);
     const CatalogueView before = readCatalogues(files.effects);
-    const QString list = files.effects + QLatin1String(kScanListFile);
-    if (const FileResult written = WriteScanList(list, workstation.scanFolders());
-        !written) { // else an old one is scanned
-        complain(QStringLiteral("cannot write the scan list %1: %2").arg(list, written.reason));
+    if (!place.writeList(workstation.scanFolders())) { // else an old one is scanned
+        complain(place.reason());
         return ScanExit::kNotFinished;
     }
     if (options.asksAgain())
@@ -156,30 +149,6 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
     return conclude(options, summary, folders);
 }
 
-/// A scanner whose fxscan was killed lives on for some seconds; its markers must not be taken for crashes.
-/// False when one goes on.
-bool waitForScanner(const QString &effectsFolder)
-{
-    constexpr int kPatience = 5000; // ms; a scanner's own patience with a plug-in is two seconds
-    const QDeadlineTimer deadline(kPatience);
-    while (ScanLock::isScannerAtWork(effectsFolder)) {
-        if (deadline.hasExpired())
-            return false;
-        QThread::msleep(50);
-    }
-    return true;
-}
-
-/// Says so when another workstation, or a scanner, is at work on the folder.
-bool isBusy(const ScanLock &lock, const DataFiles &files)
-{
-    if (!lock.isHeldByOther() && waitForScanner(files.effects))
-        return false;
-    complain(QStringLiteral("another scan is at work on %1 (%2)")
-                 .arg(files.effects, ScanLock::holder(files.effects)));
-    return true;
-}
-
 bool isScanned(const ScanOptions &options, const DataFiles &files)
 {
     if (QFileInfo(files.effects).isDir())
@@ -191,12 +160,11 @@ bool isScanned(const ScanOptions &options, const DataFiles &files)
 /// What changes the catalogues without a scan.
 int edit(const ScanOptions &options, const DataFiles &files)
 {
-    const ScanLock lock(files.effects, ScanLock::Role::Workstation);
-    if (isBusy(lock, files))
+    ScanPlace place(files.effects);
+    if (!place || !place.keepScannersAway()) {
+        complain(place.reason());
         return ScanExit::kNotFinished;
-    const ScanLock scanner(files.effects); // a workstation of another kind may start one
-    if (scanner.isHeldByOther() && isBusy(scanner, files))
-        return ScanExit::kNotFinished;
+    }
     return options.changesMarks() ? changeMarks(options, files.effects) : forget(options, files);
 }
 
@@ -214,22 +182,17 @@ int prepareAndScan(const ScanOptions &options, const DataFiles &files)
                      .arg(PluginHost::usualScannerPath()));
         return ScanExit::kNotFinished;
     }
-    if (!QDir().mkpath(files.effects)) {
-        complain(QStringLiteral("cannot make the folder %1").arg(files.effects));
+    ScanPlace place(files.effects);
+    if (!place || (options.inProcess && !place.keepScannersAway())) {
+        complain(place.reason());
         return ScanExit::kNotFinished;
     }
-    const ScanLock lock(files.effects, ScanLock::Role::Workstation);
-    if (isBusy(lock, files))
-        return ScanExit::kNotFinished;
-    std::unique_ptr<ScanLock> ownScanner;
-    if (options.inProcess)
-        ownScanner = std::make_unique<ScanLock>(files.effects);
     prepareEnvironment(options, files);
     if (const QFileInfo report(qEnvironmentVariable("FXPROBE_REPORT")); report.exists() && !report.isFile()) {
         complain(QStringLiteral("the report %1 is not a file").arg(report.filePath()));
         return ScanExit::kUsage;
     }
-    return scan(options, files, folders);
+    return scan(options, files, folders, place);
 }
 
 } // namespace

@@ -30,10 +30,23 @@ ScanPlace::ScanPlace(const QString &effectsFolder)
         m_reason = QStringLiteral("cannot make the folder %1").arg(effectsFolder);
         return;
     }
-    m_lock = std::make_unique<ScanLock>(effectsFolder, ScanLock::Role::Workstation);
-    if (m_lock->isHeldByOther() || !waitForScanner(effectsFolder))
+    m_workstation = std::make_unique<ScanLock>(effectsFolder, ScanLock::Role::Workstation);
+    isHeld(*m_workstation);
+}
+
+/// Whether somebody else is at work; then with the reason.
+bool ScanPlace::isHeld(const ScanLock &lock)
+{
+    if (lock.isHeldByOther() || !waitForScanner(m_effectsFolder))
         m_reason = QStringLiteral("another scan is at work on %1 (%2)")
-                       .arg(effectsFolder, ScanLock::holder(effectsFolder));
+                       .arg(m_effectsFolder, ScanLock::holder(m_effectsFolder));
+    return !m_reason.isEmpty();
+}
+
+bool ScanPlace::keepScannersAway()
+{
+    m_scanner = std::make_unique<ScanLock>(m_effectsFolder, ScanLock::Role::Scanner);
+    return !isHeld(*m_scanner);
 }
 
 bool ScanPlace::writeList(const QStringList &folders)

@@ -7,8 +7,8 @@
 
 #include <memory>
 
-/// The Effects folder that this process scans into: made where it is not there, and kept from other
-/// workstations for as long as the object lives.
+/// The Effects folder that this process scans into, or changes: made where it is not there, and kept from
+/// other workstations for as long as the object lives.
 class ScanPlace {
 public:
     /// Waits up to five seconds for a scanner whose workstation was killed: its markers must not be taken for
@@ -20,11 +20,17 @@ public:
     /// False when the folder cannot be used.
     explicit operator bool() const { return m_reason.isEmpty(); }
 
+    /// Keeps scanners away as well, for what is done here in place of one; false, with the reason, when one
+    /// is at work: a workstation of another kind may have started it.
+    bool keepScannersAway();
     /// Writes the scan list; false, with the reason, when it cannot: an old list would be scanned.
     bool writeList(const QStringList &folders);
 
 private:
+    bool isHeld(const ScanLock &lock);
+
     QString m_effectsFolder;
-    std::unique_ptr<ScanLock> m_lock;
+    std::unique_ptr<ScanLock> m_workstation;
+    std::unique_ptr<ScanLock> m_scanner;
     QString m_reason;
 };
