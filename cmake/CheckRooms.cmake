@@ -15,7 +15,8 @@ set(rows
     "${effects}/Launcher ${effects}/VST ${effects}/VST3"
     "${effects} Core/BaseLib/WorkstationServices"
     "Workstation/Options Workstation/Summary"
-    "Workstation/Library Workstation/Manage Workstation/Output"
+    "Workstation/Manage"
+    "Workstation/Library Workstation/Output"
     "Scanner Workstation")
 # What lies in the folder of one of these is known there only.
 set(closed_rooms "${effects}/VST" "${effects}/VST3" Workstation)

@@ -6,7 +6,7 @@ set(FXPROBE_FACE Workstation/Library/Scan.h)
 
 # Everything below the command line. The VST 3 SDK is in it: who links the library needs no SDK.
 set(rooms baselib vlib catalogue protocol plugin host busformats vstinterface vst vst3sdk vst3hostobjects vst3 effects
-    workstation_options workstation_summary workstation_library)
+    workstation_options workstation_summary workstation_manage workstation_library)
 list(TRANSFORM rooms REPLACE "(.+)" "$<TARGET_OBJECTS:\\1>" OUTPUT_VARIABLE objects)
 add_library(library STATIC ${objects})
 set_target_properties(library PROPERTIES OUTPUT_NAME fxprobe EXPORT_NAME FxProbe LINKER_LANGUAGE CXX)

@@ -5,6 +5,7 @@
 #include "Main/VLib/ApplicationContext.h"
 #include "Workstation/Library/ScanPlace.h"
 #include "Workstation/Library/ScanRun.h"
+#include "Workstation/Manage/AskAgain.h"
 #include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Summary/ScanSummary.h"
 
@@ -143,6 +144,17 @@ void prepare(PluginHost &registry, const FxProbe::ScanSettings &settings, const 
     registry.setScannerEnvironment(environment);
 }
 
+/// Why what gets another chance cannot have it; empty when it can.
+QString askAgain(const FxProbe::ScanSettings &settings, PluginHost &registry, const QStringList &folders)
+{
+    if (settings.retry.isEmpty() && !settings.retryFailed)
+        return QString();
+    registry.ReadCatalogue(); // absorbs the markers: the newest crash may be the one that is meant
+    const AskAgainRequest request{settings.retry, settings.retryFailed};
+    const AskAgainOutcome outcome = askAgain(registry.effectsFolder(), request, folders, ModuleLook());
+    return !outcome.wrong.isEmpty() ? outcome.wrong.join(QStringLiteral("; ")) : outcome.written.reason;
+}
+
 } // namespace
 
 FxProbe::ScanResult FxProbe::scan(const ScanSettings &settings)
@@ -166,7 +178,8 @@ FxProbe::ScanResult FxProbe::scan(const ScanSettings &settings)
     QFile::remove(report);
     const CatalogueView before = readCatalogues(effects);
     FollowedRun run(settings, registry, report);
-    if (!run.run())
+    result.reason = askAgain(settings, registry, folders);
+    if (result && !run.run())
         result.reason = run.reason();
     fill(result, summariseScan(readCatalogues(effects), before, run.account(), ProbeMemory(effects)));
     return result;

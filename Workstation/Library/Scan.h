@@ -49,6 +49,10 @@ struct ScanSettings {
     /// All folders to search, with those below them. What is known of plug-ins in a folder that is not given
     /// any more is dropped; in one that is given and not there, as on a drive that is unplugged, it is kept.
     QStringList folders;
+    /// Plug-ins that are disabled or failed and get another chance in this scan: paths of their files, or
+    /// their names. What the user switched off stays so. A name that means none, or several, ends the scan.
+    QStringList retry;
+    bool retryFailed = false; ///< all of them
     /// Full path of the scanner program; empty: "FxProbe" beside this program.
     QString scannerProgram;
     int timeout = 60;     ///< seconds that one plug-in may take; 0: for ever

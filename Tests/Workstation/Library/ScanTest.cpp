@@ -56,6 +56,15 @@ TEST_F(LibraryScan, TellsWhatIsThereAndKeepsWhatIsAway)
     EXPECT_FALSE(m_folder.read("scanner.log").isEmpty());
     EXPECT_FALSE(qEnvironmentVariableIsSet("FXPROBE_REPORT")) << "the caller's environment is its own";
 
+    put("Killer.vst2",
+        "trace " + m_folder.path("retried").toUtf8() + '\n'); // mended, with its old time stamp
+    EXPECT_EQ(lines(FxProbe::scan(m_settings)), expected);
+    m_settings.retry = QStringList("Comp");
+    EXPECT_EQ(FxProbe::scan(m_settings).reason, "no disabled or failed plug-in is named 'Comp'");
+    m_settings.retry = QStringList(result.plugins.at(1).path);
+    EXPECT_EQ(FxProbe::scan(m_settings).plugins.at(1).state, "ok");
+
+    m_settings.retry.clear();
     mark("Comp", "Favourite", "1");
     QDir(m_folder.dataFolder()).rename("Plugins", "Unplugged");
     const FxProbe::ScanResult away = FxProbe::scan(m_settings);
