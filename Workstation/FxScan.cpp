@@ -80,6 +80,8 @@ bool print(const ScanOptions &options, const ScanSummary &summary, const QString
         return Terminal::print(renderTable(summary));
     if (options.format == OutputFormat::Json)
         return Terminal::printData(QString::fromUtf8(renderJson(summary, options.dataFolder, folders)));
+    if (options.format == OutputFormat::JsonLines)
+        return Terminal::printData(QString::fromUtf8(renderJsonLine(summary, options.dataFolder, folders)));
     for (const QString &problem : summary.problems)
         complain(problem);
     return Terminal::printData(QString::fromUtf8(renderCsv(summary)));
@@ -139,7 +141,9 @@ int scan(const ScanOptions &options, const DataFiles &files, const QStringList &
             return failed;
     if (options.inProcess)
         ProbeReport::instance().openFromEnvironment();
-    ScanSession session(options, registry, qEnvironmentVariable("FXPROBE_REPORT"));
+    JsonLines lines(options.format == OutputFormat::JsonLines);
+    lines.begin(options.dataFolder, folders);
+    ScanSession session(options, registry, qEnvironmentVariable("FXPROBE_REPORT"), lines);
     const bool isFinished = session.run();
     ScanSummary summary =
         summariseScan(readCatalogues(files.effects), before, session.account(), ProbeMemory(files.effects));

@@ -37,10 +37,12 @@ QString keysInWords(const ScanOptions &options, const TerminalKeys &keys)
 
 } // namespace
 
-ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report)
+ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report,
+                         JsonLines &lines)
     : ScanRun(registry, report)
     , m_options(options)
     , m_progress(options.quiet, options.inProcess ? 0 : options.timeout, keysInWords(options, m_keys))
+    , m_lines(lines)
 {
     TerminationSignal::install();
     registry.setProbeLimit(options.timeout);
@@ -90,6 +92,14 @@ void ScanSession::wait()
     if (TerminationSignal::wait(kLook))
         cancelForUser();
     takeKeys();
+}
+
+void ScanSession::show(ScanAccount &account)
+{
+    m_progress.show(account);
+    m_lines.show(account);
+    if (m_lines.isBroken() && !isCancelled())
+        cancelForUser();
 }
 
 void ScanSession::takeKeys()

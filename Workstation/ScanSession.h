@@ -2,6 +2,7 @@
 
 #include "Workstation/Library/ScanRun.h"
 #include "Workstation/Options/ScanOptions.h"
+#include "Workstation/Output/JsonLines.h"
 #include "Workstation/Output/Progress.h"
 #include "Workstation/Output/TerminalKeys.h"
 
@@ -10,15 +11,15 @@
 /// One scan from the command line: shows how it gets on, and ends it when somebody asks.
 class ScanSession : public ScanRun {
 public:
-    /// `report` is the file that the scanner reports to.
-    ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report);
+    /// `report` is the file that the scanner reports to; `lines` gets what comes to pass.
+    ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report, JsonLines &lines);
 
     /// As `ScanRun` does, and takes the line of the progress away.
     bool run();
 
 protected:
     void wait() override;
-    void show(ScanAccount &account) override { m_progress.show(account); }
+    void show(ScanAccount &account) override;
     void culpritFound(const ScanCulprit &culprit) override;
     void scanOnce() override;
 
@@ -31,5 +32,6 @@ private:
     const ScanOptions &m_options;
     TerminalKeys m_keys;
     Progress m_progress;
+    JsonLines &m_lines;
     QElapsedTimer m_sinceCancel;
 };

@@ -60,6 +60,13 @@ install(FILES "${PROJECT_SOURCE_DIR}/README.md" "${PROJECT_SOURCE_DIR}/CHANGELOG
 install(DIRECTORY "${PROJECT_SOURCE_DIR}/docs" DESTINATION "${document_folder}"
     FILES_MATCHING PATTERN "*.md" PATTERN "*.png")
 
+# What programs read lies apart from the documentation, which a system may leave out.
+set(data_folder "${CMAKE_INSTALL_DATADIR}/fxprobe")
+if(WIN32)
+    set(data_folder docs)
+endif()
+install(FILES "${PROJECT_SOURCE_DIR}/docs/fxscan.schema.json" DESTINATION "${data_folder}")
+
 if(NOT WIN32)
     # What Debian's tools look for. The text of the licence is on every Debian system; the link is the README's.
     set(debian_folder "${PROJECT_BINARY_DIR}/debian")
@@ -67,6 +74,8 @@ if(NOT WIN32)
     find_program(GZIP_PROGRAM gzip REQUIRED)
     execute_process(COMMAND "${GZIP_PROGRAM}" -fn9 "${debian_folder}/changelog" COMMAND_ERROR_IS_FATAL ANY)
     file(CREATE_LINK copyright "${debian_folder}/LICENSE" SYMBOLIC)
+    file(CREATE_LINK ../../../fxprobe/fxscan.schema.json "${debian_folder}/fxscan.schema.json" SYMBOLIC)
+    install(FILES "${debian_folder}/fxscan.schema.json" DESTINATION "${document_folder}/docs")
     install(FILES "${debian_folder}/changelog.gz" "${debian_folder}/LICENSE" DESTINATION "${document_folder}")
     set(dev_documents "${CMAKE_INSTALL_DATADIR}/doc/libfxprobe-dev")
     install(FILES "${debian_folder}/changelog.gz" "${PROJECT_SOURCE_DIR}/cmake/debian/copyright"

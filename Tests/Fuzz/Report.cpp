@@ -10,7 +10,8 @@ bool isSame(const ReportLine &left, const ReportLine &right)
 {
     const auto all = [](const ReportLine &line) {
         return std::tie(line.event, line.format, line.path, line.subId, line.subName, line.stage, line.reason,
-                        line.milliseconds, line.records, line.noPlugin, line.probes);
+                        line.milliseconds, line.records, line.probes, line.status, line.time, line.files,
+                        line.worker);
     };
     return all(left) == all(right);
 }

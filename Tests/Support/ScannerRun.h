@@ -43,6 +43,8 @@ public:
     bool start();
     /// Waits in a started run until the condition holds; false when the run or its time limit ended before.
     bool waitUntil(const std::function<bool()> &condition);
+    /// What a started run has printed so far.
+    QByteArray printed() { return m_process.peek(m_process.bytesAvailable()); }
     /// Asks the program to end (SIGTERM).
     void requestTermination(const TerminationWay &way = terminationWays().front());
     /// Ends the program by force (SIGKILL).

@@ -22,14 +22,30 @@ protected:
     {
         forgetTrace();
         prepare(m_fxscan, options);
-        return m_fxscan.run();
+        const ScannerOutcome &outcome = m_fxscan.run();
+        keepJson(options, outcome.standardOutput);
+        return outcome;
+    }
+    /// Lays what was printed as JSON down for the check of all of it against its schema.
+    void keepJson(const QStringList &options, const QByteArray &output)
+    {
+        const int format = options.indexOf("--format");
+        if (output.isEmpty() || format < 0 || !options.value(format + 1).startsWith("json"))
+            return;
+        const testing::TestInfo &test = *testing::UnitTest::GetInstance()->current_test_info();
+        m_folder.write(QStringLiteral(FXPROBE_JSON_FOLDER "/%1.%2-%3.%4")
+                           .arg(test.test_suite_name())
+                           .arg(test.name())
+                           .arg(++m_kept)
+                           .arg(options[format + 1]),
+                       output);
     }
     /// Starts a scan without a limit and waits until it hangs in its second plug-in.
-    bool startHanging(const QByteArray &script)
+    bool startHanging(const QByteArray &script, const QStringList &options = {})
     {
         put("Earlier.vst3");
         put("Hang.vst3", script);
-        prepare(m_fxscan, {"--timeout", "0", m_folder.plugins()});
+        prepare(m_fxscan, QStringList({"--timeout", "0", m_folder.plugins()}) + options);
         return m_fxscan.start() && waitForStage(m_fxscan, "Hang", "initialize");
     }
     /// What a scan of "Plugins" tells, which has to end with this code.
@@ -61,5 +77,6 @@ protected:
         return result["scan"].toObject()[QLatin1String(key)].toInt(-1);
     }
 
+    int m_kept = 0; ///< outputs
     ScannerRun m_fxscan{QStringLiteral(FXPROBE_FXSCAN), m_folder};
 };

@@ -180,6 +180,39 @@ TEST_F(FxScan, AScannerThatIsMissingOrCannotStartIsSaidAtOnce)
     EXPECT_TRUE(outcome.standardError.contains("FxProbe")) << outcome.standardError.constData();
 }
 
+TEST_F(FxScan, JsonLinesComeWhileTheScanGoesOn)
+{
+    const auto lineOf = [](const QByteArray &text) { return QJsonDocument::fromJson(text).object(); };
+    const QStringList asked{"--format", "jsonl"};
+    ASSERT_TRUE(startHanging("fault initialize hang\n", asked));
+    EXPECT_TRUE(m_fxscan.waitUntil([this] { return m_fxscan.printed().contains("Earlier.vst3"); }));
+    m_fxscan.requestTermination();
+    const QByteArray cancelled = m_fxscan.wait().standardOutput;
+    keepJson(asked, cancelled);
+    const QJsonObject summary = lineOf(cancelled.trimmed().split('\n').last());
+    EXPECT_EQ(summary["type"], "summary") << cancelled.constData();
+    EXPECT_EQ(summary["scan"]["finished"], false);
+
+    put("Hang.vst3", "answer initialize false\n");
+    put("Shell.vst2", "child 1 One\nchild 2 Two\nfault entry throw-std Two\n");
+    m_folder.write("Plugins/Text.vst3", "not a library");
+    for (const QStringList &how : {QStringList{}, QStringList{"--in-process"}}) {
+        QDir(m_folder.effects()).removeRecursively();
+        States statuses; // of files, and of sub-plug-ins
+        const QStringList options = asked + how + QStringList{m_folder.plugins()};
+        for (const QByteArray &text : run(options).standardOutput.trimmed().split('\n'))
+            if (const QJsonObject line = lineOf(text); line["type"] == "probe")
+                statuses[line["subName"].toString(QFileInfo(line["path"].toString()).baseName())] =
+                    line["status"].toString();
+        EXPECT_EQ(statuses, (States{{"Earlier", "listed"},
+                                    {"Hang", "failed"},
+                                    {"One", "listed"},
+                                    {"Shell", "listed"},
+                                    {"Text", "no plug-in"},
+                                    {"Two", "failed"}}));
+    }
+}
+
 TEST_F(FxScan, TheReasonOfAnEarlierFileIsNotThatOfItsUpdate)
 {
     put("Comp.vst3", "answer initialize false\n");

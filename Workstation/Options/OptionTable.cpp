@@ -4,11 +4,12 @@ namespace {
 
 void setFormat(ScanOptions &options, size_t choice)
 {
-    constexpr OutputFormat kFormats[] = {OutputFormat::Table, OutputFormat::Json, OutputFormat::Csv};
+    constexpr OutputFormat kFormats[] = {OutputFormat::Table, OutputFormat::Json, OutputFormat::JsonLines,
+                                         OutputFormat::Csv};
     options.format = kFormats[choice];
 }
 
-/// "table, json or csv"
+/// "table, json, jsonl or csv"
 QString inWords(const std::vector<const char *> &choices)
 {
     QString words;
@@ -97,8 +98,11 @@ const std::vector<OptionRow> &optionTable()
          "For a drive that is gone for good: what is known of one that is away is kept otherwise. A folder "
          "that "
          "is there still is scanned anew next time."},
-        {"format", "format", ChoiceTarget{{"table", "json", "csv"}, setFormat},
-         "Print the result as table (the default), json or csv."},
+        {"format", "format", ChoiceTarget{{"table", "json", "jsonl", "csv"}, setFormat},
+         "Print the result as table (the default), json, jsonl or csv.",
+         "jsonl prints one JSON object a line while the scan goes on: what each probe came to, and the "
+         "result "
+         "as the last one."},
         {"in-process", "", &ScanOptions::inProcess,
          "Load the plug-ins into this process. One that crashes takes it along.",
          "Its marker stays for the next scan. A plug-in that hangs is not ended."},

@@ -11,7 +11,7 @@ inline constexpr int kUsage = 2;       ///< the command line makes no sense
 inline constexpr int kNotFinished = 3; ///< the scan did not come to its end
 } // namespace ScanExit
 
-enum class OutputFormat { Table, Json, Csv };
+enum class OutputFormat { Table, Json, JsonLines, Csv };
 
 /// What the command line asks for.
 struct ScanOptions {

@@ -1,3 +1,4 @@
+#include "Workstation/Output/JsonLines.h"
 #include "Workstation/Output/SummaryOutput.h"
 
 #include <QJsonArray>
@@ -7,8 +8,6 @@
 #include <algorithm>
 
 namespace {
-
-constexpr int kSchema = 2;
 
 QJsonValue channels(qint32 count) { return count < 0 ? QJsonValue() : QJsonValue(count); }
 
@@ -84,14 +83,12 @@ QByteArray csvLine(const QStringList &fields)
     return line + "\r\n";
 }
 
-} // namespace
-
-QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders)
+QJsonObject summaryObject(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders)
 {
     QJsonArray plugins;
     for (const CataloguedPlugin &plugin : summary.plugins)
         plugins.append(pluginObject(plugin));
-    QJsonObject object{{QStringLiteral("schema"), kSchema},
+    QJsonObject object{{QStringLiteral("schema"), JsonLines::kSchema},
                        {QStringLiteral("dataFolder"), dataFolder},
                        {QStringLiteral("plugins"), plugins},
                        {QStringLiteral("failures"), failureArray(summary.failures)},
@@ -101,7 +98,21 @@ QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, con
         object.insert(QStringLiteral("noPlugins"), failureArray(summary.noPlugins));
         object.insert(QStringLiteral("scan"), scanObject(summary));
     }
-    return QJsonDocument(object).toJson();
+    return object;
+}
+
+} // namespace
+
+QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders)
+{
+    return QJsonDocument(summaryObject(summary, dataFolder, folders)).toJson();
+}
+
+QByteArray renderJsonLine(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders)
+{
+    QJsonObject object = summaryObject(summary, dataFolder, folders);
+    object.insert(QStringLiteral("type"), QStringLiteral("summary"));
+    return QJsonDocument(object).toJson(QJsonDocument::Compact) + '\n';
 }
 
 QByteArray renderCsv(const ScanSummary &summary)

@@ -8,8 +8,10 @@
 
 /// The summary as text for people.
 QString renderTable(const ScanSummary &summary);
-/// The summary as JSON; docs/fxscan-json.md describes it.
+/// The summary as JSON; docs/fxscan.schema.json describes it.
 QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
+/// The same as the last line of JSON lines.
+QByteArray renderJsonLine(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
 /// The plug-ins, one a line, as comma-separated values with a line of titles (RFC 4180).
 QByteArray renderCsv(const ScanSummary &summary);
 

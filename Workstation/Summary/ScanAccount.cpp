@@ -1,5 +1,7 @@
 #include "Workstation/Summary/ScanAccount.h"
 
+#include <QDateTime>
+
 #include <algorithm>
 
 namespace {
@@ -15,6 +17,7 @@ PluginKey pluginKey(const ScanCulprit &culprit)
 
 ScanAccount::ScanAccount(const QString &reportFile)
     : m_report(reportFile)
+    , m_began(static_cast<double>(QDateTime::currentMSecsSinceEpoch()))
 {}
 
 void ScanAccount::update()
@@ -26,17 +29,20 @@ void ScanAccount::update()
 void ScanAccount::takeLine(const ReportLine &line)
 {
     using Event = ReportLine::Event;
+    // A clock that was set back meanwhile must not turn anything round.
+    m_lastTime = std::max(m_lastTime, line.time - m_began);
     m_finished = line.event == Event::Finished;
     m_busy = line.event == Event::Busy;
     switch (line.event) {
     case Event::Start:
         m_done += static_cast<int>(std::count_if(m_open.begin(), m_open.end(),
                                                  [](const Open &open) { return open.key.subId == 0; }));
-        m_open.clear();
+        closeOpen([](const Open &) { return true; }, std::nullopt);
         m_planned = m_done; // what is left of the plan is planned anew
         break;
     case Event::Plan:
         m_planned += line.probes;
+        m_news.push_back(PlannedFormat{line.format, line.files, line.probes});
         break;
     case Event::Begin:
         begin(line);
@@ -53,15 +59,15 @@ void ScanAccount::takeLine(const ReportLine &line)
                        .arg(line.path, line.reason));
         break;
     case Event::Stage:
-        if (const PluginKey *key = innermost(line.worker))
-            m_probes[*key].isLoaded = true;
+        if (const Open *open = innermost(line.worker)) {
+            m_probes[open->key].isLoaded = true;
+            m_spans[open->span].isLoaded = true;
+        }
         break;
     case Event::Busy:
     case Event::Finished:
     case Event::WorkerEnd: // what it was busy with is begun again, or has ended
-        m_open.erase(std::remove_if(m_open.begin(), m_open.end(),
-                                    [&](const Open &open) { return open.worker == line.worker; }),
-                     m_open.end());
+        closeOpen([&](const Open &open) { return open.worker == line.worker; }, std::nullopt);
         break;
     case Event::Ended:
     case Event::Unknown:
@@ -77,19 +83,46 @@ void ScanAccount::addProblem(const QString &problem)
 
 void ScanAccount::begin(const ReportLine &line)
 {
-    m_open.push_back({line.worker, keyOf(line)});
+    m_open.push_back({line.worker, keyOf(line), m_spans.size()});
     m_begun.push_back(keyOf(line));
+    ProbeSpan span;
+    span.key = keyOf(line);
+    span.worker = line.worker;
+    span.begin = m_lastTime;
+    m_spans.push_back(span);
     ProbeAccount account;
     account.subName = line.subName;
+    account.worker = line.worker;
+    account.span = m_spans.size() - 1;
     m_probes[keyOf(line)] = account;
+}
+
+/// Ends what of the probes under way is over.
+void ScanAccount::closeOpen(const std::function<bool(const Open &)> &isOver,
+                            std::optional<ProbeStatus> status)
+{
+    const auto first =
+        std::stable_partition(m_open.begin(), m_open.end(), [&](const Open &open) { return !isOver(open); });
+    for (auto open = first; open != m_open.end(); ++open) {
+        m_spans[open->span].end = m_lastTime;
+        m_spans[open->span].status = status;
+    }
+    m_open.erase(first, m_open.end());
+}
+
+/// What the last attempt at a plug-in came to; it may be known only after it has ended.
+void ScanAccount::setStatus(const PluginKey &key, ProbeStatus status)
+{
+    ProbeAccount &account = m_probes[key];
+    account.status = status;
+    if (account.span)
+        m_spans[*account.span].status = status;
+    m_news.push_back(key);
 }
 
 void ScanAccount::end(const ReportLine &line)
 {
-    const bool isSkipped = line.event == ReportLine::Event::Skipped;
     ProbeAccount &account = m_probes[keyOf(line)];
-    account.noPlugin = isSkipped || line.noPlugin;
-    account.isSkipped = line.isSkipped;
     account.reason = line.reason;
     account.records = line.records;
     account.milliseconds = line.milliseconds;
@@ -97,7 +130,8 @@ void ScanAccount::end(const ReportLine &line)
     const auto isOver = [&](const Open &open) {
         return open.worker == line.worker && (line.subId == 0 || open.key == keyOf(line));
     };
-    m_open.erase(std::remove_if(m_open.begin(), m_open.end(), isOver), m_open.end());
+    closeOpen(isOver, line.status);
+    setStatus(keyOf(line), line.status);
     if (line.subId == 0)
         ++m_done;
 }
@@ -109,14 +143,15 @@ void ScanAccount::scannerEnded(const ScannerRunEnd &end)
         ProbeAccount &account = m_probes[pluginKey(culprit)];
         account.reason = culprit.reason;
         account.records = 0;
+        setStatus(pluginKey(culprit), culprit.status);
     }
 }
 
-const PluginKey *ScanAccount::innermost(int worker) const
+const ScanAccount::Open *ScanAccount::innermost(int worker) const
 {
     const auto found = std::find_if(m_open.rbegin(), m_open.rend(),
                                     [worker](const Open &open) { return open.worker == worker; });
-    return found == m_open.rend() ? nullptr : &found->key;
+    return found == m_open.rend() ? nullptr : &*found;
 }
 
 std::vector<PluginKey> ScanAccount::takeBegun()
@@ -124,6 +159,13 @@ std::vector<PluginKey> ScanAccount::takeBegun()
     std::vector<PluginKey> begun;
     begun.swap(m_begun);
     return begun;
+}
+
+std::vector<ScanNews> ScanAccount::takeNews()
+{
+    std::vector<ScanNews> news;
+    news.swap(m_news);
+    return news;
 }
 
 const ProbeAccount *ScanAccount::find(const PluginKey &key) const

@@ -6,8 +6,11 @@
 #include <QString>
 #include <QStringList>
 
+#include <functional>
 #include <map>
+#include <optional>
 #include <tuple>
+#include <variant>
 #include <vector>
 
 /// Tells one plug-in, or sub-plug-in, of a file from all others.
@@ -28,13 +31,34 @@ PluginKey pluginKey(const ScanCulprit &culprit);
 /// What a scan said of one probe.
 struct ProbeAccount {
     QString subName;
-    QString reason;           ///< why it failed; empty: it did not
-    double milliseconds = -1; ///< -1: it did not come to its end
-    int records = 0;          ///< so many plug-ins of it work
-    bool noPlugin = false;    ///< no plug-in of its format
-    bool isSkipped = false;   ///< by the user
-    bool isLoaded = false;    ///< it entered a stage; else it was seen without loading it
+    QString reason; ///< why it failed; empty: it did not
+    ProbeStatus status = ProbeStatus::Failed;
+    double milliseconds = -1;        ///< -1: it did not come to its end
+    int records = 0;                 ///< so many plug-ins of it work
+    int worker = 0;                  ///< that asked it; 0: the scanner itself
+    bool isLoaded = false;           ///< it entered a stage; else it was seen without loading it
+    std::optional<std::size_t> span; ///< the place of the last attempt in `ScanAccount::spans`
 };
+
+/// One attempt at a plug-in or sub-plug-in. Times are milliseconds since the account began.
+struct ProbeSpan {
+    PluginKey key;
+    int worker = 0; ///< 0: the scanner itself
+    double begin = 0;
+    double end = -1;                   ///< -1: it goes on
+    std::optional<ProbeStatus> status; ///< nothing where it ended without a verdict, to be asked again
+    bool isLoaded = false;             ///< it entered a stage
+};
+
+/// What a scanner found of one format.
+struct PlannedFormat {
+    PluginFormat format = PluginFormat::Unknown;
+    int files = 0;  ///< found
+    int probes = 0; ///< to be made from now on
+};
+
+/// Something that came to pass: a plan, or a plug-in whose probe has ended.
+using ScanNews = std::variant<PlannedFormat, PluginKey>;
 
 /// Follows the report that scanners write while they work.
 class ScanAccount {
@@ -48,9 +72,19 @@ public:
     void scannerEnded(const ScannerRunEnd &end);
 
     /// The probe under way for the longest, or what of it is asked now; null when there is none.
-    const PluginKey *current() const { return m_open.empty() ? nullptr : innermost(m_open.front().worker); }
+    const PluginKey *current() const
+    {
+        return m_open.empty() ? nullptr : &innermost(m_open.front().worker)->key;
+    }
     /// The probes that began since the last call, in order.
     std::vector<PluginKey> takeBegun();
+    /// What came to pass since the last call, in order. A plug-in can come twice: when it ends the scanner
+    /// after its probe.
+    std::vector<ScanNews> takeNews();
+    /// All attempts, in the order in which they began.
+    const std::vector<ProbeSpan> &spans() const { return m_spans; }
+    /// When the last line was written, in milliseconds since the account began.
+    double lastTime() const { return m_lastTime; }
     /// Files dealt with, and files planned, of all formats planned so far.
     int done() const { return m_done; }
     int planned() const { return m_planned; }
@@ -69,20 +103,28 @@ public:
     bool wasProbed(PluginFormat format, const QString &path) const;
 
 private:
-    void takeLine(const ReportLine &line);
-    void begin(const ReportLine &line);
-    void end(const ReportLine &line);
-    void addProblem(const QString &problem);
-    const PluginKey *innermost(int worker) const;
-
-    ReportReader m_report;
     /// A probe under way.
     struct Open {
         int worker;
         PluginKey key;
+        std::size_t span;
     };
+
+    void takeLine(const ReportLine &line);
+    void begin(const ReportLine &line);
+    void end(const ReportLine &line);
+    void closeOpen(const std::function<bool(const Open &)> &isOver, std::optional<ProbeStatus> status);
+    void setStatus(const PluginKey &key, ProbeStatus status);
+    void addProblem(const QString &problem);
+    const Open *innermost(int worker) const;
+
+    ReportReader m_report;
+    const double m_began; ///< ms since 1970 (UTC)
+    double m_lastTime = 0;
     std::vector<Open> m_open; ///< the oldest first
     std::vector<PluginKey> m_begun;
+    std::vector<ScanNews> m_news;
+    std::vector<ProbeSpan> m_spans;
     std::map<PluginKey, ProbeAccount> m_probes;
     QStringList m_problems;
     int m_done = 0;

@@ -87,10 +87,11 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
         if (probe.reason.isEmpty() || recorded.count({key.format, key.path}) != 0)
             continue;
         const QString name = probe.subName.isEmpty() ? fileNameOf(key.path) : probe.subName;
-        const PluginState state = probe.noPlugin    ? PluginState::NoPlugin
-                                  : probe.isSkipped ? PluginState::Skipped
-                                                    : PluginState::Failed;
-        (probe.noPlugin ? summary.noPlugins : summary.failures)
+        const bool isNoPlugin = probe.status == ProbeStatus::NoPlugin;
+        const PluginState state = isNoPlugin                             ? PluginState::NoPlugin
+                                  : probe.status == ProbeStatus::Skipped ? PluginState::Skipped
+                                                                         : PluginState::Failed;
+        (isNoPlugin ? summary.noPlugins : summary.failures)
             .push_back({&formatInfo(key.format), state, name, key.path, key.subId, probe.reason, false});
     }
 }
@@ -126,7 +127,7 @@ void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount 
 void addSkipped(ScanSummary &summary, const ScanAccount &account)
 {
     for (const auto &[key, probe] : account.probes())
-        if (probe.isSkipped)
+        if (probe.status == ProbeStatus::Skipped)
             summary.skipped.append(key.path);
 }
 

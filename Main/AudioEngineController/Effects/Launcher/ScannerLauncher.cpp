@@ -41,10 +41,10 @@ void findCulprits(const QString &effectsFolder, MarkerWatch &watch, ScannerRunEn
         if (isExcused(marker, markers))
             continue;
         const QString reason = blame(end, watch.lastStage());
-        const bool isTimeLimit = end.how == ScannerRunEnd::How::TimeLimit;
-        end.culprits.push_back({marker.format, marker.plugin, reason});
-        memory.setCrash(marker.format, marker.plugin,
-                        isTimeLimit ? ProbeStatus::NoAnswer : ProbeStatus::Crashed, reason);
+        const ProbeStatus status =
+            end.how == ScannerRunEnd::How::TimeLimit ? ProbeStatus::NoAnswer : ProbeStatus::Crashed;
+        end.culprits.push_back({marker.format, marker.plugin, reason, status});
+        memory.setCrash(marker.format, marker.plugin, status, reason);
     }
     if (const FileResult written = memory.write(); !written)
         DebugLog(L"Cannot write what the probes came to: %ls", written.reason);

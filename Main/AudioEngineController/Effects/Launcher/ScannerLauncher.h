@@ -2,6 +2,7 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
+#include "Main/AudioEngineController/Effects/Protocol/Probe.h"
 
 #include <QString>
 #include <QStringList>
@@ -21,6 +22,7 @@ struct ScanCulprit {
     PluginFormat format = PluginFormat::Unknown;
     EffectRecord plugin; ///< path, file time, name and sub-plug-in, as its crash marker says
     QString reason;      ///< in words, what it did: one phrase
+    ProbeStatus status = ProbeStatus::Crashed;
 };
 
 /// How one run of the scanner ended.

@@ -17,7 +17,6 @@ using namespace ReportWord;
 constexpr char kVersion[] = "version";
 constexpr int kThisVersion = 1;
 constexpr char kFileTime[] = "fileTime";
-constexpr char kStatus[] = "status";
 constexpr char kPlugins[] = "plugins";
 constexpr char kId[] = "id";
 constexpr char kInputs[] = "inputs";
@@ -97,14 +96,12 @@ RememberedProbe probeOf(const QJsonObject &object)
 {
     RememberedProbe probe;
     const PluginFormatInfo *const format = formatOfKey(object.value(word(kFormat)).toString());
-    const bool isKnown = std::any_of(std::begin(kStatusTexts), std::end(kStatusTexts), [&](const char *text) {
-        return object.value(word(kStatus)).toString() == word(text);
-    });
-    if (format && isKnown) // else it is of another version, and nobody knows what it says
+    const std::optional<ProbeStatus> status = statusOfText(object.value(word(kStatus)).toString());
+    if (format && status) // else it is of another version, and nobody knows what it says
         probe.format = format->format;
     probe.path = object.value(word(kPath)).toString();
     probe.fileTime = object.value(word(kFileTime)).toString();
-    probe.status = enumOf<ProbeStatus>(object.value(word(kStatus)).toString(), kStatusTexts);
+    probe.status = status.value_or(ProbeStatus::Listed);
     probe.stage = enumOf<ProbeStage>(object.value(word(kStage)).toString(), kStages);
     probe.reason = object.value(word(kReason)).toString();
     probe.milliseconds = object.value(word(kMilliseconds)).toDouble();
@@ -116,6 +113,15 @@ RememberedProbe probeOf(const QJsonObject &object)
 } // namespace
 
 const char *statusText(ProbeStatus status) { return kStatusTexts[static_cast<std::size_t>(status)]; }
+
+std::optional<ProbeStatus> statusOfText(const QString &text)
+{
+    const auto found = std::find_if(std::begin(kStatusTexts), std::end(kStatusTexts),
+                                    [&](const char *each) { return text == word(each); });
+    if (found == std::end(kStatusTexts))
+        return std::nullopt;
+    return static_cast<ProbeStatus>(std::distance(std::begin(kStatusTexts), found));
+}
 
 bool RememberedProbe::isCopy() const
 {

@@ -79,3 +79,5 @@ private:
 /// For reports, files and people: "listed", "failed", "no plug-in", "crashed", "no answer", "cancelled",
 /// "skipped".
 const char *statusText(ProbeStatus status);
+/// The status that a text names; nothing for a text of another version.
+std::optional<ProbeStatus> statusOfText(const QString &text);

@@ -1,8 +1,10 @@
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Main/AudioEngineController/Effects/Protocol/ReportLines.h"
 
+#include <QDateTime>
 #include <QFile>
 #include <QJsonDocument>
 #include <QJsonObject>
@@ -49,6 +51,8 @@ FileResult ProbeReport::open(const QString &path)
     if (!file->open(QIODevice::WriteOnly | QIODevice::Append | QIODevice::Unbuffered))
         return {file->errorString()};
     m_file = std::move(file);
+    m_opened = QDateTime::currentMSecsSinceEpoch();
+    m_sinceOpened.start();
     m_complete = true;
     write("start", {});
     return {};
@@ -63,11 +67,20 @@ void ProbeReport::openFromEnvironment()
         DebugLog(L"Cannot write the report %ls: %ls", path, opened.reason);
 }
 
+/// Milliseconds since 1970 (UTC), by a clock that nobody sets while the report is written.
+double ProbeReport::now() const
+{
+    constexpr double kPerMillisecond = 1e6; // ns
+    return rounded(static_cast<double>(m_opened) +
+                   static_cast<double>(m_sinceOpened.nsecsElapsed()) / kPerMillisecond);
+}
+
 void ProbeReport::write(const char *event, QJsonObject line)
 {
     if (!m_file)
         return;
     line.insert(QLatin1String(kEvent), QLatin1String(event));
+    line.insert(QLatin1String(kTime), now());
     m_file->write(QJsonDocument(line).toJson(QJsonDocument::Compact) + '\n');
 }
 
@@ -106,10 +119,7 @@ void ProbeReport::end(PluginFormat format, const EffectRecord &plugin, const Pro
     line.insert(QLatin1String(kMilliseconds), rounded(outcome.milliseconds));
     line.insert(QLatin1String(kRecords),
                 static_cast<qint64>(std::count_if(outcome.records.begin(), outcome.records.end(), works)));
-    if (outcome.status == ProbeStatus::NoPlugin)
-        line.insert(QLatin1String(kNoPlugin), true);
-    if (outcome.status == ProbeStatus::Skipped)
-        line.insert(QLatin1String(kIsSkipped), true);
+    line.insert(QLatin1String(kStatus), QLatin1String(statusText(outcome.status)));
     if (!outcome.reason.isEmpty())
         line.insert(QLatin1String(kReason), outcome.reason);
     write("end", withWorker(line, worker));

@@ -4,6 +4,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 #include "Main/AudioEngineController/Effects/Protocol/Probe.h"
 
+#include <QElapsedTimer>
 #include <QString>
 
 #include <memory>
@@ -54,6 +55,10 @@ public:
 private:
     void write(const char *event, QJsonObject line);
 
+    double now() const;
+
     std::unique_ptr<QFile> m_file;
+    qint64 m_opened = 0; ///< ms since 1970 (UTC)
+    QElapsedTimer m_sinceOpened;
     bool m_complete = true;
 };

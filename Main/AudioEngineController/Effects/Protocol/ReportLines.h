@@ -10,12 +10,12 @@ inline constexpr char kPath[] = "path";
 inline constexpr char kSubId[] = "subId";
 inline constexpr char kSubName[] = "subName";
 inline constexpr char kStage[] = "stage";
+inline constexpr char kStatus[] = "status";
+inline constexpr char kTime[] = "time";
 inline constexpr char kWorker[] = "worker";
 inline constexpr char kReason[] = "reason";
 inline constexpr char kMilliseconds[] = "milliseconds";
 inline constexpr char kRecords[] = "records";
-inline constexpr char kNoPlugin[] = "noPlugin";
-inline constexpr char kIsSkipped[] = "skipped";
 inline constexpr char kFiles[] = "files";
 inline constexpr char kProbes[] = "probes";
 

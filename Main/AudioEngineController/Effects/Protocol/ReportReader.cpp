@@ -1,5 +1,6 @@
 #include "Main/AudioEngineController/Effects/Protocol/ReportReader.h"
 
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Main/AudioEngineController/Effects/Protocol/ReportLines.h"
 
 #include <QFile>
@@ -39,12 +40,15 @@ ReportLine lineOf(const QByteArray &text)
     if (const std::size_t stage = placeOf(textOf(kStage), kStages); stage < std::size(kStages))
         line.stage = static_cast<ProbeStage>(stage);
     line.reason = textOf(kReason);
+    line.time = json.value(QLatin1String(kTime)).toDouble(-1);
     line.milliseconds = json.value(QLatin1String(kMilliseconds)).toDouble(-1);
     line.records = json.value(QLatin1String(kRecords)).toInt();
-    line.noPlugin = json.value(QLatin1String(kNoPlugin)).toBool();
-    line.isSkipped = json.value(QLatin1String(kIsSkipped)).toBool();
+    line.files = json.value(QLatin1String(kFiles)).toInt();
     line.probes = json.value(QLatin1String(kProbes)).toInt();
     line.worker = json.value(QLatin1String(kWorker)).toInt();
+    line.status = line.event == ReportLine::Event::Skipped
+                      ? ProbeStatus::NoPlugin
+                      : statusOfText(textOf(kStatus)).value_or(ProbeStatus::Failed);
     return line;
 }
 

@@ -31,13 +31,14 @@ struct ReportLine {
     quint32 subId = 0;
     QString subName;
     ProbeStage stage = ProbeStage::Load;
+    ProbeStatus status = ProbeStatus::Failed; ///< of a probe that has ended, or of a file that was skipped
     QString reason;
     double milliseconds = -1;
+    double time = -1; ///< when the line was written, in ms since 1970 (UTC); -1: unknown
     int records = 0;
-    bool noPlugin = false;
-    bool isSkipped = false; ///< by a user
-    int probes = 0;         ///< planned
-    int worker = 0;         ///< that it is about; 0: the scanner itself
+    int files = 0;  ///< found
+    int probes = 0; ///< planned
+    int worker = 0; ///< that it is about; 0: the scanner itself
 
     /// The last line of a scan that came to its end, cancelled or not.
     bool isLast() const { return event == Event::Finished || event == Event::Ended; }
