@@ -7,6 +7,7 @@
 #include "Core/BaseLib/WorkstationServices/AudioPlugins.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
@@ -26,7 +27,7 @@ namespace {
 /// Where the workstation keeps its scan list, below the user's home folder.
 constexpr char kDefaultScanList[] =
     "/AppData/Roaming/Morrow Labs/Quillon/Preferences/Tessel/Effects/FXScan.xml";
-/// The exit code for a scan list that is there and cannot be used.
+/// The exit code for a scan list, or folder rules, that are there and cannot be used.
 constexpr int kUnusableList = 2;
 constexpr char kReWireArgument[] = "-rewire_version";
 /// How long a plug-in may go on after somebody asked the process to end.
@@ -71,6 +72,15 @@ void runDialog(QApplication &application, const QString &dataFolder, bool isDefa
         leaveProcess(0);
 }
 
+/// Says that a file which tells what to scan, and what not, cannot be used; the exit code.
+int refuse(const QString &file, const QString &reason)
+{
+    DebugLog(L"%ls cannot be used, so nothing is scanned: %ls", file, reason);
+    ProbeReport::instance().unreadList(file, reason);
+    ProbeReport::instance().finish();
+    return kUnusableList;
+}
+
 } // namespace
 
 int runScanner(QApplication &application)
@@ -94,12 +104,11 @@ int runScanner(QApplication &application)
         return 0;
     }
     const ScanListContents list = ReadScanList(path);
-    if (!list) {
-        DebugLog(L"The scan list %ls cannot be used, so nothing is scanned: %ls", path, list.reason);
-        ProbeReport::instance().unreadList(path, list.reason);
-        ProbeReport::instance().finish();
-        return kUnusableList;
-    }
+    if (!list)
+        return refuse(path, list.reason);
+    if (const FolderRules rules = readFolderRules(dataFolder + QStringLiteral("/Effects")); !rules)
+        return refuse(dataFolder + QStringLiteral("/Effects") + QLatin1String(kFolderRulesFile),
+                      rules.reason);
     const QuillonInterfaceImpl workstation(dataFolder, list.folders);
     runDialog(application, dataFolder, isDefaultPath);
     return 0;

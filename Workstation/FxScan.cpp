@@ -6,12 +6,12 @@
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/VLib/ApplicationContext.h"
-#include "Workstation/Forget.h"
+#include "Workstation/FolderCommands.h"
 #include "Workstation/Library/ScanPlace.h"
 #include "Workstation/ManageCommands.h"
-#include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
+#include "Workstation/ScanFolders.h"
 #include "Workstation/ScanSession.h"
 
 #include <QFile>
@@ -53,26 +53,6 @@ void prepareEnvironment(const ScanOptions &options, const DataFiles &files)
         qputenv("QT_QPA_PLATFORM", "offscreen");
 }
 
-/// The folders to scan; with none given and a retry asked for, those of the last scan: what they held stays
-/// listed.
-QStringList foldersToScan(const ScanOptions &options, const DataFiles &files)
-{
-    if (options.folders.isEmpty() && options.asksAgain())
-        if (const QStringList last =
-                settleFolders(ReadScanList(files.effects + QLatin1String(kScanListFile)).folders).folders;
-            !last.isEmpty())
-            return last;
-    if (options.folders.isEmpty())
-        for (const QString &reason : settleFolders(foldersOfEnvironment()).leftOut)
-            complain(QStringLiteral("left out: ") + reason);
-    if (options.folders.isEmpty())
-        return existingUsualFolders();
-    const SettledFolders settled = settleFolders(options.folders);
-    for (const QString &reason : settled.leftOut)
-        complain(QStringLiteral("left out: ") + reason);
-    return settled.folders;
-}
-
 /// False when the result could not be written.
 bool print(const ScanOptions &options, const ScanSummary &summary, const QStringList &folders)
 {
@@ -105,52 +85,35 @@ int listOnly(const ScanOptions &options, const DataFiles &files)
                     {});
 }
 
-int printUsualFolders()
+int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &folders, ScanPlace &place)
 {
-    QString lines;
-    for (const QString &folder : existingUsualFolders())
-        lines += folder + QLatin1Char('\n');
-    return Terminal::printData(lines) ? ScanExit::kDone : ScanExit::kNotFinished;
-}
-
-int forget(const ScanOptions &options, const DataFiles &files)
-{
-    const ForgetOutcome outcome = forgetFolder(files.effects, options.forget);
-    if (!outcome.written)
-        complain(QStringLiteral("cannot write ") + outcome.written.reason);
-    Terminal::print(QStringLiteral("%1 plug-in%2 dropped\n")
-                        .arg(outcome.records)
-                        .arg(QLatin1String(outcome.records == 1 ? "" : "s")));
-    return outcome.written ? ScanExit::kDone : ScanExit::kNotFinished;
-}
-
-int scan(const ScanOptions &options, const DataFiles &files, const QStringList &folders, ScanPlace &place)
-{
-    const HostApplication workstation(options.dataFolder, folders);
+    const HostApplication workstation(options.dataFolder, folders.listed);
     PluginHost &registry = PluginHost::instance();
     AudioPlugins::setRegistry(&registry);
     registry.initialise(options.dataFolder, QString(), PluginHost::kDefaultSampleRate,
                         PluginHost::kDefaultBlockSize);
-    const CatalogueView before = readCatalogues(files.effects);
+    registry.setSearchedOnly(folders.searched);
+    const CatalogueView before = onlyBelow(readCatalogues(files.effects), folders.shown);
+    const QStringList searched = folders.shown.isEmpty() ? folders.listed : folders.shown;
     if (!place.writeList(workstation.scanFolders())) { // else an old one is scanned
         complain(place.reason());
         return ScanExit::kNotFinished;
     }
     if (options.asksAgain())
-        if (const int failed = prepareAskAgain(options, folders, registry); failed != ScanExit::kDone)
+        if (const int failed = prepareAskAgain(options, searched, registry); failed != ScanExit::kDone)
             return failed;
     if (options.inProcess)
         ProbeReport::instance().openFromEnvironment();
     JsonLines lines(options.format == OutputFormat::JsonLines);
-    lines.begin(options.dataFolder, folders);
+    lines.begin(options.dataFolder, searched);
     ScanSession session(options, registry, qEnvironmentVariable("FXPROBE_REPORT"), lines);
     const bool isFinished = session.run();
-    ScanSummary summary =
-        summariseScan(readCatalogues(files.effects), before, session.account(), ProbeMemory(files.effects));
+    ScanSummary summary = summariseScan(onlyBelow(readCatalogues(files.effects), folders.shown), before,
+                                        session.account(), ProbeMemory(files.effects));
     summary.finished = isFinished;
     if (!isFinished)
         complain(session.reason());
-    return conclude(options, summary, folders);
+    return conclude(options, summary, searched);
 }
 
 bool isScanned(const ScanOptions &options, const DataFiles &files)
@@ -161,7 +124,7 @@ bool isScanned(const ScanOptions &options, const DataFiles &files)
     return false;
 }
 
-/// What changes the catalogues without a scan.
+/// What changes the catalogues, or what is remembered of folders, without a scan.
 int edit(const ScanOptions &options, const DataFiles &files)
 {
     ScanPlace place(files.effects);
@@ -169,18 +132,15 @@ int edit(const ScanOptions &options, const DataFiles &files)
         complain(place.reason());
         return ScanExit::kNotFinished;
     }
-    return options.changesMarks() ? changeMarks(options, files.effects) : forget(options, files);
+    const int exitCode = options.changesMarks() ? changeMarks(options, files.effects)
+                                                : runFolderCommand(options, files.effects);
+    if (exitCode == ScanExit::kUsage)
+        place.removeMade();
+    return exitCode;
 }
 
 int prepareAndScan(const ScanOptions &options, const DataFiles &files)
 {
-    const QStringList folders = foldersToScan(options, files);
-    if (folders.isEmpty()) {
-        complain(options.folders.isEmpty()
-                     ? QStringLiteral("none of the usual plug-in folders exists; name one")
-                     : QStringLiteral("none of the folders given can be scanned"));
-        return ScanExit::kUsage;
-    }
     if (!options.inProcess && !QFile::exists(PluginHost::usualScannerPath())) {
         complain(QStringLiteral("there is no scanner program %1; --in-process does without")
                      .arg(PluginHost::usualScannerPath()));
@@ -191,25 +151,37 @@ int prepareAndScan(const ScanOptions &options, const DataFiles &files)
         complain(place.reason());
         return ScanExit::kNotFinished;
     }
-    prepareEnvironment(options, files);
-    if (const QFileInfo report(qEnvironmentVariable("FXPROBE_REPORT")); report.exists() && !report.isFile()) {
-        complain(QStringLiteral("the report %1 is not a file").arg(report.filePath()));
-        return ScanExit::kUsage;
+    const ScanFolders folders =
+        foldersToScan(options, files.effects); // of the list that is nobody else's now
+    for (const QString &reason : folders.leftOut)
+        complain(QStringLiteral("left out: ") + reason);
+    int exitCode = folders.isDamaged ? ScanExit::kNotFinished : ScanExit::kUsage;
+    if (!folders.unusable.isEmpty()) {
+        complain(folders.unusable);
+    } else {
+        prepareEnvironment(options, files);
+        const QFileInfo report(qEnvironmentVariable("FXPROBE_REPORT"));
+        if (report.exists() && !report.isFile())
+            complain(QStringLiteral("the report %1 is not a file").arg(report.filePath()));
+        else
+            exitCode = scan(options, files, folders, place);
     }
-    return scan(options, files, folders, place);
+    if (exitCode == ScanExit::kUsage)
+        place.removeMade();
+    return exitCode;
 }
 
 } // namespace
 
 int runFxScan(const ScanOptions &options)
 {
-    if (options.foldersOnly)
-        return printUsualFolders();
     const DataFiles files(options.dataFolder);
-    const bool isEdit = options.changesMarks() || !options.forget.isEmpty();
-    if ((isEdit || options.listOnly) && !isScanned(options, files))
+    if (options.foldersOnly)
+        return printFolders(files.effects);
+    if ((options.listOnly || options.changesMarks()) && !isScanned(options, files))
         return ScanExit::kUsage;
     if (options.listOnly)
         return listOnly(options, files);
-    return isEdit ? edit(options, files) : prepareAndScan(options, files);
+    return options.changesMarks() || isFolderCommand(options) ? edit(options, files)
+                                                              : prepareAndScan(options, files);
 }

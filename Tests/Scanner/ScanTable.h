@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 #include "Tests/Support/PlatformValues.h"
 #include "Tests/Support/ScanBench.h"
 #include "Tests/Support/VST2Fixture.h"
@@ -18,7 +19,8 @@
 //   write FILE: TEXT; remove FILE; move FILE FILE (or folder); holds FILE: TEXT
 //   link FILE FILE                where it lies and where it leads; where there are links
 //   short FILE BYTES              ends a file after so many and dates it as updated; date FILE TIME
-//   folders FOLDER…               what the scan list names
+//   folders FOLDER…               what the scan list names; only PATH… what scans from now on search of it
+//   excluded PATH…, ignored PATH… what the folder rules name
 //   mark NAME ELEMENT VALUE, …    as the user does
 //   edit FILE: OLD => NEW         in a catalogue; cut FILE: TEXT ends it before the text
 //   scan [N]                      until no marker survives, which takes N runs (1)
@@ -59,6 +61,8 @@ inline std::string nameOfScan(const testing::TestParamInfo<ScanCase> &row)
 
 class ScanTable : public ScanBench, public testing::WithParamInterface<ScanCase> {
 protected:
+    ~ScanTable() override { limit({}); }
+
     void carryOutAll()
     {
         for (const QString &step : GetParam().steps) {
@@ -69,8 +73,7 @@ protected:
         }
     }
 
-private:
-    void carryOut(const QString &step)
+    virtual void carryOut(const QString &step)
     {
         const QString head = step.section(':', 0, 0);
         const QString text = resolved(step.section(':', 1)).trimmed();
@@ -83,7 +86,8 @@ private:
         const std::map<QString, std::function<void()>> verbs = {
             {"put", [&] { each([&](const QString &one) { put(one, script(text)); }); }},
             {"new", [&] { each([&](const QString &one) { dateLater(put(one, script(text))); }); }},
-            {"write", [&] { m_folder.write(file, text.toUtf8().replace("\\n", "\n")); }},
+            {"write",
+             [&] { m_folder.write(file, text.toUtf8().replace("\\n", kLineEnd).replace("\\t", "\t")); }},
             {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
             {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(spelt(file)))); }},
             {"link", [&] { link(file.section(' ', 0, 0), file.section(' ', 1)); }},
@@ -98,6 +102,9 @@ private:
              [&] { EXPECT_EQ(askAgain(m_folder.effects(), {{file}}, {}, {}).wrong, QStringList()); }},
             {"exit", [&] { EXPECT_EQ(m_last.exitCode, file.toInt()); }},
             {"folders", [&] { m_folder.writeScanList(resolved(file).split(' ')); }},
+            {"only", [&] { limit(resolved(spelt(file)).split(' ', Qt::SkipEmptyParts)); }},
+            {"excluded", [&] { writeRules(resolved(file).split(' ', Qt::SkipEmptyParts), {}); }},
+            {"ignored", [&] { writeRules({}, resolved(spelt(file)).split(' ', Qt::SkipEmptyParts)); }},
             {"mark", [&] { each([this](const QString &one) { markAsUser(one); }); }},
             {"edit", [&] { edit(file, text.section(" => ", 0, 0), text.section(" => ", 1)); }},
             {"cut",
@@ -113,11 +120,14 @@ private:
         verbs.at(verb)();
     }
 
+    /// A text of the table with its stand-ins replaced.
     QString resolved(QString text) const
     {
         return text.replace('@', m_folder.dataFolder())
             .replace(QRegularExpression("\\.vst2\\b"), vst2Ending());
     }
+
+private:
     static QString spelt(QString file)
     {
         const QString path = QString(kBundlePath).replace("%1", "\\1");
@@ -128,6 +138,15 @@ private:
         statements.replace('%', kForeignLocale)
             .replace(QRegularExpression("#(\\d)"), "id " + QString(31, '0') + "\\1");
         return QString(statements + '\n').replace(" | ", "\n").toUtf8();
+    }
+    void limit(const QStringList &paths)
+    {
+        const QByteArray value = paths.join(QDir::listSeparator()).toLocal8Bit();
+        value.isEmpty() ? qunsetenv("FXPROBE_ONLY") : qputenv("FXPROBE_ONLY", value);
+    }
+    void writeRules(const QStringList &excluded, const QStringList &ignored) const
+    {
+        EXPECT_TRUE(writeFolderRules(m_folder.effects(), {excluded, ignored, {}}));
     }
     void move(const QStringList &paths) const
     {

@@ -254,16 +254,6 @@ TEST_F(FxScan, NamesThatBreakTheCatalogueAreNamed)
     EXPECT_EQ(states(result).size(), 1u) << "shown all the same";
 }
 
-TEST_F(FxScan, TheUsualFoldersAreThoseThatExist)
-{
-    put("Any.vst3");
-    m_fxscan.setEnvironment("VST3_PATH",
-                            m_folder.plugins() + QDir::listSeparator() + m_folder.path("nowhere"));
-    const QByteArray folders = run({"--folders"}).standardOutput;
-    EXPECT_TRUE(folders.startsWith(m_folder.plugins().toUtf8())) << folders.constData();
-    EXPECT_FALSE(folders.contains("nowhere")) << folders.constData();
-}
-
 TEST_F(FxScan, OnATerminalTheResultBeginsALine)
 {
     const QString script = QStandardPaths::findExecutable("script");
@@ -277,18 +267,6 @@ TEST_F(FxScan, OnATerminalTheResultBeginsALine)
     const QByteArray output = terminal.run().standardOutput;
     EXPECT_TRUE(output.contains("[0/1] VST 3  Comp.vst3")) << output.constData();
     EXPECT_TRUE(output.contains("\r\x1b[KFORMAT")) << output.constData();
-}
-
-TEST_F(FxScan, WhatIsAwayIsDroppedOnRequest)
-{
-    put("drive/Comp.vst3");
-    put("Stays.vst3");
-    scan();
-    QDir(m_folder.path("Plugins/drive")).removeRecursively();
-    EXPECT_EQ(states(scan())["Comp"], "folder away");
-    const ScannerOutcome outcome = run({"--forget", m_folder.path("Plugins/drive")});
-    EXPECT_TRUE(outcome.exitCode == 0 && outcome.standardOutput.startsWith("1 plug-in dropped"));
-    EXPECT_EQ(states(scan()), (States{{"Stays", "ok"}}));
 }
 
 TEST_F(FxScan, WrongUsage)

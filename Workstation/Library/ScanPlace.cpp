@@ -4,6 +4,7 @@
 
 #include <QDeadlineTimer>
 #include <QDir>
+#include <QFileInfo>
 #include <QThread>
 
 namespace {
@@ -21,10 +22,21 @@ bool waitForScanner(const QString &effectsFolder)
     return true;
 }
 
+/// The topmost of the folders that have to be made for a path; empty when it is there.
+QString firstMissing(const QString &path)
+{
+    QString missing;
+    for (QFileInfo folder(path); !folder.exists() && folder.filePath() != folder.path();
+         folder.setFile(folder.path()))
+        missing = folder.filePath();
+    return missing;
+}
+
 } // namespace
 
 ScanPlace::ScanPlace(const QString &effectsFolder)
     : m_effectsFolder(effectsFolder)
+    , m_made(firstMissing(effectsFolder))
 {
     if (!QDir().mkpath(effectsFolder)) {
         m_reason = QStringLiteral("cannot make the folder %1").arg(effectsFolder);
@@ -55,4 +67,10 @@ bool ScanPlace::writeList(const QStringList &folders)
     if (const FileResult written = WriteScanList(list, folders); !written)
         m_reason = QStringLiteral("cannot write the scan list %1: %2").arg(list, written.reason);
     return m_reason.isEmpty();
+}
+
+void ScanPlace::removeMade() const
+{
+    if (!m_made.isEmpty())
+        QDir(m_made).removeRecursively();
 }

@@ -26,10 +26,14 @@ public:
     /// Writes the scan list; false, with the reason, when it cannot: an old list would be scanned.
     bool writeList(const QStringList &folders);
 
+    /// Removes the folders that were made for it, with what lies in them: nothing came of it.
+    void removeMade() const;
+
 private:
     bool isHeld(const ScanLock &lock);
 
     QString m_effectsFolder;
+    QString m_made; ///< the topmost folder that was not there; empty: all were
     std::unique_ptr<ScanLock> m_workstation;
     std::unique_ptr<ScanLock> m_scanner;
     QString m_reason;

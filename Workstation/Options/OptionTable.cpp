@@ -87,22 +87,30 @@ const std::vector<OptionRow> &optionTable()
     static const std::vector<OptionRow> rows = {
         {"data-folder", "folder", &ScanOptions::dataFolder,
          "Keep the catalogues in the folder Effects of this folder."},
+        {"exclude", "folder", &ScanOptions::exclude,
+         "Never search a folder, or anything below it, and drop what is known of its plug-ins.",
+         "Makes no scan. To keep categories and favourites, use --ignore."},
         {"favourite", "name", &ScanOptions::favourite,
          "Mark a plug-in as a favourite; its name, its file's name (all plug-ins in it) or its path. Can be "
          "given several times.",
          "Makes no scan. Where several files have plug-ins of that name, give the path."},
         {"folders", "", &ScanOptions::foldersOnly,
-         "Print the usual plug-in folders that exist, one a line, without a scan."},
+         "Print the folders that a scan without arguments searches, without a scan.",
+         "On a terminal with the number of plug-ins known in each, and with what is excluded and ignored; "
+         "otherwise one a line."},
         {"forget", "folder", &ScanOptions::forget,
-         "Drop what is known of the plug-ins below a folder, with categories and favourites; makes no scan.",
-         "For a drive that is gone for good: what is known of one that is away is kept otherwise. A folder "
-         "that "
-         "is there still is scanned anew next time."},
+         "Forget a folder and what is known of the plug-ins below it, with categories and favourites.",
+         "Makes no scan. For a drive that is gone for good: what is known of one that is away is kept "
+         "otherwise."},
         {"format", "format", ChoiceTarget{{"table", "json", "jsonl", "csv"}, setFormat},
          "Print the result as table (the default), json, jsonl or csv.",
          "jsonl prints one JSON object a line while the scan goes on: what each probe came to, and the "
          "result "
          "as the last one."},
+        {"ignore", "path", &ScanOptions::ignore,
+         "Never load a plug-in, or any below a folder; it is listed as ignored.",
+         "Makes no scan. Its categories and favourites are kept, and so is what is known of it. The "
+         "workstation does not offer it."},
         {"in-process", "", &ScanOptions::inProcess,
          "Load the plug-ins into this process. One that crashes takes it along.",
          "Its marker stays for the next scan. A plug-in that hangs is not ended."},
@@ -116,7 +124,9 @@ const std::vector<OptionRow> &optionTable()
          "Give up on a plug-in that takes more memory than this; 0 (the default): half of the machine's, "
          "divided "
          "by the number of jobs."},
+        {"no-exclude", "folder", &ScanOptions::noExclude, "Search an excluded folder again."},
         {"no-favourite", "name", &ScanOptions::noFavourite, "Take the mark of a favourite away."},
+        {"no-ignore", "path", &ScanOptions::noIgnore, "Load an ignored plug-in again."},
         {"quiet", "", &ScanOptions::quiet, "Show no progress."},
         {"rescan", "name", &ScanOptions::rescan,
          "Probe a plug-in again although its file did not change. Can be given several times.",
@@ -150,8 +160,9 @@ const std::vector<OptionRow> &optionTable()
 
 const std::vector<const char *> &optionsWithoutScan()
 {
-    static const std::vector<const char *> names = {"folders",   "forget",    "list",        "switch-off",
-                                                    "switch-on", "favourite", "no-favourite"};
+    static const std::vector<const char *> names = {"exclude",   "favourite",  "folders",    "forget",
+                                                    "ignore",    "list",       "no-exclude", "no-favourite",
+                                                    "no-ignore", "switch-off", "switch-on"};
     return names;
 }
 
@@ -170,7 +181,7 @@ const std::vector<OptionConflict> &optionConflicts()
                  {"retry", "retry-changed", "retry-failed", "rescan", "rescan-all", "in-process"})
                 all.push_back({option, ofScan, reason});
         }
-        for (const char *first : {"folders", "forget", "list"})
+        for (const char *first : {"folders", "list"})
             for (const char *other : optionsWithoutScan())
                 if (qstrcmp(first, other) != 0)
                     all.push_back(

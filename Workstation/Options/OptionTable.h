@@ -30,7 +30,8 @@ using OptionTarget = std::variant<bool ScanOptions::*, QString ScanOptions::*, Q
 /// One option of fxscan: command line, help, completion and manual are all made from this row.
 struct OptionRow {
     const char *name;      ///< without the dashes
-    const char *valueName; ///< empty for a switch; for "folder" and "file" a shell offers just these
+    const char *valueName; ///< empty for a switch; for "folder", "file" and "path" a shell offers
+                           ///< just these
     OptionTarget target;
     const char *help;      ///< for `--help` and the manual
     const char *more = ""; ///< what only the manual adds

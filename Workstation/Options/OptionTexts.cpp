@@ -20,7 +20,7 @@ QString completionCommand(const OptionRow &row)
     const QLatin1String valueName(row.valueName);
     if (valueName == QLatin1String("folder"))
         return QStringLiteral("_fxscan_files -d");
-    if (valueName == QLatin1String("file"))
+    if (valueName == QLatin1String("file") || valueName == QLatin1String("path"))
         return QStringLiteral("_fxscan_files -f");
     return QStringLiteral(":");
 }

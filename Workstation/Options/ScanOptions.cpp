@@ -53,7 +53,9 @@ CommandLine readCommandLine(const QStringList &arguments)
     parser.addOptions(commandLineOptions() << help << version);
     parser.addPositionalArgument(
         QStringLiteral("folder"),
-        QStringLiteral("Folders to scan, with all below them. None: the usual plug-in folders."),
+        QStringLiteral(
+            "Folders to scan, with all below them, or plug-ins. They are remembered. None: all that "
+            "are remembered, and the usual plug-in folders."),
         QStringLiteral("[folder...]"));
     CommandLine line;
     const bool isParsed = parser.parse(arguments);

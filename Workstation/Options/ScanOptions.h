@@ -18,7 +18,11 @@ struct ScanOptions {
     QStringList folders; ///< as given; none: the usual ones
     QString dataFolder;  ///< absolute, without a separator at its end
     OutputFormat format = OutputFormat::Table;
-    QString forget;            ///< folder whose plug-ins are dropped from the catalogues; empty: none
+    QStringList forget;        ///< folders that are dropped with what is known of their plug-ins
+    QStringList exclude;       ///< folders that are never searched from now on
+    QStringList noExclude;     ///< folders that are searched again
+    QStringList ignore;        ///< modules and folders whose plug-ins are never loaded from now on
+    QStringList noIgnore;      ///< modules and folders whose plug-ins are loaded again
     QStringList retry;         ///< names or paths of plug-ins that get another chance
     bool retryFailed = false;  ///< all of them
     bool retryChanged = false; ///< those of them that may work now
@@ -32,7 +36,7 @@ struct ScanOptions {
     int memoryLimit = 0; ///< MiB that a plug-in may take; 0: a share of the machine's
     int timeout = 60;    ///< seconds that one plug-in may take; 0: for ever
     bool listOnly = false;
-    bool foldersOnly = false; ///< prints the usual folders, and nothing else
+    bool foldersOnly = false; ///< prints the folders, and nothing else
     bool inProcess = false;
     bool quiet = false;
     bool showWindow = false;

@@ -1,7 +1,9 @@
 #include "Workstation/Summary/CatalogueView.h"
 
+#include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 
 #include <QDir>
 #include <QFile>
@@ -54,7 +56,8 @@ bool isAway(const QString &path)
                               leadsNowhere(bundleOf(path)));
 }
 
-void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder, CatalogueView &view)
+void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder, const FolderRules &rules,
+                   CatalogueView &view)
 {
     const QString path = effectsFolder + QLatin1String(format.catalogue->fileName);
     if (!QFile::exists(path))
@@ -79,6 +82,7 @@ void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder,
         if (record.standsForFile() && described.count(record.path) != 0)
             continue; // its plug-ins are shown, each with the reason that the file has
         view.plugins.push_back({&format, record, QString(), isOfCrashedFile(record), isAway(record.path)});
+        view.plugins.back().isIgnored = record.isIgnored() || rules.isIgnored(record.path);
         if (const QString bad = badText(record); !bad.isEmpty())
             view.problems.append(QStringLiteral("%1 is not well-formed XML: %2").arg(path, bad));
     }
@@ -101,6 +105,8 @@ const char *stateText(PluginState state)
         return "no plug-in";
     case PluginState::Skipped:
         return "skipped";
+    case PluginState::Ignored:
+        return "ignored";
     case PluginState::FolderAway:
         return "folder away";
     }
@@ -109,6 +115,8 @@ const char *stateText(PluginState state)
 
 PluginState CataloguedPlugin::state() const
 {
+    if (isIgnored)
+        return PluginState::Ignored;
     if (isAway)
         return PluginState::FolderAway;
     if (isOfCrashedFile)
@@ -134,14 +142,31 @@ QStringList CataloguedPlugin::categories() const
 CatalogueView readCatalogues(const QString &effectsFolder)
 {
     CatalogueView view;
+    const FolderRules rules = readFolderRules(effectsFolder);
+    if (!rules)
+        view.problems.append(QStringLiteral("%1%2 cannot be used: %3")
+                                 .arg(effectsFolder, QLatin1String(kFolderRulesFile), rules.reason));
     for (const PluginFormatInfo &format : pluginFormats())
         if (format.isScanned())
-            readCatalogue(format, effectsFolder, view);
+            readCatalogue(format, effectsFolder, rules, view);
     const auto sortKey = [](const CataloguedPlugin &plugin) {
         return std::make_tuple(plugin.record.name.toCaseFolded(), plugin.record.path, plugin.record.id);
     };
     std::stable_sort(
         view.plugins.begin(), view.plugins.end(),
         [&](const CataloguedPlugin &a, const CataloguedPlugin &b) { return sortKey(a) < sortKey(b); });
+    return view;
+}
+
+CatalogueView onlyBelow(CatalogueView view, const QStringList &paths)
+{
+    const SearchArea area(paths, {});
+    const auto isOutside = [&](const CataloguedPlugin &plugin) {
+        const QString &path = plugin.record.path; // by which the file was known before, through another link
+        return !area.isWithin(path) && (plugin.isAway || !area.isWithin(realPath(path).value_or(path)));
+    };
+    if (area.isLimited())
+        view.plugins.erase(std::remove_if(view.plugins.begin(), view.plugins.end(), isOutside),
+                           view.plugins.end());
     return view;
 }

@@ -16,6 +16,7 @@ enum class PluginState {
     SwitchedOff, ///< by the user
     NoPlugin,    ///< a file named like a plug-in that is none
     Skipped,     ///< by the user, in the last scan, and nothing is known of it
+    Ignored,     ///< never loaded, because the user wants it so
     FolderAway,  ///< the folder that it lay in is not there, or is empty: on a drive that is unplugged
 };
 
@@ -34,11 +35,12 @@ struct CataloguedPlugin {
     bool isAway = false; ///< see `PluginState::FolderAway`
 
     PluginState state() const;
-    qint32 inputs = -1;  ///< audio channels as far as catalogue and last probe tell; -1: unknown
-    qint32 outputs = -1; ///< the same
+    qint32 inputs = -1;     ///< audio channels as far as catalogue and last probe tell; -1: unknown
+    qint32 outputs = -1;    ///< the same
+    bool isIgnored = false; ///< see `PluginState::Ignored`
     /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
     bool hasWidth() const { return format->catalogue->hasWidth; }
-    bool isUsable() const { return record.working && !isOfCrashedFile && !isAway; }
+    bool isUsable() const { return record.working && !isOfCrashedFile && !isAway && !isIgnored; }
     /// The categories' names, else what the plug-in says of itself.
     QStringList categories() const;
 };
@@ -51,3 +53,6 @@ struct CatalogueView {
 };
 
 CatalogueView readCatalogues(const QString &effectsFolder);
+
+/// Takes out the plug-ins that lie neither at nor below some paths; none: all stay.
+CatalogueView onlyBelow(CatalogueView view, const QStringList &paths);

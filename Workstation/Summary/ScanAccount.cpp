@@ -55,8 +55,8 @@ void ScanAccount::takeLine(const ReportLine &line)
         addProblem(QStringLiteral("%1 could not be written: %2").arg(line.path, line.reason));
         break;
     case Event::UnreadList:
-        addProblem(QStringLiteral("the scan list %1 cannot be used, so nothing was scanned: %2")
-                       .arg(line.path, line.reason));
+        addProblem(
+            QStringLiteral("%1 cannot be used, so nothing was scanned: %2").arg(line.path, line.reason));
         break;
     case Event::Stage:
         if (const Open *open = innermost(line.worker)) {

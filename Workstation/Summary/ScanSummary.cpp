@@ -45,7 +45,7 @@ QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, con
 void addFailures(ScanSummary &summary, const ScanAccount *account, const ProbeMemory &memory)
 {
     for (CataloguedPlugin &plugin : summary.plugins) {
-        if (plugin.isUsable())
+        if (plugin.isUsable() || plugin.isIgnored)
             continue;
         plugin.reason = reasonOf(plugin, account, memory);
         summary.failures.push_back({plugin.format, plugin.state(), plugin.record.name, plugin.record.path,

@@ -77,15 +77,27 @@ QStringList FileFinder::find(const QStringList &folders, const QString &ending, 
     return paths;
 }
 
+void FileFinder::setArea(const SearchArea &area)
+{
+    m_area = area;
+    m_folders.clear(); // what was found does not count any more
+}
+
 QString FileFinder::foundInsteadOf(const QString &path) const
 {
     for (const Place &other : m_otherPaths)
-        if (isBelow(path, other.path)) {
-            const QString real = moved(path, other.path, other.real);
-            const auto listed = m_listedByLink.constFind(pathKey(real));
-            return listed != m_listedByLink.constEnd() ? *listed : searchedAs(real);
-        }
-    return {};
+        if (isBelow(path, other.path))
+            return knownAs(moved(path, other.path, other.real));
+    // The link by which it is known may lie where this search did not look.
+    const std::optional<QString> real = m_area.isLimited() ? realPath(path) : std::nullopt;
+    return real ? knownAs(*real) : QString();
+}
+
+/// The path under which something real was listed, or would have been.
+QString FileFinder::knownAs(const QString &real) const
+{
+    const auto listed = m_listedByLink.constFind(pathKey(real));
+    return listed != m_listedByLink.constEnd() ? *listed : searchedAs(real);
 }
 
 bool FileFinder::isLookedFor(const QString &name) const
@@ -97,9 +109,14 @@ bool FileFinder::isLookedFor(const QString &name) const
 /// False when it ended early.
 bool FileFinder::search(const QStringList &folders, const Cancelled &isCancelled)
 {
+    const SearchArea area = m_area;
     *this = FileFinder(m_endings, m_links);
-    for (const Place &start : settleStarts(folders))
-        if (!searchFolder(start, start.path, isCancelled))
+    m_area = area;
+    const std::vector<Place> starts = settleStarts(folders);
+    listStarts(starts);
+    for (const Place &start : starts)
+        if (mayHoldSome(start, start.path) && !isListedFile(start) &&
+            !searchFolder(start, start.path, isCancelled))
             return false;
     for (std::size_t index = 0; index < m_met.size(); ++index) { // following one adds others
         const Link link = m_met[index];
@@ -119,6 +136,8 @@ std::vector<FileFinder::Place> FileFinder::settleStarts(const QStringList &folde
             continue;
         }
         const QString path = QDir::cleanPath(QFileInfo(folder).absoluteFilePath());
+        if (m_area.isExcluded(path))
+            continue;
         const Place start{path, realPath(path).value_or(path)};
         const QString before = searchedAs(start.real);
         if (before.isNull()) {
@@ -139,6 +158,38 @@ std::vector<FileFinder::Place> FileFinder::settleStarts(const QStringList &folde
     return starts;
 }
 
+/// Lists the folders to search that are looked for themselves, before the searches come upon them.
+void FileFinder::listStarts(const std::vector<Place> &starts)
+{
+    for (const Place &start : starts)
+        if (isLookedFor(start.path) && isInArea(start, start.path) && QFileInfo::exists(start.path)) {
+            m_found.append(start.path);
+            m_listedByLink.insert(pathKey(start.real), start.path);
+        }
+}
+
+/// Whether a start is a file that was listed, in which there is nothing to search.
+bool FileFinder::isListedFile(const Place &start) const
+{
+    return m_listedByLink.contains(pathKey(start.real)) && QFileInfo(start.path).isFile();
+}
+
+/// Whether something below a start belongs to what is searched.
+bool FileFinder::isInArea(const Place &start, const QString &path) const
+{
+    if (m_area.isEverything())
+        return true;
+    const QString real = moved(path, start.path, start.real);
+    return (m_area.isWithin(path) || m_area.isWithin(real)) && !m_area.isExcluded(path) &&
+           !m_area.isExcluded(real);
+}
+
+bool FileFinder::mayHoldSome(const Place &start, const QString &folder) const
+{
+    return m_area.isEverything() ||
+           (!m_area.isExcluded(folder) && m_area.mayHoldSome(moved(folder, start.path, start.real)));
+}
+
 /// False when it ended early.
 bool FileFinder::searchFolder(const Place &start, const QString &folder, const Cancelled &isCancelled)
 {
@@ -155,14 +206,16 @@ bool FileFinder::searchFolder(const Place &start, const QString &folder, const C
     for (const FolderEntry &entry : content.entries) {
         if (entry.isLink && m_links == Links::Followed)
             m_met.push_back({prefix + entry.name, entry.isFolder});
-        else if (isLookedFor(entry.name) && !wasReached(m_listedByLink, start, prefix + entry.name))
+        else if (isLookedFor(entry.name) && isInArea(start, prefix + entry.name) &&
+                 !wasReached(m_listedByLink, start, prefix + entry.name))
             m_found.append(prefix + entry.name);
     }
     for (const FolderEntry &entry : content.entries) {
         if (!entry.isFolder || entry.isLink)
             continue;
         const QString path = prefix + entry.name;
-        if (!wasReached(m_startsMet, start, path) && !searchFolder(start, path, isCancelled))
+        if (mayHoldSome(start, path) && !wasReached(m_startsMet, start, path) &&
+            !searchFolder(start, path, isCancelled))
             return false;
     }
     return true;
@@ -190,10 +243,12 @@ bool FileFinder::follow(const Link &link, const Cancelled &isCancelled)
     if (!real || std::any_of(m_realFolders.begin(), m_realFolders.end(), isInside))
         return true;
     const Place place{link.path, *real};
+    if (!mayHoldSome(place, link.path))
+        return true;
     const bool isNew = searchedAs(place.real).isNull();
     if (!isNew || m_listedByLink.contains(pathKey(place.real)))
         m_otherPaths.push_back(place);
-    if (isLookedFor(link.path) && !isListed(place)) {
+    if (isLookedFor(link.path) && !isListed(place) && isInArea(place, link.path)) {
         m_found.append(link.path);
         m_listedByLink.insert(pathKey(place.real), link.path);
     }

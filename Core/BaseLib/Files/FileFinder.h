@@ -1,5 +1,7 @@
 #pragma once
 
+#include "Core/BaseLib/Files/SearchArea.h"
+
 #include <QHash>
 #include <QString>
 #include <QStringList>
@@ -24,16 +26,24 @@ public:
     /// are names that are not valid text. A folder that cannot be read, or an empty path, gives one log line.
     /// `isCancelled` is asked before each folder; the search ends early when it answers true.
     ///
+    /// One of `folders` whose own name ends so is listed as well; it may be a file.
+    ///
     /// Each real folder is searched once, and each real file listed once, by the first path that leads there.
     /// A link to one of `folders`, or to a folder around one, is passed over.
     QStringList find(const QStringList &folders, const QString &ending,
                      const Cancelled &isCancelled = nullptr);
 
+    /// Limits the searches that follow: what lies outside the area is not listed, and no folder is read in
+    /// which nothing of it can lie.
+    void setArea(const SearchArea &area);
+    const SearchArea &area() const { return m_area; }
+
     /// The path under which the last search came upon what this other path leads to as well; null when it
     /// knows of no such path.
     QString foundInsteadOf(const QString &path) const;
-    /// Whether there is anything that more than one path led to.
-    bool hasOtherPaths() const { return !m_otherPaths.empty(); }
+    /// Whether there is anything to which more than one path leads, or may lead: a limited search does not
+    /// see all links.
+    bool hasOtherPaths() const { return !m_otherPaths.empty() || m_area.isLimited(); }
 
     /// The folders so far of which not all could be read.
     const QStringList &unread() const { return m_unread; }
@@ -61,10 +71,16 @@ private:
     bool wasReached(const Reached &reached, const Place &start, const QString &path);
     bool follow(const Link &link, const Cancelled &isCancelled);
     bool isListed(const Place &place) const;
+    void listStarts(const std::vector<Place> &starts);
+    bool isListedFile(const Place &start) const;
+    bool isInArea(const Place &start, const QString &path) const;
+    bool mayHoldSome(const Place &start, const QString &folder) const;
+    QString knownAs(const QString &real) const;
     QString searchedAs(const QString &real) const;
 
     QStringList m_endings;
     Links m_links;
+    SearchArea m_area;
     QStringList m_folders; ///< that were searched last
     QStringList m_found;   ///< in them, of all endings
     QStringList m_unread;

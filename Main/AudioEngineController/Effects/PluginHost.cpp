@@ -8,6 +8,7 @@
 #include "Main/AudioEngineController/Effects/Host/AudioUnitHost.h"
 #include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Host/ProbePool.h"
+#include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
@@ -238,6 +239,9 @@ bool PluginHost::scanHosts(bool scan)
         if (info.isScanned())
             endings.append(info.moduleEnding);
     const auto finder = std::make_shared<FileFinder>(endings);
+    if (scan)
+        finder->setArea(
+            {m_only.isEmpty() ? searchedOnly() : m_only, readFolderRules(effectsFolder()).excluded});
     const std::shared_ptr<ProbePool> pool = scan ? poolOfEnvironment() : nullptr;
     forEachHost([&](AudioPluginHost &host) {
         if (scan && m_launcher.isCancelled()) { // what the host knows stays in its catalogue
@@ -281,9 +285,12 @@ void PluginHost::launch()
     const TAutoLockCS lock(&m_ks);
     try {
         const int jobs = scanJobs(m_scanJobs);
+        std::map<QString, QString> environment = m_scannerEnvironment;
+        if (!m_only.isEmpty())
+            environment[QStringLiteral("FXPROBE_ONLY")] = m_only.join(QDir::listSeparator());
         m_launcher.run({m_scannerPath, effectsFolder() + QLatin1String(kScanListFile), effectsFolder(),
                         m_probeLimit, [this] { WriteScanList(); }, jobs, memoryLimit(m_memoryLimit, jobs),
-                        m_scannerEnvironment});
+                        environment});
         if (!m_launcher.isCancelled())
             reloadChanged();
     } catch (const std::exception &error) {

@@ -64,6 +64,10 @@ public:
     /// MiB of resident memory that a plug-in's process may hold; 0, the default: half of the machine's memory
     /// divided by the number of jobs, at least 1 GiB. Set while no launcher runs.
     void setMemoryLimit(int mebibytes) { m_memoryLimit = mebibytes; }
+    /// The files and folders that scans search, of those in the scan list; what is known of all others stays
+    /// as it is. None, as at first: those that the environment variable "FXPROBE_ONLY" names, else all. Set
+    /// while no launcher runs.
+    void setSearchedOnly(const QStringList &paths) { m_only = paths; }
     void setAudioSettings(int sampleRate, int blockSize) override;
     void setIntParameter(IntParameter parameter, int value) override;
 
@@ -131,6 +135,7 @@ private:
     int m_probeLimit = 0; ///< seconds
     int m_scanJobs = 0;
     int m_memoryLimit = 0; ///< MiB
+    QStringList m_only;
     ScannerLauncher m_launcher;
     std::atomic<bool> m_launching{false};
     std::thread m_launcherThread; ///< joined before the next launch, and at the end

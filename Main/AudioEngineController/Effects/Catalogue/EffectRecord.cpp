@@ -43,6 +43,16 @@ void takeMarks(EffectRecord &record, const EffectRecord &old)
     record.working = true;
 }
 
+bool settleIgnored(EffectRecord &record, bool isIgnored)
+{
+    if (isIgnored == record.isIgnored() || (isIgnored && !record.enabled))
+        return false;
+    record.enabled = !isIgnored;
+    record.working = false;
+    record.fileTime = isIgnored ? QString::fromLatin1(kIgnoredTime) : QString();
+    return true;
+}
+
 bool NameFromPath(EffectRecord &record)
 {
     const int dot = record.path.lastIndexOf(QLatin1Char('.'));

@@ -4,6 +4,9 @@
 
 #include <QString>
 
+/// The time stamp of a record that is ignored.
+inline constexpr char kIgnoredTime[] = "ignored";
+
 /// One plug-in as the catalogue knows it. A value type; lists copy it.
 struct EffectRecord {
     QString path;           ///< full path of the plug-in file, "/" as separator
@@ -25,8 +28,11 @@ struct EffectRecord {
     QString subName;        ///< VST 2: name of a shell's sub-plug-in
     quint32 subId = 0;      ///< VST 2: identifier of a shell's sub-plug-in; 0: it is not one
 
+    /// True for what the user wants never loaded: disabled and not working, and in place of the file's time
+    /// stands a word that no file has.
+    bool isIgnored() const { return !enabled && !working && fileTime == QLatin1String(kIgnoredTime); }
     /// True for what a crash marker made of a whole file: disabled and not working.
-    bool isCrashedFile() const { return !enabled && !working && subId == 0; }
+    bool isCrashedFile() const { return !enabled && !working && subId == 0 && !isIgnored(); }
     /// True for what stands for a whole file that crashed or failed: such a record is named after the file,
     /// or identified by its path.
     bool standsForFile() const;
@@ -49,6 +55,11 @@ QString fileNameOf(const QString &path);
 /// switch-off. A plug-in that is switched off stays so, and is not shown as failed, also when it fails to
 /// load.
 void takeMarks(EffectRecord &record, const EffectRecord &old);
+
+/// Makes a record fit whether the user wants its file never loaded; true when it changed. A record that was
+/// usable, or failed, becomes ignored, and back again one that failed and has to be asked anew. The user's
+/// switch-off and a crash stay as they are: neither is loaded, and both are to be known afterwards.
+bool settleIgnored(EffectRecord &record, bool isIgnored);
 
 /// Gives the record a name made from its path: the file name up to its last ".", with the first "x64", then
 /// the first

@@ -140,10 +140,17 @@ CatalogueContents CatalogueHost::readContents()
 
 void CatalogueHost::readKnownRecords()
 {
-    const CatalogueContents contents = readContents();
+    m_rules = readFolderRules(catalogueFolder());
+    if (!m_rules)
+        DebugLog(L"Cannot use %ls of %ls: %ls", QString::fromLatin1(kFolderRulesFile + 1), catalogueFolder(),
+                 m_rules.reason);
+    CatalogueContents contents = readContents();
     m_isKnownAsRead = contents.isAsWritten;
-    for (const EffectRecord &record : contents.records)
+    for (EffectRecord &record : contents.records) {
+        if (m_rules) // else what is ignored stays so
+            m_isKnownAsRead &= !settleIgnored(record, m_rules.isIgnored(record.path));
         m_isKnownAsRead &= m_known.addRecord(record);
+    }
     m_isKnownAsRead &= !m_known.disableBesideCrashed();
 }
 
@@ -234,12 +241,11 @@ void CatalogueHost::clearSuspect(const QString &path)
     m_suspects.erase(suspect);
 }
 
-void CatalogueHost::clearSuspects(const KnownList::Records &away)
+void CatalogueHost::clearSuspects(const std::function<bool(const QString &path)> &mayBeAsked)
 {
     QStringList paths;
     for (const auto &suspect : m_suspects)
-        if (std::none_of(away.begin(), away.end(),
-                         [&](const EffectRecord *record) { return isSamePath(record->path, suspect.first); }))
+        if (!mayBeAsked(suspect.first))
             paths.append(suspect.first);
     for (const QString &path : paths)
         clearSuspect(path);

@@ -8,7 +8,9 @@
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/Host/AudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
+#include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 
+#include <functional>
 #include <map>
 #include <memory>
 #include <set>
@@ -52,8 +54,8 @@ public:
     bool isSuspect(const QString &path) const { return m_suspects.count(path) != 0; }
     /// Deletes the marker of a suspect that was asked.
     void clearSuspect(const QString &path);
-    /// Deletes the markers of suspects that cannot be asked any more: of all but those that are away.
-    void clearSuspects(const KnownList::Records &away);
+    /// Deletes the markers of suspects that cannot be asked any more.
+    void clearSuspects(const std::function<bool(const QString &path)> &mayBeAsked);
     /// Reads a crash marker into a fresh record that is not enabled. The file stays: it is deleted once the
     /// catalogue holds what it said.
     EffectRecord ReadCrashMarker(const QString &marker) const;
@@ -83,6 +85,8 @@ public:
     bool isLeftAlone(const QString &path) const { return m_leftAlone.count(path) != 0; }
     /// True when the effect list holds the identifier.
     bool isListed(const QString &id) const;
+    /// What the user wants left alone, as it stood when the catalogue was read.
+    const FolderRules &rules() const { return m_rules; }
     /// Whether there is a catalogue that the system did not let us read. It is not replaced.
     bool isCatalogueUnread() const { return !m_unread.isEmpty(); }
 
@@ -135,6 +139,7 @@ private:
 
     const PluginFormatInfo &m_info;
     FileStamp m_lastSeen;
+    FolderRules m_rules;
     KnownList m_known;
     EffectList m_effects;
     std::set<QString, PathLess> m_leftAlone;

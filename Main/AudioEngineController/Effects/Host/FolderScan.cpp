@@ -33,7 +33,10 @@ FolderScan::FolderScan(CatalogueHost &host)
     , m_finder(host.fileFinder() ? host.fileFinder()
                                  : std::make_shared<FileFinder>(QStringList(host.info().moduleEnding)))
     , m_memory(host)
-{}
+{
+    if (!host.fileFinder())
+        m_finder->setArea({{}, host.rules().excluded});
+}
 
 FolderScan::~FolderScan() = default;
 
@@ -57,6 +60,12 @@ void FolderScan::scan()
             m_host.WriteCatalogue(); // says why it cannot: nothing would come of the probes, and known
         return;                      // crashes would happen again
     }
+    if (!m_host.rules()) { // nobody knows what must not be loaded
+        ProbeReport::instance().unreadList(m_host.catalogueFolder() + QLatin1String(kFolderRulesFile),
+                                           m_host.rules().reason);
+        m_host.refillEffects();
+        return;
+    }
     m_progress = createProgressDisplay();
     const QStringList modules = findModules();
     if (isCancelled()) { // the catalogue holds all that is known
@@ -65,7 +74,7 @@ void FolderScan::scan()
     }
     for (const QString &path : modules)
         m_found.insert(pathKey(path));
-    m_plan = std::make_unique<ScanPlan>(m_host, m_memory.probes(), m_host.folders(), m_finder->unread());
+    m_plan = std::make_unique<ScanPlan>(m_host, m_memory.probes(), *m_finder);
     m_plan->decide(modules);
     m_memory.addCrashes();
     ProbeReport::instance().plan(m_host.format(), static_cast<std::size_t>(modules.size()),
@@ -96,11 +105,15 @@ QStringList FolderScan::findModules() const
 void FolderScan::keepKnownPaths(QStringList &paths) const
 {
     QHash<QString, int> places;
-    for (int place = 0; place < paths.size(); ++place)
+    QSet<QString> names;
+    for (int place = 0; place < paths.size(); ++place) {
         places.insert(pathKey(paths.at(place)), place);
+        names.insert(pathKey(fileNameOf(paths.at(place))));
+    }
     for (const EffectRecord *record : m_host.known().all()) {
-        if (places.contains(pathKey(record->path)))
-            continue;
+        if (places.contains(pathKey(record->path)) ||
+            (m_finder->area().isLimited() && !names.contains(pathKey(fileNameOf(record->path)))))
+            continue; // a limited search asks the system, which may take its time elsewhere
         const auto found = places.constFind(pathKey(m_finder->foundInsteadOf(record->path)));
         if (found != places.constEnd() && m_host.known().recordsOfPath(paths.at(*found)).empty())
             paths[*found] = record->path;
@@ -337,6 +350,7 @@ void FolderScan::finish(bool isWhole)
     for (const auto &[id, old] : m_likelyMarks)
         if (!m_host.isListed(old->id) && !mayYetBeListed(*old))
             m_host.passMarks(*old, id);
+    listIgnored();
     if (isWhole) {
         const ScanPlan::MovedToCrashed moved = m_plan->movedToCrashed();
         for (const EffectRecord &record : moved.records)
@@ -347,13 +361,38 @@ void FolderScan::finish(bool isWhole)
             if (!m_host.isListed(record->id)) // else a file that is there lists it
                 m_host.AddEffect(*record);
         forgetGone();
-        m_host.clearSuspects(m_plan->away());
+        m_host.clearSuspects([this](const QString &path) {
+            const KnownList::Records &away = m_plan->away();
+            return m_plan->isOutside(path) ||
+                   std::any_of(away.begin(), away.end(),
+                               [&](const EffectRecord *record) { return isSamePath(record->path, path); });
+        });
     } else {
         ProbeReport::instance().cancelled();
         collectWaiting(m_done);
     }
     m_written |= m_host.writeIfChanged(m_waiting);
     m_memory.write(true);
+}
+
+/// What the user wants never loaded is listed all the same; what nobody ever asked has a record for the file.
+void FolderScan::listIgnored()
+{
+    for (const QString &path : m_plan->ignored()) {
+        const KnownList::Records known = m_host.known().recordsOfPath(path);
+        const RememberedProbe *last = m_memory.probes().find(m_host.format(), path);
+        const bool isListed = std::any_of(known.begin(), known.end(), [&](const EffectRecord *record) {
+            const std::optional<EffectRecord> listed = m_host.findEffect(record->id);
+            return listed && isSamePath(listed->path, path);
+        });
+        if (isListed || m_host.moduleTime(path).isEmpty() || (last && last->status == ProbeStatus::NoPlugin))
+            continue;
+        EffectRecord file;
+        file.path = path;
+        m_host.completeFailedRecord(file);
+        settleIgnored(file, true);
+        m_host.AddEffect(file);
+    }
 }
 
 /// A file that came to list what another one lists no more has that one's marks, unless it had its own.
@@ -375,7 +414,8 @@ void FolderScan::forgetGone()
     QSet<QString> there = m_found;
     for (const EffectRecord *record : m_plan->away())
         there.insert(pathKey(record->path));
-    m_memory.keepOnly(there);
+    m_memory.keepOnly(
+        [&](const QString &path) { return m_plan->isOutside(path) || there.contains(pathKey(path)); });
 }
 
 void FolderScan::stageEntered(ProbeStage stage)

@@ -48,6 +48,7 @@ private:
     void passMarksToHolder(const EffectRecord &record);
     void giveUpOthers(const ScanItem &item, const OutcomeRecords &records);
     void forgetGone();
+    void listIgnored();
 
     /// Has interim writes carry what is known of the items from one on.
     void collectWaiting(std::size_t from);

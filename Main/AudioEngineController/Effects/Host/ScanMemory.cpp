@@ -35,11 +35,6 @@ void ScanMemory::addCrashes()
     }
 }
 
-void ScanMemory::keepOnly(const QSet<QString> &files)
-{
-    m_probes.keepOnly(m_host.format(), [&](const QString &path) { return files.contains(pathKey(path)); });
-}
-
 void ScanMemory::childEnded(quint32 subId, const QString &reason)
 {
     m_item.plugins.push_back({QString(), subId, reason, -1, -1, QString()});

@@ -4,7 +4,6 @@
 #include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 
 #include <QElapsedTimer>
-#include <QSet>
 
 /// What one scan of a format's folders puts into the memory of probes, item by item, and when that is
 /// written. Used on the scan worker.
@@ -19,8 +18,11 @@ public:
     /// Remembers what the crash markers said that this run absorbed. The launcher, which saw the end, knows
     /// more.
     void addCrashes();
-    /// Forgets the files of this format that are not among these, by `pathKey`.
-    void keepOnly(const QSet<QString> &files);
+    /// Forgets the files of this format of which the condition does not hold.
+    void keepOnly(const std::function<bool(const QString &path)> &isKept)
+    {
+        m_probes.keepOnly(m_host.format(), isKept);
+    }
 
     /// Begins an item, of which nothing is known yet.
     void begin() { m_item = RememberedProbe(); }

@@ -10,12 +10,6 @@
 
 namespace {
 
-bool isBelowAny(const QString &path, const QStringList &folders)
-{
-    return std::any_of(folders.begin(), folders.end(),
-                       [&](const QString &folder) { return isBelow(path, folder); });
-}
-
 /// Whether the record that speaks for a file does not fit it any more.
 bool isOutdated(const EffectRecord &first, const QString &fileTime)
 {
@@ -68,13 +62,13 @@ const EffectRecord *loneFileRecord(const KnownList::Records &records)
 
 } // namespace
 
-ScanPlan::ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const QStringList &folders,
-                   const QStringList &unread)
+ScanPlan::ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const FileFinder &finder)
     : m_host(host)
     , m_memory(memory)
-    , m_unread(unread)
+    , m_unread(finder.unread())
+    , m_area(finder.area())
 {
-    for (const QString &folder : folders)
+    for (const QString &folder : host.folders())
         if (!folder.isEmpty())
             m_folders.append(QDir::cleanPath(QFileInfo(folder).absoluteFilePath()));
 }
@@ -107,6 +101,11 @@ void ScanPlan::decide(const QStringList &modules)
 void ScanPlan::decideModule(const QString &path)
 {
     KnownList::Records known = m_host.known().recordsOfPath(path);
+    if (m_host.rules().isIgnored(path)) {
+        m_ignored.append(path);
+        keep(known);
+        return;
+    }
     const QString fileTime = m_host.moduleTime(path);
     const bool isAbsent = fileTime.isEmpty(); // not a module after all; unless nobody lets us see
     if (m_host.isLeftAlone(path) || (isAbsent && (cannotBeExamined(path) || leadsNowhere(path))) ||
@@ -123,6 +122,10 @@ void ScanPlan::sortMissing(const QSet<QString> &found)
         const QString key = pathKey(record->path);
         if (found.contains(key) || gone.contains(key))
             continue;
+        if (isOutside(record->path)) {
+            keep({record});
+            continue;
+        }
         if (!isGone(record->path)) {
             m_away.push_back(record);
             continue;
@@ -134,17 +137,34 @@ void ScanPlan::sortMissing(const QSet<QString> &found)
 
 bool ScanPlan::isGone(const QString &path)
 {
+    const QString folder = m_host.moduleFolder(path);
+    if (isBelowAny(folder, m_unread) || mayMoveOutside(path))
+        return false;
+    if (m_area.isExcluded(path))
+        return true;
     if (leadsNowhere(path) || leadsNowhere(bundleOf(path)))
         return false;
-    const QString folder = m_host.moduleFolder(path);
-    if (!isBelowAny(folder, m_folders))
+    if (!isBelowAny(path, m_folders)) // one of these may be the module itself
         return true;
     const auto [entry, isNew] = m_isFolderThere.try_emplace(folder, false);
     if (isNew)
         entry->second =
-            !isBelowAny(folder, m_unread) && QFileInfo(folder).isReadable() &&
+            QFileInfo(folder).isReadable() &&
             !QDir(folder).isEmpty(QDir::AllEntries | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot);
     return entry->second;
+}
+
+/// Whether a copy of what a file listed is known where nobody looked: it has yet to take that over.
+bool ScanPlan::mayMoveOutside(const QString &path) const
+{
+    bool hasCopy = false;
+    if (m_area.isLimited())
+        m_memory.forEach(m_host.format(), [&](const RememberedProbe &last) {
+            hasCopy |= isOutside(last.path) &&
+                       std::any_of(last.plugins.begin(), last.plugins.end(),
+                                   [&](const auto &plugin) { return isSamePath(plugin.heldBy, path); });
+        });
+    return hasCopy;
 }
 
 void ScanPlan::indexKept()
@@ -255,7 +275,8 @@ void ScanPlan::askAgain(const QStringList &paths)
 {
     for (const QString &path : paths) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
-        if (known.empty() || !known.front()->enabled || m_host.isLeftAlone(path) || !isKept(path))
+        if (known.empty() || !known.front()->enabled || m_host.isLeftAlone(path) || !isKept(path) ||
+            isOutside(path))
             continue;
         m_kept.erase(
             std::remove_if(m_kept.begin(), m_kept.end(),

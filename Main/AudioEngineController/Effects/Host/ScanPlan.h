@@ -23,13 +23,12 @@ struct ScanItem {
 ///
 /// A file that is not there is *gone* when the folder that it lay in was searched and has other content, or
 /// is not below a listed folder any more. It is *away* when that folder is not there, cannot be read or is
-/// empty: drives are unplugged.
+/// empty: drives are unplugged. What lies outside the area that was searched stays as it is.
 class ScanPlan {
 public:
-    /// While the plan is used the host's known list must not change but by crashes. `unread` are the folders
-    /// below `folders` of which not all could be read. `memory` tells which files are copies of others.
-    ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const QStringList &folders,
-             const QStringList &unread);
+    /// While the plan is used the host's known list must not change but by crashes. `finder` has searched the
+    /// host's folders. `memory` tells which files are copies of others.
+    ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const FileFinder &finder);
 
     /// Decides about all modules that were found.
     void decide(const QStringList &modules);
@@ -45,6 +44,10 @@ public:
     MovedToCrashed movedToCrashed() const;
     /// What is to be probed: known files first, so that of two files with one identifier the known one wins.
     const std::vector<ScanItem> &items() const { return m_items; }
+    /// Files that the user wants never loaded.
+    const QStringList &ignored() const { return m_ignored; }
+    /// Whether a file lies where nobody looked.
+    bool isOutside(const QString &path) const { return !m_area.isWithin(path); }
     /// Records of files that are away. One whose identifier a probed file lists gives way to it.
     const KnownList::Records &away() const { return m_away; }
 
@@ -79,6 +82,7 @@ private:
     void decideModule(const QString &path);
     void sortMissing(const QSet<QString> &found);
     bool isGone(const QString &path);
+    bool mayMoveOutside(const QString &path) const;
     void indexKept();
     void settleAllGone(const QStringList &modules);
     void settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes);
@@ -96,6 +100,8 @@ private:
     const ProbeMemory &m_memory;
     QStringList m_folders; ///< clean
     QStringList m_unread;
+    SearchArea m_area;
+    QStringList m_ignored;
     std::map<QString, bool> m_isFolderThere; ///< and searched, with some content
     std::vector<const EffectRecord *> m_kept;
     QSet<QString> m_keptPaths;                   ///< by `pathKey`

@@ -24,6 +24,9 @@ inline constexpr UsageRow kScannerVariables[] = {
                             "0 (the default): never."},
     {"FXPROBE_MEMORY_LIMIT", "With workers: give up on a plug-in that takes more memory than this many MiB; "
                              "0 (the default): never."},
+    {"FXPROBE_ONLY",
+     "Folders and plug-ins of the scan list, separated as in PATH: search only these, and keep "
+     "what is known of all others."},
     {"FXPROBE_LOG", "A file to which the log is appended, in place of standard error."},
     {"FXPROBE_TRACE", "1 adds the trace lines to the log."},
     {"FXPROBE_REPORT", "A file to which the course of the scan is appended."},
@@ -34,5 +37,5 @@ inline constexpr UsageRow kScannerVariables[] = {
 inline constexpr UsageRow kScannerExits[] = {
     {"0", "The scan came to its end, whatever it found, or there was nothing to do."},
     {"1", "-rewire_version: an update is needed."},
-    {"2", "The scan list is there and cannot be read, or is cut short; nothing was touched."},
+    {"2", "The scan list, or FXFolders.json beside it, is there and cannot be used; nothing was touched."},
 };
