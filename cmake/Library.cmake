@@ -4,18 +4,41 @@ include(CMakePackageConfigHelpers)
 # Where the headers lie in the tree. They are installed below include/FxProbe, the first ones right there.
 set(FXPROBE_FACE Workstation/Library/Scan.h)
 
+# collect_rooms(TARGET): the libraries of ours that a target is made of, in the global property FXPROBE_ROOMS, and those of others
+# that they need, in FXPROBE_NEEDED.
+function(collect_rooms target)
+    get_property(rooms GLOBAL PROPERTY FXPROBE_ROOMS)
+    if(target IN_LIST rooms)
+        return()
+    endif()
+    set_property(GLOBAL APPEND PROPERTY FXPROBE_ROOMS ${target})
+    get_property(libraries TARGET ${target} PROPERTY LINK_LIBRARIES)
+    foreach(library IN LISTS libraries)
+        set(type "")
+        if(TARGET ${library})
+            get_target_property(type ${library} TYPE)
+            get_target_property(is_imported ${library} IMPORTED)
+        endif()
+        if(NOT type OR is_imported)
+            set_property(GLOBAL APPEND PROPERTY FXPROBE_NEEDED ${library})
+        elseif(type STREQUAL "STATIC_LIBRARY")
+            collect_rooms(${library})
+        endif()
+    endforeach()
+endfunction()
+
 # Everything below the command line. The VST 3 SDK is in it: who links the library needs no SDK.
-set(rooms baselib vlib catalogue protocol plugin host busformats vstinterface vst vst3sdk vst3hostobjects vst3 effects
-    workstation_options workstation_summary workstation_manage workstation_library)
+collect_rooms(workstation_library)
+get_property(rooms GLOBAL PROPERTY FXPROBE_ROOMS)
+get_property(needed GLOBAL PROPERTY FXPROBE_NEEDED)
+list(REMOVE_DUPLICATES needed)
+list(REMOVE_ITEM needed Qt5::Core Threads::Threads)
 list(TRANSFORM rooms REPLACE "(.+)" "$<TARGET_OBJECTS:\\1>" OUTPUT_VARIABLE objects)
 add_library(library STATIC ${objects})
 set_target_properties(library PROPERTIES OUTPUT_NAME fxprobe EXPORT_NAME FxProbe LINKER_LANGUAGE CXX)
 target_compile_features(library INTERFACE cxx_std_17)
 target_include_directories(library INTERFACE "$<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>")
-target_link_libraries(library PUBLIC Qt5::Core Threads::Threads PRIVATE FxProbe::pugixml ${CMAKE_DL_LIBS})
-if(WIN32)
-    target_link_libraries(library PRIVATE mpr ntdll ole32 winmm)
-endif()
+target_link_libraries(library PUBLIC Qt5::Core Threads::Threads PRIVATE ${needed})
 
 set(package_folder "${CMAKE_INSTALL_LIBDIR}/cmake/FxProbe")
 configure_package_config_file("${PROJECT_SOURCE_DIR}/cmake/FxProbeConfig.cmake.in" "${PROJECT_BINARY_DIR}/FxProbeConfig.cmake"
