@@ -62,8 +62,8 @@ class Case:
         self.program = bench.programs / "FxProbe"
 
     def forget(self):
-        for catalogue in self.effects.glob("*Configuration.xml"):
-            catalogue.unlink()
+        for known in [*self.effects.glob("*Configuration.xml"), *self.effects.glob("FXProbes.json")]:
+            known.unlink()
 
     def first_scan(self, jobs=None):
         """In the scanner's own process, or with so many workers."""

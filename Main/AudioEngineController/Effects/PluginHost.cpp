@@ -9,6 +9,7 @@
 #include "Main/AudioEngineController/Effects/Host/MRLAudioPluginHost.h"
 #include "Main/AudioEngineController/Effects/Host/ProbePool.h"
 #include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
@@ -243,16 +244,23 @@ bool PluginHost::scanHosts(bool scan)
         finder->setArea(
             {m_only.isEmpty() ? searchedOnly() : m_only, readFolderRules(effectsFolder()).excluded});
     const std::shared_ptr<ProbePool> pool = scan ? poolOfEnvironment() : nullptr;
+    const auto memory = std::make_shared<ProbeMemory>(effectsFolder());
     forEachHost([&](AudioPluginHost &host) {
-        if (scan && m_launcher.isCancelled()) { // what the host knows stays in its catalogue
-            ProbeReport::instance().cancelled();
-            return;
-        }
         host.setFileFinder(finder);
         host.setProbePool(pool);
-        written |= host.Scan(scan, true);
+        host.setProbeMemory(memory);
+    });
+    for (const PluginFormatInfo &info : pluginFormats())
+        if (pool && info.isScanned())
+            m_hosts.at(info.format)->prepareScan();
+    forEachHost([&](AudioPluginHost &host) {
+        if (scan && !pool && m_launcher.isCancelled()) // what the host knows stays in its catalogue
+            ProbeReport::instance().cancelled();
+        else
+            written |= host.Scan(scan, true);
         host.setFileFinder(nullptr);
         host.setProbePool(nullptr);
+        host.setProbeMemory(nullptr);
     });
     if (scan)
         forEachHost([](AudioPluginHost &host) { host.scansEnded(); });

@@ -3,6 +3,9 @@
 #include <QDir>
 #include <QElapsedTimer>
 #include <QFile>
+#include <QFileInfo>
+#include <QRegularExpression>
+#include <QSet>
 #include <QThread>
 
 #include <cerrno>
@@ -105,4 +108,36 @@ TEST_F(Workers, LeaveWithTheirScannerAndBlameNobody)
         EXPECT_EQ(sortedRecords("Name Enabled Working"), expected);
         EXPECT_EQ(m_folder.markers(), QStringList());
     }
+}
+
+TEST_F(Workers, BeginWithTheSuspectsOfEveryFormatOneByOneAndThenWithTheSlowest)
+{
+    const QString suspects[] = {put("S.vst2"), put("T.vst2", "fault open abort\n")};
+    for (const char *name : {"A", "B", "C"})
+        put(name + QString(".vst3"), "delay initialize 600\n");
+    const QString slow = put("Slow.vst2");
+    ASSERT_TRUE(QFile::resize(slow, 20 << 20)); // as a slow one mostly is
+    dateFirst(slow);
+    for (const QString &suspect : suspects)
+        m_folder.write("Effects/" + QFileInfo(suspect).baseName() + ".scan",
+                       "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<CrashedPlugin>\n\t<Path>" +
+                           suspect.toUtf8() + "</Path>\n\t<Suspect>1</Suspect>\n</CrashedPlugin>\n");
+    std::map<QString, QString> environment = kPool;
+    environment["FXPROBE_REPORT"] = m_folder.path("report");
+    EXPECT_TRUE(scanOnce(environment).succeeded());
+    QStringList told;
+    QSet<QString> workers;
+    for (const QString &line : m_folder.lines("report")) {
+        const QString module = line.section("Plugins/", 1).section('.', 0, 0);
+        if (line.contains("\"begin\"") || line.contains("\"end\""))
+            told.append(line.contains("\"end\"") ? module + '.' : module);
+        workers.insert(line.section("\"worker\":", 1));
+    }
+    workers.remove(QString());
+    told.removeDuplicates(); // a culprit may be asked again
+    EXPECT_EQ(told.mid(0, 4), QStringList({"S", "S.", "T", "T."}));
+    EXPECT_TRUE(told.filter(QRegularExpression("^\\w+$")).mid(2, 3).contains("Slow"))
+        << qPrintable(told.join(' '));
+    EXPECT_EQ(m_folder.lines("report").filter("\"workerEnd\"").size(), workers.size());
+    EXPECT_EQ(m_folder.markers(), QStringList());
 }

@@ -13,6 +13,7 @@
 #include <vector>
 
 struct LoadedPlugin;
+class ProbeMemory;
 class ProbePool;
 
 /// Base of the per-format hosts and of their registry. By itself it has no catalogue: it reads, lists and
@@ -38,6 +39,9 @@ public:
     virtual QStringList folders() const;
     /// True when the catalogue file differs from the one seen last: at the last call, or when it was read.
     virtual bool catalogueChanged() { return false; }
+    /// Finds and plans what `Scan` is to probe, so that workers that it does not need meanwhile begin with
+    /// it.
+    virtual void prepareScan() {}
     /// Scans the folders (true) or only refreshes the effect list from the known list (false). `inProcess`
     /// matters to the registry only. True when the catalogue was written.
     virtual bool Scan(bool /*scan*/, bool /*inProcess*/) { return false; }
@@ -74,6 +78,10 @@ public:
     void setProbePool(std::shared_ptr<ProbePool> pool) { m_probePool = std::move(pool); }
     const std::shared_ptr<ProbePool> &probePool() const { return m_probePool; }
 
+    /// Has scans of several formats share what is remembered of probes; null, as at first: each reads it.
+    void setProbeMemory(std::shared_ptr<ProbeMemory> memory) { m_probeMemory = std::move(memory); }
+    const std::shared_ptr<ProbeMemory> &probeMemory() const { return m_probeMemory; }
+
     /// Asks a running scan to stop after the current file; any thread. The request stands until it is
     /// cleared.
     void cancel() { m_cancelled = true; }
@@ -89,5 +97,6 @@ private:
     QString m_catalogueFolder;
     std::shared_ptr<FileFinder> m_fileFinder;
     std::shared_ptr<ProbePool> m_probePool;
+    std::shared_ptr<ProbeMemory> m_probeMemory;
     std::atomic<bool> m_cancelled{false};
 };

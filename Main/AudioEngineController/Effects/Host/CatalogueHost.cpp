@@ -11,6 +11,7 @@
 
 #include <algorithm>
 #include <map>
+#include <utility>
 
 namespace {
 
@@ -44,10 +45,19 @@ bool CatalogueHost::catalogueChanged()
 
 bool CatalogueHost::Scan(bool scan, bool)
 {
-    if (scan)
-        return FolderScan(*this).run();
-    refillEffects();
-    return false;
+    if (!scan) {
+        refillEffects();
+        return false;
+    }
+    if (!m_scan)
+        prepareScan();
+    return std::exchange(m_scan, nullptr)->run();
+}
+
+void CatalogueHost::prepareScan()
+{
+    m_scan = std::make_shared<FolderScan>(*this);
+    m_scan->prepare();
 }
 
 bool CatalogueHost::AddEffect(const EffectRecord &record)

@@ -15,6 +15,8 @@
 #include <memory>
 #include <set>
 
+class FolderScan;
+
 /// Base of the hosts of formats that have a catalogue. Holds what the previous run left (the known list) and
 /// what this run found (the effect list), and reads and writes the file that carries them.
 class CatalogueHost : public AudioPluginHost {
@@ -24,6 +26,7 @@ public:
     /// knowledge outlives another crash.
     void ReadCatalogue() override;
     bool catalogueChanged() override;
+    void prepareScan() override;
     bool Scan(bool scan, bool inProcess) override;
     bool AddEffect(const EffectRecord &record) override;
     std::optional<EffectRecord> findEffect(const QString &id) const override;
@@ -138,6 +141,7 @@ private:
     bool matchesFile() const;
 
     const PluginFormatInfo &m_info;
+    std::shared_ptr<FolderScan> m_scan; ///< prepared, until it has run
     FileStamp m_lastSeen;
     FolderRules m_rules;
     KnownList m_known;

@@ -40,19 +40,26 @@ FolderScan::FolderScan(CatalogueHost &host)
 
 FolderScan::~FolderScan() = default;
 
+void FolderScan::prepare() { guard(&FolderScan::plan); }
+
 bool FolderScan::run()
 {
+    guard(&FolderScan::scan);
+    return m_written;
+}
+
+void FolderScan::guard(void (FolderScan::*step)())
+{
     try {
-        scan();
+        (this->*step)();
     } catch (const std::exception &error) {
         DebugLog(L"The scan ended early: %s", error.what());
     } catch (...) {
         DebugLog(L"The scan ended early");
     }
-    return m_written;
 }
 
-void FolderScan::scan()
+void FolderScan::plan()
 {
     m_host.clearEffects();
     if (m_host.isCatalogueUnread()) {
@@ -69,18 +76,27 @@ void FolderScan::scan()
     m_progress = createProgressDisplay();
     const QStringList modules = findModules();
     if (isCancelled()) { // the catalogue holds all that is known
+        ProbeReport::instance().cancelled();
         m_host.refillEffects();
         return;
     }
     for (const QString &path : modules)
         m_found.insert(pathKey(path));
-    m_plan = std::make_unique<ScanPlan>(m_host, m_memory.probes(), *m_finder);
-    m_plan->decide(modules);
+    auto plan = std::make_unique<ScanPlan>(m_host, m_memory.probes(), *m_finder);
+    plan->decide(modules);
+    m_plan = std::move(plan);
     m_memory.addCrashes();
     ProbeReport::instance().plan(m_host.format(), static_cast<std::size_t>(modules.size()),
                                  m_plan->items().size());
     addKept();
-    finish(probeItems());
+    if (!m_plan->items().empty() && m_host.probePool())
+        makePool();
+}
+
+void FolderScan::scan()
+{
+    if (m_plan) // else there is nothing to be scanned
+        finish(probeItems());
 }
 
 bool FolderScan::isCancelled() const
@@ -139,9 +155,9 @@ void FolderScan::showItemProgress()
 
 bool FolderScan::probeItems()
 {
-    showItemProgress();
-    if (!m_plan->items().empty() && m_host.probePool())
+    if (m_pooled)
         return probeInPool();
+    showItemProgress();
     for (const ScanItem &item : m_plan->items()) {
         if (isCancelled())
             return false;
@@ -318,8 +334,9 @@ void FolderScan::collectWaiting(std::size_t from)
     std::set<QString, PathLess> settled;
     const std::vector<ScanItem> &items = m_plan->items();
     // Not of files that are gone: another than the one that they were given to may list them.
-    for (std::size_t index = 0; index < std::min(from, items.size()); ++index)
-        settled.insert(items[index].path);
+    for (std::size_t index = 0; index < items.size(); ++index)
+        if (index < from || isSettled(index))
+            settled.insert(items[index].path);
     for (const EffectRecord *record : m_host.known().all())
         if (!m_host.isListed(record->id) && settled.count(record->path) == 0)
             m_waiting.insert({record->id, ListedEffect(*record)});
@@ -335,10 +352,11 @@ bool FolderScan::writeInterim()
 /// Whether a file that a cancelled scan did not reach may be the one in which the plug-in was.
 bool FolderScan::mayYetBeListed(const EffectRecord &old) const
 {
-    const auto first = m_plan->items().begin() + static_cast<std::ptrdiff_t>(m_done);
-    return std::any_of(first, m_plan->items().end(), [&](const ScanItem &item) {
-        return isSamePath(fileNameOf(item.path), fileNameOf(old.path));
-    });
+    const std::vector<ScanItem> &items = m_plan->items();
+    for (std::size_t index = m_done; index < items.size(); ++index)
+        if (!isSettled(index) && isSamePath(fileNameOf(items[index].path), fileNameOf(old.path)))
+            return true;
+    return false;
 }
 
 void FolderScan::finish(bool isWhole)

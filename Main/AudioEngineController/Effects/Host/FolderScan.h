@@ -8,6 +8,7 @@
 #include <QSet>
 
 #include <memory>
+#include <set>
 
 class VProgressDisplay;
 struct OutcomeRecords;
@@ -22,10 +23,15 @@ public:
     explicit FolderScan(CatalogueHost &host);
     ~FolderScan() override;
 
-    /// True when the catalogue was written at least once. Never throws.
+    /// Finds the modules and decides which are to be probed. Where there is a pool, it has their jobs from
+    /// then on. Never throws.
+    void prepare();
+    /// The rest; once, after `prepare`. True when the catalogue was written at least once. Never throws.
     bool run();
 
 private:
+    void guard(void (FolderScan::*step)());
+    void plan();
     void scan();
     QStringList findModules() const;
     void keepKnownPaths(QStringList &paths) const;
@@ -33,7 +39,10 @@ private:
     bool probeItems();
     void beginItem(const ScanItem &item);
     void probe(const ScanItem &item);
+    void makePool();
     bool probeInPool();
+    /// Whether what came of an item is kept.
+    bool isSettled(std::size_t item) const { return item < m_done || m_keptAhead.count(item) != 0; }
     /// An outcome as lists and people take it.
     static ProbeOutcome readable(const ScanItem &item, ProbeOutcome outcome);
     ProbeJob jobOf(const ScanItem &item) const;
@@ -50,7 +59,7 @@ private:
     void forgetGone();
     void listIgnored();
 
-    /// Has interim writes carry what is known of the items from one on.
+    /// Has interim writes carry what is known of the items from one on, unless they are settled.
     void collectWaiting(std::size_t from);
     void insertFirst(const EffectRecord &record);
     static void takeOut(const EffectRecord &record, WaitingRecords &waiting);
@@ -72,12 +81,14 @@ private:
     std::shared_ptr<FileFinder> m_finder;
     std::unique_ptr<ScanPlan> m_plan;
     std::unique_ptr<ProbeRunner> m_runner; ///< made for the first item: most scans find nothing new
+    std::shared_ptr<PooledScan> m_pooled;  ///< where workers ask
     std::shared_ptr<VProgressDisplay> m_progress;
     ScanMemory m_memory;
     QSet<QString> m_found; ///< the modules, by `pathKey`
     WaitingRecords m_waiting;
     bool m_hasCollected = false;       ///< what waits, for the first interim write
-    std::size_t m_done = 0;            ///< items
+    std::size_t m_done = 0;            ///< items, from the first on
+    std::set<std::size_t> m_keptAhead; ///< items behind them that are done, of a scan that was cancelled
     std::vector<EffectRecord> m_later; ///< what files keep that failed, unless another comes to list it
     /// Identifiers, and the old records whose marks they get unless another file lists those.
     std::vector<std::pair<QString, const EffectRecord *>> m_likelyMarks;

@@ -8,6 +8,7 @@
 #include "Main/VLib/VProgressDisplay.h"
 
 #include <QElapsedTimer>
+#include <QFileInfo>
 
 #include <algorithm>
 #include <map>
@@ -28,98 +29,113 @@ public:
         , m_items(scan.m_plan->items())
         , m_states(m_items.size())
         , m_probe(scan.m_host.makeProbe())
-    {}
+        , m_pool(scan.m_host.probePool())
+    {
+        std::vector<PoolJob> jobs;
+        for (std::size_t item = 0; item < m_items.size(); ++item) {
+            // Those that were at work when a scanner ended: what ends a scanner that asks nobody else is the
+            // culprit.
+            m_states[item].isAlone = m_scan.m_host.isSuspect(m_items[item].path);
+            m_places.emplace(m_items[item].path, item);
+            jobs.push_back({m_scan.jobOf(m_items[item]), isAlone(item), expectedMs(item)});
+        }
+        m_pool->add(std::move(jobs), *this);
+    }
+    ~PooledScan() override { m_pool->withdraw(*this); }
+    PooledScan(const PooledScan &) = delete;
+    PooledScan &operator=(const PooledScan &) = delete;
 
     /// False when the scan was cancelled.
     bool run();
 
-    std::optional<ProbeOutcome> look(std::size_t index) override
+    std::optional<ProbeOutcome> look(std::size_t item) override
     {
-        const ScanItem &item = m_items[m_first + index];
-        if (ScanControl::instance().isSkipped(item.path))
+        if (isSkipped(item))
             return ProbeOutcome::skipped();
-        return m_probe->look(m_scan.jobOf(item));
+        return m_probe->look(m_scan.jobOf(m_items[item]));
     }
-    void jobBegins(std::size_t index, int worker) override;
-    void stageEntered(std::size_t index, int worker, ProbeStage stage) override;
-    void classBegins(std::size_t index, int worker, const QString &name) override;
+    void jobBegins(std::size_t item, int worker) override;
+    void stageEntered(std::size_t item, int worker, ProbeStage stage) override;
+    void classBegins(std::size_t item, int worker, const QString &name) override;
     void classAnnounced() override { notifyUI(MessageCode::kEntryAdded); }
-    void childBegins(std::size_t index, int worker, const EffectRecord &child) override;
-    void childEnds(std::size_t index, int worker, const ProbeOutcome &outcome) override;
-    void jobEnds(std::size_t index, int worker, const ProbeOutcome &outcome) override;
-    void turn() override
-    {
-        if (m_owesWrite)
-            writeInterim(false);
-    }
+    void childBegins(std::size_t item, int worker, const EffectRecord &child) override;
+    void childEnds(std::size_t item, int worker, const ProbeOutcome &outcome) override;
+    void jobEnds(std::size_t item, int worker, const ProbeOutcome &outcome) override;
+    void becomesLongest(std::size_t item) override { showScanning(m_states[item].shown); }
+    void turn() override { writeInterim(); }
     void workerEnds(int worker, const QString &reason) override
     {
         ProbeReport::instance().workerEnded(worker, reason);
     }
     bool isCancelled() override { return m_scan.isCancelled(); }
-    bool isSkipped(std::size_t index) override
+    bool isSkipped(std::size_t item) override
     {
-        return ScanControl::instance().isSkipped(m_items[m_first + index].path);
+        return ScanControl::instance().isSkipped(m_items[item].path);
     }
 
 private:
     /// An item, as far as it came.
     struct State {
+        bool isAlone = false; ///< asked while nothing else is at work
         CrashMarker marker;
         bool isTouched = false;
         QString shown; ///< what of it a user reads now
         EffectRecord child;
         std::map<quint32, QString> childReasons;
         std::optional<ProbeOutcome> outcome; ///< that is not kept yet
-        std::vector<EffectRecord> pending;   ///< its records, among those that wait
+        bool isHeldBack = false;             ///< what came of it is among what waits
+        std::vector<EffectRecord> pending;   ///< its records there
     };
 
-    bool ask(std::size_t from, std::size_t to);
+    double expectedMs(std::size_t item) const;
     EffectRecord fileOf(std::size_t item) const;
     void show(std::size_t item, const QString &text);
-    void showLongest();
+    void showProgress();
+    bool isAlone(std::size_t item) const { return m_states[item].isAlone; }
     void holdBack(std::size_t item);
+    bool isOfOpenItem(const QString &id, std::size_t item) const;
+    void keep(std::size_t item);
     void keepInOrder();
+    void keepAhead();
     void probeRest();
-    bool writeInterim(bool isUrgent);
+    void writeInterim();
+    bool settleVerdicts();
 
     FolderScan &m_scan;
     const std::vector<ScanItem> &m_items;
     std::vector<State> m_states;
     const std::unique_ptr<IPluginProbe> m_probe; ///< looks at files; workers ask plug-ins
-    std::size_t m_first = 0;                     ///< item that the pool knows as its job 0
-    std::size_t m_ended = 0;
-    bool m_isAlone = true;           ///< one job at a time
-    std::vector<std::size_t> m_busy; ///< items, the longest at work first
+    const std::shared_ptr<ProbePool> m_pool;
+    std::map<QString, std::size_t, PathLess> m_places; ///< items by their paths
     QElapsedTimer m_sinceWrite;
-    bool m_owesWrite = false; ///< something came since
+    bool m_owesWrite = false;            ///< something came since
+    std::vector<std::size_t> m_verdicts; ///< items whose markers stay until a catalogue on disk blames them
 };
 
 bool FolderScan::PooledScan::run()
 {
-    // Those that were at work when a scanner ended come first, one after the other: what ends a scanner that
-    // asks nobody else is the culprit.
-    std::size_t suspects = 0;
-    while (suspects < m_items.size() && m_scan.m_host.isSuspect(m_items[suspects].path))
-        ++suspects;
-    bool isWhole = true;
-    for (std::size_t item = 0; item < suspects && isWhole; ++item)
-        isWhole = ask(item, item + 1);
-    m_isAlone = false;
-    if (isWhole && ask(suspects, m_items.size()))
-        return !m_scan.isCancelled();
-    probeRest();
-    return !m_scan.isCancelled();
+    showProgress();
+    if (!m_pool->run(*this))
+        probeRest();
+    const bool isWhole = !m_scan.isCancelled();
+    if (!isWhole)
+        keepAhead();
+    if (!m_verdicts.empty() && !settleVerdicts())
+        for (const std::size_t item : m_verdicts)
+            m_states[item].marker.leave(); // nothing else holds it
+    return isWhole;
 }
 
-/// False when there can be no workers.
-bool FolderScan::PooledScan::ask(std::size_t from, std::size_t to)
+/// How long a module will take: as long as last time. One that was never asked is judged by its size, which
+/// tells where much is to be prepared.
+double FolderScan::PooledScan::expectedMs(std::size_t item) const
 {
-    m_first = from;
-    std::vector<ProbeJob> jobs;
-    for (std::size_t item = from; item < to; ++item)
-        jobs.push_back(m_scan.jobOf(m_items[item]));
-    return m_scan.m_host.probePool()->run(std::move(jobs), *this);
+    constexpr double kBytesPerMs = 40000; // of ZamVerb, the slowest of Debian's plug-ins for its size
+    const QString &path = m_items[item].path;
+    const RememberedProbe *last = m_scan.m_memory.probes().find(m_scan.m_host.format(), path);
+    if (last && last->milliseconds > 0)
+        return last->milliseconds;
+    return static_cast<double>(QFileInfo(m_scan.m_host.moduleLibrary(path)).size()) / kBytesPerMs;
 }
 
 /// Without workers this process asks what is left.
@@ -144,31 +160,30 @@ EffectRecord FolderScan::PooledScan::fileOf(std::size_t item) const
 void FolderScan::PooledScan::show(std::size_t item, const QString &text)
 {
     m_states[item].shown = text;
-    if (!m_busy.empty() && m_busy.front() == item)
+    if (m_pool->isLongest(*this, item))
         showScanning(text);
 }
 
-void FolderScan::PooledScan::showLongest()
+void FolderScan::PooledScan::showProgress()
 {
-    if (!m_busy.empty() && !m_states[m_busy.front()].shown.isEmpty())
-        showScanning(m_states[m_busy.front()].shown);
+    if (!m_scan.m_progress)
+        return;
+    m_scan.m_progress->setRange(static_cast<int>(m_pool->added()), QString());
+    m_scan.m_progress->setValue(static_cast<int>(m_pool->ended()));
 }
 
-void FolderScan::PooledScan::jobBegins(std::size_t index, int)
+void FolderScan::PooledScan::jobBegins(std::size_t item, int)
 {
-    const std::size_t item = m_first + index;
     State &state = m_states[item];
     if (!m_scan.m_hasCollected) // most scans find nothing to ask
         m_scan.collectWaiting(m_scan.m_done);
     if (state.marker.path().isEmpty())
-        state.marker = m_isAlone ? m_scan.m_host.WriteCrashMarker(fileOf(item))
-                                 : m_scan.m_host.writeSuspectMarker(fileOf(item));
-    m_busy.push_back(item);
+        state.marker = isAlone(item) ? m_scan.m_host.WriteCrashMarker(fileOf(item))
+                                     : m_scan.m_host.writeSuspectMarker(fileOf(item));
 }
 
-void FolderScan::PooledScan::stageEntered(std::size_t index, int worker, ProbeStage stage)
+void FolderScan::PooledScan::stageEntered(std::size_t item, int worker, ProbeStage stage)
 {
-    const std::size_t item = m_first + index;
     if (stage == ProbeStage::Load || !m_states[item].isTouched) {
         m_states[item].isTouched = true;
         DebugTrace(L"Probing %ls", m_items[item].path);
@@ -178,25 +193,23 @@ void FolderScan::PooledScan::stageEntered(std::size_t index, int worker, ProbeSt
     ProbeReport::instance().stage(stage, worker);
 }
 
-void FolderScan::PooledScan::classBegins(std::size_t index, int, const QString &name)
+void FolderScan::PooledScan::classBegins(std::size_t item, int, const QString &name)
 {
-    const std::size_t item = m_first + index;
     m_states[item].marker.refresh();
     show(item, name);
 }
 
-void FolderScan::PooledScan::childBegins(std::size_t index, int worker, const EffectRecord &child)
+void FolderScan::PooledScan::childBegins(std::size_t item, int worker, const EffectRecord &child)
 {
-    const std::size_t item = m_first + index;
     m_states[item].marker.refresh();
     m_states[item].child = child;
     show(item, child.subName);
     ProbeReport::instance().begin(m_scan.m_host.format(), child, worker);
 }
 
-void FolderScan::PooledScan::childEnds(std::size_t index, int worker, const ProbeOutcome &outcome)
+void FolderScan::PooledScan::childEnds(std::size_t item, int worker, const ProbeOutcome &outcome)
 {
-    State &state = m_states[m_first + index];
+    State &state = m_states[item];
     const EffectRecord child = outcome.records.empty() ? state.child : outcome.records.front();
     if (!outcome.reason.isEmpty())
         DebugLog(L"%ls, %ls: %ls", child.path, child.subName, outcome.reason);
@@ -206,11 +219,9 @@ void FolderScan::PooledScan::childEnds(std::size_t index, int worker, const Prob
     state.childReasons[child.subId] = outcome.reason;
 }
 
-void FolderScan::PooledScan::jobEnds(std::size_t index, int worker, const ProbeOutcome &outcome)
+void FolderScan::PooledScan::jobEnds(std::size_t item, int worker, const ProbeOutcome &outcome)
 {
-    const std::size_t item = m_first + index;
     State &state = m_states[item];
-    m_busy.erase(std::remove(m_busy.begin(), m_busy.end(), item), m_busy.end());
     if (outcome.status == ProbeStatus::Cancelled) { // nobody is to blame
         state.marker.remove();
         return;
@@ -219,67 +230,107 @@ void FolderScan::PooledScan::jobEnds(std::size_t index, int worker, const ProbeO
     m_scan.m_isTouched = state.isTouched;
     state.outcome = readable(m_items[item], outcome);
     m_scan.log(m_items[item], *state.outcome, worker);
-    ++m_ended;
     if (item == m_scan.m_done)
         keepInOrder();
     else
         holdBack(item);
-    if (m_scan.m_progress)
-        m_scan.m_progress->setValue(static_cast<int>(m_ended));
-    showLongest();
+    showProgress();
     const bool isVerdict = outcome.status == ProbeStatus::Crashed || outcome.status == ProbeStatus::NoAnswer;
-    const bool isKept =
-        (!state.isTouched && !isVerdict) // what was only looked at can wait for the last write
-        || writeInterim(isVerdict);
-    if (isVerdict && !isKept)
-        state.marker.leave(); // nothing else holds it
-    else
+    if (isVerdict) {
+        m_verdicts.push_back(item);
+    } else {
         state.marker.remove();
-    m_scan.m_host.clearSuspect(m_items[item].path);
+        m_scan.m_host.clearSuspect(m_items[item].path);
+    }
+    m_owesWrite |= isVerdict || state.isTouched; // what was only looked at can wait for the last write
+    writeInterim();
 }
 
-/// Has interim writes carry what came of an item before those ahead of it have ended.
+/// Has interim writes carry what came of an item before those ahead of it have ended; unless it lists what
+/// is known of one of these, whose marks would be lost with this process.
 void FolderScan::PooledScan::holdBack(std::size_t item)
 {
     State &state = m_states[item];
-    removeWaiting(m_items[item], m_scan.m_waiting);
     OutcomeRecords records = recordsOfOutcome(m_scan.m_host, *m_scan.m_plan, m_items[item], *state.outcome);
+    const auto isOthers = [&](const EffectRecord &record) { return isOfOpenItem(record.id, item); };
+    if (std::any_of(records.listed.begin(), records.listed.end(), isOthers))
+        return;
+    state.isHeldBack = true;
+    removeWaiting(m_items[item], m_scan.m_waiting);
     state.pending = std::move(records.listed);
     state.pending.insert(state.pending.end(), records.kept.begin(), records.kept.end());
     for (const EffectRecord &record : state.pending)
         m_scan.insertFirst(record);
 }
 
+/// Whether an identifier is known of another item that has not ended.
+bool FolderScan::PooledScan::isOfOpenItem(const QString &id, std::size_t item) const
+{
+    const auto [first, last] = m_scan.m_waiting.equal_range(id);
+    return std::any_of(first, last, [&](const auto &waiting) {
+        const auto other = m_places.find(waiting.second.record.path);
+        return other != m_places.end() && other->second != item && other->second >= m_scan.m_done &&
+               !m_states[other->second].outcome;
+    });
+}
+
+void FolderScan::PooledScan::keep(std::size_t index)
+{
+    State &state = m_states[index];
+    const ScanItem &item = m_items[index];
+    for (const EffectRecord &record : state.pending)
+        takeOut(record, m_scan.m_waiting);
+    m_scan.beginItem(item);
+    m_scan.m_isTouched = state.isTouched;
+    for (const auto &[subId, reason] : state.childReasons)
+        m_scan.m_memory.childEnded(subId, reason);
+    m_scan.m_memory.end(m_scan.m_file, *state.outcome, m_scan.m_isTouched);
+    m_scan.keepOutcome(item, *state.outcome);
+    state.outcome.reset();
+    state.pending.clear();
+}
+
 /// Keeps the outcomes up to the first item that has none yet.
 void FolderScan::PooledScan::keepInOrder()
 {
-    for (; m_scan.m_done < m_items.size() && m_states[m_scan.m_done].outcome; ++m_scan.m_done) {
-        State &state = m_states[m_scan.m_done];
-        const ScanItem &item = m_items[m_scan.m_done];
-        for (const EffectRecord &record : state.pending)
-            takeOut(record, m_scan.m_waiting);
-        m_scan.beginItem(item);
-        m_scan.m_isTouched = state.isTouched;
-        for (const auto &[subId, reason] : state.childReasons)
-            m_scan.m_memory.childEnded(subId, reason);
-        m_scan.m_memory.end(m_scan.m_file, *state.outcome, m_scan.m_isTouched);
-        m_scan.keepOutcome(item, *state.outcome);
-        state.outcome.reset();
-        state.pending.clear();
-    }
+    for (; m_scan.m_done < m_items.size() && m_states[m_scan.m_done].outcome; ++m_scan.m_done)
+        keep(m_scan.m_done);
 }
 
-/// Writes what there is, also behind an item that takes long; now and then, and before a marker goes that
-/// names a culprit.
-bool FolderScan::PooledScan::writeInterim(bool isUrgent)
+/// Keeps the outcomes behind those that a cancel cut off.
+void FolderScan::PooledScan::keepAhead()
 {
-    m_owesWrite = !isUrgent && m_sinceWrite.isValid() && !m_sinceWrite.hasExpired(kWritePause);
-    if (m_owesWrite)
-        return true;
-    const bool isWritten = m_scan.writeInterim();
-    m_scan.m_memory.write(isUrgent);
-    m_sinceWrite.start();
-    return isWritten;
+    for (std::size_t item = m_scan.m_done; item < m_items.size(); ++item)
+        if (m_states[item].isHeldBack) {
+            keep(item);
+            m_scan.m_keptAhead.insert(item);
+        }
 }
 
-bool FolderScan::probeInPool() { return PooledScan(*this).run(); }
+/// Writes what there is, also behind an item that takes long; now and then.
+void FolderScan::PooledScan::writeInterim()
+{
+    if (!m_owesWrite || (m_sinceWrite.isValid() && !m_sinceWrite.hasExpired(kWritePause)))
+        return;
+    m_owesWrite = false;
+    settleVerdicts();
+    m_scan.m_memory.write(false);
+    m_sinceWrite.start();
+}
+
+/// Writes what there is. The markers go whose verdicts are on disk then.
+bool FolderScan::PooledScan::settleVerdicts()
+{
+    if (!m_scan.writeInterim())
+        return false;
+    for (const std::size_t item : m_verdicts) {
+        m_states[item].marker.remove();
+        m_scan.m_host.clearSuspect(m_items[item].path);
+    }
+    m_verdicts.clear();
+    return true;
+}
+
+void FolderScan::makePool() { m_pooled = std::make_shared<PooledScan>(*this); }
+
+bool FolderScan::probeInPool() { return m_pooled->run(); }

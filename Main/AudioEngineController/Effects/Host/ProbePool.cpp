@@ -46,45 +46,129 @@ bool ProbePool::isBusy() const
                        [](const auto &entry) { return entry.second.job.has_value(); });
 }
 
-bool ProbePool::run(std::vector<ProbeJob> jobs, IPoolListener &listener)
+bool ProbePool::isLeft(const IPoolListener &listener) const
+{
+    const auto isIts = [&](std::size_t job) { return m_jobs[job].listener == &listener; };
+    return std::any_of(m_waiting.begin(), m_waiting.end(),
+                       [&](const Waiting &waiting) { return isIts(waiting.job); }) ||
+           std::any_of(m_workers.begin(), m_workers.end(),
+                       [&](const auto &entry) { return entry.second.job && isIts(*entry.second.job); });
+}
+
+void ProbePool::add(std::vector<PoolJob> jobs, IPoolListener &listener)
+{
+    m_listeners.push_back(&listener);
+    for (std::size_t place = 0; place < jobs.size(); ++place) {
+        m_waiting.push_back({m_jobs.size()});
+        m_jobs.push_back({std::move(jobs[place]), &listener, place});
+    }
+    // A slow one that begins last is at work alone in the end. One worker keeps to the order of the plans.
+    const bool isBySlowness = m_settings.workers > 1;
+    std::stable_sort(m_waiting.begin(), m_waiting.end(), [&](const Waiting &left, const Waiting &right) {
+        const PoolJob &a = m_jobs[left.job].what;
+        const PoolJob &b = m_jobs[right.job].what;
+        return a.isAlone != b.isAlone ? a.isAlone : isBySlowness && a.expectedMs > b.expectedMs;
+    });
+}
+
+bool ProbePool::run(IPoolListener &listener)
 {
     m_listener = &listener;
-    m_jobs = std::move(jobs);
-    m_waiting.clear();
-    for (std::size_t job = 0; job < m_jobs.size(); ++job)
-        m_waiting.push_back({job});
-    m_crashedChildren.clear();
-    m_killed.clear();
-    m_failedStarts = 0;
-    m_isCancelled = false;
-    QElapsedTimer sinceCancel;
-    bool canGoOn = true;
-    while (canGoOn && (isBusy() || !m_waiting.empty())) {
+    while (!m_hasGivenUp && isLeft(listener)) {
         QElapsedTimer sinceTurn;
         sinceTurn.start();
         if (!m_isCancelled && listener.isCancelled()) {
             m_isCancelled = true;
-            sinceCancel.start();
+            m_sinceCancel.start();
             m_waiting.clear();
         }
-        if (m_isCancelled && sinceCancel.hasExpired(kPatience))
+        if (m_isCancelled && m_sinceCancel.hasExpired(kPatience))
             cancelJobs();
         skipJobs();
         lookAhead();
-        if (m_waiting.empty() && !isBusy())
+        if (!isLeft(listener))
             break;
-        startWorkers();
-        handOut();
-        for (const WorkerEvent &event : m_group.wait(kLook))
-            take(event);
-        listener.turn();
+        turn();
         forgiveWait(sinceTurn.elapsed());
         endOverdue();
         endOversized();
-        canGoOn = hasWorkers();
+        m_hasGivenUp = !hasWorkers();
     }
+    if (m_waiting.empty() && !isBusy())
+        endIdle();
     m_listener = nullptr;
-    return canGoOn;
+    return !m_hasGivenUp;
+}
+
+void ProbePool::turn()
+{
+    startWorkers();
+    handOut();
+    for (const WorkerEvent &event : m_group.wait(kLook))
+        take(event);
+    showLongest();
+    for (IPoolListener *listener : m_listeners)
+        listener->turn();
+}
+
+/// Workers that have nothing to do any more.
+void ProbePool::endIdle()
+{
+    for (auto &[number, worker] : m_workers)
+        if (!worker.isLeaving) {
+            worker.isLeaving = true;
+            endWorker(number, worker, QStringLiteral("nothing is left to be asked"));
+        }
+    QElapsedTimer patience;
+    for (patience.start(); !m_workers.empty() && !patience.hasExpired(kPatience);)
+        for (const WorkerEvent &event : m_group.wait(kLook))
+            take(event);
+}
+
+void ProbePool::withdraw(IPoolListener &listener)
+{
+    const auto isIts = [&](std::size_t job) { return m_jobs[job].listener == &listener; };
+    m_waiting.erase(std::remove_if(m_waiting.begin(), m_waiting.end(),
+                                   [&](const Waiting &waiting) { return isIts(waiting.job); }),
+                    m_waiting.end());
+    for (auto &[number, worker] : m_workers) {
+        if (!worker.job || !isIts(*worker.job))
+            continue;
+        worker.job.reset();
+        worker.isLeaving = true;
+        endWorker(number, worker, QStringLiteral("nobody waits for it any more"));
+    }
+    m_shown.reset();
+    m_listeners.erase(std::remove(m_listeners.begin(), m_listeners.end(), &listener), m_listeners.end());
+}
+
+std::optional<std::size_t> ProbePool::longest() const
+{
+    const Worker *first = nullptr;
+    for (const auto &[number, worker] : m_workers)
+        if (worker.job && (!first || worker.sinceJob < first->sinceJob))
+            first = &worker;
+    return first ? first->job : std::nullopt;
+}
+
+bool ProbePool::isLongest(const IPoolListener &listener, std::size_t job) const
+{
+    const std::optional<std::size_t> first = longest();
+    return first && m_jobs[*first].listener == &listener && m_jobs[*first].place == job;
+}
+
+void ProbePool::showLongest()
+{
+    const std::optional<std::size_t> first = longest();
+    if (first && first != m_shown)
+        listenerOf(*first).becomesLongest(m_jobs[*first].place);
+    m_shown = first;
+}
+
+void ProbePool::endJob(std::size_t job, int number, const ProbeOutcome &outcome)
+{
+    ++m_ended;
+    listenerOf(job).jobEnds(m_jobs[job].place, number, outcome);
 }
 
 /// Where this process was held up, by a slow disk for example, what workers said meanwhile was not heard yet.
@@ -113,7 +197,7 @@ void ProbePool::cancelJobs()
 void ProbePool::skipJobs()
 {
     for (auto &[number, worker] : m_workers) {
-        if (!worker.job || worker.isLeaving || !m_listener->isSkipped(*worker.job))
+        if (!worker.job || worker.isLeaving || !listenerOf(*worker.job).isSkipped(m_jobs[*worker.job].place))
             continue;
         ProbeOutcome skipped = ProbeOutcome::skipped();
         skipped.stage = worker.outcome.stage;
@@ -122,7 +206,7 @@ void ProbePool::skipJobs()
         worker.job.reset();
         worker.isLeaving = true;
         endWorker(number, worker, QStringLiteral("its plug-in was skipped"));
-        m_listener->jobEnds(job, number, skipped);
+        endJob(job, number, skipped);
     }
 }
 
@@ -133,14 +217,15 @@ void ProbePool::lookAhead()
     for (std::size_t place = 0; place < std::min(ahead, m_waiting.size());) {
         Waiting &waiting = m_waiting[place];
         const std::size_t job = waiting.job;
-        const std::optional<ProbeOutcome> seen = waiting.isLookedAt ? std::nullopt : m_listener->look(job);
+        const std::optional<ProbeOutcome> seen =
+            waiting.isLookedAt ? std::nullopt : listenerOf(job).look(m_jobs[job].place);
         waiting.isLookedAt = true;
         if (!seen) {
             ++place;
             continue;
         }
         m_waiting.erase(m_waiting.begin() + static_cast<std::ptrdiff_t>(place));
-        m_listener->jobEnds(job, 0, *seen);
+        endJob(job, 0, *seen);
     }
 }
 
@@ -176,17 +261,32 @@ bool ProbePool::hasWorkers() const
            });
 }
 
+/// The place of the job that a worker gets; past the end when none fits it.
+std::size_t ProbePool::nextFor(const Worker &worker) const
+{
+    // One that needs a fresh worker gets the next fresh one, and those that are to be alone come first.
+    const bool isFresh = worker.probed == 0;
+    const auto fits = [isFresh](const Waiting &waiting) { return isFresh || !waiting.needsFreshWorker; };
+    const bool isAlone = m_jobs[m_waiting.front().job].what.isAlone;
+    const auto end = isAlone ? m_waiting.begin() + 1 : m_waiting.end();
+    const auto next = std::find_if(m_waiting.begin(), end, fits);
+    return next == end ? m_waiting.size() : static_cast<std::size_t>(next - m_waiting.begin());
+}
+
 void ProbePool::handOut()
 {
     for (auto &[number, worker] : m_workers) {
-        if (!worker.isReady || worker.job || worker.isLeaving || m_waiting.empty())
+        const auto isAlone = [this](const auto &entry) {
+            return entry.second.job && m_jobs[*entry.second.job].what.isAlone;
+        };
+        if (m_waiting.empty() || (m_jobs[m_waiting.front().job].what.isAlone && isBusy()) ||
+            std::any_of(m_workers.begin(), m_workers.end(), isAlone))
+            return;
+        if (!worker.isReady || worker.job || worker.isLeaving)
             continue;
-        const bool isFresh = worker.probed == 0;
-        // The first that fits; one that needs a fresh worker gets the next fresh one.
-        const auto fits = [isFresh](const Waiting &waiting) { return isFresh || !waiting.needsFreshWorker; };
-        const auto next = std::find_if(m_waiting.begin(), m_waiting.end(), fits);
-        if (next != m_waiting.end()) {
-            handOut(number, worker, static_cast<std::size_t>(next - m_waiting.begin()));
+        const std::size_t next = nextFor(worker);
+        if (next < m_waiting.size()) {
+            handOut(number, worker, next);
         } else {
             worker.isLeaving = true;
             endWorker(number, worker, QStringLiteral("a fresh one takes its place"));
@@ -204,10 +304,10 @@ void ProbePool::handOut(int number, Worker &worker, std::size_t index)
     worker.child.reset();
     worker.silent.start();
     worker.sinceJob.start();
-    m_listener->jobBegins(job, number);
+    listenerOf(job).jobBegins(m_jobs[job].place, number);
     ChannelMessage message;
     message.kind = ChannelMessage::Kind::Job;
-    message.job = m_jobs[job];
+    message.job = jobOf(job);
     m_group.send(number,
                  encodeMessage(message)); // one that takes nothing has ended, which is told by an event
 }
@@ -244,26 +344,27 @@ void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &me
     if (worker.messages > kMaxMessages)
         return;
     worker.silent.start();
-    const std::size_t job = *worker.job;
+    IPoolListener &listener = listenerOf(*worker.job);
+    const std::size_t place = m_jobs[*worker.job].place;
     switch (message.kind) {
     case Kind::Stage:
         worker.outcome.stage = message.stage;
-        m_listener->stageEntered(job, number, message.stage);
+        listener.stageEntered(place, number, message.stage);
         break;
     case Kind::Class:
-        m_listener->classBegins(job, number, message.text);
+        listener.classBegins(place, number, message.text);
         break;
     case Kind::Announced:
-        m_listener->classAnnounced();
+        listener.classAnnounced();
         break;
     case Kind::Child:
         worker.child = message.record;
-        m_listener->childBegins(job, number, message.record);
+        listener.childBegins(place, number, message.record);
         break;
     case Kind::ChildEnd: {
         ProbeOutcome ended = message.outcome;
         ended.records.push_back(message.record);
-        m_listener->childEnds(job, number, ended);
+        listener.childEnds(place, number, ended);
         worker.child.reset();
         break;
     }
@@ -301,7 +402,7 @@ bool ProbePool::isBelievable(const Worker &worker, const ChannelMessage &message
     const bool hasRecord =
         message.kind == Kind::Record || message.kind == Kind::Child || message.kind == Kind::ChildCloses;
     return !hasRecord ||
-           (message.record.path == m_jobs[*worker.job].path && worker.outcome.records.size() < kMaxRecords);
+           (message.record.path == jobOf(*worker.job).path && worker.outcome.records.size() < kMaxRecords);
 }
 
 void ProbePool::endWorker(int number, Worker &worker, const QString &reason)
@@ -335,12 +436,12 @@ void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcom
     worker.job.reset();
     worker.child.reset();
     ++worker.probed;
-    worker.probedPaths.append(m_jobs[job].path);
+    worker.probedPaths.append(jobOf(job).path);
     if (const QString why = whySpent(number, worker, outcome); !why.isEmpty()) {
         worker.isLeaving = true;
         endWorker(number, worker, why);
     }
-    m_listener->jobEnds(job, number, outcome);
+    endJob(job, number, outcome);
 }
 
 /// Why a worker ended, in words; what it told of a crash goes to the log.
@@ -350,7 +451,7 @@ QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int numb
     QString printed = m_group.output(number);
     const CrashReport crash = CrashReport::take(printed);
     if (worker.job && !crash.frames.isEmpty())
-        DebugLog(L"%ls crashed at %ls", m_jobs[*worker.job].path, crash.frames.join(QStringLiteral(" < ")));
+        DebugLog(L"%ls crashed at %ls", jobOf(*worker.job).path, crash.frames.join(QStringLiteral(" < ")));
     QString text = worker.endedFor + when;
     if (worker.endedFor.isEmpty() && !crash.summary.isEmpty())
         text = QStringLiteral("it crashed%1: %2").arg(when, crash.summary);
@@ -373,7 +474,7 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
         return;
     const Worker worker = std::move(found->second);
     m_workers.erase(found);
-    if (!worker.isReady) {
+    if (!worker.isReady && !worker.isLeaving) {
         ++m_failedStarts;
         DebugLog(L"A worker ended at its start: %ls", describe(worker, end, number));
     }
@@ -398,8 +499,8 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
 /// Somebody who went before may be to blame.
 void ProbePool::askAgain(std::size_t job, const QString &reason, const Worker &worker)
 {
-    DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as before it went %ls", m_jobs[job].path,
-             reason, namesOf(worker.probedPaths));
+    DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as before it went %ls", jobOf(job).path, reason,
+             namesOf(worker.probedPaths));
     m_waiting.push_front({job, true, true});
 }
 
@@ -407,7 +508,7 @@ void ProbePool::cancelJob(std::size_t job, int number)
 {
     ProbeOutcome cancelled;
     cancelled.status = ProbeStatus::Cancelled;
-    m_listener->jobEnds(job, number, cancelled);
+    endJob(job, number, cancelled);
 }
 
 void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, const QString &reason)
@@ -417,17 +518,17 @@ void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, c
     outcome.stage = worker.outcome.stage;
     outcome.reason = reason;
     outcome.milliseconds = static_cast<double>(worker.sinceJob.nsecsElapsed()) / 1e6;
-    if (worker.child && m_jobs[job].leftOut.insert(worker.child->subId).second) {
+    if (worker.child && jobOf(job).leftOut.insert(worker.child->subId).second) {
         // One sub-plug-in's crash is not its shell's: the others are asked without it.
         outcome.records.push_back(*worker.child);
         outcome.records.back().enabled = outcome.records.back().working = false;
         m_crashedChildren[job].push_back(outcome.records.back());
-        m_listener->childEnds(job, number, outcome);
+        listenerOf(job).childEnds(m_jobs[job].place, number, outcome);
         m_waiting.push_front({job, true, true});
         return;
     }
     outcome.records = m_crashedChildren[job];
-    m_listener->jobEnds(job, number, outcome);
+    endJob(job, number, outcome);
 }
 
 void ProbePool::endOverdue()

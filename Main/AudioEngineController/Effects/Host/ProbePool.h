@@ -10,7 +10,8 @@
 #include <set>
 #include <vector>
 
-/// Hears what a pool does, on the thread that runs it.
+/// Hears what becomes of its jobs, which it knows by their places among them, on the thread that runs the
+/// pool.
 class IPoolListener {
 public:
     virtual ~IPoolListener() = default;
@@ -28,6 +29,8 @@ public:
     virtual void jobEnds(std::size_t job, int worker, const ProbeOutcome &outcome) = 0;
     /// A worker has ended, which comes after what became of its job.
     virtual void workerEnds(int worker, const QString &reason) = 0;
+    /// Of all jobs that are at work this one is now the longest.
+    virtual void becomesLongest(std::size_t job) = 0;
     /// Called now and then.
     virtual void turn() = 0;
     /// True when no more jobs are to be begun.
@@ -36,9 +39,19 @@ public:
     virtual bool isSkipped(std::size_t job) = 0;
 };
 
+/// What a pool is to ask, and when.
+struct PoolJob {
+    ProbeJob job;
+    bool isAlone = false;  ///< before all others, and while nothing else is at work
+    double expectedMs = 0; ///< how long it will take, by a guess: the slowest begin first
+};
+
 /// Makes outcomes of jobs in worker processes, several at once. A plug-in that ends its worker, or gives no
 /// answer, costs nobody else anything: it is asked once more in a worker that asked nobody before it, and
 /// only what happens there is held against it.
+///
+/// Several listeners share one pool: while one waits for its jobs, workers that it does not need are busy
+/// with those of others. Used for one scan.
 class ProbePool {
 public:
     struct Settings {
@@ -51,17 +64,34 @@ public:
     explicit ProbePool(Settings settings);
     ~ProbePool();
 
-    /// Runs the jobs, beginning with the first. Returns when all have ended, or some time after a cancel.
-    /// False, with the reason in the log, when no worker can be had: the jobs that did not end are left.
-    bool run(std::vector<ProbeJob> jobs, IPoolListener &listener);
+    /// Adds jobs, which begin when somebody runs the pool. The listener must live until it withdraws.
+    void add(std::vector<PoolJob> jobs, IPoolListener &listener);
+    /// Works until all jobs of the listener have ended, or some time after it cancelled the scan, which ends
+    /// those of all listeners. When nothing is left of anybody's, the workers are ended. False, with the
+    /// reason in the log, when no worker can be had: the jobs that did not end are left.
+    bool run(IPoolListener &listener);
+    /// Ends what is left of a listener's jobs without a word to it.
+    void withdraw(IPoolListener &listener);
+
+    /// How many jobs were added, and how many of them have ended.
+    std::size_t added() const { return m_jobs.size(); }
+    std::size_t ended() const { return m_ended; }
+    /// Whether no other job has been at work for longer.
+    bool isLongest(const IPoolListener &listener, std::size_t job) const;
 
 private:
+    /// A job of a listener, with what must be left out by now.
+    struct Job {
+        PoolJob what;
+        IPoolListener *listener;
+        std::size_t place; ///< among the listener's
+    };
     /// A worker process, and what it does.
     struct Worker {
         ChannelReader reader;
         bool isReady = false;
         int probed = 0;                    ///< jobs that it has ended
-        std::optional<std::size_t> job;    ///< the one that it is busy with
+        std::optional<std::size_t> job;    ///< the one that it is busy with, by its place in `m_jobs`
         ProbeOutcome outcome;              ///< of that one, as far as it came
         int messages = 0;                  ///< about that one
         QElapsedTimer sinceJob;            ///< since it was handed out
@@ -80,7 +110,17 @@ private:
         bool isLookedAt = false;
     };
 
+    ProbeJob &jobOf(std::size_t job) { return m_jobs[job].what.job; }
+    const ProbeJob &jobOf(std::size_t job) const { return m_jobs[job].what.job; }
+    IPoolListener &listenerOf(std::size_t job) { return *m_jobs[job].listener; }
     bool isBusy() const;
+    bool isLeft(const IPoolListener &listener) const;
+    std::optional<std::size_t> longest() const;
+    void showLongest();
+    void turn();
+    void endJob(std::size_t job, int number, const ProbeOutcome &outcome);
+    void endIdle();
+    std::size_t nextFor(const Worker &worker) const;
     void cancelJobs();
     void skipJobs();
     void cancelJob(std::size_t job, int number);
@@ -107,12 +147,17 @@ private:
     WorkerGroup m_group;
     std::map<int, Worker> m_workers;
     std::deque<Waiting> m_waiting;
-    std::vector<ProbeJob> m_jobs; ///< with what must be left out by now
+    std::vector<Job> m_jobs;
+    std::size_t m_ended = 0;            ///< jobs
+    std::optional<std::size_t> m_shown; ///< the longest job at work that was told of
+    std::vector<IPoolListener *> m_listeners;
     /// The sub-plug-ins of a job that ended a worker each.
     std::map<std::size_t, std::vector<EffectRecord>> m_crashedChildren;
     std::set<std::size_t> m_killed; ///< jobs whose fresh worker was killed from outside
     bool m_isCancelled = false;
-    IPoolListener *m_listener = nullptr;
+    bool m_hasGivenUp = false; ///< no worker can be had
+    QElapsedTimer m_sinceCancel;
+    IPoolListener *m_listener = nullptr; ///< that runs it
     int m_failedStarts = 0;
     QElapsedTimer m_sinceMemory; ///< since the workers' memory was looked at
 };

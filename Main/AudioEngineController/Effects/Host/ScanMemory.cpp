@@ -18,20 +18,21 @@ void setHolderIn(RememberedProbe &probe, const QString &id, const QString &holde
 
 ScanMemory::ScanMemory(const CatalogueHost &host)
     : m_host(host)
-    , m_probes(host.catalogueFolder())
+    , m_probes(host.probeMemory() ? host.probeMemory()
+                                  : std::make_shared<ProbeMemory>(host.catalogueFolder()))
 {}
 
 void ScanMemory::addCrashes()
 {
     for (const EffectRecord &marker : m_host.absorbed()) {
-        const RememberedProbe *last = m_probes.find(m_host.format(), marker.path);
+        const RememberedProbe *last = m_probes->find(m_host.format(), marker.path);
         const bool isKnown =
             last && last->fileTime == marker.fileTime &&
             (marker.subId == 0 ? last->status == ProbeStatus::Crashed || last->status == ProbeStatus::NoAnswer
                                : last->reasonOf(marker.subId) != last->reason);
         if (!isKnown)
-            m_probes.setCrash(m_host.format(), marker, ProbeStatus::Crashed,
-                              QStringLiteral("it ended the scanner"));
+            m_probes->setCrash(m_host.format(), marker, ProbeStatus::Crashed,
+                               QStringLiteral("it ended the scanner"));
     }
 }
 
@@ -62,12 +63,12 @@ void ScanMemory::setHolder(const QString &id, const QString &holder) { setHolder
 
 void ScanMemory::setHolder(const QString &file, const QString &id, const QString &holder)
 {
-    const RememberedProbe *last = m_probes.find(m_host.format(), file);
+    const RememberedProbe *last = m_probes->find(m_host.format(), file);
     if (!last)
         return;
     RememberedProbe changed = *last;
     setHolderIn(changed, id, holder);
-    m_probes.set(changed);
+    m_probes->set(changed);
 }
 
 void ScanMemory::write(bool isLast)
@@ -78,7 +79,7 @@ void ScanMemory::write(bool isLast)
     if (!isLast && m_sinceWrite.isValid() && !m_sinceWrite.hasExpired(pause))
         return;
     m_sinceWrite.start();
-    if (const FileResult written = m_probes.write(); !written)
+    if (const FileResult written = m_probes->write(); !written)
         DebugLog(L"Cannot write %ls: %ls", QString::fromLatin1(kProbeMemoryFile + 1), written.reason);
     m_pause = kShare * m_sinceWrite.elapsed();
     m_sinceWrite.start();

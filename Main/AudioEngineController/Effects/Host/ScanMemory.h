@@ -5,6 +5,8 @@
 
 #include <QElapsedTimer>
 
+#include <memory>
+
 /// What one scan of a format's folders puts into the memory of probes, item by item, and when that is
 /// written. Used on the scan worker.
 class ScanMemory {
@@ -13,7 +15,7 @@ public:
     explicit ScanMemory(const CatalogueHost &host);
 
     /// All that is remembered.
-    const ProbeMemory &probes() const { return m_probes; }
+    const ProbeMemory &probes() const { return *m_probes; }
 
     /// Remembers what the crash markers said that this run absorbed. The launcher, which saw the end, knows
     /// more.
@@ -21,7 +23,7 @@ public:
     /// Forgets the files of this format of which the condition does not hold.
     void keepOnly(const std::function<bool(const QString &path)> &isKept)
     {
-        m_probes.keepOnly(m_host.format(), isKept);
+        m_probes->keepOnly(m_host.format(), isKept);
     }
 
     /// Begins an item, of which nothing is known yet.
@@ -39,7 +41,7 @@ public:
     void keep()
     {
         if (m_item.status != ProbeStatus::Skipped)
-            m_probes.set(m_item);
+            m_probes->set(m_item);
     }
 
     /// Writes the file, failures soon, the rest now and then: what is lost with a process costs time only.
@@ -47,7 +49,7 @@ public:
 
 private:
     const CatalogueHost &m_host;
-    ProbeMemory m_probes;
+    const std::shared_ptr<ProbeMemory> m_probes;
     RememberedProbe m_item;     ///< at hand
     QElapsedTimer m_sinceWrite; ///< invalid before the first
     qint64 m_pause = 0;         ///< ms until it may be written again
