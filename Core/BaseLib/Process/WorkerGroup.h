@@ -53,7 +53,8 @@ public:
     QString output(int worker) const;
     /// Whether processes run that a worker started.
     bool hasChildren(int worker) const;
-    /// Resident memory of a worker in bytes; 0 when the system does not tell.
+    /// Resident memory in bytes of a worker and of the processes that it started; 0 when the system does not
+    /// tell.
     qint64 residentMemory(int worker) const;
 
 private:

@@ -6,6 +6,8 @@
 #include <dlfcn.h>
 #include <fcntl.h>
 #include <pthread.h>
+#include <sys/mman.h>
+#include <sys/prctl.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -55,6 +57,18 @@ bool leaveDaemon(const std::string &file)
     _exit(leaveChild(file) ? 0 : 1);
 }
 
+/// Starts a process that holds so many MiB.
+bool feedChild(const std::string &mebibytes)
+{
+    const pid_t child = fork();
+    if (child != 0)
+        return child > 0;
+    const std::size_t size = std::strtoul(mebibytes.c_str(), nullptr, 10) << 20;
+    mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS | MAP_POPULATE, -1, 0);
+    for (;;)
+        pause();
+}
+
 bool writeEverywhere()
 {
     for (int number = 3; number < 256; ++number)
@@ -68,6 +82,10 @@ bool causePlatformEffect(const std::string &kind, const std::string &value)
 {
     if (kind == "fork" || kind == "daemon")
         return kind == "fork" ? leaveChild(value) : leaveDaemon(value);
+    if (kind == "feed")
+        return feedChild(value);
+    if (kind == "stay") // also when the parent dies
+        return prctl(PR_SET_PDEATHSIG, 0) == 0;
     if (kind == "garbage")
         return writeEverywhere();
     if (kind == "close-all")

@@ -32,6 +32,17 @@ protected:
         }
         return processes;
     }
+    /// Ends the scanner by force. What it started must be gone soon after.
+    void killAndWatch(ScannerRun &scanner) const
+    {
+        scanner.kill();
+        scanner.wait();
+        QElapsedTimer clock;
+        clock.start();
+        while (!running().isEmpty() && clock.elapsed() < 5000)
+            QThread::msleep(10);
+        EXPECT_LT(clock.elapsed(), 1000) << qPrintable(running().join(' '));
+    }
     /// The reason that is kept of a module; empty where it has none.
     QString reason(const QString &module) const
     {
@@ -51,7 +62,9 @@ TEST_F(Workers, KeepToThemselvesWhatPluginsDo)
         const char *name;
         QByteArray script;
         const char *reason; ///< none: it is listed
-    } rows[] = {{"Child", "effect initialize fork \"" + left + "\"\n", nullptr},
+    } rows[] = {{"Brood", "effect initialize feed 250\neffect initialize feed 250\nfault initialize hang\n",
+                 "it took more than 400 MiB of memory"},
+                {"Child", "effect initialize fork \"" + left + "\"\n", nullptr},
                 {"Closed", "effect initialize close-all 1\n", "it closed the channel of its worker"},
                 {"Daemon", "effect initialize daemon \"" + left + "\"\n", nullptr},
                 {"Garbage", "effect initialize garbage 1\n", "it wrote into the channel of its worker"},
@@ -94,13 +107,7 @@ TEST_F(Workers, LeaveWithTheirScannerAndBlameNobody)
             scanner.setEnvironment(name, value);
         forgetTrace();
         ASSERT_TRUE(scanner.start() && scanner.waitUntil([&] { return loaded().size() >= moment; }));
-        scanner.kill();
-        scanner.wait();
-        QElapsedTimer clock;
-        clock.start();
-        while (!running().isEmpty() && clock.elapsed() < 5000)
-            QThread::msleep(10);
-        EXPECT_LT(clock.elapsed(), 1000) << qPrintable(running().join(' '));
+        killAndWatch(scanner);
         EXPECT_TRUE(scanOnce(kPool).succeeded());
         QStringList expected;
         for (const QString &name : names)
@@ -108,6 +115,16 @@ TEST_F(Workers, LeaveWithTheirScannerAndBlameNobody)
         EXPECT_EQ(sortedRecords("Name Enabled Working"), expected);
         EXPECT_EQ(m_folder.markers(), QStringList());
     }
+}
+
+TEST_F(Workers, LeaveWithTheirScannerWhateverTheirPluginsDo)
+{
+    put("P.vst3", "effect create-instance stay 1\nfault initialize hang\n");
+    ScannerRun scanner(scannerProgram(), m_folder);
+    for (const auto &[name, value] : kPool)
+        scanner.setEnvironment(name, value);
+    ASSERT_TRUE(scanner.start() && waitForStage(scanner, "P", "initialize"));
+    killAndWatch(scanner);
 }
 
 TEST_F(Workers, BeginWithTheSuspectsOfEveryFormatOneByOneAndThenWithTheSlowest)

@@ -6,6 +6,9 @@
 #include <QFile>
 
 #include <csignal>
+#include <vector>
+
+#include <unistd.h>
 
 std::set<pid_t> childrenOf(pid_t process)
 {
@@ -42,5 +45,39 @@ int workerOf(pid_t process)
     for (const QByteArray &entry : file.readAll().split('\0'))
         if (entry.startsWith(mark))
             return entry.mid(mark.size()).toInt();
+    return 0;
+}
+
+std::set<pid_t> withDescendants(const std::set<pid_t> &processes)
+{
+    constexpr std::size_t kMost = 1000;
+    std::set<pid_t> all = processes;
+    std::vector<pid_t> unseen(processes.begin(), processes.end());
+    while (!unseen.empty() && all.size() < kMost) {
+        const pid_t next = unseen.back();
+        unseen.pop_back();
+        for (const pid_t child : childrenOf(next))
+            if (all.insert(child).second)
+                unseen.push_back(child);
+    }
+    return all;
+}
+
+qint64 residentMemoryOf(pid_t process)
+{
+    QFile file(QStringLiteral("/proc/%1/statm").arg(process));
+    const QList<QByteArray> pages =
+        file.open(QIODevice::ReadOnly) ? file.readAll().split(' ') : QList<QByteArray>();
+    return pages.size() > 1 ? pages.at(1).toLongLong() * sysconf(_SC_PAGESIZE) : 0;
+}
+
+qint64 shareOfMemory(pid_t process)
+{
+    QFile file(QStringLiteral("/proc/%1/smaps_rollup").arg(process));
+    if (!file.open(QIODevice::ReadOnly))
+        return 0;
+    for (const QByteArray &line : file.readAll().split('\n'))
+        if (line.startsWith("Pss:"))
+            return line.simplified().split(' ').value(1).toLongLong() * 1024; // told in kB
     return 0;
 }

@@ -2,6 +2,9 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <csignal>
+#include <system_error>
+#include <thread>
 
 #include <fcntl.h>
 #include <sys/socket.h>
@@ -10,6 +13,26 @@
 namespace {
 
 constexpr int kBlock = 65536;
+constexpr useconds_t kLook = 250000;
+
+/// Ends this process and its group when the scanner has ended. The signal that the system sends then does not
+/// reach a worker whose plug-in has switched it off.
+void watchScanner()
+{
+    sigset_t all;
+    sigset_t before;
+    sigfillset(&all);
+    pthread_sigmask(SIG_SETMASK, &all, &before); // signals are the plug-ins' business
+    try {
+        std::thread([scanner = getppid()] {
+            while (getppid() == scanner)
+                usleep(kLook);
+            ::kill(-getpid(), SIGKILL);
+        }).detach();
+    } catch (const std::system_error &) { // the signal is there
+    }
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
+}
 
 } // namespace
 
@@ -29,6 +52,7 @@ WorkerChannel::WorkerChannel()
         ::close(kDescriptor);
     else
         m_handle = kDescriptor;
+    watchScanner();
     // The variable stays: by it the scanner tells whose child a process is, wherever that has gone.
 }
 

@@ -113,6 +113,7 @@ struct WorkerGroup::Private {
 
     void readAll(int timeout, std::vector<WorkerEvent> &events);
     bool reap(int number, std::vector<WorkerEvent> &events);
+    std::set<pid_t> childrenOfWorker(int number) const;
     bool isOrphan(pid_t child) const;
     void endOrphans();
 };
@@ -290,26 +291,36 @@ QString WorkerGroup::output(int worker) const
     return ended == m_private->outputs.end() ? QString() : ended->second;
 }
 
-bool WorkerGroup::hasChildren(int worker) const
+/// What a worker started and its orphans, which have come to this process.
+std::set<pid_t> WorkerGroup::Private::childrenOfWorker(int number) const
 {
-    const auto found = m_private->workers.find(worker);
-    if (found == m_private->workers.end())
-        return false;
-    const auto isOrphan = [&](pid_t child) { // which have come to this process
-        return m_private->before.count(child) == 0 && child != found->second.process &&
-               getsid(child) != getsid(0) && workerOf(child) == worker;
-    };
-    const std::set<pid_t> ours = childrenOf(getpid());
-    return !childrenOf(found->second.process).empty() || std::any_of(ours.begin(), ours.end(), isOrphan);
+    const auto found = workers.find(number);
+    if (found == workers.end())
+        return {};
+    std::set<pid_t> children = childrenOf(found->second.process);
+    for (const pid_t child : childrenOf(getpid())) {
+        const bool isWorker = std::any_of(workers.begin(), workers.end(), [child](const auto &entry) {
+            return entry.second.process == child;
+        });
+        if (!isWorker && before.count(child) == 0 && getsid(child) != getsid(0) && workerOf(child) == number)
+            children.insert(child);
+    }
+    return children;
 }
+
+bool WorkerGroup::hasChildren(int worker) const { return !m_private->childrenOfWorker(worker).empty(); }
 
 qint64 WorkerGroup::residentMemory(int worker) const
 {
     const auto found = m_private->workers.find(worker);
     if (found == m_private->workers.end())
         return 0;
-    QFile file(QStringLiteral("/proc/%1/statm").arg(found->second.process));
-    const QList<QByteArray> pages =
-        file.open(QIODevice::ReadOnly) ? file.readAll().split(' ') : QList<QByteArray>();
-    return pages.size() > 1 ? pages.at(1).toLongLong() * sysconf(_SC_PAGESIZE) : 0;
+    const pid_t process = found->second.process;
+    const std::set<pid_t> children = m_private->childrenOfWorker(worker);
+    if (children.empty())
+        return residentMemoryOf(process);
+    qint64 all = shareOfMemory(process);
+    for (const pid_t child : withDescendants(children))
+        all += shareOfMemory(child);
+    return std::max(all, residentMemoryOf(process));
 }

@@ -14,6 +14,7 @@
 #include <cstddef>
 #include <cwchar>
 #include <map>
+#include <vector>
 
 #include <psapi.h>
 
@@ -181,6 +182,15 @@ QString nameOf(DWORD status)
     }
 }
 
+/// 0 when the system does not tell.
+qint64 workingSet(HANDLE process)
+{
+    PROCESS_MEMORY_COUNTERS memory = {};
+    return K32GetProcessMemoryInfo(process, &memory, sizeof memory)
+               ? static_cast<qint64>(memory.WorkingSetSize)
+               : 0;
+}
+
 WorkerEnd endOf(HANDLE process)
 {
     DWORD status = 0;
@@ -331,9 +341,19 @@ bool WorkerGroup::hasChildren(int worker) const
 qint64 WorkerGroup::residentMemory(int worker) const
 {
     const auto found = m_private->workers.find(worker);
-    PROCESS_MEMORY_COUNTERS memory = {};
-    if (found == m_private->workers.end() ||
-        !K32GetProcessMemoryInfo(found->second.process->get(), &memory, sizeof memory))
+    if (found == m_private->workers.end())
         return 0;
-    return static_cast<qint64>(memory.WorkingSetSize);
+    constexpr std::size_t kMost = 1000;
+    std::vector<ULONG_PTR> space(kMost);
+    auto *const list = reinterpret_cast<JOBOBJECT_BASIC_PROCESS_ID_LIST *>(space.data());
+    if (!QueryInformationJobObject(found->second.job.get(), JobObjectBasicProcessIdList, list,
+                                   static_cast<DWORD>(space.size() * sizeof space[0]), nullptr) &&
+        GetLastError() != ERROR_MORE_DATA)
+        return workingSet(found->second.process->get());
+    qint64 all = 0;
+    for (DWORD each = 0; each < list->NumberOfProcessIdsInList; ++each)
+        all += workingSet(WindowsHandle(OpenProcess(PROCESS_QUERY_LIMITED_INFORMATION | PROCESS_VM_READ,
+                                                    FALSE, static_cast<DWORD>(list->ProcessIdList[each])))
+                              .get());
+    return all;
 }

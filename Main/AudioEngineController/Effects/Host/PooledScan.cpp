@@ -94,7 +94,7 @@ private:
     bool isAlone(std::size_t item) const { return m_states[item].isAlone; }
     void holdBack(std::size_t item);
     bool isOfOpenItem(const QString &id, std::size_t item) const;
-    void keep(std::size_t item);
+    void keep(std::size_t index);
     void keepInOrder();
     void keepAhead();
     void probeRest();

@@ -548,7 +548,7 @@ void ProbePool::endOverdue()
 
 void ProbePool::endOversized()
 {
-    constexpr qint64 kPause = 50; // ms
+    constexpr qint64 kPause = 100; // ms
     if (m_settings.memoryLimit <= 0 || (m_sinceMemory.isValid() && !m_sinceMemory.hasExpired(kPause)))
         return;
     m_sinceMemory.start();
