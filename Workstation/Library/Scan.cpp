@@ -135,6 +135,10 @@ void prepare(PluginHost &registry, const FxProbe::ScanSettings &settings, const 
     registry.setProbeLimit(settings.timeout);
     registry.setScanJobs(settings.jobs);
     registry.setMemoryLimit(settings.memoryLimit);
+    QStringList only;
+    for (const QString &path : settings.only)
+        only += absolute(path);
+    registry.setSearchedOnly(only);
     registry.setScannerProgram(settings.scannerProgram);
     std::map<QString, QString> environment{{QStringLiteral("FXPROBE_REPORT"), report}};
     if (!settings.log.isEmpty())

@@ -49,6 +49,9 @@ struct ScanSettings {
     /// All folders to search, with those below them. What is known of plug-ins in a folder that is not given
     /// any more is dropped; in one that is given and not there, as on a drive that is unplugged, it is kept.
     QStringList folders;
+    /// Folders in those, and paths of plug-ins, that alone are searched; what is known of all others stays as
+    /// it is. None: all are searched.
+    QStringList only;
     /// Plug-ins that are disabled or failed and get another chance in this scan: paths of their files, or
     /// their names. What the user switched off stays so. A name that means none, or several, ends the scan.
     QStringList retry;

@@ -65,12 +65,20 @@ TEST_F(LibraryScan, TellsWhatIsThereAndKeepsWhatIsAway)
     EXPECT_EQ(FxProbe::scan(m_settings).plugins.at(1).state, "ok");
 
     m_settings.retry.clear();
+    put("New.vst2");
+    put("sub/Late.vst2", "id 8\n");
+    m_settings.only = QStringList(m_folder.path("Plugins/sub"));
+    EXPECT_EQ(lines(FxProbe::scan(m_settings)),
+              QStringList(
+                  {"Comp ok 1-2 vst2:Comp:7", "Killer ok 2-2 vst2:Killer:1000", "Late ok 2-2 vst2:Late:8"}));
+
+    m_settings.only.clear();
     mark("Comp", "Favourite", "1");
     QDir(m_folder.dataFolder()).rename("Plugins", "Unplugged");
     const FxProbe::ScanResult away = FxProbe::scan(m_settings);
     EXPECT_TRUE(away);
     EXPECT_EQ(away.problems, QStringList("there is no folder " + m_folder.plugins()));
-    ASSERT_EQ(away.plugins.size(), 2u);
+    ASSERT_EQ(away.plugins.size(), 3u);
     EXPECT_EQ(away.plugins.front().state, "folder away");
     EXPECT_TRUE(away.plugins.front().isFavourite);
 }

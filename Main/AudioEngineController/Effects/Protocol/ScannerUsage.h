@@ -27,6 +27,7 @@ inline constexpr UsageRow kScannerVariables[] = {
     {"FXPROBE_ONLY",
      "Folders and plug-ins of the scan list, separated as in PATH: search only these, and keep "
      "what is known of all others."},
+    {"FXPROBE_CONTROL", "1: take requests on the standard input, one JSON object a line."},
     {"FXPROBE_LOG", "A file to which the log is appended, in place of standard error."},
     {"FXPROBE_TRACE", "1 adds the trace lines to the log."},
     {"FXPROBE_REPORT", "A file to which the course of the scan is appended."},
