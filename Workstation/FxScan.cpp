@@ -13,6 +13,7 @@
 #include "Workstation/Output/Terminal.h"
 #include "Workstation/ScanFolders.h"
 #include "Workstation/ScanSession.h"
+#include "Workstation/Summary/PluginFilter.h"
 
 #include <QFile>
 #include <QFileInfo>
@@ -57,7 +58,7 @@ void prepareEnvironment(const ScanOptions &options, const DataFiles &files)
 bool print(const ScanOptions &options, const ScanSummary &summary, const QStringList &folders)
 {
     if (options.format == OutputFormat::Table)
-        return Terminal::print(renderTable(summary));
+        return Terminal::print(renderTable(summary, Terminal::outputWidth()));
     if (options.format == OutputFormat::Json)
         return Terminal::printData(QString::fromUtf8(renderJson(summary, options.dataFolder, folders)));
     if (options.format == OutputFormat::JsonLines)
@@ -68,15 +69,17 @@ bool print(const ScanOptions &options, const ScanSummary &summary, const QString
 }
 
 /// Prints the result; the exit code that goes with it.
-int conclude(const ScanOptions &options, const ScanSummary &summary, const QStringList &folders)
+int conclude(const ScanOptions &options, ScanSummary summary, const QStringList &folders)
 {
+    const bool hasFailures = !summary.failures.empty(); // whether they are shown or not
+    PluginFilter(options.only).apply(summary);
     if (!print(options, summary, folders)) {
         complain(QStringLiteral("the result could not be printed"));
         return ScanExit::kNotFinished;
     }
     if (summary.isScan && !summary.finished)
         return ScanExit::kNotFinished;
-    return options.strict && !summary.failures.empty() ? ScanExit::kFailures : ScanExit::kDone;
+    return options.strict && hasFailures ? ScanExit::kFailures : ScanExit::kDone;
 }
 
 int listOnly(const ScanOptions &options, const DataFiles &files)

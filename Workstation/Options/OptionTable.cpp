@@ -1,5 +1,9 @@
 #include "Workstation/Options/OptionTable.h"
 
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
+
+#include <algorithm>
+
 namespace {
 
 void setFormat(ScanOptions &options, size_t choice)
@@ -9,16 +13,32 @@ void setFormat(ScanOptions &options, size_t choice)
     options.format = kFormats[choice];
 }
 
-/// "table, json, jsonl or csv"
-QString inWords(const std::vector<const char *> &choices)
+/// What `PluginFilter` understands.
+QStringList filterWords()
 {
-    QString words;
-    for (size_t i = 0; i < choices.size(); ++i) {
-        if (i > 0)
-            words += QLatin1String(i + 1 < choices.size() ? ", " : " or ");
-        words += QLatin1String(choices[i]);
-    }
+    QStringList words{QStringLiteral("ok"),          QStringLiteral("failed"),
+                      QStringLiteral("disabled"),    QStringLiteral("switched-off"),
+                      QStringLiteral("folder-away"), QStringLiteral("ignored"),
+                      QStringLiteral("favourite"),   QStringLiteral("instrument")};
+    for (const PluginFormatInfo &format : pluginFormats())
+        if (format.isScanned())
+            words += QString::fromLatin1(format.key);
+    return words + QStringList{QStringLiteral("category="), QStringLiteral("vendor=")};
+}
+
+QStringList wordsOf(const ChoiceTarget &target)
+{
+    QStringList words;
+    for (const char *choice : target.choices)
+        words += QString::fromLatin1(choice);
     return words;
+}
+
+/// "table, json, jsonl or csv"
+QString inWords(const QStringList &choices)
+{
+    const QString most = choices.mid(0, choices.size() - 1).join(QLatin1String(", "));
+    return most + QLatin1String(" or ") + choices.last();
 }
 
 /// Stores one value in whatever kind of target the row has; returns what is wrong.
@@ -68,7 +88,19 @@ struct ValueStore {
             }
         }
         return QStringLiteral("unknown %1 '%2'; use %3")
-            .arg(QLatin1String(row.name), value, inWords(target.choices));
+            .arg(QLatin1String(row.name), value, inWords(wordsOf(target)));
+    }
+
+    QString operator()(const WordsTarget &target) const
+    {
+        const QStringList words = target.words();
+        const bool isKnown = std::any_of(words.begin(), words.end(), [&](const QString &word) {
+            return word.endsWith(QLatin1Char('=')) ? value.startsWith(word) && value != word : value == word;
+        });
+        options.*target.member += value;
+        return isKnown ? QString()
+                       : QStringLiteral("unknown word '%1' for --%2; use %3")
+                             .arg(value, QLatin1String(row.name), inWords(words));
     }
 
 private:
@@ -127,6 +159,14 @@ const std::vector<OptionRow> &optionTable()
         {"no-exclude", "folder", &ScanOptions::noExclude, "Search an excluded folder again."},
         {"no-favourite", "name", &ScanOptions::noFavourite, "Take the mark of a favourite away."},
         {"no-ignore", "path", &ScanOptions::noIgnore, "Load an ignored plug-in again."},
+        {"only", "word", WordsTarget{&ScanOptions::only, filterWords},
+         "Show only some plug-ins: ok, failed, disabled, switched-off, folder-away, ignored, favourite, "
+         "instrument, the name of a format (vst3, vst2), category=NAME or vendor=TEXT (a part of it). Can be "
+         "given several "
+         "times.",
+         "Of several words of one kind one must fit: --only failed --only disabled shows both. Words of "
+         "different kinds must all fit: --only vst3 --only instrument shows instruments in that format. It "
+         "changes what is printed, in every format, not what is scanned, nor the exit code."},
         {"quiet", "", &ScanOptions::quiet, "Show no progress."},
         {"rescan", "name", &ScanOptions::rescan,
          "Probe a plug-in again although its file did not change. Can be given several times.",
@@ -181,6 +221,10 @@ const std::vector<OptionConflict> &optionConflicts()
                  {"retry", "retry-changed", "retry-failed", "rescan", "rescan-all", "in-process"})
                 all.push_back({option, ofScan, reason});
         }
+        for (const char *option : optionsWithoutScan())
+            if (qstrcmp(option, "list") != 0)
+                all.push_back(
+                    {option, "only", QStringLiteral("--%1 prints no plug-ins").arg(QLatin1String(option))});
         for (const char *first : {"folders", "list"})
             for (const char *other : optionsWithoutScan())
                 if (qstrcmp(first, other) != 0)

@@ -22,10 +22,17 @@ struct ChoiceTarget {
     void (*choose)(ScanOptions &options, size_t choice); ///< stores which was given
 };
 
+/// Words, each one of some; can be given several times. A word of the list that ends in "=" stands for all
+/// that begin with it.
+struct WordsTarget {
+    QStringList ScanOptions::*member;
+    QStringList (*words)();
+};
+
 /// Where the value of an option goes. A switch sets its member to true; an option with a list can be given
 /// several times.
 using OptionTarget = std::variant<bool ScanOptions::*, QString ScanOptions::*, QStringList ScanOptions::*,
-                                  NumberTarget, ChoiceTarget>;
+                                  NumberTarget, ChoiceTarget, WordsTarget>;
 
 /// One option of fxscan: command line, help, completion and manual are all made from this row.
 struct OptionRow {

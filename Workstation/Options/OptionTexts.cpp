@@ -17,6 +17,9 @@ QString completionCommand(const OptionRow &row)
         return QStringLiteral("mapfile -t COMPREPLY < <(compgen -W '%1' -- \"$current\")")
             .arg(words.join(QLatin1Char(' ')));
     }
+    if (const auto *target = std::get_if<WordsTarget>(&row.target))
+        return QStringLiteral("mapfile -t COMPREPLY < <(compgen -W '%1' -- \"$current\")")
+            .arg(target->words().join(QLatin1Char(' ')));
     const QLatin1String valueName(row.valueName);
     if (valueName == QLatin1String("folder"))
         return QStringLiteral("_fxscan_files -d");

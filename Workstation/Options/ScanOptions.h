@@ -28,6 +28,7 @@ struct ScanOptions {
     bool retryChanged = false; ///< those of them that may work now
     QStringList rescan;        ///< names or paths of plug-ins that are asked although they did not change
     bool rescanAll = false;
+    QStringList only;      ///< words that say which plug-ins are shown; none: all
     QStringList switchOff; ///< names or paths of plug-ins whose marks change
     QStringList switchOn;
     QStringList favourite;

@@ -6,8 +6,9 @@
 #include <QString>
 #include <QStringList>
 
-/// The summary as text for people.
-QString renderTable(const ScanSummary &summary);
+/// The summary as text for people. Columns of the table that do not fit into `width` are left out or cut; 0:
+/// any width.
+QString renderTable(const ScanSummary &summary, int width = 0);
 /// The summary as JSON; docs/fxscan.schema.json describes it.
 QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
 /// The same as the last line of JSON lines.

@@ -1,3 +1,4 @@
+#include "Workstation/Output/FailureText.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
 
@@ -23,26 +24,67 @@ Row rowOf(const CataloguedPlugin &plugin)
             QString::fromLatin1(stateText(plugin.state()))};
 }
 
-QString renderRows(const std::vector<Row> &rows)
+/// What gives way first where a line has no room for all, and the least that the others need.
+constexpr std::size_t kName = 1;
+constexpr std::size_t kVendor = 2;
+constexpr std::array<std::size_t, 2> kLeftOutFirst = {4, 3}; // channels, then categories
+constexpr int kLeastName = 16;
+constexpr int kLeastVendor = 8;
+constexpr int kGap = 2;
+
+using Widths = std::array<int, kColumns>; ///< 0: the column is left out
+
+int lineWidth(const Widths &widths)
 {
-    std::array<int, kColumns> widths = {};
+    int line = -kGap;
+    for (const int width : widths)
+        line += width == 0 ? 0 : width + kGap;
+    return line;
+}
+
+/// Makes columns fit into a line.
+void fit(Widths &widths, int line)
+{
+    for (const std::size_t column : kLeftOutFirst)
+        if (lineWidth(widths) > line)
+            widths[column] = 0;
+    const auto shrink = [&](std::size_t column, int least) {
+        const int excess = std::max(lineWidth(widths) - line, 0);
+        widths[column] = std::min(widths[column], std::max(widths[column] - excess, least));
+    };
+    const int whole = widths[kName];
+    shrink(kVendor, kLeastVendor);
+    shrink(kName, kLeastName);
+    if (lineWidth(widths) <= line)
+        return;
+    widths[kName] = whole;
+    widths[kVendor] = 0;
+    shrink(kName, 1);
+}
+
+QString renderRows(const std::vector<Row> &rows, int line)
+{
+    Widths widths = {};
     for (const Row &row : rows)
         for (std::size_t column = 0; column < kColumns; ++column)
             widths[column] =
                 std::min(kMaxWidths[column], std::max(widths[column], Terminal::width(row[column])));
+    if (line > 0)
+        fit(widths, line);
     QString text;
     for (const Row &row : rows) {
-        QString line;
+        QString shown;
         for (std::size_t column = 0; column < kColumns; ++column)
-            line += Terminal::cell(row[column], widths[column]) + QLatin1String("  ");
-        while (line.endsWith(QLatin1Char(' ')))
-            line.chop(1);
-        text += line + QLatin1Char('\n');
+            if (widths[column] > 0)
+                shown += Terminal::cell(row[column], widths[column]) + QString(kGap, QLatin1Char(' '));
+        while (shown.endsWith(QLatin1Char(' ')))
+            shown.chop(1);
+        text += shown + QLatin1Char('\n');
     }
     return text;
 }
 
-QString renderPlugins(const ScanSummary &summary)
+QString renderPlugins(const ScanSummary &summary, int width)
 {
     if (summary.plugins.empty())
         return QString();
@@ -50,18 +92,7 @@ QString renderPlugins(const ScanSummary &summary)
                            QStringLiteral("CATEGORY"), QStringLiteral("IN/OUT"), QStringLiteral("STATE")}};
     for (const CataloguedPlugin &plugin : summary.plugins)
         rows.push_back(rowOf(plugin));
-    return renderRows(rows) + QLatin1Char('\n');
-}
-
-QString renderFailures(const ScanSummary &summary)
-{
-    QString text;
-    for (const PluginFailure &failure : summary.failures)
-        text += QStringLiteral("  %1 (%2, %3): %4.\n    %5\n")
-                    .arg(Terminal::harmless(failure.name), QLatin1String(failure.format->title),
-                         QLatin1String(stateText(failure.state)), Terminal::harmless(failure.reason),
-                         Terminal::harmless(failure.path));
-    return text.isEmpty() ? text : QStringLiteral("Cannot be used:\n") + text + QLatin1Char('\n');
+    return renderRows(rows, width) + QLatin1Char('\n');
 }
 
 QString renderProblems(const ScanSummary &summary)
@@ -117,7 +148,9 @@ QString renderCounts(const ScanSummary &summary)
                 QStringLiteral("%1 skipped: %2").arg(skipped.size()).arg(skipped.join(QLatin1String(", "))));
     }
     const std::size_t count = summary.plugins.size();
-    QString text = QStringLiteral("%1 plug-in%2").arg(count).arg(QLatin1String(count == 1 ? "" : "s"));
+    const std::size_t all = summary.all == 0 ? count : summary.all;
+    const QString of = summary.all == 0 ? QString() : QStringLiteral("%1 of ").arg(count);
+    QString text = QStringLiteral("%1%2 plug-in%3").arg(of).arg(all).arg(QLatin1String(all == 1 ? "" : "s"));
     if (!now.isEmpty())
         text += QLatin1String(": ") + now.join(QLatin1String(", "));
     for (const QStringList &part :
@@ -139,8 +172,8 @@ QString channelsText(const CataloguedPlugin &plugin)
     return text(plugin.inputs) + QLatin1Char('/') + text(plugin.outputs);
 }
 
-QString renderTable(const ScanSummary &summary)
+QString renderTable(const ScanSummary &summary, int width)
 {
-    return renderPlugins(summary) + renderFailures(summary) + renderProblems(summary) +
+    return renderPlugins(summary, width) + renderFailures(summary) + renderProblems(summary) +
            renderSlowest(summary) + renderCounts(summary);
 }

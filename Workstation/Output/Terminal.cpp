@@ -65,6 +65,15 @@ void Terminal::complain(const QString &text)
 
 bool Terminal::outputIsTerminal() { return TerminalStream::isTerminal(s_result); }
 
+int Terminal::outputWidth() { return TerminalStream::width(s_result); }
+
+int Terminal::errorWidth()
+{
+    constexpr int kUsualWidth = 80;
+    const int width = TerminalStream::width(stderr);
+    return width > 0 ? width : kUsualWidth;
+}
+
 void Terminal::keepOutputForResult()
 {
     if (std::FILE *stream = TerminalStream::takeOutput())

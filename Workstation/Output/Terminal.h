@@ -22,6 +22,8 @@ bool outputIsTerminal();
 void keepOutputForResult();
 /// Columns of the error output's terminal; 80 where nobody knows.
 int errorWidth();
+/// Columns of the standard output's terminal; 0 where there is none, so that lines may have any length.
+int outputWidth();
 
 /// A text that comes from a plug-in or a file, fit to be printed: what could steer a terminal, or change the
 /// direction in which the rest of the line is shown, is replaced.

@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
+#include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 
 #include <QDir>
@@ -83,6 +84,10 @@ void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder,
             continue; // its plug-ins are shown, each with the reason that the file has
         view.plugins.push_back({&format, record, QString(), isOfCrashedFile(record), isAway(record.path)});
         view.plugins.back().isIgnored = record.isIgnored() || rules.isIgnored(record.path);
+        if (CataloguedPlugin &plugin = view.plugins.back(); plugin.state() == PluginState::Disabled) {
+            const QString now = PluginHost::instance().host(format.format).moduleTime(record.path);
+            plugin.hasChanged = !now.isEmpty() && now != record.fileTime;
+        }
         if (const QString bad = badText(record); !bad.isEmpty())
             view.problems.append(QStringLiteral("%1 is not well-formed XML: %2").arg(path, bad));
     }

@@ -35,9 +35,10 @@ struct CataloguedPlugin {
     bool isAway = false; ///< see `PluginState::FolderAway`
 
     PluginState state() const;
-    qint32 inputs = -1;     ///< audio channels as far as catalogue and last probe tell; -1: unknown
-    qint32 outputs = -1;    ///< the same
-    bool isIgnored = false; ///< see `PluginState::Ignored`
+    qint32 inputs = -1;      ///< audio channels as far as catalogue and last probe tell; -1: unknown
+    qint32 outputs = -1;     ///< the same
+    bool isIgnored = false;  ///< see `PluginState::Ignored`
+    bool hasChanged = false; ///< its file is another one than that for which it was disabled
     /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
     bool hasWidth() const { return format->catalogue->hasWidth; }
     bool isUsable() const { return record.working && !isOfCrashedFile && !isAway && !isIgnored; }

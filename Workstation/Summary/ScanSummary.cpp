@@ -49,7 +49,7 @@ void addFailures(ScanSummary &summary, const ScanAccount *account, const ProbeMe
             continue;
         plugin.reason = reasonOf(plugin, account, memory);
         summary.failures.push_back({plugin.format, plugin.state(), plugin.record.name, plugin.record.path,
-                                    plugin.record.subId, plugin.reason, true});
+                                    plugin.record.subId, plugin.reason, true, plugin.hasChanged});
     }
 }
 

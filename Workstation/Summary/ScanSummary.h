@@ -11,8 +11,9 @@ struct PluginFailure {
     QString name;
     QString path;
     quint32 subId;
-    QString reason;    ///< one phrase, without a full stop
-    bool isCatalogued; ///< it is one of the catalogue's plug-ins, too
+    QString reason;          ///< one phrase, without a full stop
+    bool isCatalogued;       ///< it is one of the catalogue's plug-ins, too
+    bool hasChanged = false; ///< see `CataloguedPlugin`
 };
 
 /// A file and the time that its probe took.
@@ -30,6 +31,7 @@ struct ScanSummary {
     std::vector<ProbeTime> slowest;       ///< the slowest first
     QStringList removed;                  ///< names of what is gone
     QStringList skipped;                  ///< paths that the user passed over in this scan
+    std::size_t all = 0;                  ///< plug-ins of which only some are shown; 0: all are shown
     int added = 0;
     int updated = 0; ///< were known and probed again
     int unchanged = 0;

@@ -43,3 +43,29 @@ TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)
     EXPECT_EQ(csv.mid(csv.indexOf("\r\n") + 2),
               "vst3,\"A \"\"B\"\", C\",\"two\nlines\",,2,,ok,,,/p/A.vst3,\r\n");
 }
+
+TEST(Output, ColumnsThatDoNotFitAreLeftOutOrCut)
+{
+    ScanSummary summary;
+    summary.plugins.push_back({&pluginFormats().front(), {}, {}, false, false, 2, 2});
+    EffectRecord &record = summary.plugins.front().record;
+    record.name = "A name of twenty-two c";
+    record.vendor = "Vendor of twenty-two c";
+    record.categories = "Fx|Reverb";
+    const struct {
+        int width;
+        const char *line;
+    } rows[] = {
+        {0, "VST 3   A name of twenty-two c  Vendor of twenty-two c  Fx, Reverb  2/2     ok"},
+        {81, "VST 3   A name of twenty-two c  Vendor of twenty-two c  Fx, Reverb  2/2     ok"},
+        {80, "VST 3   A name of twenty-two c  Vendor of twenty-two c  Fx, Reverb  ok"},
+        {72, "VST 3   A name of twenty-two c  Vendor of twenty-two c  ok"},
+        {60, "VST 3   A name of twenty-two c  Vendor of twenty-two…  ok"},
+        {41, "VST 3   A name of twent…  Vendor …  ok"},
+        {40, "VST 3   A name of twenty-two c  ok"},
+        {20, "VST 3   A na…  ok"},
+        {10, "VST 3   …  ok"},
+    };
+    for (const auto &row : rows)
+        EXPECT_EQ(renderTable(summary, row.width).section('\n', 1, 1), row.line) << row.width;
+}

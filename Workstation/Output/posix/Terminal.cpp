@@ -20,10 +20,8 @@ std::FILE *TerminalStream::takeOutput()
 
 bool Terminal::errorIsTerminal() { return isatty(STDERR_FILENO) != 0 && qgetenv("TERM") != "dumb"; }
 
-int Terminal::errorWidth()
+int TerminalStream::width(std::FILE *stream)
 {
-    constexpr int kUsualWidth = 80;
     winsize size = {};
-    const bool isKnown = ioctl(STDERR_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0;
-    return isKnown ? size.ws_col : kUsualWidth;
+    return ioctl(fileno(stream), TIOCGWINSZ, &size) == 0 ? size.ws_col : 0;
 }

@@ -45,11 +45,10 @@ bool Terminal::errorIsTerminal()
     return GetConsoleMode(handle, &mode) && SetConsoleMode(handle, mode | ENABLE_VIRTUAL_TERMINAL_PROCESSING);
 }
 
-int Terminal::errorWidth()
+int TerminalStream::width(std::FILE *stream)
 {
-    constexpr int kUsualWidth = 80;
     CONSOLE_SCREEN_BUFFER_INFO info = {};
-    if (!GetConsoleScreenBufferInfo(GetStdHandle(STD_ERROR_HANDLE), &info))
-        return kUsualWidth;
+    if (!GetConsoleScreenBufferInfo(handleOf(stream), &info))
+        return 0;
     return info.srWindow.Right - info.srWindow.Left + 1;
 }

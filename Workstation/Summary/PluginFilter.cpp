@@ -1,0 +1,113 @@
+#include "Workstation/Summary/PluginFilter.h"
+
+#include <algorithm>
+#include <set>
+
+namespace {
+
+const QLatin1String kVendor("vendor=");
+const QLatin1String kCategory("category=");
+const QLatin1String kInstrument("instrument");
+const QLatin1String kFavourite("favourite");
+
+/// A state as one word.
+QString wordOf(PluginState state)
+{
+    return QString::fromLatin1(stateText(state)).replace(QLatin1Char(' '), QLatin1Char('-'));
+}
+
+/// "category=Reverb", or "instrument": also what calls itself a synth, which catalogues without categories of
+/// their own hold.
+bool isOfCategory(const CataloguedPlugin &plugin, const QString &word)
+{
+    const QStringList names = word == kInstrument
+                                  ? QStringList{QStringLiteral("Instrument"), QStringLiteral("Synth")}
+                                  : QStringList(word.mid(kCategory.size()));
+    const QStringList own = plugin.categories();
+    return std::any_of(names.begin(), names.end(),
+                       [&](const QString &name) { return own.contains(name, Qt::CaseInsensitive); });
+}
+
+template <typename List, typename Predicate>
+void removeIf(List &list, Predicate &&isOut)
+{
+    list.erase(std::remove_if(list.begin(), list.end(), isOut), list.end());
+}
+
+} // namespace
+
+PluginFilter::PluginFilter(const QStringList &words)
+{
+    for (const QString &word : words)
+        m_words[kindOf(word)].append(word);
+}
+
+PluginFilter::Kind PluginFilter::kindOf(const QString &word)
+{
+    if (word.startsWith(kVendor))
+        return Kind::Vendor;
+    if (word.startsWith(kCategory) || word == kInstrument)
+        return Kind::Category;
+    if (word == kFavourite)
+        return Kind::Mark;
+    return formatOfKey(word) ? Kind::Format : Kind::State;
+}
+
+bool PluginFilter::fitsAll(const std::function<bool(Kind kind, const QString &word)> &isOne) const
+{
+    return std::all_of(m_words.begin(), m_words.end(), [&](const auto &entry) {
+        return std::any_of(entry.second.begin(), entry.second.end(),
+                           [&](const QString &word) { return isOne(entry.first, word); });
+    });
+}
+
+bool PluginFilter::fits(const CataloguedPlugin &plugin) const
+{
+    return fitsAll([&](Kind kind, const QString &word) {
+        switch (kind) {
+        case Kind::State:
+            return word == wordOf(plugin.state());
+        case Kind::Format:
+            return word == QLatin1String(plugin.format->key);
+        case Kind::Mark:
+            return plugin.record.favourite;
+        case Kind::Category:
+            return isOfCategory(plugin, word);
+        case Kind::Vendor:
+            return plugin.record.vendor.contains(word.mid(kVendor.size()), Qt::CaseInsensitive);
+        }
+        return false;
+    });
+}
+
+/// Of a file without a record only format and state are known.
+bool PluginFilter::fits(const PluginFailure &file) const
+{
+    return fitsAll([&](Kind kind, const QString &word) {
+        return (kind == Kind::State && word == wordOf(file.state)) ||
+               (kind == Kind::Format && word == QLatin1String(file.format->key));
+    });
+}
+
+void PluginFilter::apply(ScanSummary &summary) const
+{
+    if (m_words.empty())
+        return;
+    summary.all = summary.plugins.size();
+    const auto isOut = [this](const auto &each) { return !fits(each); };
+    removeIf(summary.plugins, isOut);
+    removeIf(summary.noPlugins, isOut);
+    std::set<PluginKey> shown;
+    std::set<QString> paths;
+    for (const CataloguedPlugin &plugin : summary.plugins) {
+        shown.insert({plugin.format->format, plugin.record.path, plugin.record.subId});
+        paths.insert(plugin.record.path);
+    }
+    removeIf(summary.failures, [&](const PluginFailure &failure) {
+        return failure.isCatalogued ? shown.count({failure.format->format, failure.path, failure.subId}) == 0
+                                    : isOut(failure);
+    });
+    for (const PluginFailure &failure : summary.failures)
+        paths.insert(failure.path);
+    removeIf(summary.slowest, [&](const ProbeTime &probe) { return paths.count(probe.path) == 0; });
+}
