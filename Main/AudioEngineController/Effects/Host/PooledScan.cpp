@@ -82,9 +82,10 @@ private:
         QString shown; ///< what of it a user reads now
         EffectRecord child;
         std::map<quint32, QString> childReasons;
-        std::optional<ProbeOutcome> outcome; ///< that is not kept yet
-        bool isHeldBack = false;             ///< what came of it is among what waits
-        std::vector<EffectRecord> pending;   ///< its records there
+        std::map<quint32, QStringList> childFrames; ///< of those that crashed
+        std::optional<ProbeOutcome> outcome;        ///< that is not kept yet
+        bool isHeldBack = false;                    ///< what came of it is among what waits
+        std::vector<EffectRecord> pending;          ///< its records there
     };
 
     double expectedMs(std::size_t item) const;
@@ -217,6 +218,7 @@ void FolderScan::PooledScan::childEnds(std::size_t item, int worker, const Probe
     if (state.childReasons.count(child.subId) == 0 || !outcome.reason.isEmpty())
         ProbeReport::instance().end(m_scan.m_host.format(), child, outcome, worker);
     state.childReasons[child.subId] = outcome.reason;
+    state.childFrames[child.subId] = outcome.frames;
 }
 
 void FolderScan::PooledScan::jobEnds(std::size_t item, int worker, const ProbeOutcome &outcome)
@@ -283,7 +285,7 @@ void FolderScan::PooledScan::keep(std::size_t index)
     m_scan.beginItem(item);
     m_scan.m_isTouched = state.isTouched;
     for (const auto &[subId, reason] : state.childReasons)
-        m_scan.m_memory.childEnded(subId, reason);
+        m_scan.m_memory.childEnded(subId, reason, state.childFrames[subId]);
     m_scan.m_memory.end(m_scan.m_file, *state.outcome, m_scan.m_isTouched);
     m_scan.keepOutcome(item, *state.outcome);
     state.outcome.reset();

@@ -1,7 +1,6 @@
 #include "Main/AudioEngineController/Effects/Host/ProbePool.h"
 
 #include "Core/BaseLib/Log/DebugLog.h"
-#include "Core/BaseLib/Process/CrashReport.h"
 
 #include <algorithm>
 
@@ -444,8 +443,8 @@ void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcom
     endJob(job, number, outcome);
 }
 
-/// Why a worker ended, in words; what it told of a crash goes to the log.
-QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int number) const
+/// Why a worker ended, in words, and where it crashed, which goes to the log, too.
+CrashReport ProbePool::describe(const Worker &worker, const WorkerEnd &end, int number) const
 {
     const QString when = worker.job ? QLatin1String(duringStage(worker.outcome.stage)) : QLatin1String();
     QString printed = m_group.output(number);
@@ -462,8 +461,9 @@ QString ProbePool::describe(const Worker &worker, const WorkerEnd &end, int numb
     else if (worker.endedFor.isEmpty())
         text = QStringLiteral("it ended its process with exit code %1%2").arg(end.code).arg(when);
     const QStringList lines = printed.split(QLatin1Char('\n'), Qt::SkipEmptyParts).mid(-kLastLines);
-    return lines.isEmpty() ? text
-                           : text + QStringLiteral("; it printed: ") + lines.join(QStringLiteral(" / "));
+    if (!lines.isEmpty())
+        text += QStringLiteral("; it printed: ") + lines.join(QStringLiteral(" / "));
+    return {text, crash.frames};
 }
 
 /// What a worker was busy with when it ended is to blame, if it asked nobody before.
@@ -476,23 +476,25 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
     m_workers.erase(found);
     if (!worker.isReady && !worker.isLeaving) {
         ++m_failedStarts;
-        DebugLog(L"A worker ended at its start: %ls", describe(worker, end, number));
+        DebugLog(L"A worker ended at its start: %ls", describe(worker, end, number).summary);
     }
     if (!worker.job) {
         if (!worker.isLeaving)
             DebugLog(L"A worker ended after it had asked %ls", namesOf(worker.probedPaths));
-        m_listener->workerEnds(number, worker.isLeaving ? worker.endedFor : describe(worker, end, number));
+        m_listener->workerEnds(number,
+                               worker.isLeaving ? worker.endedFor : describe(worker, end, number).summary);
         return;
     }
     const std::size_t job = *worker.job;
-    const QString reason = describe(worker, end, number);
+    const CrashReport report = describe(worker, end, number);
+    const QString &reason = report.summary;
     const bool isKilled = end.isKilled && worker.endedFor.isEmpty(); // by whoever needed memory, or a user
     if (m_isCancelled)
         cancelJob(job, number);
     else if (worker.probed != 0 || (isKilled && m_killed.insert(job).second))
         askAgain(job, reason, worker);
     else
-        giveVerdict(job, number, worker, reason);
+        giveVerdict(job, number, worker, report);
     m_listener->workerEnds(number, reason);
 }
 
@@ -511,12 +513,13 @@ void ProbePool::cancelJob(std::size_t job, int number)
     endJob(job, number, cancelled);
 }
 
-void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, const QString &reason)
+void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, const CrashReport &report)
 {
     ProbeOutcome outcome;
     outcome.status = worker.isOverdue ? ProbeStatus::NoAnswer : ProbeStatus::Crashed;
     outcome.stage = worker.outcome.stage;
-    outcome.reason = reason;
+    outcome.reason = report.summary;
+    outcome.frames = report.frames;
     outcome.milliseconds = static_cast<double>(worker.sinceJob.nsecsElapsed()) / 1e6;
     if (worker.child && jobOf(job).leftOut.insert(worker.child->subId).second) {
         // One sub-plug-in's crash is not its shell's: the others are asked without it.

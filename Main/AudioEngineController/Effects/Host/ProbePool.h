@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Core/BaseLib/Process/CrashReport.h"
 #include "Core/BaseLib/Process/WorkerGroup.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeChannel.h"
 
@@ -138,10 +139,10 @@ private:
     void endOversized();
     void endWorker(int number, Worker &worker, const QString &reason);
     QString whySpent(int number, const Worker &worker, const ProbeOutcome &outcome) const;
-    QString describe(const Worker &worker, const WorkerEnd &end, int number) const;
+    CrashReport describe(const Worker &worker, const WorkerEnd &end, int number) const;
     bool isBelievable(const Worker &worker, const ChannelMessage &message) const;
     void askAgain(std::size_t job, const QString &reason, const Worker &worker);
-    void giveVerdict(std::size_t job, int number, const Worker &worker, const QString &reason);
+    void giveVerdict(std::size_t job, int number, const Worker &worker, const CrashReport &report);
 
     const Settings m_settings;
     WorkerGroup m_group;

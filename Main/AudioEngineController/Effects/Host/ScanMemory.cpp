@@ -36,27 +36,28 @@ void ScanMemory::addCrashes()
     }
 }
 
-void ScanMemory::childEnded(quint32 subId, const QString &reason)
+void ScanMemory::childEnded(quint32 subId, const QString &reason, const QStringList &frames)
 {
-    m_item.plugins.push_back({QString(), subId, reason, -1, -1, QString()});
+    m_item.plugins.push_back({QString(), subId, reason, -1, -1, QString(), QString(), frames});
 }
 
 void ScanMemory::end(const EffectRecord &file, const ProbeOutcome &outcome, bool isAsked)
 {
-    std::map<quint32, QString> reasons;
+    std::map<quint32, RememberedPlugin> children;
     for (const RememberedPlugin &child : m_item.plugins)
-        reasons[child.subId] = child.reason;
+        children[child.subId] = child;
     m_item.format = m_host.format();
     m_item.path = file.path;
     m_item.fileTime = file.fileTime;
     m_item.status = outcome.status;
     m_item.stage = outcome.stage;
     m_item.reason = outcome.reason;
+    m_item.frames = outcome.frames;
     m_item.milliseconds = isAsked ? outcome.milliseconds : 0;
     m_item.plugins.clear();
     for (const EffectRecord &record : outcome.records)
-        m_item.plugins.push_back(
-            {record.id, record.subId, reasons[record.subId], record.inputs, record.outputs, QString()});
+        m_item.plugins.push_back({record.id, record.subId, children[record.subId].reason, record.inputs,
+                                  record.outputs, QString(), record.name, children[record.subId].frames});
 }
 
 void ScanMemory::setHolder(const QString &id, const QString &holder) { setHolderIn(m_item, id, holder); }

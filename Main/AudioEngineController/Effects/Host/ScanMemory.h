@@ -29,7 +29,7 @@ public:
     /// Begins an item, of which nothing is known yet.
     void begin() { m_item = RememberedProbe(); }
     /// What came of a sub-plug-in of the item.
-    void childEnded(quint32 subId, const QString &reason);
+    void childEnded(quint32 subId, const QString &reason, const QStringList &frames = QStringList());
     /// What came of the item. Its time counts only when it was asked: what was only looked at is looked at
     /// again at each scan.
     void end(const EffectRecord &file, const ProbeOutcome &outcome, bool isAsked);

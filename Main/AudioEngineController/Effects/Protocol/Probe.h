@@ -43,7 +43,9 @@ struct ProbeOutcome {
 
     ProbeStatus status = ProbeStatus::Failed;
     ProbeStage stage = ProbeStage::Load; ///< where it failed, if it did, else the last one entered
-    QString reason; ///< why it failed: one phrase without the path; empty when it did not
+    QString reason;     ///< why it failed: one phrase without the path; empty when it did not
+    QStringList frames; ///< where it crashed: the calls that led there, the innermost first, as `CrashReport`
+                        ///< has them
     IfFailed ifFailed = IfFailed::Record;
     /// In the module's order, with path and file time. A sub-plug-in that failed or was left out has its name
     /// and identifier, and `working` is false; a file that failed as a whole has no record here.

@@ -22,6 +22,8 @@ constexpr char kId[] = "id";
 constexpr char kInputs[] = "inputs";
 constexpr char kOutputs[] = "outputs";
 constexpr char kHeldBy[] = "heldBy";
+constexpr char kName[] = "name";
+constexpr char kFrames[] = "frames";
 
 /// In the order of `ProbeStatus`.
 constexpr const char *kStatusTexts[] = {"listed",    "failed",    "no plug-in", "crashed",
@@ -36,6 +38,20 @@ void insertText(QJsonObject &object, const char *name, const QString &text)
         object.insert(word(name), text);
 }
 
+void insertTexts(QJsonObject &object, const char *name, const QStringList &texts)
+{
+    if (!texts.isEmpty())
+        object.insert(word(name), QJsonArray::fromStringList(texts));
+}
+
+QStringList textsOf(const QJsonValue &value)
+{
+    QStringList texts;
+    for (const QJsonValue text : value.toArray())
+        texts.append(text.toString());
+    return texts;
+}
+
 QJsonObject jsonOf(const RememberedPlugin &plugin)
 {
     QJsonObject object;
@@ -48,6 +64,8 @@ QJsonObject jsonOf(const RememberedPlugin &plugin)
     if (plugin.outputs >= 0)
         object.insert(word(kOutputs), plugin.outputs);
     insertText(object, kHeldBy, plugin.heldBy);
+    insertText(object, kName, plugin.name);
+    insertTexts(object, kFrames, plugin.frames);
     return object;
 }
 
@@ -63,6 +81,7 @@ QByteArray render(const RememberedProbe &probe)
                        {word(kStage), word(kStages[static_cast<std::size_t>(probe.stage)])},
                        {word(kMilliseconds), probe.milliseconds}};
     insertText(object, kReason, probe.reason);
+    insertTexts(object, kFrames, probe.frames);
     if (!plugins.isEmpty())
         object.insert(word(kPlugins), plugins);
     return QJsonDocument(object).toJson(QJsonDocument::Compact);
@@ -80,6 +99,8 @@ RememberedPlugin pluginOf(const QJsonObject &object)
     plugin.inputs = channelsOf(object.value(word(kInputs)));
     plugin.outputs = channelsOf(object.value(word(kOutputs)));
     plugin.heldBy = object.value(word(kHeldBy)).toString();
+    plugin.name = object.value(word(kName)).toString();
+    plugin.frames = textsOf(object.value(word(kFrames)));
     return plugin;
 }
 
@@ -104,6 +125,7 @@ RememberedProbe probeOf(const QJsonObject &object)
     probe.status = status.value_or(ProbeStatus::Listed);
     probe.stage = enumOf<ProbeStage>(object.value(word(kStage)).toString(), kStages);
     probe.reason = object.value(word(kReason)).toString();
+    probe.frames = textsOf(object.value(word(kFrames)));
     probe.milliseconds = object.value(word(kMilliseconds)).toDouble();
     for (const QJsonValue plugin : object.value(word(kPlugins)).toArray())
         probe.plugins.push_back(pluginOf(plugin.toObject()));
@@ -197,6 +219,7 @@ void ProbeMemory::setCrash(PluginFormat format, const EffectRecord &plugin, Prob
     if (plugin.subId == 0) {
         probe.status = status;
         probe.reason = reason;
+        probe.frames.clear();
     } else {
         const auto isIt = [&](const RememberedPlugin &each) { return each.subId == plugin.subId; };
         probe.plugins.erase(std::remove_if(probe.plugins.begin(), probe.plugins.end(), isIt),

@@ -16,12 +16,14 @@ inline constexpr char kProbeMemoryFile[] = "/FXProbes.json";
 
 /// What the last probe of a file said of one plug-in in it.
 struct RememberedPlugin {
-    QString id;          ///< empty: of a sub-plug-in that failed
-    quint32 subId = 0;   ///< of a shell's sub-plug-in
-    QString reason;      ///< why it failed
-    qint32 inputs = -1;  ///< audio input channels; -1: unknown
-    qint32 outputs = -1; ///< audio output channels; -1: unknown
-    QString heldBy;      ///< the file that has the record of the identifier; empty: this one has
+    QString id;           ///< empty: of a sub-plug-in that failed
+    quint32 subId = 0;    ///< of a shell's sub-plug-in
+    QString reason;       ///< why it failed
+    qint32 inputs = -1;   ///< audio input channels; -1: unknown
+    qint32 outputs = -1;  ///< audio output channels; -1: unknown
+    QString heldBy;       ///< the file that has the record of the identifier; empty: this one has
+    QString name{};       ///< its own, which another plug-in may have in the catalogue
+    QStringList frames{}; ///< of a sub-plug-in that crashed; see `ProbeOutcome`
 };
 
 /// What the last probe of a file came to.
@@ -32,6 +34,7 @@ struct RememberedProbe {
     ProbeStatus status = ProbeStatus::Failed;
     ProbeStage stage = ProbeStage::Load;
     QString reason;
+    QStringList frames; ///< where it crashed; see `ProbeOutcome`
     double milliseconds = 0;
     std::vector<RememberedPlugin> plugins;
 
