@@ -31,7 +31,8 @@ int changeMarks(const ScanOptions &options, const QString &effectsFolder)
     return exitCode;
 }
 
-int prepareAskAgain(const ScanOptions &options, const QStringList &folders, PluginHost &registry)
+int prepareAskAgain(const ScanOptions &options, const QStringList &folders, const QStringList &shown,
+                    PluginHost &registry)
 {
     registry.ReadCatalogue(); // absorbs the markers: the newest crash may be the one that is meant
     const ModuleLook look{
@@ -41,7 +42,7 @@ int prepareAskAgain(const ScanOptions &options, const QStringList &folders, Plug
         }};
     const AskAgainOutcome outcome = askAgain(
         registry.effectsFolder(),
-        {options.retry, options.retryFailed, options.retryChanged, options.rescan, options.rescanAll},
+        {options.retry, options.retryFailed, options.retryChanged, options.rescan, shown, options.rescanAll},
         folders, look);
     return concludeEdit(outcome.wrong, outcome.written);
 }

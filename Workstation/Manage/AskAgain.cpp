@@ -21,9 +21,11 @@ bool isKiller(const EffectRecord &record) { return !record.enabled && !record.wo
 
 class Request {
 public:
-    Request(const QString &effectsFolder, const QStringList &folders, const ModuleLook &look)
+    Request(const QString &effectsFolder, const QStringList &below, const QStringList &folders,
+            const ModuleLook &look)
         : m_edit(effectsFolder)
         , m_memory(effectsFolder)
+        , m_below(below)
         , m_folders(folders)
         , m_look(look)
     {}
@@ -45,6 +47,7 @@ private:
 
     CatalogueEdit m_edit;
     ProbeMemory m_memory;
+    QStringList m_below;
     QStringList m_folders;
     const ModuleLook &m_look;
     std::vector<Plugin> m_retried;
@@ -55,7 +58,12 @@ private:
 std::vector<Plugin> Request::those(const std::function<bool(const Plugin &)> &isMeant) const
 {
     std::vector<Plugin> plugins;
-    std::copy_if(m_edit.plugins().begin(), m_edit.plugins().end(), std::back_inserter(plugins), isMeant);
+    const auto isBelowOne = [this](const QString &path) {
+        return m_below.isEmpty() || std::any_of(m_below.begin(), m_below.end(),
+                                                [&](const QString &folder) { return isBelow(path, folder); });
+    };
+    std::copy_if(m_edit.plugins().begin(), m_edit.plugins().end(), std::back_inserter(plugins),
+                 [&](const Plugin &plugin) { return isBelowOne(plugin.record->path) && isMeant(plugin); });
     return plugins;
 }
 
@@ -138,8 +146,9 @@ QString Request::whyNotAsked(const QString &name, const std::vector<Plugin> &mea
 
 void Request::rescan(const QStringList &names)
 {
+    const std::vector<Plugin> all = those([](const Plugin &) { return true; });
     for (const QString &name : names) {
-        const std::vector<Plugin> meant = named(name, m_edit.plugins(), QStringLiteral("plug-in"));
+        const std::vector<Plugin> meant = named(name, all, QStringLiteral("plug-in"));
         if (const QString why = whyNotAsked(name, meant); !why.isEmpty())
             m_wrong.append(why);
         for (const Plugin &plugin : meant)
@@ -149,7 +158,7 @@ void Request::rescan(const QStringList &names)
 
 void Request::rescanAll()
 {
-    for (const Plugin &plugin : m_edit.plugins())
+    for (const Plugin &plugin : those([](const Plugin &) { return true; }))
         m_rescanned.insert(fileOf(plugin));
 }
 
@@ -196,7 +205,7 @@ AskAgainOutcome Request::apply()
 AskAgainOutcome askAgain(const QString &effectsFolder, const AskAgainRequest &request,
                          const QStringList &folders, const ModuleLook &look)
 {
-    Request again(effectsFolder, folders, look);
+    Request again(effectsFolder, request.below, folders, look);
     again.retry(request.retry);
     if (request.retryFailed)
         again.retryIf([](const Plugin &) { return true; });

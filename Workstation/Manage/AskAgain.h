@@ -15,6 +15,7 @@ struct AskAgainRequest {
     bool retryChanged =
         false; ///< those of them that may work now: their file changed, or a library is there that it lacked
     QStringList rescan{};   ///< that are asked like new ones; never one that ended the scanner
+    QStringList below{};    ///< only what lies at or below these paths; none: anywhere
     bool rescanAll = false; ///< all of those
 };
 
