@@ -9,10 +9,12 @@
 #include "Workstation/FolderCommands.h"
 #include "Workstation/Library/ScanPlace.h"
 #include "Workstation/ManageCommands.h"
+#include "Workstation/Output/DetailText.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
 #include "Workstation/ScanFolders.h"
 #include "Workstation/ScanSession.h"
+#include "Workstation/ShowCommand.h"
 #include "Workstation/Summary/PluginFilter.h"
 
 #include <QFile>
@@ -57,6 +59,8 @@ void prepareEnvironment(const ScanOptions &options, const DataFiles &files)
 /// False when the result could not be written.
 bool print(const ScanOptions &options, const ScanSummary &summary, const QStringList &folders)
 {
+    if (options.format == OutputFormat::Table && !options.show.isEmpty())
+        return Terminal::print(renderDetails(summary));
     if (options.format == OutputFormat::Table)
         return Terminal::print(renderTable(summary, Terminal::outputWidth()));
     if (options.format == OutputFormat::Json)
@@ -88,6 +92,16 @@ int listOnly(const ScanOptions &options, const DataFiles &files)
                     {});
 }
 
+int show(const ScanOptions &options, const DataFiles &files)
+{
+    const ProbeMemory memory(files.effects);
+    ScanSummary summary = summariseCatalogue(readCatalogues(files.effects), memory);
+    const QStringList unknown = keepNamed(summary, options.show, memory);
+    for (const QString &sentence : unknown)
+        complain(sentence);
+    return unknown.isEmpty() ? conclude(options, summary, {}) : ScanExit::kUsage;
+}
+
 int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &folders, ScanPlace &place)
 {
     const HostApplication workstation(options.dataFolder, folders.listed);
@@ -103,7 +117,8 @@ int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &
         return ScanExit::kNotFinished;
     }
     if (options.asksAgain())
-        if (const int failed = prepareAskAgain(options, searched, registry); failed != ScanExit::kDone)
+        if (const int failed = prepareAskAgain(options, searched, folders.shown, registry);
+            failed != ScanExit::kDone)
             return failed;
     if (options.inProcess)
         ProbeReport::instance().openFromEnvironment();
@@ -181,10 +196,13 @@ int runFxScan(const ScanOptions &options)
     const DataFiles files(options.dataFolder);
     if (options.foldersOnly)
         return printFolders(files.effects);
-    if ((options.listOnly || options.changesMarks()) && !isScanned(options, files))
+    const bool isShow = !options.show.isEmpty();
+    if ((options.listOnly || isShow || options.changesMarks()) && !isScanned(options, files))
         return ScanExit::kUsage;
     if (options.listOnly)
         return listOnly(options, files);
+    if (isShow)
+        return show(options, files);
     return options.changesMarks() || isFolderCommand(options) ? edit(options, files)
                                                               : prepareAndScan(options, files);
 }

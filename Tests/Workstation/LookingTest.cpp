@@ -2,6 +2,9 @@
 #include "Tests/Support/PlatformValues.h"
 #include "Tests/Workstation/FxScanBench.h"
 
+#include <QFile>
+#include <QRegularExpression>
+
 namespace {
 
 /// What users look up.
@@ -82,4 +85,84 @@ TEST_F(Looking, WhatCannotBeUsedSaysHowToTryAgain)
     EXPECT_TRUE(shown.contains("  A, B (VST 3, disabled): it ended its process with exit code 0")) << "once";
     EXPECT_TRUE(shown.contains("To try again: fxscan --retry NAME")) << shown.constData();
     EXPECT_FALSE(run({"--list", "--only", "ok"}).standardOutput.contains("To try again"));
+}
+
+TEST_F(Looking, EverythingIsToldOfOnePlugin)
+{
+    put("Comp.vst3", "class Comp\nsubcategories Fx|Dynamics\n");
+    const QString copy = put("later/Comp.vst3", "class Comp\n");
+    put("Shell.vst2", "child 1 One\nchild 2 Two\nfault entry abort Two\n");
+    put("Crash.vst3", "fault initialize segv\n");
+    put("Null.vst2", "answer entry null\n");
+    put("Bare.vst3", "answer get-factory null\n");
+    scan();
+    const struct {
+        QString name;
+        int exitCode;
+        QStringList says; ///< regular expressions
+    } rows[] = {
+        {"comp",
+         0,
+         {"^Comp\n", "format +VST 3", "categories +Dynamics", "in/out +2/2", "last probe +listed, \\d"}},
+        {copy, 0, {"^Comp\n", "not used  VST 3  .*later/Comp.vst3: a copy of "}},
+        {"Crash",
+         0,
+         {"last probe +crashed while it was asked for its data, \\d+\\.\\d ms\n", "reason +it crashed",
+          "crashed at(.|\n)*Crash.vst3\\+0x"}},
+        {"Two", 0, {"state +disabled", "sub-plug-in +Two \\(2\\)", "crashed at(.|\n)*Shell\\.\\w+\\+0x"}},
+        {"One", 0, {"state +ok", "last probe +listed"}},
+        {"Null", 0, {"last probe +failed while it was starting", "reason +its entry point returned null"}},
+        {"Nobody", 2, {"no plug-in is named 'Nobody'"}},
+        {"Bare.vst3", 2, {"Bare.vst3: GetPluginFactory returned null"}},
+    };
+    for (const auto &row : rows) {
+        const ScannerOutcome outcome = run({"--show", row.name});
+        const QString said = QString::fromUtf8(outcome.standardOutput + outcome.standardError);
+        EXPECT_EQ(outcome.exitCode, row.exitCode) << qPrintable(row.name);
+        for (const QString &each : row.says)
+            EXPECT_TRUE(said.contains(QRegularExpression(each))) << qPrintable(each + "\n" + said);
+    }
+    EXPECT_FALSE(run({"--show", "One"}).standardOutput.contains("crashed at")) << "its sibling did";
+    const QJsonObject shown =
+        QJsonDocument::fromJson(run({"--show", "Crash", "--format", "json"}).standardOutput).object();
+    EXPECT_EQ(namesIn(shown["plugins"]), QStringList("Crash"));
+    EXPECT_EQ(shown["plugins"][0]["probe"]["status"], "crashed");
+    EXPECT_FALSE(shown["plugins"][0]["probe"]["frames"].toArray().isEmpty());
+}
+
+TEST_F(Looking, WhatIsThereMoreThanOnceSaysWhatIsUsed)
+{
+    put("a/Comp.vst3", "class Comp\n");
+    put("b/Comp.vst3", "class Comp\n"); // a copy
+    put("Delay.vst3");
+    put("Delay.vst2");
+    put("v1/Gate.vst3", "class Gate\nid 00000000000000000000000000000001\n");
+    put("v2/New Gate.vst3", "class Gate\nid 00000000000000000000000000000002\n"); // another version
+    put("Echo.vst3", "class Echo\nvendor One\n");
+    put("Echo.vst2", "vendor Other\n");
+    put("Twice.vst3");
+    put("Twice.vst2", "answer entry null\n"); // nobody knows whose it is
+    scan();
+    run({"--switch-off", m_folder.path("Plugins/v1/Gate.vst3")});
+    const QJsonObject result = scan();
+    QStringList found;
+    for (const QJsonValue each : result["duplicates"].toArray()) {
+        QStringList members;
+        for (const QJsonValue member : each["members"].toArray())
+            members << member["format"].toString() + (member["used"].toBool() ? "+" : "-") +
+                           member["path"].toString().mid(m_folder.plugins().size() + 1).section('.', 0, -2) +
+                           (member["reason"].isUndefined() ? ""
+                                                           : ": " + member["reason"].toString().left(12));
+        found << each["name"].toString() + " = " + members.join(", ");
+    }
+    EXPECT_EQ(found, QStringList({"Comp = vst3+a/Comp, vst3-b/Comp: a copy of " + m_folder.path("").left(2),
+                                  "Delay = vst3+Delay, vst2+Delay",
+                                  "Gate = vst3+v2/New Gate, vst3-v1/Gate: switched off"}));
+    const QString shown = QString::fromUtf8(run({"--list"}).standardOutput);
+    EXPECT_TRUE(shown.contains("\n  Delay (Fixture Works): VST 3, VST 2, all used\n")) << qPrintable(shown);
+    EXPECT_TRUE(
+        shown.contains("    not used  VST 3  " + m_folder.path("Plugins/v1/Gate.vst3") + ": switched off\n"))
+        << qPrintable(shown);
+    QFile::remove(m_folder.path("Plugins/b/Comp.vst3"));
+    EXPECT_FALSE(run({"--list"}).standardOutput.contains("a copy of")) << "it is gone";
 }

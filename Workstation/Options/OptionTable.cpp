@@ -185,6 +185,10 @@ const std::vector<OptionRow> &optionTable()
          "which is there now."},
         {"retry-failed", "", &ScanOptions::retryFailed,
          "Probe all plug-ins again that are disabled or do not work."},
+        {"show", "name", &ScanOptions::show,
+         "Print everything known of a plug-in, with its last probe and crash report, without a scan. Can be "
+         "given several times.",
+         "Where several plug-ins have the name, all are shown. With --format json too."},
         {"show-window", "", &ScanOptions::showWindow, "Let the scanner show its window."},
         {"strict", "", &ScanOptions::strict, "Exit with 1 when a plug-in cannot be used."},
         {"switch-off", "name", &ScanOptions::switchOff,
@@ -202,7 +206,7 @@ const std::vector<const char *> &optionsWithoutScan()
 {
     static const std::vector<const char *> names = {"exclude",   "favourite",  "folders",    "forget",
                                                     "ignore",    "list",       "no-exclude", "no-favourite",
-                                                    "no-ignore", "switch-off", "switch-on"};
+                                                    "no-ignore", "switch-off", "switch-on",  "show"};
     return names;
 }
 
@@ -225,7 +229,7 @@ const std::vector<OptionConflict> &optionConflicts()
             if (qstrcmp(option, "list") != 0)
                 all.push_back(
                     {option, "only", QStringLiteral("--%1 prints no plug-ins").arg(QLatin1String(option))});
-        for (const char *first : {"folders", "list"})
+        for (const char *first : {"folders", "list", "show"})
             for (const char *other : optionsWithoutScan())
                 if (qstrcmp(first, other) != 0)
                     all.push_back(

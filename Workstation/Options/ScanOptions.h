@@ -29,6 +29,7 @@ struct ScanOptions {
     QStringList rescan;        ///< names or paths of plug-ins that are asked although they did not change
     bool rescanAll = false;
     QStringList only;      ///< words that say which plug-ins are shown; none: all
+    QStringList show;      ///< names or paths of plug-ins of which everything is printed
     QStringList switchOff; ///< names or paths of plug-ins whose marks change
     QStringList switchOn;
     QStringList favourite;

@@ -22,6 +22,39 @@ QJsonObject identityOf(const PluginFormatInfo &format, const QString &name, cons
     return object;
 }
 
+/// What the last probe of a plug-in's file came to.
+QJsonObject probeObject(const RememberedProbe &probe, quint32 subId)
+{
+    QJsonObject object{{QStringLiteral("status"), QLatin1String(statusText(probe.status))},
+                       {QStringLiteral("stage"), QLatin1String(stageText(probe.stage))},
+                       {QStringLiteral("milliseconds"), probe.milliseconds},
+                       {QStringLiteral("fileTime"), probe.fileTime},
+                       {QStringLiteral("frames"), QJsonArray::fromStringList(probe.framesOf(subId))}};
+    if (const QString reason = probe.reasonOf(subId); !reason.isEmpty())
+        object.insert(QStringLiteral("reason"), reason);
+    return object;
+}
+
+QJsonArray duplicateArray(const std::vector<Duplicate> &duplicates)
+{
+    QJsonArray array;
+    for (const Duplicate &duplicate : duplicates) {
+        QJsonArray members;
+        for (const DuplicateMember &member : duplicate.members) {
+            QJsonObject object{{QStringLiteral("format"), QLatin1String(member.format->key)},
+                               {QStringLiteral("path"), member.path},
+                               {QStringLiteral("used"), member.isUsed}};
+            if (!member.why.isEmpty())
+                object.insert(QStringLiteral("reason"), member.why);
+            members.append(object);
+        }
+        array.append(QJsonObject{{QStringLiteral("name"), duplicate.name},
+                                 {QStringLiteral("vendor"), duplicate.vendor},
+                                 {QStringLiteral("members"), members}});
+    }
+    return array;
+}
+
 QJsonObject pluginObject(const CataloguedPlugin &plugin)
 {
     const EffectRecord &record = plugin.record;
@@ -36,6 +69,10 @@ QJsonObject pluginObject(const CataloguedPlugin &plugin)
     object.insert(QStringLiteral("fileTime"), record.fileTime);
     if (!plugin.reason.isEmpty())
         object.insert(QStringLiteral("reason"), plugin.reason);
+    if (plugin.hasChanged)
+        object.insert(QStringLiteral("changed"), true);
+    if (plugin.probe)
+        object.insert(QStringLiteral("probe"), probeObject(*plugin.probe, record.subId));
     return object;
 }
 
@@ -92,6 +129,7 @@ QJsonObject summaryObject(const ScanSummary &summary, const QString &dataFolder,
                        {QStringLiteral("dataFolder"), dataFolder},
                        {QStringLiteral("plugins"), plugins},
                        {QStringLiteral("failures"), failureArray(summary.failures)},
+                       {QStringLiteral("duplicates"), duplicateArray(summary.duplicates)},
                        {QStringLiteral("problems"), QJsonArray::fromStringList(summary.problems)}};
     if (summary.isScan) {
         object.insert(QStringLiteral("folders"), QJsonArray::fromStringList(folders));

@@ -1,3 +1,4 @@
+#include "Workstation/Output/DuplicateText.h"
 #include "Workstation/Output/FailureText.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
@@ -174,6 +175,6 @@ QString channelsText(const CataloguedPlugin &plugin)
 
 QString renderTable(const ScanSummary &summary, int width)
 {
-    return renderPlugins(summary, width) + renderFailures(summary) + renderProblems(summary) +
-           renderSlowest(summary) + renderCounts(summary);
+    return renderPlugins(summary, width) + renderFailures(summary) + renderDuplicates(summary) +
+           renderProblems(summary) + renderSlowest(summary) + renderCounts(summary);
 }

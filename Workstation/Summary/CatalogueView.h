@@ -2,10 +2,12 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFormat.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 
 #include <QString>
 #include <QStringList>
 
+#include <optional>
 #include <vector>
 
 /// Whether a plug-in of the catalogue can be used.
@@ -39,6 +41,8 @@ struct CataloguedPlugin {
     qint32 outputs = -1;     ///< the same
     bool isIgnored = false;  ///< see `PluginState::Ignored`
     bool hasChanged = false; ///< its file is another one than that for which it was disabled
+    /// What its last probe came to; only where somebody wants to see it.
+    std::optional<RememberedProbe> probe{};
     /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
     bool hasWidth() const { return format->catalogue->hasWidth; }
     bool isUsable() const { return record.working && !isOfCrashedFile && !isAway && !isIgnored; }

@@ -1,7 +1,6 @@
 #include "Workstation/Summary/PluginFilter.h"
 
 #include <algorithm>
-#include <set>
 
 namespace {
 
@@ -26,12 +25,6 @@ bool isOfCategory(const CataloguedPlugin &plugin, const QString &word)
     const QStringList own = plugin.categories();
     return std::any_of(names.begin(), names.end(),
                        [&](const QString &name) { return own.contains(name, Qt::CaseInsensitive); });
-}
-
-template <typename List, typename Predicate>
-void removeIf(List &list, Predicate &&isOut)
-{
-    list.erase(std::remove_if(list.begin(), list.end(), isOut), list.end());
 }
 
 } // namespace
@@ -94,20 +87,9 @@ void PluginFilter::apply(ScanSummary &summary) const
     if (m_words.empty())
         return;
     summary.all = summary.plugins.size();
-    const auto isOut = [this](const auto &each) { return !fits(each); };
-    removeIf(summary.plugins, isOut);
-    removeIf(summary.noPlugins, isOut);
-    std::set<PluginKey> shown;
-    std::set<QString> paths;
-    for (const CataloguedPlugin &plugin : summary.plugins) {
-        shown.insert({plugin.format->format, plugin.record.path, plugin.record.subId});
-        paths.insert(plugin.record.path);
-    }
-    removeIf(summary.failures, [&](const PluginFailure &failure) {
-        return failure.isCatalogued ? shown.count({failure.format->format, failure.path, failure.subId}) == 0
-                                    : isOut(failure);
-    });
-    for (const PluginFailure &failure : summary.failures)
-        paths.insert(failure.path);
-    removeIf(summary.slowest, [&](const ProbeTime &probe) { return paths.count(probe.path) == 0; });
+    std::vector<CataloguedPlugin> shown;
+    for (const CataloguedPlugin &plugin : summary.plugins)
+        if (fits(plugin))
+            shown.push_back(plugin);
+    keepPlugins(summary, std::move(shown), [this](const PluginFailure &file) { return fits(file); });
 }

@@ -153,6 +153,7 @@ ScanSummary summariseCatalogue(CatalogueView now, const ProbeMemory &memory)
     summary.problems = std::move(now.problems);
     fillChannels(summary.plugins, memory);
     addFailures(summary, nullptr, memory);
+    summary.duplicates = findDuplicates(summary.plugins, memory);
     return summary;
 }
 
@@ -170,5 +171,34 @@ ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const 
     count(summary, before, account);
     addSkipped(summary, account);
     addSlowest(summary, account);
+    summary.duplicates = findDuplicates(summary.plugins, memory);
     return summary;
+}
+
+void keepPlugins(ScanSummary &summary, std::vector<CataloguedPlugin> plugins,
+                 const std::function<bool(const PluginFailure &)> &isFileShown)
+{
+    std::set<PluginKey> shown;
+    std::set<QString> paths;
+    for (const CataloguedPlugin &plugin : plugins) {
+        shown.insert(keyOf(plugin));
+        paths.insert(plugin.record.path);
+    }
+    summary.plugins = std::move(plugins);
+    const auto keep = [](auto &list, auto &&isKept) {
+        const auto isOut = [&](const auto &each) { return !isKept(each); };
+        list.erase(std::remove_if(list.begin(), list.end(), isOut), list.end());
+    };
+    keep(summary.noPlugins, isFileShown);
+    keep(summary.failures, [&](const PluginFailure &failure) {
+        return failure.isCatalogued ? shown.count({failure.format->format, failure.path, failure.subId}) != 0
+                                    : isFileShown(failure);
+    });
+    for (const PluginFailure &failure : summary.failures)
+        paths.insert(failure.path);
+    keep(summary.slowest, [&](const ProbeTime &probe) { return paths.count(probe.path) != 0; });
+    keep(summary.duplicates, [&](const Duplicate &duplicate) {
+        return std::any_of(duplicate.members.begin(), duplicate.members.end(),
+                           [&](const DuplicateMember &member) { return paths.count(member.path) != 0; });
+    });
 }

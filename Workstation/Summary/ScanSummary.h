@@ -2,6 +2,7 @@
 
 #include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Workstation/Summary/CatalogueView.h"
+#include "Workstation/Summary/Duplicates.h"
 #include "Workstation/Summary/ScanAccount.h"
 
 /// A plug-in, or a file that was taken for one, that cannot be used.
@@ -28,6 +29,7 @@ struct ScanSummary {
     std::vector<PluginFailure> failures;
     std::vector<PluginFailure> noPlugins; ///< files that look like plug-ins and are not
     QStringList problems;                 ///< one sentence each
+    std::vector<Duplicate> duplicates;    ///< by name
     std::vector<ProbeTime> slowest;       ///< the slowest first
     QStringList removed;                  ///< names of what is gone
     QStringList skipped;                  ///< paths that the user passed over in this scan
@@ -38,6 +40,11 @@ struct ScanSummary {
     bool isScan = false;   ///< false: nothing was scanned, the counts above mean nothing
     bool finished = false; ///< the scan came to its end
 };
+
+/// Leaves only these of the plug-ins, and of what belongs to plug-ins what belongs to these. Files without a
+/// record stay where `isFileShown` says so.
+void keepPlugins(ScanSummary &summary, std::vector<CataloguedPlugin> plugins,
+                 const std::function<bool(const PluginFailure &)> &isFileShown);
 
 /// What the catalogue says. `memory` gives the reasons of earlier probes.
 ScanSummary summariseCatalogue(CatalogueView now, const ProbeMemory &memory);

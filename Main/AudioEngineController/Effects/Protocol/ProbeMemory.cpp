@@ -78,7 +78,7 @@ QByteArray render(const RememberedProbe &probe)
                        {word(kPath), probe.path},
                        {word(kFileTime), probe.fileTime},
                        {word(kStatus), word(statusText(probe.status))},
-                       {word(kStage), word(kStages[static_cast<std::size_t>(probe.stage)])},
+                       {word(kStage), word(stageText(probe.stage))},
                        {word(kMilliseconds), probe.milliseconds}};
     insertText(object, kReason, probe.reason);
     insertTexts(object, kFrames, probe.frames);
@@ -145,6 +145,8 @@ std::optional<ProbeStatus> statusOfText(const QString &text)
     return static_cast<ProbeStatus>(std::distance(std::begin(kStatusTexts), found));
 }
 
+const char *stageText(ProbeStage stage) { return kStages[static_cast<std::size_t>(stage)]; }
+
 bool RememberedProbe::isCopy() const
 {
     return !plugins.empty() &&
@@ -158,6 +160,14 @@ QString RememberedProbe::reasonOf(quint32 subId) const
         if (subId != 0 && plugin.subId == subId && !plugin.reason.isEmpty())
             return plugin.reason;
     return reason;
+}
+
+const QStringList &RememberedProbe::framesOf(quint32 subId) const
+{
+    for (const RememberedPlugin &plugin : plugins)
+        if (subId != 0 && plugin.subId == subId && !plugin.frames.isEmpty())
+            return plugin.frames;
+    return frames;
 }
 
 ProbeMemory::ProbeMemory(const QString &effectsFolder)

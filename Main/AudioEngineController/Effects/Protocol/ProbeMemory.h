@@ -42,6 +42,8 @@ struct RememberedProbe {
     bool isCopy() const;
     /// Why a plug-in of the file, or the file itself (0), failed; empty when nobody knows.
     QString reasonOf(quint32 subId) const;
+    /// Where a plug-in of the file, or the file itself (0), crashed; empty when it did not, or nobody knows.
+    const QStringList &framesOf(quint32 subId) const;
 };
 
 /// The outcomes of the last probes, of all formats, in a file beside the catalogues, which have no place for
@@ -82,5 +84,7 @@ private:
 /// For reports, files and people: "listed", "failed", "no plug-in", "crashed", "no answer", "cancelled",
 /// "skipped".
 const char *statusText(ProbeStatus status);
+/// "load", "start", "ask", "close".
+const char *stageText(ProbeStage stage);
 /// The status that a text names; nothing for a text of another version.
 std::optional<ProbeStatus> statusOfText(const QString &text);
