@@ -59,3 +59,14 @@ QString guardedText(const std::exception &exception)
     }
     return QString::fromUtf8(text.data());
 }
+
+QString thrownText()
+{
+    try {
+        throw;
+    } catch (const std::exception &error) {
+        return QLatin1String("it threw: ") + QString::fromUtf8(error.what());
+    } catch (...) {
+        return QStringLiteral("it threw something other than a standard exception");
+    }
+}

@@ -93,3 +93,18 @@ auto callTranslated(Function &&function) -> std::invoke_result_t<Function &>
 
 /// The text of an exception that foreign code threw. Its `what` is foreign code too; empty when that fails.
 QString guardedText(const std::exception &exception);
+
+/// The exception being handled, in words.
+QString thrownText();
+
+/// Makes a call into a plug-in. What it throws, in words; empty when it threw nothing.
+template <typename Call>
+QString thrownBy(Call &&call)
+{
+    try {
+        callTranslated(call);
+    } catch (...) {
+        return thrownText();
+    }
+    return QString();
+}

@@ -32,6 +32,9 @@ struct ProbeJob {
     bool announceClasses = false; ///< each class is announced as it is listed, however few there are
 };
 
+/// Each class of a module with more classes than this is announced as it is listed.
+inline constexpr int kManyClasses = 6;
+
 /// What came of a job. It starts out as failed.
 struct ProbeOutcome {
     /// What becomes of the catalogue where nothing was listed.
@@ -69,6 +72,13 @@ struct ProbeOutcome {
     {
         if (reason.isEmpty())
             reason = why;
+    }
+
+    /// The stage of a failure stays: what comes after it only clears up.
+    void enter(ProbeStage next)
+    {
+        if (reason.isEmpty())
+            stage = next;
     }
 
     /// Takes over what the file tells before it is loaded.

@@ -70,11 +70,9 @@ private:
     ProbeOutcome *m_current = &outcome; ///< of the file, or of the sub-plug-in that is asked
 };
 
-/// The stage of a failure stays: what comes after it only clears up.
 void Run::enterStage(ProbeStage stage)
 {
-    if (m_current->reason.isEmpty())
-        m_current->stage = stage;
+    m_current->enter(stage);
     m_observer.stageEntered(stage);
 }
 

@@ -20,8 +20,6 @@ namespace {
 /// The records of one module's audio classes, in the factory's class order.
 using ClassListing = std::vector<EffectRecord>;
 
-/// Each class of a module with more classes than this is announced as it is listed.
-constexpr int32 kManyClasses = 6;
 /// More classes than any module has. A factory that states more is asked for this many only: two billion
 /// calls for classes that do not exist take minutes.
 constexpr int32 kMaxClasses = 0x10000;
@@ -208,11 +206,9 @@ void ModuleListing::listClass(ClassListing &records, IPluginFactory &factory, co
     component->release();
 }
 
-/// The stage of a failure stays: what comes after it only clears up.
 void ModuleListing::enter(ProbeStage stage)
 {
-    if (m_outcome.reason.isEmpty())
-        m_outcome.stage = stage;
+    m_outcome.enter(stage);
     m_observer.stageEntered(stage);
 }
 

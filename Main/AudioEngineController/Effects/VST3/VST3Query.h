@@ -9,34 +9,9 @@
 
 #include <algorithm>
 #include <cstring>
-#include <exception>
 #include <iterator>
 
 // How a plug-in's interfaces are asked.
-
-/// The exception being handled, in words.
-inline QString thrownText()
-{
-    try {
-        throw;
-    } catch (const std::exception &error) {
-        return QLatin1String("it threw: ") + QString::fromUtf8(error.what());
-    } catch (...) {
-        return QStringLiteral("it threw something other than a standard exception");
-    }
-}
-
-/// Makes a call into a plug-in. What it throws, in words; empty when it threw nothing.
-template <typename Call>
-QString thrownBy(Call &&call)
-{
-    try {
-        callTranslated(call);
-    } catch (...) {
-        return thrownText();
-    }
-    return QString();
-}
 
 /// Text of a fixed-size field, which need not be terminated; invalid UTF-8 is replaced.
 template <std::size_t Size>

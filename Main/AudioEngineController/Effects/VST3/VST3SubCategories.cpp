@@ -1,21 +1,13 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3SubCategories.h"
 
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
-
-#include <QStringList>
-
-#include <map>
+#include "Main/AudioEngineController/Effects/Catalogue/CategoryWords.h"
 
 namespace {
 
-struct SubCategory {
-    const char *word;
-    const char *category;
-};
-
 // Words of Vst::PlugType in the SDK's ivstaudioprocessor.h, and those that plug-ins made up, with the
 // browser's category.
-constexpr SubCategory kSubCategories[] = {
+constexpr CategoryWord kSubCategories[] = {
     {"Analyzer", "Analysis"},
     {"Channel Strip", "Channel"},
     {"Drum", "Drums"},
@@ -47,30 +39,12 @@ constexpr SubCategory kSubCategories[] = {
     {"Vocals", "Vocals"},
 };
 
-std::map<QString, quint32> buildBitsByWord()
-{
-    std::map<QString, quint32> bitsByName;
-    for (const Category &category : CategoryTable::categories())
-        bitsByName[QString::fromLatin1(category.name)] =
-            CategoryTable::instance().internalBit(category.index);
-    std::map<QString, quint32> bitsByWord;
-    for (const SubCategory &entry : kSubCategories)
-        bitsByWord[QString::fromLatin1(entry.word)] = bitsByName.at(QString::fromLatin1(entry.category));
-    return bitsByWord;
-}
-
 } // namespace
 
 quint32 categoryFromSubCategories(const QString &subCategories)
 {
-    static const std::map<QString, quint32> bitsByWord = buildBitsByWord();
-    quint32 category = 0;
-    for (const QString &word : subCategories.split(QLatin1Char('|'))) {
-        const auto found = bitsByWord.find(word.trimmed());
-        if (found != bitsByWord.end())
-            category |= found->second;
-    }
-    return category;
+    static const CategoryWords words(kSubCategories);
+    return words.categoryOf(subCategories.split(QLatin1Char('|')));
 }
 
 bool isInstrumentCategory(quint32 category)
