@@ -12,7 +12,7 @@ set(rows
     "Main/ReWire Main/VLib ${effects}/BusFormats ${effects}/Catalogue ${effects}/VST3/HostObjects"
     "${effects}/Plugin ${effects}/Protocol"
     "${effects}/Host ${effects}/VST/Interface"
-    "${effects}/Launcher ${effects}/VST ${effects}/VST3"
+    "${effects}/Launcher ${effects}/CLAP ${effects}/VST ${effects}/VST3"
     "${effects} Core/BaseLib/WorkstationServices"
     "Workstation/Options Workstation/Summary"
     "Workstation/Manage"

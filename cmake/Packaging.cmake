@@ -20,8 +20,8 @@ set(CPACK_PACKAGE_VENDOR "The FxProbe authors")
 set(CPACK_PACKAGE_CONTACT "The FxProbe authors <fxprobe@localhost>")
 set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "${PROJECT_DESCRIPTION}")
 set(CPACK_COMPONENT_PROGRAMS_DESCRIPTION
-    "FxProbe loads the VST 3 and VST 2 plug-ins of a machine, asks each for its
-name, vendor and channels, and writes a catalogue that a workstation reads.
+    "FxProbe loads the VST 3, VST 2 and CLAP plug-ins of a machine, asks each for
+its name, vendor and channels, and writes a catalogue that a workstation reads.
 A plug-in that crashes or hangs is named with the reason and costs the
 others nothing. fxscan does it from the command line.")
 set(CPACK_PACKAGE_DIRECTORY "${PROJECT_BINARY_DIR}/packages")

@@ -1,3 +1,5 @@
+#include "Main/AudioEngineController/Effects/CLAP/CLAPHost.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CLAPCatalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
@@ -24,7 +26,7 @@ void checkKept(const CatalogueHost &first, CatalogueHost &second, const EffectRe
 {
     for (const EffectRecord *record : first.known().all())
         if (anyHolds({record->path, record->name, record->id, record->vendor, record->categories,
-                      record->subName, record->fileTime},
+                      record->subName, record->fileTime, record->version},
                      "\n"))
             return; // nothing is escaped
     second.setCatalogueFolder(first.catalogueFolder());
@@ -65,4 +67,5 @@ void fuzzKnown(const QByteArray &input)
     const QByteArray marker = at < 0 ? QByteArray() : input.mid(at + kSeparator.size());
     readLeftovers<VST3Host>(vst3CatalogueFormat(), catalogue, marker);
     readLeftovers<VSTHost>(vstCatalogueFormat(), catalogue, marker);
+    readLeftovers<CLAPHost>(clapCatalogueFormat(), catalogue, marker);
 }

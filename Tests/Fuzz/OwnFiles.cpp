@@ -1,4 +1,5 @@
 #include "Main/AudioEngineController/Effects/Catalogue/BuiltInCatalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CLAPCatalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
@@ -19,7 +20,7 @@ bool anyTextHolds(const std::vector<EffectRecord> &records, const char *characte
 {
     return std::any_of(records.begin(), records.end(), [&](const EffectRecord &record) {
         return anyHolds({record.path, record.fileTime, record.name, record.id, record.vendor,
-                         record.categories, record.subName},
+                         record.categories, record.subName, record.version},
                         characters);
     });
 }
@@ -57,6 +58,7 @@ void fuzzCatalogue(const QByteArray &input)
 {
     readAndWrite(vst3CatalogueFormat(), input);
     readAndWrite(vstCatalogueFormat(), input);
+    readAndWrite(clapCatalogueFormat(), input);
     readAndWrite(builtInEffectsFormat(), input);
 }
 
@@ -64,6 +66,7 @@ void fuzzMarker(const QByteArray &input)
 {
     readAndWrite(vst3CatalogueFormat().marker, input);
     readAndWrite(vstCatalogueFormat().marker, input);
+    readAndWrite(clapCatalogueFormat().marker, input);
 }
 
 void fuzzScanList(const QByteArray &input)

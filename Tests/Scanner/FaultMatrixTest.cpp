@@ -1,3 +1,5 @@
+#include "Main/AudioEngineController/Effects/Catalogue/CatalogueFormat.h"
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Tests/Support/PlatformValues.h"
 #include "Tests/Support/ScanBench.h"
 
@@ -11,58 +13,66 @@ namespace {
 /// it ended the scanner and is disabled; "?": it is recorded as not working; "-": nothing is recorded, and it
 /// is tried again. Where systems differ: Linux/Windows.
 const char kMatrix[] = R"(
-format stage              segv   abort exit _exit divide illegal stack-overflow throw-std throw-int terminate kill pthread-exit hang
-vst3   static-constructor M!/M?  M!    M!   M!    M!/M?  M!/M?   M!/M?          M!        M!        M!        M!   M!           M!
-vst3   module-entry       M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
-vst3   get-factory        M!     M!    M!   M!    M!     M!      M!             -         -         M!        M!   M!           M!
-vst3   factory-info       M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
-vst3   count-classes      M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
-vst3   class-info         M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
-vst3   class-info2        M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
-vst3   class-info-unicode M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
-vst3   create-instance    M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
-vst3   initialize         M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
-vst3   bus-count          M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
-vst3   bus-info           M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
-vst3   terminate          M!     M!    M!   M!    M!     M!      M!             AB        AB        M!        M!   M!           M!
-vst3   release            M!     M!    M!   M!    M!     M!      M!             AB        AB        M!        M!   M!           M!
-vst3   factory-release    M!     M!    M!   M!    M!     M!      M!             ABC       ABC       M!        M!   M!           M!
-vst3   module-exit        M!     M!    M!   M!    M!     M!      M!             ABC       ABC       M!        M!   M!           M!
-vst3   static-destructor  M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
-vst2   static-constructor M!/M?  M!    M!   M!    M!/M?  M!/M?   M!/M?          M!        M!        M!        M!   M!           M!
-vst2   entry              M?     M!    M!   M!    M?     M?      M?             M?        M?        M!        M!   M!           M!
-vst2   get-plug-category  M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
-vst2   get-effect-name    M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
-vst2   get-vendor-string  M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
-vst2   close              M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
-vst2   static-destructor  M!/M   M!    M!   M!    M!/M   M!/M    M!/M           M!        M!        M!        M!   M!           M!
-shell  shell-next         A      M!    M!   M!    A      A       A              A         A         M!        M!   M!           M!
-shell  entry              AB?C   AB!C  AB!C AB!C  AB?C   AB?C    AB?C           AB?C      AB?C      AB!C      AB!C AB!C         AB!C
-shell  get-plug-category  ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
-shell  get-effect-name    ACM    AB!C  AB!C AB!C  ACM    ACM     ACM            ACM       ACM       AB!C      AB!C AB!C         AB!C
-shell  get-vendor-string  ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
-shell  close              ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
-shell  static-destructor  M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
+stages                                          segv   abort exit _exit divide illegal stack-overflow throw-std throw-int terminate kill pthread-exit hang
+vst3:static-constructor,clap:static-constructor M!/M?  M!    M!   M!    M!/M?  M!/M?   M!/M?          M!        M!        M!        M!   M!           M!
+vst3:module-entry,clap:entry-init               M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
+vst3:get-factory,clap:get-factory               M!     M!    M!   M!    M!     M!      M!             -         -         M!        M!   M!           M!
+vst3:factory-info                               M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
+vst3:count-classes,clap:plugin-count            M!     M!    M!   M!    M!     M!      M!             M?        M?        M!        M!   M!           M!
+vst3:class-info,clap:descriptor                 M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3:class-info2                                M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3:class-info-unicode                         M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3:create-instance,clap:create-plugin         M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3:initialize,clap:init,clap:get-extension    M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3:bus-count,clap:port-count                  M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3:bus-info,clap:port-info                    M!     M!    M!   M!    M!     M!      M!             A         A         M!        M!   M!           M!
+vst3:terminate,clap:destroy                     M!     M!    M!   M!    M!     M!      M!             AB        AB        M!        M!   M!           M!
+vst3:release                                    M!     M!    M!   M!    M!     M!      M!             AB        AB        M!        M!   M!           M!
+vst3:factory-release                            M!     M!    M!   M!    M!     M!      M!             ABC       ABC       M!        M!   M!           M!
+vst3:module-exit,clap:entry-deinit              M!     M!    M!   M!    M!     M!      M!             ABC       ABC       M!        M!   M!           M!
+vst3:static-destructor,clap:static-destructor   M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
+vst2:static-constructor                         M!/M?  M!    M!   M!    M!/M?  M!/M?   M!/M?          M!        M!        M!        M!   M!           M!
+vst2:entry                                      M?     M!    M!   M!    M?     M?      M?             M?        M?        M!        M!   M!           M!
+vst2:get-plug-category                          M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2:get-effect-name                            M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2:get-vendor-string                          M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2:close                                      M      M!    M!   M!    M      M       M              M         M         M!        M!   M!           M!
+vst2:static-destructor                          M!/M   M!    M!   M!    M!/M   M!/M    M!/M           M!        M!        M!        M!   M!           M!
+shell:shell-next                                A      M!    M!   M!    A      A       A              A         A         M!        M!   M!           M!
+shell:entry                                     AB?C   AB!C  AB!C AB!C  AB?C   AB?C    AB?C           AB?C      AB?C      AB!C      AB!C AB!C         AB!C
+shell:get-plug-category                         ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
+shell:get-effect-name                           ACM    AB!C  AB!C AB!C  ACM    ACM     ACM            ACM       ACM       AB!C      AB!C AB!C         AB!C
+shell:get-vendor-string                         ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
+shell:close                                     ABC    AB!C  AB!C AB!C  ABC    ABC     ABC            ABC       ABC       AB!C      AB!C AB!C         AB!C
+shell:static-destructor                         M!/ABC M!    M!   M!    M!/ABC M!/ABC  M!/ABC         M!        M!        M!        M!   M!           M!
 )";
 
 QStringList words(const QString &line) { return line.split(' ', Qt::SkipEmptyParts); }
 
-QStringList matrixLines() { return QString::fromLatin1(kMatrix).split('\n', Qt::SkipEmptyParts); }
+/// The head, then a line for each format and stage: "vst3 initialize M! …".
+QStringList matrixLines()
+{
+    QStringList lines;
+    for (const QString &line : QString::fromLatin1(kMatrix).split('\n', Qt::SkipEmptyParts))
+        for (const QString &stage : line.section(' ', 0, 0).split(','))
+            lines.append(QString(stage).replace(':', ' ') + ' ' + line.section(' ', 1));
+    return lines;
+}
 
 /// A line of the matrix: the format and the stage, then what becomes of each kind of fault.
 class FaultMatrix : public ScanBench, public testing::WithParamInterface<int> {
 protected:
     FaultMatrix()
-        : m_kinds(words(matrixLines().first()).mid(2))
+        : m_kinds(words(matrixLines().first()).mid(1))
         , m_cells(words(matrixLines().at(GetParam())).mid(2))
         , m_format(words(matrixLines().at(GetParam())).at(0))
         , m_stage(words(matrixLines().at(GetParam())).at(1))
     {}
     bool isOfOnePlugin() const
     {
-        static const QRegularExpression whole("^(static|module|factory|get-factory|count)");
-        return m_format == "shell" ? m_stage != "static-destructor"
-                                   : m_format == "vst3" && !whole.match(m_stage).hasMatch();
+        static const QRegularExpression whole(
+            "^(static|module|factory|get-factory|count|entry-|plugin-count)");
+        return m_format != "vst2" && !whole.match(m_stage).hasMatch();
     }
     void add(const QString &kind) const
     {
@@ -70,12 +80,13 @@ protected:
         QByteArray script;
         if (m_format != "vst2")
             for (const char *letter : {"A", "B", "C"})
-                script += (m_format == "vst3" ? "class \"" : "child " + QByteArray::number(*letter) + " \"") +
-                          name + ' ' + letter + "\"\n";
+                script +=
+                    (m_format == "shell" ? "child " + QByteArray::number(*letter) + " \"" : "class \"") +
+                    name + ' ' + letter + "\"\n";
         if (kind != "healthy")
             script +=
                 "fault " + m_stage.toUtf8() + ' ' + name + (isOfOnePlugin() ? " \"" + name + " B\"\n" : "\n");
-        put(kind + (m_format == "vst3" ? ".vst3" : ".vst2"), script);
+        put(kind + '.' + (m_format == "shell" ? "vst2" : m_format), script);
     }
     /// Runs the scanner until no marker survives; what hangs is ended from outside, or by the scanner that
     /// has workers. The number of runs.
@@ -113,7 +124,8 @@ protected:
 QString FaultMatrix::found(const QString &kind) const
 {
     QStringList found;
-    const char *file = m_format == "vst3" ? "VST3Configuration.xml" : "FXConfiguration.xml";
+    const PluginFormatInfo *const format = formatOfKey(m_format == "shell" ? "vst2" : m_format);
+    const QString file = QString(format->catalogue->fileName).mid(1);
     for (const QString &row : recordsOf(file, "Name Path Enabled Working")) {
         const QStringList values = row.split('|');
         if (QFileInfo(values[1]).completeBaseName() != kind)

@@ -1,3 +1,4 @@
+#include "Main/AudioEngineController/Effects/CLAP/CLAPHost.h"
 #include "Main/AudioEngineController/Effects/VST/VSTHost.h"
 #include "Main/AudioEngineController/Effects/VST3/VST3Host.h"
 #include "Tests/Support/CapturedLog.h"
@@ -128,6 +129,8 @@ private:
     static QString nameOf(int number) { return QString("Plug-in %1").arg(number); }
     QString idOf(int number) const
     {
+        if (m_info.format == PluginFormat::Clap) // any text: also what the file is called
+            return number == 1 ? QString("A") : QString("com.example.%1").arg(number);
         return isVst2() ? QString("P:%1").arg(number) : QString("%1").arg(number, 32, 16, QChar('0'));
     }
     Numbers numbersOf(int product)
@@ -575,6 +578,8 @@ bool World::runOnce()
     std::unique_ptr<AudioPluginHost> host = std::make_unique<WorldHost<VST3Host>>(*this);
     if (isVst2())
         host = std::make_unique<WorldHost<VSTHost>>(*this);
+    if (m_info.format == PluginFormat::Clap)
+        host = std::make_unique<WorldHost<CLAPHost>>(*this);
     m_host = host.get();
     host->ReadCatalogue();
     host->Scan(true, true);
@@ -616,7 +621,8 @@ TEST_P(KeepingModel, LosesNothingAndBlamesNobodyElse)
 }
 
 INSTANTIATE_TEST_SUITE_P(Of, KeepingModel,
-                         testing::Combine(testing::Values(PluginFormat::Vst2, PluginFormat::Vst3),
+                         testing::Combine(testing::Values(PluginFormat::Vst2, PluginFormat::Vst3,
+                                                          PluginFormat::Clap),
                                           testing::Range(0, kBlocks)),
                          [](const auto &row) {
                              return formatInfo(std::get<0>(row.param)).key +

@@ -30,7 +30,7 @@
 //   same                          a scan that loads nothing and writes nothing
 //   loaded MODULE…                what the scan loaded, in order; closed MODULE: CALL, CALL
 //   log: TEXT                     what its log holds; readable FILE, for everybody
-//   vst3, vst2 ELEMENTS: ROW, ROW what the catalogue lists, in any order
+//   vst3, vst2, clap ELEMENTS: ROW, ROW what the catalogue lists, in any order
 struct ScanCase {
     std::string name;
     QStringList steps;
@@ -116,6 +116,7 @@ protected:
             {"markers", [&] { EXPECT_EQ(m_folder.markers().join(' '), file); }},
             {"log", [&] { EXPECT_TRUE(m_last.log.contains(text)) << qPrintable(m_last.log); }},
             {"vst3", [&] { expectRecords("VST3Configuration.xml", file, text); }},
+            {"clap", [&] { expectRecords("CLAPConfiguration.xml", file, text); }},
             {"vst2", [&] { expectRecords("FXConfiguration.xml", file, text); }}};
         verbs.at(verb)();
     }
@@ -200,8 +201,8 @@ private:
     }
     void expectNothingToDo() const
     {
-        for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"})
-            dateFirst("Effects/" + QString(file));
+        for (const QString &file : QDir(m_folder.effects()).entryList({"*Configuration.xml"}, QDir::Files))
+            dateFirst("Effects/" + file);
         const auto before = effectsFolder();
         const QDateTime modified = QFileInfo(cataloguePath()).lastModified();
         scan();

@@ -121,6 +121,44 @@ scan
 loaded Far
 vst3 Path: a/Comp.vst3, first/Far.vst3, Also.vst3
 
+= CLAP plug-ins are listed with all that they say and keep their marks
+put Two.clap: class A | #1 | vendor V | version 2.1 | features audio-effect reverb x:y | class B | inputs 1 2:aux | outputs 6
+put Some.clap/Inside.clap:
+put Killer.clap: fault init kill
+put Other.clap: class T | effect init umask 077 | effect init locale % | ask-host destroy "after all" for-ever
+write Plugins/Empty.clap/Contents/x86_64-linux/Empty: x
+write Plugins/Text.clap: not a module
+scan 2
+clap Name Path ID Vendor Version Features: A|Two.clap|00000000000000000000000000000001|V|2.1|audio-effect|reverb|x:y, B|Two.clap|fixture.B|Fixture Works|1.0|audio-effect, Inside|Some.clap/Inside.clap|fixture.Inside|Fixture Works|1.0|audio-effect, Killer|Killer.clap|Killer.clap|||, T|Other.clap|fixture.T|Fixture Works|1.0|audio-effect
+clap Name FileTime CategoryMask Inputs Outputs Enabled Working: A|2021-03-04 05:06|16384|2|2|1|1, B|2021-03-04 05:06|0|1|6|1|1, Inside|2021-03-04 05:06|0|2|2|1|1, Killer|2021-03-04 05:06|0|-1|-1|0|0, T|2021-03-04 05:06|0|2|2|1|1
+vst3 Name: .
+same
+mark A Favourite 1, A CategoryMask 2, B Enabled 0
+new Two.clap: class Renamed | #1 | class B | class C
+new Some.clap/Inside.clap: answer get-factory null
+scan
+loaded Inside Two
+log: Inside.clap: it has no plug-in factory
+clap Name FileTime CategoryMask Favourite Enabled Working: Renamed|2022-03-04 05:06|2|1|1|1, B|2022-03-04 05:06|0|0|0|1, C|2022-03-04 05:06|0|0|1|1, Inside|2021-03-04 05:06|0|0|1|1, Killer|2021-03-04 05:06|0|0|0|0, T|2021-03-04 05:06|0|0|1|1
+folders @/Effects
+scan
+clap Name: .
+same
+
+= A CLAP module that is named as its plug-in crashes and comes back
+put com.a.clap: class A | id com.a | class B
+scan
+mark A Favourite 1
+new com.a.clap: class A | id com.a | fault entry-deinit kill
+scan 2
+clap Name ID Favourite Enabled Working: com.a|com.a.clap|0|0|0, A|com.a|1|0|0, B|fixture.B|0|0|0
+same
+retry com.a
+put com.a.clap: class A | id com.a | class B
+scan
+clap Name ID Favourite Enabled Working: A|com.a|1|1|1, B|fixture.B|0|1|1
+same
+
 = What a bundle holds is never a VST 2 module
 put Damaged.vst3/Left.vst2, Other.VST3/Contents/aarch64-other/Other.vst2, Good.vst2:
 scan

@@ -1,3 +1,4 @@
+#include "Tests/Support/CLAPFixture.h"
 #include "Tests/Support/PlatformValues.h"
 #include "Tests/Support/VST2Fixture.h"
 #include "Tests/Support/VST3Fixture.h"
@@ -49,6 +50,12 @@ QString vst2Ending() { return kVst2Ending; }
 QString addVST2File(const QString &folder, const QString &name, const QByteArray &script, VST2Fixture fixture)
 {
     return put(kVst2Modules[static_cast<int>(fixture)], folder + '/' + name + vst2Ending(), script);
+}
+
+QString addCLAPFile(const QString &folder, const QString &name, const QByteArray &script, bool isPlugin)
+{
+    return put(isPlugin ? FXPROBE_SCRIPTED_CLAP : FXPROBE_NO_ENTRY_VST3, folder + '/' + name + ".clap",
+               script);
 }
 
 QString vst3FixturePath(VST3Fixture fixture) { return kVst3Modules[static_cast<int>(fixture)]; }

@@ -1,5 +1,6 @@
 #include "Tests/Support/ScanBench.h"
 
+#include "Tests/Support/CLAPFixture.h"
 #include "Tests/Support/VST2Fixture.h"
 #include "Tests/Support/VST3Fixture.h"
 
@@ -33,6 +34,8 @@ QString ScanBench::put(const QString &file, const QByteArray &script) const
         return dateFirst(addVST2File(m_folder.plugins(), name, whole));
     if (!script.contains("class "))
         whole += "class " + quoted;
+    if (file.endsWith(".clap"))
+        return dateFirst(addCLAPFile(m_folder.plugins(), name, whole));
     return dateFirst(file.endsWith(".bundle") ? addVST3Bundle(m_folder.plugins(), name, whole)
                                               : addVST3File(m_folder.plugins(), name, whole));
 }
@@ -119,7 +122,7 @@ QStringList ScanBench::sortedRecords(const char *elements) const
 void ScanBench::mark(const QString &name, const char *element, const QByteArray &value) const
 {
     bool isMarked = false;
-    for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml"}) {
+    for (const char *file : {"VST3Configuration.xml", "FXConfiguration.xml", "CLAPConfiguration.xml"}) {
         QByteArray catalogue = m_folder.catalogue(file);
         const int named = catalogue.indexOf("<Name>" + name.toUtf8() + "</Name>");
         const QByteArray tag = QByteArray("<") + element + '>';

@@ -18,8 +18,8 @@ protected:
     /// The program under test.
     static QString scannerProgram();
     /// Puts a module into "Plugins", or into a folder below it when the file has one ("sub/Comp.vst3"); the
-    /// ending ".vst2" is spelt as the system spells it, and ".bundle" makes a VST 3 bundle. A VST 3 script
-    /// without classes gets one of the file's name. Returns the module's full path.
+    /// ending ".vst2" is spelt as the system spells it, and ".bundle" makes a VST 3 bundle. A VST 3 or CLAP
+    /// script without classes gets one of the file's name. Returns the module's full path.
     QString put(const QString &file, const QByteArray &script = {}) const;
     /// Dates a file as plug-ins of the first scan are, and gives its path back.
     QString dateFirst(const QString &path) const;

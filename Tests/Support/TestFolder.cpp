@@ -56,7 +56,7 @@ QByteArray TestFolder::catalogue(const QString &name) const { return read(effect
 
 QStringList TestFolder::markers() const
 {
-    return QDir(effects()).entryList({"*.scan", "*.scan3"}, QDir::Files | QDir::Hidden, QDir::Name);
+    return QDir(effects()).entryList({"*.scan*"}, QDir::Files | QDir::Hidden, QDir::Name);
 }
 
 void TestFolder::setModified(const QString &file, const QDateTime &time) const

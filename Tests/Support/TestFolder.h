@@ -35,7 +35,7 @@ public:
     void writeScanList(QStringList folders = {}) const;
     /// The text of a catalogue file in "Effects".
     QByteArray catalogue(const QString &name = "VST3Configuration.xml") const;
-    /// The file names of the crash markers in "Effects", of both formats, sorted.
+    /// The file names of the crash markers in "Effects", sorted.
     QStringList markers() const;
 
     /// Gives a file another modification time.

@@ -16,8 +16,8 @@ namespace FxProbe {
 struct Plugin {
     QString name;   ///< display name
     QString vendor; ///< as the plug-in states it; may be empty
-    QString format; ///< "vst3" or "vst2", the key of `PluginFormatInfo`
-    /// With the prefix of its format ("vst3:", "vst2:"); tells it from all others. Empty where the plug-in
+    QString format; ///< "vst3", "vst2" or "clap", the key of `PluginFormatInfo`
+    /// With the prefix of its format ("vst3:"); tells it from all others. Empty where the plug-in
     /// cannot be used.
     QString identifier;
     QString path;             ///< full path of the module's file, with "/"

@@ -1,5 +1,7 @@
 #include "Workstation/Options/PluginFolders.h"
 
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
+
 #include <QDir>
 #include <QFileInfo>
 #include <QRegularExpression>
@@ -23,7 +25,11 @@ bool canStandInScanList(const QString &folder)
 
 QStringList foldersOfEnvironment()
 {
-    return foldersOfVariable("VST3_PATH") + foldersOfVariable("VST_PATH") + foldersOfVariable("LXVST_PATH");
+    QStringList folders;
+    for (const PluginFormatInfo &format : pluginFormats())
+        for (const QByteArray &variable : QByteArray(format.folderVariables).split(' '))
+            folders += foldersOfVariable(variable);
+    return folders;
 }
 
 QStringList usualPluginFolders() { return foldersOfEnvironment() + platformPluginFolders(); }

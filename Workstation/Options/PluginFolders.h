@@ -4,7 +4,7 @@
 #include <QStringList>
 
 /// Where plug-ins usually lie on this platform, whether the folders exist or not, after those that the
-/// environment variables "VST3_PATH", "VST_PATH" and "LXVST_PATH" name.
+/// environment variables of the formats name.
 QStringList usualPluginFolders();
 
 /// Those that the variables name alone.

@@ -43,7 +43,7 @@ CommandLine readCommandLine(const QStringList &arguments)
 {
     QCommandLineParser parser;
     parser.setApplicationDescription(QStringLiteral(
-        "Finds the VST 3 and VST 2 plug-ins of this machine and says which of them can be used.\n\n"
+        "Finds the audio plug-ins of this machine and says which of them can be used.\n\n"
         "Exit codes: 0 done, 1 done but some plug-ins cannot be used (with --strict), 2 wrong usage,\n"
         "3 the scan did not come to its end."));
     const QCommandLineOption help({QStringLiteral("h"), QStringLiteral("help")},

@@ -16,5 +16,5 @@ QByteArray renderJsonLine(const ScanSummary &summary, const QString &dataFolder,
 /// The plug-ins, one a line, as comma-separated values with a line of titles (RFC 4180).
 QByteArray renderCsv(const ScanSummary &summary);
 
-/// Channels of a plug-in as far as the catalogue tells: inputs in VST 3, outputs in VST 2.
+/// Channels of a plug-in as far as its catalogue or its last probe tells.
 QString channelsText(const CataloguedPlugin &plugin);

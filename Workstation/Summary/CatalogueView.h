@@ -43,8 +43,6 @@ struct CataloguedPlugin {
     bool hasChanged = false; ///< its file is another one than that for which it was disabled
     /// What its last probe came to; only where somebody wants to see it.
     std::optional<RememberedProbe> probe{};
-    /// True where the catalogue tells the output channels (as the width), false where it tells the inputs.
-    bool hasWidth() const { return format->catalogue->hasWidth; }
     bool isUsable() const { return record.working && !isOfCrashedFile && !isAway && !isIgnored; }
     /// The categories' names, else what the plug-in says of itself.
     QStringList categories() const;

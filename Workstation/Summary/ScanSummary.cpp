@@ -53,14 +53,18 @@ void addFailures(ScanSummary &summary, const ScanAccount *account, const ProbeMe
     }
 }
 
-/// Each catalogue tells one direction only, the last probe both.
+/// A catalogue may tell one direction only, the last probe tells both.
 void fillChannels(std::vector<CataloguedPlugin> &plugins, const ProbeMemory &memory)
 {
+    using Channels = CatalogueFormat::Channels;
     for (CataloguedPlugin &plugin : plugins) {
         if (!plugin.isUsable())
             continue;
-        (plugin.hasWidth() ? plugin.outputs : plugin.inputs) =
-            plugin.hasWidth() ? plugin.record.width : plugin.record.inputs;
+        const Channels told = plugin.format->catalogue->channels;
+        plugin.inputs = told == Channels::Width ? -1 : plugin.record.inputs;
+        plugin.outputs = told == Channels::Width  ? plugin.record.width
+                         : told == Channels::Both ? plugin.record.outputs
+                                                  : -1;
         const RememberedProbe *last = memory.find(plugin.format->format, plugin.record.path);
         if (!last || last->fileTime != plugin.record.fileTime)
             continue;

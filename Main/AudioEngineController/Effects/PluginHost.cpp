@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Files/FileFinder.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/ProcessSetup.h"
+#include "Main/AudioEngineController/Effects/CLAP/CLAPHost.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Main/AudioEngineController/Effects/Host/AudioUnitHost.h"
@@ -39,6 +40,8 @@ std::unique_ptr<AudioPluginHost> makeHost(PluginFormat format)
         return std::make_unique<VSTHost>();
     case PluginFormat::Vst3:
         return std::make_unique<VST3Host>();
+    case PluginFormat::Clap:
+        return std::make_unique<CLAPHost>();
     case PluginFormat::BuiltIn:
         return std::make_unique<MRLAudioPluginHost>();
     case PluginFormat::AudioUnit:

@@ -1,14 +1,16 @@
 #include "Workstation/Options/PluginFolders.h"
 
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
+
 #include <QDir>
 #include <QSettings>
 
 namespace {
 
-QString below(const char *variable, const char *folder)
+QString below(const char *variable, const QString &folder)
 {
     const QString root = qEnvironmentVariable(variable);
-    return root.isEmpty() ? QString() : QDir::fromNativeSeparators(root) + QString::fromLatin1(folder);
+    return root.isEmpty() ? QString() : QDir::fromNativeSeparators(root) + folder;
 }
 
 /// Where installers of VST 2 plug-ins put them, as they told the registry.
@@ -22,15 +24,19 @@ QString registeredVst2Folder()
 
 QStringList platformPluginFolders()
 {
-    // VST 3: the VST 3 documentation, "Plug-in locations" (Windows). VST 2 has no standard beyond the
-    // registry value; the others are where makers install them.
-    QStringList folders{below("LOCALAPPDATA", "/Programs/Common/VST3"),
-                        below("CommonProgramW6432", "/VST3"),
-                        registeredVst2Folder(),
-                        below("ProgramW6432", "/VSTPlugins"),
-                        below("ProgramW6432", "/Steinberg/VSTPlugins"),
-                        below("CommonProgramW6432", "/VST2"),
-                        below("CommonProgramW6432", "/Steinberg/VST2")};
+    // The VST 3 documentation, "Plug-in locations" (Windows); the comments of CLAP's entry.h.
+    QStringList folders;
+    for (const PluginFormatInfo &format : pluginFormats()) {
+        const QString name = QLatin1Char('/') + QString::fromLatin1(format.folderName).toUpper();
+        if (format.folderName)
+            folders += {below("LOCALAPPDATA", QStringLiteral("/Programs/Common") + name),
+                        below("CommonProgramW6432", name)};
+    }
+    // VST 2 has no standard beyond the registry value; the others are where makers install them.
+    folders += {registeredVst2Folder(), below("ProgramW6432", QStringLiteral("/VSTPlugins")),
+                below("ProgramW6432", QStringLiteral("/Steinberg/VSTPlugins")),
+                below("CommonProgramW6432", QStringLiteral("/VST2")),
+                below("CommonProgramW6432", QStringLiteral("/Steinberg/VST2"))};
     folders.removeAll(QString());
     return folders;
 }

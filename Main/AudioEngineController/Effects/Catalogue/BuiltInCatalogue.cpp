@@ -14,7 +14,9 @@ const CatalogueFormat &builtInEffectsFormat()
                                            kEveryVersion,
                                            kEveryVersion,
                                            KnownList::Identity::Identifier,
-                                           false, // no channels at all
+                                           nullptr,
+                                           CatalogueFormat::Channels::Inputs, // none are told
+                                           false,
                                            {},
                                            {kId, kFavourite, writtenMask}};
     return format;

@@ -6,13 +6,6 @@ namespace {
 
 using Content = std::optional<QByteArray>;
 
-template <QString EffectRecord::*Field>
-constexpr CatalogueElement textElement(const char *name)
-{
-    return {name, [](EffectRecord &record, const ElementContent &element) { record.*Field = element.text(); },
-            [](const EffectRecord &record) -> Content { return (record.*Field).toUtf8(); }};
-}
-
 template <bool EffectRecord::*Field>
 constexpr CatalogueElement boolElement(const char *name)
 {
@@ -43,5 +36,7 @@ const CatalogueElement CatalogueElements::kId = textElement<&EffectRecord::id>("
 const CatalogueElement CatalogueElements::kCategoryMask = {"CategoryMask", readCategoryMask, categoryMask};
 const CatalogueElement CatalogueElements::kFavourite = boolElement<&EffectRecord::favourite>("Favourite");
 const CatalogueElement CatalogueElements::kVendor = textElement<&EffectRecord::vendor>("Vendor");
+const CatalogueElement CatalogueElements::kInputs = numberElement<&EffectRecord::inputs>("Inputs");
+const CatalogueElement CatalogueElements::kOutputs = numberElement<&EffectRecord::outputs>("Outputs");
 const CatalogueElement CatalogueElements::kEnabled = boolElement<&EffectRecord::enabled>("Enabled");
 const CatalogueElement CatalogueElements::kWorking = boolElement<&EffectRecord::working>("Working");

@@ -35,8 +35,12 @@ struct CatalogueFormat {
     double categoryMasksFrom;    ///< in files of earlier versions the mask is not one yet
     /// What tells the plug-ins of one file apart.
     KnownList::Identity identity;
-    /// A record tells the output channels, as the width; otherwise the input channels, if any.
-    bool hasWidth;
+    /// What identifiers of plug-ins look like, as a regular expression over all of one; null: there are none
+    /// to mistake. No path of a file may match.
+    const char *identifierForm;
+    /// Which channels a record tells: of inputs, if any, of outputs as the width, or of both.
+    enum class Channels { Inputs, Width, Both } channels;
+    bool isWrittenEmpty; ///< a scan that finds nothing writes the file, also where there is none
     MarkerFormat marker;
     std::vector<CatalogueElement> elements;
 };
@@ -50,9 +54,29 @@ extern const CatalogueElement kId;
 extern const CatalogueElement kCategoryMask;
 extern const CatalogueElement kFavourite;
 extern const CatalogueElement kVendor;
+extern const CatalogueElement kInputs;
+extern const CatalogueElement kOutputs;
 extern const CatalogueElement kEnabled;
 extern const CatalogueElement kWorking;
 
 inline qint32 readInt(const ElementContent &element) { return static_cast<qint32>(element.integer()); }
 inline bool readBool(const ElementContent &element) { return element.integer() != 0; }
+
+/// An element that holds a field of the record as it is.
+template <QString EffectRecord::*Field>
+constexpr CatalogueElement textElement(const char *name)
+{
+    return {name, [](EffectRecord &record, const ElementContent &element) { record.*Field = element.text(); },
+            [](const EffectRecord &record) -> std::optional<QByteArray> { return (record.*Field).toUtf8(); }};
+}
+
+template <qint32 EffectRecord::*Field>
+constexpr CatalogueElement numberElement(const char *name)
+{
+    return {name,
+            [](EffectRecord &record, const ElementContent &element) { record.*Field = readInt(element); },
+            [](const EffectRecord &record) -> std::optional<QByteArray> {
+                return QByteArray::number(record.*Field);
+            }};
+}
 } // namespace CatalogueElements

@@ -9,7 +9,7 @@ auto fieldsOf(const EffectRecord &record)
     return std::tie(record.path, record.fileTime, record.name, record.id, record.vendor, record.categories,
                     record.inputs, record.outputs, record.enabled, record.category, record.working,
                     record.favourite, record.vstCategory, record.behaviour, record.width, record.latency,
-                    record.subName, record.subId);
+                    record.subName, record.subId, record.version);
 }
 
 } // namespace
@@ -28,7 +28,7 @@ bool EffectRecord::standsForFile() const
     EffectRecord file;
     file.path = path;
     NameFromPath(file);
-    return id == file.name || id.startsWith(path);
+    return (id == file.name && !hasFreeId) || id.startsWith(path);
 }
 
 void takeMarks(EffectRecord &record, const EffectRecord &old)

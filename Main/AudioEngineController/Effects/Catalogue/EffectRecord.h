@@ -14,7 +14,8 @@ struct EffectRecord {
     QString name;           ///< display name
     QString id;             ///< plug-in identifier without the prefix of its format; empty: it has none
     QString vendor;         ///< as the plug-in reports it
-    QString categories;     ///< VST 3: the sub-categories as the factory reports them
+    QString version;        ///< the same; not in every format
+    QString categories;     ///< what the plug-in says of its kind, between bars; not in every format
     qint32 inputs = -1;     ///< audio input channels; -1: unknown
     qint32 outputs = -1;    ///< audio output channels; -1: unknown
     bool enabled = true;    ///< false: switched off by the user, or it crashed the scanner
@@ -27,14 +28,16 @@ struct EffectRecord {
     qint32 latency = 0;     ///< VST 2: samples
     QString subName;        ///< VST 2: name of a shell's sub-plug-in
     quint32 subId = 0;      ///< VST 2: identifier of a shell's sub-plug-in; 0: it is not one
+    bool hasFreeId =
+        false; ///< plug-ins choose any text as identifier, also a file's name; set when it is read
 
     /// True for what the user wants never loaded: disabled and not working, and in place of the file's time
     /// stands a word that no file has.
     bool isIgnored() const { return !enabled && !working && fileTime == QLatin1String(kIgnoredTime); }
     /// True for what a crash marker made of a whole file: disabled and not working.
     bool isCrashedFile() const { return !enabled && !working && subId == 0 && !isIgnored(); }
-    /// True for what stands for a whole file that crashed or failed: such a record is named after the file,
-    /// or identified by its path.
+    /// True for what stands for a whole file that crashed or failed: such a record is identified by the
+    /// file's name or path.
     bool standsForFile() const;
     /// True when the user switched the plug-in off: what crashed is not working as well.
     bool isSwitchedOff() const { return !enabled && working; }

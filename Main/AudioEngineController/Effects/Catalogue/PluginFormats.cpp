@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Binary/PluginLibrary.h"
 #include "Core/BaseLib/Log/Assertion.h"
 #include "Main/AudioEngineController/Effects/Catalogue/BuiltInCatalogue.h"
+#include "Main/AudioEngineController/Effects/Catalogue/CLAPCatalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 
@@ -29,9 +30,11 @@ const std::vector<PluginFormatInfo> &pluginFormats()
 {
     static const std::vector<PluginFormatInfo> formats{
         {PluginFormat::Vst3, "vst3", "VST 3", PluginPrefix::kVst3, QStringLiteral(".vst3"),
-         &vst3CatalogueFormat()},
+         &vst3CatalogueFormat(), "vst3", "VST3_PATH"},
         {PluginFormat::Vst2, "vst2", "VST 2", PluginPrefix::kVst2, PluginLibrary::fileEnding(),
-         &vstCatalogueFormat()},
+         &vstCatalogueFormat(), nullptr, "VST_PATH LXVST_PATH"},
+        {PluginFormat::Clap, "clap", "CLAP", PluginPrefix::kClap, QStringLiteral(".clap"),
+         &clapCatalogueFormat(), "clap", "CLAP_PATH"},
         {PluginFormat::AudioUnit, "au", "Apple AudioUnit", PluginPrefix::kAudioUnit, QString(), nullptr},
         {PluginFormat::BuiltIn, "mrl", "Built-in", PluginPrefix::kBuiltIn, QString(),
          &builtInEffectsFormat()}};

@@ -13,6 +13,8 @@ enum class PluginFormat {
     Vst2 = 2,
     AudioUnit = 3,
     Vst3 = 4,
+    Clap = 5,
+    Last = Clap, ///< the greatest number
 };
 
 namespace PluginPrefix {
@@ -20,6 +22,7 @@ inline constexpr char kBuiltIn[] = "mrl:";
 inline constexpr char kVst2[] = "vst2:";
 inline constexpr char kAudioUnit[] = "au:";
 inline constexpr char kVst3[] = "vst3:";
+inline constexpr char kClap[] = "clap:";
 inline constexpr char kPlaceholder[] = "placeholder:"; ///< stands for a plug-in that is missing
 } // namespace PluginPrefix
 
@@ -31,6 +34,9 @@ struct PluginFormatInfo {
     const char *prefix;   ///< of its identifiers in memory, with the ":"
     QString moduleEnding; ///< of its modules' names, with the dot; empty: there is nothing to scan for
     const CatalogueFormat *catalogue; ///< the file, and its markers; null: it keeps none
+    /// The name, in lower case, of the folders in which the format has its modules lie; null: it has no rule.
+    const char *folderName = nullptr;
+    const char *folderVariables = ""; ///< names, between blanks, of environment variables that name folders
 
     bool isScanned() const { return !moduleEnding.isEmpty(); }
 };

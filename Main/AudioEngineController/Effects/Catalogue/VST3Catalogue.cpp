@@ -2,31 +2,6 @@
 
 #include <limits>
 
-namespace {
-
-using Content = std::optional<QByteArray>;
-
-void readInputs(EffectRecord &record, const ElementContent &element)
-{
-    record.inputs = CatalogueElements::readInt(element);
-}
-
-void readOutputs(EffectRecord &record, const ElementContent &element)
-{
-    record.outputs = CatalogueElements::readInt(element);
-}
-
-void readCategories(EffectRecord &record, const ElementContent &element)
-{
-    record.categories = element.text();
-}
-
-Content inputs(const EffectRecord &record) { return QByteArray::number(record.inputs); }
-
-Content categories(const EffectRecord &record) { return record.categories.toUtf8(); }
-
-} // namespace
-
 const CatalogueFormat &vst3CatalogueFormat()
 {
     using namespace CatalogueElements;
@@ -37,19 +12,21 @@ const CatalogueFormat &vst3CatalogueFormat()
         1.1,
         std::numeric_limits<double>::lowest(), // masks in every version
         KnownList::Identity::Identifier,
-        false, // the input channels
+        "[0-9A-Fa-f]{32}", // a class id
+        CatalogueFormat::Channels::Inputs,
+        true,
         {".scan3", false, false},
         {kPath,
          kFileTime,
          kName,
          kId,
-         {"Categories", readCategories, categories},
+         textElement<&EffectRecord::categories>("Categories"),
          kCategoryMask,
          kFavourite,
          kVendor,
-         {"Inputs", readInputs, inputs},
+         kInputs,
          // NOTE: the number of inputs. Files in the field and the workstation's reader expect it so.
-         {"Outputs", readOutputs, inputs},
+         {kOutputs.name, kOutputs.read, kInputs.content},
          kEnabled,
          kWorking}};
     return format;

@@ -6,18 +6,6 @@ namespace {
 
 using Content = std::optional<QByteArray>;
 
-template <qint32 EffectRecord::*Field>
-void readNumber(EffectRecord &record, const ElementContent &element)
-{
-    record.*Field = CatalogueElements::readInt(element);
-}
-
-template <qint32 EffectRecord::*Field>
-Content number(const EffectRecord &record)
-{
-    return QByteArray::number(record.*Field);
-}
-
 void readSubEffect(EffectRecord &record, const ElementContent &element)
 {
     record.subName = element.child("Name").text();
@@ -45,18 +33,20 @@ const CatalogueFormat &vstCatalogueFormat()
         1.4,
         1.3,
         KnownList::Identity::SubPlugin,
-        true, // the output channels
+        "[^/]*:-?\\d+", // a key: name and unique id
+        CatalogueFormat::Channels::Width,
+        true,
         {".scan", true, true},
         {kPath,
          kFileTime,
          kName,
          kId,
-         {"Category", readNumber<&EffectRecord::vstCategory>, number<&EffectRecord::vstCategory>},
+         numberElement<&EffectRecord::vstCategory>("Category"),
          kCategoryMask,
          kFavourite,
          kVendor,
-         {"Width", readNumber<&EffectRecord::width>, number<&EffectRecord::width>},
-         {"Latency", readNumber<&EffectRecord::latency>,
+         numberElement<&EffectRecord::width>("Width"),
+         {"Latency", numberElement<&EffectRecord::latency>("Latency").read,
           nullptr}, // read from other writers' files, never written
          kEnabled,
          kWorking,

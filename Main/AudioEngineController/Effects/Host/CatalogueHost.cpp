@@ -15,11 +15,11 @@
 
 namespace {
 
-/// Whether a file's name could be a plug-in's identifier: a key of VST 2, or the id of a VST 3 class.
-bool looksLikeIdentifier(const QString &name)
+/// Whether a file's name could be the identifier of one of its format's plug-ins.
+bool looksLikeIdentifier(const CatalogueFormat &format, const QString &name)
 {
-    static const QRegularExpression pattern(QStringLiteral("\\A([^/]*:-?\\d+|[0-9A-Fa-f]{32})\\z"));
-    return pattern.match(name).hasMatch();
+    const QString form = QString::fromLatin1(format.identifierForm);
+    return QRegularExpression(QRegularExpression::anchoredPattern(form)).match(name).hasMatch();
 }
 
 } // namespace
@@ -331,6 +331,8 @@ bool CatalogueHost::writeIfChanged(WaitingRecords &waiting)
     QByteArray present = m_written;
     if (present.isNull())
         readWholeFile(cataloguePath(), present);
+    if (present.isNull() && m_effects.size() == 0 && waiting.empty() && !m_info.catalogue->isWrittenEmpty)
+        return false;
     return text != present && writeText(text, Durability::Synced);
 }
 
@@ -354,7 +356,7 @@ QString CatalogueHost::freeIdentifier(const EffectRecord &plugin, const QString 
 {
     const auto isFree = [&](const QString &candidate) {
         const EffectRecord *listed = m_effects.find(candidate);
-        return !candidate.isEmpty() && !looksLikeIdentifier(candidate) &&
+        return !candidate.isEmpty() && !looksLikeIdentifier(*m_info.catalogue, candidate) &&
                !(listed && !listed->isSamePlugin(plugin)) &&
                (m_givenUp.count(candidate) != 0 || !m_known.isIdHeldByOther(candidate, plugin));
     };

@@ -20,7 +20,8 @@ constexpr std::size_t kMany = 3;
 /// A plug-in's texts as a catalogue takes them, whose lines they must not break.
 void replaceControls(EffectRecord &record)
 {
-    for (QString *text : {&record.name, &record.id, &record.vendor, &record.categories, &record.subName})
+    for (QString *text :
+         {&record.name, &record.id, &record.vendor, &record.version, &record.categories, &record.subName})
         for (QChar &character : *text)
             if (character < QLatin1Char(' '))
                 character = QLatin1Char(' ');

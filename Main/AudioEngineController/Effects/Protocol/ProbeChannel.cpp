@@ -90,7 +90,7 @@ template <typename Visitor, typename Record>
 void visitRecord(Visitor &fields, Record &record)
 {
     for (auto *text : {&record.path, &record.fileTime, &record.name, &record.id, &record.vendor,
-                       &record.categories, &record.subName})
+                       &record.version, &record.categories, &record.subName})
         fields.text(*text);
     for (auto *number : {&record.inputs, &record.outputs, &record.vstCategory, &record.behaviour,
                          &record.width, &record.latency})
@@ -120,7 +120,7 @@ void visitMessage(Visitor &fields, Message &message)
     fields.choice(message.kind, Kind::Done);
     switch (message.kind) {
     case Kind::Job:
-        fields.choice(message.job.format, PluginFormat::Vst3);
+        fields.choice(message.job.format, PluginFormat::Last);
         fields.text(message.job.path);
         fields.text(message.job.fileTime);
         fields.numbers(message.job.leftOut);

@@ -142,6 +142,7 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHostAndTheKeyThePlugin)
     list(PluginFormat::Vst3, "FF112233445566778899AABBCCDDEEFF");
     list(PluginFormat::Vst3, "Off", "", false);
     list(PluginFormat::BuiltIn, "a");
+    list(PluginFormat::Clap, "com.a.B");
     list(PluginFormat::Vst2, "Q10:7", "name Q10\nid 7\n");
     list(PluginFormat::Vst2, "ves Q10:8", "name \"ves Q10\"\nid 8\n");
     list(PluginFormat::Vst2, "Off", "", false);
@@ -156,6 +157,8 @@ TEST(PluginHostLoading, ThePrefixDecidesTheHostAndTheKeyThePlugin)
                 {"vst2:Waves Waves Q10:7", "vst2:Q10:7", true},
                 {"vst2:Old Waves Q10:8", "vst2:ves Q10:8", true},
                 {"placeholder:vst2:Gone:1", "placeholder:vst2:Gone:1", true},
+                {"clap:com.a.B", "placeholder:clap:com.a.B", true}, // listed only
+                {"clap:com.a", nullptr, false},
                 {"vst3:FF112233445566778899AABBCCDDEEFF", nullptr, true},
                 {"vst3:EE112233445566778899AABBCCDDEEFF", nullptr, true},
                 {"vst3:Off", nullptr, true},

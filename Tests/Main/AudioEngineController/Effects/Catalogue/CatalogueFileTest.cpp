@@ -1,5 +1,6 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 
+#include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VST3Catalogue.h"
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Tests/Support/QtPrinters.h"
@@ -25,21 +26,22 @@ protected:
 
 TEST(CatalogueText, IsWrittenAsItWasRead)
 {
-    for (const CatalogueFormat *format : {&vstCatalogueFormat(), &vst3CatalogueFormat()}) {
-        const bool isVst3 = format == &vst3CatalogueFormat();
+    for (const PluginFormat which : {PluginFormat::Vst2, PluginFormat::Vst3, PluginFormat::Clap}) {
+        const CatalogueFormat *const format = formatInfo(which).catalogue;
+        const bool isVst2 = which == PluginFormat::Vst2;
         const QString path =
-            QStringLiteral(FXPROBE_FUZZ_CORPUS "/catalogue/every-element-vst%1.xml").arg(isVst3 ? 3 : 2);
+            QStringLiteral(FXPROBE_FUZZ_CORPUS "/catalogue/every-element-%1.xml").arg(formatInfo(which).key);
         QByteArray text;
         ASSERT_TRUE(bool(readWholeFile(path, text)));
         std::vector<EffectRecord> records = readCatalogueFile(*format, path).records;
         ASSERT_EQ(records.size(), 1u);
-        records[0].outputs = records[0].latency =
-            7; // for the one the inputs are written, for the other nothing
+        if (which != PluginFormat::Clap) // for the one the inputs are written, for the other nothing
+            records[0].outputs = records[0].latency = 7;
         EXPECT_EQ(renderCatalogue(*format, records), text.replace("\n", kLineEnd));
         EXPECT_EQ(records[0].category, 0x400u) << "EQ";
-        EXPECT_TRUE(records[0].favourite && !records[0].enabled && records[0].working == isVst3);
-        EXPECT_EQ(records[0].subId, isVst3 ? 0u : 4294967295u);
-        EXPECT_EQ(records[0].vstCategory, isVst3 ? 0 : -3);
+        EXPECT_TRUE(records[0].favourite && !records[0].enabled && records[0].working != isVst2);
+        EXPECT_EQ(records[0].subId, isVst2 ? 4294967295u : 0u);
+        EXPECT_EQ(records[0].vstCategory, isVst2 ? -3 : 0);
     }
     EXPECT_FALSE(renderRecord(vstCatalogueFormat(), EffectRecord()).contains("SubEffect"));
 }
