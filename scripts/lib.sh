@@ -43,7 +43,8 @@ build() {
 configure_windows() {
     local preset=windows-release configured=$root/build/windows-release/configured-with fresh=()
     local options=("-DFXPROBE_WINDOWS_PREFIX=$("$root/scripts/windows-toolchain" --prefix)"
-        "-DFXPROBE_WINDOWS_PLUGINS=$("$root/scripts/windows-plugins" --prefix)")
+        "-DFXPROBE_WINDOWS_PLUGINS=$("$root/scripts/windows-plugins" --prefix)"
+        "-DFXPROBE_CLAP_PLUGINS=$("$root/scripts/clap-plugins" windows --prefix)")
     [[ -f $configured && $(<"$configured") == "${options[*]}" ]] || fresh=(--fresh)
     configure "$preset" "${fresh[@]}" "${options[@]}"
     printf '%s\n' "${options[*]}" >"$configured"

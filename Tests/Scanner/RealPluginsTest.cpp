@@ -3,6 +3,9 @@
 #include "Tests/Support/VST2Fixture.h"
 
 #include <QDir>
+#include <QFile>
+#include <QFileInfo>
+#include <QProcess>
 #include <QRegularExpression>
 
 using RealPlugins = ScanBench;
@@ -38,4 +41,40 @@ TEST_F(RealPlugins, AreFoundOnceAndThenKnown)
     EXPECT_GE(met, 3);
     EXPECT_GE(first.log.count("Probing "), vst2.size() + vst3.size());
     EXPECT_EQ(scanOnce(environment).log.count("Probing "), 0);
+}
+
+TEST_F(RealPlugins, OfClapAreListedAsAListerOfItsOwnListsThem)
+{
+    const QDir built(QStringLiteral(FXPROBE_CLAP_PLUGINS));
+    QStringList files;
+    for (const QFileInfo &file : built.entryInfoList({"*.clap"}, QDir::Files))
+        files << file.filePath();
+    if (built.dirName().isEmpty() || files.isEmpty())
+        GTEST_SKIP() << "Debian's dpf-plugins are not built as CLAP";
+    QProcess lister;
+    lister.start(FXPROBE_CLAP_LISTER, files);
+    EXPECT_TRUE(lister.waitForFinished() && lister.exitCode() == 0);
+    QStringList rows =
+        QString::fromUtf8(lister.readAllStandardOutput()).remove('\r').split('\n', Qt::SkipEmptyParts);
+    EXPECT_GE(rows.size(), files.size());
+    // Some state another one's identifier, which a catalogue holds once: they are scanned apart.
+    for (int round = 0; !rows.isEmpty(); ++round) {
+        std::map<QString, QString> byId;
+        for (const QString &row : rows)
+            byId.emplace(row.section('|', 1, 1), row);
+        const QString folder = m_folder.path(QStringLiteral("Round %1").arg(round));
+        QDir().mkpath(folder);
+        QStringList expected;
+        for (const auto &[id, row] : byId) {
+            const QFileInfo file(row.section('|', 0, 0));
+            rows.removeOne(row);
+            EXPECT_TRUE(QFile::copy(file.filePath(), folder + '/' + file.fileName()));
+            expected << folder + '/' + file.fileName() + '|' + row.section('|', 1) + "|1|1";
+        }
+        m_folder.writeScanList({folder});
+        scanOnce({{"LSAN_OPTIONS", "detect_leaks=0"}}); // theirs
+        EXPECT_EQ(
+            recordsOf("CLAPConfiguration.xml", "Path ID Name Vendor Features Inputs Outputs Enabled Working"),
+            expected);
+    }
 }
