@@ -18,6 +18,7 @@ import time
 from pathlib import Path
 
 LIBRARIES = {"vst3": Path("/usr/lib/vst3"), "vst2": Path("/usr/lib/vst")}
+KINDS = [*LIBRARIES, "clap"]
 BINARY_FOLDER = "Contents/x86_64-linux"
 
 
@@ -108,6 +109,8 @@ class Bench:
         print("|---|---:|---:|---:|---:|---:|")
 
     def floor(self, folders):
+        if "clap" in folders:
+            return Process(self.programs / "clap_lister", *sorted(folders["clap"].rglob("*.clap")))
         return Process(self.programs / "load_floor", *load_arguments(folders))
 
     def row(self, name, ours, other, aim, without_start=True, share=1):
@@ -124,9 +127,9 @@ class Bench:
               flush=True)
         return statistics.median(net), statistics.median(times[2] for times in turns)
 
-    def fixtures(self, name, count):
-        """Folders with so many plug-ins of each format: links to the scripted ones, without a script."""
-        folders = {kind: self.work / name / kind for kind in LIBRARIES}
+    def fixtures(self, name, count, kinds=tuple(LIBRARIES)):
+        """Folders with so many plug-ins of these formats: links to the scripted ones, without a script."""
+        folders = {kind: self.work / name / kind for kind in kinds}
         for kind, folder in folders.items():
             folder.mkdir(parents=True)
             source = self.work / f"{kind}.so"
@@ -138,6 +141,8 @@ class Bench:
                     binaries = path.with_suffix(".vst3") / BINARY_FOLDER
                     binaries.mkdir(parents=True)
                     path = binaries / path.name
+                if kind == "clap":
+                    path = path.with_suffix(".clap")
                 os.link(source, path)
         return folders
 
@@ -191,9 +196,9 @@ class Bench:
                 workers = f"{jobs} workers" if jobs else "no workers"
                 self.row(f"first scan, {name}, {workers}, against the floor", case.first_scan(jobs), floor, aim if jobs == 4 else "",
                          share=3)
-        for kind in LIBRARIES:
+        for kind in KINDS:
             count = 1000
-            folders = {kind: self.fixtures(f"pool {kind}", count)[kind]}
+            folders = self.fixtures(f"pool {kind}", count, [kind])
             scan, floor = Case(self, f"pool {kind} case", folders.values()).first_scan(4), self.floor(folders)
             net, least = self.row(f"first scan, {count:,} fixtures, {kind}, 4 workers", scan, floor, "", share=4)
             print(f"| … our own for each file | {(net - least) / count * 1e6:.0f} µs | | | | 500 µs |")
@@ -227,13 +232,15 @@ class Bench:
             print(f"| … for each plug-in | {net / count * 1e6:.1f} µs | | | | the same |")
 
     def first_scans(self):
-        for kind in LIBRARIES:
+        for kind in KINDS:
             for count in (100, 300, 1000):
-                folders = {kind: self.fixtures(f"first {kind} {count}", count)[kind]}
+                folders = self.fixtures(f"first {kind} {count}", count, [kind])
                 scan, floor = Case(self, f"first {kind} {count} case", folders.values()).first_scan(), self.floor(folders)
                 net, least = self.row(f"first scan, {count:,} fixtures, {kind}, against the floor", scan, floor, "",
                                       share=1 + count // 300)
                 print(f"| … our own for each file | {(net - least) / count * 1e6:.0f} µs | | | | hardly grows |")
+            if kind == "clap":  # its floor tells no memory
+                continue
             output = tempfile.TemporaryFile()
             floor.run(output)
             output.seek(0)
