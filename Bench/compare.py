@@ -215,12 +215,15 @@ class Bench:
             files = sorted(folder.rglob("*.vst3" if kind == "vst3" else "*.so"))
             settings = {"environment": {"LD_LIBRARY_PATH": str(libraries), "HOME": str(home), "XDG_CACHE_HOME": str(home)},
                         "prepare": lambda home=home: shutil.rmtree(home)}
-            ours = Case(self, f"beside {program}", [folder]).first_scan()
+            case = Case(self, f"beside {program}", [folder])
+            ours = case.first_scan()
             at_once = Process(libraries / program, "-f", "-q", *files, **settings)
             one_each = Process("/bin/sh", "-c", 'program=$1; shift; for file; do "$program" -f -q "$file"; done', "sh",
                                libraries / program, *files, **settings)
             self.row(f"first scan, real {kind}, against {program}, all at once", ours, at_once, "<1", without_start=False)
             self.row(f"… and a process for each file", ours, one_each, "<1", without_start=False, share=2)
+            self.row(f"… and a process for each file, against 8 workers", case.first_scan(8), one_each, "<0.33", without_start=False,
+                     share=2)
 
     def unchanged_scans(self):
         for count in (100, 1000, 10000, 20000):
