@@ -1,5 +1,6 @@
 #include "Workstation/FxScan.h"
 
+#include "Core/BaseLib/Files/TextFile.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/WorkstationServices/AudioPlugins.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
@@ -17,6 +18,7 @@
 #include "Workstation/ShowCommand.h"
 #include "Workstation/Summary/PluginFilter.h"
 
+#include <QDir>
 #include <QFile>
 #include <QFileInfo>
 
@@ -67,6 +69,8 @@ bool print(const ScanOptions &options, const ScanSummary &summary, const QString
         return Terminal::printData(QString::fromUtf8(renderJson(summary, options.dataFolder, folders)));
     if (options.format == OutputFormat::JsonLines)
         return Terminal::printData(QString::fromUtf8(renderJsonLine(summary, options.dataFolder, folders)));
+    if (options.format == OutputFormat::Html)
+        return Terminal::printData(QString::fromUtf8(renderHtml(summary, options.dataFolder, folders)));
     for (const QString &problem : summary.problems)
         complain(problem);
     return Terminal::printData(QString::fromUtf8(renderCsv(summary)));
@@ -81,6 +85,13 @@ int conclude(const ScanOptions &options, ScanSummary summary, const QStringList 
         complain(QStringLiteral("the result could not be printed"));
         return ScanExit::kNotFinished;
     }
+    if (!options.html.isEmpty())
+        if (const FileResult written = replaceFile(
+                options.html, renderHtml(summary, options.dataFolder, folders), Durability::Buffered);
+            !written) {
+            complain(QStringLiteral("cannot write %1: %2").arg(options.html, written.reason));
+            return ScanExit::kNotFinished;
+        }
     if (summary.isScan && !summary.finished)
         return ScanExit::kNotFinished;
     return options.strict && hasFailures ? ScanExit::kFailures : ScanExit::kDone;
@@ -193,6 +204,10 @@ int prepareAndScan(const ScanOptions &options, const DataFiles &files)
 
 int runFxScan(const ScanOptions &options)
 {
+    if (!options.html.isEmpty() && !QFileInfo(options.html).dir().exists()) { // known before a long scan
+        complain(QStringLiteral("there is no folder for %1").arg(options.html));
+        return ScanExit::kUsage;
+    }
     const DataFiles files(options.dataFolder);
     if (options.foldersOnly)
         return printFolders(files.effects);

@@ -9,7 +9,7 @@ namespace {
 void setFormat(ScanOptions &options, size_t choice)
 {
     constexpr OutputFormat kFormats[] = {OutputFormat::Table, OutputFormat::Json, OutputFormat::JsonLines,
-                                         OutputFormat::Csv};
+                                         OutputFormat::Csv, OutputFormat::Html};
     options.format = kFormats[choice];
 }
 
@@ -134,11 +134,14 @@ const std::vector<OptionRow> &optionTable()
          "Forget a folder and what is known of the plug-ins below it, with categories and favourites.",
          "Makes no scan. For a drive that is gone for good: what is known of one that is away is kept "
          "otherwise."},
-        {"format", "format", ChoiceTarget{{"table", "json", "jsonl", "csv"}, setFormat},
-         "Print the result as table (the default), json, jsonl or csv.",
+        {"format", "format", ChoiceTarget{{"table", "json", "jsonl", "csv", "html"}, setFormat},
+         "Print the result as table (the default), json, jsonl, csv or html.",
          "jsonl prints one JSON object a line while the scan goes on: what each probe came to, and the "
          "result "
          "as the last one."},
+        {"html", "file", &ScanOptions::html,
+         "Also write the result to a file as a page for browsers, with a picture of the scan.",
+         "The page needs no network and no other file."},
         {"ignore", "path", &ScanOptions::ignore,
          "Never load a plug-in, or any below a folder; it is listed as ignored.",
          "Makes no scan. Its categories and favourites are kept, and so is what is known of it. The "

@@ -11,13 +11,14 @@ inline constexpr int kUsage = 2;       ///< the command line makes no sense
 inline constexpr int kNotFinished = 3; ///< the scan did not come to its end
 } // namespace ScanExit
 
-enum class OutputFormat { Table, Json, JsonLines, Csv };
+enum class OutputFormat { Table, Json, JsonLines, Csv, Html };
 
 /// What the command line asks for.
 struct ScanOptions {
     QStringList folders; ///< as given; none: the usual ones
     QString dataFolder;  ///< absolute, without a separator at its end
     OutputFormat format = OutputFormat::Table;
+    QString html;              ///< file that the page is written to; empty: none
     QStringList forget;        ///< folders that are dropped with what is known of their plug-ins
     QStringList exclude;       ///< folders that are never searched from now on
     QStringList noExclude;     ///< folders that are searched again

@@ -120,6 +120,8 @@ QByteArray csvLine(const QStringList &fields)
     return line + "\r\n";
 }
 
+} // namespace
+
 QJsonObject summaryObject(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders)
 {
     QJsonArray plugins;
@@ -138,8 +140,6 @@ QJsonObject summaryObject(const ScanSummary &summary, const QString &dataFolder,
     }
     return object;
 }
-
-} // namespace
 
 QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders)
 {

@@ -3,6 +3,7 @@
 #include "Workstation/Summary/ScanSummary.h"
 
 #include <QByteArray>
+#include <QJsonObject>
 #include <QString>
 #include <QStringList>
 
@@ -16,5 +17,12 @@ QByteArray renderJsonLine(const ScanSummary &summary, const QString &dataFolder,
 /// The plug-ins, one a line, as comma-separated values with a line of titles (RFC 4180).
 QByteArray renderCsv(const ScanSummary &summary);
 
+/// The summary as a page for browsers that needs nothing else; page/page.html is its template.
+QByteArray renderHtml(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
+
+/// The members of the JSON.
+QJsonObject summaryObject(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
+/// How many plug-ins there are, by state, and what changed: one line with its end.
+QString renderCounts(const ScanSummary &summary);
 /// Channels of a plug-in as far as its catalogue or its last probe tells.
 QString channelsText(const CataloguedPlugin &plugin);

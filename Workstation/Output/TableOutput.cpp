@@ -121,6 +121,8 @@ void addCount(QStringList &parts, std::size_t count, const char *what)
         parts.append(QStringLiteral("%1 %2").arg(count).arg(QLatin1String(what)));
 }
 
+} // namespace
+
 QString renderCounts(const ScanSummary &summary)
 {
     std::map<PluginState, std::size_t> states;
@@ -162,8 +164,6 @@ QString renderCounts(const ScanSummary &summary)
             text += QLatin1String("; ") + part.join(QLatin1String(", "));
     return text + QLatin1Char('\n');
 }
-
-} // namespace
 
 QString channelsText(const CataloguedPlugin &plugin)
 {

@@ -176,6 +176,7 @@ ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const 
     addSkipped(summary, account);
     addSlowest(summary, account);
     summary.duplicates = findDuplicates(summary.plugins, memory);
+    summary.timeline = timelineOf(account);
     return summary;
 }
 

@@ -4,6 +4,7 @@
 #include "Workstation/Summary/CatalogueView.h"
 #include "Workstation/Summary/Duplicates.h"
 #include "Workstation/Summary/ScanAccount.h"
+#include "Workstation/Summary/ScanTimeline.h"
 
 /// A plug-in, or a file that was taken for one, that cannot be used.
 struct PluginFailure {
@@ -31,6 +32,7 @@ struct ScanSummary {
     QStringList problems;                 ///< one sentence each
     std::vector<Duplicate> duplicates;    ///< by name
     std::vector<ProbeTime> slowest;       ///< the slowest first
+    ScanTimeline timeline;
     QStringList removed;                  ///< names of what is gone
     QStringList skipped;                  ///< paths that the user passed over in this scan
     std::size_t all = 0;                  ///< plug-ins of which only some are shown; 0: all are shown

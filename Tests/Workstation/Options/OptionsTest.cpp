@@ -45,8 +45,8 @@ TEST(Options, WrongOnesAreNamedWithWhatToDo)
         QStringList arguments;
         const char *message;
     } rows[] = {
-        {{"--format", "xml"}, "unknown format 'xml'; use table, json, jsonl or csv"},
-        {{"--format", "JSON"}, "unknown format 'JSON'; use table, json, jsonl or csv"},
+        {{"--format", "xml"}, "unknown format 'xml'; use table, json, jsonl, csv or html"},
+        {{"--format", "JSON"}, "unknown format 'JSON'; use table, json, jsonl, csv or html"},
         {{"--timeout", "%1"}, "--timeout must be 0 to 86400 seconds, not '%1'"},
         {{"--timeout", "86401"}, "--timeout must be 0 to 86400 seconds, not '86401'"},
         {{"--retry", "A", "--retry", ""}, "--retry needs a name"},
@@ -82,7 +82,7 @@ TEST(Options, BashCompletesThem)
     if (bash.isEmpty())
         GTEST_SKIP() << "there is no bash on this machine";
     EXPECT_EQ(completions(bash, {"--retry-"}), QStringList({"--retry-changed", "--retry-failed"}));
-    EXPECT_EQ(completions(bash, {"--format", ""}), QStringList({"table", "json", "jsonl", "csv"}));
+    EXPECT_EQ(completions(bash, {"--format", ""}), QStringList({"table", "json", "jsonl", "csv", "html"}));
     EXPECT_EQ(completions(bash, {"--timeout", ""}), QStringList());
     EXPECT_EQ(completions(bash, {"--data-folder", "/us"}), QStringList("/usr"));
     EXPECT_EQ(completions(bash, {"/us"}), QStringList("/usr"));
