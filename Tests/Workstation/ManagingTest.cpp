@@ -145,6 +145,19 @@ TEST_F(Managing, WhatIsAskedAgainIsNamedOrAll)
     }
 }
 
+TEST_F(Managing, OnlyWhatTheScanIsLimitedToIsAskedAgain)
+{
+    put("a/Crash.vst3", "fault initialize abort\n");
+    put("b/Kill.vst3", "fault initialize abort\n");
+    scan();
+    for (const char *options : {"--retry-failed @a", "--retry-failed --rescan-all @a"}) {
+        EXPECT_EQ(runLine(options).exitCode, 0);
+        EXPECT_EQ(asked(), "Crash");
+        EXPECT_EQ(marks(), "Crashx Killx") << "that of the other stays disabled";
+    }
+    EXPECT_EQ(runLine("--retry Kill @a").exitCode, 2);
+}
+
 TEST_F(Managing, WhatMayWorkNowIsAskedAgain)
 {
     put("Same.vst3", "fault initialize abort\n");

@@ -4,6 +4,8 @@
 
 #include <QStringList>
 
+#include <algorithm>
+
 namespace {
 
 QString render(const Duplicate &duplicate)
@@ -35,5 +37,8 @@ QString renderDuplicates(const ScanSummary &summary)
     QString text = QStringLiteral("More than once:\n");
     for (const Duplicate &duplicate : summary.duplicates)
         text += render(duplicate);
-    return text + QStringLiteral("  To leave one out: fxscan --switch-off PATH\n\n");
+    const auto isMoreThanOneUsed = [](const Duplicate &duplicate) { return duplicate.members[1].isUsed; };
+    if (std::any_of(summary.duplicates.begin(), summary.duplicates.end(), isMoreThanOneUsed))
+        text += QStringLiteral("  To leave one out: fxscan --switch-off PATH\n");
+    return text + QLatin1Char('\n');
 }
