@@ -1,5 +1,6 @@
 #include "Workstation/ScanFolders.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
@@ -14,6 +15,8 @@
 #include <algorithm>
 
 namespace {
+
+constexpr std::chrono::seconds kPatience(5); ///< with a folder that was given and gives no answer
 
 bool isModuleName(const QString &path)
 {
@@ -57,6 +60,10 @@ QStringList settleGiven(const QStringList &given, const QStringList &excluded, Q
     QStringList paths;
     for (const QString &each : given) {
         const QString path = settledPath(each);
+        if (!answerInTime(kPatience, [path] { return QFileInfo::exists(path); })) {
+            leftOut.append(QStringLiteral("'%1' gives no answer").arg(each));
+            continue;
+        }
         const bool isModule = isModuleName(path) && QFileInfo(path).isFile();
         const SettledFolders folder = isModule ? SettledFolders{{path}, {}} : settleFolders({path});
         if (!isModule && QFileInfo(path).isFile())

@@ -51,6 +51,7 @@ remove Effects/FXScan.xml
 shows @/Plugins/a @/Plugins/drive: One ok, Two ok
 move Plugins/drive unplugged
 shows : One ok, Two folder away
+fxscan 0 : Problem: @/Plugins/drive could not be searched: it does not exist.
 fxscan 2 @/Plugins/drive: there is no folder
 fxscan 0 --forget @/Plugins/drive: 1 plug-in dropped
 listed: @/Plugins/a

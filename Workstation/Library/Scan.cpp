@@ -116,8 +116,6 @@ QStringList listed(const QStringList &folders, QStringList &problems)
     QStringList list;
     for (const QString &given : folders) {
         const QString folder = absolute(given);
-        if (!QFileInfo(folder).isDir())
-            problems.append(QStringLiteral("there is no folder %1").arg(folder));
         if (!canStandInScanList(folder))
             problems.append(
                 QStringLiteral("the name of the folder %1 cannot stand in a scan list").arg(folder));

@@ -50,7 +50,9 @@ void Progress::show(ScanAccount &account)
 {
     if (m_isQuiet)
         return;
-    if (!m_isTerminal)
+    if (!account.looking().isEmpty())
+        showLooking(account.looking());
+    else if (!m_isTerminal)
         showLines(account);
     else if (const PluginKey *key = account.current())
         showLine(account, *key);
@@ -68,13 +70,35 @@ void Progress::showLine(const ScanAccount &account, const PluginKey &key)
     if (!(key == m_shown))
         m_since.start();
     m_shown = key;
+    const QString time = m_since.elapsed() < kSlow ? QString() : QLatin1String("  ") + timeText(m_keys);
+    showText(countOf(account) + QLatin1Char(' ') + nameOf(account, key) + time);
+}
+
+/// A folder that gives no answer.
+void Progress::showLooking(const QString &folder)
+{
+    const QString text = QStringLiteral("Looking in %1").arg(folder);
+    if (folder != m_looking) {
+        m_since.start();
+        m_shown = PluginKey();
+        if (!m_isTerminal)
+            Terminal::printError(Terminal::harmless(text) + QLatin1Char('\n'));
+    }
+    m_looking = folder;
+    if (m_isTerminal)
+        showText(text + QLatin1Char(' ') + timeText(QString()));
+}
+
+/// "(12 s of 60)"
+QString Progress::timeText(const QString &keys) const
+{
     const QString limit = m_limit > 0 ? QStringLiteral(" of %1").arg(m_limit) : QString();
-    const QString time =
-        m_since.elapsed() < kSlow
-            ? QString()
-            : QStringLiteral("  (%1 s%2%3)").arg(m_since.elapsed() / 1000).arg(limit, m_keys);
-    const QString text =
-        Terminal::harmless(countOf(account) + QLatin1Char(' ') + nameOf(account, key) + time);
+    return QStringLiteral("(%1 s%2%3)").arg(m_since.elapsed() / 1000).arg(limit, keys);
+}
+
+void Progress::showText(const QString &given)
+{
+    const QString text = Terminal::harmless(given);
     const QString line = Terminal::cell(text, Terminal::errorWidth() - 1).trimmed();
     if (line == m_line)
         return;

@@ -26,6 +26,9 @@ public:
 private:
     void showLines(ScanAccount &account);
     void showLine(const ScanAccount &account, const PluginKey &key);
+    void showLooking(const QString &folder);
+    QString timeText(const QString &keys) const;
+    void showText(const QString &given);
 
     bool m_isQuiet;
     bool m_isTerminal;
@@ -33,5 +36,6 @@ private:
     QString m_keys;
     QString m_line;    ///< as it stands on the terminal
     PluginKey m_shown; ///< what it is about
+    QString m_looking; ///< the folder that it was about last
     QElapsedTimer m_since;
 };

@@ -1,5 +1,6 @@
 #include "Workstation/Summary/CatalogueView.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CategoryTable.h"
@@ -9,6 +10,7 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QHash>
 
 #include <algorithm>
 #include <array>
@@ -48,11 +50,28 @@ QString badText(const EffectRecord &record)
     return QString();
 }
 
+/// Whether the system tells anything of a folder; one that does not answer, as on a network drive whose
+/// server is gone, is not asked again.
+bool answers(const QString &folder)
+{
+    thread_local QHash<QString, bool> known;
+    thread_local std::chrono::milliseconds patience(2000); // after the first that does not answer less
+    if (const auto before = known.constFind(folder); before != known.constEnd())
+        return *before;
+    const bool answers = answerInTime(patience, [folder] { return QFileInfo::exists(folder); }).has_value();
+    if (!answers)
+        patience = std::chrono::milliseconds(200);
+    known.insert(folder, answers);
+    return answers;
+}
+
 /// Whether a file is not there because its folder is not, or is empty, or because what it is a link to is
 /// not.
 bool isAway(const QString &path)
 {
     const QFileInfo file(path);
+    if (!answers(file.path()))
+        return true;
     return !file.exists() && (!file.dir().exists() || file.dir().isEmpty() || leadsNowhere(path) ||
                               leadsNowhere(bundleOf(path)));
 }
@@ -83,7 +102,8 @@ void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder,
         if (record.standsForFile() && described.count(record.path) != 0)
             continue; // its plug-ins are shown, each with the reason that the file has
         view.plugins.push_back({&format, record, QString(), isOfCrashedFile(record), isAway(record.path)});
-        view.plugins.back().isIgnored = record.isIgnored() || rules.isIgnored(record.path);
+        view.plugins.back().isIgnored =
+            record.isIgnored() || (!view.plugins.back().isAway && rules.isIgnored(record.path));
         if (CataloguedPlugin &plugin = view.plugins.back(); plugin.state() == PluginState::Disabled) {
             const QString now = PluginHost::instance().host(format.format).moduleTime(record.path);
             plugin.hasChanged = !now.isEmpty() && now != record.fileTime;

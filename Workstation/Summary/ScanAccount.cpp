@@ -33,7 +33,11 @@ void ScanAccount::takeLine(const ReportLine &line)
     m_lastTime = std::max(m_lastTime, line.time - m_began);
     m_finished = line.event == Event::Finished;
     m_busy = line.event == Event::Busy;
+    m_looking = line.event == Event::Looking ? line.path : QString();
     switch (line.event) {
+    case Event::Unsearched:
+        addProblem(QStringLiteral("%1 could not be searched: %2").arg(line.path, line.reason));
+        break;
     case Event::Start:
         m_done += static_cast<int>(std::count_if(m_open.begin(), m_open.end(),
                                                  [](const Open &open) { return open.key.subId == 0; }));
@@ -69,6 +73,7 @@ void ScanAccount::takeLine(const ReportLine &line)
     case Event::WorkerEnd: // what it was busy with is begun again, or has ended
         closeOpen([&](const Open &open) { return open.worker == line.worker; }, std::nullopt);
         break;
+    case Event::Looking:
     case Event::Ended:
     case Event::Unknown:
         break;

@@ -93,6 +93,8 @@ public:
     bool isFinished() const { return m_finished; }
     /// The last scanner found another one at work.
     bool isBusy() const { return m_busy; }
+    /// The folder, or link, for which the search waits; empty when it waits for none.
+    const QString &looking() const { return m_looking; }
     /// What kept a scanner from its work; one sentence each.
     const QStringList &problems() const { return m_problems; }
 
@@ -127,6 +129,7 @@ private:
     std::vector<ProbeSpan> m_spans;
     std::map<PluginKey, ProbeAccount> m_probes;
     QStringList m_problems;
+    QString m_looking;
     int m_done = 0;
     int m_planned = 0;
     bool m_finished = false;

@@ -8,9 +8,11 @@
 #include <QFileInfo>
 
 #include <algorithm>
+#include <condition_variable>
 #include <iterator>
 #include <mutex>
 #include <set>
+#include <thread>
 
 namespace {
 
@@ -38,12 +40,13 @@ Reports &reports()
 
 void logUnsearchable(const QString &folder, const QString &reason)
 {
-    if (reason.isEmpty())
-        return;
     const std::lock_guard<std::mutex> lock(reports().mutex);
     if (reports().folders.insert(folder).second)
         DebugLog(L"Cannot search the folder \"%ls\": %ls", folder, reason);
 }
+
+constexpr std::chrono::seconds kTold(1); ///< between two words on a folder that gives no answer
+constexpr std::chrono::milliseconds kLook(50);
 
 /// What a path becomes when the folder at its start is reached by another one.
 QString moved(const QString &path, const QString &from, const QString &to)
@@ -55,6 +58,23 @@ QString moved(const QString &path, const QString &from, const QString &to)
 }
 
 } // namespace
+
+/// A search on a thread of its own, seen by the one that waits for it. Whoever gave up does not look at the
+/// finder any more.
+struct FileFinder::Watch {
+    explicit Watch(const FileFinder &of)
+        : finder(of)
+    {}
+
+    std::mutex mutex; ///< guards what follows, but the finder and its answer until `isDone`
+    std::condition_variable done;
+    QString atHand; ///< what the system is asked about
+    std::chrono::steady_clock::time_point since;
+    bool isDone = false;
+    bool isGivenUp = false;
+    FileFinder finder;
+    bool isWhole = false;
+};
 
 FileFinder::FileFinder(const QStringList &endings, Links links)
     : m_endings(endings)
@@ -69,7 +89,8 @@ void FileFinder::forgetReports()
 
 QStringList FileFinder::find(const QStringList &folders, const QString &ending, const Cancelled &isCancelled)
 {
-    const bool isWhole = (!folders.isEmpty() && folders == m_folders) || search(folders, isCancelled);
+    const bool isWhole =
+        (!folders.isEmpty() && folders == m_folders) || searchPatiently(folders, isCancelled);
     m_folders = isWhole ? folders : QStringList();
     QStringList paths;
     std::copy_if(m_found.begin(), m_found.end(), std::back_inserter(paths),
@@ -106,12 +127,119 @@ bool FileFinder::isLookedFor(const QString &name) const
                        [&](const QString &ending) { return name.endsWith(ending, Qt::CaseInsensitive); });
 }
 
+void FileFinder::setPatience(std::chrono::seconds limit, Waiting waiting)
+{
+    m_limit = limit;
+    m_waiting = std::move(waiting);
+}
+
+std::vector<FileFinder::Problem> FileFinder::takeProblems()
+{
+    std::vector<Problem> problems;
+    problems.swap(m_problems);
+    return problems;
+}
+
+void FileFinder::addProblem(const QString &path, const QString &reason)
+{
+    if (!reason.isEmpty())
+        m_problems.push_back({path, reason});
+}
+
+/// Whether a path gave no answer before. Else whoever waits hears that it is asked now.
+bool FileFinder::isPassedOver(const QString &path)
+{
+    if (isBelowAny(path, m_silent))
+        return true;
+    if (m_watch) {
+        const std::lock_guard<std::mutex> lock(m_watch->mutex);
+        m_watch->atHand = path;
+        m_watch->since = std::chrono::steady_clock::now();
+    }
+    return false;
+}
+
+/// False when it ended early.
+bool FileFinder::searchPatiently(const QStringList &folders, const Cancelled &isCancelled)
+{
+    bool isWhole = false;
+    if (!m_waiting) {
+        isWhole = search(folders, isCancelled);
+    } else {
+        m_silent.clear();
+        for (bool isOver = false; !isOver;) {
+            const auto watch = std::make_shared<Watch>(*this);
+            watch->since = std::chrono::steady_clock::now();
+            std::thread thread([watch, folders] {
+                watch->finder.m_watch = watch;
+                const bool isFound = watch->finder.search(folders, [&watch] {
+                    const std::lock_guard<std::mutex> lock(watch->mutex);
+                    return watch->isGivenUp;
+                });
+                watch->finder.m_watch.reset();
+                const std::lock_guard<std::mutex> lock(watch->mutex);
+                watch->isWhole = isFound;
+                watch->isDone = true;
+                watch->done.notify_all();
+            });
+            if (waitFor(watch, isCancelled)) {
+                thread.join();
+                *this = watch->finder;
+                isWhole = watch->isWhole && !(isCancelled && isCancelled());
+                isOver = true;
+            } else { // it ends when the system answers, and nobody asks for what it found
+                thread.detach();
+                isOver = isCancelled && isCancelled();
+            }
+        }
+    }
+    for (const QString &path : m_silent) {
+        m_unread.append(path);
+        addProblem(path, QStringLiteral("it gave no answer for %1 s").arg(m_limit.count()));
+    }
+    for (const Problem &problem : m_problems)
+        logUnsearchable(problem.path, problem.reason);
+    return isWhole;
+}
+
+/// Waits for a search. False when it was given up: somebody cancelled, or the path at hand gave no answer,
+/// which is noted.
+bool FileFinder::waitFor(const std::shared_ptr<Watch> &watch, const Cancelled &isCancelled)
+{
+    auto told = std::chrono::steady_clock::now();
+    std::unique_lock<std::mutex> lock(watch->mutex);
+    while (!watch->done.wait_for(lock, kLook, [&] { return watch->isDone; })) {
+        const auto now = std::chrono::steady_clock::now();
+        const bool isSilent = m_limit.count() > 0 && now - watch->since >= m_limit;
+        const bool isSlow = now - std::max(watch->since, told) >= kTold;
+        const QString atHand = watch->atHand;
+        lock.unlock(); // others' code follows
+        const bool isOver = isSilent || (isCancelled && isCancelled());
+        if (isSlow && !isOver) {
+            m_waiting(atHand);
+            told = now;
+        }
+        lock.lock();
+        if (isOver && !watch->isDone) {
+            watch->isGivenUp = true;
+            if (isSilent)
+                m_silent.append(atHand);
+            return false;
+        }
+    }
+    return true;
+}
+
 /// False when it ended early.
 bool FileFinder::search(const QStringList &folders, const Cancelled &isCancelled)
 {
-    const SearchArea area = m_area;
-    *this = FileFinder(m_endings, m_links);
-    m_area = area;
+    FileFinder fresh(m_endings, m_links);
+    fresh.m_area = m_area;
+    fresh.m_limit = m_limit;
+    fresh.m_waiting = m_waiting;
+    fresh.m_watch = m_watch;
+    fresh.m_silent = m_silent;
+    *this = std::move(fresh);
     const std::vector<Place> starts = settleStarts(folders);
     listStarts(starts);
     for (const Place &start : starts)
@@ -132,11 +260,11 @@ std::vector<FileFinder::Place> FileFinder::settleStarts(const QStringList &folde
     std::vector<Place> starts;
     for (const QString &folder : folders) {
         if (folder.isEmpty()) { // made absolute, it would be the working folder
-            logUnsearchable(folder, QStringLiteral("no folder is given"));
+            addProblem(folder, QStringLiteral("no folder is given"));
             continue;
         }
         const QString path = QDir::cleanPath(QFileInfo(folder).absoluteFilePath());
-        if (m_area.isExcluded(path))
+        if (m_area.isExcluded(path) || isPassedOver(path))
             continue;
         const Place start{path, realPath(path).value_or(path)};
         const QString before = searchedAs(start.real);
@@ -195,14 +323,20 @@ bool FileFinder::searchFolder(const Place &start, const QString &folder, const C
 {
     if (isCancelled && isCancelled())
         return false;
-    const FolderContent content = listFolder(folder);
+    if (isPassedOver(folder))
+        return true;
+    const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
+    const FolderContent content =
+        listFolder(folder, [&](const QString &name) { return !isPassedOver(prefix + name); });
     if (!content.problem.isEmpty()) {
         m_unread.append(folder);
-        logUnsearchable(folder, content.problem);
+        addProblem(folder, content.problem);
     } else if (content.entries.empty()) {
-        logUnsearchable(folder, reasonAgainst(QFileInfo(folder)));
+        addProblem(folder, reasonAgainst(QFileInfo(folder)));
     }
-    const QString prefix = folder.endsWith(QLatin1Char('/')) ? folder : folder + QLatin1Char('/');
+    for (const FolderEntry &entry : content.unnamed)
+        if (entry.isFolder || isLookedFor(entry.name))
+            addProblem(prefix + entry.name, QStringLiteral("its name is not valid text"));
     for (const FolderEntry &entry : content.entries) {
         if (entry.isLink && m_links == Links::Followed)
             m_met.push_back({prefix + entry.name, entry.isFolder});
@@ -238,6 +372,8 @@ bool FileFinder::wasReached(const Reached &reached, const Place &start, const QS
 /// Searches the folder that a link leads to, and lists what is looked for. False when it ended early.
 bool FileFinder::follow(const Link &link, const Cancelled &isCancelled)
 {
+    if (isPassedOver(link.path))
+        return true;
     const std::optional<QString> real = realPath(link.path);
     const auto isInside = [&](const QString &folder) { return isBelow(folder, *real); };
     if (!real || std::any_of(m_realFolders.begin(), m_realFolders.end(), isInside))

@@ -6,7 +6,9 @@
 #include <QString>
 #include <QStringList>
 
+#include <chrono>
 #include <functional>
+#include <memory>
 #include <vector>
 
 /// Finds files and folders by the ends of their names, in some folders and all folders below them. Each
@@ -38,6 +40,12 @@ public:
     void setArea(const SearchArea &area);
     const SearchArea &area() const { return m_area; }
 
+    /// How long searches wait for a folder, which may lie on a drive whose server is gone, and whom they tell
+    /// of one that takes longer than a second, each second anew. `limit` 0: for ever. Without this call a
+    /// search waits for ever and tells nobody.
+    using Waiting = std::function<void(const QString &folder)>;
+    void setPatience(std::chrono::seconds limit, Waiting waiting);
+
     /// The path under which the last search came upon what this other path leads to as well; null when it
     /// knows of no such path.
     QString foundInsteadOf(const QString &path) const;
@@ -45,8 +53,16 @@ public:
     /// see all links.
     bool hasOtherPaths() const { return !m_otherPaths.empty() || m_area.isLimited(); }
 
-    /// The folders so far of which not all could be read.
+    /// The folders so far of which not all could be read, and links that gave no answer.
     const QStringList &unread() const { return m_unread; }
+
+    /// A path, and why it, or something in it, could not be searched.
+    struct Problem {
+        QString path;
+        QString reason;
+    };
+    /// What came up in the search, handed out once.
+    std::vector<Problem> takeProblems();
 
     /// Folders that cannot be read are reported again from now on.
     static void forgetReports();
@@ -64,7 +80,13 @@ private:
     /// Paths by the keys of the real ones.
     using Reached = QHash<QString, QString>;
 
+    struct Watch;
+
     bool isLookedFor(const QString &name) const;
+    bool isPassedOver(const QString &path);
+    void addProblem(const QString &path, const QString &reason);
+    bool searchPatiently(const QStringList &folders, const Cancelled &isCancelled);
+    bool waitFor(const std::shared_ptr<Watch> &watch, const Cancelled &isCancelled);
     bool search(const QStringList &folders, const Cancelled &isCancelled);
     std::vector<Place> settleStarts(const QStringList &folders);
     bool searchFolder(const Place &start, const QString &folder, const Cancelled &isCancelled);
@@ -81,6 +103,11 @@ private:
     QStringList m_endings;
     Links m_links;
     SearchArea m_area;
+    std::chrono::seconds m_limit{0};
+    Waiting m_waiting;              ///< null: nobody waits with patience
+    std::shared_ptr<Watch> m_watch; ///< who waits for this search; null: nobody
+    QStringList m_silent;           ///< paths that gave no answer in time
+    std::vector<Problem> m_problems;
     QStringList m_folders; ///< that were searched last
     QStringList m_found;   ///< in them, of all endings
     QStringList m_unread;

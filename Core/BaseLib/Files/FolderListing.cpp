@@ -26,9 +26,9 @@ void sortByName(std::vector<FolderEntry> &entries)
 
 } // namespace
 
-FolderContent listFolder(const QString &folder)
+FolderContent listFolder(const QString &folder, const MayFollow &mayFollow)
 {
-    FolderContent content = readFolder(folder);
+    FolderContent content = readFolder(folder, mayFollow);
     if (content.entries.size() > 1) // most folders of a bundle hold one
         sortByName(content.entries);
     return content;

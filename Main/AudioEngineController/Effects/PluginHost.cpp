@@ -243,9 +243,14 @@ bool PluginHost::scanHosts(bool scan)
         if (info.isScanned())
             endings.append(info.moduleEnding);
     const auto finder = std::make_shared<FileFinder>(endings);
-    if (scan)
+    if (scan) {
         finder->setArea(
             {m_only.isEmpty() ? searchedOnly() : m_only, readFolderRules(effectsFolder()).excluded});
+        finder->setPatience(std::chrono::seconds(m_probeLimit > 0
+                                                     ? m_probeLimit
+                                                     : qEnvironmentVariableIntValue("FXPROBE_PROBE_LIMIT")),
+                            [](const QString &folder) { ProbeReport::instance().looking(folder); });
+    }
     const std::shared_ptr<ProbePool> pool = scan ? poolOfEnvironment() : nullptr;
     const auto memory = std::make_shared<ProbeMemory>(effectsFolder());
     forEachHost([&](AudioPluginHost &host) {

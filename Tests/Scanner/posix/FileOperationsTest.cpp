@@ -1,6 +1,7 @@
 #include "Tests/Scanner/InterruptedScan.h"
 #include "Tests/Support/VST3Fixture.h"
 
+#include <cstdio>
 #include <set>
 
 namespace {
@@ -67,6 +68,11 @@ protected:
         }
     }
 
+    static QStringList sorted(QStringList list)
+    {
+        list.sort();
+        return list;
+    }
     /// A file that crashed has a record of its own beside its class's.
     QStringList distinctNames() const
     {
@@ -79,6 +85,7 @@ protected:
 };
 
 using UnreadableInput = TracedScan;
+using SilentFolder = TracedScan;
 class FileOperations : public TracedScan, public testing::WithParamInterface<Disturbance> {};
 
 } // namespace
@@ -117,5 +124,39 @@ TEST_F(UnreadableInput, ChangesNothing)
         EXPECT_EQ(m_folder.catalogue(), m_listed);
         expectSettled();
         m_folder.write(cataloguePath(), m_listed);
+    }
+}
+
+TEST_F(SilentFolder, IsGivenUpWithWhatIsKnownOfItKept)
+{
+    addVST3File(m_folder.path("Drive"), "Far");
+    addVST3File(m_folder.path("Plugins/sub"), "Near");
+    m_folder.writeScanList({m_folder.path("Drive"), m_folder.plugins()});
+    scan();
+    const QStringList listed = sortedRecords("Name");
+    addVST3File(m_folder.plugins(), "New");
+    m_folder.write("Plugins/x", {});
+    ASSERT_EQ(std::rename(m_folder.path("Plugins/x").toLocal8Bit(),
+                          m_folder.plugins().toLocal8Bit() + "/caf\xE9.vst3"),
+              0);
+    const QString silent[] = {m_folder.path("Drive"), m_folder.path("Plugins/sub")};
+    QStringList options{"-e", "inject=getdents64:delay_enter=9000000"};
+    for (const QString &folder : silent)
+        options += QStringList{"-P", folder};
+    qputenv("FXPROBE_PROBE_LIMIT", "3");
+    qputenv("FXPROBE_REPORT", m_folder.path("report").toLocal8Bit());
+    const ScannerOutcome outcome = trace(options);
+    qunsetenv("FXPROBE_PROBE_LIMIT");
+    qunsetenv("FXPROBE_REPORT");
+    EXPECT_TRUE(outcome.succeeded());
+    EXPECT_EQ(sortedRecords("Name"), sorted(listed + QStringList("New"))) << qPrintable(outcome.log);
+    const QString report = m_folder.read("report");
+    EXPECT_TRUE(report.contains(R"(/caf\\xe9.vst3","reason":"its name is not valid text")"))
+        << qPrintable(report);
+    for (const QString &folder : silent) {
+        EXPECT_TRUE(report.contains("{\"event\":\"looking\",\"path\":\"" + folder + '"'))
+            << qPrintable(report);
+        EXPECT_TRUE(outcome.log.contains(folder + "\": it gave no answer for 3 s"))
+            << qPrintable(outcome.log);
     }
 }

@@ -37,20 +37,34 @@ QString textOf(const dirent64 &entry)
     return isDoubtful && QFile::encodeName(name) != entry.d_name ? QString() : name;
 }
 
-void add(std::vector<FolderEntry> &entries, int folder, const dirent64 &entry)
+/// The name with its bytes that are not ASCII spelt out.
+QString speltOut(const dirent64 &entry)
+{
+    QString text;
+    for (const char *byte = entry.d_name; *byte != '\0'; ++byte)
+        text += *byte > 0 ? QString(QLatin1Char(*byte))
+                          : QStringLiteral("\\x%1").arg(static_cast<unsigned char>(*byte), 0, 16);
+    return text;
+}
+
+void add(FolderContent &content, int folder, const dirent64 &entry, const MayFollow &mayFollow)
 {
     if (entry.d_name[0] == '.')
         return;
     const mode_t own = ownKind(folder, entry);
+    const QString name = textOf(entry);
+    if (own == S_IFLNK && mayFollow && !mayFollow(name))
+        return;
     const mode_t target = own == S_IFLNK ? kindOf(folder, entry, 0) : own;
-    const QString name = target == S_IFDIR || target == S_IFREG ? textOf(entry) : QString();
-    if (!name.isNull())
-        entries.push_back({name, target == S_IFDIR, own == S_IFLNK});
+    if (target != S_IFDIR && target != S_IFREG)
+        return;
+    (name.isNull() ? content.unnamed : content.entries)
+        .push_back({name.isNull() ? speltOut(entry) : name, target == S_IFDIR, own == S_IFLNK});
 }
 
 } // namespace
 
-FolderContent readFolder(const QString &folder)
+FolderContent readFolder(const QString &folder, const MayFollow &mayFollow)
 {
     FolderContent content;
     const int descriptor = open(QFile::encodeName(folder).constData(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
@@ -65,7 +79,7 @@ FolderContent readFolder(const QString &folder)
     while ((filled = getdents64(descriptor, buffer, sizeof buffer)) > 0)
         for (ssize_t place = 0; place < filled;) {
             const auto *entry = reinterpret_cast<const dirent64 *>(buffer + place);
-            add(content.entries, descriptor, *entry);
+            add(content, descriptor, *entry, mayFollow);
             place += entry->d_reclen;
         }
     if (filled < 0)

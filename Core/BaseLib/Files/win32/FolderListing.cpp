@@ -21,13 +21,16 @@ bool isLink(const WIN32_FIND_DATAW &entry)
            tag == 0; // NOTE: Wine gives links of the system that it runs on no tag
 }
 
-void add(std::vector<FolderEntry> &entries, const WIN32_FIND_DATAW &entry)
+void add(FolderContent &content, const WIN32_FIND_DATAW &entry)
 {
     const QString name = QString::fromWCharArray(entry.cFileName);
     const bool isHidden = (entry.dwFileAttributes & FILE_ATTRIBUTE_HIDDEN) != 0;
-    if (name == QLatin1String(".") || name == QLatin1String("..") || isHidden || !isText(name))
+    if (name == QLatin1String(".") || name == QLatin1String("..") || isHidden)
         return;
-    entries.push_back({name, (entry.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) != 0, isLink(entry)});
+    const bool isNamed = isText(name);
+    (isNamed ? content.entries : content.unnamed)
+        .push_back({isNamed ? name : QString::fromUtf8(name.toUtf8()),
+                    (entry.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) != 0, isLink(entry)});
 }
 
 /// Whether nothing could be listed because there is no such folder.
@@ -40,7 +43,8 @@ bool isAbsent(const QString &folder, DWORD error)
 
 } // namespace
 
-FolderContent readFolder(const QString &folder)
+/// It tells links apart without following them.
+FolderContent readFolder(const QString &folder, const MayFollow &)
 {
     FolderContent content;
     WIN32_FIND_DATAW entry = {};
@@ -53,7 +57,7 @@ FolderContent readFolder(const QString &folder)
     }
     const auto close = qScopeGuard([search] { FindClose(search); });
     do
-        add(content.entries, entry);
+        add(content, entry);
     while (FindNextFileW(search, &entry));
     if (const DWORD error = GetLastError(); error != ERROR_NO_MORE_FILES)
         content.problem = systemMessage(error, folder);

@@ -109,6 +109,8 @@ QStringList FolderScan::findModules() const
 {
     QStringList paths =
         m_finder->find(m_host.folders(), m_host.info().moduleEnding, [this] { return isCancelled(); });
+    for (const FileFinder::Problem &problem : m_finder->takeProblems())
+        ProbeReport::instance().unsearched(problem.path, problem.reason);
     const auto isPart = [this](const QString &path) { return !m_host.isModule(path); };
     paths.erase(std::remove_if(paths.begin(), paths.end(), isPart), paths.end());
     if (m_finder->hasOtherPaths())

@@ -100,10 +100,9 @@ std::optional<ScannerRunEnd::How> ScannerLauncher::runOnce(const Job &job)
     for (const auto &[variable, value] : job.environment)
         scanner.setEnvironment(variable, value);
     scanner.setEnvironment("FXPROBE_JOBS", std::max(job.jobs, 0)); // whatever this process has
-    if (job.jobs > 0) {
-        scanner.setEnvironment("FXPROBE_PROBE_LIMIT", job.probeLimit);
+    scanner.setEnvironment("FXPROBE_PROBE_LIMIT", job.probeLimit);
+    if (job.jobs > 0)
         scanner.setEnvironment("FXPROBE_MEMORY_LIMIT", job.memoryLimit);
-    }
     scanner.setEnvironment(ScanControl::kVariable, 1);
     m_passedOn = 0;
     ScannerRunEnd end;

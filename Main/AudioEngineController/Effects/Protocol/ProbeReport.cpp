@@ -154,6 +154,13 @@ void ProbeReport::unreadList(const QString &path, const QString &reason)
     write("unreadList", {{QLatin1String(kPath), path}, {QLatin1String(kReason), reason}});
 }
 
+void ProbeReport::looking(const QString &path) { write("looking", {{QLatin1String(kPath), path}}); }
+
+void ProbeReport::unsearched(const QString &path, const QString &reason)
+{
+    write("unsearched", {{QLatin1String(kPath), path}, {QLatin1String(kReason), reason}});
+}
+
 void ProbeReport::busy() { write("busy", {}); }
 
 void ProbeReport::finish() { write(m_complete ? "finished" : "ended", {}); }

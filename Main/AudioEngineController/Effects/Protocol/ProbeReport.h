@@ -47,6 +47,10 @@ public:
     void unwritten(const QString &path, const QString &reason);
     /// The scan list cannot be used, so that nothing is scanned.
     void unreadList(const QString &path, const QString &reason);
+    /// The search waits for a folder, or a link, that gives no answer.
+    void looking(const QString &path);
+    /// A folder, or something in it, could not be searched.
+    void unsearched(const QString &path, const QString &reason);
     /// Another scanner is at work on the same folder.
     void busy();
     /// The last line: all catalogues are written, unless something above said otherwise.

@@ -20,9 +20,9 @@ inline constexpr char kFiles[] = "files";
 inline constexpr char kProbes[] = "probes";
 
 /// In the order of `ReportLine::Event`.
-inline constexpr const char *kEvents[] = {"start",      "busy",     "plan",    "begin",
-                                          "stage",      "end",      "skipped", "unwritten",
-                                          "unreadList", "finished", "ended",   "workerEnd"};
+inline constexpr const char *kEvents[] = {"start", "busy",      "plan",      "begin",      "stage",
+                                          "end",   "skipped",   "unwritten", "unreadList", "finished",
+                                          "ended", "workerEnd", "looking",   "unsearched"};
 /// In the order of `ProbeStage`.
 inline constexpr const char *kStages[] = {"load", "start", "ask", "close"};
 

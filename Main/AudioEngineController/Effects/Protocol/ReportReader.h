@@ -22,6 +22,8 @@ struct ReportLine {
         Finished,
         Ended,
         WorkerEnd,
+        Looking,
+        Unsearched,
         Unknown, ///< of a later version, or damaged
     };
 

@@ -20,14 +20,14 @@ inline constexpr UsageRow kScannerArguments[] = {
 inline constexpr UsageRow kScannerVariables[] = {
     {"FXPROBE_JOBS", "Probe this many plug-ins at once, each in a worker process, 64 at most. Without it "
                      "plug-ins are loaded into the scanner itself, one after the other."},
-    {"FXPROBE_PROBE_LIMIT", "With workers: give up on a plug-in that does not answer for this many seconds; "
-                            "0 (the default): never."},
+    {"FXPROBE_PROBE_LIMIT",
+     "Give up on a folder, and with workers on a plug-in, that does not answer for this "
+     "many seconds; 0 (the default): never."},
     {"FXPROBE_MEMORY_LIMIT", "With workers: give up on a plug-in that takes more memory than this many MiB; "
                              "0 (the default): never."},
     {"FXPROBE_ONLY",
      "Folders and plug-ins of the scan list, separated as in PATH: search only these, and keep "
      "what is known of all others."},
-    {"FXPROBE_CONTROL", "1: take requests on the standard input, one JSON object a line."},
     {"FXPROBE_LOG", "A file to which the log is appended, in place of standard error."},
     {"FXPROBE_TRACE", "1 adds the trace lines to the log."},
     {"FXPROBE_REPORT", "A file to which the course of the scan is appended."},
