@@ -143,6 +143,7 @@ TEST_F(Managing, WhatIsAskedAgainIsNamedOrAll)
         const bool isTwoAsked = !trace().filter("Shell entry Two").isEmpty();
         EXPECT_EQ(isTwoAsked, QString(row.arguments).contains("retry-failed")) << row.arguments;
     }
+    EXPECT_TRUE(runLine("--show Off").standardOutput.contains("in/out       2/2")) << "known from its probe";
 }
 
 TEST_F(Managing, OnlyWhatTheScanIsLimitedToIsAskedAgain)
