@@ -161,8 +161,9 @@ int edit(const ScanOptions &options, const DataFiles &files)
         complain(place.reason());
         return ScanExit::kNotFinished;
     }
-    const int exitCode = options.changesMarks() ? changeMarks(options, files.effects)
-                                                : runFolderCommand(options, files.effects);
+    int exitCode = options.changesMarks() ? changeMarks(options, files.effects) : ScanExit::kDone;
+    if (exitCode == ScanExit::kDone && isFolderCommand(options))
+        exitCode = runFolderCommand(options, files.effects);
     if (exitCode == ScanExit::kUsage)
         place.removeMade();
     return exitCode;

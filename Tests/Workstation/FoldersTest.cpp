@@ -89,10 +89,10 @@ loaded .
 fxscan 0 --list: 3 plug-ins: 3 ignored
 fxscan 0 --retry-failed: 3 ignored
 loaded .
-fxscan 0 --no-ignore @/Plugins/One.vst3: is not ignored any more
+fxscan 0 --favourite Two --no-ignore @/Plugins/One.vst3: is not ignored any more
 shows @/Plugins: A ok, B switched off, C ok, Two ignored
 loaded One
-vst3 Name Favourite: A|1, B|0, C|0, Two|0
+vst3 Name Favourite: A|1, B|0, C|0, Two|1
 fxscan 2 --no-ignore @/Plugins/One.vst3: is not ignored
 fxscan 2 --ignore @/Plugins/None.vst3: there is no plug-in or folder
 

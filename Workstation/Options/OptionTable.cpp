@@ -229,9 +229,11 @@ const std::vector<OptionConflict> &optionConflicts()
                 all.push_back({option, ofScan, reason});
         }
         for (const char *option : optionsWithoutScan())
-            if (qstrcmp(option, "list") != 0)
-                all.push_back(
-                    {option, "only", QStringLiteral("--%1 prints no plug-ins").arg(QLatin1String(option))});
+            if (qstrcmp(option, "list") != 0 && qstrcmp(option, "show") != 0)
+                for (const char *ofOutput : {"only", "format", "html"})
+                    all.push_back({option, ofOutput,
+                                   QStringLiteral("--%1 prints no plug-ins").arg(QLatin1String(option))});
+        all.push_back({"show", "only", QStringLiteral("--show shows what it names")});
         for (const char *first : {"folders", "list", "show"})
             for (const char *other : optionsWithoutScan())
                 if (qstrcmp(first, other) != 0)

@@ -54,6 +54,8 @@ TEST(Options, WrongOnesAreNamedWithWhatToDo)
         {{"--quiet=yes"}, "Unexpected value after '--quiet'."},
         {{"--list", "/plug-ins"}, "--list makes no scan; it takes no folders"},
         {{"--folders", "/plug-ins"}, "--folders makes no scan; it takes no folders"},
+        {{"--folders", "--format", "json"},
+         "--folders prints no plug-ins; it cannot be combined with --format"},
         {{"--timeout", "5", "--in-process"},
          "--in-process cannot end a plug-in that hangs; it cannot be combined with --timeout"},
     };
