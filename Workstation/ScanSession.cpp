@@ -27,23 +27,17 @@ void leaveUnfinished()
         leaveProcess(ScanExit::kNotFinished);
 }
 
-/// What the live line says of them.
-QString keysInWords(const ScanOptions &options, const TerminalKeys &keys)
-{
-    if (!keys.areThere())
-        return QString();
-    return options.inProcess ? QStringLiteral("; q cancels") : QStringLiteral("; s skips it, q cancels");
-}
-
 } // namespace
 
 ScanSession::ScanSession(const ScanOptions &options, PluginHost &registry, const QString &report,
                          JsonLines &lines)
     : ScanRun(registry, report)
     , m_options(options)
-    , m_progress(options.quiet, options.inProcess ? 0 : options.timeout, keysInWords(options, m_keys))
+    , m_progress(options.quiet, options.inProcess ? 0 : options.timeout)
     , m_lines(lines)
 {
+    if (!options.inProcess)
+        m_keys.emplace();
     TerminationSignal::install();
     registry.setProbeLimit(options.timeout);
     registry.setScanJobs(options.jobs);
@@ -80,10 +74,13 @@ void ScanSession::scanOnce()
 }
 
 /// Nobody else can end a plug-in that does not return.
-void ScanSession::endOverdueProbe() const
+void ScanSession::endOverdueProbe()
 {
-    if (isCancelled() && m_sinceCancel.hasExpired(kPatience))
-        CrashMarker::abandonAll([] { leaveProcess(ScanExit::kNotFinished); });
+    if (!isCancelled() || !m_sinceCancel.hasExpired(kPatience))
+        return;
+    m_progress.end();
+    Terminal::complain(QStringLiteral("the scan was cancelled, and a plug-in did not return"));
+    CrashMarker::abandonAll([] { leaveProcess(ScanExit::kNotFinished); });
 }
 
 /// Waits a moment, and passes on what asks us to end.
@@ -96,7 +93,7 @@ void ScanSession::wait()
 
 void ScanSession::show(ScanAccount &account)
 {
-    m_progress.show(account);
+    m_progress.show(account, m_keys && m_keys->areThere());
     m_lines.show(account);
     if (m_lines.isBroken() && !isCancelled())
         cancelForUser();
@@ -104,7 +101,7 @@ void ScanSession::show(ScanAccount &account)
 
 void ScanSession::takeKeys()
 {
-    switch (m_keys.take()) {
+    switch (m_keys ? m_keys->take() : '\0') {
     case 's':
         skip();
         break;
@@ -122,10 +119,6 @@ void ScanSession::skip()
     const PluginKey *plugin = account().current();
     if (!plugin)
         return;
-    if (m_options.inProcess) {
-        m_progress.say(QStringLiteral("A plug-in in this process cannot be skipped"));
-        return;
-    }
     m_progress.say(QStringLiteral("Skipping %1").arg(plugin->path));
     registry().skipProbe(plugin->path);
 }

@@ -8,6 +8,8 @@
 
 #include <QElapsedTimer>
 
+#include <optional>
+
 /// One scan from the command line: shows how it gets on, and ends it when somebody asks.
 class ScanSession : public ScanRun {
 public:
@@ -27,10 +29,10 @@ private:
     void cancelForUser();
     void skip();
     void takeKeys();
-    void endOverdueProbe() const;
+    void endOverdueProbe();
 
     const ScanOptions &m_options;
-    TerminalKeys m_keys;
+    std::optional<TerminalKeys> m_keys; ///< none where a plug-in could end us before the terminal is put back
     Progress m_progress;
     JsonLines &m_lines;
     QElapsedTimer m_sinceCancel;

@@ -38,8 +38,8 @@ protected:
         FxProbe::Progress progress;
         progress.done = account.done();
         progress.planned = account.planned();
-        if (const std::vector<PluginKey> begun = account.takeBegun(); !begun.empty())
-            m_last = begun.back();
+        if (const std::vector<BegunProbe> begun = account.takeBegun(); !begun.empty())
+            m_last = begun.back().key;
         if (const PluginKey *key = account.current())
             m_last = *key;
         const ProbeAccount *probe = account.find(m_last);

@@ -6,12 +6,9 @@
 
 namespace {
 
-constexpr qint64 kSlow = 2000; ///< ms after which the time of a probe is shown
+constexpr double kSlow = 2000; ///< ms after which the time of a probe is shown
 
-QString countOf(const ScanAccount &account)
-{
-    return QStringLiteral("[%1/%2]").arg(account.done()).arg(account.planned());
-}
+QString countOf(int done, int planned) { return QStringLiteral("[%1/%2]").arg(done).arg(planned); }
 
 QString nameOf(const ScanAccount &account, const PluginKey &key)
 {
@@ -24,11 +21,10 @@ QString nameOf(const ScanAccount &account, const PluginKey &key)
 
 } // namespace
 
-Progress::Progress(bool isQuiet, int limit, QString keys)
+Progress::Progress(bool isQuiet, int limit)
     : m_isQuiet(isQuiet)
     , m_isTerminal(Terminal::errorIsTerminal())
     , m_limit(limit)
-    , m_keys(std::move(keys))
 {}
 
 void Progress::end()
@@ -46,7 +42,7 @@ void Progress::say(const QString &text)
     Terminal::printError(Terminal::harmless(text) + QLatin1Char('\n'));
 }
 
-void Progress::show(ScanAccount &account)
+void Progress::show(ScanAccount &account, bool hasKeys)
 {
     if (m_isQuiet)
         return;
@@ -55,23 +51,24 @@ void Progress::show(ScanAccount &account)
     else if (!m_isTerminal)
         showLines(account);
     else if (const PluginKey *key = account.current())
-        showLine(account, *key);
+        showLine(account, *key, hasKeys);
 }
 
 void Progress::showLines(ScanAccount &account)
 {
-    for (const PluginKey &key : account.takeBegun())
-        Terminal::printError(Terminal::harmless(countOf(account) + QLatin1Char(' ') + nameOf(account, key)) +
+    for (const BegunProbe &begun : account.takeBegun())
+        Terminal::printError(Terminal::harmless(countOf(begun.done, begun.planned) + QLatin1Char(' ') +
+                                                nameOf(account, begun.key)) +
                              QLatin1Char('\n'));
 }
 
-void Progress::showLine(const ScanAccount &account, const PluginKey &key)
+void Progress::showLine(const ScanAccount &account, const PluginKey &key, bool hasKeys)
 {
-    if (!(key == m_shown))
-        m_since.start();
-    m_shown = key;
-    const QString time = m_since.elapsed() < kSlow ? QString() : QLatin1String("  ") + timeText(m_keys);
-    showText(countOf(account) + QLatin1Char(' ') + nameOf(account, key) + time);
+    const ProbeAccount *probe = account.find(key);
+    const double at = probe && probe->span ? account.now() - account.spans()[*probe->span].begin : 0;
+    const QString keys = hasKeys ? QStringLiteral("; s skips it, q cancels") : QString();
+    const QString time = at < kSlow ? QString() : QLatin1String("  ") + timeText(at, keys);
+    showText(countOf(account.done(), account.planned()) + QLatin1Char(' ') + nameOf(account, key) + time);
 }
 
 /// A folder that gives no answer.
@@ -80,20 +77,19 @@ void Progress::showLooking(const QString &folder)
     const QString text = QStringLiteral("Looking in %1").arg(folder);
     if (folder != m_looking) {
         m_since.start();
-        m_shown = PluginKey();
         if (!m_isTerminal)
             Terminal::printError(Terminal::harmless(text) + QLatin1Char('\n'));
     }
     m_looking = folder;
     if (m_isTerminal)
-        showText(text + QLatin1Char(' ') + timeText(QString()));
+        showText(text + QLatin1Char(' ') + timeText(static_cast<double>(m_since.elapsed())));
 }
 
 /// "(12 s of 60)"
-QString Progress::timeText(const QString &keys) const
+QString Progress::timeText(double milliseconds, const QString &keys) const
 {
     const QString limit = m_limit > 0 ? QStringLiteral(" of %1").arg(m_limit) : QString();
-    return QStringLiteral("(%1 s%2%3)").arg(m_since.elapsed() / 1000).arg(limit, keys);
+    return QStringLiteral("(%1 s%2%3)").arg(static_cast<int>(milliseconds / 1000)).arg(limit, keys);
 }
 
 void Progress::showText(const QString &given)

@@ -4,7 +4,7 @@
 
 /// The keys that a user presses while a scan runs. As long as it lives, a terminal hands them over one by one
 /// and does not show them; where the input is none, or another program has it at the moment, there are none.
-/// Ctrl-C stays what it is.
+/// Ctrl-C, Ctrl-\\ and Ctrl-Z stay what they are. One object at a time.
 class TerminalKeys {
 public:
     TerminalKeys();
@@ -20,5 +20,5 @@ public:
 
 private:
     struct Mode;
-    std::unique_ptr<Mode> m_mode; ///< what the terminal was like; null: the input is none
+    std::unique_ptr<Mode> m_mode; ///< the terminal; null: the input is none
 };

@@ -20,6 +20,8 @@ ScanAccount::ScanAccount(const QString &reportFile)
     , m_began(static_cast<double>(QDateTime::currentMSecsSinceEpoch()))
 {}
 
+double ScanAccount::now() const { return static_cast<double>(QDateTime::currentMSecsSinceEpoch()) - m_began; }
+
 void ScanAccount::update()
 {
     for (const ReportLine &line : m_report.takeNewLines())
@@ -89,7 +91,7 @@ void ScanAccount::addProblem(const QString &problem)
 void ScanAccount::begin(const ReportLine &line)
 {
     m_open.push_back({line.worker, keyOf(line), m_spans.size()});
-    m_begun.push_back(keyOf(line));
+    m_begun.push_back({keyOf(line), m_done, m_planned});
     ProbeSpan span;
     span.key = keyOf(line);
     span.worker = line.worker;
@@ -159,9 +161,9 @@ const ScanAccount::Open *ScanAccount::innermost(int worker) const
     return found == m_open.rend() ? nullptr : &*found;
 }
 
-std::vector<PluginKey> ScanAccount::takeBegun()
+std::vector<BegunProbe> ScanAccount::takeBegun()
 {
-    std::vector<PluginKey> begun;
+    std::vector<BegunProbe> begun;
     begun.swap(m_begun);
     return begun;
 }

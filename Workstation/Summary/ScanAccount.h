@@ -57,6 +57,13 @@ struct PlannedFormat {
     int probes = 0; ///< to be made from now on
 };
 
+/// A probe that began, with what had been dealt with and was planned then.
+struct BegunProbe {
+    PluginKey key;
+    int done = 0;
+    int planned = 0;
+};
+
 /// Something that came to pass: a plan, or a plug-in whose probe has ended.
 using ScanNews = std::variant<PlannedFormat, PluginKey>;
 
@@ -77,7 +84,7 @@ public:
         return m_open.empty() ? nullptr : &innermost(m_open.front().worker)->key;
     }
     /// The probes that began since the last call, in order.
-    std::vector<PluginKey> takeBegun();
+    std::vector<BegunProbe> takeBegun();
     /// What came to pass since the last call, in order. A plug-in can come twice: when it ends the scanner
     /// after its probe.
     std::vector<ScanNews> takeNews();
@@ -85,6 +92,8 @@ public:
     const std::vector<ProbeSpan> &spans() const { return m_spans; }
     /// When the last line was written, in milliseconds since the account began.
     double lastTime() const { return m_lastTime; }
+    /// Milliseconds since the account began.
+    double now() const;
     /// Files dealt with, and files planned, of all formats planned so far.
     int done() const { return m_done; }
     int planned() const { return m_planned; }
@@ -124,7 +133,7 @@ private:
     const double m_began; ///< ms since 1970 (UTC)
     double m_lastTime = 0;
     std::vector<Open> m_open; ///< the oldest first
-    std::vector<PluginKey> m_begun;
+    std::vector<BegunProbe> m_begun;
     std::vector<ScanNews> m_news;
     std::vector<ProbeSpan> m_spans;
     std::map<PluginKey, ProbeAccount> m_probes;

@@ -1,13 +1,16 @@
 #include "Tests/Support/ScanBench.h"
 
 #include <QDeadlineTimer>
+#include <QFile>
 #include <QRegularExpression>
+#include <QThread>
 
 #include <array>
 
 #include <poll.h>
 #include <pty.h>
 #include <sys/wait.h>
+#include <termios.h>
 #include <unistd.h>
 
 namespace {
@@ -16,13 +19,10 @@ namespace {
 class FxScanOnTerminal : public ScanBench {
 protected:
     /// Runs it; `key` is pressed when `at` has been shown. Gives the exit code.
-    int run(const QByteArray &at, char key)
+    int run(const QByteArray &at, char key, const QByteArray &option = "--timeout=60")
     {
-        const std::array<QByteArray, 6> words = {FXPROBE_FXSCAN,
-                                                 "--data-folder",
-                                                 m_folder.dataFolder().toUtf8(),
-                                                 "--timeout",
-                                                 "60",
+        const std::array<QByteArray, 5> words = {FXPROBE_FXSCAN, "--data-folder",
+                                                 m_folder.dataFolder().toUtf8(), option,
                                                  m_folder.plugins().toUtf8()};
         std::array<char *, words.size() + 1> arguments = {};
         for (std::size_t word = 0; word < words.size(); ++word)
@@ -41,6 +41,7 @@ protected:
             if (!isPressed && m_shown.contains(at))
                 isPressed = write(terminal, &key, 1) == 1;
         EXPECT_TRUE(isPressed) << m_shown.constData();
+        EXPECT_TRUE(isAsItWas(terminal)) << m_shown.constData();
         close(terminal);
         int status = -1;
         waitpid(child, &status, 0);
@@ -55,6 +56,12 @@ protected:
     QByteArray m_shown;
 
 private:
+    static bool isAsItWas(int terminal)
+    {
+        constexpr tcflag_t kUsual = ICANON | ECHO;
+        termios mode = {};
+        return tcgetattr(terminal, &mode) == 0 && (mode.c_lflag & kUsual) == kUsual;
+    }
     /// False when nobody has the terminal any more.
     bool readSome(int terminal)
     {
@@ -85,5 +92,23 @@ TEST_F(FxScanOnTerminal, ShowsALiveLineAndListensToKeys)
                                      "is kept\nFORMAT"))
         << qPrintable(remains());
     EXPECT_EQ(recordsOf("VST3Configuration.xml", "Name Enabled Working"), QStringList("Good|1|1"));
+    EXPECT_EQ(m_folder.markers(), QStringList());
+}
+
+TEST_F(FxScanOnTerminal, IsPutBackHoweverTheScanEnds)
+{
+    put("Plug.vst3", "delay initialize 300\nfault initialize abort\n");
+    EXPECT_EQ(run("] VST 3  Plug.vst3", 'x', "--in-process"), -1);
+    QFile::remove(m_folder.path("Effects/Plug.scan3"));
+    put("Plug.vst3", "fault initialize hang\n");
+    constexpr char kInterrupt = '\x03';
+    EXPECT_EQ(run("(2 s)", kInterrupt, "--in-process"), 3);
+    EXPECT_TRUE(remains().endsWith("fxscan: the scan was cancelled, and a plug-in did not return\n"))
+        << qPrintable(remains());
+    constexpr char kQuit = '\x1c';
+    EXPECT_EQ(run("(2 s of 60; s", kQuit), -1);
+    const QDeadlineTimer deadline(30000); // the scanner finds itself alone
+    while (!m_folder.read("FxProbe.report").contains("\"ended\"") && !deadline.hasExpired())
+        QThread::msleep(10);
     EXPECT_EQ(m_folder.markers(), QStringList());
 }
