@@ -10,7 +10,8 @@
 //   fxscan CODE ARGUMENT…: TEXT | …   ends with that code; the texts are parts of what it prints
 //   shows ARGUMENT…: NAME STATE, …    a scan that prints these plug-ins
 //   listed: FOLDER…                   what the scan list names
-//   usual FOLDER…                     the only usual folders that there are; "." none
+//   usual FOLDER…                     the only usual folders that there are: the first of VST 3,
+//                                     the others of CLAP; "." none
 //   fresh FOLDER                      another data folder, which must not be there yet
 
 namespace {
@@ -29,14 +30,25 @@ mark Echo Favourite 1
 shows @/Plugins/b: Two ok, New failed
 loaded Two New
 listed: @/Plugins/a @/Plugins/b/Two.vst3 @/Plugins/c @/Plugins/b
-usual @/Plugins/d
-put d/Usual.vst3:
-shows : One ok, Two ok, New failed, Usual ok, Echo ok
-loaded One Usual
-listed: @/Plugins/a @/Plugins/b/Two.vst3 @/Plugins/c @/Plugins/b @/Plugins/d
+usual @/Plugins/d @/Plugins/e
+put d/Usual.vst3, e/Late.clap:
+shows : One ok, Two ok, New failed, Usual ok, Echo ok, Late ok
+loaded One Usual Late
+listed: @/Plugins/a @/Plugins/b/Two.vst3 @/Plugins/c @/Plugins/b @/Plugins/d @/Plugins/e
 usual .
-fxscan 0 --folders: @/Plugins/a\n@/Plugins/b/Two.vst3\n@/Plugins/c\n@/Plugins/b\n@/Plugins/d\n
+fxscan 0 --folders: @/Plugins/a\n@/Plugins/b/Two.vst3\n@/Plugins/c\n@/Plugins/b\n@/Plugins/d\n@/Plugins/e\n
 vst2 Name Favourite: Echo|1
+
+= A scan of one folder follows the links in it
+put a/Own.vst3, drive/Two.vst3, drive/deep/Three.clap, other/Four.clap:
+move Plugins/drive Drive
+move Plugins/other Other
+link Plugins/a/drive Drive
+link Plugins/a/Four.clap Other/Four.clap
+usual .
+fxscan 0 --exclude @/Drive/deep: is not searched any more
+shows @/Plugins/a: Own ok, Two ok, Four ok
+shows @/Plugins/a/drive: Two ok
 
 = A folder of the environment that is not there is named
 usual @/nowhere
@@ -148,7 +160,7 @@ protected:
             FolderRules rules;
             rules.excluded = platformPluginFolders();
             EXPECT_TRUE(writeFolderRules(m_folder.effects(), rules));
-            m_environment = words.value(1) == "." ? QString() : words.mid(1).join(QDir::listSeparator());
+            m_usual = words.value(1) == "." ? QStringList() : words.mid(1);
         } else if (words[0] == "fresh") {
             m_dataFolder = m_folder.path(words[1]);
             EXPECT_FALSE(QFileInfo::exists(m_folder.path(words[1].section('/', 0, 0))));
@@ -162,7 +174,8 @@ private:
     {
         ScannerRun fxscan(QStringLiteral(FXPROBE_FXSCAN), m_folder);
         fxscan.removeEnvironment("FXPROBE_LOG");
-        fxscan.setEnvironment("VST3_PATH", m_environment);
+        fxscan.setEnvironment("VST3_PATH", m_usual.value(0));
+        fxscan.setEnvironment("CLAP_PATH", m_usual.mid(1).join(QDir::listSeparator()));
         fxscan.setArguments(QStringList{"--quiet", "--data-folder", m_dataFolder} + arguments);
         return fxscan.run();
     }
@@ -180,7 +193,7 @@ private:
     }
 
     QString m_dataFolder = m_folder.dataFolder();
-    QString m_environment;
+    QStringList m_usual;
 };
 
 } // namespace

@@ -312,10 +312,15 @@ bool FileFinder::isInArea(const Place &start, const QString &path) const
            !m_area.isExcluded(real);
 }
 
+/// Whether something that belongs to what is searched may lie in a folder below a start. What a link in the
+/// area leads to lies elsewhere, and what leads into the area may be a link outside it.
 bool FileFinder::mayHoldSome(const Place &start, const QString &folder) const
 {
-    return m_area.isEverything() ||
-           (!m_area.isExcluded(folder) && m_area.mayHoldSome(moved(folder, start.path, start.real)));
+    if (m_area.isEverything())
+        return true;
+    const QString real = moved(folder, start.path, start.real);
+    return !m_area.isExcluded(folder) && !m_area.isExcluded(real) &&
+           (m_area.mayHoldSome(folder) || m_area.mayHoldSome(real));
 }
 
 /// False when it ended early.
