@@ -47,8 +47,14 @@ constexpr CategoryWord kFeatures[] = {
 QStringList clapFeatures(const char *const *features)
 {
     QStringList texts;
-    for (int index = 0; features && index < kMaxFeatures && features[index]; ++index)
-        texts.append(clapText(features[index]));
+    std::size_t length = 0; // with a bar behind each
+    for (int index = 0; features && index < kMaxFeatures && features[index]; ++index) {
+        const QString text = clapText(features[index]);
+        length += static_cast<std::size_t>(text.size()) + 1;
+        if (length > kMaxClapText + 1)
+            break;
+        texts.append(text);
+    }
     return texts;
 }
 

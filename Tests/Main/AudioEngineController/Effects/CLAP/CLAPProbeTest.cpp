@@ -72,6 +72,7 @@ class A / id com.a.B / vendor "V\xE9" / version 2 / features instrument stereo ~
 class A / null name vendor version features ~ fixture.A|fixture.A|||
 class A / vendor "" / version "" / features ~ A|fixture.A|||
 class "🎛" / id * ~ 🎛|+|Fixture Works|1.0|audio-effect
+class A / features * reverb ~ A|fixture.A|Fixture Works|1.0|+
 class A / inputs 1 / outputs ~ A|fixture.A|Fixture Works|1.0|audio-effect 1>0
 class A / inputs 1:aux 2 6 2:aux ~ A|fixture.A|Fixture Works|1.0|audio-effect 8>2
 class A / inputs 2:aux 1:aux / outputs -1 -1 ~ A|fixture.A|Fixture Works|1.0|audio-effect 3>2147483647
