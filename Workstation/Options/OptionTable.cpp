@@ -164,9 +164,9 @@ const std::vector<OptionRow> &optionTable()
         {"no-ignore", "path", &ScanOptions::noIgnore, "Load an ignored plug-in again."},
         {"only", "word", WordsTarget{&ScanOptions::only, filterWords},
          "Show only some plug-ins: ok, failed, disabled, switched-off, folder-away, ignored, favourite, "
-         "instrument, the name of a format (vst3, vst2), category=NAME or vendor=TEXT (a part of it). Can be "
-         "given several "
-         "times.",
+         "instrument, the name of a format (vst3, vst2, clap), category=NAME or vendor=TEXT (a part of it). "
+         "Can "
+         "be given several times.",
          "Of several words of one kind one must fit: --only failed --only disabled shows both. Words of "
          "different kinds must all fit: --only vst3 --only instrument shows instruments in that format. It "
          "changes what is printed, in every format, not what is scanned, nor the exit code."},
