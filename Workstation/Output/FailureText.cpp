@@ -87,10 +87,10 @@ QString shellWord(const QString &text)
                                             QRegularExpression::UseUnicodePropertiesOption);
     if (!text.contains(special) && !text.isEmpty())
         return text;
-#ifdef _WIN32 // whose shells know no other quotes
-    return QLatin1Char('"') + text + QLatin1Char('"');
-#else
     QString quoted = text;
+#ifdef _WIN32 // whose shells know no other quotes, and no way to write one inside
+    return QLatin1Char('"') + quoted.remove(QLatin1Char('"')) + QLatin1Char('"');
+#else
     return QLatin1Char('\'') + quoted.replace(QLatin1Char('\''), QLatin1String("'\\''")) + QLatin1Char('\'');
 #endif
 }

@@ -1,4 +1,5 @@
 #include "Workstation/Options/PluginFolders.h"
+#include "Workstation/Output/FailureText.h"
 #include "Workstation/Output/SummaryOutput.h"
 #include "Workstation/Output/Terminal.h"
 
@@ -68,16 +69,6 @@ mustache::data dataOf(const QJsonValue &value)
                             : Terminal::harmless(value.toString()).toStdString();
 }
 
-/// One word of a command line, as a shell takes it.
-QString quoted(QString word)
-{
-#ifdef Q_OS_WIN
-    return QLatin1Char('"') + word.remove(QLatin1Char('"')) + QLatin1Char('"');
-#else
-    return QLatin1Char('\'') + word.replace(QLatin1Char('\''), QLatin1String("'\\''")) + QLatin1Char('\'');
-#endif
-}
-
 struct Advice {
     QString text;
     QString option; ///< of fxscan, with its value; empty: none helps
@@ -86,7 +77,7 @@ struct Advice {
 Advice adviceFor(const PluginFailure &failure)
 {
     // A sub-plug-in shares its path with its siblings.
-    const QString name = QLatin1Char('=') + quoted(failure.subId != 0 ? failure.name : failure.path);
+    const QString name = QLatin1Char('=') + shellWord(failure.subId != 0 ? failure.name : failure.path);
     switch (failure.state) {
     case PluginState::Failed:
         return {QStringLiteral("It is asked again when its file changes. To ask it now:"),
@@ -99,7 +90,7 @@ Advice adviceFor(const PluginFailure &failure)
                 QStringLiteral("--switch-on") + name};
     case PluginState::FolderAway:
         return {QStringLiteral("Connect its drive and scan again. If it is gone for good:"),
-                QStringLiteral("--forget=") + quoted(QFileInfo(failure.path).path())};
+                QStringLiteral("--forget=") + shellWord(QFileInfo(failure.path).path())};
     case PluginState::Skipped:
         return {QStringLiteral("The next scan asks it again."), QString()};
     default:
@@ -281,7 +272,7 @@ QByteArray renderHtml(const ScanSummary &summary, const QString &dataFolder, con
     });
     const QString command = dataFolder == userDataFolder()
                                 ? QStringLiteral("fxscan ")
-                                : QStringLiteral("fxscan --data-folder=%1 ").arg(quoted(dataFolder));
+                                : QStringLiteral("fxscan --data-folder=%1 ").arg(shellWord(dataFolder));
     decorate(page, "failures", [&](QJsonObject &object, std::size_t index) {
         const Advice advice = adviceFor(summary.failures[index]);
         object.insert(QStringLiteral("help"), advice.text);

@@ -36,7 +36,7 @@ TEST_F(Html, ABrowserSortsFiltersAndTakesNoTextForMarkup)
                      "bars: bar b-crashed Crash.vst3|bar b-failed It's.vst3|bar b-failed Two|bar b-listed "
                      "Evil.vst3|bar b-listed Mono.vst3|bar b-listed One|bar b-listed Shell.so|bar "
                      "b-listed Stereo.so",
-                     "inside: true", "commands: retry='Crash.vst3'|retry='It'\\''s.vst3'|retry='Two'",
+                     "inside: true", "commands: retry=Crash.vst3|retry='It'\\''s.vst3'|retry=Two",
                      "strangers: 0", "loads: 0", "wide: true", "narrow: true", ""}))
         << qPrintable(dom);
 }
