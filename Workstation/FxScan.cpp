@@ -205,8 +205,11 @@ int prepareAndScan(const ScanOptions &options, const DataFiles &files)
 
 int runFxScan(const ScanOptions &options)
 {
-    if (!options.html.isEmpty() && !QFileInfo(options.html).dir().exists()) { // known before a long scan
-        complain(QStringLiteral("there is no folder for %1").arg(options.html));
+    const QFileInfo page(options.html);
+    if (!options.html.isEmpty() && (page.isDir() || !page.dir().exists())) { // known before a long scan
+        complain(
+            (page.isDir() ? QStringLiteral("%1 is a folder") : QStringLiteral("there is no folder for %1"))
+                .arg(options.html));
         return ScanExit::kUsage;
     }
     const DataFiles files(options.dataFolder);

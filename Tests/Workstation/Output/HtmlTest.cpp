@@ -49,4 +49,5 @@ TEST_F(Html, TheCatalogueAloneHasNoPicture)
     EXPECT_TRUE(page.contains("<bdi>Comp</bdi>")) << page.constData();
     EXPECT_FALSE(page.contains("class=\"timeline\""));
     EXPECT_EQ(run({"--list", "--html", m_folder.path("nowhere/page.html")}).exitCode, 2);
+    EXPECT_EQ(run({"--list", "--html", m_folder.plugins()}).exitCode, 2);
 }
