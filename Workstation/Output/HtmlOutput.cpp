@@ -83,6 +83,9 @@ Advice adviceFor(const PluginFailure &failure)
         return {QStringLiteral("It is asked again when its file changes. To ask it now:"),
                 QStringLiteral("--retry") + name};
     case PluginState::Disabled:
+        if (failure.hasChanged)
+            return {QStringLiteral("Its file has changed since it crashed. To ask it again:"),
+                    QStringLiteral("--retry") + name};
         return {QStringLiteral("It is not loaded again until you ask for it, best after an update:"),
                 QStringLiteral("--retry") + name};
     case PluginState::SwitchedOff:
@@ -279,6 +282,14 @@ QByteArray renderHtml(const ScanSummary &summary, const QString &dataFolder, con
         object.insert(QStringLiteral("hasCommand"), !advice.option.isEmpty());
         object.insert(QStringLiteral("command"), command + advice.option);
     });
+    decorate(page, "duplicates", [](QJsonObject &duplicate, std::size_t) {
+        decorate(duplicate, "members", [](QJsonObject &member, std::size_t) {
+            const QString why = member.value(QStringLiteral("reason")).toString();
+            member.insert(QStringLiteral("usage"), member.value(QStringLiteral("used")).toBool()
+                                                       ? QStringLiteral("used")
+                                                       : QStringLiteral("not used, ") + why);
+        });
+    });
     Picture(summary.timeline).addTo(page);
     addTimes(page, summary.timeline);
     const QString now = QDateTime::currentDateTime().toString(QStringLiteral("yyyy-MM-dd hh:mm"));
@@ -286,6 +297,7 @@ QByteArray renderHtml(const ScanSummary &summary, const QString &dataFolder, con
     page.insert(QStringLiteral("when"), now);
     page.insert(QStringLiteral("hasFolders"), summary.isScan);
     page.insert(QStringLiteral("hasFailures"), !summary.failures.empty());
+    page.insert(QStringLiteral("hasDuplicates"), !summary.duplicates.empty());
     page.insert(QStringLiteral("hasNoPlugins"), !summary.noPlugins.empty());
     page.insert(QStringLiteral("isUnfinished"), summary.isScan && !summary.finished);
     page.insert(QStringLiteral("hasTimeline"), summary.isScan);

@@ -41,6 +41,23 @@ TEST_F(Html, ABrowserSortsFiltersAndTakesNoTextForMarkup)
         << qPrintable(dom);
 }
 
+TEST_F(Html, TellsWhatIsThereMoreThanOnceAndWhatHasChanged)
+{
+    put("Comp.vst3", "class <Comp>\n");
+    const QByteArray copy = put("later/Comp.vst3", "class <Comp>\n").toUtf8();
+    put("Crash.vst3", "fault initialize abort\n");
+    scan();
+    const QByteArray changed = "has changed since it crashed";
+    EXPECT_FALSE(run({"--list", "--format", "html"}).standardOutput.contains(changed));
+    dateLater(put("Crash.vst3"));
+    const QByteArray page = run({"--list", "--format", "html"}).standardOutput;
+    EXPECT_TRUE(page.contains(changed)) << page.constData();
+    EXPECT_TRUE(page.contains("<li><bdi>&lt;Comp&gt;</bdi> <bdi class=\"format\">Fixture Works</bdi>"))
+        << page.constData();
+    EXPECT_TRUE(page.contains("<li>VST 3 <bdi>" + copy + "</bdi>: <bdi>not used, a copy of "))
+        << page.constData();
+}
+
 TEST_F(Html, TheCatalogueAloneHasNoPicture)
 {
     put("Comp.vst3");
