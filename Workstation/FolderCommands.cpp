@@ -100,10 +100,14 @@ bool FolderEditor::forget(const QString &given)
     const QStringList paths = SearchArea::spellings(settledPath(given));
     const int folders = removeBelow(m_list.folders, paths, asItIs);
     const int records = drop(paths);
+    if (m_exitCode != ScanExit::kDone)
+        return false;
     if (folders == 0 && records == 0)
         return refuse(QStringLiteral("nothing is remembered of '%1'").arg(given));
     if (folders != 0)
         check(listPath(), WriteScanList(listPath(), m_list.folders));
+    if (m_exitCode != ScanExit::kDone)
+        return false;
     say(plugins(records) + QStringLiteral(" dropped"));
     if (isBelowAny(paths.front(), existingUsualFolders() + m_list.folders))
         say(QStringLiteral("The next scan searches %1 again; --exclude keeps it from that.").arg(given));
@@ -116,28 +120,31 @@ bool FolderEditor::exclude(const QString &given)
     m_rules.excluded += paths;
     m_rules.excluded.removeDuplicates();
     writeRules();
-    if (m_exitCode == ScanExit::kDone)
-        say(QStringLiteral("%1 is not searched any more; %2 dropped").arg(given, plugins(drop(paths))));
+    const int records = m_exitCode == ScanExit::kDone ? drop(paths) : 0;
+    if (m_exitCode != ScanExit::kDone)
+        return false;
+    say(QStringLiteral("%1 is not searched any more; %2 dropped").arg(given, plugins(records)));
     return true;
 }
 
 bool FolderEditor::ignore(const QString &given)
 {
-    const QString path = settledPath(given);
+    const QStringList paths = SearchArea::spellings(settledPath(given));
     int known = 0;
     change([&](Records &records) {
-        known += static_cast<int>(std::count_if(
-            records.begin(), records.end(), [&](const auto &record) { return isBelow(record.path, path); }));
-        return false;
+        known += removeBelow(records, paths, pathOfRecord);
+        return false; // they were counted
     });
-    if (known == 0 && !QFileInfo::exists(path))
+    if (known == 0 && !QFileInfo::exists(paths.front()))
         return refuse(QStringLiteral("there is no plug-in or folder '%1'").arg(given));
-    m_rules.ignored += SearchArea::spellings(path);
+    m_rules.ignored += paths;
     m_rules.ignored.removeDuplicates();
     writeRules();
     if (m_exitCode != ScanExit::kDone)
         return false;
     settleAllIgnored();
+    if (m_exitCode != ScanExit::kDone)
+        return false;
     say(QStringLiteral("%1 is not loaded any more (%2)").arg(given, plugins(known)));
     return true;
 }
@@ -158,6 +165,8 @@ bool FolderEditor::takeBack(QStringList &rule, const QString &given, const char 
     if (m_exitCode != ScanExit::kDone)
         return false;
     settleAllIgnored();
+    if (m_exitCode != ScanExit::kDone)
+        return false;
     say(QStringLiteral("%1 is not %2 any more; the next scan asks what is there")
             .arg(given, QLatin1String(state)));
     return true;
