@@ -39,13 +39,21 @@ bool hasRecordsBelow(const QString &folder, const QString &effectsFolder)
     });
 }
 
-/// What is remembered and what is usual. A usual folder that is gone with all that was in it is let go.
+/// What is remembered and what is usual. A usual folder that is gone with all that was in it is let go, and
+/// so is a module that is not in its folder any more.
 QStringList allFolders(QStringList remembered, const QStringList &excluded, const QString &effectsFolder)
 {
     const QStringList usual = usualPluginFolders();
-    const auto isOver = [&](const QString &folder) {
-        return usual.contains(folder) && !QFileInfo(folder).isDir() &&
-               !hasRecordsBelow(folder, effectsFolder);
+    const auto isGone = [&](const QString &path) {
+        const auto ask = [path, isUsual = usual.contains(path)] {
+            const QFileInfo file(path);
+            return isUsual ? !file.isDir() : !file.exists() && !file.isSymLink() && file.dir().exists();
+        };
+        return answerInTime(kPatience, ask).value_or(false);
+    };
+    const auto isOver = [&](const QString &path) {
+        return (usual.contains(path) || isModuleName(path)) && !hasRecordsBelow(path, effectsFolder) &&
+               isGone(path);
     };
     remembered.erase(std::remove_if(remembered.begin(), remembered.end(), isOver), remembered.end());
     for (const QString &folder : existingUsualFolders())
@@ -64,17 +72,17 @@ QStringList settleGiven(const QStringList &given, const QStringList &excluded, Q
             leftOut.append(QStringLiteral("'%1' gives no answer").arg(each));
             continue;
         }
-        const bool isModule = isModuleName(path) && QFileInfo(path).isFile();
-        const SettledFolders folder = isModule ? SettledFolders{{path}, {}} : settleFolders({path});
-        if (!isModule && QFileInfo(path).isFile())
+        const QFileInfo file(path);
+        if (path.isEmpty() || !file.exists())
+            leftOut.append(QStringLiteral("there is no folder or plug-in '%1'").arg(each));
+        else if (!file.isDir() && !(file.isFile() && isModuleName(path)))
             leftOut.append(QStringLiteral("'%1' is neither a folder nor a plug-in").arg(each));
         else if (isBelowAny(path, excluded))
             leftOut.append(QStringLiteral("'%1' is excluded; --no-exclude takes that back").arg(each));
-        else
-            leftOut += folder.leftOut;
-        if (isBelowAny(path, excluded) || paths.contains(path))
-            continue;
-        paths += folder.folders;
+        else if (!canStandInScanList(path))
+            leftOut.append(QStringLiteral("the name of '%1' cannot stand in a scan list").arg(each));
+        else if (!paths.contains(path))
+            paths.append(path);
     }
     return paths;
 }

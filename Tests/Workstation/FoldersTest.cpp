@@ -74,6 +74,18 @@ shows @/Plugins/a: One ok, Three ok
 fxscan 0 --forget @/Plugins/a/deep: 1 plug-in dropped | The next scan searches @/Plugins/a/deep again
 listed: @/Plugins/a
 
+= A module that is gone is let go, and one that cannot be listed is named
+put a/One.vst3, a/Two.vst3, b/x&lt;.vst3:
+usual .
+remove Effects/FXScan.xml
+shows @/Plugins/a/One.vst3 @/Plugins/a: One ok, Two ok
+remove Plugins/a/One.vst3
+fxscan 0 : 1 gone: One
+shows : Two ok
+listed: @/Plugins/a
+fxscan 2 @/Plugins/a/One.vst3: there is no folder or plug-in '@/Plugins/a/One.vst3'
+fxscan 2 @/Plugins/b/x&lt;.vst3: the name of '@/Plugins/b/x&lt;.vst3' cannot stand in a scan list
+
 = An excluded folder is dropped and comes back on request
 put a/One.vst3, a/b/Two.vst3:
 usual .
