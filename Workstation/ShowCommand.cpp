@@ -15,7 +15,10 @@ QStringList usedInsteadOf(const QString &name, const ProbeMemory &memory, QStrin
         memory.forEach(format.format, [&](const RememberedProbe &probe) {
             if (!isFileNamed(name, probe.path))
                 return;
-            reason = QStringLiteral("%1: %2").arg(probe.path, probe.reason);
+            reason = QStringLiteral("%1: %2").arg(
+                probe.path, probe.reason.isEmpty()
+                                ? QStringLiteral("nothing is known of it any more; scan it again")
+                                : probe.reason);
             for (const RememberedPlugin &plugin : probe.plugins)
                 if (!plugin.heldBy.isEmpty())
                     paths.append(plugin.heldBy);
