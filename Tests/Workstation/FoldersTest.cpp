@@ -112,6 +112,8 @@ shows @/Plugins: A ignored, B ignored, Two ignored
 loaded .
 fxscan 0 --list: 3 plug-ins: 3 ignored
 fxscan 0 --retry-failed: 3 ignored
+fxscan 2 --retry A: 'A' is ignored; --no-ignore its path first
+fxscan 2 --rescan A: 'A' is ignored; --no-ignore its path first
 loaded .
 fxscan 0 --favourite Two --no-ignore @/Plugins/One.vst3: is not ignored any more
 shows @/Plugins: A ok, B switched off, C ok, Two ignored

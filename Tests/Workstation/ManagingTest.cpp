@@ -156,7 +156,9 @@ TEST_F(Managing, OnlyWhatTheScanIsLimitedToIsAskedAgain)
         EXPECT_EQ(asked(), "Crash");
         EXPECT_EQ(marks(), "Crashx Killx") << "that of the other stays disabled";
     }
-    EXPECT_EQ(runLine("--retry Kill @a").exitCode, 2);
+    const ScannerOutcome other = runLine("--retry Kill @a");
+    EXPECT_EQ(other.exitCode, 2);
+    EXPECT_TRUE(other.standardError.contains("is named 'Kill' in the folders that are scanned"));
 }
 
 TEST_F(Managing, WhatMayWorkNowIsAskedAgain)

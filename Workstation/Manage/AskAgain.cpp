@@ -19,6 +19,32 @@ FileKey fileOf(const Plugin &plugin) { return {plugin.format->format, pathKey(pl
 /// It ended the process that probed it, or gave no answer.
 bool isKiller(const EffectRecord &record) { return !record.enabled && !record.working; }
 
+/// Whether something is true of all plug-ins that a name means, and there are some.
+bool areAll(const std::vector<Plugin> &meant, bool (*is)(const EffectRecord &record))
+{
+    return !meant.empty() &&
+           std::all_of(meant.begin(), meant.end(), [is](const Plugin &plugin) { return is(*plugin.record); });
+}
+
+/// Why what is meant by a name cannot be asked at all; empty when it can.
+QString whyNeverAsked(const QString &name, const std::vector<Plugin> &meant)
+{
+    const bool areIgnored = areAll(meant, [](const EffectRecord &record) { return record.isIgnored(); });
+    return areIgnored ? QStringLiteral("'%1' is ignored; --no-ignore its path first").arg(name) : QString();
+}
+
+/// Why a scan leaves alone what is meant by a name; empty when it does not.
+QString whyNotAsked(const QString &name, const std::vector<Plugin> &meant)
+{
+    if (const QString why = whyNeverAsked(name, meant); !why.isEmpty())
+        return why;
+    if (areAll(meant, isKiller))
+        return QStringLiteral("'%1' is disabled; --retry asks it again").arg(name);
+    if (areAll(meant, [](const EffectRecord &record) { return !record.enabled; }))
+        return QStringLiteral("'%1' is switched off; --switch-on it first").arg(name);
+    return QString();
+}
+
 class Request {
 public:
     Request(const QString &effectsFolder, const QStringList &below, const QStringList &folders,
@@ -43,7 +69,6 @@ private:
     std::vector<Plugin> named(const QString &name, const std::vector<Plugin> &plugins, const QString &kind);
     bool isUnrecorded(const QString &name);
     void reopen(const std::vector<Plugin> &chosen) const;
-    static QString whyNotAsked(const QString &name, const std::vector<Plugin> &meant);
 
     CatalogueEdit m_edit;
     ProbeMemory m_memory;
@@ -78,7 +103,9 @@ std::vector<Plugin> Request::named(const QString &name, const std::vector<Plugin
     if (found.isAmbiguous())
         m_wrong.append(found.question(name));
     else if (found.places.empty() && !isUnrecorded(name))
-        m_wrong.append(QStringLiteral("no %1 is named '%2'").arg(kind, name));
+        m_wrong.append(
+            QStringLiteral("no %1 is named '%2'%3")
+                .arg(kind, name, QLatin1String(m_below.isEmpty() ? "" : " in the folders that are scanned")));
     std::vector<Plugin> meant;
     for (const std::size_t place : found.isAmbiguous() ? std::vector<std::size_t>() : found.places)
         meant.push_back(plugins[place]);
@@ -104,9 +131,12 @@ bool Request::isUnrecorded(const QString &name)
 void Request::retry(const QStringList &names)
 {
     const std::vector<Plugin> outOfUse = those([](const Plugin &plugin) { return !plugin.record->working; });
-    for (const QString &name : names)
-        for (const Plugin &plugin : named(name, outOfUse, QStringLiteral("disabled or failed plug-in")))
-            m_retried.push_back(plugin);
+    for (const QString &name : names) {
+        const std::vector<Plugin> meant = named(name, outOfUse, QStringLiteral("disabled or failed plug-in"));
+        if (const QString why = whyNeverAsked(name, meant); !why.isEmpty())
+            m_wrong.append(why);
+        m_retried.insert(m_retried.end(), meant.begin(), meant.end());
+    }
 }
 
 void Request::retryIf(const std::function<bool(const Plugin &)> &isMeant)
@@ -128,20 +158,6 @@ bool Request::mayWorkNow(const Plugin &plugin) const
     const RememberedProbe *last = m_memory.find(format, record.path);
     return last && last->status == ProbeStatus::Failed && last->fileTime == fileTime &&
            last->reason.startsWith(QLatin1String(kNeedsLibrary)) && m_look.hasLibraries(format, record.path);
-}
-
-/// Why a scan leaves alone what is meant by a name; empty when it does not.
-QString Request::whyNotAsked(const QString &name, const std::vector<Plugin> &meant)
-{
-    const auto all = [&](auto &&is) {
-        return !meant.empty() && std::all_of(meant.begin(), meant.end(),
-                                             [&](const Plugin &plugin) { return is(*plugin.record); });
-    };
-    if (all([](const EffectRecord &record) { return isKiller(record); }))
-        return QStringLiteral("'%1' is disabled; --retry asks it again").arg(name);
-    if (all([](const EffectRecord &record) { return !record.enabled; }))
-        return QStringLiteral("'%1' is switched off; --switch-on it first").arg(name);
-    return QString();
 }
 
 void Request::rescan(const QStringList &names)
