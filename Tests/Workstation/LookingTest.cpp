@@ -60,6 +60,9 @@ TEST_F(Looking, OnlyWhatIsAskedForIsShownInEveryForm)
     }
     EXPECT_TRUE(
         run({"--list", "--only", "vst2"}).standardOutput.endsWith("\n2 of 5 plug-ins: 1 usable, 1 failed\n"));
+    EXPECT_TRUE(run({"--quiet", "--only", "failed", m_folder.plugins()})
+                    .standardOutput.contains("\n2 of 6 plug-ins: 2 failed"))
+        << "Bare has no record";
     EXPECT_EQ(run({"--list", "--only", "ok", "--strict"}).exitCode, 1)
         << "what is shown changes nothing else";
     EXPECT_EQ(run({"--list", "--only", "vendor="}).exitCode, 2);

@@ -150,7 +150,7 @@ QString renderCounts(const ScanSummary &summary)
             changes.append(
                 QStringLiteral("%1 skipped: %2").arg(skipped.size()).arg(skipped.join(QLatin1String(", "))));
     }
-    const std::size_t count = summary.plugins.size();
+    const std::size_t count = countOf(summary);
     const std::size_t all = summary.all == 0 ? count : summary.all;
     const QString of = summary.all == 0 ? QString() : QStringLiteral("%1 of ").arg(count);
     QString text = QStringLiteral("%1%2 plug-in%3").arg(of).arg(all).arg(QLatin1String(all == 1 ? "" : "s"));

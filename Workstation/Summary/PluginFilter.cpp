@@ -86,7 +86,7 @@ void PluginFilter::apply(ScanSummary &summary) const
 {
     if (m_words.empty())
         return;
-    summary.all = summary.plugins.size();
+    summary.all = countOf(summary);
     std::vector<CataloguedPlugin> shown;
     for (const CataloguedPlugin &plugin : summary.plugins)
         if (fits(plugin))

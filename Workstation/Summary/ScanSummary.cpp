@@ -180,6 +180,15 @@ ScanSummary summariseScan(CatalogueView now, const CatalogueView &before, const 
     return summary;
 }
 
+std::size_t countOf(const ScanSummary &summary)
+{
+    const auto isCounted = [](const PluginFailure &failure) {
+        return !failure.isCatalogued && failure.state != PluginState::Skipped;
+    };
+    const auto others = std::count_if(summary.failures.begin(), summary.failures.end(), isCounted);
+    return summary.plugins.size() + static_cast<std::size_t>(others);
+}
+
 void keepPlugins(ScanSummary &summary, std::vector<CataloguedPlugin> plugins,
                  const std::function<bool(const PluginFailure &)> &isFileShown)
 {

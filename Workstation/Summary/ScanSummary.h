@@ -33,15 +33,18 @@ struct ScanSummary {
     std::vector<Duplicate> duplicates;    ///< by name
     std::vector<ProbeTime> slowest;       ///< the slowest first
     ScanTimeline timeline;
-    QStringList removed;                  ///< names of what is gone
-    QStringList skipped;                  ///< paths that the user passed over in this scan
-    std::size_t all = 0;                  ///< plug-ins of which only some are shown; 0: all are shown
+    QStringList removed; ///< names of what is gone
+    QStringList skipped; ///< paths that the user passed over in this scan
+    std::size_t all = 0; ///< what `countOf` gave when only some are shown; 0: all are
     int added = 0;
     int updated = 0; ///< were known and probed again
     int unchanged = 0;
     bool isScan = false;   ///< false: nothing was scanned, the counts above mean nothing
     bool finished = false; ///< the scan came to its end
 };
+
+/// Plug-ins, and files that failed and have no record. What the user skipped says nothing about itself.
+std::size_t countOf(const ScanSummary &summary);
 
 /// Leaves only these of the plug-ins, and of what belongs to plug-ins what belongs to these. Files without a
 /// record stay where `isFileShown` says so.
