@@ -167,6 +167,56 @@ remove Plugins/a/WaveShell1-VST3 9.2.vst3
 scan
 vst3 Name Path Favourite: Inner|f/WaveShell1-VST3 9.2.vst3|1
 
+= A moved WaveShell that ends the scanner keeps its marks
+put a/WaveShell1-VST3 9.2.vst3: class Inner | #1
+write Plugins/a/other: x
+scan
+mark Inner Favourite 1
+remove Plugins/a/WaveShell1-VST3 9.2.vst3
+put f/WaveShell1-VST3 9.2.vst3: class Inner | #1 | fault module-entry kill
+scan 2
+vst3 Name Path Favourite Enabled: Inner|f/WaveShell1-VST3 9.2.vst3|1|1
+
+= A killer among them costs no marks of what moves and is renamed, or goes over to a copy
+put a/C.vst2: name C | id 1
+put b/D.vst2: child 1 P | child 2 Q
+put b/D.vst3: class P | #1 | class Q | #2
+write Plugins/a/other: x
+scan
+mark C Favourite 1, Q Favourite 1
+remove Plugins/a/C.vst2
+put f/C.vst2: name E | id 2
+new b/D.vst2: child 1 P
+new b/D.vst3: class P | #1
+put n/K.vst2: fault entry kill
+put n/K.vst3: fault module-entry kill
+put z/D.vst2: child 2 Q
+put z/D.vst3: class Q | #2
+scan 3
+vst2 Name Path Favourite: E|f/C.vst2|1, K|n/K.vst2|0, P|b/D.vst2|0, Q|z/D.vst2|1
+vst3 Name Path Favourite: K|n/K.vst3|0, P|b/D.vst3|0, Q|z/D.vst3|1
+same
+
+= A killer among them costs no marks of what another file lists instead of one that crashed
+put b/B.vst3: class S | #1
+scan
+mark S Favourite 1
+new b/B.vst3: class S | #1 | fault module-entry kill
+put c/A.vst3: class S | #1 | class T | #2
+put d/D.vst3: fault module-entry kill
+scan 3
+vst3 Name Path Favourite: B|b/B.vst3|0, S|c/A.vst3|1, T|c/A.vst3|0, D|d/D.vst3|0
+
+= A copy has what the last file to crash listed
+put b/B.vst3: class S | #1
+put c/A.vst3: class S | #1 | class T | #2
+scan
+mark S Favourite 1
+new b/B.vst3: class S | #1 | fault module-entry kill
+scan 2
+vst3 Name Path Favourite: B|b/B.vst3|0, S|c/A.vst3|1, T|c/A.vst3|0
+same
+
 = A catalogue of a negative version keeps its categories
 put Comp.vst3:
 scan

@@ -46,6 +46,12 @@ void EffectList::passMarks(const EffectRecord &old, const QString &id)
     entry->second.forgetText();
 }
 
+void EffectList::setHidden(const QString &id, bool isHidden)
+{
+    if (const auto entry = m_entries.find(id); entry != m_entries.end())
+        entry->second.isHidden = isHidden;
+}
+
 void EffectList::remove(const QString &id)
 {
     const auto entry = m_entries.find(id);

@@ -17,6 +17,7 @@ public:
 
     EffectRecord record;
     bool ownsName = false; ///< the name counts as used because of this record
+    bool isHidden = false; ///< no file is to hold it yet: whose marks it gets is not settled
 
     /// The record's text in a format's catalogue file.
     const QByteArray &text(const CatalogueFormat &format)
@@ -56,6 +57,8 @@ public:
     void setFavourite(const QString &id, bool favourite);
     /// Has a record take over the user's marks of an old one; nothing for an identifier that is not there.
     void passMarks(const EffectRecord &old, const QString &id);
+    /// Has files not hold a record, or hold it again; nothing for an identifier that is not there.
+    void setHidden(const QString &id, bool isHidden);
     /// Takes a record out, and its name.
     void remove(const QString &id);
 

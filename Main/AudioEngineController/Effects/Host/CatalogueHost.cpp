@@ -95,6 +95,12 @@ void CatalogueHost::passMarks(const EffectRecord &old, const QString &id)
     m_effects.passMarks(old, id);
 }
 
+void CatalogueHost::setHidden(const QString &id, bool isHidden)
+{
+    const TAutoLockCS lock(&m_ks);
+    m_effects.setHidden(id, isHidden);
+}
+
 QString CatalogueHost::moduleTime(const QString &path) const { return regularFileTimeText(path); }
 
 QString CatalogueHost::moduleFolder(const QString &path) const
@@ -298,6 +304,8 @@ QByteArray CatalogueHost::render(WaitingRecords &waiting)
             }
     };
     for (auto &[id, effect] : m_effects.entries()) {
+        if (effect.isHidden)
+            continue;
         addWaitingBefore(&id);
         texts.push_back(&effect.text(*m_info.catalogue));
         last = id;

@@ -96,6 +96,10 @@ public:
     /// Has a listed record take over the user's marks of an old one.
     void passMarks(const EffectRecord &old, const QString &id);
 
+    /// Has written catalogues leave a listed record out, or hold it again. A next run asks a file anew of
+    /// which nothing is recorded.
+    void setHidden(const QString &id, bool isHidden);
+
     /// Empties the effect list.
     void clearEffects();
     /// Empties the effect list and fills it from the known list.

@@ -244,26 +244,43 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
         for (const EffectRecord &record : records.listed)
             added |= add(record) && m_isTouched;
     giveUpOthers(item, records);
+    for (const EffectRecord &record : droppedOf(item, records)) {
+        m_dropped.push_back(record);
+        if (m_hasCollected)
+            m_waiting.insert({record.id, ListedEffect(record)});
+    }
     for (EffectRecord &record : records.kept)
         addLater(std::move(record));
     for (const EffectRecord &marker : records.crashes)
         m_host.applyCrash(marker);
-    m_likelyMarks.insert(m_likelyMarks.end(), records.likelyMarks.begin(), records.likelyMarks.end());
+    for (const auto &likely : records.likelyMarks) {
+        m_likelyMarks.push_back(likely);
+        m_host.setHidden(likely.first, true);
+    }
     m_memory.keep();
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
     return added;
 }
 
+/// What an item lists no more while another file of its name may yet come to list it: the marks would be lost
+/// with this process. Without a time stamp, which has the next scan ask the file again.
+std::vector<EffectRecord> FolderScan::droppedOf(const ScanItem &item, const OutcomeRecords &records) const
+{
+    std::vector<EffectRecord> dropped;
+    for (const EffectRecord *old : item.known)
+        if (!records.holds(old->id) && mayYetBeListed(*old)) {
+            dropped.push_back(*old);
+            dropped.back().fileTime.clear();
+        }
+    return dropped;
+}
+
 /// What was known of an item and is not kept gives its identifier up, as if it had been read without it.
 void FolderScan::giveUpOthers(const ScanItem &item, const OutcomeRecords &records)
 {
-    const auto hasId = [](const std::vector<EffectRecord> &all, const QString &id) {
-        return std::any_of(all.begin(), all.end(),
-                           [&](const EffectRecord &record) { return record.id == id; });
-    };
     for (const EffectRecord *old : item.known)
-        if (!hasId(records.listed, old->id) && !hasId(records.kept, old->id))
+        if (!records.holds(old->id))
             m_host.giveUp(old->id);
 }
 
@@ -315,6 +332,9 @@ bool FolderScan::add(const EffectRecord &record)
 {
     const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
     const bool isAdded = m_host.AddEffect(record);
+    for (const EffectRecord &later : m_later) // now, as another plug-in may end this process
+        if (isAdded && later.id == record.id)
+            passMarksToHolder(later);
     if (!holder || isSamePath(holder->path, record.path))
         return isAdded;
     if (isAdded) // the holder has an older version, which this one replaces
@@ -328,6 +348,7 @@ bool FolderScan::add(const EffectRecord &record)
 void FolderScan::addLater(EffectRecord record)
 {
     insertFirst(record);
+    passMarksToHolder(record);
     m_later.push_back(std::move(record));
 }
 
@@ -343,6 +364,9 @@ void FolderScan::collectWaiting(std::size_t from)
     for (const EffectRecord *record : m_host.known().all())
         if (!m_host.isListed(record->id) && settled.count(record->path) == 0)
             m_waiting.insert({record->id, ListedEffect(*record)});
+    for (const EffectRecord &record : m_dropped)
+        if (!m_host.isListed(record.id) && mayYetBeListed(record))
+            m_waiting.insert({record.id, ListedEffect(record)});
 }
 
 bool FolderScan::writeInterim()
@@ -352,12 +376,14 @@ bool FolderScan::writeInterim()
     return isWritten;
 }
 
-/// Whether a file that a cancelled scan did not reach may be the one in which the plug-in was.
+/// Whether another file, which is still to be asked or which a cancelled scan did not reach, may be the one
+/// in which the plug-in was.
 bool FolderScan::mayYetBeListed(const EffectRecord &old) const
 {
     const std::vector<ScanItem> &items = m_plan->items();
     for (std::size_t index = m_done; index < items.size(); ++index)
-        if (!isSettled(index) && isSamePath(fileNameOf(items[index].path), fileNameOf(old.path)))
+        if (!isSettled(index) && isSamePath(fileNameOf(items[index].path), fileNameOf(old.path)) &&
+            !isSamePath(items[index].path, old.path))
             return true;
     return false;
 }
@@ -368,9 +394,13 @@ void FolderScan::finish(bool isWhole)
     for (const EffectRecord &record : m_later)
         if (!m_host.AddEffect(record))
             passMarksToHolder(record);
-    for (const auto &[id, old] : m_likelyMarks)
-        if (!m_host.isListed(old->id) && !mayYetBeListed(*old))
+    for (const auto &[id, old] : m_likelyMarks) {
+        if (mayYetBeListed(*old)) // the next scan knows
+            continue;
+        if (!m_host.isListed(old->id))
             m_host.passMarks(*old, id);
+        m_host.setHidden(id, false);
+    }
     listIgnored();
     if (isWhole) {
         const ScanPlan::MovedToCrashed moved = m_plan->movedToCrashed();

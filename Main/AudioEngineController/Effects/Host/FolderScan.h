@@ -55,6 +55,7 @@ private:
     bool add(const EffectRecord &record);
     void addLater(EffectRecord record);
     void passMarksToHolder(const EffectRecord &record);
+    std::vector<EffectRecord> droppedOf(const ScanItem &item, const OutcomeRecords &records) const;
     void giveUpOthers(const ScanItem &item, const OutcomeRecords &records);
     void forgetGone();
     void listIgnored();
@@ -86,10 +87,11 @@ private:
     ScanMemory m_memory;
     QSet<QString> m_found; ///< the modules, by `pathKey`
     WaitingRecords m_waiting;
-    bool m_hasCollected = false;       ///< what waits, for the first interim write
-    std::size_t m_done = 0;            ///< items, from the first on
-    std::set<std::size_t> m_keptAhead; ///< items behind them that are done, of a scan that was cancelled
-    std::vector<EffectRecord> m_later; ///< what files keep that failed, unless another comes to list it
+    bool m_hasCollected = false;         ///< what waits, for the first interim write
+    std::size_t m_done = 0;              ///< items, from the first on
+    std::set<std::size_t> m_keptAhead;   ///< items behind them that are done, of a scan that was cancelled
+    std::vector<EffectRecord> m_dropped; ///< what files list no more, for interim writes
+    std::vector<EffectRecord> m_later;   ///< what files keep that failed, unless another comes to list it
     /// Identifiers, and the old records whose marks they get unless another file lists those.
     std::vector<std::pair<QString, const EffectRecord *>> m_likelyMarks;
     bool m_written = false;

@@ -198,18 +198,18 @@ void Maker::keepUnchanged()
 {
     for (const EffectRecord *record : m_item.known)
         made.kept.push_back(*record);
-    for (const EffectRecord *record : m_item.moved) {
-        if (record->standsForFile())
-            continue;
-        EffectRecord moved = *record;
-        moved.path = m_item.path;
-        moved.fileTime.clear(); // what another path's file was, or did, says nothing
-        moved.enabled |= !moved.working;
-        made.kept.push_back(moved);
-    }
+    for (const EffectRecord *record : m_item.moved)
+        if (!record->standsForFile())
+            made.kept.push_back(ScanPlan::movedUnasked(*record, m_item.path));
 }
 
 } // namespace
+
+bool OutcomeRecords::holds(const QString &id) const
+{
+    const auto hasId = [&](const EffectRecord &record) { return record.id == id; };
+    return std::any_of(listed.begin(), listed.end(), hasId) || std::any_of(kept.begin(), kept.end(), hasId);
+}
 
 OutcomeRecords recordsOfOutcome(const CatalogueHost &host, const ScanPlan &plan, const ScanItem &item,
                                 const ProbeOutcome &outcome)

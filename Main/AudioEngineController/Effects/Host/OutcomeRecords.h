@@ -14,6 +14,9 @@ struct OutcomeRecords {
     std::vector<EffectRecord> crashes;
     /// Identifiers of listed ones, and the old records whose marks they get unless another file lists those.
     std::vector<std::pair<QString, const EffectRecord *>> likelyMarks;
+
+    /// True when one of the listed or kept ones has the identifier.
+    bool holds(const QString &id) const;
 };
 
 /// The records of an item of the plan when its probe came to this. Changes nothing; the order in which

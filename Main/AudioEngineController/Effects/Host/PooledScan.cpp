@@ -248,18 +248,20 @@ void FolderScan::PooledScan::jobEnds(std::size_t item, int worker, const ProbeOu
     writeInterim();
 }
 
-/// Has interim writes carry what came of an item before those ahead of it have ended; unless it lists what
-/// is known of one of these, whose marks would be lost with this process.
+/// Has interim writes carry what came of an item before those ahead of it have ended; unless whose marks it
+/// gets is not settled, or it lists what is known of one of these, whose marks would be lost with this
+/// process.
 void FolderScan::PooledScan::holdBack(std::size_t item)
 {
     State &state = m_states[item];
     OutcomeRecords records = recordsOfOutcome(m_scan.m_host, *m_scan.m_plan, m_items[item], *state.outcome);
     const auto isOthers = [&](const EffectRecord &record) { return isOfOpenItem(record.id, item); };
-    if (std::any_of(records.listed.begin(), records.listed.end(), isOthers))
+    if (!records.likelyMarks.empty() || std::any_of(records.listed.begin(), records.listed.end(), isOthers))
         return;
     state.isHeldBack = true;
     removeWaiting(m_items[item], m_scan.m_waiting);
-    state.pending = std::move(records.listed);
+    state.pending = m_scan.droppedOf(m_items[item], records);
+    state.pending.insert(state.pending.end(), records.listed.begin(), records.listed.end());
     state.pending.insert(state.pending.end(), records.kept.begin(), records.kept.end());
     for (const EffectRecord &record : state.pending)
         m_scan.insertFirst(record);

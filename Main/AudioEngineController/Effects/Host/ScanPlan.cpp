@@ -10,9 +10,13 @@
 
 namespace {
 
-/// Whether the record that speaks for a file does not fit it any more.
-bool isOutdated(const EffectRecord &first, const QString &fileTime)
+/// Whether the record that speaks for a file does not fit it any more, or a scan that asked it was cut off.
+bool isOutdated(const KnownList::Records &known, const QString &fileTime)
 {
+    const EffectRecord &first = *known.front();
+    const auto hasNoTime = [](const EffectRecord *record) { return record->fileTime.isEmpty(); };
+    if (!first.isCrashedFile() && std::any_of(known.begin(), known.end(), hasNoTime))
+        return true;
     if (!first.enabled)
         return first.subId != 0 && // all sub-plug-ins of a shell are disabled
                (!first.isSwitchedOff() || first.fileTime != fileTime);
@@ -86,7 +90,8 @@ void ScanPlan::decide(const QStringList &modules)
         decideModule(path);
     }
     sortMissing(found);
-    if (!m_items.empty() || !m_gone.empty()) { // else there is nothing to settle, nor what a copy may be of
+    // Else there is nothing to settle, nor what a copy may be of.
+    if (!m_items.empty() || !m_gone.empty() || m_host.hasNewCrashes()) {
         indexKept();
         settleAllGone(modules);
         leaveOutCopies();
@@ -109,7 +114,7 @@ void ScanPlan::decideModule(const QString &path)
     const QString fileTime = m_host.moduleTime(path);
     const bool isAbsent = fileTime.isEmpty(); // not a module after all; unless nobody lets us see
     if (m_host.isLeftAlone(path) || (isAbsent && (cannotBeExamined(path) || leadsNowhere(path))) ||
-        (!isAbsent && !known.empty() && !isOutdated(*known.front(), fileTime)))
+        (!isAbsent && !known.empty() && !isOutdated(known, fileTime)))
         keep(known);
     else if (!isAbsent)
         m_items.push_back({path, fileTime, std::move(known), {}});
@@ -212,11 +217,29 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
             bestPlace = place;
         }
     }
-    m_settled.push_back({&gone, namesakes, heirs});
+    m_settled.push_back({&gone, namesakes, heirs, best ? QString() : leftAloneOf(namesakes)});
     if (best)
         best->moved = gone.records;
     else
         askAgain(namesakes);
+}
+
+/// The first file of which nothing is known that this run must not touch; empty when there is none.
+QString ScanPlan::leftAloneOf(const QStringList &namesakes) const
+{
+    const auto found = std::find_if(namesakes.begin(), namesakes.end(), [this](const QString &path) {
+        return m_host.isLeftAlone(path) && m_host.known().recordsOfPath(path).empty();
+    });
+    return found == namesakes.end() ? QString() : *found;
+}
+
+EffectRecord ScanPlan::movedUnasked(const EffectRecord &gone, const QString &path)
+{
+    EffectRecord moved = gone;
+    moved.path = path;
+    moved.fileTime.clear(); // what another path's file was, or did, says nothing
+    moved.enabled |= !moved.working;
+    return moved;
 }
 
 ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
@@ -226,6 +249,10 @@ ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
         return !known.empty() && known.front()->isCrashedFile();
     };
     MovedToCrashed moved;
+    for (const SettledFile &settled : m_settled)
+        for (const EffectRecord *record : settled.gone->records)
+            if (!settled.leftAlone.isEmpty() && !record->standsForFile())
+                moved.records.push_back(movedUnasked(*record, settled.leftAlone));
     if (!m_host.hasNewCrashes()) // what crashed long ago is none that has moved just now
         return moved;
     for (const SettledFile &settled : m_settled)

@@ -66,6 +66,9 @@ public:
     /// come to list that plug-in.
     const EffectRecord *likelySourceOfMarks(const ScanItem &item, const EffectRecord &probed) const;
 
+    /// A record of a gone file at a path where it is asked again next time.
+    static EffectRecord movedUnasked(const EffectRecord &gone, const QString &path);
+
 private:
     struct KnownFile {
         QString path;
@@ -77,6 +80,7 @@ private:
         const KnownFile *gone;
         QStringList namesakes;
         QStringList heirs; ///< new files of its name, one of which its records move to
+        QString leftAlone; ///< else the one of its name that this run must not touch
     };
 
     void decideModule(const QString &path);
@@ -86,6 +90,7 @@ private:
     void indexKept();
     void settleAllGone(const QStringList &modules);
     void settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes);
+    QString leftAloneOf(const QStringList &namesakes) const;
     void moveToCrashed(const KnownFile &gone, const QStringList &namesakes, MovedToCrashed &all) const;
     void askAgain(const QStringList &paths);
     bool isKept(const QString &path) const;
