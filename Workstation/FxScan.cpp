@@ -1,5 +1,6 @@
 #include "Workstation/FxScan.h"
 
+#include "Core/BaseLib/Files/SearchArea.h"
 #include "Core/BaseLib/Files/TextFile.h"
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/WorkstationServices/AudioPlugins.h"
@@ -21,6 +22,8 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+
+#include <algorithm>
 
 namespace {
 
@@ -113,6 +116,18 @@ int show(const ScanOptions &options, const DataFiles &files)
     return unknown.isEmpty() ? conclude(options, summary, {}) : ScanExit::kUsage;
 }
 
+/// Those of which something lies at or below some paths.
+std::vector<Duplicate> duplicatesBelow(std::vector<Duplicate> duplicates, const QStringList &paths)
+{
+    const SearchArea area(paths, {});
+    const auto isElsewhere = [&](const Duplicate &duplicate) {
+        return std::none_of(duplicate.members.begin(), duplicate.members.end(),
+                            [&](const DuplicateMember &member) { return area.isWithin(member.path); });
+    };
+    duplicates.erase(std::remove_if(duplicates.begin(), duplicates.end(), isElsewhere), duplicates.end());
+    return duplicates;
+}
+
 int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &folders, ScanPlace &place)
 {
     const HostApplication workstation(options.dataFolder, folders.listed);
@@ -137,8 +152,11 @@ int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &
     lines.begin(options.dataFolder, searched);
     ScanSession session(options, registry, qEnvironmentVariable("FXPROBE_REPORT"), lines);
     const bool isFinished = session.run();
-    ScanSummary summary = summariseScan(onlyBelow(readCatalogues(files.effects), folders.shown), before,
-                                        session.account(), ProbeMemory(files.effects));
+    const ProbeMemory memory(files.effects);
+    const CatalogueView now = readCatalogues(files.effects);
+    ScanSummary summary = summariseScan(onlyBelow(now, folders.shown), before, session.account(), memory);
+    if (!folders.shown.isEmpty()) // the one that is used in place of a copy may lie elsewhere
+        summary.duplicates = duplicatesBelow(findDuplicates(now.plugins, memory), folders.shown);
     summary.finished = isFinished;
     if (!isFinished)
         complain(session.reason());

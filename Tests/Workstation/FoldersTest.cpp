@@ -38,6 +38,8 @@ listed: @/Plugins/a @/Plugins/b/Two.vst3 @/Plugins/c @/Plugins/b @/Plugins/d @/P
 usual .
 fxscan 0 --folders: @/Plugins/a\n@/Plugins/b/Two.vst3\n@/Plugins/c\n@/Plugins/b\n@/Plugins/d\n@/Plugins/e\n
 vst2 Name Favourite: Echo|1
+put e/Copy.vst3: class One
+fxscan 0 @/Plugins/e: not used  VST 3  @/Plugins/e/Copy.vst3: a copy of @/Plugins/a/One.vst3
 
 = A scan of one folder follows the links in it
 put a/Own.vst3, drive/Two.vst3, drive/deep/Three.clap, other/Four.clap:
