@@ -88,7 +88,7 @@ _fxscan() {
     if [[ $current == -* ]]; then
         mapfile -t COMPREPLY < <(compgen -W '%2' -- "$current")
     else
-        _fxscan_files -d
+        _fxscan_files -f
     fi
 }
 

@@ -120,7 +120,9 @@ void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount 
             failedNow.insert(file);
         const bool wasKnown = gone.erase(identityOf(plugin)) + failedBefore.count(file) != 0 ||
                               (standsForFile && filesBefore.count(file) != 0);
-        const bool wasProbed = account.wasProbed(file.first, file.second);
+        const ProbeAccount *probe = account.find({file.first, file.second, 0});
+        const bool wasProbed =
+            account.wasProbed(file.first, file.second) && !(probe && probe->status == ProbeStatus::Skipped);
         ++(!wasKnown ? summary.added : wasProbed ? summary.updated : summary.unchanged);
     }
     for (const auto &[identity, name] : gone)

@@ -87,7 +87,7 @@ TEST(Options, BashCompletesThem)
     EXPECT_EQ(completions(bash, {"--format", ""}), QStringList({"table", "json", "jsonl", "csv", "html"}));
     EXPECT_EQ(completions(bash, {"--timeout", ""}), QStringList());
     EXPECT_EQ(completions(bash, {"--data-folder", "/us"}), QStringList("/usr"));
-    EXPECT_EQ(completions(bash, {"/us"}), QStringList("/usr"));
+    EXPECT_TRUE(completions(bash, {"/etc/pass"}).contains("/etc/passwd")) << "a plug-in may be a file";
 }
 
 TEST(Options, ManualIsTroff)

@@ -92,6 +92,11 @@ TEST_F(FxScanOnTerminal, ShowsALiveLineAndListensToKeys)
                                      "is kept\nFORMAT"))
         << qPrintable(remains());
     EXPECT_EQ(recordsOf("VST3Configuration.xml", "Name Enabled Working"), QStringList("Good|1|1"));
+
+    dateLater(put("Good.vst3", "class Good\nfault initialize hang\n"));
+    QFile::remove(m_folder.path("Plugins/Hang.vst3"));
+    EXPECT_EQ(run("(2 s of 60; s", 's'), 0);
+    EXPECT_TRUE(remains().endsWith("\n1 plug-in: 1 usable; 1 skipped: Good.vst3\n")) << qPrintable(remains());
     EXPECT_EQ(m_folder.markers(), QStringList());
 }
 
