@@ -217,6 +217,17 @@ scan 2
 vst3 Name Path Favourite: B|b/B.vst3|0, S|c/A.vst3|1, T|c/A.vst3|0
 same
 
+= A file is asked for what another one lists no more, whatever a scan that was cut off remembers
+put a/B.vst3: class S | #1
+put c/B.vst3: class S | #1 | class T | #2
+scan
+mark S Favourite 1
+edit Effects/FXProbes.json: "heldBy":"@/Plugins/a/B.vst3" => "heldBy":""
+new a/B.vst3: class U | #3
+scan
+vst3 Name Path Favourite: U|a/B.vst3|0, S|c/B.vst3|1, T|c/B.vst3|0
+same
+
 = A catalogue of a negative version keeps its categories
 put Comp.vst3:
 scan

@@ -335,14 +335,22 @@ void ScanPlan::leaveOutCopies()
                   m_items.end());
 }
 
-/// Has files asked again that list something which another file held that is gone or asked now.
+/// Has files asked again that list something which another file held that is gone or asked now. Which one
+/// that is says the catalogue where the memory does not: a process may have ended between writing the two.
 void ScanPlan::askCopiesOfUnsettled()
 {
+    QHash<QString, const EffectRecord *> holders;
+    for (const EffectRecord *record : m_host.known().all())
+        holders.insert(record->id, record);
+    const auto isElsewhere = [&](const QString &id, const QString &path) {
+        const EffectRecord *holder = holders.value(id);
+        return holder && !isSamePath(holder->path, path) && !isKept(holder->path);
+    };
     QStringList copies;
     m_memory.forEach(m_host.format(), [&](const RememberedProbe &last) {
         const bool isUnsettled =
-            std::any_of(last.plugins.begin(), last.plugins.end(), [this](const RememberedPlugin &plugin) {
-                return !plugin.heldBy.isEmpty() && !isHeld(plugin);
+            std::any_of(last.plugins.begin(), last.plugins.end(), [&](const RememberedPlugin &plugin) {
+                return plugin.heldBy.isEmpty() ? isElsewhere(plugin.id, last.path) : !isHeld(plugin);
             });
         if (isUnsettled)
             copies.append(last.path);
