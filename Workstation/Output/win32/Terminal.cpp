@@ -1,6 +1,7 @@
 #include "Workstation/Output/Terminal.h"
 #include "Workstation/Output/TerminalStream.h"
 
+#include <fcntl.h>
 #include <io.h>
 
 #include <qt_windows.h>
@@ -20,8 +21,10 @@ bool TerminalStream::isTerminal(std::FILE *stream)
 // As UTF-16, whatever the console's code page is.
 std::optional<bool> TerminalStream::writeAsText(std::FILE *stream, const QString &text)
 {
-    if (!isTerminal(stream))
+    if (!isTerminal(stream)) {
+        _setmode(_fileno(stream), _O_BINARY); // lines end as they are written: CSV's have a CR already
         return std::nullopt;
+    }
     DWORD written = 0;
     return WriteConsoleW(handleOf(stream), text.utf16(), static_cast<DWORD>(text.size()), &written,
                          nullptr) != 0;
