@@ -82,8 +82,10 @@ class A / answer get-extension null ~ A|fixture.A|Fixture Works|1.0|audio-effect
 null port-count / class A ~ A|fixture.A|Fixture Works|1.0|audio-effect 0>0
 null port-info / class A ~ A|fixture.A|Fixture Works|1.0|audio-effect 0>0
 )";
-    for (const QStringList &row :
-         rowsOf(QByteArray(rows).replace('*', QByteArray(5000, 'n')).replace('+', QByteArray(4096, 'n')))) {
+    // An identifier is cut after 4,096 bytes.
+    const QString table =
+        QString::fromUtf8(rows).replace('*', QString(5000, 'n')).replace('+', QString(4096, 'n'));
+    for (const QStringList &row : rowsOf(table.toUtf8())) {
         QStringList found;
         for (const EffectRecord &record : probe("Parts", scriptIn(row[0])).records)
             found << QStringList({record.name, record.id, record.vendor, record.version, record.categories})
