@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Core/BaseLib/Files/TextFile.h"
 #include "Core/BaseLib/Log/DebugLog.h"
+#include "Core/BaseLib/Log/LogSink.h"
 #include "Core/BaseLib/WorkstationServices/AudioPlugins.h"
 #include "Main/AudioEngineController/Effects/PluginHost.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
@@ -214,8 +215,10 @@ int prepareAndScan(const ScanOptions &options, const DataFiles &files)
         else
             exitCode = scan(options, files, folders, place);
     }
-    if (exitCode == ScanExit::kUsage)
+    if (exitCode == ScanExit::kUsage) {
+        setLogSink(FileLogSink::onStandardError()); // Windows removes no folder whose log is open
         place.removeMade();
+    }
     return exitCode;
 }
 

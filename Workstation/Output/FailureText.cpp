@@ -83,7 +83,7 @@ QString renderGroup(const Group &group, const ScanSummary &summary)
 
 QString shellWord(const QString &text)
 {
-    static const QRegularExpression special(QStringLiteral("[^\\w./+-]"),
+    static const QRegularExpression special(QStringLiteral("[^\\w./:+-]"),
                                             QRegularExpression::UseUnicodePropertiesOption);
     if (!text.contains(special) && !text.isEmpty())
         return text;
