@@ -34,7 +34,8 @@ struct ChannelMessage {
 
 /// The argument with which the scanner program is a worker of another scanner.
 inline constexpr char kProbeWorkerArgument[] = "-probe_worker";
-/// The exit code of a worker whose channel is gone; any that plug-ins hardly take: abort() takes 3 on Windows.
+/// The exit code of a worker whose channel is gone; any that plug-ins hardly take: abort() takes 3 on
+/// Windows.
 inline constexpr int kChannelLost = 213;
 
 /// A message as it goes through a channel: its size in four bytes, the lowest first, and its content.
