@@ -16,7 +16,7 @@
 
 namespace {
 
-constexpr std::chrono::seconds kPatience(5); ///< with a folder that was given and gives no answer
+constexpr std::chrono::seconds kPatience(10); ///< with a folder that was given and gives no answer
 
 bool isModuleName(const QString &path)
 {

@@ -55,12 +55,13 @@ QString badText(const EffectRecord &record)
 bool answers(const QString &folder)
 {
     thread_local QHash<QString, bool> known;
-    thread_local std::chrono::milliseconds patience(2000); // after the first that does not answer less
+    // A disk that sleeps takes some seconds. After the first folder that gives no answer less.
+    thread_local std::chrono::milliseconds patience(10000);
     if (const auto before = known.constFind(folder); before != known.constEnd())
         return *before;
     const bool answers = answerInTime(patience, [folder] { return QFileInfo::exists(folder); }).has_value();
     if (!answers)
-        patience = std::chrono::milliseconds(200);
+        patience = std::chrono::milliseconds(1000);
     known.insert(folder, answers);
     return answers;
 }
