@@ -364,13 +364,16 @@ QString CatalogueHost::freeIdentifier(const EffectRecord &plugin, const QString 
 {
     const auto isFree = [&](const QString &candidate) {
         const EffectRecord *listed = m_effects.find(candidate);
-        return !candidate.isEmpty() && !looksLikeIdentifier(*m_info.catalogue, candidate) &&
-               !(listed && !listed->isSamePlugin(plugin)) &&
+        return !(listed && !listed->isSamePlugin(plugin)) &&
                (m_givenUp.count(candidate) != 0 || !m_known.isIdHeldByOther(candidate, plugin));
     };
+    // Only of the name is asked what it looks like: a damaged marker's path may look like an identifier, and
+    // so would every text made of it.
+    if (!name.isEmpty() && !looksLikeIdentifier(*m_info.catalogue, name) && isFree(name))
+        return name;
     const QString ofSubPlugin = plugin.path + QLatin1Char(':') + QString::number(plugin.subId);
-    for (const QString &candidate : {name, plugin.path, ofSubPlugin})
-        if (isFree(candidate))
+    for (const QString &candidate : {plugin.path, ofSubPlugin})
+        if (!candidate.isEmpty() && isFree(candidate))
             return candidate;
     int number = 2;
     QString numbered;
