@@ -163,10 +163,7 @@ const std::vector<OptionRow> &optionTable()
         {"no-favourite", "name", &ScanOptions::noFavourite, "Take the mark of a favourite away."},
         {"no-ignore", "path", &ScanOptions::noIgnore, "Load an ignored plug-in again."},
         {"only", "word", WordsTarget{&ScanOptions::only, filterWords},
-         "Show only some plug-ins: ok, failed, disabled, switched-off, folder-away, ignored, favourite, "
-         "instrument, the name of a format (vst3, vst2, clap), category=NAME or vendor=TEXT (a part of it). "
-         "Can "
-         "be given several times.",
+         "Show only some plug-ins: %1 (a part of the name is enough). Can be given several times.",
          "Of several words of one kind one must fit: --only failed --only disabled shows both. Words of "
          "different kinds must all fit: --only vst3 --only instrument shows instruments in that format. It "
          "changes what is printed, in every format, not what is scanned, nor the exit code."},
@@ -244,11 +241,18 @@ const std::vector<OptionConflict> &optionConflicts()
     return conflicts;
 }
 
+QString helpOf(const OptionRow &row)
+{
+    const QString help = QString::fromLatin1(row.help);
+    const WordsTarget *const target = std::get_if<WordsTarget>(&row.target);
+    return target ? help.arg(inWords(target->words())) : help;
+}
+
 QList<QCommandLineOption> commandLineOptions()
 {
     QList<QCommandLineOption> options;
     for (const OptionRow &row : optionTable())
-        options += QCommandLineOption(QString::fromLatin1(row.name), QString::fromLatin1(row.help),
+        options += QCommandLineOption(QString::fromLatin1(row.name), helpOf(row),
                                       QString::fromLatin1(row.valueName));
     return options;
 }

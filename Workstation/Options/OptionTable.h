@@ -40,7 +40,7 @@ struct OptionRow {
     const char *valueName; ///< empty for a switch; for "folder", "file" and "path" a shell offers
                            ///< just these
     OptionTarget target;
-    const char *help;      ///< for `--help` and the manual
+    const char *help;      ///< for `--help` and the manual, see `helpOf`
     const char *more = ""; ///< what only the manual adds
 
     bool isSwitch() const { return *valueName == '\0'; }
@@ -58,6 +58,9 @@ const std::vector<OptionRow> &optionTable();
 const std::vector<OptionConflict> &optionConflicts();
 /// The options that do something else than a scan. They take no folders to scan.
 const std::vector<const char *> &optionsWithoutScan();
+
+/// What `--help` and the manual say of an option; in a row of words they stand at "%1".
+QString helpOf(const OptionRow &row);
 
 /// The table for a `QCommandLineParser`.
 QList<QCommandLineOption> commandLineOptions();

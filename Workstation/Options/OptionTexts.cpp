@@ -30,9 +30,8 @@ QString completionCommand(const OptionRow &row)
 
 /// Plain text for troff: dashes stay dashes, and no line begins with a character that troff takes for a
 /// request.
-QString escaped(const char *text)
+QString escaped(QString escaped)
 {
-    QString escaped = QString::fromLatin1(text);
     escaped.replace(QLatin1Char('\\'), QLatin1String("\\e")).replace(QLatin1Char('-'), QLatin1String("\\-"));
     if (escaped.startsWith(QLatin1Char('.')) || escaped.startsWith(QLatin1Char('\'')))
         escaped.prepend(QLatin1String("\\&"));
@@ -43,12 +42,13 @@ QString manualEntry(const OptionRow &row)
 {
     QString entry = QLatin1String(".TP\n");
     if (row.isSwitch())
-        entry += QStringLiteral(".B \\-\\-%1\n").arg(escaped(row.name));
+        entry += QStringLiteral(".B \\-\\-%1\n").arg(escaped(QLatin1String(row.name)));
     else
-        entry += QStringLiteral(".BI \\-\\-%1 \" %2\"\n").arg(escaped(row.name), escaped(row.valueName));
-    entry += escaped(row.help) + QLatin1Char('\n');
+        entry += QStringLiteral(".BI \\-\\-%1 \" %2\"\n")
+                     .arg(escaped(QLatin1String(row.name)), escaped(QLatin1String(row.valueName)));
+    entry += escaped(helpOf(row)) + QLatin1Char('\n');
     if (*row.more != '\0')
-        entry += escaped(row.more) + QLatin1Char('\n');
+        entry += escaped(QLatin1String(row.more)) + QLatin1Char('\n');
     return entry;
 }
 
@@ -57,7 +57,8 @@ QString manualEntries(const UsageRow (&rows)[Count])
 {
     QString entries;
     for (const UsageRow &row : rows)
-        entries += QStringLiteral(".TP\n.B %1\n%2\n").arg(escaped(row.name), escaped(row.text));
+        entries += QStringLiteral(".TP\n.B %1\n%2\n")
+                       .arg(escaped(QLatin1String(row.name)), escaped(QLatin1String(row.text)));
     return entries;
 }
 
