@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <condition_variable>
+#include <exception>
 #include <iterator>
 #include <mutex>
 #include <set>
@@ -74,6 +75,7 @@ struct FileFinder::Watch {
     bool isGivenUp = false;
     FileFinder finder;
     bool isWhole = false;
+    std::exception_ptr thrown; ///< by the search, for whoever waits
 };
 
 FileFinder::FileFinder(const QStringList &endings, Links links)
@@ -172,10 +174,16 @@ bool FileFinder::searchPatiently(const QStringList &folders, const Cancelled &is
             watch->since = std::chrono::steady_clock::now();
             std::thread thread([watch, folders] {
                 watch->finder.m_watch = watch;
-                const bool isFound = watch->finder.search(folders, [&watch] {
+                const auto isGivenUp = [&watch] {
                     const std::lock_guard<std::mutex> lock(watch->mutex);
                     return watch->isGivenUp;
-                });
+                };
+                bool isFound = false;
+                try {
+                    isFound = watch->finder.search(folders, isGivenUp);
+                } catch (...) {
+                    watch->thrown = std::current_exception();
+                }
                 watch->finder.m_watch.reset();
                 const std::lock_guard<std::mutex> lock(watch->mutex);
                 watch->isWhole = isFound;
@@ -184,6 +192,8 @@ bool FileFinder::searchPatiently(const QStringList &folders, const Cancelled &is
             });
             if (waitFor(watch, isCancelled)) {
                 thread.join();
+                if (watch->thrown)
+                    std::rethrow_exception(watch->thrown);
                 *this = watch->finder;
                 isWhole = watch->isWhole && !(isCancelled && isCancelled());
                 isOver = true;
