@@ -593,7 +593,7 @@ struct WorldProbe final : IPluginProbe {
     explicit WorldProbe(World &of)
         : world(of)
     {}
-    ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) override
+    ProbeOutcome ask(const ProbeJob &job, IProbeObserver &observer) override
     {
         return world.probe(job, observer);
     }

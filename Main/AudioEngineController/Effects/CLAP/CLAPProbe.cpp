@@ -145,16 +145,11 @@ void ModuleListing::fail(const QString &reason)
 
 std::optional<ProbeOutcome> CLAPProbe::look(const ProbeJob &job) const
 {
-    const ModuleInspection file = CLAPModule::inspect(job.path);
-    ProbeOutcome outcome;
-    outcome.take(file);
-    return file.isLoadable() ? std::nullopt : std::make_optional(outcome);
+    return ProbeOutcome::ofFile(CLAPModule::inspect(job.path));
 }
 
-ProbeOutcome CLAPProbe::run(const ProbeJob &job, IProbeObserver &observer)
+ProbeOutcome CLAPProbe::ask(const ProbeJob &job, IProbeObserver &observer)
 {
-    if (const std::optional<ProbeOutcome> seen = job.isLookedAt ? std::nullopt : look(job))
-        return *seen;
     ModuleListing module(job, observer);
     module.list();
     module.close();

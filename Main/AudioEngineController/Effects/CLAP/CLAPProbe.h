@@ -10,5 +10,7 @@
 class CLAPProbe : public IPluginProbe {
 public:
     std::optional<ProbeOutcome> look(const ProbeJob &job) const override;
-    ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) override;
+
+private:
+    ProbeOutcome ask(const ProbeJob &job, IProbeObserver &observer) override;
 };

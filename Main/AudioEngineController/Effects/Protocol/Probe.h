@@ -9,6 +9,7 @@
 
 #include <optional>
 #include <set>
+#include <utility>
 #include <vector>
 
 /// What a probe came to.
@@ -81,15 +82,21 @@ struct ProbeOutcome {
             stage = next;
     }
 
-    /// Takes over what the file tells before it is loaded.
-    void take(const ModuleInspection &file)
+    /// Of a file by what it tells before it is loaded; nothing when it is to be loaded.
+    static std::optional<ProbeOutcome> ofFile(const ModuleInspection &file,
+                                              IfFailed ifFailed = IfFailed::Record)
     {
         using Verdict = ModuleInspection::Verdict;
-        fail(file.reason);
+        if (file.isLoadable())
+            return std::nullopt;
+        ProbeOutcome outcome;
+        outcome.reason = file.reason;
+        outcome.ifFailed = ifFailed;
         if (file.verdict == Verdict::NoLibrary || file.verdict == Verdict::NoExport)
-            status = ProbeStatus::NoPlugin;
+            outcome.status = ProbeStatus::NoPlugin;
         if (file.verdict == Verdict::CutShort || file.verdict == Verdict::Unopened)
-            ifFailed = IfFailed::LookAgain;
+            outcome.ifFailed = IfFailed::LookAgain;
+        return outcome;
     }
 };
 
@@ -125,5 +132,12 @@ public:
     virtual std::optional<ProbeOutcome> look(const ProbeJob & /*job*/) const { return std::nullopt; }
     /// Looks at the job's module, if nobody did, loads it, asks it and unloads it again. Never throws:
     /// whatever the plug-in throws is part of the outcome.
-    virtual ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) = 0;
+    ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer)
+    {
+        std::optional<ProbeOutcome> seen = job.isLookedAt ? std::nullopt : look(job);
+        return seen ? *std::move(seen) : ask(job, observer);
+    }
+
+private:
+    virtual ProbeOutcome ask(const ProbeJob &job, IProbeObserver &observer) = 0;
 };

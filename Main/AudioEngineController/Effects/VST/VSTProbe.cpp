@@ -195,16 +195,11 @@ void Run::closeEffect()
 
 std::optional<ProbeOutcome> VSTProbe::look(const ProbeJob &job) const
 {
-    const ModuleInspection file = VSTModule::inspect(job.path);
-    ProbeOutcome outcome;
-    outcome.take(file);
-    return file.isLoadable() ? std::nullopt : std::make_optional(outcome);
+    return ProbeOutcome::ofFile(VSTModule::inspect(job.path));
 }
 
-ProbeOutcome VSTProbe::run(const ProbeJob &job, IProbeObserver &observer)
+ProbeOutcome VSTProbe::ask(const ProbeJob &job, IProbeObserver &observer)
 {
-    if (const std::optional<ProbeOutcome> seen = job.isLookedAt ? std::nullopt : look(job))
-        return *seen;
     Run run(job, observer);
     try {
         run.ask();

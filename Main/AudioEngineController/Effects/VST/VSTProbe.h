@@ -6,5 +6,7 @@
 class VSTProbe : public IPluginProbe {
 public:
     std::optional<ProbeOutcome> look(const ProbeJob &job) const override;
-    ProbeOutcome run(const ProbeJob &job, IProbeObserver &observer) override;
+
+private:
+    ProbeOutcome ask(const ProbeJob &job, IProbeObserver &observer) override;
 };

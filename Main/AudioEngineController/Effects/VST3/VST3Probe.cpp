@@ -231,17 +231,11 @@ ProbeOutcome::IfFailed ifFailed(const QString &path, bool factoryFound)
 
 std::optional<ProbeOutcome> VST3Probe::look(const ProbeJob &job) const
 {
-    const ModuleInspection file = VST3Module::inspect(job.path);
-    ProbeOutcome outcome;
-    outcome.ifFailed = ifFailed(job.path, true);
-    outcome.take(file);
-    return file.isLoadable() ? std::nullopt : std::make_optional(outcome);
+    return ProbeOutcome::ofFile(VST3Module::inspect(job.path), ifFailed(job.path, true));
 }
 
-ProbeOutcome VST3Probe::run(const ProbeJob &job, IProbeObserver &observer)
+ProbeOutcome VST3Probe::ask(const ProbeJob &job, IProbeObserver &observer)
 {
-    if (const std::optional<ProbeOutcome> seen = job.isLookedAt ? std::nullopt : look(job))
-        return *seen;
     ProbeOutcome outcome;
     bool factoryFound = true;
     ModuleListing module(job.path, outcome, observer);
