@@ -142,6 +142,8 @@ TEST_F(Looking, WhatIsThereMoreThanOnceSaysWhatIsUsed)
 {
     put("a/Comp.vst3", "class Comp\n");
     put("b/Comp.vst3", "class Comp\n"); // a copy
+    put("b/Verb.clap", "class Verb\nid same\n");
+    put("c/Wah.clap", "class Wah\nid same\n"); // no copy
     put("Delay.vst3");
     put("Delay.vst2");
     put("v1/Gate.vst3", "class Gate\nid 00000000000000000000000000000001\n");
@@ -165,7 +167,8 @@ TEST_F(Looking, WhatIsThereMoreThanOnceSaysWhatIsUsed)
     }
     EXPECT_EQ(found, QStringList({"Comp = vst3+a/Comp, vst3-b/Comp: a copy of " + m_folder.path("").left(2),
                                   "Delay = vst3+Delay, vst2+Delay",
-                                  "Gate = vst3+v2/New Gate, vst3-v1/Gate: switched off"}));
+                                  "Gate = vst3+v2/New Gate, vst3-v1/Gate: switched off",
+                                  "Verb = clap+b/Verb, clap-c/Wah: Wah, which h"}));
     const QString shown = QString::fromUtf8(run({"--list"}).standardOutput);
     EXPECT_TRUE(shown.contains("\n  Delay (Fixture Works): VST 3, VST 2, all used\n")) << qPrintable(shown);
     EXPECT_TRUE(

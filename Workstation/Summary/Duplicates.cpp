@@ -67,9 +67,16 @@ private:
             return; // gone since
         for (const RememberedPlugin &plugin : probe.plugins) {
             const auto holder = m_holders.find({&format, plugin.heldBy, plugin.id});
-            if (!plugin.heldBy.isEmpty() && holder != m_holders.end())
-                m_groups[holder->second].members.push_back(
-                    {&format, probe.path, false, QStringLiteral("a copy of %1").arg(plugin.heldBy)});
+            if (plugin.heldBy.isEmpty() || holder == m_holders.end())
+                continue;
+            Duplicate &group = m_groups[holder->second];
+            // Of another name it is another plug-in, whose maker gave two the same identifier.
+            const bool isCopy =
+                plugin.name.isEmpty() || plugin.name.compare(group.name, Qt::CaseInsensitive) == 0;
+            const QString reason = isCopy ? QStringLiteral("a copy of %1").arg(plugin.heldBy)
+                                          : QStringLiteral("%1, which has the same identifier as %2")
+                                                .arg(plugin.name, plugin.heldBy);
+            group.members.push_back({&format, probe.path, false, reason});
         }
     }
 
