@@ -117,16 +117,13 @@ void FixtureScript::add(Words words, const FixtureWords &format)
         subjects.push_back({words.back(), format.subjectHasNumber ? numberOf(words[0]) : 0, subjects.size()});
     else if (!isOfModule && !holdsWord(format.subjectKeys, key))
         reportMisuse("unknown statement '" + key + ' ' + (words.empty() ? "" : words[0]) + "'");
-    m_statements.push_back({key, std::move(words), isOfModule ? 0 : subjects.size() - 1});
+    m_statements[{key, isOfModule ? 0 : subjects.size() - 1}].push_back(std::move(words));
 }
 
 std::vector<FixtureScript::Words> FixtureScript::all(const std::string &key, std::size_t place) const
 {
-    std::vector<Words> found;
-    for (const Statement &statement : m_statements)
-        if (statement.key == key && statement.place == place)
-            found.push_back(statement.words);
-    return found;
+    const auto found = m_statements.find({key, place});
+    return found == m_statements.end() ? std::vector<Words>() : found->second;
 }
 
 std::string FixtureScript::text(const std::string &key, std::size_t place, const std::string &usual) const

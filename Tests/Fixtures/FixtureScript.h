@@ -1,7 +1,9 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <string>
+#include <utility>
 #include <vector>
 
 /// The exit code of a process whose fixture was scripted wrongly or called against its rules, so that neither
@@ -78,16 +80,12 @@ public:
     std::string answer(const std::string &stage, const FixtureSubject &subject = {}) const;
 
 private:
-    struct Statement {
-        std::string key;
-        Words words;
-        std::size_t place;
-    };
     void add(Words words, const FixtureWords &format);
     /// The statements of a key that apply at this stage to this subject. Those of more than `least` words end
     /// with the subject's name or number; the others apply to all.
     std::vector<Words> ordered(const char *key, const std::string &stage, const FixtureSubject &subject,
                                std::size_t least = 2) const;
 
-    std::vector<Statement> m_statements;
+    /// By key and subject, so that a module may have thousands of classes.
+    std::map<std::pair<std::string, std::size_t>, std::vector<Words>> m_statements;
 };

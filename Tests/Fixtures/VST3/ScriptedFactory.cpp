@@ -102,6 +102,12 @@ tresult describe(const char *stage, int32 index, Info &info)
 /// The factory of the scripted module: one object for the module's life.
 class ScriptedFactory final : public IPluginFactory3 {
 public:
+    ScriptedFactory()
+    {
+        for (const FixtureSubject &described : script().subjects)
+            if (described.place != 0)
+                m_places.emplace(idOf(described), described.place); // of two with one identifier the first
+    }
     virtual ~ScriptedFactory() = default;
 
     tresult PLUGIN_API queryInterface(const TUID id, void **object) override
@@ -172,18 +178,18 @@ public:
     tresult PLUGIN_API createInstance(FIDString classId, FIDString interfaceId, void **object) override
     {
         *object = nullptr;
-        for (const FixtureSubject &described : script().subjects) {
-            if (described.place == 0 || !FUnknownPrivate::iidEqual(idOf(described).toTUID(), classId))
-                continue;
-            script().reach("create-instance", described);
-            if (!script().answer("create-instance", described).empty())
-                return resultAt("create-instance", described);
-            return createInstanceOf(described, interfaceId, object);
-        }
-        return kInvalidArgument;
+        const auto described = m_places.find(FUID::fromTUID(classId));
+        if (described == m_places.end())
+            return kInvalidArgument;
+        const FixtureSubject &subject = script().subjects[described->second];
+        script().reach("create-instance", subject);
+        if (!script().answer("create-instance", subject).empty())
+            return resultAt("create-instance", subject);
+        return createInstanceOf(subject, interfaceId, object);
     }
 
 private:
+    std::map<FUID, std::size_t> m_places; ///< of the classes among the script's subjects
     uint32 m_references = 0;
 };
 
