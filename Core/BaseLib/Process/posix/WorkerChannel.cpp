@@ -7,6 +7,7 @@
 #include <thread>
 
 #include <fcntl.h>
+#include <sys/prctl.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
@@ -15,8 +16,11 @@ namespace {
 constexpr int kBlock = 65536;
 constexpr useconds_t kLook = 250000;
 
-/// Ends this process and its group when the scanner has ended. The signal that the system sends then does not
-/// reach a worker whose plug-in has switched it off.
+/// This process, and what its plug-ins started in its group.
+void endGroup(int) { ::kill(-getpid(), SIGKILL); }
+
+/// Ends this process and its group when the scanner has ended. The system sends a signal then, which does not
+/// reach a worker whose plug-in has switched it off, or handles it itself.
 void watchScanner()
 {
     sigset_t all;
@@ -29,6 +33,9 @@ void watchScanner()
                 usleep(kLook);
             ::kill(-getpid(), SIGKILL);
         }).detach();
+        // So far it is SIGKILL, which nothing escapes but what plug-ins started.
+        std::signal(SIGRTMAX, endGroup);
+        prctl(PR_SET_PDEATHSIG, SIGRTMAX);
     } catch (const std::system_error &) { // the signal is there
     }
     pthread_sigmask(SIG_SETMASK, &before, nullptr);
