@@ -24,6 +24,12 @@ struct WorkerEvent {
     std::optional<WorkerEnd> end; ///< set when it has ended; nothing comes from it after that
 };
 
+/// What a worker takes of the machine, with the processes that it started.
+struct WorkerUse {
+    int children = 0;  ///< that run now; counted to some hundreds only
+    qint64 memory = 0; ///< resident, in bytes; 0 when the system does not tell
+};
+
 /// Worker processes: copies of a program that talk to this process through a channel each, and to nobody
 /// else. A worker leads a session of its own (on Windows a job), its input is the null device, what it prints
 /// is kept, and of our descriptors it holds the channel only. While this process lives, nothing outlives its
@@ -51,11 +57,9 @@ public:
     void end(int worker);
     /// The last lines that a worker printed that has ended.
     QString output(int worker) const;
-    /// Whether processes run that a worker started.
-    bool hasChildren(int worker) const;
-    /// Resident memory in bytes of a worker and of the processes that it started; 0 when the system does not
-    /// tell.
-    qint64 residentMemory(int worker) const;
+    /// What a worker takes now. Takes some milliseconds at most, whatever the worker started: of many
+    /// processes the memory of some is as old as the call before, or not known yet.
+    WorkerUse use(int worker);
 
 private:
     struct Private;

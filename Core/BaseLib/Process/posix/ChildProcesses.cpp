@@ -2,13 +2,32 @@
 
 #include "Core/BaseLib/Process/WorkerGroup.h"
 
+#include <QDeadlineTimer>
 #include <QDir>
 #include <QFile>
 
 #include <csignal>
+#include <iterator>
+#include <numeric>
 #include <vector>
 
 #include <unistd.h>
+
+namespace {
+
+/// Resident memory of a process in bytes, with what it shares with others divided among them.
+qint64 shareOfMemory(pid_t process)
+{
+    QFile file(QStringLiteral("/proc/%1/smaps_rollup").arg(process));
+    if (!file.open(QIODevice::ReadOnly))
+        return 0;
+    for (const QByteArray &line : file.readAll().split('\n'))
+        if (line.startsWith("Pss:"))
+            return line.simplified().split(' ').value(1).toLongLong() * 1024; // told in kB
+    return 0;
+}
+
+} // namespace
 
 std::set<pid_t> childrenOf(pid_t process)
 {
@@ -50,7 +69,7 @@ int workerOf(pid_t process)
 
 std::set<pid_t> withDescendants(const std::set<pid_t> &processes)
 {
-    constexpr std::size_t kMost = 1000;
+    constexpr std::size_t kMost = 300;
     std::set<pid_t> all = processes;
     std::vector<pid_t> unseen(processes.begin(), processes.end());
     while (!unseen.empty() && all.size() < kMost) {
@@ -71,13 +90,18 @@ qint64 residentMemoryOf(pid_t process)
     return pages.size() > 1 ? pages.at(1).toLongLong() * sysconf(_SC_PAGESIZE) : 0;
 }
 
-qint64 shareOfMemory(pid_t process)
+qint64 SharedMemory::of(const std::set<pid_t> &processes)
 {
-    QFile file(QStringLiteral("/proc/%1/smaps_rollup").arg(process));
-    if (!file.open(QIODevice::ReadOnly))
-        return 0;
-    for (const QByteArray &line : file.readAll().split('\n'))
-        if (line.startsWith("Pss:"))
-            return line.simplified().split(' ').value(1).toLongLong() * 1024; // told in kB
-    return 0;
+    const QDeadlineTimer deadline(std::chrono::milliseconds(5));
+    for (auto share = m_shares.begin(); share != m_shares.end();)
+        share = processes.count(share->first) == 0 ? m_shares.erase(share) : std::next(share);
+    auto next = processes.upper_bound(m_last); // those whose turn was longest ago
+    for (std::size_t count = 0; count < processes.size() && !deadline.hasExpired(); ++count, ++next) {
+        if (next == processes.end())
+            next = processes.begin();
+        m_shares[*next] = shareOfMemory(*next);
+        m_last = *next;
+    }
+    return std::accumulate(m_shares.begin(), m_shares.end(), qint64(0),
+                           [](qint64 sum, const auto &share) { return sum + share.second; });
 }

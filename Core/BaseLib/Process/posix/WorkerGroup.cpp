@@ -44,6 +44,7 @@ struct Worker {
     Descriptor printed;
     QByteArray unsent;
     QByteArray output;
+    SharedMemory memory;                           ///< its own and that of what it started
     QDeadlineTimer grace{QDeadlineTimer::Forever}; ///< it ends by itself until then
 };
 
@@ -109,12 +110,13 @@ struct WorkerGroup::Private {
     std::map<int, Worker> workers;
     std::map<int, QString> outputs; ///< of those that have ended
     std::set<pid_t> before;         ///< children of this process that are not ours
+    std::map<pid_t, int> adoptedBy; ///< the workers of what came to this process, by their environment
     bool mayHaveOrphans = false;
 
     void readAll(int timeout, std::vector<WorkerEvent> &events);
     bool reap(int number, std::vector<WorkerEvent> &events);
-    std::set<pid_t> childrenOfWorker(int number) const;
-    bool isOrphan(pid_t child) const;
+    std::map<pid_t, int> adopted();
+    int ownerOf(pid_t child, pid_t session);
     void endOrphans();
 };
 
@@ -230,20 +232,38 @@ bool WorkerGroup::Private::reap(int number, std::vector<WorkerEvent> &events)
     return true;
 }
 
-/// Whether a child of this process was left behind by a worker of ours that has ended. A worker leads a
-/// session of its own, and from a session one only gets to a new one: what is in ours was never a worker's.
-bool WorkerGroup::Private::isOrphan(pid_t child) const
+/// The children of this process that workers started, which come here when their parents have ended, with the
+/// numbers of these workers; 0 where nothing tells. A worker leads a session of its own, and from a session
+/// one only gets to a new one: what is in ours was never a worker's.
+std::map<pid_t, int> WorkerGroup::Private::adopted()
 {
-    const pid_t session = getsid(child);
-    if (session == getsid(0) || before.count(child) != 0)
-        return false;
-    const auto isIts = [child, session](const auto &entry) {
-        return entry.second.process == child || entry.second.process == session;
-    };
-    if (std::any_of(workers.begin(), workers.end(), isIts))
-        return false;
-    const int worker = workerOf(child);
-    return worker == 0 || outputs.count(worker) != 0;
+    std::map<pid_t, int> found;
+    const pid_t ours = getsid(0);
+    for (const pid_t child : childrenOf(getpid())) {
+        const pid_t session = getsid(child);
+        const bool isWorker = std::any_of(workers.begin(), workers.end(), [child](const auto &entry) {
+            return entry.second.process == child;
+        });
+        if (isWorker || session == ours || before.count(child) != 0)
+            continue;
+        if (waitpid(child, nullptr, WNOHANG) == child)
+            adoptedBy.erase(child); // it has ended
+        else
+            found[child] = ownerOf(child, session);
+    }
+    return found;
+}
+
+/// The worker that a child is of; 0 when nothing tells.
+int WorkerGroup::Private::ownerOf(pid_t child, pid_t session)
+{
+    for (const auto &[number, worker] : workers)
+        if (worker.process == session)
+            return number;
+    const auto [owner, isNew] = adoptedBy.try_emplace(child, 0);
+    if (isNew)
+        owner->second = workerOf(child);
+    return owner->second;
 }
 
 /// Ends what ended workers left behind: orphans come to this process, and theirs when they have ended.
@@ -252,12 +272,11 @@ void WorkerGroup::Private::endOrphans()
     if (!mayHaveOrphans)
         return;
     mayHaveOrphans = false;
-    for (const pid_t child : childrenOf(getpid())) {
-        if (!isOrphan(child))
-            continue;
+    for (const auto &[child, worker] : adopted()) {
+        if (worker != 0 && outputs.count(worker) == 0)
+            continue; // its worker is there
         ::kill(child, SIGKILL);
-        waitpid(child, nullptr, WNOHANG); // it is looked at again until it is gone
-        mayHaveOrphans = true;
+        mayHaveOrphans = true; // it is looked at again until it is gone
     }
 }
 
@@ -266,7 +285,9 @@ std::vector<WorkerEvent> WorkerGroup::wait(std::chrono::milliseconds timeout)
     const QDeadlineTimer deadline(timeout);
     std::vector<WorkerEvent> events;
     do {
-        const bool isNearEnd = std::any_of(m_private->workers.begin(), m_private->workers.end(),
+        // Orphans are looked at often as well: some start others as fast as they can.
+        const bool isNearEnd = m_private->mayHaveOrphans ||
+                               std::any_of(m_private->workers.begin(), m_private->workers.end(),
                                            [](const auto &entry) { return !entry.second.channel.isOpen(); });
         const qint64 look = isNearEnd ? kNearEnd : kLook;
         m_private->readAll(static_cast<int>(std::min(deadline.remainingTime(), look)), events);
@@ -291,36 +312,20 @@ QString WorkerGroup::output(int worker) const
     return ended == m_private->outputs.end() ? QString() : ended->second;
 }
 
-/// What a worker started and its orphans, which have come to this process.
-std::set<pid_t> WorkerGroup::Private::childrenOfWorker(int number) const
-{
-    const auto found = workers.find(number);
-    if (found == workers.end())
-        return {};
-    std::set<pid_t> children = childrenOf(found->second.process);
-    for (const pid_t child : childrenOf(getpid())) {
-        const bool isWorker = std::any_of(workers.begin(), workers.end(), [child](const auto &entry) {
-            return entry.second.process == child;
-        });
-        if (!isWorker && before.count(child) == 0 && getsid(child) != getsid(0) && workerOf(child) == number)
-            children.insert(child);
-    }
-    return children;
-}
-
-bool WorkerGroup::hasChildren(int worker) const { return !m_private->childrenOfWorker(worker).empty(); }
-
-qint64 WorkerGroup::residentMemory(int worker) const
+WorkerUse WorkerGroup::use(int worker)
 {
     const auto found = m_private->workers.find(worker);
     if (found == m_private->workers.end())
-        return 0;
+        return {};
     const pid_t process = found->second.process;
-    const std::set<pid_t> children = m_private->childrenOfWorker(worker);
-    if (children.empty())
-        return residentMemoryOf(process);
-    qint64 all = shareOfMemory(process);
-    for (const pid_t child : withDescendants(children))
-        all += shareOfMemory(child);
-    return std::max(all, residentMemoryOf(process));
+    std::set<pid_t> started = childrenOf(process);
+    for (const auto &[child, owner] : m_private->adopted())
+        if (owner == worker)
+            started.insert(child);
+    if (started.empty())
+        return {0, residentMemoryOf(process)};
+    std::set<pid_t> all = withDescendants(started);
+    const int children = static_cast<int>(all.size());
+    all.insert(process);
+    return {children, std::max(found->second.memory.of(all), residentMemoryOf(process))};
 }

@@ -328,32 +328,24 @@ QString WorkerGroup::output(int worker) const
     return ended == m_private->outputs.end() ? QString() : ended->second;
 }
 
-bool WorkerGroup::hasChildren(int worker) const
-{
-    const auto found = m_private->workers.find(worker);
-    JOBOBJECT_BASIC_ACCOUNTING_INFORMATION job = {};
-    return found != m_private->workers.end() &&
-           QueryInformationJobObject(found->second.job.get(), JobObjectBasicAccountingInformation, &job,
-                                     sizeof job, nullptr) &&
-           job.ActiveProcesses > 1;
-}
-
-qint64 WorkerGroup::residentMemory(int worker) const
+WorkerUse WorkerGroup::use(int worker)
 {
     const auto found = m_private->workers.find(worker);
     if (found == m_private->workers.end())
-        return 0;
-    constexpr std::size_t kMost = 1000;
+        return {};
+    constexpr std::size_t kMost = 300;
     std::vector<ULONG_PTR> space(kMost);
     auto *const list = reinterpret_cast<JOBOBJECT_BASIC_PROCESS_ID_LIST *>(space.data());
     if (!QueryInformationJobObject(found->second.job.get(), JobObjectBasicProcessIdList, list,
                                    static_cast<DWORD>(space.size() * sizeof space[0]), nullptr) &&
         GetLastError() != ERROR_MORE_DATA)
-        return workingSet(found->second.process->get());
-    qint64 all = 0;
+        return {0, workingSet(found->second.process->get())};
+    WorkerUse use;
+    use.children = std::max(0, static_cast<int>(list->NumberOfProcessIdsInList) - 1);
     for (DWORD each = 0; each < list->NumberOfProcessIdsInList; ++each)
-        all += workingSet(WindowsHandle(OpenProcess(PROCESS_QUERY_LIMITED_INFORMATION | PROCESS_VM_READ,
-                                                    FALSE, static_cast<DWORD>(list->ProcessIdList[each])))
-                              .get());
-    return all;
+        use.memory +=
+            workingSet(WindowsHandle(OpenProcess(PROCESS_QUERY_LIMITED_INFORMATION | PROCESS_VM_READ, FALSE,
+                                                 static_cast<DWORD>(list->ProcessIdList[each])))
+                           .get());
+    return use;
 }

@@ -9,15 +9,6 @@ namespace {
 constexpr std::chrono::milliseconds kLook(50);
 /// What plug-ins at work get to end by themselves after a cancel.
 constexpr qint64 kPatience = 2000; // ms
-/// A worker that holds so much more memory than a fresh one is replaced.
-constexpr qint64 kMaxGrowth = 256 << 20; // bytes
-/// So many modules are asked in one worker: what they leave in the process adds up.
-constexpr int kMaxModules = 50;
-/// Far more than the largest shell or module has to tell.
-constexpr int kMaxMessages = 1 << 20;
-constexpr std::size_t kMaxRecords = 1
-                                    << 16; ///< classes of a module that are asked for, and more than children
-constexpr int kLastLines = 3;              ///< of what a worker printed, in the reason
 /// A turn that takes longer was held up.
 constexpr qint64 kLongTurn = 500; // ms
 /// What a worker gets to say that it is there.
@@ -90,7 +81,7 @@ bool ProbePool::run(IPoolListener &listener)
         turn();
         forgiveWait(sinceTurn.elapsed());
         endOverdue();
-        endOversized();
+        endExcessive();
         m_hasGivenUp = !hasWorkers();
     }
     if (m_waiting.empty() && !isBusy())
@@ -143,7 +134,7 @@ void ProbePool::withdraw(IPoolListener &listener)
 
 std::optional<std::size_t> ProbePool::longest() const
 {
-    const Worker *first = nullptr;
+    const PoolWorker *first = nullptr;
     for (const auto &[number, worker] : m_workers)
         if (worker.job && (!first || worker.sinceJob < first->sinceJob))
             first = &worker;
@@ -200,7 +191,7 @@ void ProbePool::skipJobs()
             continue;
         ProbeOutcome skipped = ProbeOutcome::skipped();
         skipped.stage = worker.outcome.stage;
-        skipped.milliseconds = static_cast<double>(worker.sinceJob.nsecsElapsed()) / 1e6;
+        skipped.milliseconds = worker.millisecondsOfJob();
         const std::size_t job = *worker.job;
         worker.job.reset();
         worker.isLeaving = true;
@@ -235,10 +226,10 @@ void ProbePool::startWorkers()
         return static_cast<std::size_t>(std::count_if(m_workers.begin(), m_workers.end(),
                                                       [&](const auto &entry) { return has(entry.second); }));
     };
-    const std::size_t busy = count([](const Worker &worker) { return worker.job.has_value(); });
+    const std::size_t busy = count([](const PoolWorker &worker) { return worker.job.has_value(); });
     const std::size_t wanted =
         std::min(static_cast<std::size_t>(m_settings.workers), m_waiting.size() + busy);
-    while (count([](const Worker &worker) { return !worker.isLeaving; }) < wanted &&
+    while (count([](const PoolWorker &worker) { return !worker.isLeaving; }) < wanted &&
            m_failedStarts < kMaxFailedStarts) {
         QString reason;
         const std::optional<int> number = m_group.start(reason);
@@ -261,7 +252,7 @@ bool ProbePool::hasWorkers() const
 }
 
 /// The place of the job that a worker gets; past the end when none fits it.
-std::size_t ProbePool::nextFor(const Worker &worker) const
+std::size_t ProbePool::nextFor(const PoolWorker &worker) const
 {
     // One that needs a fresh worker gets the next fresh one, and those that are to be alone come first.
     const bool isFresh = worker.probed == 0;
@@ -293,16 +284,11 @@ void ProbePool::handOut()
     }
 }
 
-void ProbePool::handOut(int number, Worker &worker, std::size_t index)
+void ProbePool::handOut(int number, PoolWorker &worker, std::size_t index)
 {
     const std::size_t job = m_waiting[index].job;
     m_waiting.erase(m_waiting.begin() + static_cast<std::ptrdiff_t>(index));
-    worker.job = job;
-    worker.outcome = ProbeOutcome();
-    worker.messages = 0;
-    worker.child.reset();
-    worker.silent.start();
-    worker.sinceJob.start();
+    worker.begin(job, jobOf(job).path);
     listenerOf(job).jobBegins(m_jobs[job].place, number);
     ChannelMessage message;
     message.kind = ChannelMessage::Kind::Job;
@@ -320,34 +306,29 @@ void ProbePool::take(const WorkerEvent &event)
     const auto found = m_workers.find(event.worker);
     if (found == m_workers.end() || found->second.isLeaving)
         return;
-    Worker &worker = found->second;
+    PoolWorker &worker = found->second;
     worker.reader.feed(event.data);
     while (const std::optional<ChannelMessage> message = worker.reader.next())
         takeMessage(event.worker, worker, *message);
-    if ((worker.reader.isBroken() || worker.messages > kMaxMessages) && worker.endedFor.isEmpty())
+    if (worker.isGarbled() && worker.endedFor.isEmpty())
         endWorker(event.worker, worker, QStringLiteral("it wrote into the channel of its worker"));
 }
 
-void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &message)
+void ProbePool::takeMessage(int number, PoolWorker &worker, const ChannelMessage &message)
 {
     using Kind = ChannelMessage::Kind;
     if (message.kind == Kind::Ready) {
         worker.isReady = true;
-        worker.freshMemory = m_group.residentMemory(number);
+        worker.freshMemory = m_group.use(number).memory;
         m_failedStarts = 0;
         return;
     }
-    if (!worker.job || worker.messages > kMaxMessages)
+    if (!worker.job || worker.isGarbled() || !worker.note(message))
         return; // a plug-in speaks in its worker's name
-    worker.messages = isBelievable(worker, message) ? worker.messages + 1 : kMaxMessages + 1;
-    if (worker.messages > kMaxMessages)
-        return;
-    worker.silent.start();
     IPoolListener &listener = listenerOf(*worker.job);
     const std::size_t place = m_jobs[*worker.job].place;
     switch (message.kind) {
     case Kind::Stage:
-        worker.outcome.stage = message.stage;
         listener.stageEntered(place, number, message.stage);
         break;
     case Kind::Class:
@@ -357,25 +338,14 @@ void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &me
         listener.classAnnounced();
         break;
     case Kind::Child:
-        worker.child = message.record;
         listener.childBegins(place, number, message.record);
         break;
     case Kind::ChildEnd: {
         ProbeOutcome ended = message.outcome;
         ended.records.push_back(message.record);
         listener.childEnds(place, number, ended);
-        worker.child.reset();
         break;
     }
-    case Kind::ChildCloses:
-        worker.child = message.record;
-        break;
-    case Kind::ChildClosed:
-        worker.child.reset();
-        break;
-    case Kind::Record:
-        worker.outcome.records.push_back(message.record);
-        break;
     case Kind::Done: {
         ProbeOutcome outcome = message.outcome;
         outcome.records = std::move(worker.outcome.records);
@@ -385,85 +355,28 @@ void ProbePool::takeMessage(int number, Worker &worker, const ChannelMessage &me
     case Kind::Ready:
     case Kind::Job:
     case Kind::Children:
+    case Kind::ChildCloses:
+    case Kind::ChildClosed:
+    case Kind::Record:
         break;
     }
 }
 
-/// What a probe can have said of the job at hand. A plug-in may write anything.
-bool ProbePool::isBelievable(const Worker &worker, const ChannelMessage &message) const
-{
-    using Kind = ChannelMessage::Kind;
-    const bool isOver = message.outcome.status == ProbeStatus::Listed ||
-                        message.outcome.status == ProbeStatus::Failed ||
-                        message.outcome.status == ProbeStatus::NoPlugin;
-    if (message.kind == Kind::Done || message.kind == Kind::ChildEnd)
-        return isOver;
-    const bool hasRecord =
-        message.kind == Kind::Record || message.kind == Kind::Child || message.kind == Kind::ChildCloses;
-    return !hasRecord ||
-           (message.record.path == jobOf(*worker.job).path && worker.outcome.records.size() < kMaxRecords);
-}
-
-void ProbePool::endWorker(int number, Worker &worker, const QString &reason)
+void ProbePool::endWorker(int number, PoolWorker &worker, const QString &reason)
 {
     worker.endedFor = reason;
     m_group.end(number);
 }
 
-/// Why a worker asks nobody else; empty when it may. What a plug-in left behind would meet a stranger's
-/// probe.
-QString ProbePool::whySpent(int number, const Worker &worker, const ProbeOutcome &outcome) const
-{
-    if (outcome.faulted)
-        return QStringLiteral("a plug-in crashed in it");
-    if (outcome.leftThreads)
-        return QStringLiteral("a plug-in left threads in it");
-    if (outcome.leftModule)
-        return QStringLiteral("a plug-in stayed in it");
-    if (m_group.hasChildren(number))
-        return QStringLiteral("a plug-in left processes in it");
-    if (m_group.residentMemory(number) - worker.freshMemory > kMaxGrowth)
-        return QStringLiteral("it holds too much memory");
-    if (worker.probed >= kMaxModules)
-        return QStringLiteral("it asked %1 plug-ins").arg(worker.probed);
-    return QString();
-}
-
-void ProbePool::finishJob(int number, Worker &worker, const ProbeOutcome &outcome)
+void ProbePool::finishJob(int number, PoolWorker &worker, const ProbeOutcome &outcome)
 {
     const std::size_t job = *worker.job;
-    worker.job.reset();
-    worker.child.reset();
-    ++worker.probed;
-    worker.probedPaths.append(jobOf(job).path);
-    if (const QString why = whySpent(number, worker, outcome); !why.isEmpty()) {
+    worker.end();
+    if (const QString why = worker.whySpent(outcome, m_group.use(number)); !why.isEmpty()) {
         worker.isLeaving = true;
         endWorker(number, worker, why);
     }
     endJob(job, number, outcome);
-}
-
-/// Why a worker ended, in words, and where it crashed, which goes to the log, too.
-CrashReport ProbePool::describe(const Worker &worker, const WorkerEnd &end, int number) const
-{
-    const QString when = worker.job ? QLatin1String(duringStage(worker.outcome.stage)) : QLatin1String();
-    QString printed = m_group.output(number);
-    const CrashReport crash = CrashReport::take(printed);
-    if (worker.job && !crash.frames.isEmpty())
-        DebugLog(L"%ls crashed at %ls", jobOf(*worker.job).path, crash.frames.join(QStringLiteral(" < ")));
-    QString text = worker.endedFor + when;
-    if (worker.endedFor.isEmpty() && !crash.summary.isEmpty())
-        text = QStringLiteral("it crashed%1: %2").arg(when, crash.summary);
-    else if (worker.endedFor.isEmpty() && end.crashed)
-        text = QStringLiteral("it crashed%1: %2").arg(when, end.text);
-    else if (worker.endedFor.isEmpty() && end.code == kChannelLost)
-        text = QStringLiteral("it closed the channel of its worker") + when;
-    else if (worker.endedFor.isEmpty())
-        text = QStringLiteral("it ended its process with exit code %1%2").arg(end.code).arg(when);
-    const QStringList lines = printed.split(QLatin1Char('\n'), Qt::SkipEmptyParts).mid(-kLastLines);
-    if (!lines.isEmpty())
-        text += QStringLiteral("; it printed: ") + lines.join(QStringLiteral(" / "));
-    return {text, crash.frames};
 }
 
 /// What a worker was busy with when it ended is to blame, if it asked nobody before.
@@ -472,21 +385,22 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
     const auto found = m_workers.find(number);
     if (found == m_workers.end())
         return;
-    const Worker worker = std::move(found->second);
+    const PoolWorker worker = std::move(found->second);
     m_workers.erase(found);
     if (!worker.isReady && !worker.isLeaving) {
         ++m_failedStarts;
-        DebugLog(L"A worker ended at its start: %ls", describe(worker, end, number).summary);
+        DebugLog(L"A worker ended at its start: %ls", worker.whyEnded(end, m_group.output(number)).summary);
     }
     if (!worker.job) {
         if (!worker.isLeaving)
             DebugLog(L"A worker ended after it had asked %ls", namesOf(worker.probedPaths));
-        m_listener->workerEnds(number,
-                               worker.isLeaving ? worker.endedFor : describe(worker, end, number).summary);
+        m_listener->workerEnds(number, worker.isLeaving
+                                           ? worker.endedFor
+                                           : worker.whyEnded(end, m_group.output(number)).summary);
         return;
     }
     const std::size_t job = *worker.job;
-    const CrashReport report = describe(worker, end, number);
+    const CrashReport report = worker.whyEnded(end, m_group.output(number));
     const QString &reason = report.summary;
     const bool isKilled = end.isKilled && worker.endedFor.isEmpty(); // by whoever needed memory, or a user
     if (m_isCancelled)
@@ -499,7 +413,7 @@ void ProbePool::takeEnd(int number, const WorkerEnd &end)
 }
 
 /// Somebody who went before may be to blame.
-void ProbePool::askAgain(std::size_t job, const QString &reason, const Worker &worker)
+void ProbePool::askAgain(std::size_t job, const QString &reason, const PoolWorker &worker)
 {
     DebugLog(L"%ls: %ls; it is asked again in a fresh worker, as before it went %ls", jobOf(job).path, reason,
              namesOf(worker.probedPaths));
@@ -513,14 +427,14 @@ void ProbePool::cancelJob(std::size_t job, int number)
     endJob(job, number, cancelled);
 }
 
-void ProbePool::giveVerdict(std::size_t job, int number, const Worker &worker, const CrashReport &report)
+void ProbePool::giveVerdict(std::size_t job, int number, const PoolWorker &worker, const CrashReport &report)
 {
     ProbeOutcome outcome;
     outcome.status = worker.isOverdue ? ProbeStatus::NoAnswer : ProbeStatus::Crashed;
     outcome.stage = worker.outcome.stage;
     outcome.reason = report.summary;
     outcome.frames = report.frames;
-    outcome.milliseconds = static_cast<double>(worker.sinceJob.nsecsElapsed()) / 1e6;
+    outcome.milliseconds = worker.millisecondsOfJob();
     if (worker.child && jobOf(job).leftOut.insert(worker.child->subId).second) {
         // One sub-plug-in's crash is not its shell's: the others are asked without it.
         outcome.records.push_back(*worker.child);
@@ -549,15 +463,18 @@ void ProbePool::endOverdue()
     }
 }
 
-void ProbePool::endOversized()
+/// Ends workers that take too much, by themselves or in processes that they started.
+void ProbePool::endExcessive()
 {
     constexpr qint64 kPause = 100; // ms
-    if (m_settings.memoryLimit <= 0 || (m_sinceMemory.isValid() && !m_sinceMemory.hasExpired(kPause)))
+    if (m_sinceUse.isValid() && !m_sinceUse.hasExpired(kPause))
         return;
-    m_sinceMemory.start();
-    for (auto &[number, worker] : m_workers)
-        if (worker.job && worker.endedFor.isEmpty() &&
-            m_group.residentMemory(number) > m_settings.memoryLimit)
-            endWorker(number, worker,
-                      QStringLiteral("it took more than %1 MiB of memory").arg(m_settings.memoryLimit >> 20));
+    m_sinceUse.start();
+    for (auto &[number, worker] : m_workers) {
+        if (!worker.job || !worker.endedFor.isEmpty())
+            continue;
+        const QString excess = PoolWorker::excessOf(m_group.use(number), m_settings.memoryLimit);
+        if (!excess.isEmpty())
+            endWorker(number, worker, excess);
+    }
 }

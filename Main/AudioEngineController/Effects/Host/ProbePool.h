@@ -1,10 +1,6 @@
 #pragma once
 
-#include "Core/BaseLib/Process/CrashReport.h"
-#include "Core/BaseLib/Process/WorkerGroup.h"
-#include "Main/AudioEngineController/Effects/Protocol/ProbeChannel.h"
-
-#include <QElapsedTimer>
+#include "Main/AudioEngineController/Effects/Host/PoolWorker.h"
 
 #include <deque>
 #include <map>
@@ -87,23 +83,6 @@ private:
         IPoolListener *listener;
         std::size_t place; ///< among the listener's
     };
-    /// A worker process, and what it does.
-    struct Worker {
-        ChannelReader reader;
-        bool isReady = false;
-        int probed = 0;                    ///< jobs that it has ended
-        std::optional<std::size_t> job;    ///< the one that it is busy with, by its place in `m_jobs`
-        ProbeOutcome outcome;              ///< of that one, as far as it came
-        int messages = 0;                  ///< about that one
-        QElapsedTimer sinceJob;            ///< since it was handed out
-        std::optional<EffectRecord> child; ///< the sub-plug-in that is asked or closed
-        QStringList probedPaths;           ///< of the jobs before
-        QElapsedTimer silent;              ///< since it last said something
-        qint64 freshMemory = 0;            ///< bytes of resident memory before its first job
-        QString endedFor;                  ///< why we ended it; empty: we did not
-        bool isOverdue = false;            ///< ended by us for want of an answer
-        bool isLeaving = false;            ///< ended by us; what it had to say was said
-    };
     /// A job that waits for a worker.
     struct Waiting {
         std::size_t job;
@@ -121,7 +100,7 @@ private:
     void turn();
     void endJob(std::size_t job, int number, const ProbeOutcome &outcome);
     void endIdle();
-    std::size_t nextFor(const Worker &worker) const;
+    std::size_t nextFor(const PoolWorker &worker) const;
     void cancelJobs();
     void skipJobs();
     void cancelJob(std::size_t job, int number);
@@ -130,23 +109,20 @@ private:
     void startWorkers();
     bool hasWorkers() const;
     void handOut();
-    void handOut(int number, Worker &worker, std::size_t index);
+    void handOut(int number, PoolWorker &worker, std::size_t index);
     void take(const WorkerEvent &event);
-    void takeMessage(int number, Worker &worker, const ChannelMessage &message);
-    void finishJob(int number, Worker &worker, const ProbeOutcome &outcome);
+    void takeMessage(int number, PoolWorker &worker, const ChannelMessage &message);
+    void finishJob(int number, PoolWorker &worker, const ProbeOutcome &outcome);
     void takeEnd(int number, const WorkerEnd &end);
     void endOverdue();
-    void endOversized();
-    void endWorker(int number, Worker &worker, const QString &reason);
-    QString whySpent(int number, const Worker &worker, const ProbeOutcome &outcome) const;
-    CrashReport describe(const Worker &worker, const WorkerEnd &end, int number) const;
-    bool isBelievable(const Worker &worker, const ChannelMessage &message) const;
-    void askAgain(std::size_t job, const QString &reason, const Worker &worker);
-    void giveVerdict(std::size_t job, int number, const Worker &worker, const CrashReport &report);
+    void endExcessive();
+    void endWorker(int number, PoolWorker &worker, const QString &reason);
+    void askAgain(std::size_t job, const QString &reason, const PoolWorker &worker);
+    void giveVerdict(std::size_t job, int number, const PoolWorker &worker, const CrashReport &report);
 
     const Settings m_settings;
     WorkerGroup m_group;
-    std::map<int, Worker> m_workers;
+    std::map<int, PoolWorker> m_workers;
     std::deque<Waiting> m_waiting;
     std::vector<Job> m_jobs;
     std::size_t m_ended = 0;            ///< jobs
@@ -160,5 +136,5 @@ private:
     QElapsedTimer m_sinceCancel;
     IPoolListener *m_listener = nullptr; ///< that runs it
     int m_failedStarts = 0;
-    QElapsedTimer m_sinceMemory; ///< since the workers' memory was looked at
+    QElapsedTimer m_sinceUse; ///< since it was looked at what workers take
 };

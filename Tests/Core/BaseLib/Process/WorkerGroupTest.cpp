@@ -63,7 +63,7 @@ TEST(WorkerGroup, BytesGoBothWaysHoweverManyAndAnExitCodeComesLast)
     }
     EXPECT_TRUE(worker.waitUntil([&] { return worker.data.size() >= sent.size(); }));
     EXPECT_TRUE(worker.data == sent) << worker.data.size() << " bytes of " << sent.size();
-    EXPECT_GT(worker.group().residentMemory(worker.number), 100000);
+    EXPECT_GT(worker.group().use(worker.number).memory, 100000);
 
     EXPECT_TRUE(worker.group().send(worker.number, "leave"));
     ASSERT_TRUE(worker.waitForEnd());
@@ -71,7 +71,7 @@ TEST(WorkerGroup, BytesGoBothWaysHoweverManyAndAnExitCodeComesLast)
     EXPECT_EQ(worker.end->code, 7);
     EXPECT_EQ(worker.group().output(worker.number), QStringLiteral("echo: input empty"));
     EXPECT_FALSE(worker.group().send(worker.number, "x"));
-    EXPECT_EQ(worker.group().residentMemory(worker.number), 0);
+    EXPECT_EQ(worker.group().use(worker.number).memory, 0);
 }
 
 TEST(WorkerGroup, CrashesAreToldInWordsAndAClosedChannelIsAnEnd)
