@@ -1,7 +1,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/KnownList.h"
 
 #include <algorithm>
-#include <tuple>
+#include <utility>
 
 namespace {
 
@@ -12,6 +12,12 @@ int rankOf(const EffectRecord &record)
     if (record.standsForFile())
         return 2;
     return record.enabled ? 3 : 4;
+}
+
+/// Its place among the records of a file name: those of the full path first.
+std::pair<bool, int> placeOf(const EffectRecord &record, const QString &path)
+{
+    return {!isSamePath(record.path, path), rankOf(record)};
 }
 
 void markCrashed(EffectRecord &record)
@@ -25,21 +31,41 @@ void markCrashed(EffectRecord &record)
 void KnownList::clear()
 {
     m_byFileName.clear();
+    m_byId.clear();
     m_records.clear();
+}
+
+const std::vector<EffectRecord *> &KnownList::recordsOfId(const QString &id) const
+{
+    static const std::vector<EffectRecord *> none;
+    const auto found = m_byId.constFind(id);
+    return found == m_byId.constEnd() ? none : *found;
+}
+
+EffectRecord &KnownList::insert(const EffectRecord &record)
+{
+    m_records.push_back(record);
+    m_byFileName.emplace(fileNameOf(record.path), &m_records.back());
+    m_byId[record.id].push_back(&m_records.back());
+    return m_records.back();
 }
 
 bool KnownList::addRecord(const EffectRecord &record)
 {
-    const QString fileName = fileNameOf(record.path);
-    const auto [first, last] = m_byFileName.equal_range(fileName);
-    const bool isThere = std::any_of(first, last, [&](const auto &entry) {
-        return entry.second->id == record.id && isSamePath(entry.second->path, record.path);
-    });
-    if (isThere)
+    if (holds(record.path, record.id))
         return false;
-    m_records.push_back(record);
-    m_byFileName.emplace_hint(last, fileName, &m_records.back());
+    insert(record);
     return true;
+}
+
+void KnownList::setIdentifier(const EffectRecord &record, const QString &id)
+{
+    std::vector<EffectRecord *> &before = m_byId[record.id];
+    const auto entry = std::find(before.begin(), before.end(), &record);
+    EffectRecord &changed = **entry;
+    before.erase(entry);
+    changed.id = id;
+    m_byId[id].push_back(&changed);
 }
 
 /// The record that a marker is about: of a sub-plug-in its own, of a file the one that stands for it.
@@ -55,14 +81,11 @@ EffectRecord *KnownList::find(const EffectRecord &marker)
     return found == last ? nullptr : found->second;
 }
 
-EffectRecord &KnownList::applyCrash(const EffectRecord &marker)
+const EffectRecord &KnownList::applyCrash(const EffectRecord &marker)
 {
     EffectRecord *record = find(marker);
-    if (!record) {
-        m_records.push_back(marker);
-        record = &m_records.back();
-        m_byFileName.emplace(fileNameOf(marker.path), record);
-    }
+    if (!record)
+        record = &insert(marker);
     record->fileTime = marker.fileTime;
     markCrashed(*record);
     if (marker.subId == 0)
@@ -94,19 +117,35 @@ bool KnownList::disableOthers(const EffectRecord &crashed)
 
 KnownList::Records KnownList::recordsOfFileName(const QString &path) const
 {
-    Records records;
+    using Placed = std::pair<std::pair<bool, int>, const EffectRecord *>;
+    std::vector<Placed> placed;
     const auto [first, last] = m_byFileName.equal_range(fileNameOf(path));
     for (auto entry = first; entry != last; ++entry)
-        records.push_back(entry->second);
-    if (records.size() < 2) // most have one, and sorting allocates
-        return records;
-    const auto place = [&](const EffectRecord *record) {
-        return std::make_tuple(!isSamePath(record->path, path), rankOf(*record));
-    };
-    std::stable_sort(
-        records.begin(), records.end(),
-        [&](const EffectRecord *left, const EffectRecord *right) { return place(left) < place(right); });
+        placed.push_back({placeOf(*entry->second, path), entry->second});
+    std::stable_sort(placed.begin(), placed.end(),
+                     [](const Placed &left, const Placed &right) { return left.first < right.first; });
+    Records records;
+    records.reserve(placed.size());
+    for (const Placed &each : placed)
+        records.push_back(each.second);
     return records;
+}
+
+const EffectRecord *KnownList::pluginOfFileName(const QString &path, const QString &id) const
+{
+    const EffectRecord *best = nullptr;
+    for (const EffectRecord *record : recordsOfId(id))
+        if (!record->standsForFile() && isSamePath(fileNameOf(record->path), fileNameOf(path)) &&
+            (!best || placeOf(*record, path) < placeOf(*best, path)))
+            best = record;
+    return best;
+}
+
+bool KnownList::holds(const QString &path, const QString &id) const
+{
+    const std::vector<EffectRecord *> &records = recordsOfId(id);
+    return std::any_of(records.begin(), records.end(),
+                       [&](const EffectRecord *record) { return isSamePath(record->path, path); });
 }
 
 KnownList::Records KnownList::recordsOfPath(const QString &path) const
@@ -121,9 +160,9 @@ KnownList::Records KnownList::recordsOfPath(const QString &path) const
 
 bool KnownList::isIdHeldByOther(const QString &id, const EffectRecord &plugin) const
 {
-    return std::any_of(m_records.begin(), m_records.end(), [&](const EffectRecord &record) {
-        return record.id == id && !record.isSamePlugin(plugin);
-    });
+    const std::vector<EffectRecord *> &records = recordsOfId(id);
+    return std::any_of(records.begin(), records.end(),
+                       [&](const EffectRecord *record) { return !record->isSamePlugin(plugin); });
 }
 
 KnownList::Records KnownList::all() const

@@ -2,6 +2,8 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
 
+#include <QHash>
+
 #include <deque>
 #include <map>
 #include <vector>
@@ -42,7 +44,9 @@ public:
     /// back, and the file's others become disabled and not working as well, but for those that the user
     /// switched off. Where there is no record, the marker becomes one; its identifier is the caller's to set.
     /// Records of other paths are never touched.
-    EffectRecord &applyCrash(const EffectRecord &marker);
+    const EffectRecord &applyCrash(const EffectRecord &marker);
+    /// Gives a record of this list another identifier.
+    void setIdentifier(const EffectRecord &record, const QString &id);
     /// Has what is listed beside a file that crashed disabled and not working as well: a user, or an earlier
     /// version of this program, may have left it usable. True when something changed.
     bool disableBesideCrashed();
@@ -56,6 +60,11 @@ public:
     /// The same for all records of a file name, those of the full path before the others.
     Records recordsOfFileName(const QString &path) const;
 
+    /// The first of the records of a file name that is of a plug-in with this identifier, not of a whole
+    /// file; null when there is none.
+    const EffectRecord *pluginOfFileName(const QString &path, const QString &id) const;
+    /// Whether a file has a record of that identifier.
+    bool holds(const QString &path, const QString &id) const;
     /// True when a record of another plug-in holds the identifier.
     bool isIdHeldByOther(const QString &id, const EffectRecord &plugin) const;
 
@@ -67,8 +76,13 @@ public:
 private:
     EffectRecord *find(const EffectRecord &marker);
     bool disableOthers(const EffectRecord &crashed);
+    EffectRecord &insert(const EffectRecord &record);
+    const std::vector<EffectRecord *> &recordsOfId(const QString &id) const;
 
     Identity m_identity;
     std::deque<EffectRecord> m_records;
     std::multimap<QString, EffectRecord *, PathLess> m_byFileName;
+    /// In the order in which they were added: one module may have thousands, and each is looked up when it is
+    /// asked again.
+    QHash<QString, std::vector<EffectRecord *>> m_byId;
 };

@@ -219,8 +219,8 @@ void CatalogueHost::absorbMarker(const EffectRecord &marker)
 void CatalogueHost::applyCrash(const EffectRecord &marker)
 {
     m_hasNewCrashes = true;
-    EffectRecord &crashed = m_known.applyCrash(marker);
-    crashed.id = freeIdentifier(crashed, marker.name);
+    const EffectRecord &crashed = m_known.applyCrash(marker);
+    m_known.setIdentifier(crashed, freeIdentifier(crashed, marker.name));
     m_isKnownAsRead = false;
 }
 

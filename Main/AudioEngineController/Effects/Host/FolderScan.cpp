@@ -452,9 +452,7 @@ void FolderScan::passMarksToHolder(const EffectRecord &record)
     const std::optional<EffectRecord> holder = m_host.findEffect(record.id);
     if (!holder || !holder->working || isSamePath(holder->path, record.path))
         return;
-    const KnownList::Records known = m_host.known().recordsOfPath(holder->path);
-    if (std::none_of(known.begin(), known.end(),
-                     [&](const EffectRecord *old) { return old->id == record.id; }))
+    if (!m_host.known().holds(holder->path, record.id))
         m_host.passMarks(record, record.id);
 }
 

@@ -82,8 +82,8 @@ KnownList Maker::knownOfFile() const
 void Maker::applyCrash(KnownList &known, const EffectRecord &marker)
 {
     made.crashes.push_back(marker);
-    EffectRecord &crashed = known.applyCrash(marker);
-    crashed.id = m_host.freeIdentifier(crashed, marker.name);
+    const EffectRecord &crashed = known.applyCrash(marker);
+    known.setIdentifier(crashed, m_host.freeIdentifier(crashed, marker.name));
 }
 
 /// What a crash marker says of a sub-plug-in.

@@ -381,10 +381,10 @@ const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRe
     if (own && (own->working || hasId(*own) || hasMarks(*own)))
         return own;
     // Also of a file that is there: its copy comes to list what it does not list any more.
-    const KnownList::Records namesakes = m_host.known().recordsOfFileName(item.path);
-    for (const KnownList::Records *records : {&namesakes, &m_away})
-        if (const EffectRecord *same = findIn(*records, isSamePlugin))
-            return same;
+    if (const EffectRecord *same = m_host.known().pluginOfFileName(item.path, probed.id))
+        return same;
+    if (const EffectRecord *same = findIn(m_away, isSamePlugin))
+        return same;
     const EffectRecord *child = missingChild(item, probed);
     if (child || own || !isOnly)
         return child ? child : own;
