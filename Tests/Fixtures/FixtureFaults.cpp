@@ -129,8 +129,16 @@ bool causeSideEffect(const std::string &kind, const std::string &value)
         {"alarm", startAlarm},
         {"print", printMuch},
         {"input", [](Text) { return std::getchar() == EOF; }},
+        {"terminal", [](Text) { return !hasTerminal(); }},
+        {"child", leaveChild},
+        {"daemon", leaveDaemon},
+        {"feed", feedChild},
+        {"stay", [](Text) { return outliveParent(); }},
+        {"kill-parent", [](Text) { return killParent(); }},
+        {"garbage", [](Text) { return writeEverywhere(); }},
+        {"close-all", [](Text) { return closeEverything(); }},
         {"late-fault", faultLater},
         {"thread", leaveThreadRunning}};
     const auto effect = effects.find(kind);
-    return effect != effects.end() ? effect->second(value) : causePlatformEffect(kind, value);
+    return effect != effects.end() && effect->second(value);
 }

@@ -17,8 +17,22 @@ void killProcess();
 /// Ends the calling thread only.
 void endThread();
 
-/// What only some systems have plug-ins do; false elsewhere, and for no such kind.
-bool causePlatformEffect(const std::string &kind, const std::string &value);
+/// Starts a process that stays until it is ended, and leaves its number in a file.
+bool leaveChild(const std::string &file);
+/// The same, as far from this process as the system allows.
+bool leaveDaemon(const std::string &file);
+/// Starts a process that stays and holds so many MiB.
+bool feedChild(const std::string &mebibytes);
+/// Has the system not end this process when its parent dies.
+bool outliveParent();
+/// Ends the process that started this one, with its group.
+bool killParent();
+/// Writes into every descriptor or handle that can be written to, but the standard ones.
+bool writeEverywhere();
+/// Closes every descriptor or handle that can be closed.
+bool closeEverything();
+/// Whether there is a terminal or console to write to.
+bool hasTerminal();
 void setFileMask(int mask);
 /// Lets an alarm signal arrive after so many seconds, where the system has one; false for none.
 bool startAlarm(const std::string &seconds);

@@ -14,6 +14,9 @@ protected:
     void setupChildProcess() override;
 };
 
+/// The processes that a process started and that run, not what they started in turn.
+std::vector<qint64> childrenOf(qint64 process);
+
 /// A way in which a process is asked to end.
 struct TerminationWay {
     const char *name;

@@ -45,6 +45,8 @@ public:
     bool waitUntil(const std::function<bool()> &condition);
     /// What a started run has printed so far.
     QByteArray printed() { return m_process.peek(m_process.bytesAvailable()); }
+    /// The processes that a started run has started.
+    std::vector<qint64> children() const { return childrenOf(m_process.processId()); }
     /// Asks the program to end (SIGTERM).
     void requestTermination(const TerminationWay &way = terminationWays().front());
     /// Ends the program by force (SIGKILL).

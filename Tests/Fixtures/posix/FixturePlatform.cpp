@@ -35,9 +35,6 @@ void killProcess() { kill(getpid(), SIGKILL); }
 
 void endThread() { pthread_exit(nullptr); }
 
-namespace {
-
-/// Starts a process that stays until it is ended, and leaves its number in a file.
 bool leaveChild(const std::string &file)
 {
     const pid_t child = fork();
@@ -47,7 +44,6 @@ bool leaveChild(const std::string &file)
         pause();
 }
 
-/// The same in a session of its own, and nobody's child.
 bool leaveDaemon(const std::string &file)
 {
     const pid_t child = fork();
@@ -57,7 +53,6 @@ bool leaveDaemon(const std::string &file)
     _exit(leaveChild(file) ? 0 : 1);
 }
 
-/// Starts a process that holds so many MiB.
 bool feedChild(const std::string &mebibytes)
 {
     const pid_t child = fork();
@@ -69,6 +64,10 @@ bool feedChild(const std::string &mebibytes)
         pause();
 }
 
+bool outliveParent() { return prctl(PR_SET_PDEATHSIG, 0) == 0; }
+
+bool killParent() { return kill(-getpgid(getppid()), SIGKILL) == 0; }
+
 bool writeEverywhere()
 {
     for (int number = 3; number < 256; ++number)
@@ -76,24 +75,9 @@ bool writeEverywhere()
     return true;
 }
 
-} // namespace
+bool closeEverything() { return close_range(0, ~0U, 0) == 0; }
 
-bool causePlatformEffect(const std::string &kind, const std::string &value)
-{
-    if (kind == "fork" || kind == "daemon")
-        return kind == "fork" ? leaveChild(value) : leaveDaemon(value);
-    if (kind == "feed")
-        return feedChild(value);
-    if (kind == "stay") // also when the parent dies
-        return prctl(PR_SET_PDEATHSIG, 0) == 0;
-    if (kind == "garbage")
-        return writeEverywhere();
-    if (kind == "close-all")
-        return close_range(0, ~0U, 0) == 0;
-    if (kind == "terminal") // there must be none
-        return open("/dev/tty", O_RDWR) < 0;
-    return kind == "kill-group" && kill(-getpgid(getppid()), SIGKILL) == 0;
-}
+bool hasTerminal() { return open("/dev/tty", O_RDWR) >= 0; }
 
 void setFileMask(int mask) { umask(static_cast<mode_t>(mask)); }
 

@@ -1,10 +1,14 @@
 #include "Tests/Fixtures/FixturePlatform.h"
 
+#include <cstdint>
 #include <cstdlib>
 #include <filesystem>
+#include <vector>
 
 #include <io.h>
 #include <windows.h>
+
+#include <tlhelp32.h>
 
 std::string modulePath()
 {
@@ -40,7 +44,89 @@ void killProcess() { TerminateProcess(GetCurrentProcess(), 1); }
 
 void endThread() { ExitThread(0); }
 
-bool causePlatformEffect(const std::string &, const std::string &) { return false; }
+namespace {
+
+/// Another process of this program that never begins; it stays until it is ended.
+PROCESS_INFORMATION startIdle(DWORD flags)
+{
+    std::wstring program(32768, L'\0');
+    GetModuleFileNameW(nullptr, program.data(), static_cast<DWORD>(program.size()));
+    STARTUPINFOW start = {};
+    start.cb = sizeof start;
+    PROCESS_INFORMATION process = {};
+    CreateProcessW(program.c_str(), nullptr, nullptr, nullptr, FALSE, CREATE_SUSPENDED | flags, nullptr,
+                   nullptr, &start, &process);
+    return process;
+}
+
+bool leaveIdle(DWORD flags, const std::string &file)
+{
+    const DWORD number = startIdle(flags).dwProcessId;
+    return number != 0 && appendToFile(file, std::to_string(number) + '\n');
+}
+
+/// The process that started this one; 0 when the system does not tell.
+DWORD parentProcess()
+{
+    PROCESSENTRY32W entry = {};
+    entry.dwSize = sizeof entry;
+    const HANDLE all = CreateToolhelp32Snapshot(TH32CS_SNAPPROCESS, 0);
+    bool isFound = Process32FirstW(all, &entry);
+    while (isFound && entry.th32ProcessID != GetCurrentProcessId())
+        isFound = Process32NextW(all, &entry);
+    CloseHandle(all);
+    return isFound ? entry.th32ParentProcessID : 0;
+}
+
+/// More than a process has that was just started.
+constexpr std::uintptr_t kLastHandle = 4096;
+
+HANDLE handleOf(std::uintptr_t number) { return reinterpret_cast<HANDLE>(number); }
+
+} // namespace
+
+bool leaveChild(const std::string &file) { return leaveIdle(0, file); }
+
+bool leaveDaemon(const std::string &file)
+{
+    return leaveIdle(DETACHED_PROCESS | CREATE_NEW_PROCESS_GROUP, file);
+}
+
+bool feedChild(const std::string &mebibytes)
+{
+    const std::vector<char> block(std::strtoul(mebibytes.c_str(), nullptr, 10) << 20, 1);
+    const HANDLE process = startIdle(0).hProcess;
+    void *const place =
+        VirtualAllocEx(process, nullptr, block.size(), MEM_COMMIT | MEM_RESERVE, PAGE_READWRITE);
+    return place && WriteProcessMemory(process, place, block.data(), block.size(), nullptr);
+}
+
+bool outliveParent() { return true; }
+
+bool killParent() { return TerminateProcess(OpenProcess(PROCESS_TERMINATE, FALSE, parentProcess()), 1); }
+
+bool writeEverywhere()
+{
+    for (std::uintptr_t number = 4; number < kLastHandle; number += 4) {
+        DWORD count = 0;
+        if (GetFileType(handleOf(number)) == FILE_TYPE_PIPE)
+            WriteFile(handleOf(number), "garbage garbage ", 16, &count, nullptr);
+    }
+    return true;
+}
+
+bool closeEverything()
+{
+    for (std::uintptr_t number = 4; number < kLastHandle; number += 4)
+        CloseHandle(handleOf(number));
+    return true;
+}
+
+bool hasTerminal()
+{
+    return CreateFileW(L"CONOUT$", GENERIC_WRITE, FILE_SHARE_WRITE, nullptr, OPEN_EXISTING, 0, nullptr) !=
+           INVALID_HANDLE_VALUE;
+}
 
 void setFileMask(int mask) { _umask(mask); }
 

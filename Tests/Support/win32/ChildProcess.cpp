@@ -4,6 +4,8 @@
 
 #include <windows.h>
 
+#include <tlhelp32.h>
+
 namespace {
 
 /// Puts this process into a job that ends its members when its last handle goes. Children are born into it.
@@ -46,6 +48,19 @@ ChildProcess::ChildProcess()
 }
 
 void ChildProcess::setupChildProcess() {}
+
+std::vector<qint64> childrenOf(qint64 process)
+{
+    std::vector<qint64> children;
+    PROCESSENTRY32W entry = {};
+    entry.dwSize = sizeof entry;
+    const HANDLE all = CreateToolhelp32Snapshot(TH32CS_SNAPPROCESS, 0);
+    for (bool isThere = Process32FirstW(all, &entry); isThere; isThere = Process32NextW(all, &entry))
+        if (entry.th32ParentProcessID == process)
+            children.push_back(entry.th32ProcessID);
+    CloseHandle(all);
+    return children;
+}
 
 const std::vector<TerminationWay> &terminationWays()
 {
