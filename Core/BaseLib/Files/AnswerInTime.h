@@ -3,8 +3,26 @@
 #include <chrono>
 #include <future>
 #include <memory>
+#include <mutex>
 #include <optional>
 #include <thread>
+#include <utility>
+#include <vector>
+
+/// Lets go of a thread that may end at any moment, or never.
+inline void leaveBehind(std::thread thread)
+{
+#ifdef _WIN32
+    // NOTE: where a thread is detached just as it ends, winpthreads 10 has later threads of the process never
+    // run, or ends the process.
+    static std::mutex mutex;
+    static auto *const threads = new std::vector<std::thread>; // for ever: one that still runs must not go
+    const std::lock_guard<std::mutex> lock(mutex);
+    threads->push_back(std::move(thread));
+#else
+    thread.detach();
+#endif
+}
 
 /// Asks the file system something on a thread of its own. Nothing when the answer does not come in time, as
 /// from a network drive whose server is gone: the thread is left behind then. What `ask` captures must be
@@ -13,13 +31,13 @@ template <typename Ask>
 auto answerInTime(std::chrono::milliseconds limit, Ask ask) -> std::optional<decltype(ask())>
 {
     using Answer = decltype(ask());
-    // Twice, each for half of the time: under Wine a new thread now and then does not come to its answer.
-    for (int attempt = 0; attempt < 2; ++attempt) {
-        const auto promise = std::make_shared<std::promise<Answer>>();
-        std::future<Answer> answer = promise->get_future();
-        std::thread([promise, ask] { promise->set_value(ask()); }).detach();
-        if (answer.wait_for(limit / 2) == std::future_status::ready)
-            return answer.get();
+    const auto promise = std::make_shared<std::promise<Answer>>();
+    std::future<Answer> answer = promise->get_future();
+    std::thread thread([promise, ask] { promise->set_value(ask()); });
+    if (answer.wait_for(limit) != std::future_status::ready) {
+        leaveBehind(std::move(thread));
+        return std::nullopt;
     }
-    return std::nullopt;
+    thread.join();
+    return answer.get();
 }

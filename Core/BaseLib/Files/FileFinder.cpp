@@ -1,5 +1,6 @@
 #include "Core/BaseLib/Files/FileFinder.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/FolderListing.h"
 #include "Core/BaseLib/Files/NativeFile.h"
 #include "Core/BaseLib/Log/DebugLog.h"
@@ -198,7 +199,7 @@ bool FileFinder::searchPatiently(const QStringList &folders, const Cancelled &is
                 isWhole = watch->isWhole && !(isCancelled && isCancelled());
                 isOver = true;
             } else { // it ends when the system answers, and nobody asks for what it found
-                thread.detach();
+                leaveBehind(std::move(thread));
                 isOver = isCancelled && isCancelled();
             }
         }
