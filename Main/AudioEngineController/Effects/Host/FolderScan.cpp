@@ -381,11 +381,13 @@ bool FolderScan::writeInterim()
 bool FolderScan::mayYetBeListed(const EffectRecord &old) const
 {
     const std::vector<ScanItem> &items = m_plan->items();
-    for (std::size_t index = m_done; index < items.size(); ++index)
-        if (!isSettled(index) && isSamePath(fileNameOf(items[index].path), fileNameOf(old.path)) &&
-            !isSamePath(items[index].path, old.path))
-            return true;
-    return false;
+    if (m_namesakes.isEmpty())
+        for (std::size_t index = 0; index < items.size(); ++index)
+            m_namesakes[pathKey(fileNameOf(items[index].path))].push_back(index);
+    const std::vector<std::size_t> namesakes = m_namesakes.value(pathKey(fileNameOf(old.path)));
+    return std::any_of(namesakes.begin(), namesakes.end(), [&](std::size_t index) {
+        return !isSettled(index) && !isSamePath(items[index].path, old.path);
+    });
 }
 
 void FolderScan::finish(bool isWhole)

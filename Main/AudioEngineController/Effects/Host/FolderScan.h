@@ -5,6 +5,7 @@
 #include "Main/AudioEngineController/Effects/Host/ScanMemory.h"
 #include "Main/AudioEngineController/Effects/Host/ScanPlan.h"
 
+#include <QHash>
 #include <QSet>
 
 #include <memory>
@@ -95,6 +96,9 @@ private:
     /// Identifiers, and the old records whose marks they get unless another file lists those.
     std::vector<std::pair<QString, const EffectRecord *>> m_likelyMarks;
     bool m_written = false;
+
+    /// Items by the keys of their file names, made when they are first looked up.
+    mutable QHash<QString, std::vector<std::size_t>> m_namesakes;
 
     EffectRecord m_file;            ///< of the item at hand: path and time
     EffectRecord m_child;           ///< the sub-plug-in at hand
