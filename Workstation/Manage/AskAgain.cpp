@@ -1,7 +1,9 @@
 #include "Workstation/Manage/AskAgain.h"
 
 #include "Core/BaseLib/Binary/LoadFailure.h"
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/FileFinder.h"
+#include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Workstation/Manage/CatalogueEdit.h"
 #include "Workstation/Manage/PluginNames.h"
@@ -45,6 +47,15 @@ QString whyNotAsked(const QString &name, const std::vector<Plugin> &meant)
     return QString();
 }
 
+QStringList moduleEndings()
+{
+    QStringList endings;
+    for (const PluginFormatInfo &format : pluginFormats())
+        if (format.isScanned())
+            endings.append(format.moduleEnding);
+    return endings;
+}
+
 class Request {
 public:
     Request(const QString &effectsFolder, const QStringList &below, const QStringList &folders,
@@ -53,8 +64,12 @@ public:
         , m_memory(effectsFolder)
         , m_below(below)
         , m_folders(folders)
+        , m_finder(moduleEndings())
         , m_look(look)
-    {}
+    {
+        m_finder.setArea({{}, readFolderRules(effectsFolder).excluded});
+        m_finder.setPatience(std::chrono::seconds(10), [](const QString &) {});
+    }
 
     void retry(const QStringList &names);
     void retryIf(const std::function<bool(const Plugin &)> &isMeant);
@@ -74,6 +89,7 @@ private:
     ProbeMemory m_memory;
     QStringList m_below;
     QStringList m_folders;
+    FileFinder m_finder;
     const ModuleLook &m_look;
     std::vector<Plugin> m_retried;
     std::set<FileKey> m_rescanned;
@@ -118,13 +134,13 @@ bool Request::isUnrecorded(const QString &name)
 {
     bool isFound = false;
     for (const PluginFormatInfo &format : pluginFormats())
-        for (const QString &folder : format.isScanned() ? m_folders : QStringList())
-            for (const QString &path : findFiles(folder, format.moduleEnding))
-                if (isFileNamed(name, path) && m_edit.pluginsOf(format, path).empty()) {
-                    isFound = true;
-                    m_memory.keepOnly(format.format,
-                                      [&path](const QString &other) { return !isSamePath(path, other); });
-                }
+        for (const QString &path :
+             format.isScanned() ? m_finder.find(m_folders, format.moduleEnding) : QStringList())
+            if (isFileNamed(name, path) && m_edit.pluginsOf(format, path).empty()) {
+                isFound = true;
+                m_memory.keepOnly(format.format,
+                                  [&path](const QString &other) { return !isSamePath(path, other); });
+            }
     return isFound;
 }
 
@@ -150,6 +166,8 @@ bool Request::mayWorkNow(const Plugin &plugin) const
 {
     const EffectRecord &record = *plugin.record;
     const PluginFormat format = plugin.format->format;
+    if (!fileAnswers(record.path))
+        return false;
     const QString fileTime = m_look.fileTime(format, record.path);
     if (fileTime.isEmpty())
         return false;

@@ -1,5 +1,6 @@
 #include "Workstation/Options/PluginFolders.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <QDir>
@@ -44,7 +45,9 @@ SettledFolders settleFolders(const QStringList &folders)
     SettledFolders settled;
     for (const QString &given : folders) {
         const QString folder = QDir::cleanPath(QFileInfo(given).absoluteFilePath());
-        if (given.isEmpty() || !QFileInfo(folder).isDir())
+        if (!given.isEmpty() && !answers(folder))
+            settled.leftOut.append(QStringLiteral("the folder '%1' gives no answer").arg(given));
+        else if (given.isEmpty() || !QFileInfo(folder).isDir())
             settled.leftOut.append(QStringLiteral("there is no folder '%1'").arg(given));
         else if (!canStandInScanList(folder))
             settled.leftOut.append(

@@ -1,5 +1,7 @@
 #include "Workstation/Summary/Duplicates.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
+
 #include <QFileInfo>
 
 #include <algorithm>
@@ -63,7 +65,7 @@ private:
 
     void addCopy(const PluginFormatInfo &format, const RememberedProbe &probe)
     {
-        if (!QFileInfo::exists(probe.path))
+        if (!fileAnswers(probe.path) || !QFileInfo::exists(probe.path))
             return; // gone since
         for (const RememberedPlugin &plugin : probe.plugins) {
             const auto holder = m_holders.find({&format, plugin.heldBy, plugin.id});

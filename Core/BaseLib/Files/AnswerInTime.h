@@ -1,5 +1,7 @@
 #pragma once
 
+#include <QString>
+
 #include <chrono>
 #include <future>
 #include <memory>
@@ -41,3 +43,11 @@ auto answerInTime(std::chrono::milliseconds limit, Ask ask) -> std::optional<dec
     thread.join();
     return answer.get();
 }
+
+/// Whether the system tells anything of a file or folder within ten seconds, and within one after another
+/// that gave no answer. A path is asked anew after half a minute; each thread remembers what it asked.
+bool answers(const QString &path);
+
+/// The same for a file whose folder is likely to hold others that are asked for: only the folder is asked,
+/// and where the file is a link what it leads to.
+bool fileAnswers(const QString &path);

@@ -1,5 +1,6 @@
 #include "Core/BaseLib/Files/SearchArea.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/NativeFile.h"
 
 #include <QDir>
@@ -45,6 +46,8 @@ QStringList SearchArea::spellings(const QString &path)
     if (path.isEmpty()) // made absolute, it would be the working folder
         return {};
     const QString given = QDir::cleanPath(QFileInfo(path).absoluteFilePath());
+    if (!answers(given))
+        return {given};
     QStringList all{given, realFolderAndName(given), realOf(given)};
     all.removeDuplicates();
     return all;

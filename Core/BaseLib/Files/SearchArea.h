@@ -15,7 +15,7 @@ public:
     SearchArea(const QStringList &only, const QStringList &excluded);
 
     /// The paths by which the same is reached: as given, absolute; with the links to its folder followed; and
-    /// what it leads to.
+    /// what it leads to. Only the first of one that gives no answer.
     static QStringList spellings(const QString &path);
 
     bool isEverything() const { return m_only.isEmpty() && m_excluded.isEmpty(); }

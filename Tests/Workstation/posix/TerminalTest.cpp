@@ -6,6 +6,7 @@
 #include <QThread>
 
 #include <array>
+#include <vector>
 
 #include <poll.h>
 #include <pty.h>
@@ -18,20 +19,22 @@ namespace {
 /// fxscan on a terminal of 70 columns, with a user at its keys.
 class FxScanOnTerminal : public ScanBench {
 protected:
-    /// Runs it; `key` is pressed when `at` has been shown. Gives the exit code.
-    int run(const QByteArray &at, char key, const QByteArray &option = "--timeout=60")
+    /// Runs it, after the words of another program that starts it; `key` is pressed when `at` has been shown.
+    /// Gives the exit code.
+    int run(const QByteArray &at, char key, const QByteArray &option = "--timeout=60",
+            QList<QByteArray> words = {})
     {
-        const std::array<QByteArray, 5> words = {FXPROBE_FXSCAN, "--data-folder",
-                                                 m_folder.dataFolder().toUtf8(), option,
-                                                 m_folder.plugins().toUtf8()};
-        std::array<char *, words.size() + 1> arguments = {};
-        for (std::size_t word = 0; word < words.size(); ++word)
-            arguments[word] = const_cast<char *>(words[word].constData());
+        words += {FXPROBE_FXSCAN, "--data-folder", m_folder.dataFolder().toUtf8(), option,
+                  m_folder.plugins().toUtf8()};
+        std::vector<char *> arguments;
+        for (QByteArray &word : words)
+            arguments.push_back(word.data());
+        arguments.push_back(nullptr);
         winsize size = {24, 70, 0, 0};
         int terminal = -1;
         const pid_t child = forkpty(&terminal, nullptr, nullptr, &size);
         if (child == 0) {
-            execv(arguments[0], arguments.data());
+            execvp(arguments[0], arguments.data());
             _exit(127);
         }
         m_shown.clear();
@@ -98,6 +101,20 @@ TEST_F(FxScanOnTerminal, ShowsALiveLineAndListensToKeys)
     EXPECT_EQ(run("(2 s of 60; s", 's'), 0);
     EXPECT_TRUE(remains().endsWith("\n1 plug-in: 1 usable; 1 skipped: Good.vst3\n")) << qPrintable(remains());
     EXPECT_EQ(m_folder.markers(), QStringList());
+}
+
+TEST_F(FxScanOnTerminal, SaysInWhichFolderItWaits)
+{
+    const QByteArray folder = QFileInfo(put("s/Plug.vst3")).path().toUtf8();
+    const QList<QByteArray> strace{"strace", "-f",
+                                   "-o",     m_folder.path("operations").toUtf8(),
+                                   "-e",     "inject=getdents64:delay_enter=2000000:when=1",
+                                   "-P",     folder};
+    qputenv("ASAN_OPTIONS", "detect_leaks=0"); // not when traced
+    EXPECT_EQ(run("/s (", ' ', "--timeout=60", strace), 0);
+    EXPECT_TRUE(m_shown.contains("\rLooking in ") || m_shown.contains("KLooking in ")) << m_shown.constData();
+    EXPECT_TRUE(m_shown.contains(" s of 60)")) << m_shown.constData();
+    EXPECT_TRUE(remains().startsWith("FORMAT")) << qPrintable(remains());
 }
 
 TEST_F(FxScanOnTerminal, IsPutBackHoweverTheScanEnds)

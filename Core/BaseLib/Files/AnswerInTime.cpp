@@ -1,0 +1,42 @@
+#include "Core/BaseLib/Files/AnswerInTime.h"
+
+#include <QFileInfo>
+#include <QHash>
+
+#include <algorithm>
+
+namespace {
+
+constexpr std::chrono::seconds kPatience(10); ///< a disk that sleeps takes some
+constexpr std::chrono::seconds kLessPatience(1);
+constexpr std::chrono::seconds kValid(30);
+
+struct Answer {
+    bool isThere;
+    std::chrono::steady_clock::time_point when;
+
+    bool isValid() const { return std::chrono::steady_clock::now() - when < kValid; }
+};
+
+} // namespace
+
+bool answers(const QString &path)
+{
+    thread_local QHash<QString, Answer> known;
+    if (const auto before = known.constFind(path); before != known.constEnd() && before->isValid())
+        return before->isThere;
+    const bool isSilenceKnown = std::any_of(known.cbegin(), known.cend(), [](const Answer &answer) {
+        return !answer.isThere && answer.isValid();
+    });
+    const bool isThere = answerInTime(isSilenceKnown ? kLessPatience : kPatience, [path] {
+                             return QFileInfo::exists(path);
+                         }).has_value();
+    known.insert(path, {isThere, std::chrono::steady_clock::now()});
+    return isThere;
+}
+
+bool fileAnswers(const QString &path)
+{
+    const QFileInfo file(path);
+    return answers(file.path()) && (!file.isSymLink() || answers(path));
+}
