@@ -16,8 +16,6 @@
 
 namespace {
 
-constexpr std::chrono::seconds kPatience(10); ///< with a folder that was given and gives no answer
-
 bool isModuleName(const QString &path)
 {
     const auto &formats = pluginFormats();
@@ -45,11 +43,10 @@ QStringList allFolders(QStringList remembered, const QStringList &excluded, cons
 {
     const QStringList usual = usualPluginFolders();
     const auto isGone = [&](const QString &path) {
-        const auto ask = [path, isUsual = usual.contains(path)] {
-            const QFileInfo file(path);
-            return isUsual ? !file.isDir() : !file.exists() && !file.isSymLink() && file.dir().exists();
-        };
-        return answerInTime(kPatience, ask).value_or(false);
+        const QFileInfo file(path);
+        return answers(path) &&
+               (usual.contains(path) ? !file.isDir()
+                                     : !file.exists() && !file.isSymLink() && file.dir().exists());
     };
     const auto isOver = [&](const QString &path) {
         return (usual.contains(path) || isModuleName(path)) && !hasRecordsBelow(path, effectsFolder) &&
@@ -68,7 +65,7 @@ QStringList settleGiven(const QStringList &given, const QStringList &excluded, Q
     QStringList paths;
     for (const QString &each : given) {
         const QString path = settledPath(each);
-        if (!answerInTime(kPatience, [path] { return QFileInfo::exists(path); })) {
+        if (!answers(path)) {
             leftOut.append(QStringLiteral("'%1' gives no answer").arg(each));
             continue;
         }
@@ -128,9 +125,6 @@ ScanFolders foldersToScan(const ScanOptions &options, const QString &effectsFold
     for (const QString &path : folders.shown)
         if (!isBelowAny(path, folders.listed))
             folders.listed.append(path);
-    // One whose name holds what separates paths cannot be told to the scanner: it searches all then.
-    const auto isSeparated = [](const QString &path) { return path.contains(QDir::listSeparator()); };
-    if (std::none_of(folders.shown.begin(), folders.shown.end(), isSeparated))
-        folders.searched = folders.shown;
+    folders.searched = folders.shown;
     return folders;
 }

@@ -14,7 +14,7 @@
 #include <functional>
 
 // Whole scans, each a few steps. Files of "put" lie in "Plugins", others in the data folder, which "@" stands
-// for; "\n" is a line's end and "." in a list an empty one.
+// for; "~" is what separates paths, "\n" a line's end, and "." in a list an empty one.
 //   put, new FILE, …: STATEMENT | … scripted modules, dated as of the first scan or as updated; "#1" is an id
 //   write FILE: TEXT; remove FILE; move FILE FILE (or folder); holds FILE: TEXT
 //   link FILE FILE                where it lies and where it leads; where there are links
@@ -125,6 +125,7 @@ protected:
     QString resolved(QString text) const
     {
         return text.replace('@', m_folder.dataFolder())
+            .replace('~', QDir::listSeparator())
             .replace(QRegularExpression("\\.vst2\\b"), vst2Ending());
     }
 
@@ -132,7 +133,8 @@ private:
     static QString spelt(QString file)
     {
         const QString path = QString(kBundlePath).replace("%1", "\\1");
-        return file.replace(".vst2", vst2Ending()).replace(QRegularExpression("(\\w+)\\.bundle"), path);
+        file.replace('~', QDir::listSeparator()).replace(".vst2", vst2Ending());
+        return file.replace(QRegularExpression("(\\w+)\\.bundle"), path);
     }
     static QByteArray script(QString statements)
     {

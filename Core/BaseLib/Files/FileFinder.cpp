@@ -50,6 +50,13 @@ void logUnsearchable(const QString &folder, const QString &reason)
 constexpr std::chrono::seconds kTold(1); ///< between two words on a folder that gives no answer
 constexpr std::chrono::milliseconds kLook(50);
 
+/// Whether one of some folders is this one or lies in it.
+bool isAroundAny(const QString &path, const QStringList &folders)
+{
+    return std::any_of(folders.begin(), folders.end(),
+                       [&](const QString &folder) { return isBelow(folder, path); });
+}
+
 /// What a path becomes when the folder at its start is reached by another one.
 QString moved(const QString &path, const QString &from, const QString &to)
 {
@@ -113,7 +120,8 @@ QString FileFinder::foundInsteadOf(const QString &path) const
         if (isBelow(path, other.path))
             return knownAs(moved(path, other.path, other.real));
     // The link by which it is known may lie where this search did not look.
-    const std::optional<QString> real = m_area.isLimited() ? realPath(path) : std::nullopt;
+    const std::optional<QString> real =
+        m_area.isLimited() && fileAnswers(path) ? realPath(path) : std::nullopt;
     return real ? knownAs(*real) : QString();
 }
 
@@ -278,6 +286,10 @@ std::vector<FileFinder::Place> FileFinder::settleStarts(const QStringList &folde
         if (m_area.isExcluded(path) || isPassedOver(path))
             continue;
         const Place start{path, realPath(path).value_or(path)};
+        if (!mayHoldSome(start, path)) { // a link in the area may lead there
+            m_realOthers.append(start.real);
+            continue;
+        }
         const QString before = searchedAs(start.real);
         if (before.isNull()) {
             m_starts.insert(pathKey(start.real), path);
@@ -391,13 +403,19 @@ bool FileFinder::follow(const Link &link, const Cancelled &isCancelled)
     if (isPassedOver(link.path))
         return true;
     const std::optional<QString> real = realPath(link.path);
-    const auto isInside = [&](const QString &folder) { return isBelow(folder, *real); };
-    if (!real || std::any_of(m_realFolders.begin(), m_realFolders.end(), isInside))
+    if (!real)
         return true;
     const Place place{link.path, *real};
+    if (isAroundAny(place.real, m_realFolders)) { // it is searched by its own path
+        if (!searchedAs(place.real).isNull())
+            m_otherPaths.push_back(place);
+        return true;
+    }
+    if (isAroundAny(place.real, m_realOthers) && !m_realOthers.contains(place.real, kPathCase))
+        return true;
     if (!mayHoldSome(place, link.path))
         return true;
-    const bool isNew = searchedAs(place.real).isNull();
+    const bool isNew = searchedInAreaAs(place.real).isNull();
     if (!isNew || m_listedByLink.contains(pathKey(place.real)))
         m_otherPaths.push_back(place);
     if (isLookedFor(link.path) && !isListed(place) && isInArea(place, link.path)) {
@@ -417,7 +435,7 @@ bool FileFinder::isListed(const Place &place) const
 {
     if (m_listedByLink.contains(pathKey(place.real)))
         return true;
-    const QString before = searchedAs(place.real);
+    const QString before = searchedInAreaAs(place.real);
     return std::any_of(m_endings.begin(), m_endings.end(), [&](const QString &ending) {
         return place.path.endsWith(ending, Qt::CaseInsensitive) &&
                before.endsWith(ending, Qt::CaseInsensitive);
@@ -435,6 +453,13 @@ QString FileFinder::searchedAs(const QString &real) const
             break;
     }
     return {};
+}
+
+/// The same where it belongs to what is searched: what lies elsewhere below a start is not come upon.
+QString FileFinder::searchedInAreaAs(const QString &real) const
+{
+    const QString path = searchedAs(real);
+    return m_area.isWithin(path) || m_area.isWithin(real) ? path : QString();
 }
 
 QStringList findFiles(const QString &folder, const QString &ending, FileFinder::Links links)

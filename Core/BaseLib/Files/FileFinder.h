@@ -99,6 +99,7 @@ private:
     bool mayHoldSome(const Place &start, const QString &folder) const;
     QString knownAs(const QString &real) const;
     QString searchedAs(const QString &real) const;
+    QString searchedInAreaAs(const QString &real) const;
 
     QStringList m_endings;
     Links m_links;
@@ -111,7 +112,8 @@ private:
     QStringList m_folders; ///< that were searched last
     QStringList m_found;   ///< in them, of all endings
     QStringList m_unread;
-    QStringList m_realFolders; ///< m_folders without links
+    QStringList m_realFolders; ///< m_folders without links, but for those outside the area
+    QStringList m_realOthers;  ///< those
     std::vector<Link> m_met;   ///< links, in the order in which they are followed
     std::vector<Place> m_otherPaths;
     Reached m_starts;       ///< where searches start: the folders, and those that links lead to

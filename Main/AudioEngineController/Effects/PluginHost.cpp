@@ -303,7 +303,7 @@ void PluginHost::launch()
         const int jobs = scanJobs(m_scanJobs);
         std::map<QString, QString> environment = m_scannerEnvironment;
         if (!m_only.isEmpty())
-            environment[QStringLiteral("FXPROBE_ONLY")] = m_only.join(QDir::listSeparator());
+            environment[QStringLiteral("FXPROBE_ONLY")] = searchedOnlyText(m_only);
         m_launcher.run({m_scannerPath, effectsFolder() + QLatin1String(kScanListFile), effectsFolder(),
                         m_probeLimit, [this] { WriteScanList(); }, jobs, memoryLimit(m_memoryLimit, jobs),
                         environment});

@@ -1,5 +1,6 @@
 #include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/NativeFile.h"
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
@@ -37,8 +38,8 @@ QStringList pathsOf(const QJsonObject &root, QLatin1String name, QString &reason
 
 bool FolderRules::isIgnored(const QString &path) const
 {
-    return !ignored.isEmpty() &&
-           (isBelowAny(path, ignored) || isBelowAny(realPath(path).value_or(path), ignored));
+    return !ignored.isEmpty() && (isBelowAny(path, ignored) ||
+                                  (fileAnswers(path) && isBelowAny(realPath(path).value_or(path), ignored)));
 }
 
 FolderRules readFolderRules(const QString &effectsFolder)
@@ -78,10 +79,19 @@ FileResult writeFolderRules(const QString &effectsFolder, const FolderRules &rul
 QStringList searchedOnly()
 {
     QStringList paths;
-    for (const QString &path :
-         qEnvironmentVariable("FXPROBE_ONLY").split(QDir::listSeparator(), Qt::SkipEmptyParts)) {
+    const QString text = qEnvironmentVariable("FXPROBE_ONLY");
+    const QChar separator = text.contains(QLatin1Char('\n')) ? QLatin1Char('\n') : QDir::listSeparator();
+    for (const QString &path : text.split(separator, Qt::SkipEmptyParts)) {
         const QString bundle = bundleOf(path + QLatin1Char('/')); // a bundle is searched as a whole
         paths.append(bundle.isEmpty() ? path : bundle);
     }
     return paths;
+}
+
+QString searchedOnlyText(const QStringList &paths)
+{
+    QString text;
+    for (const QString &path : paths)
+        text += path + QLatin1Char('\n');
+    return text;
 }

@@ -28,6 +28,10 @@ FolderRules readFolderRules(const QString &effectsFolder);
 /// Replaces the file.
 FileResult writeFolderRules(const QString &effectsFolder, const FolderRules &rules);
 
-/// The paths of the environment variable "FXPROBE_ONLY", separated as in PATH: a scan searches only these and
-/// keeps what is known of all others. None where the variable is not set, or empty.
+/// The paths of the environment variable "FXPROBE_ONLY": a scan searches only these and keeps what is known
+/// of all others. They stand one a line, or, where the text has no end of a line, are separated as in PATH.
+/// None where the variable is not set, or empty.
 QStringList searchedOnly();
+
+/// The value of that variable for some paths, which may hold what separates others in PATH.
+QString searchedOnlyText(const QStringList &paths);

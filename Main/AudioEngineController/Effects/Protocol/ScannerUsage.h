@@ -26,8 +26,8 @@ inline constexpr UsageRow kScannerVariables[] = {
     {"FXPROBE_MEMORY_LIMIT", "With workers: give up on a plug-in that takes more memory than this many MiB; "
                              "0 (the default): never."},
     {"FXPROBE_ONLY",
-     "Folders and plug-ins of the scan list, separated as in PATH: search only these, and keep "
-     "what is known of all others."},
+     "Folders and plug-ins of the scan list, separated as in PATH or one a line: search only these, and "
+     "keep what is known of all others."},
     {"FXPROBE_LOG", "A file to which the log is appended, in place of standard error."},
     {"FXPROBE_TRACE", "1 adds the trace lines to the log."},
     {"FXPROBE_REPORT", "A file to which the course of the scan is appended."},
