@@ -249,7 +249,8 @@ private:
     }
 
     /// A scan of one folder changes nothing elsewhere, but that a plug-in that works takes an identifier from
-    /// one that does not. As if it had never been: what follows sees none of it.
+    /// one that does not, and that a file takes over what was known of one that is not there. No mark is
+    /// lost: what is gone may lie in another folder. As if it had never been: what follows sees none of it.
     void scanPart()
     {
         const std::vector<EffectRecord> before = catalogue();
@@ -274,8 +275,15 @@ private:
                 return other == record;
             };
             // What a user switched on beside what crashed is switched off again when it is read.
-            const bool mayGo = isBelow(record.path, m_part) || crashed.count(record.path) != 0 ||
+            const bool isMissing = m_files.count(record.path) == 0 || isAway(record.path);
+            const bool mayGo = isBelow(record.path, m_part) || crashed.count(record.path) != 0 || isMissing ||
                                (!record.working && !record.standsForFile());
+            const auto hasMarks = [&](const EffectRecord &other) {
+                return other.category == record.category && other.favourite == record.favourite;
+            };
+            EXPECT_TRUE(!isMissing || markOf(record) == Mark() ||
+                        std::any_of(after.begin(), after.end(), hasMarks))
+                << "marks of " << qPrintable(record.path + ' ' + record.id) << catalogueText().constData();
             EXPECT_TRUE(mayGo || std::any_of(after.begin(), after.end(), isIt))
                 << qPrintable(record.path + ' ' + record.id) << catalogueText().constData();
         }

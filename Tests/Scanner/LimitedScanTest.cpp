@@ -46,7 +46,7 @@ folders @/Plugins/Two.vst3 @/Plugins/Pack.vst3 @/Plugins
 scan
 vst3 Name: Pack
 
-= What moved is known again by the scan that sees both places
+= What moved is known again by the scan that finds it
 put a/Comp.vst3:
 write Plugins/a/other: x
 scan
@@ -54,14 +54,55 @@ mark Comp Favourite 1
 move Plugins/a/Comp.vst3 Plugins/b/Comp.vst3
 only @/Plugins/b
 scan
-vst3 Path Favourite: a/Comp.vst3|1
+vst3 Path Favourite: b/Comp.vst3|1
+only @/Plugins/a
+same
+only
+same
+
+= What moved out of the searched part keeps marks and crashes until it is found
+put a/Comp.vst3, a/Plain.vst3:
+put a/Shell.vst2: child 1 One | child 2 Two | fault entry abort Two
+write Plugins/a/other: x
+scan 2
+mark Comp Favourite 1
+move Plugins/a/Comp.vst3 Plugins/b/Comp.vst3
+move Plugins/a/Shell.vst2 Plugins/b/Shell.vst2
+remove Plugins/a/Plain.vst3
 only @/Plugins/a
 scan
 vst3 Path Favourite: a/Comp.vst3|1
-only
+vst2 Name Working: Two|0
+same
+only @/Plugins/b
 scan
 vst3 Path Favourite: b/Comp.vst3|1
+vst2 Name Working: One|1, Two|0
 same
+only
+same
+
+= What is gone from everywhere goes with its marks
+put a/Comp.vst3, a/Other.vst3:
+scan
+mark Comp Favourite 1
+remove Plugins/a/Comp.vst3
+only @/Plugins/a
+scan
+vst3 Path Favourite: a/Comp.vst3|1, a/Other.vst3|0
+only
+scan
+vst3 Path Favourite: a/Other.vst3|0
+
+= A plug-in of a folder that is away is used where it is found
+put a/Comp.vst3, b/Other.vst3:
+scan
+mark Comp Favourite 1
+move Plugins/a Away
+put b/Comp.vst3:
+only @/Plugins/b
+scan
+vst3 Path Favourite: b/Comp.vst3|1, b/Other.vst3|0
 
 = A working plug-in takes the identifier of one that failed elsewhere
 put a/Comp.vst3: class Comp | answer initialize false
@@ -133,6 +174,27 @@ loaded Comp New Echo
 vst3 Name Favourite CategoryMask Enabled Working: A|1|16384|1|1, B|0|0|0|1, Bad|0|0|0|0, New|0|0|1|1
 vst2 Name Enabled Working: Echo|1|1
 same
+
+= What moves into an ignored folder keeps its marks
+put a/Comp.vst3: class A
+put a/Bad.vst3: fault initialize kill
+write Plugins/a/other: x
+scan 2
+mark A Favourite 1
+mark Bad Favourite 1
+ignored @/Plugins/b
+move Plugins/a/Comp.vst3 Plugins/b/Comp.vst3
+only @/Plugins/b
+scan
+vst3 Name Path FileTime Favourite: A|b/Comp.vst3|ignored|1, Bad|a/Bad.vst3|2021-03-04 05:06|1
+only
+move Plugins/a/Bad.vst3 Plugins/b/Bad.vst3
+scan
+vst3 Name Path FileTime Favourite: A|b/Comp.vst3|ignored|1, Bad|b/Bad.vst3|ignored|1
+same
+ignored
+scan 2
+vst3 Name Path Favourite Working: A|b/Comp.vst3|1|1, Bad|b/Bad.vst3|1|0
 
 = A copy takes the place of what is ignored
 put a/Comp.vst3, b/Comp.vst3: class Comp

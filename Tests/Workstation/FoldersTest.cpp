@@ -36,7 +36,7 @@ shows : One ok, Two ok, New failed, Usual ok, Echo ok, Late ok
 loaded One Usual Late
 listed: @/Plugins/a @/Plugins/b/Two.vst3 @/Plugins/c @/Plugins/b @/Plugins/d @/Plugins/e
 usual .
-fxscan 0 --folders: @/Plugins/a\n@/Plugins/b/Two.vst3\n@/Plugins/c\n@/Plugins/b\n@/Plugins/d\n@/Plugins/e\n
+fxscan 0 --folders: @/Plugins/a\t1\t\n@/Plugins/b/Two.vst3\t1\t\n@/Plugins/c\t1\t\n@/Plugins/b\t2\t\n@/Plugins/d\t1
 vst2 Name Favourite: Echo|1
 put e/Copy.vst3: class One
 fxscan 0 @/Plugins/e: not used  VST 3  @/Plugins/e/Copy.vst3: a copy of @/Plugins/a/One.vst3
@@ -52,10 +52,43 @@ fxscan 0 --exclude @/Drive/deep: is not searched any more
 shows @/Plugins/a: Own ok, Two ok, Four ok
 shows @/Plugins/a/drive: Two ok
 
+= A link to another remembered folder is followed
+put a/One.vst3, b/Two.vst3, b/sub/Four.vst3:
+link Plugins/a/inner Plugins/b
+link Plugins/a/lower Plugins/b/sub
+usual .
+shows @/Plugins/a @/Plugins/b: One ok, Two ok, Four ok
+new b/Two.vst3:
+put b/Three.vst3:
+shows @/Plugins/a: One ok, Three ok
+loaded Two Three
+shows : One ok, Two ok, Three ok, Four ok
+loaded .
+
+= A folder whose name holds what separates paths is searched alone
+put a/One.vst3, b/Two.vst3:
+move Plugins/b Plugins/x~y
+usual .
+shows @/Plugins/a: One ok
+new a/One.vst3:
+shows @/Plugins/x~y: Two ok
+loaded Two
+
+= What moved from one folder to another is shown where it was and where it is
+put a/One.vst3, a/Comp.vst3, b/Two.vst3:
+usual .
+shows @/Plugins/a @/Plugins/b: One ok, Comp ok, Two ok
+mark Comp Favourite 1
+move Plugins/a/Comp.vst3 Plugins/b/Comp.vst3
+fxscan 0 @/Plugins/a: 1 usable, 1 file gone\n | Comp (VST 3, file gone): its file is not there
+shows @/Plugins/b: Comp ok, Two ok
+remove Plugins/b/Two.vst3
+fxscan 0 @/Plugins/b: 1 usable; 1 gone: Two\n
+
 = A folder of the environment that is not there is named
 usual @/nowhere
 put One.vst3:
-fxscan 0 --folders: left out: there is no folder '@/nowhere' | @/Plugins\n
+fxscan 0 --folders: left out: there is no folder '@/nowhere' | @/Plugins\t0\t\n
 shows : One ok
 
 = What is away is kept until its folder is forgotten
@@ -118,6 +151,7 @@ fxscan 2 --retry A: 'A' is ignored; --no-ignore its path first
 fxscan 2 --rescan A: 'A' is ignored; --no-ignore its path first
 loaded .
 fxscan 0 --favourite Two --no-ignore @/Plugins/One.vst3: is not ignored any more
+fxscan 0 --list: 3 plug-ins: 1 switched off, 1 ignored, 1 not asked
 shows @/Plugins: A ok, B switched off, C ok, Two ignored
 loaded One
 vst3 Name Favourite: A|1, B|0, C|0, Two|1
@@ -162,7 +196,7 @@ protected:
             const QByteArray output = outcome.standardOutput + outcome.standardError;
             EXPECT_EQ(outcome.exitCode, words[1].toInt()) << output.constData();
             for (const QString &part : text.split(" | "))
-                EXPECT_TRUE(QString(output).contains(QString(part).replace("\\n", "\n")))
+                EXPECT_TRUE(QString(output).contains(QString(part).replace("\\n", "\n").replace("\\t", "\t")))
                     << output.constData();
         } else if (words[0] == "shows") {
             forgetTrace();

@@ -27,8 +27,8 @@ struct Plugin {
     int outputs = -1;         ///< audio channels; -1: unknown
     bool isUsable = false;    ///< it works, and the user did not switch it off
     bool isFavourite = false; ///< the user's mark
-    /// "ok", "failed", "disabled" (it ended its scanner or gave no answer), "switched off" (by the user), or
-    /// "folder away" (its folder is not there or is empty)
+    /// "ok", "failed", "disabled" (it ended its scanner or gave no answer), "switched off" (by the user),
+    /// "folder away" (its folder is not there or is empty), or "file gone" (its folder is there, it is not)
     QString state;
     QString reason; ///< why it cannot be used: one phrase without a full stop; empty when it can
 };

@@ -18,7 +18,8 @@ QStringList filterWords()
 {
     QStringList words{QStringLiteral("ok"),          QStringLiteral("failed"),
                       QStringLiteral("disabled"),    QStringLiteral("switched-off"),
-                      QStringLiteral("folder-away"), QStringLiteral("ignored"),
+                      QStringLiteral("folder-away"), QStringLiteral("file-gone"),
+                      QStringLiteral("ignored"),     QStringLiteral("not-asked"),
                       QStringLiteral("favourite"),   QStringLiteral("instrument")};
     for (const PluginFormatInfo &format : pluginFormats())
         if (format.isScanned())
@@ -127,9 +128,12 @@ const std::vector<OptionRow> &optionTable()
          "given several times.",
          "Makes no scan. Where several files have plug-ins of that name, give the path."},
         {"folders", "", &ScanOptions::foldersOnly,
-         "Print the folders that a scan without arguments searches, without a scan.",
-         "On a terminal with the number of plug-ins known in each, and with what is excluded and ignored; "
-         "otherwise one a line."},
+         "Print the folders that a scan without arguments searches, with the number of plug-ins known in "
+         "each, "
+         "and what is excluded and ignored; without a scan.",
+         "On a terminal as a table; otherwise one a line, with tabs between the folder, the number, and what "
+         "is "
+         "to be said of it: usual, not there, gives no answer, excluded or ignored."},
         {"forget", "folder", &ScanOptions::forget,
          "Forget a folder and what is known of the plug-ins below it, with categories and favourites.",
          "Makes no scan. For a drive that is gone for good: what is known of one that is away is kept "
@@ -221,13 +225,13 @@ const std::vector<OptionConflict> &optionConflicts()
         };
         for (const char *option : optionsWithoutScan()) {
             const QString reason = QStringLiteral("--%1 makes no scan").arg(QLatin1String(option));
-            for (const char *ofScan :
-                 {"retry", "retry-changed", "retry-failed", "rescan", "rescan-all", "in-process"})
+            for (const char *ofScan : {"retry", "retry-changed", "retry-failed", "rescan", "rescan-all",
+                                       "in-process", "jobs", "memory-limit", "show-window", "timeout"})
                 all.push_back({option, ofScan, reason});
         }
         for (const char *option : optionsWithoutScan())
             if (qstrcmp(option, "list") != 0 && qstrcmp(option, "show") != 0)
-                for (const char *ofOutput : {"only", "format", "html"})
+                for (const char *ofOutput : {"only", "format", "html", "strict"})
                     all.push_back({option, ofOutput,
                                    QStringLiteral("--%1 prints no plug-ins").arg(QLatin1String(option))});
         all.push_back({"show", "only", QStringLiteral("--show shows what it names")});

@@ -40,7 +40,7 @@ void addProbe(Lines &lines, const RememberedProbe &probe, const EffectRecord &re
                                 .arg(QLatin1String(statusText(probe.status)),
                                      QLatin1String(hasFailed ? duringStage(probe.stage) : ""))
                                 .arg(probe.milliseconds, 0, 'f', 1));
-    if (probe.fileTime != record.fileTime && !record.isIgnored())
+    if (probe.fileTime != record.fileTime && !record.fileTime.isEmpty())
         lines.add("", QStringLiteral("of the file of ") + probe.fileTime);
     lines.add("reason", probe.reasonOf(record.subId));
     lines.add("crashed at", probe.framesOf(record.subId));
@@ -61,7 +61,7 @@ QString detailsOf(const CataloguedPlugin &plugin)
     if (record.subId != 0)
         lines.add("sub-plug-in", QStringLiteral("%1 (%2)").arg(record.subName).arg(record.subId));
     lines.add("file", record.path);
-    lines.add("file time", record.isIgnored() ? QString() : record.fileTime);
+    lines.add("file time", record.fileTime);
     if (plugin.hasChanged)
         lines.add("", QStringLiteral("changed since it crashed: fxscan --retry ") + shellWord(record.path));
     if (plugin.probe)

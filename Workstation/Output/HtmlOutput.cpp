@@ -94,6 +94,10 @@ Advice adviceFor(const PluginFailure &failure)
     case PluginState::FolderAway:
         return {QStringLiteral("Connect its drive and scan again. If it is gone for good:"),
                 QStringLiteral("--forget=") + shellWord(QFileInfo(failure.path).path())};
+    case PluginState::FileGone:
+        return {QStringLiteral("A scan of all folders finds it where it is now, or lets it go."), QString()};
+    case PluginState::NotAsked:
+        return {QStringLiteral("The next scan asks it."), QString()};
     case PluginState::Skipped:
         return {QStringLiteral("The next scan asks it again."), QString()};
     default:

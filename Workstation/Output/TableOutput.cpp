@@ -132,8 +132,9 @@ QString renderCounts(const ScanSummary &summary)
         states[failure.state] += failure.isCatalogued ? 0 : 1;
     QStringList now;
     addCount(now, states[PluginState::Ok], "usable");
-    for (const PluginState state : {PluginState::Failed, PluginState::Disabled, PluginState::SwitchedOff,
-                                    PluginState::Ignored, PluginState::FolderAway})
+    for (const PluginState state :
+         {PluginState::Failed, PluginState::Disabled, PluginState::SwitchedOff, PluginState::Ignored,
+          PluginState::FolderAway, PluginState::FileGone, PluginState::NotAsked})
         addCount(now, states[state], stateText(state));
     QStringList changes;
     if (summary.isScan) {

@@ -10,7 +10,6 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
-#include <QHash>
 
 #include <algorithm>
 #include <array>
@@ -50,32 +49,19 @@ QString badText(const EffectRecord &record)
     return QString();
 }
 
-/// Whether the system tells anything of a folder; one that does not answer, as on a network drive whose
-/// server is gone, is not asked again.
-bool answers(const QString &folder)
-{
-    thread_local QHash<QString, bool> known;
-    // A disk that sleeps takes some seconds. After the first folder that gives no answer less.
-    thread_local std::chrono::milliseconds patience(10000);
-    if (const auto before = known.constFind(folder); before != known.constEnd())
-        return *before;
-    const bool answers = answerInTime(patience, [folder] { return QFileInfo::exists(folder); }).has_value();
-    if (!answers)
-        patience = std::chrono::milliseconds(1000);
-    known.insert(folder, answers);
-    return answers;
-}
-
 /// Whether a file is not there because its folder is not, or is empty, or because what it is a link to is
 /// not.
 bool isAway(const QString &path)
 {
-    const QFileInfo file(path);
-    if (!answers(file.path()))
+    if (!fileAnswers(path))
         return true;
+    const QFileInfo file(path);
     return !file.exists() && (!file.dir().exists() || file.dir().isEmpty() || leadsNowhere(path) ||
                               leadsNowhere(bundleOf(path)));
 }
+
+/// Whether a file is not there although its folder is.
+bool isGone(const QString &path) { return !QFileInfo::exists(path) && !cannotBeExamined(path); }
 
 void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder, const FolderRules &rules,
                    CatalogueView &view)
@@ -103,9 +89,12 @@ void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder,
         if (record.standsForFile() && described.count(record.path) != 0)
             continue; // its plug-ins are shown, each with the reason that the file has
         view.plugins.push_back({&format, record, QString(), isOfCrashedFile(record), isAway(record.path)});
-        view.plugins.back().isIgnored =
-            record.isIgnored() || (!view.plugins.back().isAway && rules.isIgnored(record.path));
-        if (CataloguedPlugin &plugin = view.plugins.back(); plugin.state() == PluginState::Disabled) {
+        CataloguedPlugin &plugin = view.plugins.back();
+        plugin.isGone = !plugin.isAway && isGone(record.path);
+        plugin.isIgnored = record.isIgnored() || (!plugin.isAway && rules.isIgnored(record.path));
+        if (record.isIgnored())
+            plugin.record.fileTime.clear(); // is no time
+        if (plugin.state() == PluginState::Disabled) {
             const QString now = PluginHost::instance().host(format.format).moduleTime(record.path);
             plugin.hasChanged = !now.isEmpty() && now != record.fileTime;
         }
@@ -135,6 +124,10 @@ const char *stateText(PluginState state)
         return "ignored";
     case PluginState::FolderAway:
         return "folder away";
+    case PluginState::FileGone:
+        return "file gone";
+    case PluginState::NotAsked:
+        return "not asked";
     }
     return "";
 }
@@ -145,12 +138,16 @@ PluginState CataloguedPlugin::state() const
         return PluginState::Ignored;
     if (isAway)
         return PluginState::FolderAway;
+    if (isGone)
+        return PluginState::FileGone;
     if (isOfCrashedFile)
         return PluginState::Disabled;
     if (record.isSwitchedOff())
         return PluginState::SwitchedOff;
     if (record.working)
         return PluginState::Ok;
+    if (isUnasked)
+        return PluginState::NotAsked;
     return record.enabled ? PluginState::Failed : PluginState::Disabled;
 }
 

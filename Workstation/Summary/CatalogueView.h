@@ -20,6 +20,8 @@ enum class PluginState {
     Skipped,     ///< by the user, in the last scan, and nothing is known of it
     Ignored,     ///< never loaded, because the user wants it so
     FolderAway,  ///< the folder that it lay in is not there, or is empty: on a drive that is unplugged
+    FileGone,    ///< its folder is there, and its file is not
+    NotAsked,    ///< the next scan asks it: it is not ignored any more
 };
 
 /// For people and for JSON.
@@ -40,10 +42,14 @@ struct CataloguedPlugin {
     qint32 inputs = -1;      ///< audio channels as far as catalogue and last probe tell; -1: unknown
     qint32 outputs = -1;     ///< the same
     bool isIgnored = false;  ///< see `PluginState::Ignored`
+    bool isGone = false;     ///< see `PluginState::FileGone`
+    bool isUnasked = false;  ///< see `PluginState::NotAsked`
     bool hasChanged = false; ///< its file is another one than that for which it was disabled
     /// What its last probe came to; only where somebody wants to see it.
     std::optional<RememberedProbe> probe{};
-    bool isUsable() const { return record.working && !isOfCrashedFile && !isAway && !isIgnored; }
+    bool isUsable() const { return isUsableIfThere() && !isGone; }
+    /// The same as long as its file is there.
+    bool isUsableIfThere() const { return record.working && !isOfCrashedFile && !isAway && !isIgnored; }
     /// The categories' names, else what the plug-in says of itself.
     QStringList categories() const;
 };

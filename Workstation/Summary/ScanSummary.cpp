@@ -17,7 +17,7 @@ using PluginIdentity = std::tuple<PluginFormat, QString, QString, quint32>;
 /// What makes a plug-in the same in two catalogues; several classes share a file.
 PluginIdentity identityOf(const CataloguedPlugin &plugin)
 {
-    const QString id = plugin.isUsable() ? plugin.record.id : QString();
+    const QString id = plugin.isUsableIfThere() ? plugin.record.id : QString();
     return {plugin.format->format, plugin.record.path, id, plugin.record.subId};
 }
 
@@ -25,6 +25,9 @@ QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, con
 {
     if (plugin.isAway)
         return QStringLiteral("the folder that it lay in is not there, or is empty");
+    if (plugin.isGone)
+        return QStringLiteral(
+            "its file is not there; a scan of all folders finds it elsewhere, or lets it go");
     const PluginKey key = keyOf(plugin);
     const PluginKey file{key.format, key.path, 0};
     for (const PluginKey &each : {key, file})
@@ -32,14 +35,27 @@ QString reasonOf(const CataloguedPlugin &plugin, const ScanAccount *account, con
             probe && !probe->reason.isEmpty())
             return probe->reason;
     const RememberedProbe *last = memory.find(key.format, key.path);
-    if (const QString reason =
-            last && last->fileTime == plugin.record.fileTime ? last->reasonOf(key.subId) : QString();
-        !reason.isEmpty())
+    const bool isOfFile =
+        last && (last->fileTime == plugin.record.fileTime || plugin.record.fileTime.isEmpty());
+    if (const QString reason = isOfFile ? last->reasonOf(key.subId) : QString(); !reason.isEmpty())
         return reason;
     if (plugin.isOfCrashedFile)
         return QStringLiteral("its file ended the scanner");
+    if (plugin.isUnasked)
+        return QStringLiteral("the next scan asks it");
     return plugin.state() == PluginState::Disabled ? QStringLiteral("it ended the scanner in an earlier scan")
                                                    : QStringLiteral("it failed in an earlier scan");
+}
+
+/// Whether nobody knows of a reason why a plug-in does not work, and the next scan looks at its file.
+bool isUnasked(const CataloguedPlugin &plugin, const ScanAccount *account, const ProbeMemory &memory)
+{
+    const EffectRecord &record = plugin.record;
+    if (!record.enabled || record.working || !record.fileTime.isEmpty())
+        return false;
+    const RememberedProbe *last = memory.find(plugin.format->format, record.path);
+    return !(account && account->find({plugin.format->format, record.path, 0})) &&
+           !(last && !last->reasonOf(record.subId).isEmpty());
 }
 
 void addFailures(ScanSummary &summary, const ScanAccount *account, const ProbeMemory &memory)
@@ -47,6 +63,7 @@ void addFailures(ScanSummary &summary, const ScanAccount *account, const ProbeMe
     for (CataloguedPlugin &plugin : summary.plugins) {
         if (plugin.isUsable() || plugin.isIgnored)
             continue;
+        plugin.isUnasked = isUnasked(plugin, account, memory);
         plugin.reason = reasonOf(plugin, account, memory);
         summary.failures.push_back({plugin.format, plugin.state(), plugin.record.name, plugin.record.path,
                                     plugin.record.subId, plugin.reason, true, plugin.hasChanged});
@@ -107,7 +124,7 @@ void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount 
     std::set<FileIdentity> filesBefore;
     for (const CataloguedPlugin &plugin : before.plugins) {
         filesBefore.insert(fileOf(plugin));
-        if (plugin.isUsable() || plugin.record.subId != 0)
+        if (plugin.isUsableIfThere() || plugin.record.subId != 0)
             gone.emplace(identityOf(plugin), plugin.record.name);
         else
             failedBefore.insert(fileOf(plugin));
@@ -115,7 +132,7 @@ void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount 
     std::set<FileIdentity> failedNow;
     for (const CataloguedPlugin &plugin : summary.plugins) {
         const FileIdentity file = fileOf(plugin);
-        const bool standsForFile = !plugin.isUsable() && plugin.record.subId == 0;
+        const bool standsForFile = !plugin.isUsableIfThere() && plugin.record.subId == 0;
         if (standsForFile)
             failedNow.insert(file);
         const bool wasKnown = gone.erase(identityOf(plugin)) + failedBefore.count(file) != 0 ||

@@ -54,6 +54,7 @@ TEST(Options, WrongOnesAreNamedWithWhatToDo)
         {{"--quiet=yes"}, "Unexpected value after '--quiet'."},
         {{"--list", "/plug-ins"}, "--list makes no scan; it takes no folders"},
         {{"--folders", "/plug-ins"}, "--folders makes no scan; it takes no folders"},
+        {{"--list", "--timeout", "5"}, "--list makes no scan; it cannot be combined with --timeout"},
         {{"--folders", "--format", "json"},
          "--folders prints no plug-ins; it cannot be combined with --format"},
         {{"--timeout", "5", "--in-process"},

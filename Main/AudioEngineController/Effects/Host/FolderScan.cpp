@@ -396,22 +396,30 @@ void FolderScan::finish(bool isWhole)
     for (const EffectRecord &record : m_later)
         if (!m_host.AddEffect(record))
             passMarksToHolder(record);
+    QSet<const EffectRecord *> replaced;
     for (const auto &[id, old] : m_likelyMarks) {
         if (mayYetBeListed(*old)) // the next scan knows
             continue;
-        if (!m_host.isListed(old->id))
+        if (!m_host.isListed(old->id)) {
             m_host.passMarks(*old, id);
+            replaced.insert(old);
+        }
         m_host.setHidden(id, false);
     }
-    listIgnored();
+    const auto moved = isWhole ? m_plan->movedToCrashed() : ScanPlan::MovedToCrashed();
+    QSet<QString> settled;
+    for (const EffectRecord &record : moved.records)
+        if (m_host.AddEffect(record))
+            settled.insert(pathKey(record.path));
+    listIgnored(settled);
     if (isWhole) {
-        const ScanPlan::MovedToCrashed moved = m_plan->movedToCrashed();
-        for (const EffectRecord &record : moved.records)
-            m_host.AddEffect(record);
         for (const auto &[id, old] : moved.marks)
             m_host.passMarks(old, id);
         for (const EffectRecord *record : m_plan->away())
             if (!m_host.isListed(record->id)) // else a file that is there lists it
+                m_host.AddEffect(*record);
+        for (const EffectRecord *record : m_plan->orphans())
+            if (!replaced.contains(record))
                 m_host.AddEffect(*record);
         forgetGone();
         m_host.clearSuspects([this](const QString &path) {
@@ -429,9 +437,11 @@ void FolderScan::finish(bool isWhole)
 }
 
 /// What the user wants never loaded is listed all the same; what nobody ever asked has a record for the file.
-void FolderScan::listIgnored()
+void FolderScan::listIgnored(const QSet<QString> &settled)
 {
     for (const QString &path : m_plan->ignored()) {
+        if (settled.contains(pathKey(path)))
+            continue;
         const KnownList::Records known = m_host.known().recordsOfPath(path);
         const RememberedProbe *last = m_memory.probes().find(m_host.format(), path);
         const bool isListed = std::any_of(known.begin(), known.end(), [&](const EffectRecord *record) {
@@ -463,8 +473,9 @@ void FolderScan::forgetGone()
     if (!m_plan->hasGone() && m_plan->items().empty())
         return; // as it was read
     QSet<QString> there = m_found;
-    for (const EffectRecord *record : m_plan->away())
-        there.insert(pathKey(record->path));
+    for (const KnownList::Records *records : {&m_plan->away(), &m_plan->orphans()})
+        for (const EffectRecord *record : *records)
+            there.insert(pathKey(record->path));
     m_memory.keepOnly(
         [&](const QString &path) { return m_plan->isOutside(path) || there.contains(pathKey(path)); });
 }

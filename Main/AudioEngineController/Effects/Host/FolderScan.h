@@ -59,7 +59,7 @@ private:
     std::vector<EffectRecord> droppedOf(const ScanItem &item, const OutcomeRecords &records) const;
     void giveUpOthers(const ScanItem &item, const OutcomeRecords &records);
     void forgetGone();
-    void listIgnored();
+    void listIgnored(const QSet<QString> &settled);
 
     /// Has interim writes carry what is known of the items from one on, unless they are settled.
     void collectWaiting(std::size_t from);

@@ -1,5 +1,7 @@
 #include "Main/AudioEngineController/Effects/Host/ScanPlan.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
+
 #include <QDir>
 #include <QFileInfo>
 
@@ -57,6 +59,12 @@ bool hasMarks(const EffectRecord &record)
     return record.favourite || record.category != 0 || record.isSwitchedOff();
 }
 
+/// Whether a record says something of a plug-in that nobody else knows.
+bool hasSomethingToLose(const EffectRecord &record)
+{
+    return hasMarks(record) || (!record.enabled && !record.working && !record.isIgnored());
+}
+
 /// A lone record that stands for a whole file, as catalogues of earlier versions hold; null when there is
 /// none.
 const EffectRecord *loneFileRecord(const KnownList::Records &records)
@@ -96,6 +104,7 @@ void ScanPlan::decide(const QStringList &modules)
         settleAllGone(modules);
         leaveOutCopies();
         askCopiesOfUnsettled();
+        collectOrphans();
     }
     std::stable_partition(m_items.begin(), m_items.end(),
                           [](const ScanItem &item) { return !item.known.empty(); });
@@ -122,22 +131,53 @@ void ScanPlan::decideModule(const QString &path)
 
 void ScanPlan::sortMissing(const QSet<QString> &found)
 {
+    collectSought();
     QSet<QString> gone;
     for (const EffectRecord *record : m_host.known().all()) {
         const QString key = pathKey(record->path);
         if (found.contains(key) || gone.contains(key))
             continue;
-        if (isOutside(record->path)) {
+        const bool isNamesake = m_sought.contains(pathKey(fileNameOf(record->path)));
+        const bool isElsewhere = isOutside(record->path);
+        if (isElsewhere && !((isNamesake || m_sought.contains(key)) && isMissing(record->path))) {
             keep({record});
             continue;
         }
-        if (!isGone(record->path)) {
+        if ((isElsewhere && !isNamesake) || !isGone(record->path)) {
             m_away.push_back(record);
             continue;
         }
         gone.insert(key);
         m_gone.push_back({record->path, m_host.known().recordsOfPath(record->path)});
     }
+}
+
+/// Collects the names of files of which hardly anything is known, and the paths of those whose copies they
+/// were: a file that lay where this scan does not look may have moved there.
+void ScanPlan::collectSought()
+{
+    if (!m_area.isLimited())
+        return;
+    for (const QString &path : m_ignored)
+        if (m_host.known().recordsOfPath(path).empty())
+            m_sought.insert(pathKey(fileNameOf(path)));
+    for (const ScanItem &item : m_items) {
+        if (!isHardlyKnown(item.known))
+            continue;
+        m_sought.insert(pathKey(fileNameOf(item.path)));
+        if (const RememberedProbe *last = m_memory.find(m_host.format(), item.path))
+            for (const RememberedPlugin &plugin : last->plugins)
+                m_sought.insert(pathKey(plugin.heldBy));
+    }
+}
+
+/// Whether a file is not there, wherever it lay. What gives no answer counts as there.
+bool ScanPlan::isMissing(const QString &path)
+{
+    const auto [entry, isNew] = m_isMissing.try_emplace(path, false);
+    if (isNew)
+        entry->second = fileAnswers(path) && !QFileInfo::exists(path) && !cannotBeExamined(path);
+    return entry->second;
 }
 
 bool ScanPlan::isGone(const QString &path)
@@ -217,18 +257,29 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
             bestPlace = place;
         }
     }
-    m_settled.push_back({&gone, namesakes, heirs, best ? QString() : leftAloneOf(namesakes)});
+    const QString leftAlone = best ? QString() : leftAloneOf(namesakes);
+    m_settled.push_back({&gone, namesakes, heirs, leftAlone, best || !leftAlone.isEmpty()});
     if (best)
         best->moved = gone.records;
     else
         askAgain(namesakes);
 }
 
-/// The first file of which nothing is known that this run must not touch; empty when there is none.
+/// A scan of a part does not see where a gone file may have moved to.
+void ScanPlan::collectOrphans()
+{
+    for (const SettledFile &settled : m_area.isLimited() ? m_settled : std::vector<SettledFile>())
+        for (const EffectRecord *record : settled.gone->records)
+            if (hasSomethingToLose(*record) && !(settled.hasMoved && record->standsForFile()))
+                m_orphans.push_back(record);
+}
+
+/// The first file of which nothing is known that must not be loaded; empty when there is none.
 QString ScanPlan::leftAloneOf(const QStringList &namesakes) const
 {
     const auto found = std::find_if(namesakes.begin(), namesakes.end(), [this](const QString &path) {
-        return m_host.isLeftAlone(path) && m_host.known().recordsOfPath(path).empty();
+        return (m_host.isLeftAlone(path) || m_ignored.contains(path)) &&
+               m_host.known().recordsOfPath(path).empty();
     });
     return found == namesakes.end() ? QString() : *found;
 }
@@ -242,6 +293,16 @@ EffectRecord ScanPlan::movedUnasked(const EffectRecord &gone, const QString &pat
     return moved;
 }
 
+/// The same where the user wants nothing loaded.
+EffectRecord ScanPlan::movedIgnored(const EffectRecord &gone, const QString &path) const
+{
+    EffectRecord moved = movedUnasked(gone, path);
+    if (gone.standsForFile())
+        moved.id = m_host.freeIdentifier(moved, gone.name);
+    settleIgnored(moved, true);
+    return moved;
+}
+
 ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
 {
     const auto hasCrashed = [this](const QString &path) {
@@ -251,7 +312,9 @@ ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
     MovedToCrashed moved;
     for (const SettledFile &settled : m_settled)
         for (const EffectRecord *record : settled.gone->records)
-            if (!settled.leftAlone.isEmpty() && !record->standsForFile())
+            if (m_ignored.contains(settled.leftAlone))
+                moved.records.push_back(movedIgnored(*record, settled.leftAlone));
+            else if (!settled.leftAlone.isEmpty() && !record->standsForFile())
                 moved.records.push_back(movedUnasked(*record, settled.leftAlone));
     if (!m_host.hasNewCrashes()) // what crashed long ago is none that has moved just now
         return moved;

@@ -23,7 +23,10 @@ struct ScanItem {
 ///
 /// A file that is not there is *gone* when the folder that it lay in was searched and has other content, or
 /// is not below a listed folder any more. It is *away* when that folder is not there, cannot be read or is
-/// empty: drives are unplugged. What lies outside the area that was searched stays as it is.
+/// empty: drives are unplugged. What lies outside the area that was searched stays as it is, but for a file
+/// that is not there while one was found that may be it: that counts as gone, or away. In turn a scan of such
+/// an area keeps of files that are gone what has marks or crashed: they may have moved to where it did not
+/// look.
 class ScanPlan {
 public:
     /// While the plan is used the host's known list must not change but by crashes. `finder` has searched the
@@ -35,7 +38,7 @@ public:
 
     /// Records that stay as they are.
     const std::vector<const EffectRecord *> &kept() const { return m_kept; }
-    /// What moves from gone files to files that crashed, in this scan too.
+    /// What moves from gone files to files that crashed, in this scan too, or that must not be loaded.
     struct MovedToCrashed {
         std::vector<EffectRecord> records;     ///< changed copies, unless a probed file lists them
         std::map<QString, EffectRecord> marks; ///< by the identifier of the record that gets them
@@ -50,6 +53,9 @@ public:
     bool isOutside(const QString &path) const { return !m_area.isWithin(path); }
     /// Records of files that are away. One whose identifier a probed file lists gives way to it.
     const KnownList::Records &away() const { return m_away; }
+
+    /// Records of gone files that stay unless a file that is there lists them.
+    const KnownList::Records &orphans() const { return m_orphans; }
 
     /// The sub-plug-ins of an item that are known to have ended the process that probed them, in the version
     /// of the file that is there: they must not be loaded. None where a file ended it as a whole and moved
@@ -80,16 +86,21 @@ private:
         const KnownFile *gone;
         QStringList namesakes;
         QStringList heirs; ///< new files of its name, one of which its records move to
-        QString leftAlone; ///< else the one of its name that this run must not touch
+        QString leftAlone; ///< else the one of its name that must not be loaded, to which they move
+        bool hasMoved;     ///< to one of these
     };
 
     void decideModule(const QString &path);
     void sortMissing(const QSet<QString> &found);
+    void collectSought();
+    bool isMissing(const QString &path);
     bool isGone(const QString &path);
     bool mayMoveOutside(const QString &path) const;
     void indexKept();
     void settleAllGone(const QStringList &modules);
     void settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes);
+    void collectOrphans();
+    EffectRecord movedIgnored(const EffectRecord &gone, const QString &path) const;
     QString leftAloneOf(const QStringList &namesakes) const;
     void moveToCrashed(const KnownFile &gone, const QStringList &namesakes, MovedToCrashed &all) const;
     void askAgain(const QStringList &paths);
@@ -115,4 +126,7 @@ private:
     std::vector<KnownFile> m_gone;
     std::vector<SettledFile> m_settled;
     KnownList::Records m_away;
+    KnownList::Records m_orphans;
+    QSet<QString> m_sought; ///< names and paths of missing files that may have moved here, as keys
+    std::map<QString, bool> m_isMissing; ///< by path
 };
