@@ -1,5 +1,6 @@
 #include "Workstation/FolderCommands.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
@@ -39,7 +40,7 @@ private:
     bool ignore(const QString &given);
     bool takeBack(QStringList &rule, const QString &given, const char *state);
     int drop(const QStringList &paths);
-    void settleAllIgnored();
+    bool settleRules();
     void change(const Change &change);
     void writeRules();
     bool refuse(const QString &reason);
@@ -135,15 +136,11 @@ bool FolderEditor::ignore(const QString &given)
         known += removeBelow(records, paths, pathOfRecord);
         return false; // they were counted
     });
-    if (known == 0 && !QFileInfo::exists(paths.front()))
+    if (known == 0 && answers(paths.front()) && !QFileInfo::exists(paths.front()))
         return refuse(QStringLiteral("there is no plug-in or folder '%1'").arg(given));
     m_rules.ignored += paths;
     m_rules.ignored.removeDuplicates();
-    writeRules();
-    if (m_exitCode != ScanExit::kDone)
-        return false;
-    settleAllIgnored();
-    if (m_exitCode != ScanExit::kDone)
+    if (!settleRules())
         return false;
     say(QStringLiteral("%1 is not loaded any more (%2)").arg(given, plugins(known)));
     return true;
@@ -161,11 +158,7 @@ bool FolderEditor::takeBack(QStringList &rule, const QString &given, const char 
         return refuse(above == rule.end()
                           ? QStringLiteral("'%1' is not %2").arg(given, QLatin1String(state))
                           : QStringLiteral("'%1' is %2 with '%3'").arg(given, QLatin1String(state), *above));
-    writeRules();
-    if (m_exitCode != ScanExit::kDone)
-        return false;
-    settleAllIgnored();
-    if (m_exitCode != ScanExit::kDone)
+    if (!settleRules())
         return false;
     say(QStringLiteral("%1 is not %2 any more; the next scan asks what is there")
             .arg(given, QLatin1String(state)));
@@ -184,15 +177,20 @@ int FolderEditor::drop(const QStringList &paths)
     return count;
 }
 
-/// Has the catalogues say what is ignored now, so that a workstation hears of it before the next scan.
-void FolderEditor::settleAllIgnored()
+/// Writes the rules, and has the catalogues say what is ignored now, so that a workstation hears of it before
+/// the next scan. False when that could not be done.
+bool FolderEditor::settleRules()
 {
+    writeRules();
+    if (m_exitCode != ScanExit::kDone)
+        return false;
     change([this](Records &records) {
         bool hasChanged = false;
         for (EffectRecord &record : records)
             hasChanged |= settleIgnored(record, m_rules.isIgnored(record.path));
         return hasChanged;
     });
+    return m_exitCode == ScanExit::kDone;
 }
 
 void FolderEditor::change(const Change &change)

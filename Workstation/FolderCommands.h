@@ -11,6 +11,7 @@ bool isFolderCommand(const ScanOptions &options);
 /// lock must be held. The exit code.
 int runFolderCommand(const ScanOptions &options, const QString &effectsFolder);
 
-/// Prints the folders: for people with what is known of each; for programs those that a scan searches, one a
-/// line. The exit code.
+/// Prints the folders that a scan searches, and those that it leaves alone, with the number of plug-ins known
+/// in each: for people as a table, for programs a line each, folder, number and remark with tabs between
+/// them. The exit code.
 int printFolders(const QString &effectsFolder);

@@ -1,3 +1,4 @@
+#include "Core/BaseLib/Files/AnswerInTime.h"
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 #include "Workstation/FolderCommands.h"
@@ -31,7 +32,7 @@ std::vector<Row> rowsOf(const QStringList &paths, const CatalogueView &catalogue
     return rows;
 }
 
-QString render(const std::vector<Row> &rows)
+QString renderTable(const std::vector<Row> &rows)
 {
     int width = Terminal::width(QStringLiteral("FOLDER"));
     for (const Row &row : rows)
@@ -47,6 +48,16 @@ QString render(const std::vector<Row> &rows)
     return text;
 }
 
+/// For programs.
+QString renderLines(const std::vector<Row> &rows)
+{
+    QString text;
+    for (const Row &row : rows)
+        text += row.path + QLatin1Char('\t') + QString::number(row.plugins) + QLatin1Char('\t') + row.remark +
+                QLatin1Char('\n');
+    return text;
+}
+
 } // namespace
 
 int printFolders(const QString &effectsFolder)
@@ -59,29 +70,24 @@ int printFolders(const QString &effectsFolder)
         return folders.isDamaged ? ScanExit::kNotFinished : ScanExit::kUsage;
     }
     const FolderRules rules = readFolderRules(effectsFolder);
-    QString text;
-    if (Terminal::outputIsTerminal()) {
-        const CatalogueView catalogue = readCatalogues(effectsFolder);
-        const QStringList usual = usualPluginFolders();
-        std::vector<Row> rows;
-        for (Row &row : rowsOf(folders.listed, catalogue, QString())) {
-            if (!QFileInfo::exists(row.path))
-                row.remark = QStringLiteral("not there");
-            else if (isBelowAny(row.path, rules.excluded))
-                continue; // stands below
-            else if (usual.contains(row.path))
-                row.remark = QStringLiteral("usual");
-            rows.push_back(row);
-        }
-        for (const Row &row : rowsOf(rules.excluded, catalogue, QStringLiteral("excluded")))
-            rows.push_back(row);
-        for (const Row &row : rowsOf(rules.ignored, catalogue, QStringLiteral("ignored")))
-            rows.push_back(row);
-        text = render(rows);
-    } else {
-        for (const QString &folder : folders.listed)
-            if (!isBelowAny(folder, rules.excluded) && QFileInfo::exists(folder))
-                text += folder + QLatin1Char('\n');
+    const CatalogueView catalogue = readCatalogues(effectsFolder);
+    const QStringList usual = usualPluginFolders();
+    std::vector<Row> rows;
+    for (Row &row : rowsOf(folders.listed, catalogue, QString())) {
+        if (!answers(row.path))
+            row.remark = QStringLiteral("gives no answer");
+        else if (!QFileInfo::exists(row.path))
+            row.remark = QStringLiteral("not there");
+        else if (isBelowAny(row.path, rules.excluded))
+            continue; // stands below
+        else if (usual.contains(row.path))
+            row.remark = QStringLiteral("usual");
+        rows.push_back(row);
     }
+    for (const Row &row : rowsOf(rules.excluded, catalogue, QStringLiteral("excluded")))
+        rows.push_back(row);
+    for (const Row &row : rowsOf(rules.ignored, catalogue, QStringLiteral("ignored")))
+        rows.push_back(row);
+    const QString text = Terminal::outputIsTerminal() ? renderTable(rows) : renderLines(rows);
     return Terminal::printData(text) ? ScanExit::kDone : ScanExit::kNotFinished;
 }
