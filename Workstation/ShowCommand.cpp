@@ -5,29 +5,6 @@
 #include <algorithm>
 #include <set>
 
-namespace {
-
-/// Files that are not in the catalogue, by name: a copy leads to the plug-ins that are used in its place.
-QStringList usedInsteadOf(const QString &name, const ProbeMemory &memory, QString &reason)
-{
-    QStringList paths;
-    for (const PluginFormatInfo &format : pluginFormats())
-        memory.forEach(format.format, [&](const RememberedProbe &probe) {
-            if (!isFileNamed(name, probe.path))
-                return;
-            reason = QStringLiteral("%1: %2").arg(
-                probe.path, probe.reason.isEmpty()
-                                ? QStringLiteral("nothing is known of it any more; scan it again")
-                                : probe.reason);
-            for (const RememberedPlugin &plugin : probe.plugins)
-                if (!plugin.heldBy.isEmpty())
-                    paths.append(plugin.heldBy);
-        });
-    return paths;
-}
-
-} // namespace
-
 QStringList keepNamed(ScanSummary &summary, const QStringList &names, const ProbeMemory &memory)
 {
     QStringList unknown;
@@ -43,10 +20,9 @@ QStringList keepNamed(ScanSummary &summary, const QStringList &names, const Prob
     for (const QString &name : names) {
         if (keep(name))
             continue;
-        QString reason = QStringLiteral("no plug-in is named '%1'").arg(name);
-        const QStringList used = usedInsteadOf(name, memory, reason);
+        const auto [reason, used] = unlistedFileNamed(name, memory);
         if (std::count_if(used.begin(), used.end(), keep) == 0)
-            unknown.append(reason);
+            unknown.append(reason.isEmpty() ? QStringLiteral("no plug-in is named '%1'").arg(name) : reason);
     }
     std::vector<CataloguedPlugin> plugins;
     for (const std::size_t place : kept) {

@@ -47,7 +47,8 @@ protected:
 
 TEST_F(Managing, MarksAreSetByNameFileOrPath)
 {
-    put("Comp.vst3");
+    const QString used = put("Comp.vst3");
+    put("Copy.vst3", "class Comp\n");
     const QString other = put("Comp.vst2", "name Comp\n");
     put("Pair.vst3", "class A\nclass B\nclass a\n");
     put("Shell.vst2", "child 1 One\nchild 2 Two\nfault entry abort Two\n");
@@ -57,10 +58,12 @@ TEST_F(Managing, MarksAreSetByNameFileOrPath)
     const struct {
         QString arguments;
         int exitCode;
-        const char *said;
+        QByteArray said;
         const char *marks; ///< afterwards
     } rows[] = {
         {"--switch-off Comp", 2, "several plug-ins are named 'Comp'; use the path of one:\n", "Crashx Twox"},
+        {"--favourite @Copy.vst3", 2, used.toUtf8().prepend("use the path of what is used in its place:\n  "),
+         "Crashx Twox"},
         {"--switch-off B --favourite Nobody", 2, "no plug-in is named 'Nobody'", "Crashx Twox"},
         {"--switch-off B @Comp.vst3", 2, "it takes no folders", "Crashx Twox"},
         {"--switch-off @Comp.vst3", 0, "Comp (VST 3): switched off", "Comp- Crashx Twox"},

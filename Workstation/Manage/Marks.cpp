@@ -82,6 +82,17 @@ std::vector<Plugin> shownPlugins(const CatalogueEdit &edit)
     return shown;
 }
 
+/// Why a name means none of the plug-ins that the catalogue lists.
+QString whyUnknown(const QString &name, const ProbeMemory &memory)
+{
+    const UnlistedFile file = unlistedFileNamed(name, memory);
+    if (!file.usedInstead.isEmpty())
+        return QStringLiteral("'%1' is not used; use the path of what is used in its place:\n  ")
+                   .arg(name) +
+               file.usedInstead.join(QLatin1String("\n  "));
+    return file.reason.isEmpty() ? QStringLiteral("no plug-in is named '%1'").arg(name) : file.reason;
+}
+
 } // namespace
 
 MarkOutcome setMarks(const QString &effectsFolder, const MarkRequest &request)
@@ -100,7 +111,7 @@ MarkOutcome setMarks(const QString &effectsFolder, const MarkRequest &request)
             if (named.isAmbiguous())
                 outcome.wrong.append(named.question(name));
             else if (named.places.empty())
-                outcome.wrong.append(QStringLiteral("no plug-in is named '%1'").arg(name));
+                outcome.wrong.append(whyUnknown(name, memory));
             else
                 for (const std::size_t place : named.places)
                     outcome.done.append(QStringLiteral("%1 (%2): %3")

@@ -12,7 +12,7 @@
 namespace {
 
 /// How well a name fits, the best first.
-enum class Fit { Path, Exact, AnyCase, None };
+enum class Fit { Path, Exact, Alike, Base, None };
 
 bool isPath(const QString &name, const QString &path)
 {
@@ -24,12 +24,19 @@ Fit fitOf(const QString &name, const QString &text)
 {
     if (text == name)
         return Fit::Exact;
-    return text.compare(name, Qt::CaseInsensitive) == 0 ? Fit::AnyCase : Fit::None;
+    // Who types a name sees no blanks at its ends.
+    return text.trimmed().compare(name.trimmed(), Qt::CaseInsensitive) == 0 ? Fit::Alike : Fit::None;
 }
 
 Fit fitOfFile(const QString &name, const QString &path)
 {
-    return isPath(name, path) ? Fit::Path : fitOf(name, fileNameOf(path));
+    if (isPath(name, path))
+        return Fit::Path;
+    EffectRecord file;
+    file.path = path;
+    NameFromPath(file);
+    return std::min(fitOf(name, fileNameOf(path)),
+                    fitOf(name, file.name) == Fit::None ? Fit::None : Fit::Base);
 }
 
 } // namespace
@@ -69,10 +76,22 @@ NamedPlugins pluginsNamed(const QString &name, const std::vector<const EffectRec
     return named;
 }
 
-bool isFileNamed(const QString &name, const QString &path)
+bool isFileNamed(const QString &name, const QString &path) { return fitOfFile(name, path) != Fit::None; }
+
+UnlistedFile unlistedFileNamed(const QString &name, const ProbeMemory &memory)
 {
-    EffectRecord file;
-    file.path = path;
-    NameFromPath(file);
-    return fitOfFile(name, path) != Fit::None || fitOf(name, file.name) != Fit::None;
+    UnlistedFile file;
+    for (const PluginFormatInfo &format : pluginFormats())
+        memory.forEach(format.format, [&](const RememberedProbe &probe) {
+            if (!isFileNamed(name, probe.path))
+                return;
+            file.reason = QStringLiteral("%1: %2").arg(
+                probe.path, probe.reason.isEmpty()
+                                ? QStringLiteral("nothing is known of it any more; scan it again")
+                                : probe.reason);
+            for (const RememberedPlugin &plugin : probe.plugins)
+                if (!plugin.heldBy.isEmpty() && !file.usedInstead.contains(plugin.heldBy))
+                    file.usedInstead.append(plugin.heldBy);
+        });
+    return file;
 }

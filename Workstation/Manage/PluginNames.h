@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Catalogue/EffectRecord.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 
 #include <QString>
 #include <QStringList>
@@ -18,9 +19,17 @@ struct NamedPlugins {
 };
 
 /// Finds what a name means among some records: a file's path (absolute or from the working folder, also that
-/// of the bundle around it), else the name of a plug-in or of a file, else the same whatever the case. A file
-/// stands for all that is in it, and so does the record of a whole file.
+/// of the bundle around it), else the name of a plug-in or of a file, else the same whatever the case and the
+/// blanks around it, else the name of a file without its ending. A file stands for all that is in it, and so
+/// does the record of a whole file.
 NamedPlugins pluginsNamed(const QString &name, const std::vector<const EffectRecord *> &records);
 
 /// True when the name means the file of this path.
 bool isFileNamed(const QString &name, const QString &path);
+
+/// What is remembered of the files that a name means and that the catalogue does not list.
+struct UnlistedFile {
+    QString reason;          ///< "PATH: why"; empty when there is no such file
+    QStringList usedInstead; ///< the files that list what is in it: it is a copy
+};
+UnlistedFile unlistedFileNamed(const QString &name, const ProbeMemory &memory);
