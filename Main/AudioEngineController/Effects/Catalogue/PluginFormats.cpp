@@ -30,7 +30,7 @@ const std::vector<PluginFormatInfo> &pluginFormats()
 {
     static const std::vector<PluginFormatInfo> formats{
         {PluginFormat::Vst3, "vst3", "VST 3", PluginPrefix::kVst3, QStringLiteral(".vst3"),
-         &vst3CatalogueFormat(), "vst3", "VST3_PATH"},
+         &vst3CatalogueFormat(), "vst3", "VST3_PATH", true},
         {PluginFormat::Vst2, "vst2", "VST 2", PluginPrefix::kVst2, PluginLibrary::fileEnding(),
          &vstCatalogueFormat(), nullptr, "VST_PATH LXVST_PATH"},
         {PluginFormat::Clap, "clap", "CLAP", PluginPrefix::kClap, QStringLiteral(".clap"),
@@ -56,10 +56,24 @@ const PluginFormatInfo *formatOfKey(const QString &key)
 
 QString bundleOf(const QString &path)
 {
-    static const QString ending = formatInfo(PluginFormat::Vst3).moduleEnding;
-    static const QString boundary = ending + QLatin1String(kBundleContents) + QLatin1Char('/');
-    const int place = path.lastIndexOf(boundary, -1, Qt::CaseInsensitive);
-    return place < 0 ? QString() : path.left(place + ending.size());
+    int end = 0;
+    for (const PluginFormatInfo &info : pluginFormats()) {
+        if (!info.hasBundles)
+            continue;
+        const QString boundary = info.moduleEnding + QLatin1String(kBundleContents) + QLatin1Char('/');
+        const int place = path.lastIndexOf(boundary, -1, Qt::CaseInsensitive);
+        if (place >= 0)
+            end = std::max(end, place + info.moduleEnding.size());
+    }
+    return path.left(end);
+}
+
+bool isBelowBundle(const QString &path)
+{
+    const PluginFormatInfo *const info = find([&](const PluginFormatInfo &each) {
+        return each.hasBundles && path.contains(each.moduleEnding + QLatin1Char('/'), Qt::CaseInsensitive);
+    });
+    return info != nullptr;
 }
 
 PluginFormat formatOfPrefix(const QString &prefix)

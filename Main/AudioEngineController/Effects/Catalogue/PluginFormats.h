@@ -37,6 +37,8 @@ struct PluginFormatInfo {
     /// The name, in lower case, of the folders in which the format has its modules lie; null: it has no rule.
     const char *folderName = nullptr;
     const char *folderVariables = ""; ///< names, between blanks, of environment variables that name folders
+    /// Whether a folder of the modules' ending is a module as well: all that it holds is part of it.
+    bool hasBundles = false;
 
     bool isScanned() const { return !moduleEnding.isEmpty(); }
 };
@@ -48,10 +50,12 @@ const PluginFormatInfo &formatInfo(PluginFormat format);
 /// The format of that key; null for a key that the table does not have.
 const PluginFormatInfo *formatOfKey(const QString &key);
 
-/// The folder that holds everything in a VST 3 bundle, appended to the bundle's path.
+/// The folder that holds everything in a bundle, appended to the bundle's path.
 inline constexpr char kBundleContents[] = "/Contents";
-/// The path of the innermost VST 3 bundle that holds a file; empty when the file is not in a bundle.
+/// The path of the innermost bundle that holds a file; empty when the file is not in a bundle.
 QString bundleOf(const QString &path);
+/// Whether a file lies in a folder that has the ending of bundles, whole ones or not.
+bool isBelowBundle(const QString &path);
 
 /// The format that a prefix names; the prefix is compared whole and case-sensitively.
 PluginFormat formatOfPrefix(const QString &prefix);

@@ -77,6 +77,8 @@ public:
 
     PluginFormat format() const { return m_info.format; }
     const PluginFormatInfo &info() const { return m_info; }
+    /// The catalogue's full path.
+    QString cataloguePath() const;
     const KnownList &known() const { return m_known; }
     /// Has the known list hold what a crash marker says.
     void applyCrash(const EffectRecord &marker);
@@ -111,8 +113,7 @@ public:
     /// False for a path that a folder search finds although it is not a module of its own.
     virtual bool isModule(const QString &path) const
     {
-        // In a bundle, whole or not, lie modules of the bundle's format.
-        return !path.contains(QLatin1String(".vst3/"), Qt::CaseInsensitive);
+        return !isBelowBundle(path); // what lies there is of the bundle's format
     }
     QString moduleTime(const QString &path) const override;
     /// The folder in which a module lies: that of its bundle, if it is inside one.
@@ -131,7 +132,6 @@ protected:
 
     /// The catalogue file's content; what cannot be used is logged.
     CatalogueContents readContents();
-    QString cataloguePath() const;
     EffectList &effectList() { return m_effects; }
 
 private:

@@ -19,7 +19,8 @@ using EntryFunction = bool(PLUGIN_API *)();
 bool holdsModuleForUs(const QString &bundle)
 {
     const QDir folder(VST3ModuleFile::machineFolder(bundle, kMachine));
-    return !folder.entryList({QStringLiteral("*.vst3")}, QDir::Files).isEmpty();
+    const QString pattern = QLatin1Char('*') + formatInfo(PluginFormat::Vst3).moduleEnding;
+    return !folder.entryList({pattern}, QDir::Files).isEmpty();
 }
 
 } // namespace
