@@ -228,6 +228,41 @@ scan
 vst3 Name Path Favourite: U|a/B.vst3|0, S|c/B.vst3|1, T|c/B.vst3|0
 same
 
+= A plug-in keeps its marks whichever of several files that are asked lists it
+put a/A.vst3: class Q | #1
+put a/B.vst3: class R | #2 | class S | #3
+put x/X.vst3: class P | #4
+put x/X.vst2: name V | id 4
+put x/O.vst2: name M | id 5
+put y/O.vst2: name N | id 6
+write Plugins/x/other: x
+scan
+mark P Favourite 1, S Favourite 1, V Favourite 1, M Favourite 1, N CategoryMask 4
+new a/A.vst3: class Q | #1 | class P | #4
+new a/B.vst3: class R | #2
+put a/A.vst2: name V | id 4
+put a/K.vst3: fault module-entry kill
+put z/C.vst3: class S | #3
+move Plugins/x/X.vst3 Plugins/y/X.vst3
+move Plugins/x/X.vst2 Plugins/y/X.vst2
+remove Plugins/x/O.vst2
+put y/O.vst2: name M | id 5
+scan 2
+vst3 Name Path Favourite: K|a/K.vst3|0, P|a/A.vst3|1, Q|a/A.vst3|0, R|a/B.vst3|0, S|z/C.vst3|1
+vst2 Name Path Favourite CategoryMask: M|y/O.vst2|1|0, V|y/X.vst2|1|0
+same
+
+= A shell that moved and crashes beside one of its children keeps their marks
+put a/S.vst2: child 1 D | child 2 E
+write Plugins/a/other: x
+scan
+mark D Favourite 1, E Favourite 1
+remove Plugins/a/S.vst2
+put c/S.vst2: child 1 D | child 2 E | fault entry kill D | fault static-destructor kill
+scan 3
+vst2 Name Path Favourite Enabled: S|c/S.vst2|0|0, D|c/S.vst2|1|0, E|c/S.vst2|1|0
+same
+
 = A catalogue of a negative version keeps its categories
 put Comp.vst3:
 scan

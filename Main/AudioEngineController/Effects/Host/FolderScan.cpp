@@ -41,22 +41,45 @@ FolderScan::FolderScan(CatalogueHost &host)
 
 FolderScan::~FolderScan() = default;
 
-void FolderScan::prepare() { guard(&FolderScan::plan); }
+void FolderScan::prepare()
+{
+    if (guard([this] { plan(); }))
+        return;
+    // A catalogue that is written by a part of a plan loses what that part leaves out.
+    m_pooled.reset();
+    m_plan.reset();
+    guard([this] { m_host.refillEffects(); });
+}
 
 bool FolderScan::run()
 {
-    guard(&FolderScan::scan);
+    guard([this] { scan(); });
     return m_written;
 }
 
-void FolderScan::guard(void (FolderScan::*step)())
+/// False when the step ended early.
+bool FolderScan::guard(const std::function<void()> &step) const
 {
     try {
-        (this->*step)();
+        step();
+        return true;
     } catch (const std::exception &error) {
-        DebugLog(L"The scan ended early: %s", error.what());
+        endEarly(error.what());
     } catch (...) {
-        DebugLog(L"The scan ended early");
+        endEarly("an unknown exception");
+    }
+    return false;
+}
+
+/// What the catalogue holds stays: what came of the scan so far leaves out the rest.
+void FolderScan::endEarly(const char *why) const
+{
+    try {
+        DebugLog(L"The scan ended early: %s", why);
+        ProbeReport::instance().unwritten(m_host.cataloguePath(),
+                                          QStringLiteral("the scan ended early: ") + QString::fromUtf8(why));
+    } catch (...) {
+        return; // there is no memory to say so
     }
 }
 
@@ -263,13 +286,19 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
     return added;
 }
 
-/// What an item lists no more while another file of its name may yet come to list it: the marks would be lost
-/// with this process. Without a time stamp, which has the next scan ask the file again.
+/// What an item lists no more while another file may yet come to list it: the marks would be lost with this
+/// process. Without a time stamp, which has the next scan ask the file again.
 std::vector<EffectRecord> FolderScan::droppedOf(const ScanItem &item, const OutcomeRecords &records) const
 {
+    const auto isReplaced = [&](const EffectRecord &old) {
+        return std::any_of(records.listed.begin(), records.listed.end(), [&](const EffectRecord &listed) {
+            return m_host.known().isSameOfFile(old, listed);
+        });
+    };
     std::vector<EffectRecord> dropped;
     for (const EffectRecord *old : item.known)
-        if (!records.holds(old->id) && mayYetBeListed(*old)) {
+        if (!records.holds(old->id) &&
+            (isReplaced(*old) || old->standsForFile() ? mayYetBeListed(*old) : isAnyOpenBeside(item.path))) {
             dropped.push_back(*old);
             dropped.back().fileTime.clear();
         }
@@ -365,7 +394,7 @@ void FolderScan::collectWaiting(std::size_t from)
         if (!m_host.isListed(record->id) && settled.count(record->path) == 0)
             m_waiting.insert({record->id, ListedEffect(*record)});
     for (const EffectRecord &record : m_dropped)
-        if (!m_host.isListed(record.id) && mayYetBeListed(record))
+        if (!m_host.isListed(record.id) && isAnyOpenBeside(record.path))
             m_waiting.insert({record.id, ListedEffect(record)});
 }
 
@@ -388,6 +417,16 @@ bool FolderScan::mayYetBeListed(const EffectRecord &old) const
     return std::any_of(namesakes.begin(), namesakes.end(), [&](std::size_t index) {
         return !isSettled(index) && !isSamePath(items[index].path, old.path);
     });
+}
+
+/// Whether another file is still to be asked, or was not reached by a cancelled scan.
+bool FolderScan::isAnyOpenBeside(const QString &path) const
+{
+    const std::vector<ScanItem> &items = m_plan->items();
+    for (std::size_t index = m_done; index < items.size(); ++index)
+        if (!isSettled(index) && !isSamePath(items[index].path, path))
+            return true;
+    return false;
 }
 
 void FolderScan::finish(bool isWhole)

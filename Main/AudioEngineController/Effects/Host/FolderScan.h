@@ -8,6 +8,7 @@
 #include <QHash>
 #include <QSet>
 
+#include <functional>
 #include <memory>
 #include <set>
 
@@ -31,7 +32,8 @@ public:
     bool run();
 
 private:
-    void guard(void (FolderScan::*step)());
+    bool guard(const std::function<void()> &step) const;
+    void endEarly(const char *why) const;
     void plan();
     void scan();
     QStringList findModules() const;
@@ -48,6 +50,7 @@ private:
     static ProbeOutcome readable(const ScanItem &item, ProbeOutcome outcome);
     ProbeJob jobOf(const ScanItem &item) const;
     bool mayYetBeListed(const EffectRecord &old) const;
+    bool isAnyOpenBeside(const QString &path) const;
     void finish(bool isWhole);
 
     bool keepOutcome(const ScanItem &item, const ProbeOutcome &outcome);

@@ -54,6 +54,13 @@ const EffectRecord *findIn(const KnownList::Records &records,
     return found == records.end() ? nullptr : *found;
 }
 
+/// True for a sub-plug-in of which nothing but its crash is known.
+bool isFromMarker(const EffectRecord *record)
+{
+    return record->subId != 0 && !record->enabled && !record->working &&
+           (record->id == record->subName || record->id.startsWith(record->path));
+}
+
 bool hasMarks(const EffectRecord &record)
 {
     return record.favourite || record.category != 0 || record.isSwitchedOff();
@@ -107,9 +114,14 @@ void ScanPlan::decide(const QStringList &modules)
         collectOrphans();
     }
     std::stable_partition(m_items.begin(), m_items.end(),
-                          [](const ScanItem &item) { return !item.known.empty(); });
+                          [](const ScanItem &item) { return !item.known.empty() || !item.moved.empty(); });
     std::stable_partition(m_items.begin(), m_items.end(),
                           [this](const ScanItem &item) { return m_host.isSuspect(item.path); });
+    for (const ScanItem &item : m_items)
+        for (const KnownList::Records &records : {item.known, item.moved})
+            for (const EffectRecord *record : records)
+                if (!record->standsForFile() && !m_asked.contains(record->id))
+                    m_asked.insert(record->id, record);
 }
 
 void ScanPlan::decideModule(const QString &path)
@@ -328,16 +340,20 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
 {
     const auto isOnlyCrashed = [this](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
-        return known.size() == 1 && known.front()->isCrashedFile();
+        return !known.empty() && known.front()->isCrashedFile() &&
+               std::all_of(known.begin() + 1, known.end(), isFromMarker);
     };
     const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);
     if (crashed == namesakes.end())
         return;
-    const EffectRecord &file = *m_host.known().recordsOfPath(*crashed).front();
+    const KnownList::Records present = m_host.known().recordsOfPath(*crashed);
+    const EffectRecord &file = *present.front();
     for (const EffectRecord *record : gone.records) {
-        if (m_host.known().isSameOfFile(*record, file)) {
-            if (!hasMarks(file))
-                all.marks.try_emplace(file.id, *record).first->second.enabled = true; // it stays disabled
+        const EffectRecord *same = findIn(
+            present, [&](const EffectRecord &each) { return m_host.known().isSameOfFile(*record, each); });
+        if (same) {
+            if (!hasMarks(*same))
+                all.marks.try_emplace(same->id, *record).first->second.enabled = true; // it stays disabled
             continue;
         }
         if (record->standsForFile())
@@ -441,18 +457,30 @@ const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRe
     const auto hasId = [&](const EffectRecord &old) { return old.id == probed.id; };
     const auto isSamePlugin = [&](const EffectRecord &old) { return hasId(old) && !old.standsForFile(); };
     const EffectRecord *own = findIn(item.known, isSame);
-    if (own && (own->working || hasId(*own) || hasMarks(*own)))
+    if (own && hasId(*own))
         return own;
-    // Also of a file that is there: its copy comes to list what it does not list any more.
+    // Also of a file that is there: its copy comes to list what it does not list any more. Before what had
+    // the place: a file may have been moved over another.
     if (const EffectRecord *same = m_host.known().pluginOfFileName(item.path, probed.id))
         return same;
     if (const EffectRecord *same = findIn(m_away, isSamePlugin))
+        return same;
+    if (own && (own->working || hasMarks(*own)))
+        return own;
+    if (const EffectRecord *same = askedElsewhere(probed))
         return same;
     const EffectRecord *child = missingChild(item, probed);
     if (child || own || !isOnly)
         return child ? child : own;
     const EffectRecord *lone = loneFileRecord(item.known);
     return lone ? lone : loneFileRecord(item.moved);
+}
+
+/// The same plug-in of another file that is asked as well, whichever of the two holds it from now on.
+const EffectRecord *ScanPlan::askedElsewhere(const EffectRecord &probed) const
+{
+    const EffectRecord *same = m_asked.value(probed.id);
+    return same && same->id == probed.id ? same : nullptr; // a crash may have taken it the identifier since
 }
 
 /// The sub-plug-in of a missing namesake that crashed, and so lost its identifier.

@@ -45,7 +45,8 @@ public:
     };
     /// The same, when the known list holds how the probes ended.
     MovedToCrashed movedToCrashed() const;
-    /// What is to be probed: known files first, so that of two files with one identifier the known one wins.
+    /// What is to be probed: known files first, also those that moved, so that of two files with one
+    /// identifier the known one wins.
     const std::vector<ScanItem> &items() const { return m_items; }
     /// Files that the user wants never loaded.
     const QStringList &ignored() const { return m_ignored; }
@@ -109,6 +110,7 @@ private:
     bool isUnchangedCopy(const ScanItem &item) const;
     void leaveOutCopies();
     void askCopiesOfUnsettled();
+    const EffectRecord *askedElsewhere(const EffectRecord &probed) const;
     const EffectRecord *missingChild(const ScanItem &item, const EffectRecord &probed) const;
     void keep(const KnownList::Records &records);
 
@@ -123,6 +125,7 @@ private:
     QSet<QString> m_keptPaths;                   ///< by `pathKey`
     QSet<QPair<QString, QString>> m_keptPlugins; ///< path and identifier of those that work
     std::vector<ScanItem> m_items;
+    QHash<QString, const EffectRecord *> m_asked; ///< what is known of these, by identifier
     std::vector<KnownFile> m_gone;
     std::vector<SettledFile> m_settled;
     KnownList::Records m_away;
