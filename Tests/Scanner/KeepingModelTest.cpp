@@ -29,7 +29,7 @@ constexpr int kBlocks = 5; ///< of each format
 constexpr char kMemoryFolder[] = "/dev/shm";
 
 enum class Way { Lists, Fails, HalfWritten, Kills };
-enum class Ending { Whole, Cancelled, Terminated, Killed };
+enum class Ending { Whole, Cancelled, Terminated, Killed, OutOfMemory };
 using Numbers = std::set<int>;                ///< of plug-ins
 using Mark = std::tuple<quint32, bool, bool>; ///< category, favourite, switched off
 
@@ -92,6 +92,18 @@ public:
     // What the hosts ask.
     QString folder() const { return m_folder.effects(); }
     QString plugins() const { return m_folder.plugins(); }
+    void allocate()
+    {
+        if (m_ending != Ending::OutOfMemory || --m_countdown != 0)
+            return;
+        history << "    out of memory";
+        doubtDropped();
+        for (const auto &entry : m_files) // the next scan takes those that crashed for old killers
+            if (m_culprits.count(entry.first))
+                m_unsure.insert(entry.second.kept.begin(), entry.second.kept.end());
+        m_hasFailed = true;
+        throw std::bad_alloc();
+    }
     QString stampOf(const QString &path) const
     {
         return m_files.count(path) ? QString("version %1").arg(m_files.at(path).version) : QString();
@@ -199,7 +211,8 @@ private:
     /// A moment of a probe: the process ends here when the plug-in kills it, or somebody else.
     void reach(const QString &culprit, int number, bool kills)
     {
-        const bool isInterrupted = m_ending != Ending::Whole && --m_countdown == 0;
+        const bool isInterrupted =
+            m_ending != Ending::Whole && m_ending != Ending::OutOfMemory && --m_countdown == 0;
         if (!kills && !isInterrupted)
             return;
         doubtDropped();
@@ -233,7 +246,7 @@ private:
     /// False when the scan was interrupted and is left so.
     bool scan()
     {
-        m_ending = pick(2) == 0 ? Ending::Whole : static_cast<Ending>(pick(4));
+        m_ending = pick(2) == 0 ? Ending::Whole : static_cast<Ending>(pick(5));
         m_countdown = 1 + pick(5);
         history << QString("  scan, ending %1 after %2").arg(int(m_ending)).arg(m_countdown);
         for (int run = 0; run < 30; ++run) {
@@ -566,7 +579,7 @@ private:
         std::set<QString> awake;
         const std::vector<EffectRecord> records = catalogue();
         for (const EffectRecord &record : records)
-            if (!record.isSwitchedOff() || record.subId != 0)
+            if (!record.isSwitchedOff() || record.subId != 0 || record.fileTime.isEmpty())
                 awake.insert(record.path);
         for (const EffectRecord &record : records) {
             const auto file = m_files.find(record.path);
@@ -595,6 +608,7 @@ private:
     AudioPluginHost *m_host = nullptr;      ///< that scans
     std::map<QString, QByteArray> m_frozen; ///< the Effects folder when the process ended
     bool m_hasEnded = false;
+    bool m_hasFailed = false; ///< for want of memory
 };
 
 struct WorldProbe final : IPluginProbe {
@@ -616,14 +630,23 @@ struct WorldHost final : Host {
         this->setCatalogueFolder(world.folder());
     }
     QStringList folders() const override { return {world.plugins()}; }
-    QString moduleTime(const QString &path) const override { return world.stampOf(path); }
+    bool AddEffect(const EffectRecord &record) override
+    {
+        world.allocate();
+        return Host::AddEffect(record);
+    }
+    QString moduleTime(const QString &path) const override
+    {
+        world.allocate();
+        return world.stampOf(path);
+    }
     std::unique_ptr<IPluginProbe> makeProbe() const override { return std::make_unique<WorldProbe>(world); }
     World &world;
 };
 
 bool World::runOnce()
 {
-    m_hasEnded = false;
+    m_hasEnded = m_hasFailed = false;
     m_frozen.clear();
     std::unique_ptr<AudioPluginHost> host = std::make_unique<WorldHost<VST3Host>>(*this);
     if (isVst2())
@@ -638,7 +661,7 @@ bool World::runOnce()
     }
     host->ReadCatalogue();
     host->Scan(true, true);
-    const bool isWhole = !m_hasEnded && !host->isCancelled();
+    const bool isWhole = !m_hasEnded && !m_hasFailed && !host->isCancelled();
     if (m_hasEnded) {
         for (const QFileInfo &file : QDir(folder()).entryInfoList(QDir::Files))
             QFile::remove(file.filePath());

@@ -128,6 +128,29 @@ TEST_F(Workers, LeaveWithTheirScannerAndBlameNobody)
     }
 }
 
+TEST_F(Workers, LoseNoMarksOfWhatTwoListWhileAnotherHangs)
+{
+    const QByteArray same = "class P\nid 00000000000000000000000000000001\n";
+    put("A.vst3");
+    put("B.vst3", same);
+    scan();
+    mark("P", "Favourite", "1");
+    dateLater(put("A.vst3", "fault initialize hang\n"));
+    dateLater(put("B.vst3", same));
+    put("C.vst3", same + "delay initialize 200\n");
+    put("D.vst3", "delay initialize 800\n"); // when it is on disk, so is what came before
+    ScannerRun scanner(scannerProgram(), m_folder);
+    for (const auto &[name, value] : kPool)
+        scanner.setEnvironment(name, value);
+    scanner.setEnvironment("FXPROBE_JOBS", "4"); // all at once
+    ASSERT_TRUE(scanner.start() &&
+                scanner.waitUntil([this] { return m_folder.catalogue().contains("D.vst3"); }));
+    killAndWatch(scanner);
+    put("A.vst3");
+    EXPECT_TRUE(scanOnce(kPool).succeeded());
+    EXPECT_EQ(sortedRecords("Name Favourite"), QStringList({"A|0", "D|0", "P|1"}));
+}
+
 TEST_F(Workers, LeaveWithTheirScannerWhateverTheirPluginsDo)
 {
     const QByteArray script =

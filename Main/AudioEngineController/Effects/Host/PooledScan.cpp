@@ -30,6 +30,18 @@ public:
         , m_states(m_items.size())
         , m_probe(scan.m_host.makeProbe())
         , m_pool(scan.m_host.probePool())
+    {}
+    ~PooledScan() override
+    {
+        m_pool->withdraw(*this);
+        for (const std::size_t item : m_verdicts)
+            m_states[item].marker.leave(); // nothing else holds it
+    }
+    PooledScan(const PooledScan &) = delete;
+    PooledScan &operator=(const PooledScan &) = delete;
+
+    /// Hands the jobs to the pool.
+    void begin()
     {
         std::vector<PoolJob> jobs;
         for (std::size_t item = 0; item < m_items.size(); ++item) {
@@ -37,15 +49,13 @@ public:
             // culprit.
             m_states[item].isAlone = m_scan.m_host.isSuspect(m_items[item].path);
             m_places.emplace(m_items[item].path, item);
+            for (const EffectRecord *moved : m_items[item].moved)
+                m_places.emplace(moved->path, item);
             jobs.push_back({m_scan.jobOf(m_items[item]), isAlone(item), expectedMs(item)});
         }
         m_pool->add(std::move(jobs), *this);
     }
-    ~PooledScan() override { m_pool->withdraw(*this); }
-    PooledScan(const PooledScan &) = delete;
-    PooledScan &operator=(const PooledScan &) = delete;
-
-    /// False when the scan was cancelled.
+    /// False when not all were asked: the scan was cancelled.
     bool run();
 
     std::optional<ProbeOutcome> look(std::size_t item) override
@@ -94,20 +104,20 @@ private:
     void showProgress();
     bool isAlone(std::size_t item) const { return m_states[item].isAlone; }
     void holdBack(std::size_t item);
-    bool isOfOpenItem(const QString &id, std::size_t item) const;
+    bool isOfOtherItem(const QString &id, std::size_t item) const;
     void keep(std::size_t index);
     void keepInOrder();
     void keepAhead();
     void probeRest();
     void writeInterim();
-    bool settleVerdicts();
+    void settleVerdicts();
 
     FolderScan &m_scan;
     const std::vector<ScanItem> &m_items;
     std::vector<State> m_states;
     const std::unique_ptr<IPluginProbe> m_probe; ///< looks at files; workers ask plug-ins
     const std::shared_ptr<ProbePool> m_pool;
-    std::map<QString, std::size_t, PathLess> m_places; ///< items by their paths
+    std::map<QString, std::size_t, PathLess> m_places; ///< items by their paths, also those that they had
     QElapsedTimer m_sinceWrite;
     bool m_owesWrite = false;            ///< something came since
     std::vector<std::size_t> m_verdicts; ///< items whose markers stay until a catalogue on disk blames them
@@ -118,12 +128,11 @@ bool FolderScan::PooledScan::run()
     showProgress();
     if (!m_pool->run(*this))
         probeRest();
-    const bool isWhole = !m_scan.isCancelled();
+    const bool isWhole = !m_scan.isCancelled() && m_scan.m_done == m_items.size();
     if (!isWhole)
         keepAhead();
-    if (!m_verdicts.empty() && !settleVerdicts())
-        for (const std::size_t item : m_verdicts)
-            m_states[item].marker.leave(); // nothing else holds it
+    if (!m_verdicts.empty())
+        settleVerdicts();
     return isWhole;
 }
 
@@ -249,13 +258,13 @@ void FolderScan::PooledScan::jobEnds(std::size_t item, int worker, const ProbeOu
 }
 
 /// Has interim writes carry what came of an item before those ahead of it have ended; unless whose marks it
-/// gets is not settled, or it lists what is known of one of these, whose marks would be lost with this
+/// gets is not settled, or another item waits with what it lists, whose marks would be lost with this
 /// process.
 void FolderScan::PooledScan::holdBack(std::size_t item)
 {
     State &state = m_states[item];
     OutcomeRecords records = recordsOfOutcome(m_scan.m_host, *m_scan.m_plan, m_items[item], *state.outcome);
-    const auto isOthers = [&](const EffectRecord &record) { return isOfOpenItem(record.id, item); };
+    const auto isOthers = [&](const EffectRecord &record) { return isOfOtherItem(record.id, item); };
     if (!records.likelyMarks.empty() || std::any_of(records.listed.begin(), records.listed.end(), isOthers))
         return;
     state.isHeldBack = true;
@@ -267,14 +276,13 @@ void FolderScan::PooledScan::holdBack(std::size_t item)
         m_scan.insertFirst(record);
 }
 
-/// Whether an identifier is known of another item that has not ended.
-bool FolderScan::PooledScan::isOfOpenItem(const QString &id, std::size_t item) const
+/// Whether another item waits with an identifier: it is known of it, or came of it.
+bool FolderScan::PooledScan::isOfOtherItem(const QString &id, std::size_t item) const
 {
     const auto [first, last] = m_scan.m_waiting.equal_range(id);
     return std::any_of(first, last, [&](const auto &waiting) {
         const auto other = m_places.find(waiting.second.record.path);
-        return other != m_places.end() && other->second != item && other->second >= m_scan.m_done &&
-               !m_states[other->second].outcome;
+        return other != m_places.end() && other->second != item;
     });
 }
 
@@ -323,18 +331,25 @@ void FolderScan::PooledScan::writeInterim()
 }
 
 /// Writes what there is. The markers go whose verdicts are on disk then.
-bool FolderScan::PooledScan::settleVerdicts()
+void FolderScan::PooledScan::settleVerdicts()
 {
     if (!m_scan.writeInterim())
-        return false;
-    for (const std::size_t item : m_verdicts) {
-        m_states[item].marker.remove();
-        m_scan.m_host.clearSuspect(m_items[item].path);
-    }
-    m_verdicts.clear();
-    return true;
+        return;
+    const auto isOnDisk = [this](std::size_t item) {
+        return !m_states[item].outcome || m_states[item].isHeldBack;
+    };
+    for (const std::size_t item : m_verdicts)
+        if (isOnDisk(item)) {
+            m_states[item].marker.remove();
+            m_scan.m_host.clearSuspect(m_items[item].path);
+        }
+    m_verdicts.erase(std::remove_if(m_verdicts.begin(), m_verdicts.end(), isOnDisk), m_verdicts.end());
 }
 
-void FolderScan::makePool() { m_pooled = std::make_shared<PooledScan>(*this); }
+void FolderScan::makePool()
+{
+    m_pooled = std::make_shared<PooledScan>(*this);
+    m_pooled->begin();
+}
 
 bool FolderScan::probeInPool() { return m_pooled->run(); }

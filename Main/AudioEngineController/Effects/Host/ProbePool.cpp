@@ -49,8 +49,8 @@ void ProbePool::add(std::vector<PoolJob> jobs, IPoolListener &listener)
 {
     m_listeners.push_back(&listener);
     for (std::size_t place = 0; place < jobs.size(); ++place) {
-        m_waiting.push_back({m_jobs.size()});
         m_jobs.push_back({std::move(jobs[place]), &listener, place});
+        m_waiting.push_back({m_jobs.size() - 1});
     }
     // A slow one that begins last is at work alone in the end. One worker keeps to the order of the plans.
     const bool isBySlowness = m_settings.workers > 1;

@@ -176,21 +176,26 @@ ProbeMemory::ProbeMemory(const QString &effectsFolder)
 
 std::map<ProbeMemory::Key, ProbeMemory::Entry> &ProbeMemory::entries() const
 {
-    if (m_entries)
-        return *m_entries;
-    m_entries.emplace();
+    if (!m_entries)
+        m_entries = readEntries(); // all, or none: what is written later leaves nothing out
+    return *m_entries;
+}
+
+std::map<ProbeMemory::Key, ProbeMemory::Entry> ProbeMemory::readEntries() const
+{
+    std::map<Key, Entry> entries;
     QByteArray content;
     if (!readWholeFile(m_file, content))
-        return *m_entries;
+        return entries;
     const QJsonObject root = QJsonDocument::fromJson(content).object();
     if (root.value(word(kVersion)).toInt() != kThisVersion)
-        return *m_entries;
+        return entries;
     for (const QJsonValue value : root.value(word(kProbes)).toArray()) {
         const RememberedProbe probe = probeOf(value.toObject());
         if (probe.format != PluginFormat::Unknown && !probe.path.isEmpty())
-            (*m_entries)[{probe.format, pathKey(probe.path)}] = {probe, {}};
+            entries[{probe.format, pathKey(probe.path)}] = {probe, {}};
     }
-    return *m_entries;
+    return entries;
 }
 
 const RememberedProbe *ProbeMemory::find(PluginFormat format, const QString &path) const

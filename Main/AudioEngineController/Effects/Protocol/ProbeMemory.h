@@ -75,6 +75,7 @@ private:
         QByteArray text; ///< as it stands in the file; rendered once
     };
     std::map<Key, Entry> &entries() const;
+    std::map<Key, Entry> readEntries() const;
 
     QString m_file;
     mutable std::optional<std::map<Key, Entry>> m_entries; ///< nothing before the file was read
