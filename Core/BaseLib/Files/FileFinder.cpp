@@ -285,6 +285,8 @@ std::vector<FileFinder::Place> FileFinder::settleStarts(const QStringList &folde
         const QString path = QDir::cleanPath(QFileInfo(folder).absoluteFilePath());
         if (m_area.isExcluded(path) || isPassedOver(path))
             continue;
+        if (!m_area.mayHoldSome(path) && !answers(path)) // nobody waits long for a folder that was not named
+            continue;
         const Place start{path, realPath(path).value_or(path)};
         if (!mayHoldSome(start, path)) { // a link in the area may lead there
             m_realOthers.append(start.real);
