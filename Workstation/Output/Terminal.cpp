@@ -1,5 +1,6 @@
 #include "Workstation/Output/Terminal.h"
 
+#include "Core/BaseLib/Log/HarmlessText.h"
 #include "Workstation/Output/TerminalStream.h"
 
 #include <QStringList>
@@ -30,9 +31,6 @@ struct Range {
 constexpr Range kWide[] = {{0x1100, 0x115F},   {0x2E80, 0x303E},   {0x3041, 0xA4CF},  {0xAC00, 0xD7A3},
                            {0xF900, 0xFAFF},   {0xFE30, 0xFE6F},   {0xFF00, 0xFF60},  {0xFFE0, 0xFFE6},
                            {0x1F300, 0x1F64F}, {0x1F680, 0x1F9FF}, {0x20000, 0x3FFFD}};
-/// What sets the direction of text: Unicode Standard Annex 9, "Directional formatting characters".
-constexpr Range kDirections[] = {{0x200E, 0x200F}, {0x202A, 0x202E}, {0x2066, 0x2069}, {0x061C, 0x061C}};
-
 template <std::size_t Size>
 bool isIn(const Range (&ranges)[Size], uint character)
 {
@@ -57,10 +55,12 @@ bool Terminal::printError(const QString &text) { return write(stderr, text); }
 
 void Terminal::complain(const QString &text)
 {
-    QStringList lines = text.split(QLatin1Char('\n'));
+    // Of the lines of a list all but the first are indented: a text in it cannot look like a message of ours.
+    const QLatin1String indented("\n  ");
+    QStringList lines = text.split(indented);
     for (QString &line : lines)
         line = harmless(line);
-    printError(QStringLiteral("fxscan: %1\n").arg(lines.join(QLatin1Char('\n'))));
+    printError(QStringLiteral("fxscan: %1\n").arg(lines.join(indented)));
 }
 
 bool Terminal::outputIsTerminal() { return TerminalStream::isTerminal(s_result); }
@@ -80,18 +80,7 @@ void Terminal::keepOutputForResult()
         s_result = stream;
 }
 
-QString Terminal::harmless(const QString &text)
-{
-    QVector<uint> characters = text.toUcs4();
-    for (uint &character : characters) {
-        const QChar::Category category = QChar::category(character);
-        const bool isControl = category == QChar::Other_Control || category == QChar::Other_Surrogate ||
-                               category == QChar::Separator_Line || category == QChar::Separator_Paragraph;
-        if (isControl || isIn(kDirections, character))
-            character = '?';
-    }
-    return QString::fromUcs4(characters.constData(), characters.size());
-}
+QString Terminal::harmless(const QString &text) { return harmlessText(text); }
 
 int Terminal::width(const QString &text)
 {

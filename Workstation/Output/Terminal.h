@@ -25,8 +25,7 @@ int errorWidth();
 /// Columns of the standard output's terminal; 0 where there is none, so that lines may have any length.
 int outputWidth();
 
-/// A text that comes from a plug-in or a file, fit to be printed: what could steer a terminal, or change the
-/// direction in which the rest of the line is shown, is replaced.
+/// A text that comes from a plug-in or a file, fit to be printed: see `harmlessText`.
 QString harmless(const QString &text);
 /// Columns that a text takes on a terminal.
 int width(const QString &text);

@@ -1,6 +1,7 @@
 #include "Core/BaseLib/Log/DebugLog.h"
 
 #include "Core/BaseLib/Log/DebuggerOutput.h"
+#include "Core/BaseLib/Log/HarmlessText.h"
 #include "Core/BaseLib/Log/LogSink.h"
 
 #include <QDebug>
@@ -44,6 +45,7 @@ void deliver(const QString &message)
     }
     // So that a later sink of the printf family passes the line through unchanged.
     line.replace(QLatin1Char('%'), QLatin1Char('*'));
+    line = harmlessText(line); // a plug-in's text must neither begin a line nor steer a terminal
     if (state.sink)
         state.sink->write(state.settings.level, line);
     if (state.settings.debuggerOutput)

@@ -52,8 +52,8 @@ void findCulprits(const QString &effectsFolder, MarkerWatch &watch, ScannerRunEn
 
 void logOutput(ScannerProcess &scanner)
 {
-    if (const QString output = scanner.takeOutput(); !output.isEmpty())
-        DebugTrace(L"The scanner printed: %ls", output);
+    for (const QString &line : scanner.takeOutput().split(QLatin1Char('\n'), Qt::SkipEmptyParts))
+        DebugTrace(L"The scanner printed: %ls", line);
 }
 
 } // namespace

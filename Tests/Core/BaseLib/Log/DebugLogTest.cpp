@@ -41,12 +41,12 @@ TEST(DebugLog, SwitchesDecideWhereALineGoes)
         const auto direct = std::make_shared<CapturedLog::Sink>();
         setDirectLogSink(direct);
         debugLogSettings().directOutput = isDirect;
-        DebugLog(L"%ls", QString("100% Fuzz"));
+        DebugLog(L"%ls", QString("100% Fuzz\n\x1b[2J"));
         DebugLog(L"%ls", ThrowingText());
         debugLogSettings().off = true;
         DebugLog(L"not logged");
-        EXPECT_EQ(log.lines(), isDirect ? QStringList() : QStringList("100* Fuzz"));
-        EXPECT_EQ(direct->lines, isDirect ? QStringList("100% Fuzz") : QStringList());
+        EXPECT_EQ(log.lines(), isDirect ? QStringList() : QStringList("100* Fuzz??[2J"));
+        EXPECT_EQ(direct->lines, isDirect ? QStringList("100% Fuzz\n\x1b[2J") : QStringList());
     }
 }
 
