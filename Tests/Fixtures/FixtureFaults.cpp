@@ -87,6 +87,10 @@ bool changeFolder(const std::string &path)
     return !error;
 }
 
+struct Textless : std::exception {
+    const char *what() const noexcept override { return nullptr; }
+};
+
 } // namespace
 
 bool commitFault(const std::string &kind)
@@ -100,6 +104,7 @@ bool commitFault(const std::string &kind)
         {"illegal", [] { __builtin_trap(); }},
         {"stack-overflow", [] { consumeStack(0); }},
         {"throw-std", [] { throw std::runtime_error("thrown by the fixture"); }},
+        {"throw-null", [] { throw Textless(); }},
         {"throw-int", [] { throw 42; }},
         {"terminate", [] { std::terminate(); }},
         {"kill", killProcess},

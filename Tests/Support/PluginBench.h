@@ -80,6 +80,23 @@ protected:
         const QStringList entered = QStringList("load") + m_observer.heard.filter(stage);
         EXPECT_EQ(NotingObserver::nameOf(outcome.stage), entered.last());
     }
+    /// The outcome must be what a row says: of the file in row 0 the observer hears row 2; row 3 has the
+    /// plug-ins listed, or what becomes of the catalogue, and the reason.
+    void expectOutcome(const ProbeOutcome &outcome, const QStringList &row, const char *ending) const
+    {
+        EXPECT_EQ(m_observer.heard.join(' '), row[2]);
+        QStringList listed;
+        for (const EffectRecord &record : outcome.records) {
+            listed << record.name;
+            EXPECT_EQ(record.path + record.fileTime, m_folder.plugins() + '/' + row[0] + ending + "its time");
+        }
+        EXPECT_EQ(outcome.status, listed.isEmpty() ? ProbeStatus::Failed : ProbeStatus::Listed);
+        if (listed.isEmpty())
+            listed << (outcome.ifFailed == ProbeOutcome::IfFailed::Record ? "record" : "keep");
+        expectStage(outcome);
+        listed << (outcome.leftThreads ? "left threads: " : ": ") + outcome.reason;
+        EXPECT_EQ(listed.join(' ').replace(" : ", ": ").trimmed(), row[3]);
+    }
 
     TestFolder m_folder;
     const CapturedLog m_log;

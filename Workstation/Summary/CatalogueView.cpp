@@ -32,20 +32,15 @@ QStringList namesOfSet(quint32 category)
     return names;
 }
 
-/// The first text of a record that is not well-formed XML as it stands.
-QString badText(const EffectRecord &record)
+/// The first element of a record that is not well-formed XML as it is written.
+QString badElement(const CatalogueFormat &format, const EffectRecord &record)
 {
-    const struct {
-        const char *what;
-        const QString &text;
-    } texts[] = {
-        {"name", record.name},           {"vendor", record.vendor}, {"sub-categories", record.categories},
-        {"sub-plug-in", record.subName}, {"path", record.path},     {"identifier", record.id}};
-    for (const auto &[what, text] : texts)
+    for (const CatalogueElement &element : format.elements)
         for (const char bad : {'<', '&'})
-            if (text.contains(QLatin1Char(bad)))
+            if (element.content && element.content(record).value_or(QByteArray()).contains(bad))
                 return QStringLiteral("the %1 of '%2' (%3) holds \"%4\"")
-                    .arg(QLatin1String(what), record.name, record.path, QString(QLatin1Char(bad)));
+                    .arg(QString::fromLatin1(element.name).toLower(), record.name, record.path,
+                         QString(QLatin1Char(bad)));
     return QString();
 }
 
@@ -98,7 +93,7 @@ void readCatalogue(const PluginFormatInfo &format, const QString &effectsFolder,
             const QString now = PluginHost::instance().host(format.format).moduleTime(record.path);
             plugin.hasChanged = !now.isEmpty() && now != record.fileTime;
         }
-        if (const QString bad = badText(record); !bad.isEmpty())
+        if (const QString bad = badElement(*format.catalogue, record); !bad.isEmpty())
             view.problems.append(QStringLiteral("%1 is not well-formed XML: %2").arg(path, bad));
     }
 }

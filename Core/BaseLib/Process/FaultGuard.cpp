@@ -14,6 +14,29 @@ std::string describe(quint32 code)
     return formatText(L"SE Exception: 0x%08X", code).toStdString();
 }
 
+constexpr char kThrewOther[] = "threw something other than a standard exception";
+
+QString threw(const QString &what)
+{
+    return what.isEmpty() ? QStringLiteral("threw an exception without a text")
+                          : QLatin1String("threw: ") + what;
+}
+
+/// The text of an exception; empty where there is none, or asking for it fails.
+QString guardedWhat(const std::exception &exception)
+{
+    std::array<char, 512> text = {};
+    try {
+        callGuarded([&] {
+            if (const char *what = exception.what())
+                std::strncpy(text.data(), what, text.size() - 1);
+        });
+    } catch (...) {
+        return QString();
+    }
+    return QString::fromUtf8(text.data());
+}
+
 } // namespace
 
 QString FaultCode::name(quint32 code)
@@ -46,18 +69,15 @@ QString SEException::words() const
     return name.isEmpty() ? formatText(L"fault 0x%08X", m_code) : name;
 }
 
-QString guardedText(const std::exception &exception)
+QString guardedThrownText()
 {
-    std::array<char, 512> text = {};
     try {
-        callGuarded([&] {
-            if (const char *what = exception.what())
-                std::strncpy(text.data(), what, text.size() - 1);
-        });
+        throw;
+    } catch (const std::exception &exception) {
+        return threw(guardedWhat(exception));
     } catch (...) {
-        return QString();
+        return QLatin1String(kThrewOther);
     }
-    return QString::fromUtf8(text.data());
 }
 
 QString thrownText()
@@ -65,8 +85,9 @@ QString thrownText()
     try {
         throw;
     } catch (const std::exception &error) {
-        return QLatin1String("it threw: ") + QString::fromUtf8(error.what());
+        const char *const what = error.what();
+        return QLatin1String("it ") + threw(what ? QString::fromUtf8(what) : QString());
     } catch (...) {
-        return QStringLiteral("it threw something other than a standard exception");
+        return QLatin1String("it ") + QLatin1String(kThrewOther);
     }
 }

@@ -91,10 +91,11 @@ auto callTranslated(Function &&function) -> std::invoke_result_t<Function &>
     return FaultGuardDetail::call(FaultGuardDetail::Watch::ForeignExceptions, function);
 }
 
-/// The text of an exception that foreign code threw. Its `what` is foreign code too; empty when that fails.
-QString guardedText(const std::exception &exception);
+/// The exception being handled, which foreign code threw, in words: "threw: …". Its `what` is foreign code,
+/// too.
+QString guardedThrownText();
 
-/// The exception being handled, in words.
+/// The same as a sentence about what threw, without a guard.
 QString thrownText();
 
 /// Makes a call into a plug-in. What it throws, in words; empty when it threw nothing.

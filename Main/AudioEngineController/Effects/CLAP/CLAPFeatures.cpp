@@ -49,11 +49,11 @@ QStringList clapFeatures(const char *const *features)
     QStringList texts;
     std::size_t length = 0; // with a bar behind each
     for (int index = 0; features && index < kMaxFeatures && features[index]; ++index) {
-        const QString text = clapText(features[index]);
+        QString text = clapText(features[index]);
         length += static_cast<std::size_t>(text.size()) + 1;
         if (length > kMaxClapText + 1)
             break;
-        texts.append(text);
+        texts.append(text.replace(QLatin1Char('|'), QLatin1Char('/'))); // bars come between them
     }
     return texts;
 }

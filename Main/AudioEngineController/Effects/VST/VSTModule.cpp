@@ -69,11 +69,8 @@ VSTLoadResult VSTModule::enter(VSTHostCallbackFunction callback, IVSTEffectOwner
         DebugLog(L"The VST plug-in's entry point failed: %s, %ls", fault.what(), fault.words());
         return failed(Status::EntryFailed,
                       QStringLiteral("it crashed when it was started (%1)").arg(fault.words()));
-    } catch (const std::exception &exception) {
-        return entryFailed(Status::EntryFailed, QStringLiteral("threw: ") + guardedText(exception));
     } catch (...) {
-        return entryFailed(Status::EntryFailed,
-                           QStringLiteral("threw something that is not a standard exception"));
+        return entryFailed(Status::EntryFailed, guardedThrownText());
     }
 }
 

@@ -180,10 +180,8 @@ bool VSTEffect::guard(const char *what, int number, Call &&call)
     } catch (const SEException &fault) {
         *m_faulted = true;
         DebugLog(L"VST plug-in %s %d: %s, %ls", what, number, fault.what(), fault.words());
-    } catch (const std::exception &exception) {
-        DebugLog(L"VST plug-in %s %d threw: %ls", what, number, guardedText(exception));
     } catch (...) {
-        DebugLog(L"VST plug-in %s %d threw something that is not a standard exception", what, number);
+        DebugLog(L"VST plug-in %s %d %ls", what, number, guardedThrownText());
     }
     return false;
 }

@@ -49,7 +49,7 @@ missing ~ - ~ it cannot be opened: ~ ~
 null ~ answer entry null ~ its entry point returned null ~ load start close
 wrong magic ~ magic 1 ~ its entry point returned something that is not a VST 2 effect ~ load start close
 no memory ~ answer entry no-memory ~ its entry point returned something that is not a VST 2 effect ~ load start close
-entry throws ~ fault entry throw-int ~ its entry point threw something that is not a standard exception ~ load start close
+entry throws ~ fault entry throw-null ~ its entry point threw an exception without a text ~ load start close
 entry faults ~ fault entry segv ~ it crashed when it was started (invalid memory access at 0x10 in  ~ load start close ~ faulted
 call throws ~ fault get-vendor-string throw-std ~ ~ load start ask close
 call faults ~ fault get-vendor-string segv ~ ~ load start ask close ~ faulted

@@ -47,18 +47,7 @@ leaves a thread ~ class A / effect initialize thread ~ load start ask A close ~ 
         const bool isPlugin = row[0] != "no export";
         const ProbeOutcome outcome =
             probe(row[0], scriptIn(row[1]), isPlugin ? VST3Fixture::Scripted : VST3Fixture::NoEntry);
-        EXPECT_EQ(m_observer.heard.join(' '), row[2]);
-        QStringList listed;
-        for (const EffectRecord &record : outcome.records) {
-            listed << record.name;
-            EXPECT_EQ(record.path + record.fileTime, m_folder.plugins() + '/' + row[0] + ".vst3its time");
-        }
-        EXPECT_EQ(outcome.status, listed.isEmpty() ? ProbeStatus::Failed : ProbeStatus::Listed);
-        if (listed.isEmpty())
-            listed << (outcome.ifFailed == ProbeOutcome::IfFailed::Record ? "record" : "keep");
-        expectStage(outcome);
-        listed << (outcome.leftThreads ? "left threads: " : ": ") + outcome.reason;
-        EXPECT_EQ(listed.join(' ').replace(" : ", ": ").trimmed(), row[3]);
+        expectOutcome(outcome, row, ".vst3");
     }
 }
 
