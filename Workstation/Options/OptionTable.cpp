@@ -141,8 +141,9 @@ const std::vector<OptionRow> &optionTable()
         {"format", "format", ChoiceTarget{{"table", "json", "jsonl", "csv", "html"}, setFormat},
          "Print the result as table (the default), json, jsonl, csv or html.",
          "jsonl prints one JSON object a line while the scan goes on: what each probe came to, and the "
-         "result "
-         "as the last one."},
+         "result as the last one. In csv a text that a spreadsheet would take for a formula, as it begins "
+         "with "
+         "=, +, - or @, has an apostrophe in front."},
         {"html", "file", &ScanOptions::html,
          "Also write the result to a file as a page for browsers, with a picture of the scan.",
          "The page needs no network and no other file."},

@@ -1,6 +1,7 @@
 #include "Workstation/Output/JsonLines.h"
 #include "Workstation/Output/SummaryOutput.h"
 
+#include <QByteArrayList>
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <QJsonObject>
@@ -103,22 +104,27 @@ QJsonObject scanObject(const ScanSummary &summary)
             {QStringLiteral("slowest"), slowest}};
 }
 
-QByteArray csvField(const QString &text)
+/// A spreadsheet takes a field for a formula that begins with one of these, also a quoted one, and carries it
+/// out: OWASP, "CSV Injection".
+bool isFormula(const QString &text)
 {
-    QByteArray field = text.toUtf8();
+    return !text.isEmpty() && QStringLiteral("=+-@\t\r\n＝＋－＠").contains(text.front());
+}
+
+QByteArray csvText(const QString &text)
+{
+    const QByteArray field = ((isFormula(text) ? QStringLiteral("'") : QString()) + text).toUtf8();
     const bool isPlain = std::none_of(field.begin(), field.end(), [](char each) {
         return each == '"' || each == ',' || each == '\n' || each == '\r';
     });
-    return isPlain ? field : '"' + field.replace("\"", "\"\"") + '"';
+    return isPlain ? field : '"' + QByteArray(field).replace("\"", "\"\"") + '"';
 }
 
-QByteArray csvLine(const QStringList &fields)
-{
-    QByteArray line;
-    for (const QString &field : fields)
-        line += (line.isNull() ? QByteArray() : QByteArray(",")) + csvField(field);
-    return line + "\r\n";
-}
+/// Nothing for what is unknown.
+QByteArray csvNumber(qint64 value) { return value < 0 ? QByteArray() : QByteArray::number(value); }
+QByteArray csvSubId(quint32 id) { return csvNumber(id == 0 ? -1 : qint64(id)); }
+
+QByteArray csvLine(const QByteArrayList &fields) { return fields.join(',') + "\r\n"; }
 
 } // namespace
 
@@ -155,21 +161,19 @@ QByteArray renderJsonLine(const ScanSummary &summary, const QString &dataFolder,
 
 QByteArray renderCsv(const ScanSummary &summary)
 {
-    const auto number = [](qint64 value) { return value < 0 ? QString() : QString::number(value); };
-    const auto subId = [&](quint32 id) { return number(id == 0 ? -1 : qint64(id)); };
-    QByteArray text = csvLine({QStringLiteral("format"), QStringLiteral("name"), QStringLiteral("vendor"),
-                               QStringLiteral("categories"), QStringLiteral("inputs"),
-                               QStringLiteral("outputs"), QStringLiteral("state"), QStringLiteral("reason"),
-                               QStringLiteral("id"), QStringLiteral("path"), QStringLiteral("subId")});
-    for (const CataloguedPlugin &plugin : summary.plugins)
-        text += csvLine({QString::fromLatin1(plugin.format->key), plugin.record.name, plugin.record.vendor,
-                         plugin.categories().join(QLatin1Char(';')), number(plugin.inputs),
-                         number(plugin.outputs), QString::fromLatin1(stateText(plugin.state())),
-                         plugin.reason, plugin.record.id, plugin.record.path, subId(plugin.record.subId)});
+    QByteArray text = csvLine({"format", "name", "vendor", "categories", "inputs", "outputs", "state",
+                               "reason", "id", "path", "subId"});
+    for (const CataloguedPlugin &plugin : summary.plugins) {
+        const EffectRecord &record = plugin.record;
+        text += csvLine({plugin.format->key, csvText(record.name), csvText(record.vendor),
+                         csvText(plugin.categories().join(QLatin1Char(';'))), csvNumber(plugin.inputs),
+                         csvNumber(plugin.outputs), stateText(plugin.state()), csvText(plugin.reason),
+                         csvText(record.id), csvText(record.path), csvSubId(record.subId)});
+    }
     for (const PluginFailure &failure : summary.failures)
         if (!failure.isCatalogued)
-            text += csvLine({QString::fromLatin1(failure.format->key), failure.name, QString(), QString(),
-                             QString(), QString(), QString::fromLatin1(stateText(failure.state)),
-                             failure.reason, QString(), failure.path, subId(failure.subId)});
+            text +=
+                csvLine({failure.format->key, csvText(failure.name), "", "", "", "", stateText(failure.state),
+                         csvText(failure.reason), "", csvText(failure.path), csvSubId(failure.subId)});
     return text;
 }

@@ -14,7 +14,8 @@ QString renderTable(const ScanSummary &summary, int width = 0);
 QByteArray renderJson(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
 /// The same as the last line of JSON lines.
 QByteArray renderJsonLine(const ScanSummary &summary, const QString &dataFolder, const QStringList &folders);
-/// The plug-ins, one a line, as comma-separated values with a line of titles (RFC 4180).
+/// The plug-ins, one a line, as comma-separated values with a line of titles (RFC 4180). A text that a
+/// spreadsheet would take for a formula has "'" in front.
 QByteArray renderCsv(const ScanSummary &summary);
 
 /// The summary as a page for browsers that needs nothing else; page/page.html is its template.

@@ -31,17 +31,19 @@ TEST(Output, NothingInATextSteersTheTerminal)
     EXPECT_EQ(Terminal::harmless("Ünï 🎹 日本"), "Ünï 🎹 日本");
 }
 
-TEST(Output, CsvFieldsAreQuotedWhereTheyMustBe)
+TEST(Output, CsvFieldsAreQuotedWhereTheyMustBeAndAreNoFormulas)
 {
     CataloguedPlugin plugin{&pluginFormats().front(), {}, {}, false, false, 2};
     plugin.record.name = "A \"B\", C";
     plugin.record.vendor = "two\nlines";
+    plugin.record.categories = "=1|Fx";
+    plugin.record.id = "-1,2";
     plugin.record.path = "/p/A.vst3";
     ScanSummary summary;
     summary.plugins.push_back(plugin);
     const QByteArray csv = renderCsv(summary);
     EXPECT_EQ(csv.mid(csv.indexOf("\r\n") + 2),
-              "vst3,\"A \"\"B\"\", C\",\"two\nlines\",,2,,ok,,,/p/A.vst3,\r\n");
+              "vst3,\"A \"\"B\"\", C\",\"two\nlines\",'=1;Fx,2,,ok,,\"'-1,2\",/p/A.vst3,\r\n");
 }
 
 TEST(Output, ColumnsThatDoNotFitAreLeftOutOrCut)
