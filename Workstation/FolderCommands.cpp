@@ -5,6 +5,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 #include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanList.h"
 #include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Options/ScanOptions.h"
@@ -165,7 +166,7 @@ bool FolderEditor::takeBack(QStringList &rule, const QString &given, const char 
     return true;
 }
 
-/// Drops the records of all plug-ins below some paths, with the user's marks.
+/// Drops what is known of all plug-ins below some paths, with the user's marks.
 int FolderEditor::drop(const QStringList &paths)
 {
     int count = 0;
@@ -174,6 +175,10 @@ int FolderEditor::drop(const QStringList &paths)
         count += dropped;
         return dropped != 0;
     });
+    ProbeMemory memory(m_effectsFolder);
+    for (const PluginFormatInfo &format : pluginFormats())
+        memory.keepOnly(format.format, [&](const QString &path) { return !isBelowAny(path, paths); });
+    check(m_effectsFolder + QLatin1String(kProbeMemoryFile), memory.write());
     return count;
 }
 

@@ -56,13 +56,13 @@ TEST_F(Looking, OnlyWhatIsAskedForIsShownInEveryForm)
         EXPECT_EQ(namesIn(result["failures"]).join(' '), row.failures) << row.words;
         options += "--list";
         const QByteArray csv = run(options + QStringList{"--format", "csv"}).standardOutput;
-        EXPECT_EQ(csv.count("\r\n") - 1, namesIn(result["plugins"]).size()) << csv.constData();
+        const int bare = namesIn(result["failures"]).count("Bare.vst3");
+        EXPECT_EQ(csv.count("\r\n") - 1, namesIn(result["plugins"]).size() + bare) << csv.constData();
     }
     EXPECT_TRUE(
-        run({"--list", "--only", "vst2"}).standardOutput.endsWith("\n2 of 5 plug-ins: 1 usable, 1 failed\n"));
+        run({"--list", "--only", "vst2"}).standardOutput.endsWith("\n2 of 6 plug-ins: 1 usable, 1 failed\n"));
     EXPECT_TRUE(run({"--quiet", "--only", "failed", m_folder.plugins()})
-                    .standardOutput.contains("\n2 of 6 plug-ins: 2 failed"))
-        << "Bare has no record";
+                    .standardOutput.contains("\n2 of 6 plug-ins: 2 failed"));
     EXPECT_EQ(run({"--list", "--only", "ok", "--strict"}).exitCode, 1)
         << "what is shown changes nothing else";
     EXPECT_EQ(run({"--list", "--only", "vendor="}).exitCode, 2);
@@ -176,4 +176,30 @@ TEST_F(Looking, WhatIsThereMoreThanOnceSaysWhatIsUsed)
         << qPrintable(shown);
     QFile::remove(m_folder.path("Plugins/b/Comp.vst3"));
     EXPECT_FALSE(run({"--list"}).standardOutput.contains("a copy of")) << "it is gone";
+}
+
+TEST_F(Looking, TextsOfPluginsStayInTheirLines)
+{
+    const QByteArray evil = "\\x1b]0;x\\x0AForged\\xC2\\x9B\\xE2\\x80\\xAE\"\n";
+    put("Evil.vst2", "name \"A" + evil + "vendor \"B" + evil);
+    put("Evil.clap", "class \"A" + evil + "id \"I" + evil + "vendor \"B" + evil + "features \"C" + evil);
+    put("Fails.clap", "class \"D" + evil + "answer init false\n");
+    const QString shell =
+        put("Shell.vst2", "child 1 \"E" + evil + "child 2 \"F" + evil + "fault entry abort 2\n");
+    const QStringList hows[] = {{},
+                                {"--in-process"},
+                                {"--list"},
+                                {"--list", "--format", "html"},
+                                {"--show", "Evil.clap", "--show", shell},
+                                {"--rescan", m_folder.path("Plugins/Fails.clap"), "--format", "jsonl"},
+                                {"--switch-off", "Evil.clap"}};
+    for (const QStringList &how : hows) {
+        const bool isScan = how.isEmpty() || how.front() == "--in-process" || how.front() == "--rescan";
+        const ScannerOutcome &outcome = run(how + (isScan ? QStringList(m_folder.plugins()) : QStringList()));
+        const QString text = QString::fromUtf8(outcome.standardOutput + outcome.standardError) +
+                             QString::fromUtf8(m_folder.read("FxProbe.log"));
+        const QString harmful = how.contains("jsonl") ? "\\x1b|\nForged" : "\\x1b|\\x{9b}|\\x{202e}|\nForged";
+        EXPECT_FALSE(text.contains(QRegularExpression(harmful))) << qPrintable(how.join(' ') + '\n' + text);
+        EXPECT_TRUE(text.contains("Forged")) << qPrintable(how.join(' '));
+    }
 }

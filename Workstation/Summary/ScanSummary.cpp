@@ -1,5 +1,9 @@
 #include "Workstation/Summary/ScanSummary.h"
 
+#include "Core/BaseLib/Files/AnswerInTime.h"
+
+#include <QFileInfo>
+
 #include <algorithm>
 #include <set>
 
@@ -117,6 +121,24 @@ void addUnrecorded(ScanSummary &summary, const ScanAccount &account)
     }
 }
 
+/// The same from what earlier scans left: files that list nothing and are asked at each scan.
+void addUnrecorded(ScanSummary &summary, const ProbeMemory &memory)
+{
+    std::set<FileIdentity> recorded;
+    for (const CataloguedPlugin &plugin : summary.plugins)
+        recorded.insert(fileOf(plugin));
+    for (const PluginFormatInfo &format : pluginFormats())
+        memory.forEach(format.format, [&](const RememberedProbe &probe) {
+            const bool hasFailed = probe.status == ProbeStatus::Failed ||
+                                   probe.status == ProbeStatus::Crashed ||
+                                   probe.status == ProbeStatus::NoAnswer;
+            if (hasFailed && recorded.count({format.format, probe.path}) == 0 && fileAnswers(probe.path) &&
+                QFileInfo::exists(probe.path))
+                summary.failures.push_back({&format, PluginState::Failed, fileNameOf(probe.path), probe.path,
+                                            0, probe.reason, false});
+        });
+}
+
 void count(ScanSummary &summary, const CatalogueView &before, const ScanAccount &account)
 {
     std::map<PluginIdentity, QString> gone;
@@ -176,6 +198,7 @@ ScanSummary summariseCatalogue(CatalogueView now, const ProbeMemory &memory)
     summary.problems = std::move(now.problems);
     fillChannels(summary.plugins, memory);
     addFailures(summary, nullptr, memory);
+    addUnrecorded(summary, memory);
     summary.duplicates = findDuplicates(summary.plugins, memory);
     return summary;
 }
