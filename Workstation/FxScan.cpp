@@ -149,7 +149,7 @@ int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &
             return failed;
     if (options.inProcess)
         ProbeReport::instance().openFromEnvironment();
-    JsonLines lines(options.format == OutputFormat::JsonLines);
+    JsonLines lines(options.format == OutputFormat::JsonLines, options.only);
     lines.begin(options.dataFolder, searched);
     ScanSession session(options, registry, qEnvironmentVariable("FXPROBE_REPORT"), lines);
     const bool isFinished = session.run();

@@ -212,6 +212,9 @@ TEST_F(FxScan, JsonLinesComeWhileTheScanGoesOn)
                                     {"Text", "no plug-in"},
                                     {"Two", "failed"}}));
     }
+    const QByteArray failed =
+        run(asked + QStringList{"--rescan-all", "--only", "failed", m_folder.plugins()}).standardOutput;
+    EXPECT_EQ(failed.count(R"("type":"probe")"), 2) << failed.constData();
 }
 
 TEST_F(FxScan, TheReasonOfAnEarlierFileIsNotThatOfItsUpdate)

@@ -51,10 +51,13 @@ void JsonLines::begin(const QString &dataFolder, const QStringList &folders)
 void JsonLines::show(ScanAccount &account)
 {
     for (const ScanNews &news : account.takeNews()) {
-        if (const auto *plan = std::get_if<PlannedFormat>(&news))
+        if (const auto *plan = std::get_if<PlannedFormat>(&news)) {
             print(lineOf(*plan));
-        else if (const PluginKey &key = std::get<PluginKey>(news);
-                 const ProbeAccount *probe = account.find(key))
+            continue;
+        }
+        const PluginKey &key = std::get<PluginKey>(news);
+        const ProbeAccount *const probe = account.find(key);
+        if (probe && m_filter.fits(key.format, probe->status))
             print(lineOf(key, *probe));
     }
 }

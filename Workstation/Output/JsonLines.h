@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Workstation/Summary/PluginFilter.h"
 #include "Workstation/Summary/ScanAccount.h"
 
 #include <QJsonObject>
@@ -12,8 +13,10 @@ public:
     /// What the member "schema" says: it grows when a member changes its meaning or goes.
     static constexpr int kSchema = 2;
 
-    explicit JsonLines(bool isAskedFor)
+    /// `only`: the words of `--only`.
+    JsonLines(bool isAskedFor, const QStringList &only)
         : m_isAskedFor(isAskedFor)
+        , m_filter(only)
     {}
 
     /// The first line: what is to be scanned.
@@ -27,5 +30,6 @@ private:
     void print(const QJsonObject &line);
 
     bool m_isAskedFor;
+    PluginFilter m_filter;
     bool m_isBroken = false;
 };

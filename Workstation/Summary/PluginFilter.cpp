@@ -15,6 +15,26 @@ QString wordOf(PluginState state)
     return QString::fromLatin1(stateText(state)).replace(QLatin1Char(' '), QLatin1Char('-'));
 }
 
+/// The state that a probe leaves a plug-in in which the user did not switch off.
+PluginState stateOf(ProbeStatus status)
+{
+    switch (status) {
+    case ProbeStatus::Listed:
+        return PluginState::Ok;
+    case ProbeStatus::Failed:
+        return PluginState::Failed;
+    case ProbeStatus::Crashed:
+    case ProbeStatus::NoAnswer:
+        return PluginState::Disabled;
+    case ProbeStatus::NoPlugin:
+        return PluginState::NoPlugin;
+    case ProbeStatus::Cancelled:
+    case ProbeStatus::Skipped:
+        return PluginState::Skipped;
+    }
+    return PluginState::Failed;
+}
+
 /// "category=Reverb", or "instrument": also what calls itself a synth, which catalogues without categories of
 /// their own hold.
 bool isOfCategory(const CataloguedPlugin &plugin, const QString &word)
@@ -74,12 +94,17 @@ bool PluginFilter::fits(const CataloguedPlugin &plugin) const
 }
 
 /// Of a file without a record only format and state are known.
-bool PluginFilter::fits(const PluginFailure &file) const
+bool PluginFilter::fits(const PluginFormatInfo &format, PluginState state) const
 {
     return fitsAll([&](Kind kind, const QString &word) {
-        return (kind == Kind::State && word == wordOf(file.state)) ||
-               (kind == Kind::Format && word == QLatin1String(file.format->key));
+        return (kind == Kind::State && word == wordOf(state)) ||
+               (kind == Kind::Format && word == QLatin1String(format.key));
     });
+}
+
+bool PluginFilter::fits(PluginFormat format, ProbeStatus status) const
+{
+    return fits(formatInfo(format), stateOf(status));
 }
 
 void PluginFilter::apply(ScanSummary &summary) const
@@ -91,5 +116,6 @@ void PluginFilter::apply(ScanSummary &summary) const
     for (const CataloguedPlugin &plugin : summary.plugins)
         if (fits(plugin))
             shown.push_back(plugin);
-    keepPlugins(summary, std::move(shown), [this](const PluginFailure &file) { return fits(file); });
+    keepPlugins(summary, std::move(shown),
+                [this](const PluginFailure &file) { return fits(*file.format, file.state); });
 }
