@@ -1,3 +1,4 @@
+#include "Core/BaseLib/Binary/LoadFailure.h"
 #include "Workstation/Options/PluginFolders.h"
 #include "Workstation/Output/FailureText.h"
 #include "Workstation/Output/SummaryOutput.h"
@@ -74,12 +75,30 @@ struct Advice {
     QString option; ///< of fxscan, with its value; empty: none helps
 };
 
+/// Why asking again alone is in vain: how the reason begins, and what helps.
+struct Remedy {
+    const char *reason;
+    const char *text;
+    bool asksAgain; ///< by the user; else the next scan does so
+};
+
+constexpr Remedy kRemedies[] = {
+    {kNeedsLibrary, "Install what it needs. Then, to ask it again:", true},
+    {kBuiltFor, "Only another build of it can help. It is asked again when its file changes.", false},
+    {kCutShort, "Copy or install it anew. The next scan looks at it again.", false},
+    {kEmptyFile, "Copy or install it anew. The next scan looks at it again.", false},
+};
+
 Advice adviceFor(const PluginFailure &failure)
 {
     // A sub-plug-in shares its path with its siblings.
     const QString name = QLatin1Char('=') + shellWord(failure.subId != 0 ? failure.name : failure.path);
     switch (failure.state) {
     case PluginState::Failed:
+        for (const Remedy &remedy : kRemedies)
+            if (failure.reason.startsWith(QLatin1String(remedy.reason)))
+                return {QLatin1String(remedy.text),
+                        remedy.asksAgain ? QStringLiteral("--retry") + name : QString()};
         return {QStringLiteral("It is asked again when its file changes. To ask it now:"),
                 QStringLiteral("--retry") + name};
     case PluginState::Disabled:

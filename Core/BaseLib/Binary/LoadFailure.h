@@ -12,6 +12,12 @@ using LibrarySearch = std::function<std::optional<QString>(const QString &name)>
 /// How every text of `whyNotLoadable` begins.
 inline constexpr char kNeedsLibrary[] = "it needs ";
 
+/// How the reasons begin that `inspectModule` gives for a file that is built for another machine or system,
+/// is not whole, or is empty.
+inline constexpr char kBuiltFor[] = "it is built for ";
+inline constexpr char kCutShort[] = "it is cut short";
+inline constexpr char kEmptyFile[] = "it is empty";
+
 /// Tells why the loader refuses a library that is built for this machine, which its own message does not say
 /// or only in part: libraries that it needs, or that those need, are not there or not for this machine. "it
 /// needs drums.dll and bass.dll, which are not installed". Empty when nothing of this kind is wrong.

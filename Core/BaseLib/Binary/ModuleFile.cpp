@@ -1,5 +1,6 @@
 #include "Core/BaseLib/Binary/ModuleFile.h"
 
+#include "Core/BaseLib/Binary/LoadFailure.h"
 #include "Core/BaseLib/Binary/PagedFile.h"
 #include "Core/BaseLib/Binary/PeFormat.h"
 
@@ -128,12 +129,12 @@ QString machineName(LibraryForm form, quint16 machine)
 QString foreignness(LibraryForm form, ByteView file)
 {
     if (form != kOwnForm)
-        return form == LibraryForm::Pe
-                   ? QStringLiteral("it is built for Windows; this machine needs one for Linux")
-                   : QStringLiteral("it is built for Linux; this machine needs one for Windows");
+        return QLatin1String(kBuiltFor) + (form == LibraryForm::Pe
+                                               ? QStringLiteral("Windows; this machine needs one for Linux")
+                                               : QStringLiteral("Linux; this machine needs one for Windows"));
     const QString name = machineName(form, machineOf(form, file));
     return name.isNull() ? name
-                         : QStringLiteral("it is built for %1; this machine needs 64-bit x86").arg(name);
+                         : QLatin1String(kBuiltFor) + name + QLatin1String("; this machine needs 64-bit x86");
 }
 
 /// Whether so few bytes are there that they may become any library's.
@@ -150,7 +151,7 @@ ModuleInspection inspectContent(ByteView file, const std::vector<QByteArray> &ex
     while (start.size() < kElfMagic.size() && static_cast<quint64>(start.size()) < file.size())
         start.append(file.item<char>(static_cast<quint64>(start.size())).value_or('\0'));
     if (start.isEmpty())
-        return {Verdict::CutShort, QStringLiteral("it is empty")};
+        return {Verdict::CutShort, QLatin1String(kEmptyFile)};
     const bool isElf = start == kElfMagic;
     const bool isPe = file.item<quint16>(0) == kDosMagic;
     std::optional<quint64> end = isElf ? elfEnd(file) : peEnd(file);
@@ -159,9 +160,10 @@ ModuleInspection inspectContent(ByteView file, const std::vector<QByteArray> &ex
     if (!end)
         return {Verdict::NoLibrary, QStringLiteral("it is not a program library")};
     if (*end > file.size())
-        return {
-            Verdict::CutShort,
-            QStringLiteral("it is cut short: %1 of at least %2 bytes are there").arg(file.size()).arg(*end)};
+        return {Verdict::CutShort, QStringLiteral("%1: %2 of at least %3 bytes are there")
+                                       .arg(QLatin1String(kCutShort))
+                                       .arg(file.size())
+                                       .arg(*end)};
     const QString foreign = foreignness(isElf ? LibraryForm::Elf : LibraryForm::Pe, file);
     if (!exports.empty() && findExports(file, exports) == ExportAnswer::NotExported)
         return {Verdict::NoExport, QStringLiteral("it does not export what was asked for")};
