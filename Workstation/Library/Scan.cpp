@@ -17,6 +17,8 @@
 
 namespace {
 
+QString absolute(const QString &path) { return QDir::cleanPath(QFileInfo(path).absoluteFilePath()); }
+
 /// Follows a scan on behalf of whoever called.
 class FollowedRun : public ScanRun {
 public:
@@ -32,6 +34,8 @@ protected:
         std::this_thread::sleep_for(kPause);
         if (!isCancelled() && m_settings.isCancelled && m_settings.isCancelled())
             cancel();
+        if (const QString path = m_settings.toSkip ? m_settings.toSkip() : QString(); !path.isEmpty())
+            registry().skipProbe(absolute(path));
     }
     void show(ScanAccount &account) override
     {
@@ -101,8 +105,6 @@ void fill(FxProbe::Catalogue &catalogue, const ScanSummary &summary)
             catalogue.plugins.push_back(describe(failure));
     catalogue.problems += summary.problems;
 }
-
-QString absolute(const QString &folder) { return QDir::cleanPath(QFileInfo(folder).absoluteFilePath()); }
 
 QString effectsFolderOf(const QString &dataFolder)
 {

@@ -27,8 +27,9 @@ struct Plugin {
     int outputs = -1;         ///< audio channels; -1: unknown
     bool isUsable = false;    ///< it works, and the user did not switch it off
     bool isFavourite = false; ///< the user's mark
-    /// "ok", "failed", "disabled" (it ended its scanner or gave no answer), "switched off" (by the user),
-    /// "folder away" (its folder is not there or is empty), or "file gone" (its folder is there, it is not)
+    /// "ok", "failed", "disabled" (it ended its scanner or gave no answer), "switched off" or "ignored" (by
+    /// the user), "folder away" (its folder is not there or is empty), "file gone" (its folder is there, it
+    /// is not), or, only in what a scan came to, "skipped" (by the user, and nothing is known of it)
     QString state;
     QString reason; ///< why it cannot be used: one phrase without a full stop; empty when it can
 };
@@ -68,6 +69,10 @@ struct ScanSettings {
     /// Asked on the scan's thread twenty times a second; true ends the scan within seconds. Nobody is blamed
     /// for a scan that was cancelled, and what was found is kept.
     std::function<bool()> isCancelled;
+    /// Asked on the scan's thread twenty times a second for the path of a file to pass over, `Progress::path`
+    /// for example; empty: none. The scan gives up on it, now or when its turn comes. It is not blamed: what
+    /// is known of it stays, and the next scan asks it again.
+    std::function<QString()> toSkip;
 };
 
 /// What the catalogue holds.

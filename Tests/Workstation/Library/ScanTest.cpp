@@ -5,6 +5,7 @@
 #include <QDir>
 #include <QElapsedTimer>
 #include <QFileInfo>
+#include <QRegularExpression>
 
 namespace {
 
@@ -97,6 +98,20 @@ TEST_F(LibraryScan, CancelBlamesNobody)
     EXPECT_TRUE(result.reason.contains("cancelled")) << qPrintable(result.reason);
     EXPECT_EQ(lines(result), QStringList("Comp ok 2-2 vst2:Comp:1000"));
     EXPECT_LT(sinceHang.elapsed(), 20000);
+}
+
+TEST_F(LibraryScan, APluginThatIsPassedOverIsNotBlamed)
+{
+    put("Comp.vst2");
+    put("Hang.vst2", "fault entry hang\n");
+    m_settings.toSkip = [this] { return m_last.name.startsWith("Hang") ? m_last.path : QString(); };
+    const FxProbe::ScanResult result = FxProbe::scan(m_settings);
+    EXPECT_TRUE(result) << qPrintable(result.reason);
+    EXPECT_TRUE(
+        lines(result).join(' ').contains(QRegularExpression(R"(^Comp ok .* Hang\.\w+ skipped -1--1 $)")))
+        << qPrintable(lines(result).join(' '));
+    EXPECT_EQ(lines(FxProbe::readCatalogue(m_folder.dataFolder())),
+              QStringList("Comp ok 2-2 vst2:Comp:1000"));
 }
 
 TEST_F(LibraryScan, SaysWhyItCannotScan)
