@@ -1,3 +1,4 @@
+#include "Tests/Workstation/FxScanBench.h"
 #include "Workstation/Options/OptionTable.h"
 #include "Workstation/Options/OptionTexts.h"
 
@@ -10,15 +11,17 @@
 
 namespace {
 
+using Completion = FxScanBench;
+
 CommandLine read(const QStringList &arguments) { return readCommandLine(QStringList("fxscan") + arguments); }
 
 /// What bash offers for the last of the words.
-QStringList completions(const QString &bash, const QStringList &words)
+QStringList completions(const QString &bash, const QStringList &words, const QString &fxscan = "fxscan")
 {
     const QString script = bashCompletion() + "COMP_WORDS=(\"$@\"); COMP_CWORD=$(($# - 1)); _fxscan\n"
                                               "printf '%s\\n' \"${COMPREPLY[@]}\"";
     QProcess shell;
-    shell.start(bash, QStringList({"--norc", "-c", script, "bash", "fxscan"}) + words);
+    shell.start(bash, QStringList({"--norc", "-c", script, "bash", fxscan}) + words);
     EXPECT_TRUE(shell.waitForFinished());
     return QString::fromUtf8(shell.readAllStandardOutput()).split('\n', Qt::SkipEmptyParts);
 }
@@ -89,6 +92,45 @@ TEST(Options, BashCompletesThem)
     EXPECT_EQ(completions(bash, {"--timeout", ""}), QStringList());
     EXPECT_EQ(completions(bash, {"--data-folder", "/us"}), QStringList("/usr"));
     EXPECT_TRUE(completions(bash, {"/etc/pass"}).contains("/etc/passwd")) << "a plug-in may be a file";
+}
+
+TEST_F(Completion, KnowsThePluginsWhateverTheirNames)
+{
+    const QString bash = QStandardPaths::findExecutable("bash");
+    if (bash.isEmpty())
+        GTEST_SKIP() << "there is no bash on this machine";
+    put("Plain.vst3", "class Comp\nvendor \"Keys & Co, Ltd\"\n");
+    put("Odd.vst3", "class \"$(touch hacked) \\x22a\\x22, *\"\nclass =1\n");
+    put("Crash.vst3", "fault initialize abort\n");
+    scan();
+    const struct {
+        const char *words; ///< as bash parts them
+        QStringList offered;
+    } rows[] = {
+        {"--show|", {"$(touch hacked) \"a\", *", "=1", "Comp", "Crash"}},
+        {"--show|Co", {"Comp"}},
+        {"--show|$\\(tou", {"$(touch hacked) \"a\", *"}},
+        {"--show|=|C", {"Comp", "Crash"}},
+        {"--retry|", {"Crash"}},
+        {"--switch-on|", {}},
+        {"--show|/us", {"/usr"}},
+        {"--only|fa", {"failed", "favourite"}},
+        {"--only|=|", {"ok"}},
+        {"--only=ok", {"--only=ok"}}, // where somebody has bash not part words at "="
+        {"--only|vendor|=|Ke", {"Keys & Co, Ltd"}},
+        {"--only|=|vendor|=", {"Fixture Works", "Keys & Co, Ltd"}},
+    };
+    for (const auto &row : rows) {
+        QStringList words{"--data-folder", "=", m_folder.dataFolder()};
+        QStringList offered = completions(bash, words + QString(row.words).split('|'), FXPROBE_FXSCAN);
+        offered.removeDuplicates();
+        if (row.offered == QStringList("ok"))
+            offered = offered.mid(0, 1);
+        EXPECT_EQ(offered, row.offered) << row.words;
+    }
+    EXPECT_EQ(completions(bash, {"--data-folder", m_folder.path("none"), "--show", ""}, FXPROBE_FXSCAN),
+              QStringList());
+    EXPECT_FALSE(QFile::exists("hacked"));
 }
 
 TEST(Options, ManualIsTroff)
