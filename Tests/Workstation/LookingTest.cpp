@@ -98,6 +98,7 @@ TEST_F(Looking, EverythingIsToldOfOnePlugin)
     put("Crash.vst3", "fault initialize segv\n");
     put("Null.vst2", "answer entry null\n");
     put("Bare.vst3", "answer get-factory null\n");
+    m_folder.write("Plugins/Empty.vst3", {}); // looked at again at each scan
     scan();
     const struct {
         QString name;
@@ -120,6 +121,7 @@ TEST_F(Looking, EverythingIsToldOfOnePlugin)
               : "with exit code 3 while it was starting"}}, // abort() is an exit on Windows
         {"One", 0, {"state +ok", "last probe +listed"}},
         {"Null", 0, {"last probe +failed while it was starting", "reason +its entry point returned null"}},
+        {"Empty", 0, {"last probe +failed while it was being loaded, .*\n  reason +it is empty\n"}},
         {"Nobody", 2, {"no plug-in is named 'Nobody'"}},
         {"Bare.vst3", 2, {"Bare.vst3: GetPluginFactory returned null"}},
     };
@@ -130,6 +132,7 @@ TEST_F(Looking, EverythingIsToldOfOnePlugin)
         for (const QString &each : row.says)
             EXPECT_TRUE(said.contains(QRegularExpression(each))) << qPrintable(each + "\n" + said);
     }
+    EXPECT_TRUE(run({"--list"}).standardOutput.contains("Empty (VST 3, failed): it is empty.\n"));
     EXPECT_FALSE(run({"--show", "One"}).standardOutput.contains("crashed at")) << "its sibling did";
     const QJsonObject shown =
         QJsonDocument::fromJson(run({"--show", "Crash", "--format", "json"}).standardOutput).object();
