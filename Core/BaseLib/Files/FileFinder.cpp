@@ -132,10 +132,13 @@ QString FileFinder::knownAs(const QString &real) const
     return listed != m_listedByLink.constEnd() ? *listed : searchedAs(real);
 }
 
-bool FileFinder::isLookedFor(const QString &name) const
+/// Of a name or a path. What is called like an ending and no more is a folder for such files: "~/.vst3".
+bool FileFinder::isLookedFor(const QString &path) const
 {
-    return std::any_of(m_endings.begin(), m_endings.end(),
-                       [&](const QString &ending) { return name.endsWith(ending, Qt::CaseInsensitive); });
+    const int length = path.size() - (path.lastIndexOf(QLatin1Char('/')) + 1);
+    return std::any_of(m_endings.begin(), m_endings.end(), [&](const QString &ending) {
+        return length > ending.size() && path.endsWith(ending, Qt::CaseInsensitive);
+    });
 }
 
 void FileFinder::setPatience(std::chrono::seconds limit, Waiting waiting)

@@ -82,7 +82,7 @@ private:
 
     struct Watch;
 
-    bool isLookedFor(const QString &name) const;
+    bool isLookedFor(const QString &path) const;
     bool isPassedOver(const QString &path);
     void addProblem(const QString &path, const QString &reason);
     bool searchPatiently(const QStringList &folders, const Cancelled &isCancelled);

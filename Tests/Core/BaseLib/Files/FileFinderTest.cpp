@@ -35,6 +35,14 @@ TEST(FileFinder, ListsAFolderByNameAndThenWhatLiesBelow)
     EXPECT_EQ(log.lines(), QStringList()) << "a folder that merely holds nothing is not reported";
 }
 
+TEST(FileFinder, AFolderThatIsCalledLikeAnEndingIsNotAModule)
+{
+    const TestFolder folder;
+    folder.write("Plugins/.vst3/a.vst3", {});
+    EXPECT_EQ(FileFinder({".vst3"}).find({folder.path("Plugins/.vst3")}, ".vst3"),
+              QStringList(folder.path("Plugins/.vst3/a.vst3")));
+}
+
 TEST(FileFinder, CancelIsAskedBeforeEachFolder)
 {
     const TestFolder folder;
