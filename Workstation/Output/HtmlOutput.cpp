@@ -244,12 +244,14 @@ void addTimes(QJsonObject &page, const ScanTimeline &timeline)
         double time = 0;
     };
     std::map<std::optional<ProbeStatus>, Sum> sums;
-    std::vector<const TimelineBar *> files;
+    std::map<QString, double> times; // ms, of files; some are asked twice
+    int probes = 0;
     double all = 0; // ms
     for (const TimelineBar &bar : timeline.bars) {
         if (bar.isPart)
             continue;
-        files.push_back(&bar);
+        ++probes;
+        times[bar.path] += bar.end - bar.begin;
         Sum &sum = sums[bar.status];
         ++sum.count;
         sum.time += bar.end - bar.begin;
@@ -261,15 +263,15 @@ void addTimes(QJsonObject &page, const ScanTimeline &timeline)
                                     {QStringLiteral("label"), labelOf(status)},
                                     {QStringLiteral("count"), sum.count},
                                     {QStringLiteral("seconds"), seconds(sum.time)}});
-    std::stable_sort(files.begin(), files.end(), [](const TimelineBar *a, const TimelineBar *b) {
-        return a->end - a->begin > b->end - b->begin;
-    });
+    std::vector<std::pair<QString, double>> files(times.begin(), times.end());
+    std::stable_sort(files.begin(), files.end(),
+                     [](const auto &a, const auto &b) { return a.second > b.second; });
+    files.resize(std::min(kSlow, files.size()));
     QJsonArray slow;
-    for (std::size_t place = 0; place < std::min(kSlow, files.size()); ++place) {
-        const double share = all > 0 ? (files[place]->end - files[place]->begin) / all : 0;
-        slow.append(QJsonObject{{QStringLiteral("name"), files[place]->name},
-                                {QStringLiteral("milliseconds"),
-                                 QString::number(files[place]->end - files[place]->begin, 'f', 0)},
+    for (const auto &[path, time] : files) {
+        const double share = all > 0 ? time / all : 0;
+        slow.append(QJsonObject{{QStringLiteral("name"), fileNameOf(path)},
+                                {QStringLiteral("milliseconds"), QString::number(time, 'f', 0)},
                                 {QStringLiteral("share"), share * kShareWidth},
                                 {QStringLiteral("percent"), QString::number(share * 100, 'f', 0)}});
     }
@@ -278,8 +280,8 @@ void addTimes(QJsonObject &page, const ScanTimeline &timeline)
     page.insert(QStringLiteral("timeText"),
                 QStringLiteral("The scan took %1 s; %2 probe%3 took %4 s together, up to %5 at once.")
                     .arg(seconds(timeline.milliseconds))
-                    .arg(files.size())
-                    .arg(QLatin1String(files.size() == 1 ? "" : "s"))
+                    .arg(probes)
+                    .arg(QLatin1String(probes == 1 ? "" : "s"))
                     .arg(seconds(all))
                     .arg(timeline.rows));
 }

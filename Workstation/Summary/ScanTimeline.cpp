@@ -40,6 +40,7 @@ ScanTimeline timelineOf(const ScanAccount &account)
             continue; // only looked at
         const bool isLast = probe->span == index;
         TimelineBar bar;
+        bar.path = span.key.path;
         bar.name = probe->subName.isEmpty() ? fileNameOf(span.key.path) : probe->subName;
         bar.reason = isLast ? probe->reason : QString();
         bar.begin = span.begin;

@@ -8,6 +8,7 @@
 
 /// One attempt at a file or a sub-plug-in, as a bar in a picture of the scan.
 struct TimelineBar {
+    QString path; ///< of the file
     QString name; ///< of the file or the sub-plug-in
     QString reason;
     double begin = 0; ///< ms since the scan began
