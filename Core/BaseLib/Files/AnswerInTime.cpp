@@ -22,15 +22,20 @@ struct Answer {
 
 bool answers(const QString &path)
 {
-    thread_local QHash<QString, Answer> known;
+    // NOTE: not one for each thread: MinGW frees such memory before what is in it is destroyed.
+    static std::mutex mutex;
+    static auto &known = *new QHash<QString, Answer>; // for ever: threads may outlive what is static
+    std::unique_lock<std::mutex> lock(mutex);
     if (const auto before = known.constFind(path); before != known.constEnd() && before->isValid())
         return before->isThere;
     const bool isSilenceKnown = std::any_of(known.cbegin(), known.cend(), [](const Answer &answer) {
         return !answer.isThere && answer.isValid();
     });
+    lock.unlock();
     const bool isThere = answerInTime(isSilenceKnown ? kLessPatience : kPatience, [path] {
                              return QFileInfo::exists(path);
                          }).has_value();
+    lock.lock();
     known.insert(path, {isThere, std::chrono::steady_clock::now()});
     return isThere;
 }

@@ -45,7 +45,7 @@ auto answerInTime(std::chrono::milliseconds limit, Ask ask) -> std::optional<dec
 }
 
 /// Whether the system tells anything of a file or folder within ten seconds, and within one after another
-/// that gave no answer. A path is asked anew after half a minute; each thread remembers what it asked.
+/// that gave no answer. A path is asked anew after half a minute. Any thread.
 bool answers(const QString &path);
 
 /// The same for a file whose folder is likely to hold others that are asked for: only the folder is asked,
