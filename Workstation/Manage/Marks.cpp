@@ -87,8 +87,7 @@ QString whyUnknown(const QString &name, const ProbeMemory &memory)
 {
     const UnlistedFile file = unlistedFileNamed(name, memory);
     if (!file.usedInstead.isEmpty())
-        return QStringLiteral("'%1' is not used; use the path of what is used in its place:\n  ")
-                   .arg(name) +
+        return QStringLiteral("'%1' is not used; use the path of what is used in its place:\n  ").arg(name) +
                file.usedInstead.join(QLatin1String("\n  "));
     return file.reason.isEmpty() ? QStringLiteral("no plug-in is named '%1'").arg(name) : file.reason;
 }

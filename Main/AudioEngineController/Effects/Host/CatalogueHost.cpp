@@ -127,7 +127,7 @@ void CatalogueHost::ReadCatalogue()
     m_known.clear();
     m_leftAlone.clear();
     m_absorbed.clear();
-    m_hasNewCrashes = false;
+    m_newCrashes.clear();
     m_suspects.clear();
     m_givenUp.clear();
     m_heldMarkers.clear();
@@ -218,7 +218,7 @@ void CatalogueHost::absorbMarker(const EffectRecord &marker)
 
 void CatalogueHost::applyCrash(const EffectRecord &marker)
 {
-    m_hasNewCrashes = true;
+    m_newCrashes.insert(pathKey(marker.path));
     const EffectRecord &crashed = m_known.applyCrash(marker);
     m_known.setIdentifier(crashed, freeIdentifier(crashed, marker.name));
     m_isKnownAsRead = false;

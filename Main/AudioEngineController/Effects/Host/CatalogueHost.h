@@ -10,6 +10,8 @@
 #include "Main/AudioEngineController/Effects/Protocol/CrashMarker.h"
 #include "Main/AudioEngineController/Effects/Protocol/FolderRules.h"
 
+#include <QSet>
+
 #include <functional>
 #include <map>
 #include <memory>
@@ -83,7 +85,9 @@ public:
     /// Has the known list hold what a crash marker says.
     void applyCrash(const EffectRecord &marker);
     /// Whether the known list took over any since it was read.
-    bool hasNewCrashes() const { return m_hasNewCrashes; }
+    bool hasNewCrashes() const { return !m_newCrashes.isEmpty(); }
+    /// The same of a file, or of a sub-plug-in in it.
+    bool hasNewCrash(const QString &path) const { return m_newCrashes.contains(pathKey(path)); }
     /// What the crash markers said that the last reading absorbed.
     const std::vector<EffectRecord> &absorbed() const { return m_absorbed; }
     /// True for a file that this run must not touch although nothing is recorded about it.
@@ -156,8 +160,8 @@ private:
     std::set<QString> m_givenUp;                     ///< known identifiers
     QStringList m_heldMarkers;                       ///< of files left alone
     QStringList m_unwrittenMarkers; ///< absorbed, but what they say could not be written down
-    QByteArray m_written; ///< what this process wrote to the file last; null: nothing since it was read
-    bool m_hasNewCrashes = false;
+    QByteArray m_written;       ///< what this process wrote to the file last; null: nothing since it was read
+    QSet<QString> m_newCrashes; ///< files, by `pathKey`
     bool m_isKnownAsRead = false; ///< the file holds exactly the known list, in our layout
     QString m_unread;             ///< why the catalogue that is there could not be read
 };

@@ -457,9 +457,10 @@ void FolderScan::finish(bool isWhole)
         for (const EffectRecord *record : m_plan->away())
             if (!m_host.isListed(record->id)) // else a file that is there lists it
                 m_host.AddEffect(*record);
-        for (const EffectRecord *record : m_plan->orphans())
-            if (!replaced.contains(record))
-                m_host.AddEffect(*record);
+        for (const KnownList::Records &orphans : {m_plan->orphans(), m_plan->orphansOf(skippedFiles())})
+            for (const EffectRecord *record : orphans)
+                if (!replaced.contains(record))
+                    m_host.AddEffect(*record);
         forgetGone();
         m_host.clearSuspects([this](const QString &path) {
             const KnownList::Records &away = m_plan->away();
@@ -473,6 +474,16 @@ void FolderScan::finish(bool isWhole)
     }
     m_written |= m_host.writeIfChanged(m_waiting);
     m_memory.write(true);
+}
+
+/// What the user passed over in this scan.
+QStringList FolderScan::skippedFiles() const
+{
+    QStringList skipped;
+    for (const ScanItem &item : m_plan->items())
+        if (ScanControl::instance().isSkipped(item.path))
+            skipped.append(item.path);
+    return skipped;
 }
 
 /// What the user wants never loaded is listed all the same; what nobody ever asked has a record for the file.

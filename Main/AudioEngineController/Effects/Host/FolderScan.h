@@ -52,6 +52,7 @@ private:
     bool mayYetBeListed(const EffectRecord &old) const;
     bool isAnyOpenBeside(const QString &path) const;
     void finish(bool isWhole);
+    QStringList skippedFiles() const;
 
     bool keepOutcome(const ScanItem &item, const ProbeOutcome &outcome);
     void log(const ScanItem &item, const ProbeOutcome &outcome, int worker) const;

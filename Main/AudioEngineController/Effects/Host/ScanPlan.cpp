@@ -286,6 +286,20 @@ void ScanPlan::collectOrphans()
                 m_orphans.push_back(record);
 }
 
+KnownList::Records ScanPlan::orphansOf(const QStringList &unasked) const
+{
+    KnownList::Records orphans;
+    for (const SettledFile &settled : m_settled) {
+        const bool mayMove = std::any_of(settled.namesakes.begin(), settled.namesakes.end(),
+                                         [&](const QString &path) { return unasked.contains(path); });
+        if (!settled.hasMoved && mayMove)
+            std::copy_if(settled.gone->records.begin(), settled.gone->records.end(),
+                         std::back_inserter(orphans),
+                         [](const EffectRecord *record) { return hasSomethingToLose(*record); });
+    }
+    return orphans;
+}
+
 /// The first file of which nothing is known that must not be loaded; empty when there is none.
 QString ScanPlan::leftAloneOf(const QStringList &namesakes) const
 {
@@ -328,8 +342,6 @@ ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
                 moved.records.push_back(movedIgnored(*record, settled.leftAlone));
             else if (!settled.leftAlone.isEmpty() && !record->standsForFile())
                 moved.records.push_back(movedUnasked(*record, settled.leftAlone));
-    if (!m_host.hasNewCrashes()) // what crashed long ago is none that has moved just now
-        return moved;
     for (const SettledFile &settled : m_settled)
         if (std::all_of(settled.heirs.begin(), settled.heirs.end(), hasCrashed))
             moveToCrashed(*settled.gone, settled.namesakes, moved);
@@ -341,6 +353,7 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
     const auto isOnlyCrashed = [this](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
         return !known.empty() && known.front()->isCrashedFile() &&
+               m_host.hasNewCrash(path) && // what crashed long ago is none that has moved just now
                std::all_of(known.begin() + 1, known.end(), isFromMarker);
     };
     const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);

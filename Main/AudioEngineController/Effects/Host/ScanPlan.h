@@ -57,6 +57,8 @@ public:
 
     /// Records of gone files that stay unless a file that is there lists them.
     const KnownList::Records &orphans() const { return m_orphans; }
+    /// The same where it is one of these files that may list them, which nobody asked in this scan.
+    KnownList::Records orphansOf(const QStringList &unasked) const;
 
     /// The sub-plug-ins of an item that are known to have ended the process that probed them, in the version
     /// of the file that is there: they must not be loaded. None where a file ended it as a whole and moved
