@@ -41,6 +41,8 @@ struct EffectRecord {
     bool standsForFile() const;
     /// True when the user switched the plug-in off: what crashed is not working as well.
     bool isSwitchedOff() const { return !enabled && working; }
+    /// True when it holds something that the user set: a favourite, a category, a switch-off.
+    bool hasMarks() const { return favourite || category != 0 || isSwitchedOff(); }
     /// True when both records stand for the same file, or the same sub-plug-in of one.
     bool isSamePlugin(const EffectRecord &other) const
     {

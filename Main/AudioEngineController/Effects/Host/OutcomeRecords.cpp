@@ -198,9 +198,14 @@ void Maker::keepUnchanged()
 {
     for (const EffectRecord *record : m_item.known)
         made.kept.push_back(*record);
-    for (const EffectRecord *record : m_item.moved)
-        if (!record->standsForFile())
-            made.kept.push_back(ScanPlan::movedUnasked(*record, m_item.path));
+    for (const EffectRecord *record : m_item.moved) {
+        const bool isForFile = record->standsForFile();
+        if (isForFile && !record->hasMarks())
+            continue;
+        made.kept.push_back(ScanPlan::movedUnasked(*record, m_item.path));
+        if (isForFile)
+            made.kept.back().id = m_host.freeIdentifier(made.kept.back(), record->name);
+    }
 }
 
 } // namespace

@@ -61,15 +61,10 @@ bool isFromMarker(const EffectRecord *record)
            (record->id == record->subName || record->id.startsWith(record->path));
 }
 
-bool hasMarks(const EffectRecord &record)
-{
-    return record.favourite || record.category != 0 || record.isSwitchedOff();
-}
-
 /// Whether a record says something of a plug-in that nobody else knows.
 bool hasSomethingToLose(const EffectRecord &record)
 {
-    return hasMarks(record) || (!record.enabled && !record.working && !record.isIgnored());
+    return record.hasMarks() || (!record.enabled && !record.working && !record.isIgnored());
 }
 
 /// A lone record that stands for a whole file, as catalogues of earlier versions hold; null when there is
@@ -365,7 +360,7 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
         const EffectRecord *same = findIn(
             present, [&](const EffectRecord &each) { return m_host.known().isSameOfFile(*record, each); });
         if (same) {
-            if (!hasMarks(*same))
+            if (!same->hasMarks())
                 all.marks.try_emplace(same->id, *record).first->second.enabled = true; // it stays disabled
             continue;
         }
@@ -478,7 +473,7 @@ const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRe
         return same;
     if (const EffectRecord *same = findIn(m_away, isSamePlugin))
         return same;
-    if (own && (own->working || hasMarks(*own)))
+    if (own && (own->working || own->hasMarks()))
         return own;
     if (const EffectRecord *same = askedElsewhere(probed))
         return same;
