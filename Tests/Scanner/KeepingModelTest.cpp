@@ -98,9 +98,6 @@ public:
             return;
         history << "    out of memory";
         doubtDropped();
-        for (const auto &entry : m_files) // the next scan takes those that crashed for old killers
-            if (m_culprits.count(entry.first))
-                m_unsure.insert(entry.second.kept.begin(), entry.second.kept.end());
         m_hasFailed = true;
         throw std::bad_alloc();
     }
@@ -221,7 +218,7 @@ private:
         const bool isBlamed = kills || m_ending == Ending::Killed;
         history << (isBlamed ? "    killed in " : "    ended in ") + culprit;
         for (const QFileInfo &file : QDir(folder()).entryInfoList(QDir::Files))
-            if (isBlamed || file.suffix() == "xml")
+            if (isBlamed || file.suffix() == "xml" || file.suffix() == "json")
                 m_frozen[file.filePath()] = m_folder.read(file.filePath());
         if (isBlamed) {
             m_culprits.insert(culprit);

@@ -263,6 +263,23 @@ scan 3
 vst2 Name Path Favourite Enabled: S|c/S.vst2|0|0, D|c/S.vst2|1|0, E|c/S.vst2|1|0
 same
 
+= Marks follow to where a file moved and crashed, also when others end the scanner after it
+put a/B.vst3: class S | #1
+put a/B.vst2: child 1 D | child 2 E
+write Plugins/a/other: x
+scan
+mark S Favourite 1, D Favourite 1
+remove Plugins/a/B.vst3
+remove Plugins/a/B.vst2
+put b/B.vst3: class S | #1 | fault module-entry kill
+put b/B.vst2: child 1 D | child 2 E | fault entry kill
+put z/K.vst3: fault module-entry kill
+put z/K.vst2: fault entry kill
+scan 5
+vst3 Name Path Favourite Enabled: B|b/B.vst3|0|0, S|b/B.vst3|1|0, K|z/K.vst3|0|0
+vst2 Name Path Favourite Enabled: B|b/B.vst2|0|0, D|b/B.vst2|1|0, E|b/B.vst2|0|0, K|z/K.vst2|0|0
+same
+
 = A catalogue of a negative version keeps its categories
 put Comp.vst3:
 scan

@@ -129,9 +129,7 @@ void addUnrecorded(ScanSummary &summary, const ProbeMemory &memory)
         recorded.insert(fileOf(plugin));
     for (const PluginFormatInfo &format : pluginFormats())
         memory.forEach(format.format, [&](const RememberedProbe &probe) {
-            const bool hasFailed = probe.status == ProbeStatus::Failed ||
-                                   probe.status == ProbeStatus::Crashed ||
-                                   probe.status == ProbeStatus::NoAnswer;
+            const bool hasFailed = probe.status == ProbeStatus::Failed || isCrash(probe.status);
             if (hasFailed && recorded.count({format.format, probe.path}) == 0 && fileAnswers(probe.path) &&
                 QFileInfo::exists(probe.path))
                 summary.failures.push_back({&format, PluginState::Failed, fileNameOf(probe.path), probe.path,

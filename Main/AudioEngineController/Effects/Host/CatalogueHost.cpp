@@ -2,6 +2,7 @@
 
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Main/AudioEngineController/Effects/Host/FolderScan.h"
+#include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeReport.h"
 #include "Main/AudioEngineController/Effects/Protocol/ScanLock.h"
 
@@ -126,7 +127,6 @@ void CatalogueHost::ReadCatalogue()
     const TAutoLockCS lock(&m_ks);
     m_known.clear();
     m_leftAlone.clear();
-    m_absorbed.clear();
     m_newCrashes.clear();
     m_suspects.clear();
     m_givenUp.clear();
@@ -183,6 +183,7 @@ void CatalogueHost::absorbMarkers()
         return;
     }
     QStringList absorbed;
+    std::vector<EffectRecord> crashes;
     const std::vector<FoundMarker> markers = readMarkers(files);
     for (const FoundMarker &marker : markers) {
         if (marker.isSuspect) { // stays until the plug-in was asked alone
@@ -190,11 +191,12 @@ void CatalogueHost::absorbMarkers()
             continue;
         }
         (isMarkerWithoutRecord(marker.plugin) ? m_heldMarkers : absorbed).append(marker.file);
-        if (!isExcused(marker, markers))
-            absorbMarker(marker.plugin);
+        if (!isExcused(marker, markers) && absorbMarker(marker.plugin))
+            crashes.push_back(marker.plugin);
     }
     if (absorbed.isEmpty())
         return;
+    rememberCrashes(crashes);
     if (!writeKnownRecords()) { // they stay: nothing else holds what they say
         m_unwrittenMarkers = absorbed;
         return;
@@ -203,17 +205,29 @@ void CatalogueHost::absorbMarkers()
         removeMarkerFile(file);
 }
 
-void CatalogueHost::absorbMarker(const EffectRecord &marker)
+/// True when the known list holds what it says.
+bool CatalogueHost::absorbMarker(const EffectRecord &marker)
 {
     DebugLog(L"A crash marker names %ls, %ls", marker.name, marker.path);
     if (marker.path.isEmpty())
-        return; // a damaged one
+        return false; // a damaged one
     if (isMarkerWithoutRecord(marker)) {
         m_leftAlone.insert(marker.path);
-        return;
+        return false;
     }
-    m_absorbed.push_back(marker);
     applyCrash(marker);
+    return true;
+}
+
+/// Has later runs know that these crashes are new, as this one may end before it has settled what moved. The
+/// launcher, which saw the end, knows the reason.
+void CatalogueHost::rememberCrashes(const std::vector<EffectRecord> &markers) const
+{
+    const auto memory = probeMemory() ? probeMemory() : std::make_shared<ProbeMemory>(catalogueFolder());
+    for (const EffectRecord &marker : markers)
+        memory->addCrash(format(), marker);
+    if (const FileResult written = memory->write(); !written)
+        DebugLog(L"Cannot write what is known of crashes: %ls", written.reason);
 }
 
 void CatalogueHost::applyCrash(const EffectRecord &marker)
@@ -351,6 +365,7 @@ bool CatalogueHost::writeText(const QByteArray &text, Durability durability)
     const FileResult written = isCatalogueUnread()
                                    ? FileResult{QStringLiteral("the one there cannot be read: ") + m_unread}
                                    : replaceFile(path, text, durability);
+    m_hasFailedToWrite = !written;
     if (written) {
         m_written = text;
     } else {

@@ -88,8 +88,6 @@ public:
     bool hasNewCrashes() const { return !m_newCrashes.isEmpty(); }
     /// The same of a file, or of a sub-plug-in in it.
     bool hasNewCrash(const QString &path) const { return m_newCrashes.contains(pathKey(path)); }
-    /// What the crash markers said that the last reading absorbed.
-    const std::vector<EffectRecord> &absorbed() const { return m_absorbed; }
     /// True for a file that this run must not touch although nothing is recorded about it.
     bool isLeftAlone(const QString &path) const { return m_leftAlone.count(path) != 0; }
     /// True when the effect list holds the identifier.
@@ -98,6 +96,8 @@ public:
     const FolderRules &rules() const { return m_rules; }
     /// Whether there is a catalogue that the system did not let us read. It is not replaced.
     bool isCatalogueUnread() const { return !m_unread.isEmpty(); }
+    /// Whether the last attempt to write the catalogue came to nothing.
+    bool hasFailedToWrite() const { return m_hasFailedToWrite; }
 
     /// Has a listed record take over the user's marks of an old one.
     void passMarks(const EffectRecord &old, const QString &id);
@@ -142,7 +142,8 @@ private:
     void readKnownRecords();
     QStringList takenMarkers() const;
     void absorbMarkers();
-    void absorbMarker(const EffectRecord &marker);
+    bool absorbMarker(const EffectRecord &marker);
+    void rememberCrashes(const std::vector<EffectRecord> &markers) const;
     bool writeKnownRecords();
     QByteArray render(WaitingRecords &waiting);
     bool writeText(const QByteArray &text, Durability durability);
@@ -155,7 +156,6 @@ private:
     KnownList m_known;
     EffectList m_effects;
     std::set<QString, PathLess> m_leftAlone;
-    std::vector<EffectRecord> m_absorbed;
     std::map<QString, QString, PathLess> m_suspects; ///< path to marker
     std::set<QString> m_givenUp;                     ///< known identifiers
     QStringList m_heldMarkers;                       ///< of files left alone
@@ -163,5 +163,6 @@ private:
     QByteArray m_written;       ///< what this process wrote to the file last; null: nothing since it was read
     QSet<QString> m_newCrashes; ///< files, by `pathKey`
     bool m_isKnownAsRead = false; ///< the file holds exactly the known list, in our layout
-    QString m_unread;             ///< why the catalogue that is there could not be read
+    bool m_hasFailedToWrite = false;
+    QString m_unread; ///< why the catalogue that is there could not be read
 };

@@ -109,7 +109,6 @@ void FolderScan::plan()
     auto plan = std::make_unique<ScanPlan>(m_host, m_memory.probes(), *m_finder);
     plan->decide(modules);
     m_plan = std::move(plan);
-    m_memory.addCrashes();
     ProbeReport::instance().plan(m_host.format(), static_cast<std::size_t>(modules.size()),
                                  m_plan->items().size());
     addKept();
@@ -473,6 +472,9 @@ void FolderScan::finish(bool isWhole)
         collectWaiting(m_done);
     }
     m_written |= m_host.writeIfChanged(m_waiting);
+    if (isWhole && !m_finder->area().isLimited() && !m_host.hasFailedToWrite() &&
+        (m_plan->hasNewCrashes() || m_host.hasNewCrashes()))
+        m_memory.settleCrashes();
     m_memory.write(true);
 }
 

@@ -241,12 +241,14 @@ void FolderScan::PooledScan::jobEnds(std::size_t item, int worker, const ProbeOu
     m_scan.m_isTouched = state.isTouched;
     state.outcome = readable(m_items[item], outcome);
     m_scan.log(m_items[item], *state.outcome, worker);
+    const bool isVerdict = isCrash(outcome.status);
+    if (isVerdict)
+        m_scan.m_memory.addCrash(m_scan.m_file, *state.outcome);
     if (item == m_scan.m_done)
         keepInOrder();
     else
         holdBack(item);
     showProgress();
-    const bool isVerdict = outcome.status == ProbeStatus::Crashed || outcome.status == ProbeStatus::NoAnswer;
     if (isVerdict) {
         m_verdicts.push_back(item);
     } else {
@@ -338,6 +340,8 @@ void FolderScan::PooledScan::settleVerdicts()
     const auto isOnDisk = [this](std::size_t item) {
         return !m_states[item].outcome || m_states[item].isHeldBack;
     };
+    if (std::any_of(m_verdicts.begin(), m_verdicts.end(), isOnDisk))
+        m_scan.m_memory.write(true); // the markers held this as well
     for (const std::size_t item : m_verdicts)
         if (isOnDisk(item)) {
             m_states[item].marker.remove();

@@ -22,20 +22,6 @@ ScanMemory::ScanMemory(const CatalogueHost &host)
                                   : std::make_shared<ProbeMemory>(host.catalogueFolder()))
 {}
 
-void ScanMemory::addCrashes()
-{
-    for (const EffectRecord &marker : m_host.absorbed()) {
-        const RememberedProbe *last = m_probes->find(m_host.format(), marker.path);
-        const bool isKnown =
-            last && last->fileTime == marker.fileTime &&
-            (marker.subId == 0 ? last->status == ProbeStatus::Crashed || last->status == ProbeStatus::NoAnswer
-                               : last->reasonOf(marker.subId) != last->reason);
-        if (!isKnown)
-            m_probes->setCrash(m_host.format(), marker, ProbeStatus::Crashed,
-                               QStringLiteral("it ended the scanner"));
-    }
-}
-
 void ScanMemory::childEnded(quint32 subId, const QString &reason, const QStringList &frames)
 {
     m_item.plugins.push_back({QString(), subId, reason, -1, -1, QString(), QString(), frames});
@@ -50,6 +36,7 @@ void ScanMemory::end(const EffectRecord &file, const ProbeOutcome &outcome, bool
     m_item.path = file.path;
     m_item.fileTime = file.fileTime;
     m_item.status = outcome.status;
+    m_item.isUnsettled = isCrash(outcome.status);
     m_item.stage = outcome.stage;
     m_item.reason = outcome.reason;
     m_item.frames = outcome.frames;

@@ -17,9 +17,13 @@ public:
     /// All that is remembered.
     const ProbeMemory &probes() const { return *m_probes; }
 
-    /// Remembers what the crash markers said that this run absorbed. The launcher, which saw the end, knows
-    /// more.
-    void addCrashes();
+    /// Remembers that a file crashed whose turn among the items has not come yet.
+    void addCrash(const EffectRecord &file, const ProbeOutcome &outcome)
+    {
+        m_probes->setCrash(m_host.format(), file, outcome.status, outcome.reason);
+    }
+    /// Has all crashes count as settled: what may have moved to where they are has.
+    void settleCrashes() { m_probes->settle(m_host.format()); }
     /// Forgets the files of this format of which the condition does not hold.
     void keepOnly(const std::function<bool(const QString &path)> &isKept)
     {

@@ -74,6 +74,13 @@ const EffectRecord *loneFileRecord(const KnownList::Records &records)
     return records.size() == 1 && records.front()->standsForFile() ? records.front() : nullptr;
 }
 
+bool hasCrashed(const KnownList &known)
+{
+    const auto &records = known.inOrder();
+    return std::any_of(records.begin(), records.end(),
+                       [](const EffectRecord &record) { return record.isCrashedFile(); });
+}
+
 } // namespace
 
 ScanPlan::ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const FileFinder &finder)
@@ -81,10 +88,19 @@ ScanPlan::ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const F
     , m_memory(memory)
     , m_unread(finder.unread())
     , m_area(finder.area())
+    , m_hasNewCrashes(host.hasNewCrashes() ||
+                      (hasCrashed(host.known()) && memory.hasUnsettled(host.format())))
 {
     for (const QString &folder : host.folders())
         if (!folder.isEmpty())
             m_folders.append(QDir::cleanPath(QFileInfo(folder).absoluteFilePath()));
+}
+
+/// Whether a file crashed since a scan settled what moved: in this scan, or in one that was cut off.
+bool ScanPlan::isNewCrash(const QString &path) const
+{
+    const RememberedProbe *last = m_memory.find(m_host.format(), path);
+    return m_host.hasNewCrash(path) || (last && last->isUnsettled);
 }
 
 void ScanPlan::keep(const KnownList::Records &records)
@@ -101,7 +117,7 @@ void ScanPlan::decide(const QStringList &modules)
     }
     sortMissing(found);
     // Else there is nothing to settle, nor what a copy may be of.
-    if (!m_items.empty() || !m_gone.empty() || m_host.hasNewCrashes()) {
+    if (!m_items.empty() || !m_gone.empty() || m_hasNewCrashes) {
         indexKept();
         settleAllGone(modules);
         leaveOutCopies();
@@ -348,7 +364,7 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
     const auto isOnlyCrashed = [this](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
         return !known.empty() && known.front()->isCrashedFile() &&
-               m_host.hasNewCrash(path) && // what crashed long ago is none that has moved just now
+               isNewCrash(path) && // what crashed long ago is none that has moved just now
                std::all_of(known.begin() + 1, known.end(), isFromMarker);
     };
     const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);

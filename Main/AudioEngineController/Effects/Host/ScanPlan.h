@@ -65,6 +65,8 @@ public:
     /// since: what was disabled beside it did nothing.
     KnownList::Records deadly(const ScanItem &item) const;
 
+    /// Whether something crashed of which no scan has settled yet what may have moved to it.
+    bool hasNewCrashes() const { return m_hasNewCrashes; }
     /// Whether files are gone that were known.
     bool hasGone() const { return !m_gone.empty(); }
 
@@ -93,6 +95,7 @@ private:
         bool hasMoved;     ///< to one of these
     };
 
+    bool isNewCrash(const QString &path) const;
     void decideModule(const QString &path);
     void sortMissing(const QSet<QString> &found);
     void collectSought();
@@ -122,6 +125,7 @@ private:
     QStringList m_unread;
     SearchArea m_area;
     QStringList m_ignored;
+    bool m_hasNewCrashes;
     std::map<QString, bool> m_isFolderThere; ///< and searched, with some content
     std::vector<const EffectRecord *> m_kept;
     QSet<QString> m_keptPaths;                   ///< by `pathKey`

@@ -23,6 +23,12 @@ enum class ProbeStatus {
     Skipped,   ///< a user passed over it
 };
 
+/// Whether a plug-in ended the process that probed it, or had to be ended with it.
+constexpr bool isCrash(ProbeStatus status)
+{
+    return status == ProbeStatus::Crashed || status == ProbeStatus::NoAnswer;
+}
+
 /// One file to ask: everything that a format's probe needs to know.
 struct ProbeJob {
     PluginFormat format = PluginFormat::Unknown;

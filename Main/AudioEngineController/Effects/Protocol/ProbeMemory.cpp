@@ -24,6 +24,7 @@ constexpr char kOutputs[] = "outputs";
 constexpr char kHeldBy[] = "heldBy";
 constexpr char kName[] = "name";
 constexpr char kFrames[] = "frames";
+constexpr char kUnsettled[] = "unsettled";
 
 /// In the order of `ProbeStatus`.
 constexpr const char *kStatusTexts[] = {"listed",    "failed",    "no plug-in", "crashed",
@@ -82,6 +83,8 @@ QByteArray render(const RememberedProbe &probe)
                        {word(kMilliseconds), probe.milliseconds}};
     insertText(object, kReason, probe.reason);
     insertTexts(object, kFrames, probe.frames);
+    if (probe.isUnsettled)
+        object.insert(word(kUnsettled), true);
     if (!plugins.isEmpty())
         object.insert(word(kPlugins), plugins);
     return QJsonDocument(object).toJson(QJsonDocument::Compact);
@@ -127,6 +130,7 @@ RememberedProbe probeOf(const QJsonObject &object)
     probe.reason = object.value(word(kReason)).toString();
     probe.frames = textsOf(object.value(word(kFrames)));
     probe.milliseconds = object.value(word(kMilliseconds)).toDouble();
+    probe.isUnsettled = object.value(word(kUnsettled)).toBool();
     for (const QJsonValue plugin : object.value(word(kPlugins)).toArray())
         probe.plugins.push_back(pluginOf(plugin.toObject()));
     return probe;
@@ -231,6 +235,7 @@ void ProbeMemory::setCrash(PluginFormat format, const EffectRecord &plugin, Prob
     probe.format = format;
     probe.path = plugin.path;
     probe.fileTime = plugin.fileTime;
+    probe.isUnsettled = true;
     if (plugin.subId == 0) {
         probe.status = status;
         probe.reason = reason;
@@ -242,6 +247,42 @@ void ProbeMemory::setCrash(PluginFormat format, const EffectRecord &plugin, Prob
         probe.plugins.push_back({QString(), plugin.subId, reason, -1, -1, QString()});
     }
     set(probe);
+}
+
+void ProbeMemory::addCrash(PluginFormat format, const EffectRecord &marker)
+{
+    const RememberedProbe *last = find(format, marker.path);
+    const bool isKnown =
+        last && last->fileTime == marker.fileTime &&
+        (marker.subId == 0 ? isCrash(last->status) : last->reasonOf(marker.subId) != last->reason);
+    if (!isKnown)
+        return setCrash(format, marker, ProbeStatus::Crashed, QStringLiteral("it ended the scanner"));
+    RememberedProbe known = *last;
+    known.isUnsettled = true;
+    set(known);
+}
+
+bool ProbeMemory::hasUnsettled(PluginFormat format) const
+{
+    QByteArray content;
+    if (!m_entries && !(readWholeFile(m_file, content) && content.contains(kUnsettled)))
+        return false;
+    return std::any_of(entries().begin(), entries().end(), [&](const auto &each) {
+        return each.first.first == format && each.second.probe.isUnsettled;
+    });
+}
+
+void ProbeMemory::settle(PluginFormat format)
+{
+    std::vector<RememberedProbe> settled;
+    forEach(format, [&](const RememberedProbe &probe) {
+        if (probe.isUnsettled)
+            settled.push_back(probe);
+    });
+    for (RememberedProbe &probe : settled) {
+        probe.isUnsettled = false;
+        set(probe);
+    }
 }
 
 void ProbeMemory::keepOnly(PluginFormat format, const std::function<bool(const QString &path)> &isKept)

@@ -36,6 +36,9 @@ struct RememberedProbe {
     QString reason;
     QStringList frames; ///< where it crashed; see `ProbeOutcome`
     double milliseconds = 0;
+    /// It crashed, and no scan that saw all folders has come to its end since: a file that is gone may yet
+    /// turn out to have moved there.
+    bool isUnsettled = false;
     std::vector<RememberedPlugin> plugins;
 
     /// True for a copy: other files hold the identifiers of everything that it lists.
@@ -47,7 +50,8 @@ struct RememberedProbe {
 };
 
 /// The outcomes of the last probes, of all formats, in a file beside the catalogues, which have no place for
-/// them. Losing the file costs the reasons, and the time to probe copies again; nothing else.
+/// them. Losing the file costs the reasons, and the time to probe copies again; and where a scan was cut off
+/// after a file had moved and crashed, the marks of what it held.
 /// docs/protocol.md describes it.
 class ProbeMemory {
 public:
@@ -60,8 +64,14 @@ public:
     void forEach(PluginFormat format, const std::function<void(const RememberedProbe &)> &operation) const;
     void set(const RememberedProbe &probe);
     /// Remembers that a plug-in, or a sub-plug-in, ended the process that probed it, or gave no answer. Of
-    /// the plug-in its path, file time, identifier and name count.
+    /// the plug-in its path, file time, identifier and name count. The crash is unsettled.
     void setCrash(PluginFormat format, const EffectRecord &plugin, ProbeStatus status, const QString &reason);
+    /// The same of a crash of which only the marker tells. What is known of it already stays.
+    void addCrash(PluginFormat format, const EffectRecord &marker);
+    /// Whether any crash of a format is unsettled. Quick while nothing else was asked.
+    bool hasUnsettled(PluginFormat format) const;
+    /// No crash of a format is unsettled any more.
+    void settle(PluginFormat format);
     /// Forgets the files of a format for which the answer is false.
     void keepOnly(PluginFormat format, const std::function<bool(const QString &path)> &isKept);
 
