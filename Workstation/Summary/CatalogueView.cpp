@@ -35,9 +35,13 @@ QStringList namesOfSet(quint32 category)
 /// The first element of a record that is not well-formed XML as it is written.
 QString badElement(const CatalogueFormat &format, const EffectRecord &record)
 {
+    const auto textOf = [&record](const CatalogueElement &element) {
+        const QByteArray content = element.content(record).value_or(QByteArray());
+        return content.startsWith(kLineEnd) ? record.subName.toUtf8() : content; // a block holds elements
+    };
     for (const CatalogueElement &element : format.elements)
         for (const char bad : {'<', '&'})
-            if (element.content && element.content(record).value_or(QByteArray()).contains(bad))
+            if (element.content && textOf(element).contains(bad))
                 return QStringLiteral("the %1 of '%2' (%3) holds \"%4\"")
                     .arg(QString::fromLatin1(element.name).toLower(), record.name, record.path,
                          QString(QLatin1Char(bad)));
