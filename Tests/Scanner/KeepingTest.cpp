@@ -280,14 +280,50 @@ vst3 Name Path Favourite Enabled: B|b/B.vst3|0|0, S|b/B.vst3|1|0, K|z/K.vst3|0|0
 vst2 Name Path Favourite Enabled: B|b/B.vst2|0|0, D|b/B.vst2|1|0, E|b/B.vst2|0|0, K|z/K.vst2|0|0
 same
 
+= A catalogue that somebody edited keeps its marks and its killer
+put E.vst3: class "Top <br/> E" | vendor "Jo <jo x.org>" | #1
+put K.vst3: class K | fault module-entry kill
+put N.vst3: class N | #3 | class O | #4
+put S.vst2: child 1 "Top <br/> P" | child 2 Q
+scan 2
+mark Top <br/> E Favourite 1, N CategoryMask 4, O Enabled 0, Q Favourite 1
+edit Effects/VST3Configuration.xml: <Effects version="1.1"> => \t<Effects version='1.1'>
+edit Effects/VST3Configuration.xml: <Name>K</Name> => <Name>K</Name>\t
+edit Effects/FXConfiguration.xml: </Effects> => <!-- by hand -->
+edit Effects/FXConfiguration.xml: <ID>2</ID> => <ID>2</ID>\t
+scan
+loaded .
+vst3 Name Favourite CategoryMask Enabled Working: K|0|0|0|0, N|0|4|1|1, O|0|0|0|1, Top <br/> E|1|0|1|1
+vst2 Name Favourite: Top <br/> P|0, Q|1
+same
+
+= A damaged catalogue has what works asked again, and keeps the marks and the killer that can be read
+put E.vst3: class E | vendor "Jo <jo x.org>" | #1
+put K.vst3: class K | fault module-entry kill
+put N.vst3: class N | #3 | class O | #4
+put S.vst2: child 1 P | child 2 Q
+scan 2
+mark E Favourite 1, N CategoryMask 4, O Enabled 0, P Favourite 1
+edit Effects/VST3Configuration.xml: <Name>K</Name> => <Name>K</Nam
+edit Effects/VST3Configuration.xml: <Vendor>Jo <jo x.org></Vendor> => Jo
+cut Effects/FXConfiguration.xml: <ID>2</ID>
+scan
+loaded E N S
+vst3 Name Favourite CategoryMask Enabled Working: E|1|0|1|1, K|0|0|0|0, N|0|4|1|1, O|0|0|0|1
+vst2 Name Favourite: P|1, Q|0
+same
+
 = A catalogue of a negative version keeps its categories
 put Comp.vst3:
+put Comp.clap:
 scan
 mark Comp CategoryMask 4
 edit Effects/VST3Configuration.xml: version="1.1" => version="-1"
+edit Effects/CLAPConfiguration.xml: version="1.0" => version="-1"
 scan
 loaded .
 vst3 Name CategoryMask: Comp|4
+clap Name CategoryMask: Comp|4
 
 = A new file of a known name and time is asked and starts without marks
 put a/Comp.vst3: class A | #1

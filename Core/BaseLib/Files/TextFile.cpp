@@ -7,6 +7,9 @@
 
 namespace {
 
+/// What is written at once needs no buffer, and one that cannot be emptied keeps a file from being removed.
+constexpr QIODevice::OpenMode kWhole = QIODevice::WriteOnly | QIODevice::Truncate | QIODevice::Unbuffered;
+
 FileResult writeAll(QFile &file, const QByteArray &content, Durability durability)
 {
     // A disk that fills up accepts a part first; only the next attempt gives the reason.
@@ -16,20 +19,39 @@ FileResult writeAll(QFile &file, const QByteArray &content, Durability durabilit
             return {file.errorString()};
         written += taken;
     }
-    if (!file.flush())
-        return {file.errorString()};
     if (durability == Durability::Synced)
         syncToDisk(file.handle());
     file.close();
     return file.error() == QFile::NoError ? FileResult{} : FileResult{file.errorString()};
 }
 
+/// Writes over the only copy. Where the content does not fit, what was there stays: only space that is there
+/// already is written over.
 FileResult writeDirectly(const QString &path, const QByteArray &content, Durability durability)
 {
     QFile file(path);
-    if (!file.open(QIODevice::WriteOnly | QIODevice::Truncate))
+    const QFileInfo existing(path);
+    if (!existing.isFile()) {
+        const bool isOpen = file.open(kWhole);
+        return isOpen ? writeAll(file, content, durability) : FileResult{file.errorString()};
+    }
+    const int size = static_cast<int>(existing.size());
+    if (content.size() > size) {
+        if (!file.open(QIODevice::Append | QIODevice::Unbuffered))
+            return {file.errorString()};
+        FileResult grown = writeAll(file, content.mid(size), Durability::Buffered);
+        if (!grown) {
+            file.close();
+            QFile::resize(path, size);
+            return grown;
+        }
+    }
+    if (!file.open(QIODevice::ReadWrite | QIODevice::Unbuffered))
         return {file.errorString()};
-    return writeAll(file, content, durability);
+    FileResult result = writeAll(file, content, durability);
+    if (result && content.size() < size && !QFile::resize(path, content.size()))
+        result.reason = QStringLiteral("it could not be shortened");
+    return result;
 }
 
 } // namespace
@@ -51,7 +73,7 @@ FileResult replaceFile(const QString &path, const QByteArray &content, Durabilit
             return {probe.errorString()};
     }
     QFile temporary(target + QStringLiteral(".tmp"));
-    if (!temporary.open(QIODevice::WriteOnly | QIODevice::Truncate))
+    if (!temporary.open(kWhole))
         return writeDirectly(target, content, durability);
     if (exists)
         temporary.setPermissions(existing.permissions());

@@ -59,6 +59,7 @@ void prepareProcess()
     giveHome();
     suppressCoreDumps();
     std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN); // a file that grows too large fails to be written, as on a full disk
     // File names are bytes; read as UTF-8 they also survive where the locale is "C".
     QTextCodec::setCodecForLocale(QTextCodec::codecForName("UTF-8"));
     chooseDisplayPlatform();

@@ -1,5 +1,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CLAPCatalogue.h"
 
+#include <limits>
+
 namespace {
 
 void readId(EffectRecord &record, const ElementContent &element)
@@ -17,7 +19,7 @@ const CatalogueFormat &clapCatalogueFormat()
                                            "1.0",
                                            false,
                                            1.0,
-                                           1.0,
+                                           std::numeric_limits<double>::lowest(), // masks in every version
                                            KnownList::Identity::Identifier,
                                            "[^/]*", // any text: a file is identified by its path
                                            CatalogueFormat::Channels::Both,

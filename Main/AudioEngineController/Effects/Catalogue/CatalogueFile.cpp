@@ -16,15 +16,10 @@ EffectRecord readRecord(const CatalogueFormat &format, const XMLElement &effect)
     return record;
 }
 
-/// What an XML reader makes of the file; the version, where it states one.
-std::optional<QString> readAsXml(const CatalogueFormat &format, const QByteArray &text,
+/// What a file of another layout holds; the version, where it states one.
+std::optional<QString> readAsXml(const CatalogueFormat &format, const XMLDocument &document,
                                  CatalogueContents &contents)
 {
-    XMLDocument document(XMLDocument::Entities::Literal);
-    if (!document.parse(text)) {
-        contents.reason = document.error();
-        return std::nullopt;
-    }
     const XMLElement root = document.root("Effects");
     if (!root) {
         contents.reason = QStringLiteral("it has no \"Effects\" element");
@@ -35,7 +30,6 @@ std::optional<QString> readAsXml(const CatalogueFormat &format, const QByteArray
         contents.reason = QStringLiteral("it states no version");
         return std::nullopt;
     }
-    contents.records.clear();
     for (const XMLElement &effect : root.children("Effect"))
         contents.records.push_back(readRecord(format, effect));
     return version.value_or(QStringLiteral("1.0"));
@@ -54,6 +48,17 @@ void upgrade(const CatalogueFormat &format, double version, const FileTimeOf &fi
     }
 }
 
+/// What is damaged may have told of more plug-ins of these files, and more of these. Nobody asks what
+/// crashed.
+void haveAskedAgain(std::vector<EffectRecord> &records)
+{
+    for (EffectRecord &record : records)
+        if (record.enabled && record.working)
+            record.fileTime.clear();
+        else if (record.name.isEmpty())
+            NameFromPath(record);
+}
+
 } // namespace
 
 CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path,
@@ -67,13 +72,23 @@ CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString
         return contents;
     }
     CatalogueLines lines = readCatalogueLines(format, text);
-    contents.records = std::move(lines.records);
-    std::optional<QString> version = lines.version;
     contents.isAsWritten =
         lines.isWhole && lines.isAsWritten && lines.version == QLatin1String(format.version);
     if (!lines.isWhole)
-        version = readAsXml(format, text, contents);
-    upgrade(format, parseDecimal(version.value_or(lines.version)), fileTimeOf, contents);
+        lines = readEditedLines(format, text);
+    std::optional<QString> version = lines.version;
+    XMLDocument document(XMLDocument::Entities::Literal);
+    if (lines.isWhole && version) {
+        contents.records = std::move(lines.records);
+    } else if (document.parse(text)) {
+        version = readAsXml(format, document, contents);
+    } else {
+        contents.reason = document.error();
+        contents.records = std::move(lines.records);
+        haveAskedAgain(contents.records);
+    }
+    upgrade(format, parseDecimal(version.value_or(QString::fromLatin1(format.version))), fileTimeOf,
+            contents);
     return contents;
 }
 

@@ -21,8 +21,8 @@ using FileTimeOf = std::function<QString(const QString &path)>;
 
 /// Reads a catalogue file: by its lines where it has the layout in which it is written, as XML where it has
 /// another. Records of earlier versions are upgraded: their time stamps, which were of another form, become
-/// those of the files now, or none where `fileTimeOf` is null. Where the file cannot be used as a whole, the
-/// records before the place that cannot be read are there.
+/// those of the files now, or none where `fileTimeOf` is null. Where the file is damaged, the records that
+/// can be read are there, those of plug-ins that work without time stamps.
 CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString &path,
                                     const FileTimeOf &fileTimeOf = nullptr);
 

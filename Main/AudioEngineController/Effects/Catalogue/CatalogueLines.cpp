@@ -1,20 +1,24 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueLines.h"
 
 #include "Core/BaseLib/Files/TextFile.h"
+#include "Core/BaseLib/Files/XMLDocument.h"
 
 #include <QStringList>
 
 #include <algorithm>
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
 
 namespace {
 
+constexpr char kByteOrderMark[] = "\xef\xbb\xbf";
 constexpr char kHeader[] = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>";
 constexpr char kRootStart[] = "<Effects version=\"";
 constexpr char kRootEnd[] = "\">";
 constexpr char kRecordEnd[] = "\t</Effect>";
+constexpr char kLineOfRecordEnd[] = "\n\t</Effect>";
 
 /// A place in a text that moves on over what is expected there.
 class Lines {
@@ -43,12 +47,15 @@ public:
     bool isAtEnd() const { return m_at == m_text.size(); }
 
     /// The bytes up to `end`, which has the end of its line; moves behind it. Nothing, and no move, when
-    /// there is no end behind which `isNext` holds: a text may look like an end itself.
+    /// there is no end behind which `isNext` holds: a text may look like an end itself. Nor where that is
+    /// behind the end of a record: its own is damaged.
     template <typename IsNext>
     std::optional<ElementContent> takeUntil(std::string_view end, IsNext &&isNext)
     {
         const std::size_t start = m_at;
         for (std::size_t at = m_text.find(end, start); at != m_text.npos; at = m_text.find(end, at + 1)) {
+            if (m_text.substr(start, at - start).find(kLineOfRecordEnd) != m_text.npos)
+                break;
             m_at = at + end.size();
             if (isNext())
                 return ElementContent(m_text.data() + start, static_cast<int>(at - start));
@@ -102,6 +109,69 @@ bool takeElements(Lines &lines, const std::vector<ElementTags> &tags, EffectReco
     return lines.takeLine(kRecordEnd);
 }
 
+/// The version that a line with the root's opening tag states: none is no version.
+std::optional<QString> versionOf(const QByteArray &line)
+{
+    XMLDocument root;
+    return root.parse(line + "</Effects>") ? root.root("Effects").attribute("version") : std::nullopt;
+}
+
+/// Reads the lines of one record of an edited file, each by itself.
+class EditedRecord {
+public:
+    explicit EditedRecord(const CatalogueFormat &format)
+        : m_format(format)
+    {}
+
+    /// False for a line that is no element, and no part of one.
+    bool take(const QByteArray &line)
+    {
+        if (m_block && line == "</" + m_block->name + '>') {
+            read(m_block->name, m_block->content + "\t\t");
+            m_block.reset();
+            return true;
+        }
+        const int nameEnd = line.indexOf('>');
+        const QByteArray name = line.mid(1, nameEnd - 1);
+        const QByteArray closing = "</" + name + '>';
+        if (nameEnd < 2 || line.front() != '<')
+            return false;
+        if (line.size() == nameEnd + 1 && !m_block && !line.contains('/')) {
+            m_block = Block{name, kLineEnd};
+            return true;
+        }
+        if (!line.endsWith(closing) || line.size() < nameEnd + 1 + closing.size())
+            return false;
+        if (m_block)
+            m_block->content += "\t\t\t" + line + kLineEnd;
+        else
+            read(name, line.mid(nameEnd + 1, line.size() - nameEnd - 1 - closing.size()));
+        return true;
+    }
+    /// Whether the lines tell enough to go by.
+    bool isUsable() const { return !m_block && m_hasState; }
+
+    EffectRecord record;
+
+private:
+    struct Block {
+        QByteArray name;
+        QByteArray content;
+    };
+
+    void read(const QByteArray &name, const QByteArray &content)
+    {
+        m_hasState |= name == CatalogueElements::kEnabled.name || name == CatalogueElements::kWorking.name;
+        for (const CatalogueElement &element : m_format.elements)
+            if (element.read && name == element.name)
+                element.read(record, ElementContent(content.constData(), content.size()));
+    }
+
+    const CatalogueFormat &m_format;
+    std::optional<Block> m_block; ///< an element of several lines, in our layout, as far as it was read
+    bool m_hasState = false;
+};
+
 } // namespace
 
 CatalogueLines readCatalogueLines(const CatalogueFormat &format, const QByteArray &content)
@@ -124,6 +194,38 @@ CatalogueLines readCatalogueLines(const CatalogueFormat &format, const QByteArra
         read.records.push_back(std::move(record));
     }
     read.isWhole = lines.takeLine("</Effects>") && lines.isAtEnd();
+    return read;
+}
+
+CatalogueLines readEditedLines(const CatalogueFormat &format, const QByteArray &content)
+{
+    CatalogueLines read;
+    read.isAsWritten = false;
+    read.isWhole = true;
+    std::unique_ptr<EditedRecord> record; // that has begun
+    const int start = content.startsWith(kByteOrderMark) ? static_cast<int>(qstrlen(kByteOrderMark)) : 0;
+    for (const QByteArray &untrimmed : content.mid(start).split('\n')) {
+        const QByteArray line = untrimmed.trimmed();
+        const bool isComment = line.startsWith("<!--") && line.endsWith("-->");
+        if (line == "<Effect>" || line == "</Effect>") {
+            const bool isEnd = line.at(1) == '/';
+            read.isWhole &= isEnd == bool(record) && (!isEnd || record->isUsable());
+            if (isEnd && record && record->isUsable())
+                read.records.push_back(record->record);
+            record.reset();
+            if (!isEnd)
+                record = std::make_unique<EditedRecord>(format);
+        } else if (line.isEmpty() || isComment) {
+            continue;
+        } else if (record) {
+            read.isWhole &= record->take(line);
+        } else if (line.startsWith("<Effects") && !read.version) {
+            read.version = versionOf(line);
+        } else if (!line.startsWith("<?xml ") && line != "</Effects>") {
+            read.isWhole = false;
+        }
+    }
+    read.isWhole &= !record;
     return read;
 }
 

@@ -8,9 +8,11 @@
 #include <QDir>
 #include <QFile>
 
+#include <csignal>
 #include <functional>
 
 #include <grp.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -119,4 +121,20 @@ TEST(ReplaceFile, ObeysPermissions)
         setMode(folder.dataFolder(), 0755);
         EXPECT_EQ(folder.read("a.xml"), mayWrite ? "new" : "long old content");
     }
+}
+
+TEST(ReplaceFile, WhatDoesNotFitLeavesWhatWasThere)
+{
+    const TestFolder folder;
+    folder.write("a.xml", "old content");
+    setMode(folder.path("a.xml"), 0666);
+    setMode(folder.dataFolder(), 0555);
+    EXPECT_TRUE(trueForOrdinaryUser([&folder] {
+        const rlimit limit = {16, 16};
+        return signal(SIGXFSZ, SIG_IGN) != SIG_ERR && setrlimit(RLIMIT_FSIZE, &limit) == 0 &&
+               replaceFile(folder.path("a.xml"), "new content that is longer", Durability::Buffered).reason ==
+                   "File too large";
+    }));
+    setMode(folder.dataFolder(), 0755);
+    EXPECT_EQ(folder.read("a.xml"), "old content");
 }
