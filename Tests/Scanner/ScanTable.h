@@ -90,7 +90,7 @@ protected:
              [&] { m_folder.write(file, text.toUtf8().replace("\\n", kLineEnd).replace("\\t", "\t")); }},
             {"holds", [&] { EXPECT_EQ(m_folder.read(file), text.toUtf8()); }},
             {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(spelt(file)))); }},
-            {"link", [&] { link(file.section(' ', 0, 0), file.section(' ', 1)); }},
+            {"link", [&] { link(spelt(file).section(' ', 0, 0), spelt(file).section(' ', 1)); }},
             {"short", [&] { cutShort(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
             {"move", [&] { move(spelt(file).split(' ')); }},
             {"date", [&] { date(file.section(' ', 0, -2), file.section(' ', -1) + ':' + text); }},

@@ -161,8 +161,24 @@ same
 
 = What a bundle holds is never a VST 2 module
 put Damaged.vst3/Left.vst2, Other.VST3/Contents/aarch64-other/Other.vst2, Good.vst2:
+put .vst3/Own.vst2: id 2
+put .vst3/Own.clap:
+folders @/Plugins @/Plugins/.vst3
 scan
-vst2 Name: Good
+vst2 Name: Good, Own
+clap Name: Own
+same
+
+= A file for several formats is found by a link of each
+put ../Store/Clap.clap, ../Store/Two.vst2:
+write Plugins/X.vst3/Contents/Resources/x: x
+link Plugins/1.vst2 Store/Clap.clap
+link Plugins/2.clap Store/Clap.clap
+link Plugins/X.vst3/Contents/Resources/X.vst2 Store/Two.vst2
+link Plugins/z.vst2 Store/Two.vst2
+scan
+vst2 Path: z.vst2
+clap Path: 2.clap
 same
 
 = A module that is cut short is looked at until it is whole again

@@ -60,6 +60,8 @@ bool isAroundAny(const QString &path, const QStringList &folders)
 /// What a path becomes when the folder at its start is reached by another one.
 QString moved(const QString &path, const QString &from, const QString &to)
 {
+    if (from == to)
+        return path;
     const auto withoutSlash = [](const QString &folder) {
         return folder.endsWith(QLatin1Char('/')) ? folder.chopped(1) : folder;
     };
@@ -86,9 +88,10 @@ struct FileFinder::Watch {
     std::exception_ptr thrown; ///< by the search, for whoever waits
 };
 
-FileFinder::FileFinder(const QStringList &endings, Links links)
+FileFinder::FileFinder(const QStringList &endings, Links links, IsPart isPart)
     : m_endings(endings)
     , m_links(links)
+    , m_isPart(isPart)
 {}
 
 void FileFinder::forgetReports()
@@ -118,27 +121,38 @@ QString FileFinder::foundInsteadOf(const QString &path) const
 {
     for (const Place &other : m_otherPaths)
         if (isBelow(path, other.path))
-            return knownAs(moved(path, other.path, other.real));
+            return knownAs({path, moved(path, other.path, other.real)});
     // The link by which it is known may lie where this search did not look.
     const std::optional<QString> real =
         m_area.isLimited() && fileAnswers(path) ? realPath(path) : std::nullopt;
-    return real ? knownAs(*real) : QString();
+    return real ? knownAs({path, *real}) : QString();
 }
 
-/// The path under which something real was listed, or would have been.
-QString FileFinder::knownAs(const QString &real) const
+/// The path under which what lies at a place was listed, or would have been.
+QString FileFinder::knownAs(const Place &place) const
 {
-    const auto listed = m_listedByLink.constFind(pathKey(real));
-    return listed != m_listedByLink.constEnd() ? *listed : searchedAs(real);
+    const auto listed = m_listedByLink.constFind(listedKey(place.real, place.path));
+    return listed != m_listedByLink.constEnd() ? *listed : searchedAs(place.real);
 }
 
-/// Of a name or a path. What is called like an ending and no more is a folder for such files: "~/.vst3".
-bool FileFinder::isLookedFor(const QString &path) const
+/// The finder's ending that a name or a path has; null when it has none. What is called like an ending and no
+/// more is a folder for such files: "~/.vst3".
+QString FileFinder::endingOf(const QString &path) const
 {
     const int length = path.size() - (path.lastIndexOf(QLatin1Char('/')) + 1);
-    return std::any_of(m_endings.begin(), m_endings.end(), [&](const QString &ending) {
-        return length > ending.size() && path.endsWith(ending, Qt::CaseInsensitive);
+    const auto ending = std::find_if(m_endings.begin(), m_endings.end(), [&](const QString &each) {
+        return length > each.size() && path.endsWith(each, Qt::CaseInsensitive);
     });
+    return ending == m_endings.end() ? QString() : *ending;
+}
+
+bool FileFinder::isLookedFor(const QString &path) const { return !endingOf(path).isNull(); }
+
+/// A file is one for each ending: makers install one file for several formats, and link to it by as many
+/// names.
+QString FileFinder::listedKey(const QString &real, const QString &path) const
+{
+    return pathKey(real) + QLatin1Char('\n') + endingOf(path);
 }
 
 void FileFinder::setPatience(std::chrono::seconds limit, Waiting waiting)
@@ -255,7 +269,7 @@ bool FileFinder::waitFor(const std::shared_ptr<Watch> &watch, const Cancelled &i
 /// False when it ended early.
 bool FileFinder::search(const QStringList &folders, const Cancelled &isCancelled)
 {
-    FileFinder fresh(m_endings, m_links);
+    FileFinder fresh(m_endings, m_links, m_isPart);
     fresh.m_area = m_area;
     fresh.m_limit = m_limit;
     fresh.m_waiting = m_waiting;
@@ -320,14 +334,14 @@ void FileFinder::listStarts(const std::vector<Place> &starts)
     for (const Place &start : starts)
         if (isLookedFor(start.path) && isInArea(start, start.path) && QFileInfo::exists(start.path)) {
             m_found.append(start.path);
-            m_listedByLink.insert(pathKey(start.real), start.path);
+            m_listedByLink.insert(listedKey(start.real, start.path), start.path);
         }
 }
 
 /// Whether a start is a file that was listed, in which there is nothing to search.
 bool FileFinder::isListedFile(const Place &start) const
 {
-    return m_listedByLink.contains(pathKey(start.real)) && QFileInfo(start.path).isFile();
+    return m_listedByLink.contains(listedKey(start.real, start.path)) && QFileInfo(start.path).isFile();
 }
 
 /// Whether something below a start belongs to what is searched.
@@ -373,32 +387,38 @@ bool FileFinder::searchFolder(const Place &start, const QString &folder, const C
     for (const FolderEntry &entry : content.entries) {
         if (entry.isLink && m_links == Links::Followed)
             m_met.push_back({prefix + entry.name, entry.isFolder});
-        else if (isLookedFor(entry.name) && isInArea(start, prefix + entry.name) &&
-                 !wasReached(m_listedByLink, start, prefix + entry.name))
-            m_found.append(prefix + entry.name);
+        else if (isLookedFor(entry.name))
+            listEntry(start, prefix + entry.name);
     }
     for (const FolderEntry &entry : content.entries) {
         if (!entry.isFolder || entry.isLink)
             continue;
-        const QString path = prefix + entry.name;
-        if (mayHoldSome(start, path) && !wasReached(m_startsMet, start, path) &&
-            !searchFolder(start, path, isCancelled))
+        const Place place{prefix + entry.name, moved(prefix + entry.name, start.path, start.real)};
+        if (mayHoldSome(start, place.path) && !wasReached(m_startsMet, pathKey(place.real), place) &&
+            !searchFolder(start, place.path, isCancelled))
             return false;
     }
     return true;
 }
 
-/// Whether a path below a start leads to something that was reached by another path.
-bool FileFinder::wasReached(const Reached &reached, const Place &start, const QString &path)
+/// Lists what is looked for below a start, unless it was listed before.
+void FileFinder::listEntry(const Place &start, const QString &path)
 {
-    if (reached.isEmpty())
-        return false;
-    const QString real = moved(path, start.path, start.real);
-    const auto found = reached.constFind(pathKey(real));
+    const Place place{path, moved(path, start.path, start.real)};
+    if (!isInArea(start, path) || isPartOfOther(path) || (place.real != path && isPartOfOther(place.real)))
+        return;
+    if (m_listedByLink.isEmpty() || !wasReached(m_listedByLink, listedKey(place.real, path), place))
+        m_found.append(path);
+}
+
+/// Whether something was reached by another path, which is noted.
+bool FileFinder::wasReached(const Reached &reached, const QString &key, const Place &place)
+{
+    const auto found = reached.constFind(key);
     if (found == reached.constEnd())
         return false;
-    if (!isSamePath(*found, path))
-        m_otherPaths.push_back({path, real});
+    if (!isSamePath(*found, place.path))
+        m_otherPaths.push_back(place);
     return true;
 }
 
@@ -421,11 +441,13 @@ bool FileFinder::follow(const Link &link, const Cancelled &isCancelled)
     if (!mayHoldSome(place, link.path))
         return true;
     const bool isNew = searchedInAreaAs(place.real).isNull();
-    if (!isNew || m_listedByLink.contains(pathKey(place.real)))
+    const QString key = listedKey(place.real, link.path);
+    if (!isNew || m_listedByLink.contains(key))
         m_otherPaths.push_back(place);
-    if (isLookedFor(link.path) && !isListed(place) && isInArea(place, link.path)) {
+    if (isLookedFor(link.path) && !isPartOfOther(link.path) && !isListed(place) &&
+        isInArea(place, link.path)) {
         m_found.append(link.path);
-        m_listedByLink.insert(pathKey(place.real), link.path);
+        m_listedByLink.insert(key, link.path);
     }
     if (!link.isToFolder || !isNew)
         return true;
@@ -434,17 +456,14 @@ bool FileFinder::follow(const Link &link, const Cancelled &isCancelled)
     return searchFolder(place, place.path, isCancelled);
 }
 
-/// Whether what a link leads to was listed. Where it has another ending than the link, it was not, although
-/// its folder was searched.
+/// Whether what a link leads to was listed. Where it has another ending than the link, or is part of
+/// something else there, it was not, although its folder was searched.
 bool FileFinder::isListed(const Place &place) const
 {
-    if (m_listedByLink.contains(pathKey(place.real)))
+    if (m_listedByLink.contains(listedKey(place.real, place.path)))
         return true;
     const QString before = searchedInAreaAs(place.real);
-    return std::any_of(m_endings.begin(), m_endings.end(), [&](const QString &ending) {
-        return place.path.endsWith(ending, Qt::CaseInsensitive) &&
-               before.endsWith(ending, Qt::CaseInsensitive);
-    });
+    return endingOf(before) == endingOf(place.path) && !isPartOfOther(before);
 }
 
 /// The path under which the search of some start comes upon a real file or folder; null when none does.

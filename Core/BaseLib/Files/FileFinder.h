@@ -18,9 +18,12 @@ public:
     using Cancelled = std::function<bool()>;
     enum class Links { Followed, NotEntered };
 
+    /// Whether what lies at a path is part of something else, and so not looked for itself. Any thread.
+    using IsPart = bool (*)(const QString &path);
+
     /// `endings` are the ends of the names looked for, with their dots (".vst3"), compared without regard to
-    /// case.
-    explicit FileFinder(const QStringList &endings, Links links = Links::Followed);
+    /// case; no name has two of them. What `isPart` names is not listed; null: nothing is left out.
+    explicit FileFinder(const QStringList &endings, Links links = Links::Followed, IsPart isPart = nullptr);
 
     /// The full paths found that end in `ending`, one of the finder's, "/" as separator: those of a folder in
     /// the order of their names, followed by what lies in its sub-folders; what only links lead to comes
@@ -30,8 +33,9 @@ public:
     ///
     /// One of `folders` whose own name ends so is listed as well; it may be a file.
     ///
-    /// Each real folder is searched once, and each real file listed once, by the first path that leads there.
-    /// A link to one of `folders`, or to a folder around one, is passed over.
+    /// Each real folder is searched once, and each real file listed once for each ending under which it is
+    /// reached, by the first path that leads there. A link to one of `folders`, or to a folder around one, is
+    /// passed over.
     QStringList find(const QStringList &folders, const QString &ending,
                      const Cancelled &isCancelled = nullptr);
 
@@ -77,12 +81,16 @@ private:
         QString path;
         bool isToFolder;
     };
-    /// Paths by the keys of the real ones.
+    /// Paths by the keys of the real ones, or of what was listed.
     using Reached = QHash<QString, QString>;
 
     struct Watch;
 
+    QString endingOf(const QString &path) const;
     bool isLookedFor(const QString &path) const;
+    QString listedKey(const QString &real, const QString &path) const;
+    bool isPartOfOther(const QString &path) const { return m_isPart && m_isPart(path); }
+    void listEntry(const Place &start, const QString &path);
     bool isPassedOver(const QString &path);
     void addProblem(const QString &path, const QString &reason);
     bool searchPatiently(const QStringList &folders, const Cancelled &isCancelled);
@@ -90,19 +98,20 @@ private:
     bool search(const QStringList &folders, const Cancelled &isCancelled);
     std::vector<Place> settleStarts(const QStringList &folders);
     bool searchFolder(const Place &start, const QString &folder, const Cancelled &isCancelled);
-    bool wasReached(const Reached &reached, const Place &start, const QString &path);
+    bool wasReached(const Reached &reached, const QString &key, const Place &place);
     bool follow(const Link &link, const Cancelled &isCancelled);
     bool isListed(const Place &place) const;
     void listStarts(const std::vector<Place> &starts);
     bool isListedFile(const Place &start) const;
     bool isInArea(const Place &start, const QString &path) const;
     bool mayHoldSome(const Place &start, const QString &folder) const;
-    QString knownAs(const QString &real) const;
+    QString knownAs(const Place &place) const;
     QString searchedAs(const QString &real) const;
     QString searchedInAreaAs(const QString &real) const;
 
     QStringList m_endings;
     Links m_links;
+    IsPart m_isPart;
     SearchArea m_area;
     std::chrono::seconds m_limit{0};
     Waiting m_waiting;              ///< null: nobody waits with patience
@@ -118,7 +127,7 @@ private:
     std::vector<Place> m_otherPaths;
     Reached m_starts;       ///< where searches start: the folders, and those that links lead to
     Reached m_startsMet;    ///< those that another search comes upon; mostly empty, which saves a look-up
-    Reached m_listedByLink; ///< links that are looked for
+    Reached m_listedByLink; ///< links that are looked for, by `listedKey`
 };
 
 /// The paths that a new finder finds in one folder.

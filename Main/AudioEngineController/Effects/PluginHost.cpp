@@ -242,7 +242,7 @@ bool PluginHost::scanHosts(bool scan)
     for (const PluginFormatInfo &info : pluginFormats())
         if (info.isScanned())
             endings.append(info.moduleEnding);
-    const auto finder = std::make_shared<FileFinder>(endings);
+    const auto finder = std::make_shared<FileFinder>(endings, FileFinder::Links::Followed, isPartOfBundle);
     if (scan) {
         finder->setArea(
             {m_only.isEmpty() ? searchedOnly() : m_only, readFolderRules(effectsFolder()).excluded});

@@ -24,6 +24,23 @@ const PluginFormatInfo *infoOfPrefix(const QString &prefix)
     return find([&](const PluginFormatInfo &info) { return prefix == QLatin1String(info.prefix); });
 }
 
+/// Where the path of the innermost folder ends that has the ending of bundles and `behind` follows; 0 when
+/// there is none. A folder that is called like the ending and no more is no bundle, but one for such:
+/// "~/.vst3".
+int bundleEnd(const QString &path, const QString &behind)
+{
+    int end = 0;
+    for (const PluginFormatInfo &info : pluginFormats()) {
+        const QString boundary = info.moduleEnding + behind;
+        int place = info.hasBundles ? path.lastIndexOf(boundary, -1, Qt::CaseInsensitive) : -1;
+        while (place > 0 && path.at(place - 1) == QLatin1Char('/'))
+            place = path.lastIndexOf(boundary, place - 1, Qt::CaseInsensitive);
+        if (place > 0)
+            end = std::max(end, place + info.moduleEnding.size());
+    }
+    return end;
+}
+
 } // namespace
 
 const std::vector<PluginFormatInfo> &pluginFormats()
@@ -56,24 +73,17 @@ const PluginFormatInfo *formatOfKey(const QString &key)
 
 QString bundleOf(const QString &path)
 {
-    int end = 0;
-    for (const PluginFormatInfo &info : pluginFormats()) {
-        if (!info.hasBundles)
-            continue;
-        const QString boundary = info.moduleEnding + QLatin1String(kBundleContents) + QLatin1Char('/');
-        const int place = path.lastIndexOf(boundary, -1, Qt::CaseInsensitive);
-        if (place >= 0)
-            end = std::max(end, place + info.moduleEnding.size());
-    }
-    return path.left(end);
+    return path.left(bundleEnd(path, QLatin1String(kBundleContents) + QLatin1Char('/')));
 }
 
-bool isBelowBundle(const QString &path)
+bool isBelowBundle(const QString &path) { return bundleEnd(path, QStringLiteral("/")) > 0; }
+
+bool isPartOfBundle(const QString &path)
 {
     const PluginFormatInfo *const info = find([&](const PluginFormatInfo &each) {
-        return each.hasBundles && path.contains(each.moduleEnding + QLatin1Char('/'), Qt::CaseInsensitive);
+        return each.isScanned() && path.endsWith(each.moduleEnding, Qt::CaseInsensitive);
     });
-    return info != nullptr;
+    return info && !info->hasBundles && isBelowBundle(path);
 }
 
 PluginFormat formatOfPrefix(const QString &prefix)

@@ -56,6 +56,8 @@ inline constexpr char kBundleContents[] = "/Contents";
 QString bundleOf(const QString &path);
 /// Whether a file lies in a folder that has the ending of bundles, whole ones or not.
 bool isBelowBundle(const QString &path);
+/// Whether a path is that of a plain module in such a folder: a part of what the folder stands for.
+bool isPartOfBundle(const QString &path);
 
 /// The format that a prefix names; the prefix is compared whole and case-sensitively.
 PluginFormat formatOfPrefix(const QString &prefix);
