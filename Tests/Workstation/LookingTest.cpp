@@ -100,6 +100,7 @@ TEST_F(Looking, EverythingIsToldOfOnePlugin)
     put("Bare.vst3", "answer get-factory null\n");
     m_folder.write("Plugins/Empty.vst3", {}); // looked at again at each scan
     scan();
+    EXPECT_FALSE(run({"--list"}).standardOutput.contains("Problem")) << "also not of a shell";
     const struct {
         QString name;
         int exitCode;
