@@ -194,7 +194,6 @@ private:
         const QString child = childOf(record.path, number);
         if (isLeftOut) { // killed here, or where the file lay before
             EXPECT_TRUE(m_deadly.count(fileNameOf(child))) << qPrintable(child);
-            m_culprits.insert(child);
             record.id.clear();
             record.enabled = record.working = false;
             return;
@@ -356,6 +355,9 @@ private:
                     << "marks of a file";
                 continue;
             }
+            const QString child = childOf(record.path, number);
+            if (!record.working && m_deadly.count(fileNameOf(child)))
+                m_culprits.insert(child); // it killed where the file lay before, and was left out
             const auto file = m_files.find(record.path);
             const bool isKnown = file != m_files.end();
             const bool isBetter =
@@ -480,9 +482,11 @@ private:
             unplug(QChar('a' + pick(3)));
         else if (kind == "remove" && QFile::remove(path))
             leave(path);
-        else if (kind == "move" && QFile::rename(path, target))
+        else if (kind == "move" && QFile::rename(path, target)) {
             move(path, target);
-        else if (kind == "copy" && QFile::copy(path, target))
+            if (pick(2) == 0) // an installer brings another version
+                update(target);
+        } else if (kind == "copy" && QFile::copy(path, target))
             (m_files[target] = m_files[path]).kept.clear();
     }
     void install(const QString &target)
