@@ -2,6 +2,8 @@
 
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueLines.h"
 
+#include <QDir>
+
 namespace {
 
 EffectRecord readRecord(const CatalogueFormat &format, const XMLElement &effect)
@@ -86,6 +88,11 @@ CatalogueContents readCatalogueFile(const CatalogueFormat &format, const QString
         contents.reason = document.error();
         contents.records = std::move(lines.records);
         haveAskedAgain(contents.records);
+    }
+    for (EffectRecord &record : contents.records) {
+        const QString clean = QDir::fromNativeSeparators(record.path); // as other writers may have it
+        contents.isAsWritten &= clean == record.path;
+        record.path = clean;
     }
     upgrade(format, parseDecimal(version.value_or(QString::fromLatin1(format.version))), fileTimeOf,
             contents);

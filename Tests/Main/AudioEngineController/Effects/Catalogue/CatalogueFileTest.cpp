@@ -5,6 +5,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/VSTCatalogue.h"
 #include "Tests/Support/QtPrinters.h"
 
+#include <QDir>
 #include <QTemporaryDir>
 
 #include <gtest/gtest.h>
@@ -52,6 +53,11 @@ TEST_F(CatalogueReading, ValuesThatAreAbsentOrNoNumbers)
         <Effect><Inputs> +7 junk</Inputs><Outputs>x</Outputs><Enabled>2</Enabled><Working>no</Working></Effect>
         </Effects>)")
                              .records;
+    const QByteArray path = QDir::toNativeSeparators("a/b").toUtf8(); // as other writers have it
+    EXPECT_EQ(read(vst3CatalogueFormat(), "<Effects><Effect><Path>" + path + "</Path></Effect></Effects>")
+                  .records.at(0)
+                  .path,
+              "a/b");
     ASSERT_EQ(records.size(), 2u);
     EXPECT_EQ(records[0].inputs, -1);
     EXPECT_EQ(records[0].category, 0u);
