@@ -5,7 +5,9 @@
 
 #include <clocale>
 #include <csignal>
+#include <cstddef>
 
+#include <pthread.h>
 #include <pwd.h>
 #include <sys/resource.h>
 #include <unistd.h>
@@ -15,6 +17,22 @@
 #endif
 
 namespace {
+
+/// In bytes, as much as the system keeps free below the process's first stack (stack_guard_gap in the
+/// kernel's list of parameters).
+constexpr std::size_t kStackGuard = std::size_t(1024) * 1024;
+
+/// By default a single page lies between the stacks of two threads: a plug-in's recursion with larger frames
+/// steps over it and goes on in the other thread's stack.
+void widenStackGuards()
+{
+    pthread_attr_t attributes;
+    if (pthread_getattr_default_np(&attributes) != 0)
+        return;
+    pthread_attr_setguardsize(&attributes, kStackGuard);
+    pthread_setattr_default_np(&attributes);
+    pthread_attr_destroy(&attributes);
+}
 
 /// No core file, and nothing for a crash reporter: a limit of 0 still feeds a reporter behind a pipe, a limit
 /// of 1 byte does neither (core(5)).
@@ -58,6 +76,7 @@ void prepareProcess()
 {
     giveHome();
     suppressCoreDumps();
+    widenStackGuards();
     std::signal(SIGPIPE, SIG_IGN);
     std::signal(SIGXFSZ, SIG_IGN); // a file that grows too large fails to be written, as on a full disk
     // File names are bytes; read as UTF-8 they also survive where the locale is "C".

@@ -1,3 +1,4 @@
+#include "Core/BaseLib/Process/ManualResetEvent.h"
 #include "Tests/Core/BaseLib/Process/GuardedOutcome.h"
 
 #include <csignal>
@@ -40,13 +41,21 @@ TEST(FaultGuard, FaultsBecomeExceptionsAgainAndAgain)
     worker.join();
 }
 
+// The other thread's stack is the next one below.
 TEST(FaultGuard, ContainsTheFirstStackOverflowOfAThreadWhateverTheFrames)
 {
     int (*const recursions[])(int) = {overflowStack<256>, overflowStack<1024>, overflowStack<2048>,
                                       overflowStack<8192>, overflowStack<65536>};
     for (std::size_t row = 0; row < std::size(recursions); ++row) {
         std::string result = "the thread was ended";
-        std::thread([&] { result = outcome([&] { recursions[row](0); }); }).join();
+        ManualResetEvent begun, ended;
+        std::thread overflowing([&] {
+            begun.waitFor(std::chrono::hours(1));
+            result = outcome([&] { recursions[row](0); });
+            ended.set();
+        });
+        std::thread([&] { begun.set(), ended.waitFor(std::chrono::hours(1)); }).join();
+        overflowing.join();
         EXPECT_EQ(result, kOverflowOutcome) << "row " << row;
     }
 }
