@@ -24,6 +24,12 @@ void writeToInvalidAddress()
     *reinterpret_cast<volatile int *>(address) = 1;
 }
 
+void callNothing()
+{
+    void (*volatile function)() = nullptr;
+    function(); // NOLINT(clang-analyzer-core.CallAndMessage): that is the fault
+}
+
 void divideByZero()
 {
     volatile int dividend = 1, zero = 0;
@@ -97,6 +103,7 @@ bool commitFault(const std::string &kind)
 {
     static const std::map<std::string, void (*)()> faults = {
         {"segv", writeToInvalidAddress},
+        {"call-null", callNothing},
         {"abort", [] { std::abort(); }},
         {"exit", [] { std::exit(0); }},
         {"_exit", [] { endProcess(0); }},

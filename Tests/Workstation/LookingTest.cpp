@@ -95,7 +95,7 @@ TEST_F(Looking, EverythingIsToldOfOnePlugin)
     put("Comp.vst3", "class Comp\nsubcategories Fx|Dynamics\n");
     const QString copy = put("later/Comp.vst3", "class Comp\n");
     put("Shell.vst2", "child 1 One\nchild 2 Two\nfault entry abort Two\n");
-    put("Crash.vst3", "fault initialize segv\n");
+    put("Crash.vst3", "fault initialize call-null\n");
     put("Null.vst2", "answer entry null\n");
     put("Bare.vst3", "answer get-factory null\n");
     m_folder.write("Plugins/Empty.vst3", {}); // looked at again at each scan

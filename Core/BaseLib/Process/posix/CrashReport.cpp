@@ -12,6 +12,7 @@
 
 #include <execinfo.h>
 #include <fcntl.h>
+#include <sys/uio.h>
 #include <ucontext.h>
 #include <unistd.h>
 
@@ -40,6 +41,19 @@ bool isStackOverflow(const siginfo_t *info, const void *context)
     constexpr quint64 kNear =
         quint64(64) * 1024; // more than any frame that is entered without a look at its end
     return reinterpret_cast<quint64>(info->si_addr) + kNear - registerOf(context, REG_RSP) < 2 * kNear;
+}
+
+/// Where a call led to no code, the place behind the call: it is on top of the stack. 0 for any other fault.
+quint64 callerOf(int signalNumber, const siginfo_t *info, const void *context)
+{
+    const bool isInCode = reinterpret_cast<quint64>(info->si_addr) != registerOf(context, REG_RIP);
+    if (signalNumber != SIGSEGV || isInCode)
+        return 0;
+    quint64 caller = 0;
+    const iovec target = {&caller, sizeof caller};
+    const iovec stack = {reinterpret_cast<void *>(registerOf(context, REG_RSP)), sizeof caller};
+    // By way of the system, which fails where the stack is damaged.
+    return process_vm_readv(getpid(), &target, 1, &stack, 1, 0) == sizeof caller ? caller : 0;
 }
 
 const char *wordsOf(int signalNumber, const siginfo_t *info, const void *context)
@@ -174,14 +188,16 @@ void describeFault(int signalNumber, const siginfo_t *info, const void *context,
 {
     CrashText text;
     text << wordsOf(signalNumber, info, context);
-    const bool isFault = info->si_code > 0; // not sent by a process (sigaction(2))
-    if (isFault && (signalNumber == SIGSEGV || signalNumber == SIGBUS))
+    const bool isFault = info->si_code > 0;                        // not sent by a process (sigaction(2))
+    const bool hasAddress = isFault && info->si_code != SI_KERNEL; // which is told of no address
+    if (hasAddress && (signalNumber == SIGSEGV || signalNumber == SIGBUS))
         text << " at " << reinterpret_cast<quint64>(info->si_addr);
+    const quint64 caller = hasAddress ? callerOf(signalNumber, info, context) : 0;
     CrashPlaces places;
-    places[0].address = registerOf(context, REG_RIP);
+    places[0].address = caller != 0 ? caller : registerOf(context, REG_RIP);
     if (isFault) {
         locate(places, 1);
-        text << " in " << places[0];
+        text << (caller != 0 ? ", called from " : " in ") << places[0];
     }
     text.copyTo(words, size);
 }
@@ -196,7 +212,12 @@ void describeCrash(int signalNumber, const siginfo_t *info, const void *context)
     static CrashPlaces frames;
     // Before the frames are looked for, which may be a fault of its own in a stack that is damaged.
     print(crashText(words, frames, 0, isOwnThread));
-    const std::size_t count = framesFrom(registerOf(context, REG_RIP), frames);
+    std::size_t count = framesFrom(registerOf(context, REG_RIP), frames);
+    // Nothing leads on from where there is no code.
+    if (const quint64 caller = callerOf(signalNumber, info, context)) {
+        frames[0].address = caller;
+        count = 1;
+    }
     locate(frames, count);
     if (count > 0)
         print(crashText(words, frames, count, isOwnThread));

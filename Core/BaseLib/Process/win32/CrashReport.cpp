@@ -39,6 +39,24 @@ const char *wordsOf(DWORD code)
     }
 }
 
+/// What a frame without a table returns to; 0 where the stack is damaged.
+quint64 topOfStack(const CONTEXT &context)
+{
+    const auto *top = reinterpret_cast<const quint64 *>(context.Rsp);
+    MEMORY_BASIC_INFORMATION memory = {};
+    const bool isStack = context.Rsp % sizeof *top == 0 && VirtualQuery(top, &memory, sizeof memory) != 0 &&
+                         memory.State == MEM_COMMIT && memory.Protect == PAGE_READWRITE;
+    return isStack ? *top : 0;
+}
+
+/// Where a call led to no code, the place behind the call. 0 for any other fault.
+quint64 callerOf(const EXCEPTION_RECORD &record, const CONTEXT &context)
+{
+    const bool isInCode = record.ExceptionCode != EXCEPTION_ACCESS_VIOLATION || record.NumberParameters < 2 ||
+                          record.ExceptionInformation[1] != context.Rip;
+    return isInCode ? 0 : topOfStack(context);
+}
+
 /// Tells of a place which module it lies in.
 void locate(CrashPlace &place)
 {
@@ -64,8 +82,13 @@ std::size_t framesFrom(CONTEXT context, CrashPlaces &frames)
         locate(frames[count++]);
         DWORD64 base = 0;
         PRUNTIME_FUNCTION function = RtlLookupFunctionEntry(context.Rip, &base, nullptr);
-        if (!function) // a leaf: the return address is all that is on the stack
+        if (!function && count > 1) // only the innermost function may go without
             break;
+        if (!function) {
+            context.Rip = topOfStack(context);
+            context.Rsp += sizeof context.Rip;
+            continue;
+        }
         void *handlerData = nullptr;
         DWORD64 frame = 0;
         RtlVirtualUnwind(UNW_FLAG_NHANDLER, base, context.Rip, function, &context, &handlerData, &frame,
@@ -85,19 +108,24 @@ LONG WINAPI describe(EXCEPTION_POINTERS *fault)
     if (s_isDescribing.test_and_set())
         return EXCEPTION_CONTINUE_SEARCH;
     static char words[512];
-    describeFault(*fault->ExceptionRecord, words, sizeof words);
+    CONTEXT context = *fault->ContextRecord;
+    describeFault(*fault->ExceptionRecord, context, words, sizeof words);
     static CrashPlaces frames;
     const bool isOwnThread = GetCurrentThreadId() != s_thread;
     // Before the frames are looked for, which may be a fault of its own in a stack that is damaged.
     print(crashText(words, frames, 0, isOwnThread));
-    const std::size_t count = framesFrom(*fault->ContextRecord, frames);
+    if (const quint64 caller = callerOf(*fault->ExceptionRecord, context)) {
+        context.Rip = caller;
+        context.Rsp += sizeof caller;
+    }
+    const std::size_t count = framesFrom(context, frames);
     print(crashText(words, frames, count, isOwnThread));
     return EXCEPTION_CONTINUE_SEARCH;
 }
 
 } // namespace
 
-void describeFault(const EXCEPTION_RECORD &record, char *words, std::size_t size)
+void describeFault(const EXCEPTION_RECORD &record, const CONTEXT &context, char *words, std::size_t size)
 {
     static std::atomic_flag isAtWork = ATOMIC_FLAG_INIT; // of several threads one is described whole
     const DWORD code = record.ExceptionCode;
@@ -108,10 +136,11 @@ void describeFault(const EXCEPTION_RECORD &record, char *words, std::size_t size
     else if (wordsOf(code) == wordsOf(0))
         text << " " << static_cast<quint64>(code);
     if (!isAtWork.test_and_set()) {
+        const quint64 caller = callerOf(record, context);
         CrashPlace place;
-        place.address = reinterpret_cast<quint64>(record.ExceptionAddress);
+        place.address = caller != 0 ? caller : reinterpret_cast<quint64>(record.ExceptionAddress);
         locate(place);
-        text << " in " << place;
+        text << (caller != 0 ? ", called from " : " in ") << place;
         isAtWork.clear();
     }
     text.copyTo(words, size);

@@ -55,7 +55,7 @@ void fxprobeGuardReturn();
                     dispatcher->HistoryTable);
     } else if (guard->watch == FaultGuardDetail::Watch::FaultsAndForeignExceptions) {
         guard->code = record->ExceptionCode;
-        describeFault(*record, guard->text, sizeof guard->text);
+        describeFault(*record, *context, guard->text, sizeof guard->text);
         // Not unwound: after a fault the plug-in's state is unknown, and an overflowed stack has no room.
         RtlRestoreContext(&guard->context, nullptr);
     }
