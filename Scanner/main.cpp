@@ -1,6 +1,7 @@
 #include "Core/BaseLib/Log/DebugLog.h"
 #include "Core/BaseLib/Process/ProcessSetup.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeChannel.h"
+#include "Main/VLib/QtWarnings.h"
 #include "Scanner/ProbeWorker.h"
 #include "Scanner/ScannerEntry.h"
 #include "Scanner/ScannerHelp.h"
@@ -21,6 +22,7 @@ int main(int argc, char **argv)
         settleLocale();
         exitCode = runProbeWorker();
     } else {
+        traceQtWarnings();
         // Sizes are those of an ordinary display; also 150% must give neither 100% nor 200%.
         QApplication::setAttribute(Qt::AA_EnableHighDpiScaling);
         QApplication::setHighDpiScaleFactorRoundingPolicy(Qt::HighDpiScaleFactorRoundingPolicy::PassThrough);

@@ -37,6 +37,7 @@ constexpr wchar_t kThreadEnded[] = L"The scan's thread was ended by a plug-in";
 /// blamed.
 void endWithoutScreen(StatusHandover &status)
 {
+    DebugLog(L"The connection to the screen broke");
     status.setClosing();
     TerminationSignal::raise();
     while (!status.isFinished())

@@ -58,10 +58,10 @@ TEST_F(NoScreen, DoesNotKeepTheScannerFromItsWork)
     for (const auto &row : rows) {
         SCOPED_TRACE(row.name);
         QFile::remove(cataloguePath());
-        EXPECT_TRUE(scanOnce({{"QT_QPA_PLATFORM", row.platform},
-                              {"DISPLAY", row.display},
-                              {"WAYLAND_DISPLAY", row.wayland}})
-                        .succeeded());
+        const ScannerOutcome outcome = scanOnce(
+            {{"QT_QPA_PLATFORM", row.platform}, {"DISPLAY", row.display}, {"WAYLAND_DISPLAY", row.wayland}});
+        EXPECT_TRUE(outcome.succeeded());
+        EXPECT_EQ(outcome.standardError, "");
         EXPECT_EQ(records("Name"), QStringList(kComp));
     }
 }
