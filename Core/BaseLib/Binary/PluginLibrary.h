@@ -32,6 +32,8 @@ public:
     bool freeUnlessRunning();
 
     bool isLoaded() const { return m_handle != nullptr; }
+    /// What was loaded last; empty before.
+    const QString &path() const { return m_path; }
     /// The system's handle, or null.
     void *handle() const { return m_handle; }
     /// Why the last load failed, as a phrase about "it": libraries that it needs, or the system's message.

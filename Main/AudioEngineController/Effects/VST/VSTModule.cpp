@@ -66,7 +66,7 @@ VSTLoadResult VSTModule::enter(VSTHostCallbackFunction callback, IVSTEffectOwner
         return takeOver(callGuarded([&] { return entryPoint(callback); }), owner);
     } catch (const SEException &fault) {
         m_faulted = true;
-        DebugLog(L"The VST plug-in's entry point failed: %s, %ls", fault.what(), fault.words());
+        DebugLog(L"%ls: the entry point failed: %s, %ls", m_library.path(), fault.what(), fault.words());
         return failed(Status::EntryFailed,
                       QStringLiteral("it crashed when it was started (%1)").arg(fault.words()));
     } catch (...) {
@@ -78,7 +78,7 @@ VSTLoadResult VSTModule::takeOver(AEffect *effect, IVSTEffectOwner &owner)
 {
     if (!effect)
         return entryFailed(Status::NoEffect, QStringLiteral("returned null"));
-    VSTEffect taken(effect);
+    VSTEffect taken(effect, m_library.path());
     if (!taken.isEffect())
         return invalidEffect();
     const auto known = std::find_if(m_handedOut.begin(), m_handedOut.end(),

@@ -101,7 +101,7 @@ bool VSTEffect::setOwner(IVSTEffectOwner *owner)
         return true;
     } catch (const SEException &fault) {
         *m_faulted = true;
-        DebugLog(L"A VST plug-in's effect cannot be written to: %s", fault.what());
+        DebugLog(L"%ls: its effect cannot be written to: %s", m_path, fault.what());
     }
     return false;
 }
@@ -179,9 +179,9 @@ bool VSTEffect::guard(const char *what, int number, Call &&call)
         return true;
     } catch (const SEException &fault) {
         *m_faulted = true;
-        DebugLog(L"VST plug-in %s %d: %s, %ls", what, number, fault.what(), fault.words());
+        DebugLog(L"%ls: %s %d: %s, %ls", m_path, what, number, fault.what(), fault.words());
     } catch (...) {
-        DebugLog(L"VST plug-in %s %d %ls", what, number, guardedThrownText());
+        DebugLog(L"%ls: %s %d %ls", m_path, what, number, guardedThrownText());
     }
     return false;
 }

@@ -5,6 +5,7 @@
 
 #include <QByteArray>
 #include <QRect>
+#include <QString>
 
 #include <atomic>
 #include <memory>
@@ -30,8 +31,10 @@ public:
     };
 
     VSTEffect() = default;
-    explicit VSTEffect(AEffect *effect)
+    /// `path` is the module's, for the log.
+    explicit VSTEffect(AEffect *effect, const QString &path = QString())
         : m_plugin(effect)
+        , m_path(path)
         , m_faulted(std::make_shared<std::atomic<bool>>(false))
     {}
 
@@ -100,6 +103,7 @@ private:
                                   float number);
 
     AEffect *m_plugin = nullptr;
+    QString m_path;
     std::shared_ptr<std::atomic<bool>> m_faulted; ///< set by whatever thread the plug-in was called on
 };
 

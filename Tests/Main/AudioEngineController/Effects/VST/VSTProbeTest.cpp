@@ -72,6 +72,7 @@ childless ~ category 10 ~ it is a shell and lists no sub-plug-ins ~ load start a
         EXPECT_EQ(outcome.records.size(), isListed ? 1u : 0u);
         EXPECT_EQ(outcome.faulted, row.value(4) == "faulted");
         EXPECT_EQ(outcome.leftThreads, row.value(4) == "left threads");
+        EXPECT_TRUE(!row[0].startsWith("call ") || m_log.lines().last().contains('/' + row[0] + '.'));
         EXPECT_FALSE(m_log.contains("VSTPlugin::Load")) << "that is said of known plug-ins";
     }
 }
