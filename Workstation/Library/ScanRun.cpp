@@ -28,7 +28,8 @@ bool ScanRun::isDoneAfterOnce()
     show(m_account);
     if (m_account.isFinished() && !m_cancelled)
         return true;
-    if (m_cancelled && m_reason.isEmpty())
+    const bool wasCancelled = m_account.hasGivenUp() && m_account.problems().isEmpty();
+    if ((m_cancelled || wasCancelled) && m_reason.isEmpty())
         m_reason = QStringLiteral("the scan was cancelled; what was found until then is kept");
     else if (m_account.isBusy())
         m_reason = QStringLiteral("another scanner is at work on the same folder");

@@ -34,6 +34,7 @@ void ScanAccount::takeLine(const ReportLine &line)
     // A clock that was set back meanwhile must not turn anything round.
     m_lastTime = std::max(m_lastTime, line.time - m_began);
     m_finished = line.event == Event::Finished;
+    m_givenUp = line.event == Event::Ended;
     m_busy = line.event == Event::Busy;
     m_looking = line.event == Event::Looking ? line.path : QString();
     switch (line.event) {

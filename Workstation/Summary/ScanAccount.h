@@ -100,6 +100,9 @@ public:
 
     /// The last scanner wrote all its catalogues.
     bool isFinished() const { return m_finished; }
+    /// The last scanner ended as it should without having finished; where `problems` tells nothing, because
+    /// somebody cancelled it: its window was closed, for example.
+    bool hasGivenUp() const { return m_givenUp; }
     /// The last scanner found another one at work.
     bool isBusy() const { return m_busy; }
     /// The folder, or link, for which the search waits; empty when it waits for none.
@@ -142,5 +145,6 @@ private:
     int m_done = 0;
     int m_planned = 0;
     bool m_finished = false;
+    bool m_givenUp = false;
     bool m_busy = false;
 };

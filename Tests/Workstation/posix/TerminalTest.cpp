@@ -1,4 +1,4 @@
-#include "Tests/Support/ScanBench.h"
+#include "Tests/Workstation/FxScanBench.h"
 
 #include <QDeadlineTimer>
 #include <QFile>
@@ -6,6 +6,7 @@
 #include <QThread>
 
 #include <array>
+#include <csignal>
 #include <vector>
 
 #include <poll.h>
@@ -115,6 +116,17 @@ TEST_F(FxScanOnTerminal, SaysInWhichFolderItWaits)
     EXPECT_TRUE(m_shown.contains("\rLooking in ") || m_shown.contains("KLooking in ")) << m_shown.constData();
     EXPECT_TRUE(m_shown.contains(" s of 60)")) << m_shown.constData();
     EXPECT_TRUE(remains().startsWith("FORMAT")) << qPrintable(remains());
+}
+
+TEST_F(FxScanBench, AScanThatIsCancelledInItsScannerSaysSo)
+{
+    ASSERT_TRUE(startHanging("fault initialize hang\n"));
+    for (const qint64 scanner : m_fxscan.children())
+        kill(static_cast<pid_t>(scanner), SIGTERM);
+    const ScannerOutcome &outcome = m_fxscan.wait();
+    EXPECT_EQ(outcome.exitCode, 3);
+    EXPECT_TRUE(outcome.standardError.contains("the scan was cancelled"))
+        << outcome.standardError.constData();
 }
 
 TEST_F(FxScanOnTerminal, IsPutBackHoweverTheScanEnds)
