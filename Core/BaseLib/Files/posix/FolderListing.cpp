@@ -82,7 +82,8 @@ FolderContent readFolder(const QString &folder, const MayFollow &mayFollow)
             add(content, descriptor, *entry, mayFollow);
             place += entry->d_reclen;
         }
-    if (filled < 0)
+    // Names alone may be read of a folder that is closed otherwise: nothing in it can be opened.
+    if (filled < 0 || faccessat(descriptor, ".", X_OK, 0) != 0)
         content.problem = qt_error_string(errno);
     close(descriptor);
     return content;
