@@ -48,8 +48,11 @@ std::string textOf(const FixtureSubject &described, const char *key, const char 
 
 tresult resultAt(const std::string &stage, const FixtureSubject &subject)
 {
-    static const std::map<std::string, tresult> names = {
-        {"", kResultOk}, {"null", kResultOk}, {"false", kResultFalse}, {"internal-error", kInternalError}};
+    static const std::map<std::string, tresult> names = {{"", kResultOk},
+                                                         {"null", kResultOk},
+                                                         {"blank", kResultOk},
+                                                         {"false", kResultFalse},
+                                                         {"internal-error", kInternalError}};
     const std::string answer = script().answer(stage, subject);
     const auto named = names.find(answer);
     return named != names.end() ? named->second : numberOf(answer);
@@ -83,7 +86,7 @@ tresult describe(const char *stage, int32 index, Info &info)
     const FixtureSubject &described = subjects[static_cast<std::size_t>(index) + 1];
     script().reach(stage, described);
     const tresult result = resultAt(stage, described);
-    if (result != kResultOk)
+    if (result != kResultOk || script().answer(stage, described) == "blank")
         return result;
     idOf(described).toTUID(info.cid);
     info.cardinality = PClassInfo::kManyInstances;

@@ -83,7 +83,8 @@ void ModuleListing::listFactory()
             m_observer.classAnnounced();
     }
     if (outcome.records.empty())
-        outcome.fail(QStringLiteral("it lists no plug-in among its %1").arg(count));
+        outcome.fail(count == 0 ? QStringLiteral("its factory lists no plug-ins")
+                                : QStringLiteral("none of its plug-ins has a descriptor that can be used"));
 }
 
 void ModuleListing::listPlugin(const clap_plugin_factory &factory, const clap_plugin_descriptor &descriptor)

@@ -26,7 +26,7 @@ constexpr int32 kMaxClasses = 0x10000;
 
 /// What a factory tells of a class.
 struct ClassInfo {
-    bool isOrdinary = false; ///< the oldest form tells of it
+    bool isOrdinary = false; ///< the oldest form tells of it, if perhaps not its name
     bool isAudio = false;
     QString name;
     FUID id;
@@ -68,33 +68,51 @@ ClassInfo classInfo(IPluginFactory &factory, int32 index)
     ClassInfo read;
     PClassInfo info;
     clear(info);
-    const tresult result = factory.getClassInfo(index, &info);
-    read.isOrdinary = result == kResultOk || isFilled(info);
+    factory.getClassInfo(index, &info);
+    read.isOrdinary = isFilled(info);
     readBasics(read, info);
     return read;
 }
 
+/// Takes from a newer form what the oldest one leaves open: the class, or its name, which may have no 8-bit
+/// form.
+template <typename Info>
+void readMissing(ClassInfo &read, const Info &info)
+{
+    if (!read.isOrdinary && isFilled(info))
+        readBasics(read, info);
+    else if (read.name.isEmpty())
+        read.name = fixedText(info.name);
+}
+
 /// Asks the newer forms. An ordinary class has its details from the second; the third is asked as hosts do,
-/// and not used. A class that the oldest form does not tell of is what the richest other one says.
+/// for a name at most. A class that the oldest form does not tell of is what the richest other one says.
 void askNewerForms(ClassInfo &read, IPluginFactory &factory, int32 index)
 {
     if (const FUnknownPtr<IPluginFactory2> factory2(&factory); factory2) {
         PClassInfo2 info;
         clear(info);
         factory2->getClassInfo2(index, &info);
-        if (!read.isOrdinary && isFilled(info))
-            readBasics(read, info);
+        readMissing(read, info);
         readDetails(read, info);
     }
     if (const FUnknownPtr<IPluginFactory3> factory3(&factory); factory3) {
         PClassInfoW info;
         clear(info);
         factory3->getClassInfoUnicode(index, &info);
-        if (!read.isOrdinary && isFilled(info)) {
-            readBasics(read, info);
+        readMissing(read, info);
+        if (!read.isOrdinary && isFilled(info))
             readDetails(read, info);
-        }
     }
+}
+
+/// Why a factory with so many classes lists nothing.
+QString noneAmong(int32 count)
+{
+    if (count <= 0)
+        return QStringLiteral("its factory lists no classes");
+    return count == 1 ? QStringLiteral("its only class is not an audio plug-in")
+                      : QStringLiteral("none of its %1 classes is an audio plug-in").arg(count);
 }
 
 /// What an initialised component and the factory say of its class.
@@ -178,7 +196,7 @@ void ModuleListing::listFactory(ClassListing &records, bool notifyEachClass, boo
     const int32 count = factory->countClasses();
     for (int32 index = 0; index < std::min(count, kMaxClasses); ++index) {
         ClassInfo info = classInfo(*factory, index);
-        if (!info.isOrdinary || isNew(info))
+        if (!info.isOrdinary || isNew(info) || (info.isAudio && info.name.isEmpty()))
             askNewerForms(info, *factory, index);
         if (!isNew(info))
             continue;
@@ -187,7 +205,7 @@ void ModuleListing::listFactory(ClassListing &records, bool notifyEachClass, boo
             m_observer.classAnnounced();
     }
     if (records.empty())
-        m_outcome.fail(QStringLiteral("it lists no audio plug-in among its %1 classes").arg(count));
+        m_outcome.fail(noneAmong(count));
     factory->release(); // not when the plug-in threw: its state is unknown then
 }
 

@@ -22,9 +22,9 @@ TEST_F(CLAPProbeTest, OutcomesAndWhatTheObserverHears)
 six ~ class 1 / class 2 / class 3 / class 4 / class 5 / class 6 ~ load start ask 1 2 3 4 5 6 close ~ 1 2 3 4 5 6:
 seven are announced ~ class A / class A / answer plugin-count 7 ~ load start ask A ! close ~ A:
 a count too high ~ class A / answer plugin-count -1 ~ load start ask A ! close ~ A:
-none ~ answer plugin-count 0 ~ load start ask close ~ record: it lists no plug-in among its 0
+none ~ answer plugin-count 0 ~ load start ask close ~ record: its factory lists no plug-ins
 no descriptor ~ class A / class B / answer descriptor null A ~ load start ask B close ~ B:
-older descriptor ~ class A / older ~ load start ask close ~ record: it lists no plug-in among its 1
+older descriptor ~ class A / older ~ load start ask close ~ record: none of its plug-ins has a descriptor that can be used
 no identifier ~ class A / null id / class B ~ load start ask B close ~ B: its plug-in "A" has no identifier
 not created ~ class A / class B / answer create-plugin null A ~ load start ask A B close ~ B: its plug-in "A" could not be created
 not initialised ~ class A / answer init false ~ load start ask A close ~ record: its plug-in "A" could not be initialised

@@ -25,17 +25,17 @@ six ~ class 1 / class 2 / class 3 / class 4 / class 5 / class 6 ~ load start ask
 seven are announced ~ class A / answer count-classes 7 ~ load start ask A ! close ~ A:
 a name twice ~ class A / class A / class C ~ load start ask A C close ~ A C:
 a count too high ~ class A / answer count-classes 2147483647 ~ load start ask A ! close ~ A:
-a negative count ~ answer count-classes -5 ~ load start ask close ~ record: it lists no audio plug-in among its -5 classes
+a negative count ~ answer count-classes -5 ~ load start ask close ~ record: its factory lists no classes
 not initialised ~ class A / class B / answer initialize false A ~ load start ask A B close ~ B: its class "A" could not be initialised (result 0x00000001)
 not created ~ class A / answer create-instance null ~ load start ask A close ~ record: its class "A" could not be created (result 0x00000000)
-controller ~ class 1 / category "Component Controller Class" ~ load start ask close ~ record: it lists no audio plug-in among its 1 classes
-other categories ~ class 2 / category "Audio Module" / class 3 / category "Audio Module Class and 32 bytes!!" ~ load start ask close ~ record: it lists no audio plug-in among its 2 classes
+controller ~ class 1 / category "Component Controller Class" ~ load start ask close ~ record: its only class is not an audio plug-in
+other categories ~ class 2 / category "Audio Module" / class 3 / category "Audio Module Class and 32 bytes!!" ~ load start ask close ~ record: none of its 2 classes is an audio plug-in
 throws in the middle ~ class A / class B / class C / fault bus-count throw-std B ~ load start ask A B close ~ A: it threw: thrown by the fixture
 throws no exception ~ fault count-classes throw-int ~ load start ask close ~ record: it threw something other than a standard exception
 throws while closed ~ class A / fault factory-release throw-int / fault module-exit throw-std ~ load start ask A close ~ A:
 does not start ~ answer module-entry false ~ load start close ~ record: its entry function reports that it could not start
 throws at its start ~ fault module-entry throw-std ~ load start close ~ record: it threw: thrown by the fixture
-WaveShell ~ ~ load start ask close ~ keep: it lists no audio plug-in among its 0 classes
+WaveShell ~ ~ load start ask close ~ keep: its factory lists no classes
 WaveShell without factory ~ answer get-factory null ~ load start ask close ~ keep: GetPluginFactory returned null
 factory throws ~ fault get-factory throw-std ~ load start ask close ~ keep: it threw: thrown by the fixture
 another factory ~ generation 0 ~ load start ask close ~ keep: its factory does not offer IPluginFactory
@@ -62,6 +62,7 @@ $ / answer class-info false ~ Aé|Vé|Fx|EQ
 $ / answer class-info false / answer class-info2 false ~ Aé|Vé|Fx|EQ
 $ / answer class-info false / answer class-info-unicode false ~ A�|V�|Fx|EQ
 $ / answer class-info false / answer class-info2 false / answer class-info-unicode false ~
+$ / answer class-info blank / answer class-info2 blank ~ Aé|Vé|Fx|EQ
 $ / answer class-info false / generation 2 ~ A�|V�|Fx|EQ
 $ / answer class-info false / generation 1 ~
 $ / answer class-info false / category Audio ~
