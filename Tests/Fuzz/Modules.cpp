@@ -31,7 +31,7 @@ void fuzzPe(const QByteArray &input)
     const QString file = "library.dll";
     writeFuzzFile(file, input);
     // Of the libraries that it needs, some are missing, some load, and the others are this one again.
-    const auto search = [&](const QString &name) -> std::optional<QString> {
+    const auto search = [&](const QString &name, const QString &) -> std::optional<QString> {
         if (name.startsWith('m'))
             return std::nullopt;
         return name.startsWith('k') ? QString() : file;

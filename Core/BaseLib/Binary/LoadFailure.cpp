@@ -36,20 +36,32 @@ public:
         return m_unusable;
     }
 
-private:
-    void lookAt(const QString &path)
+    QString ofCut(const QString &path)
     {
-        PagedFile file(path);
-        for (const QString &name : neededLibraries(file.content()).value_or(QStringList()))
-            lookFor(name);
+        lookAt(path);
+        return m_cutShort;
     }
 
-    void lookFor(const QString &name)
+private:
+    /// In the loader's order: a library's own needs come after those of whatever needs it. A name that was
+    /// found once serves all.
+    void lookAt(const QString &path)
+    {
+        m_queue = QStringList(path);
+        while (!m_queue.isEmpty()) {
+            const QString library = m_queue.takeFirst();
+            PagedFile file(library);
+            for (const QString &name : neededLibraries(file.content()).value_or(QStringList()))
+                lookFor(name, library);
+        }
+    }
+
+    void lookFor(const QString &name, const QString &neededBy)
     {
         if (m_seen.size() >= kMostLibraries || m_seen.contains(pathKey(name)))
             return;
         m_seen.insert(pathKey(name));
-        const std::optional<QString> path = m_search(name);
+        const std::optional<QString> path = m_search(name, neededBy);
         if (!path)
             m_missing.append(name);
         else if (!path->isEmpty())
@@ -59,17 +71,24 @@ private:
     void lookInto(const QString &name, const QString &path)
     {
         const ModuleInspection library = inspectModule(path);
-        if (library.verdict == ModuleInspection::Verdict::Loadable)
-            lookAt(path);
-        else if (m_unusable.isEmpty())
-            m_unusable =
-                QStringLiteral("%1%2, and %3").arg(QLatin1String(kNeedsLibrary), name, library.reason);
+        if (library.isLoadable()) {
+            m_queue.append(path);
+            return;
+        }
+        const QString which = library.reason.mid(library.reason.indexOf(QLatin1Char(' '))); // instead of "it"
+        const QString reason = QStringLiteral("%1%2, which%3").arg(QLatin1String(kNeedsLibrary), name, which);
+        if (m_unusable.isEmpty())
+            m_unusable = reason;
+        if (m_cutShort.isEmpty() && library.verdict == ModuleInspection::Verdict::CutShort)
+            m_cutShort = reason;
     }
 
     const LibrarySearch &m_search;
+    QStringList m_queue; ///< paths to look at
     QSet<QString> m_seen;
     QStringList m_missing;
     QString m_unusable; ///< the first library that is there in vain
+    QString m_cutShort; ///< the first one that is cut short
 };
 
 } // namespace
@@ -77,4 +96,9 @@ private:
 QString whyNotLoadable(const QString &path, const LibrarySearch &search)
 {
     return Diagnosis(search).of(path);
+}
+
+QString whyCutShort(const QString &path, const LibrarySearch &search)
+{
+    return Diagnosis(search).ofCut(path);
 }

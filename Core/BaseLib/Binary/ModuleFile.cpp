@@ -176,6 +176,6 @@ ModuleInspection inspectModule(const QString &path, const std::vector<QByteArray
 {
     PagedFile file(path);
     if (!file.problem().isEmpty())
-        return {Verdict::Unopened, QStringLiteral("it cannot be opened: ") + file.problem()};
+        return {Verdict::Unopened, QLatin1String(kUnopened) + file.problem()};
     return inspectContent(file.content(), exports);
 }

@@ -49,11 +49,17 @@ bool PluginLibrary::load(const QString &path)
     return m_handle != nullptr;
 }
 
-void PluginLibrary::setErrorText(const QString &path, const LibrarySearch &search, const QString &loaderText)
+void PluginLibrary::setErrorText(const QString &path, const LibrarySearch &search,
+                                 const QString &loaderReason)
 {
     m_errorText = whyNotLoadable(path, search);
     if (m_errorText.isEmpty())
-        m_errorText = QStringLiteral("it could not be loaded: ") + loaderText;
+        m_errorText = loaderReason;
+}
+
+QString PluginLibrary::notLoaded(const QString &loaderText)
+{
+    return QStringLiteral("it could not be loaded: ") + loaderText;
 }
 
 void PluginLibrary::leaveMapped() { m_handle = nullptr; }

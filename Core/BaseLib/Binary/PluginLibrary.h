@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Core/BaseLib/Binary/LoadFailure.h"
+#include "Core/BaseLib/Binary/ModuleFile.h"
 
 #include <QString>
 
@@ -39,6 +40,10 @@ public:
     /// Why the last load failed, as a phrase about "it": libraries that it needs, or the system's message.
     const QString &errorText() const { return m_errorText; }
 
+    /// What `inspectModule` tells, and where the system's loader does not look at the sizes of files before
+    /// it maps them, also whether libraries that the module brings along are cut short.
+    static ModuleInspection inspect(const QString &path, const std::vector<QByteArray> &exports = {});
+
     /// The end of the names of the system's libraries, with its dot.
     static QString fileEnding();
     /// Whether a library is mapped into this process that lies at the path, or in the bundle there.
@@ -60,7 +65,10 @@ private:
     void *loadUncached(const QString &path) noexcept;
 
     /// What the files tell comes first: the loader names one of several missing libraries, or none.
-    void setErrorText(const QString &path, const LibrarySearch &search, const QString &loaderText);
+    /// `loaderReason` is a phrase about "it".
+    void setErrorText(const QString &path, const LibrarySearch &search, const QString &loaderReason);
+    /// The phrase for a loader's message that has no better one.
+    static QString notLoaded(const QString &loaderText);
 
     void *m_handle = nullptr;
     QString m_path;

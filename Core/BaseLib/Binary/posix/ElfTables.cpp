@@ -154,7 +154,8 @@ std::optional<ElfNeeds> readElfNeeds(ByteView file)
         if (tag == DT_NEEDED)
             needs.libraries.append(QFile::decodeName(*name));
         else
-            needs.folders.append(QFile::decodeName(*name).split(QLatin1Char(':'), Qt::SkipEmptyParts));
+            (tag == DT_RPATH ? needs.olderFolders : needs.folders)
+                .append(QFile::decodeName(*name).split(QLatin1Char(':'), Qt::SkipEmptyParts));
     }
     return needs;
 }

@@ -26,7 +26,9 @@ std::optional<ElfTables> readElfTables(ByteView file);
 /// The libraries that a shared library needs, and the folders that it names for finding them.
 struct ElfNeeds {
     QStringList libraries;
-    QStringList folders; ///< as they stand there, with "$ORIGIN" and the like
+    /// As they stand there, with "$ORIGIN" and the like. The older form (DT_RPATH) counts for the libraries
+    /// that are loaded with it as well, and not where there is the newer one (DT_RUNPATH).
+    QStringList olderFolders, folders;
 };
 
 /// None when the file is not an x86-64 shared library, is cut short or contradicts itself.

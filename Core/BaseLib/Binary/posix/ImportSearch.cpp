@@ -8,6 +8,9 @@
 #include <QFile>
 #include <QFileInfo>
 
+#include <map>
+#include <memory>
+
 #include <dlfcn.h>
 
 namespace {
@@ -27,16 +30,55 @@ bool isInCache(const QByteArray &cache, const QString &name)
     return cache.contains('\0' + text) || cache.contains('/' + text);
 }
 
-QStringList foldersFor(const QString &path)
-{
-    PagedFile file(path);
-    QStringList folders = readElfNeeds(file.content()).value_or(ElfNeeds()).folders;
-    const QString own = QFileInfo(QFileInfo(path).canonicalFilePath()).path();
-    folders.replaceInStrings(QStringLiteral("${ORIGIN}"), own)
-        .replaceInStrings(QStringLiteral("$ORIGIN"), own);
-    folders += qEnvironmentVariable("LD_LIBRARY_PATH").split(QLatin1Char(':'), Qt::SkipEmptyParts);
-    return folders;
-}
+/// Searches the folders that are named for one library and those that are loaded with it.
+class NamedFolders {
+public:
+    explicit NamedFolders(const QString &path)
+        : m_path(path)
+    {}
+
+    /// Empty when it is not there.
+    QString find(const QString &name, const QString &neededBy)
+    {
+        if (name.contains(QLatin1Char('/')))
+            return QFileInfo::exists(name) ? name : QString();
+        for (const QString &folder : foldersFor(neededBy))
+            if (const QString found = QDir(folder).filePath(name); QFileInfo(found).isFile())
+                return found;
+        return QString();
+    }
+
+private:
+    /// In the order of the loader (ld.so(8)).
+    QStringList foldersFor(const QString &library)
+    {
+        const ElfNeeds &own = needsOf(library);
+        const ElfNeeds &first = needsOf(m_path);
+        QStringList folders;
+        if (own.folders.isEmpty())
+            folders = own.olderFolders + (first.folders.isEmpty() ? first.olderFolders : QStringList());
+        folders += qEnvironmentVariable("LD_LIBRARY_PATH").split(QLatin1Char(':'), Qt::SkipEmptyParts);
+        return folders + own.folders;
+    }
+
+    const ElfNeeds &needsOf(const QString &library)
+    {
+        const auto [entry, isNew] = m_needs.try_emplace(library);
+        if (!isNew)
+            return entry->second;
+        PagedFile file(library);
+        entry->second = readElfNeeds(file.content()).value_or(ElfNeeds());
+        // Where the loader was sent, which need not be where a link leads.
+        const QString folder = QFileInfo(library).path();
+        for (QStringList *folders : {&entry->second.olderFolders, &entry->second.folders})
+            folders->replaceInStrings(QStringLiteral("${ORIGIN}"), folder)
+                .replaceInStrings(QStringLiteral("$ORIGIN"), folder);
+        return entry->second;
+    }
+
+    const QString m_path;
+    std::map<QString, ElfNeeds> m_needs;
+};
 
 /// Folders that the loader searches whether the cache has them or not.
 const char *const kSystemFolders[] = {
@@ -48,17 +90,28 @@ LibrarySearch importSearch(const QString &path)
 {
     QByteArray cache;
     readWholeFile(QStringLiteral("/etc/ld.so.cache"), cache);
-    return [cache, folders = foldersFor(path)](const QString &name) -> std::optional<QString> {
+    const auto named = std::make_shared<NamedFolders>(path);
+    return [cache, named](const QString &name, const QString &neededBy) -> std::optional<QString> {
+        if (isLoaded(name))
+            return QString();
+        if (const QString found = named->find(name, neededBy); !found.isEmpty())
+            return found;
         if (name.contains(QLatin1Char('/')))
-            return QFileInfo::exists(name) ? std::make_optional(name) : std::nullopt;
-        for (const QString &folder : folders)
-            if (const QString found = QDir(folder).filePath(name); QFileInfo(found).isFile())
-                return found;
-        if (isLoaded(name) || isInCache(cache, name))
+            return std::nullopt;
+        if (isInCache(cache, name))
             return QString();
         for (const char *folder : kSystemFolders)
             if (QFileInfo(QDir(QLatin1String(folder)).filePath(name)).isFile())
                 return QString();
         return std::nullopt;
+    };
+}
+
+LibrarySearch namedFolderSearch(const QString &path)
+{
+    const auto named = std::make_shared<NamedFolders>(path);
+    return [named](const QString &name, const QString &neededBy) -> std::optional<QString> {
+        const QString found = named->find(name, neededBy);
+        return found.isEmpty() || isLoaded(name) ? QString() : found;
     };
 }

@@ -4,9 +4,46 @@
 #include "Core/BaseLib/Files/NativeFile.h"
 
 #include <QFile>
+#include <QRegularExpression>
 
+#include <cstdlib>
+#include <memory>
+
+#include <cxxabi.h>
 #include <dlfcn.h>
 #include <link.h>
+
+namespace {
+
+/// A symbol as it stands in the source; as it is where it does not come from C++.
+QString sourceName(const QString &symbol)
+{
+    const std::unique_ptr<char, decltype(&std::free)> text(
+        abi::__cxa_demangle(symbol.toLocal8Bit().constData(), nullptr, nullptr, nullptr), &std::free);
+    return text ? QString::fromLocal8Bit(text.get()) : symbol;
+}
+
+/// The GNU loader's message on a library that lacks something as a phrase about "it"; empty for others.
+QString lackIn(const QString &loaderText)
+{
+    static const QRegularExpression version(
+        QStringLiteral("([^/]+): version `(.+)' not found \\(required by .*\\)$"));
+    static const QRegularExpression symbol(QStringLiteral("^(?:.*?([^/]+): )?undefined symbol: ([^\\s,]+)"));
+    if (const auto match = version.match(loaderText); match.hasMatch())
+        return QStringLiteral("%1version %2 of %3, which is not installed")
+            .arg(QLatin1String(kNeedsLibrary), match.captured(2), match.captured(1));
+    const auto match = symbol.match(loaderText);
+    if (!match.hasMatch())
+        return QString();
+    const QString library = match.captured(1), name = sourceName(match.captured(2));
+    const QString lack =
+        library.isEmpty()
+            ? QStringLiteral("the symbol \"%1\", which none of its libraries has").arg(name)
+            : QStringLiteral("%1, which needs the symbol \"%2\" that no library has").arg(library, name);
+    return QLatin1String(kNeedsLibrary) + lack;
+}
+
+} // namespace
 
 void *PluginLibrary::loadUncached(const QString &path) noexcept
 {
@@ -20,7 +57,9 @@ void *PluginLibrary::loadUncached(const QString &path) noexcept
     if (handle)
         return handle;
     QString text = QString::fromLocal8Bit(dlerror());
-    setErrorText(path, importSearch(path), text.remove(path + QLatin1String(": ")));
+    text.remove(path + QLatin1String(": "));
+    const QString lack = lackIn(text);
+    setErrorText(path, importSearch(path), lack.isEmpty() ? notLoaded(text) : lack);
     return nullptr;
 }
 
@@ -48,6 +87,15 @@ bool PluginLibrary::isMapped(const QString &path)
 bool PluginLibrary::hasNeededLibraries(const QString &path)
 {
     return whyNotLoadable(path, importSearch(path)).isEmpty();
+}
+
+ModuleInspection PluginLibrary::inspect(const QString &path, const std::vector<QByteArray> &exports)
+{
+    ModuleInspection module = inspectModule(path, exports);
+    if (!module.isLoadable())
+        return module;
+    const QString reason = whyCutShort(path, namedFolderSearch(path));
+    return reason.isEmpty() ? module : ModuleInspection{ModuleInspection::Verdict::CutShort, reason};
 }
 
 QString PluginLibrary::fileEnding() { return QStringLiteral(".so"); }

@@ -43,7 +43,7 @@ bool belongsToTheSystem(const QString &path)
 
 LibrarySearch importSearch(const QString &firstFolder)
 {
-    return [firstFolder](const QString &name) -> std::optional<QString> {
+    return [firstFolder](const QString &name, const QString &) -> std::optional<QString> {
         if (isResolvedElsewhere(name) || GetModuleHandleW(name.toStdWString().c_str()))
             return QString();
         const QString beside = firstFolder.isEmpty() ? QString() : QDir(firstFolder).filePath(name);

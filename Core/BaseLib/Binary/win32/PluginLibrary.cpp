@@ -35,7 +35,7 @@ void *PluginLibrary::loadUncached(const QString &path) noexcept
         return module;
     const DWORD error = GetLastError();
     setErrorText(path, importSearch(searchDllLoadDir ? QFileInfo(path).path() : QString()),
-                 systemMessage(error, QStringLiteral("the file")));
+                 notLoaded(systemMessage(error, QStringLiteral("the file"))));
     return nullptr;
 }
 
@@ -73,6 +73,11 @@ bool PluginLibrary::isMapped(const QString &path)
 bool PluginLibrary::hasNeededLibraries(const QString &path)
 {
     return whyNotLoadable(path, importSearch(QFileInfo(path).path())).isEmpty();
+}
+
+ModuleInspection PluginLibrary::inspect(const QString &path, const std::vector<QByteArray> &exports)
+{
+    return inspectModule(path, exports);
 }
 
 QString PluginLibrary::fileEnding() { return QStringLiteral(".dll"); }

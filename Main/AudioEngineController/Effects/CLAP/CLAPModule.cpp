@@ -22,7 +22,7 @@ CLAPModule::~CLAPModule() { close(); }
 
 ModuleInspection CLAPModule::inspect(const QString &path)
 {
-    ModuleInspection file = inspectModule(path, {kEntry});
+    ModuleInspection file = PluginLibrary::inspect(path, {kEntry});
     if (file.verdict == ModuleInspection::Verdict::NoExport)
         file.reason = noEntry();
     return file;

@@ -39,7 +39,7 @@ VSTLoadResult invalidEffect()
 
 ModuleInspection VSTModule::inspect(const QString &path)
 {
-    ModuleInspection file = inspectModule(path, {kEntryPoint, kOldEntryPoint});
+    ModuleInspection file = PluginLibrary::inspect(path, {kEntryPoint, kOldEntryPoint});
     if (file.verdict == ModuleInspection::Verdict::NoExport)
         file.reason = noEntryPoint().reason;
     return file;

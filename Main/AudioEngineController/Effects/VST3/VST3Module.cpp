@@ -26,7 +26,7 @@ ModuleInspection VST3Module::inspect(const QString &path)
     const QString binary = VST3ModuleFile::binary(path, reason);
     if (binary.isEmpty())
         return {ModuleInspection::Verdict::Foreign, reason};
-    return inspectModule(binary);
+    return PluginLibrary::inspect(binary);
 }
 
 std::optional<VST3Failure> VST3Module::open(const QString &path)

@@ -86,7 +86,7 @@ TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
     const QString own =
         kOwnForm == LibraryForm::Pe
             ? ""
-            : "it needs plug.dll, and it is built for Windows; this machine needs one for Linux";
+            : "it needs plug.dll, which is built for Windows; this machine needs one for Linux";
     const struct {
         const char *name;
         QString library;
@@ -98,13 +98,13 @@ TEST(LoadFailure, NamesWhatKeepsALibraryFromLoading)
         {"two are missing", "pe/64-bit.dll", "none", "none",
          "it needs missing.dll and plug.dll, which are not installed"},
         {"needs what is cut short", "pe/64-bit.dll", "", "pe/cut-short.dll",
-         "it needs plug.dll, and it is cut short: "},
+         "it needs plug.dll, which is cut short: "},
         {"needs a text", "pe/64-bit.dll", "scanlist/folders.xml", "none",
          "it needs plug.dll, which is not installed"},
         {"not there: the loader says so", "pe/none", "none", "none", ""},
     };
     for (const auto &row : rows) {
-        const auto search = [&](const QString &name) -> std::optional<QString> {
+        const auto search = [&](const QString &name, const QString &) -> std::optional<QString> {
             const QString found = name == "missing.dll" ? row.missing : name == "plug.dll" ? row.plug : "";
             if (found == "none")
                 return std::nullopt;

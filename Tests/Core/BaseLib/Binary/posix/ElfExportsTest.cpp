@@ -102,5 +102,35 @@ TEST(PluginLibrary, NamesTheLibrariesThatAreMissing)
     EXPECT_EQ(library.errorText(), "it needs libaway.so.2, which is not installed");
     folder.write("lib/libaway.so.2", folder.read(path));
     EXPECT_FALSE(library.load(path));
-    EXPECT_EQ(library.errorText(), "it needs libgone.so.1, and it is not a program library");
+    EXPECT_EQ(library.errorText(), "it needs libgone.so.1, which is not a program library");
+    folder.write("Elsewhere/libgone.so.1", {});
+    const QString link = folder.path("Elsewhere/link.so");
+    EXPECT_TRUE(PluginLibrary::inspect(path).isLoadable() && QFile::link(path, link) && !library.load(link));
+    EXPECT_EQ(library.errorText(), "it needs libgone.so.1 and libaway.so.2, which are not installed")
+        << "it names folders beside it, and not beside its file";
+    folder.write(beside, folder.read(path).left(1000));
+    EXPECT_EQ(PluginLibrary::inspect(path).verdict, ModuleInspection::Verdict::CutShort);
+    EXPECT_TRUE(
+        PluginLibrary::inspect(path).reason.startsWith("it needs libgone.so.1, which is cut short: 1000 of"));
+}
+
+TEST(PluginLibrary, NamesWhatALibraryThatIsThereLacks)
+{
+    const TestFolder folder;
+    QFile file(ONE_FUNCTION_LIBRARY);
+    ASSERT_TRUE(file.open(QIODevice::ReadOnly));
+    const QByteArray whole = file.readAll();
+    const struct {
+        QByteArray name, other;
+        QString lack;
+    } rows[] = {
+        {"GLIBC_2.2.5", "GLIBC_9.9.9", "version GLIBC_9.9.9 of libc.so.6, which is not installed"},
+        {"getenv", "_Z2gov", "the symbol \"go()\", which none of its libraries has"},
+    };
+    for (const auto &row : rows) {
+        folder.write("x.so", QByteArray(whole).replace(row.name, row.other));
+        PluginLibrary library;
+        EXPECT_FALSE(library.load(folder.path("x.so")));
+        EXPECT_EQ(library.errorText(), "it needs " + row.lack);
+    }
 }

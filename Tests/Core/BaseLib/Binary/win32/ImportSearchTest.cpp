@@ -22,7 +22,7 @@ TEST(ImportSearch, FindsWhatWindowsFinds)
         {"beside it", "Beside Ünï.dll", missing, folder.path("Beside Ünï.dll")},
     };
     for (const auto &row : rows) {
-        EXPECT_EQ(importSearch()(row.library), row.found) << row.name;
-        EXPECT_EQ(importSearch(folder.dataFolder())(row.library), row.foundFromFolder) << row.name;
+        EXPECT_EQ(importSearch()(row.library, {}), row.found) << row.name;
+        EXPECT_EQ(importSearch(folder.dataFolder())(row.library, {}), row.foundFromFolder) << row.name;
     }
 }
