@@ -224,8 +224,10 @@ scan
 log: X.vst3: the bundle has modules for aarch64-linux only
 write Plugins/Y.vst3/Contents/arm64-win/Y.vst3: y
 write Plugins/Y.vst3/Contents/Resources/y.txt: y
+write Plugins/Y.vst3/Contents/x86_64-linux/y.txt: y
+write Plugins/Y.vst3/Contents/x86_64-win/y.txt: y
 scan
-log: Y.vst3: the bundle has modules for arm64-win only
+log: Y.vst3: the bundle has modules for arm64-win, x86_64-win only / Y.vst3: the bundle has modules for arm64-win, x86_64-linux only
 write Plugins/Z.vst3/z: z
 link Plugins/Z.vst3/Contents Plugins/Z.vst3/Contents
 scan

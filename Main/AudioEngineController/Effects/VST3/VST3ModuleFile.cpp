@@ -1,19 +1,22 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
+#include "Core/BaseLib/Binary/LoadFailure.h"
 #include "Core/BaseLib/Files/FolderListing.h"
+#include "Core/BaseLib/Files/NativeFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
 #include <QRegularExpression>
 
 namespace {
 
-/// The folders of other machines and systems ("aarch64-linux") that are not empty.
-QStringList otherMachines(const FolderContent &contents, const QString &path)
+/// The folders of machines and systems other than this one ("aarch64-linux") that are not empty.
+QStringList otherMachines(const FolderContent &contents, const QString &path, const char *machine)
 {
     static const QRegularExpression pattern(QStringLiteral("^(.+-(linux|win)|MacOS)$"));
     QStringList machines;
     for (const FolderEntry &entry : contents.entries)
         if (entry.isFolder && pattern.match(entry.name).hasMatch() &&
+            !isSamePath(entry.name, QLatin1String(machine)) &&
             !listFolder(path + QLatin1Char('/') + entry.name).entries.empty())
             machines.append(entry.name);
     return machines;
@@ -33,8 +36,8 @@ QString VST3ModuleFile::whyNoBinary(const QString &bundle, const char *machine)
     for (const QString &problem : {contents.problem, listFolder(machineFolder(bundle, machine)).problem})
         if (!problem.isEmpty())
             return QStringLiteral("its folder Contents cannot be searched: ") + problem;
-    const QStringList machines = otherMachines(contents, path);
+    const QStringList machines = otherMachines(contents, path, machine);
     if (!machines.isEmpty())
-        return QStringLiteral("the bundle has modules for %1 only").arg(machines.join(QLatin1String(", ")));
+        return QLatin1String(kBundleFor) + machines.join(QLatin1String(", ")) + QLatin1String(" only");
     return QStringLiteral("the bundle has no module in Contents/") + QLatin1String(machine);
 }
