@@ -150,9 +150,13 @@ bool FolderEditor::ignore(const QString &given)
 bool FolderEditor::takeBack(QStringList &rule, const QString &given, const char *state)
 {
     const QStringList paths = SearchArea::spellings(settledPath(given));
-    bool isThere = false;
-    for (const QString &path : paths)
-        isThere |= rule.removeAll(path) != 0;
+    const auto isGiven = [&](const QString &other) {
+        return std::any_of(paths.begin(), paths.end(),
+                           [&](const QString &path) { return isSamePath(path, other); });
+    };
+    const auto others = std::remove_if(rule.begin(), rule.end(), isGiven);
+    const bool isThere = others != rule.end();
+    rule.erase(others, rule.end());
     const auto isAbove = [&](const QString &other) { return isBelow(paths.front(), other); };
     const auto above = std::find_if(rule.begin(), rule.end(), isAbove);
     if (!isThere)
