@@ -342,8 +342,12 @@ private:
     void checkAll()
     {
         doubtMoved();
+        const std::vector<EffectRecord> records = catalogue();
+        for (const EffectRecord &record : records)
+            if (isThere(record.path) && record.fileTime == stampOf(record.path))
+                m_asleep.erase(record.path); // it was asked, as another file does not list the same any more
         std::map<int, EffectRecord> found;
-        for (const EffectRecord &record : catalogue()) {
+        for (const EffectRecord &record : records) {
             SCOPED_TRACE(qPrintable(record.path + " " + record.id));
             const int number = numberOf(record);
             const bool isCulprit = m_culprits.count(record.path) != 0;
@@ -455,7 +459,8 @@ private:
     QString pathFor(const QString &name)
     {
         const QString path = plugins() + '/' + QChar('a' + pick(3)) + '/' + name;
-        return m_files.count(path) || m_left.contains(path) || isAway(path) ? QString() : path;
+        const bool isFree = !m_files.count(path) && !m_left.contains(path) && !isAway(path);
+        return isFree && !catalogueText().contains(path.toUtf8()) ? path : QString();
     }
     void change()
     {

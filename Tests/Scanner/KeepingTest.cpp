@@ -313,6 +313,64 @@ vst3 Name Favourite CategoryMask Enabled Working: E|1|0|1|1, K|0|0|0|0, N|0|4|1|
 vst2 Name Favourite: P|1, Q|0
 same
 
+= A copy that failed before keeps what an uninstalled one held
+put a/M.vst3, a/M.clap: class A | #1 | class B | #2
+put a/M.vst2: child 1 A | child 2 B
+write Plugins/a/other: x
+scan
+mark A Favourite 1, B CategoryMask 4
+put b/M.vst3: class A | #1 | answer module-entry false
+put b/M.clap: class A | #1 | answer entry-init failure
+put b/M.vst2: child 1 A | answer entry null
+scan
+remove Plugins/a/M.vst3
+remove Plugins/a/M.clap
+remove Plugins/a/M.vst2
+scan
+new b/M.vst3, b/M.clap: class A | #1 | class B | #2
+new b/M.vst2: child 1 A | child 2 B
+scan
+vst3 Name Path Favourite CategoryMask: A|b/M.vst3|1|0, B|b/M.vst3|0|4
+clap Name Path Favourite CategoryMask: A|b/M.clap|1|0, B|b/M.clap|0|4
+vst2 Name Path Favourite CategoryMask: A|b/M.vst2|1|0, B|b/M.vst2|0|4
+same
+
+= A copy lists what another file of another name held, with its marks, also when the rest of it is switched off and nothing is remembered
+put x/M.vst3: class A | #1 | class D | #4
+put z/Other.vst3: class A | #1 | class C | #3
+write Plugins/x/other: x
+scan
+mark A Favourite 1, C Enabled 0
+write Effects/FXProbes.json: {}
+remove Plugins/x/M.vst3
+scan
+vst3 Name Path Favourite Enabled: A|z/Other.vst3|1|1, C|z/Other.vst3|0|0
+same
+
+= A plug-in whose file has another name in each version keeps its marks
+put WaveShell1-VST3 9.2.vst3: class Inner | #1
+put Shell 9.2.vst2: child 1 D | child 2 E
+scan
+mark Inner Favourite 1, E Favourite 1
+remove Plugins/WaveShell1-VST3 9.2.vst3
+remove Plugins/Shell 9.2.vst2
+put WaveShell1-VST3 9.3.vst3: class Inner | #1
+put Shell 9.3.vst2: child 1 D | child 2 E
+scan
+vst3 Name Favourite: Inner|1
+vst2 Name Favourite: D|0, E|1
+
+= What is asked again and fails is not asked at each scan, whatever is switched off in it
+put M.vst3: class A | #1 | class B | #2
+scan
+mark B Enabled 0
+new M.vst3: class A | answer module-entry false
+scan
+retry A
+scan
+loaded M
+same
+
 = A catalogue of a negative version keeps its categories
 put Comp.vst3:
 put Comp.clap:

@@ -52,6 +52,15 @@ void EffectList::setHidden(const QString &id, bool isHidden)
         entry->second.isHidden = isHidden;
 }
 
+void EffectList::setUnsettled(const QString &id, bool isUnsettled)
+{
+    const auto entry = m_entries.find(id);
+    if (entry == m_entries.end())
+        return;
+    entry->second.isUnsettled = isUnsettled;
+    entry->second.forgetText();
+}
+
 void EffectList::remove(const QString &id)
 {
     const auto entry = m_entries.find(id);

@@ -16,14 +16,19 @@ public:
     {}
 
     EffectRecord record;
-    bool ownsName = false; ///< the name counts as used because of this record
-    bool isHidden = false; ///< no file is to hold it yet: whose marks it gets is not settled
+    bool ownsName = false;    ///< the name counts as used because of this record
+    bool isHidden = false;    ///< no file is to hold it yet: whose marks it gets is not settled
+    bool isUnsettled = false; ///< another of its file is hidden: it is written without the file's time
 
     /// The record's text in a format's catalogue file.
     const QByteArray &text(const CatalogueFormat &format)
     {
-        if (m_rendered.isNull())
-            m_rendered = renderRecord(format, record);
+        if (m_rendered.isNull()) {
+            EffectRecord written = record;
+            if (isUnsettled)
+                written.fileTime.clear();
+            m_rendered = renderRecord(format, written);
+        }
         return m_rendered;
     }
     /// To be called when the record was changed.
@@ -59,6 +64,9 @@ public:
     void passMarks(const EffectRecord &old, const QString &id);
     /// Has files not hold a record, or hold it again; nothing for an identifier that is not there.
     void setHidden(const QString &id, bool isHidden);
+    /// Has files hold a record so that its file is asked again, or not; nothing for an identifier that is not
+    /// there.
+    void setUnsettled(const QString &id, bool isUnsettled);
     /// Takes a record out, and its name.
     void remove(const QString &id);
 

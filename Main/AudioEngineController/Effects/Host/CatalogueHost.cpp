@@ -102,6 +102,12 @@ void CatalogueHost::setHidden(const QString &id, bool isHidden)
     m_effects.setHidden(id, isHidden);
 }
 
+void CatalogueHost::setUnsettled(const QString &id, bool isUnsettled)
+{
+    const TAutoLockCS lock(&m_ks);
+    m_effects.setUnsettled(id, isUnsettled);
+}
+
 QString CatalogueHost::moduleTime(const QString &path) const { return regularFileTimeText(path); }
 
 QString CatalogueHost::moduleFolder(const QString &path) const

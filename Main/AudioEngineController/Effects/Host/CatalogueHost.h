@@ -105,6 +105,8 @@ public:
     /// Has written catalogues leave a listed record out, or hold it again. A next run asks a file anew of
     /// which nothing is recorded.
     void setHidden(const QString &id, bool isHidden);
+    /// Has them hold a listed record so that a next run asks its file anew, or as it is.
+    void setUnsettled(const QString &id, bool isUnsettled);
 
     /// Empties the effect list.
     void clearEffects();

@@ -279,6 +279,9 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
         m_likelyMarks.push_back(likely);
         m_host.setHidden(likely.first, true);
     }
+    for (const EffectRecord &record : records.listed)
+        if (!records.likelyMarks.empty()) // else they would speak for the file if this process ends
+            m_host.setUnsettled(record.id, true);
     m_memory.keep();
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
@@ -438,6 +441,9 @@ void FolderScan::finish(bool isWhole)
     for (const auto &[id, old] : m_likelyMarks) {
         if (mayYetBeListed(*old)) // the next scan knows
             continue;
+        for (const EffectRecord &record : m_host.effects())
+            if (isSamePath(record.path, m_host.findEffect(id)->path))
+                m_host.setUnsettled(record.id, false);
         if (!m_host.isListed(old->id)) {
             m_host.passMarks(*old, id);
             replaced.insert(old);

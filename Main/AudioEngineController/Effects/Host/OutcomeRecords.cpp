@@ -16,6 +16,8 @@ EffectRecord keptBesideFailure(const EffectRecord &old, const EffectRecord &file
             kept.enabled = true;
         }
         kept.working = false;
+    } else if (kept.fileTime.isEmpty()) {
+        kept.fileTime = file.fileTime; // it was to be asked again, and has been
     }
     return kept;
 }

@@ -37,12 +37,13 @@ int commonEnd(const QString &left, const QString &right)
     return common;
 }
 
-/// True for a file of which nothing is known, or only that sub-plug-ins crashed: a marker may have come
-/// before the records of the file that moved there.
+/// True for a file of which no plug-in is known: nothing is, or only that it failed, or that sub-plug-ins
+/// crashed, as a marker may have come before the records of the file that moved there.
 bool isHardlyKnown(const KnownList::Records &records)
 {
     return std::all_of(records.begin(), records.end(), [](const EffectRecord *record) {
-        return record->subId != 0 && !record->enabled && !record->working;
+        const bool isCrashedChild = record->subId != 0 && !record->enabled && !record->working;
+        return isCrashedChild || (record->standsForFile() && record->enabled);
     });
 }
 
@@ -117,7 +118,7 @@ void ScanPlan::decide(const QStringList &modules)
     }
     sortMissing(found);
     // Else there is nothing to settle, nor what a copy may be of.
-    if (!m_items.empty() || !m_gone.empty() || m_hasNewCrashes) {
+    if (!m_items.empty() || !m_gone.empty() || !m_away.empty() || m_hasNewCrashes) {
         indexKept();
         settleAllGone(modules);
         leaveOutCopies();
@@ -130,9 +131,16 @@ void ScanPlan::decide(const QStringList &modules)
                           [this](const ScanItem &item) { return m_host.isSuspect(item.path); });
     for (const ScanItem &item : m_items)
         for (const KnownList::Records &records : {item.known, item.moved})
-            for (const EffectRecord *record : records)
-                if (!record->standsForFile() && !m_asked.contains(record->id))
-                    m_asked.insert(record->id, record);
+            indexUnsettled(records);
+    for (const KnownFile &gone : m_gone)
+        indexUnsettled(gone.records);
+}
+
+void ScanPlan::indexUnsettled(const KnownList::Records &records)
+{
+    for (const EffectRecord *record : records)
+        if (!record->standsForFile() && !m_unsettled.contains(record->id))
+            m_unsettled.insert(record->id, record);
 }
 
 void ScanPlan::decideModule(const QString &path)
@@ -261,8 +269,8 @@ void ScanPlan::settleAllGone(const QStringList &modules)
     }
 }
 
-/// Gives the records of a gone file to one that may be the same: to one of its name of which hardly anything
-/// is known, by the place of its item. Else those that are known are asked again.
+/// Gives the records of a gone file to one that may be the same: to one of its name of which no plug-in is
+/// known, by the place of its item. Else those that are known are asked again, and so is a copy that failed.
 void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, const QStringList &namesakes)
 {
     std::sort(unknown.begin(), unknown.end());
@@ -282,10 +290,18 @@ void ScanPlan::settleGone(const KnownFile &gone, QList<std::size_t> unknown, con
     }
     const QString leftAlone = best ? QString() : leftAloneOf(namesakes);
     m_settled.push_back({&gone, namesakes, heirs, leftAlone, best || !leftAlone.isEmpty()});
-    if (best)
+    if (best) {
         best->moved = gone.records;
-    else
-        askAgain(namesakes);
+        return;
+    }
+    const std::size_t first = m_items.size();
+    askAgain(namesakes, SwitchedOff::StayUnasked);
+    const auto failed = std::find_if(m_items.begin() + static_cast<std::ptrdiff_t>(first), m_items.end(),
+                                     [](const ScanItem &item) { return isHardlyKnown(item.known); });
+    if (failed != m_items.end()) {
+        failed->moved = gone.records;
+        m_settled.back().hasMoved = true;
+    }
 }
 
 /// A scan of a part does not see where a gone file may have moved to.
@@ -401,12 +417,14 @@ bool ScanPlan::isHeld(const RememberedPlugin &plugin) const
 }
 
 /// Has modules asked again that were to be kept: what a gone file listed may be theirs as well.
-void ScanPlan::askAgain(const QStringList &paths)
+void ScanPlan::askAgain(const QStringList &paths, SwitchedOff switchedOff)
 {
     for (const QString &path : paths) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
-        if (known.empty() || !known.front()->enabled || m_host.isLeftAlone(path) || !isKept(path) ||
-            isOutside(path))
+        const bool isAsked =
+            !known.empty() && (known.front()->enabled ||
+                               (switchedOff == SwitchedOff::AreAsked && known.front()->isSwitchedOff()));
+        if (!isAsked || m_host.isLeftAlone(path) || !isKept(path) || isOutside(path))
             continue;
         m_kept.erase(
             std::remove_if(m_kept.begin(), m_kept.end(),
@@ -440,16 +458,23 @@ void ScanPlan::leaveOutCopies()
 
 /// Has files asked again that list something which another file held that is gone or asked now. Which one
 /// that is says the catalogue where the memory does not: a process may have ended between writing the two.
+/// What a file lists of which nothing is remembered nobody knows.
 void ScanPlan::askCopiesOfUnsettled()
 {
     QHash<QString, const EffectRecord *> holders;
-    for (const EffectRecord *record : m_host.known().all())
+    bool isAnyUnsettled = false;
+    for (const EffectRecord *record : m_host.known().all()) {
         holders.insert(record->id, record);
+        isAnyUnsettled |= !isKept(record->path);
+    }
     const auto isElsewhere = [&](const QString &id, const QString &path) {
         const EffectRecord *holder = holders.value(id);
         return holder && !isSamePath(holder->path, path) && !isKept(holder->path);
     };
     QStringList copies;
+    for (const EffectRecord *record : isAnyUnsettled ? m_host.known().all() : KnownList::Records())
+        if (!m_memory.find(m_host.format(), record->path))
+            copies.append(record->path);
     m_memory.forEach(m_host.format(), [&](const RememberedProbe &last) {
         const bool isUnsettled =
             std::any_of(last.plugins.begin(), last.plugins.end(), [&](const RememberedPlugin &plugin) {
@@ -458,7 +483,7 @@ void ScanPlan::askCopiesOfUnsettled()
         if (isUnsettled)
             copies.append(last.path);
     });
-    askAgain(copies);
+    askAgain(copies, SwitchedOff::AreAsked); // they list more than that
 }
 
 KnownList::Records ScanPlan::deadly(const ScanItem &item) const
@@ -500,10 +525,11 @@ const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRe
     return lone ? lone : loneFileRecord(item.moved);
 }
 
-/// The same plug-in of another file that is asked as well, whichever of the two holds it from now on.
+/// The same plug-in of another file that is asked as well, whichever of the two holds it from now on, or that
+/// is gone: its version may have been a part of its name.
 const EffectRecord *ScanPlan::askedElsewhere(const EffectRecord &probed) const
 {
-    const EffectRecord *same = m_asked.value(probed.id);
+    const EffectRecord *same = m_unsettled.value(probed.id);
     return same && same->id == probed.id ? same : nullptr; // a crash may have taken it the identifier since
 }
 

@@ -109,12 +109,15 @@ private:
     EffectRecord movedIgnored(const EffectRecord &gone, const QString &path) const;
     QString leftAloneOf(const QStringList &namesakes) const;
     void moveToCrashed(const KnownFile &gone, const QStringList &namesakes, MovedToCrashed &all) const;
-    void askAgain(const QStringList &paths);
+    /// What becomes of files of which the user switched off all that is known.
+    enum class SwitchedOff { StayUnasked, AreAsked };
+    void askAgain(const QStringList &paths, SwitchedOff switchedOff);
     bool isKept(const QString &path) const;
     bool isHeld(const RememberedPlugin &plugin) const;
     bool isUnchangedCopy(const ScanItem &item) const;
     void leaveOutCopies();
     void askCopiesOfUnsettled();
+    void indexUnsettled(const KnownList::Records &records);
     const EffectRecord *askedElsewhere(const EffectRecord &probed) const;
     const EffectRecord *missingChild(const ScanItem &item, const EffectRecord &probed) const;
     void keep(const KnownList::Records &records);
@@ -131,7 +134,8 @@ private:
     QSet<QString> m_keptPaths;                   ///< by `pathKey`
     QSet<QPair<QString, QString>> m_keptPlugins; ///< path and identifier of those that work
     std::vector<ScanItem> m_items;
-    QHash<QString, const EffectRecord *> m_asked; ///< what is known of these, by identifier
+    QHash<QString, const EffectRecord *>
+        m_unsettled; ///< what is known of these and of gone files, by identifier
     std::vector<KnownFile> m_gone;
     std::vector<SettledFile> m_settled;
     KnownList::Records m_away;
