@@ -51,7 +51,7 @@ wrong magic ~ magic 1 ~ its entry point returned something that is not a VST 2 e
 no memory ~ answer entry no-memory ~ its entry point returned something that is not a VST 2 effect ~ load start close
 entry throws ~ fault entry throw-null ~ its entry point threw an exception without a text ~ load start close
 entry faults ~ fault entry segv ~ it crashed when it was started (invalid memory access at 0x10 in  ~ load start close ~ faulted
-entry calls nothing ~ fault entry call-null ~ invalid memory access at 0x0, called from entry calls nothing. ~ load start close ~ faulted
+calls nothing ~ fault entry call-null ~ invalid memory access at 0x0, called from calls nothing. ~ load start close ~ faulted
 call throws ~ fault get-vendor-string throw-std ~ ~ load start ask close
 call faults ~ fault get-vendor-string segv ~ ~ load start ask close ~ faulted
 close faults ~ fault close segv ~ ~ load start ask close ~ faulted
