@@ -4,6 +4,7 @@
 
 #include <QHash>
 
+#include <algorithm>
 #include <deque>
 #include <map>
 #include <vector>
@@ -86,3 +87,12 @@ private:
     /// asked again.
     QHash<QString, std::vector<EffectRecord *>> m_byId;
 };
+
+/// The first of some records that matches, or null.
+template <typename Matches>
+const EffectRecord *findRecord(const KnownList::Records &records, Matches &&matches)
+{
+    const auto found = std::find_if(records.begin(), records.end(),
+                                    [&](const EffectRecord *each) { return matches(*each); });
+    return found == records.end() ? nullptr : *found;
+}

@@ -122,7 +122,7 @@ EffectRecord Maker::file(const QString &fileTime) const
 void Maker::addDeadly(const EffectRecord &child, EffectRecord deadly, bool isOnly)
 {
     deadly.path = m_item.path;
-    if (const EffectRecord *source = m_plan.sourceOfMarks(m_item, child, isOnly)) {
+    if (const EffectRecord *source = m_plan.marks().sourceOf(m_item, child, isOnly)) {
         deadly.category = source->category;
         deadly.favourite = source->favourite;
     }
@@ -137,8 +137,8 @@ void Maker::add(EffectRecord record, bool isOnly)
         return addDeadly(record, crashedChild(record), isOnly);
     if (!record.working)
         m_host.completeFailedRecord(record);
-    const EffectRecord *source = m_plan.sourceOfMarks(m_item, record, isOnly);
-    const EffectRecord *likely = source ? nullptr : m_plan.likelySourceOfMarks(m_item, record);
+    const EffectRecord *source = m_plan.marks().sourceOf(m_item, record, isOnly);
+    const EffectRecord *likely = source ? nullptr : m_plan.marks().likelySourceOf(m_item, record);
     if (likely && record.working)
         made.likelyMarks.push_back({record.id, likely});
     else if (source || likely)

@@ -47,14 +47,6 @@ bool isHardlyKnown(const KnownList::Records &records)
     });
 }
 
-const EffectRecord *findIn(const KnownList::Records &records,
-                           const std::function<bool(const EffectRecord &)> &matches)
-{
-    const auto found = std::find_if(records.begin(), records.end(),
-                                    [&](const EffectRecord *each) { return matches(*each); });
-    return found == records.end() ? nullptr : *found;
-}
-
 /// True for a sub-plug-in of which nothing but its crash is known.
 bool isFromMarker(const EffectRecord *record)
 {
@@ -66,13 +58,6 @@ bool isFromMarker(const EffectRecord *record)
 bool hasSomethingToLose(const EffectRecord &record)
 {
     return record.hasMarks() || (!record.enabled && !record.working && !record.isIgnored());
-}
-
-/// A lone record that stands for a whole file, as catalogues of earlier versions hold; null when there is
-/// none.
-const EffectRecord *loneFileRecord(const KnownList::Records &records)
-{
-    return records.size() == 1 && records.front()->standsForFile() ? records.front() : nullptr;
 }
 
 bool hasCrashed(const KnownList &known)
@@ -89,6 +74,7 @@ ScanPlan::ScanPlan(const CatalogueHost &host, const ProbeMemory &memory, const F
     , m_memory(memory)
     , m_unread(finder.unread())
     , m_area(finder.area())
+    , m_marks(host.known())
     , m_hasNewCrashes(host.hasNewCrashes() ||
                       (hasCrashed(host.known()) && memory.hasUnsettled(host.format())))
 {
@@ -129,18 +115,12 @@ void ScanPlan::decide(const QStringList &modules)
                           [](const ScanItem &item) { return !item.known.empty() || !item.moved.empty(); });
     std::stable_partition(m_items.begin(), m_items.end(),
                           [this](const ScanItem &item) { return m_host.isSuspect(item.path); });
+    m_marks.addAway(m_away);
     for (const ScanItem &item : m_items)
         for (const KnownList::Records &records : {item.known, item.moved})
-            indexUnsettled(records);
+            m_marks.addAsked(records);
     for (const KnownFile &gone : m_gone)
-        indexUnsettled(gone.records);
-}
-
-void ScanPlan::indexUnsettled(const KnownList::Records &records)
-{
-    for (const EffectRecord *record : records)
-        if (!record->standsForFile() && !m_unsettled.contains(record->id))
-            m_unsettled.insert(record->id, record);
+        m_marks.addGone(gone.records);
 }
 
 void ScanPlan::decideModule(const QString &path)
@@ -389,7 +369,7 @@ void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes
     const KnownList::Records present = m_host.known().recordsOfPath(*crashed);
     const EffectRecord &file = *present.front();
     for (const EffectRecord *record : gone.records) {
-        const EffectRecord *same = findIn(
+        const EffectRecord *same = findRecord(
             present, [&](const EffectRecord &each) { return m_host.known().isSameOfFile(*record, each); });
         if (same) {
             if (!same->hasMarks())
@@ -497,58 +477,4 @@ KnownList::Records ScanPlan::deadly(const ScanItem &item) const
                                     old->fileTime == item.fileTime;
                          });
     return deadly;
-}
-
-const EffectRecord *ScanPlan::sourceOfMarks(const ScanItem &item, const EffectRecord &probed,
-                                            bool isOnly) const
-{
-    const auto isSame = [&](const EffectRecord &old) { return m_host.known().isSameOfFile(old, probed); };
-    const auto hasId = [&](const EffectRecord &old) { return old.id == probed.id; };
-    const auto isSamePlugin = [&](const EffectRecord &old) { return hasId(old) && !old.standsForFile(); };
-    const EffectRecord *own = findIn(item.known, isSame);
-    if (own && hasId(*own))
-        return own;
-    // Also of a file that is there: its copy comes to list what it does not list any more. Before what had
-    // the place: a file may have been moved over another.
-    if (const EffectRecord *same = m_host.known().pluginOfFileName(item.path, probed.id))
-        return same;
-    if (const EffectRecord *same = findIn(m_away, isSamePlugin))
-        return same;
-    if (own && (own->working || own->hasMarks()))
-        return own;
-    if (const EffectRecord *same = askedElsewhere(probed))
-        return same;
-    const EffectRecord *child = missingChild(item, probed);
-    if (child || own || !isOnly)
-        return child ? child : own;
-    const EffectRecord *lone = loneFileRecord(item.known);
-    return lone ? lone : loneFileRecord(item.moved);
-}
-
-/// The same plug-in of another file that is asked as well, whichever of the two holds it from now on, or that
-/// is gone: its version may have been a part of its name.
-const EffectRecord *ScanPlan::askedElsewhere(const EffectRecord &probed) const
-{
-    const EffectRecord *same = m_unsettled.value(probed.id);
-    return same && same->id == probed.id ? same : nullptr; // a crash may have taken it the identifier since
-}
-
-/// The sub-plug-in of a missing namesake that crashed, and so lost its identifier.
-const EffectRecord *ScanPlan::missingChild(const ScanItem &item, const EffectRecord &probed) const
-{
-    if (probed.subName.isEmpty())
-        return nullptr;
-    KnownList::Records missing = m_away;
-    for (const KnownFile &file : m_gone)
-        missing.insert(missing.end(), file.records.begin(), file.records.end());
-    return findIn(missing, [&](const EffectRecord &old) {
-        return m_host.known().isSameOfFile(old, probed) && old.subName == probed.subName &&
-               isSamePath(fileNameOf(old.path), fileNameOf(item.path));
-    });
-}
-
-const EffectRecord *ScanPlan::likelySourceOfMarks(const ScanItem &item, const EffectRecord &probed) const
-{
-    return findIn(item.moved,
-                  [&](const EffectRecord &old) { return m_host.known().isSameOfFile(old, probed); });
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
+#include "Main/AudioEngineController/Effects/Host/MarkSources.h"
 #include "Main/AudioEngineController/Effects/Protocol/ProbeMemory.h"
 
 #include <QHash>
@@ -9,14 +10,6 @@
 
 #include <map>
 #include <vector>
-
-/// A module that a scan has to probe.
-struct ScanItem {
-    QString path;
-    QString fileTime;
-    KnownList::Records known; ///< of this path, the one that speaks for the file first
-    KnownList::Records moved; ///< of a file that is gone, of this file name: they move here, whole
-};
 
 /// Decides what becomes of each module that a search found, and of what is known of those that it did not
 /// find. Pure bookkeeping: nothing is loaded, added or written.
@@ -70,12 +63,8 @@ public:
     /// Whether files are gone that were known.
     bool hasGone() const { return !m_gone.empty(); }
 
-    /// The old record whose marks a newly probed one takes over; null when there is none. `isOnly`: the
-    /// file lists nothing else.
-    const EffectRecord *sourceOfMarks(const ScanItem &item, const EffectRecord &probed, bool isOnly) const;
-    /// Where there is none: the record in whose place it came, in a file that moved. Another file may yet
-    /// come to list that plug-in.
-    const EffectRecord *likelySourceOfMarks(const ScanItem &item, const EffectRecord &probed) const;
+    /// Whose marks what is newly probed takes over.
+    const MarkSources &marks() const { return m_marks; }
 
     /// A record of a gone file at a path where it is asked again next time.
     static EffectRecord movedUnasked(const EffectRecord &gone, const QString &path);
@@ -117,9 +106,6 @@ private:
     bool isUnchangedCopy(const ScanItem &item) const;
     void leaveOutCopies();
     void askCopiesOfUnsettled();
-    void indexUnsettled(const KnownList::Records &records);
-    const EffectRecord *askedElsewhere(const EffectRecord &probed) const;
-    const EffectRecord *missingChild(const ScanItem &item, const EffectRecord &probed) const;
     void keep(const KnownList::Records &records);
 
     const CatalogueHost &m_host;
@@ -127,6 +113,7 @@ private:
     QStringList m_folders; ///< clean
     QStringList m_unread;
     SearchArea m_area;
+    MarkSources m_marks;
     QStringList m_ignored;
     bool m_hasNewCrashes;
     std::map<QString, bool> m_isFolderThere; ///< and searched, with some content
@@ -134,8 +121,6 @@ private:
     QSet<QString> m_keptPaths;                   ///< by `pathKey`
     QSet<QPair<QString, QString>> m_keptPlugins; ///< path and identifier of those that work
     std::vector<ScanItem> m_items;
-    QHash<QString, const EffectRecord *>
-        m_unsettled; ///< what is known of these and of gone files, by identifier
     std::vector<KnownFile> m_gone;
     std::vector<SettledFile> m_settled;
     KnownList::Records m_away;
