@@ -119,7 +119,7 @@ void FolderScan::plan()
 void FolderScan::scan()
 {
     if (m_plan) // else there is nothing to be scanned
-        finish(probeItems());
+        finish(m_pooled ? probeInPool() : probeHere());
 }
 
 bool FolderScan::isCancelled() const
@@ -170,30 +170,6 @@ void FolderScan::addKept()
             m_later.push_back(*record); // a file that lists the same and works goes first
 }
 
-void FolderScan::showItemProgress()
-{
-    if (!m_progress)
-        return;
-    m_progress->setRange(static_cast<int>(m_plan->items().size()), QString());
-    m_progress->setValue(static_cast<int>(m_done));
-}
-
-bool FolderScan::probeItems()
-{
-    if (m_pooled)
-        return probeInPool();
-    showItemProgress();
-    for (const ScanItem &item : m_plan->items()) {
-        if (isCancelled())
-            return false;
-        probe(item);
-        ++m_done;
-        if (m_progress)
-            m_progress->setValue(static_cast<int>(m_done));
-    }
-    return !isCancelled();
-}
-
 ProbeOutcome FolderScan::readable(const ScanItem &item, ProbeOutcome outcome)
 {
     outcome.reason.remove(item.path + QLatin1String(": ")); // the path stands beside it
@@ -220,26 +196,6 @@ void FolderScan::beginItem(const ScanItem &item)
     m_file.fileTime = item.fileTime;
     m_memory.begin();
     m_isTouched = false;
-    m_childrenDone = 0;
-}
-
-void FolderScan::probe(const ScanItem &item)
-{
-    if (!m_runner)
-        m_runner = std::make_unique<ProbeRunner>(m_host);
-    beginItem(item);
-    const ProbeOutcome outcome = ScanControl::instance().isSkipped(item.path)
-                                     ? ProbeOutcome::skipped()
-                                     : readable(item, m_runner->run(jobOf(item), *this));
-    m_memory.end(m_file, outcome, m_isTouched);
-    const bool added = keepOutcome(item, outcome);
-    log(item, outcome, 0);
-    if (added)
-        writeInterim();
-    m_memory.write(false);
-    m_host.clearSuspect(item.path);
-    if (m_childrenDone != 0)
-        showItemProgress();
 }
 
 void FolderScan::log(const ScanItem &item, const ProbeOutcome &outcome, int worker) const
@@ -536,43 +492,4 @@ void FolderScan::forgetGone()
             there.insert(pathKey(record->path));
     m_memory.keepOnly(
         [&](const QString &path) { return m_plan->isOutside(path) || there.contains(pathKey(path)); });
-}
-
-void FolderScan::stageEntered(ProbeStage stage)
-{
-    if (!m_isTouched) {
-        m_isTouched = true;
-        showScanning(m_host.displayName(m_file.path));
-        DebugTrace(L"Probing %ls", m_file.path);
-        ProbeReport::instance().begin(m_host.format(), m_file);
-    }
-    ProbeReport::instance().stage(stage);
-}
-
-void FolderScan::classBegins(const QString &name) { showScanning(name); }
-
-void FolderScan::classAnnounced() { notifyUI(MessageCode::kEntryAdded); }
-
-void FolderScan::childrenFound(std::size_t count)
-{
-    if (m_progress)
-        m_progress->setRange(static_cast<int>(count), QStringLiteral("Scanning WaveShell"));
-}
-
-void FolderScan::childBegins(const EffectRecord &child)
-{
-    m_child = child;
-    showScanning(child.subName);
-    ProbeReport::instance().begin(m_host.format(), child);
-}
-
-void FolderScan::childEnds(const ProbeOutcome &outcome)
-{
-    if (!outcome.reason.isEmpty())
-        DebugLog(L"%ls, %ls: %ls", m_child.path, m_child.subName, outcome.reason);
-    ProbeReport::instance().end(m_host.format(), m_child, outcome);
-    m_memory.childEnded(m_child.subId, outcome.reason);
-    ++m_childrenDone;
-    if (m_progress)
-        m_progress->setValue(static_cast<int>(m_childrenDone));
 }

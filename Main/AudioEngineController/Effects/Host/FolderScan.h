@@ -1,7 +1,6 @@
 #pragma once
 
 #include "Main/AudioEngineController/Effects/Host/CatalogueHost.h"
-#include "Main/AudioEngineController/Effects/Host/ProbeRunner.h"
 #include "Main/AudioEngineController/Effects/Host/ScanMemory.h"
 #include "Main/AudioEngineController/Effects/Host/ScanPlan.h"
 
@@ -18,12 +17,15 @@ struct OutcomeRecords;
 /// One scan of a host's folders: finds the modules, has those probed that are new or changed, and keeps what
 /// they say: passes marks on, adds records, writes catalogues, logs and reports each outcome once. Used once,
 /// on the scan worker.
-class FolderScan : private IProbeObserver {
+class FolderScan {
+    class LocalScan;
     class PooledScan;
 
 public:
     explicit FolderScan(CatalogueHost &host);
-    ~FolderScan() override;
+    ~FolderScan();
+    FolderScan(const FolderScan &) = delete;
+    FolderScan &operator=(const FolderScan &) = delete;
 
     /// Finds the modules and decides which are to be probed. Where there is a pool, it has their jobs from
     /// then on. Never throws.
@@ -39,9 +41,9 @@ private:
     QStringList findModules() const;
     void keepKnownPaths(QStringList &paths) const;
     void addKept();
-    bool probeItems();
     void beginItem(const ScanItem &item);
     void probe(const ScanItem &item);
+    bool probeHere();
     void makePool();
     bool probeInPool();
     /// Whether what came of an item is kept.
@@ -72,22 +74,12 @@ private:
     static void removeWaiting(const ScanItem &item, WaitingRecords &waiting);
     bool writeInterim();
     bool isCancelled() const;
-    void showItemProgress();
-
-    void stageEntered(ProbeStage stage) override;
-    void classBegins(const QString &name) override;
-    void classAnnounced() override;
-    void childrenFound(std::size_t count) override;
-    void childBegins(const EffectRecord &child) override;
-    void childEnds(const ProbeOutcome &outcome) override;
-    void childCloses(const EffectRecord &) override {}
-    void childClosed() override {}
 
     CatalogueHost &m_host;
     std::shared_ptr<FileFinder> m_finder;
     std::unique_ptr<ScanPlan> m_plan;
-    std::unique_ptr<ProbeRunner> m_runner; ///< made for the first item: most scans find nothing new
-    std::shared_ptr<PooledScan> m_pooled;  ///< where workers ask
+    std::shared_ptr<LocalScan> m_local;   ///< where this process asks
+    std::shared_ptr<PooledScan> m_pooled; ///< where workers ask
     std::shared_ptr<VProgressDisplay> m_progress;
     ScanMemory m_memory;
     QSet<QString> m_found; ///< the modules, by `pathKey`
@@ -104,8 +96,6 @@ private:
     /// Items by the keys of their file names, made when they are first looked up.
     mutable QHash<QString, std::vector<std::size_t>> m_namesakes;
 
-    EffectRecord m_file;            ///< of the item at hand: path and time
-    EffectRecord m_child;           ///< the sub-plug-in at hand
-    bool m_isTouched = false;       ///< the item at hand has entered its first stage
-    std::size_t m_childrenDone = 0; ///< of the item at hand
+    EffectRecord m_file;      ///< of the item at hand: path and time
+    bool m_isTouched = false; ///< the item at hand has entered its first stage
 };
