@@ -121,6 +121,18 @@ scan
 loaded Far
 vst3 Path: a/Comp.vst3, first/Far.vst3, Also.vst3
 
+= A file stays where it is known in whatever order its folders are listed
+put ../Store/Odd.vst3:
+write W/x: x
+link Plugins/up W
+link Plugins/one.vst3 Store/Odd.vst3
+link W/two.vst3 Store/Odd.vst3
+folders @/Plugins/up @/Plugins
+scan
+vst3 Path: up/two.vst3
+folders @/Plugins @/Plugins/up
+same
+
 = CLAP plug-ins are listed with all that they say and keep their marks
 put Two.clap: class A | #1 | vendor V | version 2.1 | features audio-effect reverb x:y | class B | inputs 1 2:aux | outputs 6
 put Some.clap/Inside.clap:

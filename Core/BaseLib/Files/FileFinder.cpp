@@ -119,13 +119,24 @@ void FileFinder::setArea(const SearchArea &area)
 
 QString FileFinder::foundInsteadOf(const QString &path) const
 {
-    for (const Place &other : m_otherPaths)
-        if (isBelow(path, other.path))
-            return knownAs({path, moved(path, other.path, other.real)});
-    // The link by which it is known may lie where this search did not look.
+    const QString known = knownByLink(path);
+    if (m_foundKeys.contains(pathKey(known)))
+        return known;
+    // There may be further links behind this one, or one where this search did not look.
     const std::optional<QString> real =
-        m_area.isLimited() && fileAnswers(path) ? realPath(path) : std::nullopt;
-    return real ? knownAs({path, *real}) : QString();
+        (!known.isNull() || m_area.isLimited()) && fileAnswers(path) ? realPath(path) : std::nullopt;
+    return real ? knownAs({path, *real}) : known;
+}
+
+/// The same as one link tells it, without asking the system: the one that leads to the longest part of the
+/// path.
+QString FileFinder::knownByLink(const QString &path) const
+{
+    const Place *longest = nullptr;
+    for (const Place &other : m_otherPaths)
+        if (isBelow(path, other.path) && (!longest || other.path.size() > longest->path.size()))
+            longest = &other;
+    return longest ? knownAs({path, moved(path, longest->path, longest->real)}) : QString();
 }
 
 /// The path under which what lies at a place was listed, or would have been.
@@ -287,6 +298,9 @@ bool FileFinder::search(const QStringList &folders, const Cancelled &isCancelled
         if (!follow(link, isCancelled))
             return false;
     }
+    if (hasOtherPaths())
+        for (const QString &path : m_found)
+            m_foundKeys.insert(pathKey(path));
     return true;
 }
 

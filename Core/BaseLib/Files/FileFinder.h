@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Files/SearchArea.h"
 
 #include <QHash>
+#include <QSet>
 #include <QString>
 #include <QStringList>
 
@@ -105,6 +106,7 @@ private:
     bool isListedFile(const Place &start) const;
     bool isInArea(const Place &start, const QString &path) const;
     bool mayHoldSome(const Place &start, const QString &folder) const;
+    QString knownByLink(const QString &path) const;
     QString knownAs(const Place &place) const;
     QString searchedAs(const QString &real) const;
     QString searchedInAreaAs(const QString &real) const;
@@ -125,9 +127,10 @@ private:
     QStringList m_realOthers;  ///< those
     std::vector<Link> m_met;   ///< links, in the order in which they are followed
     std::vector<Place> m_otherPaths;
-    Reached m_starts;       ///< where searches start: the folders, and those that links lead to
-    Reached m_startsMet;    ///< those that another search comes upon; mostly empty, which saves a look-up
-    Reached m_listedByLink; ///< links that are looked for, by `listedKey`
+    QSet<QString> m_foundKeys; ///< of m_found, where there are other paths
+    Reached m_starts;          ///< where searches start: the folders, and those that links lead to
+    Reached m_startsMet;       ///< those that another search comes upon; mostly empty, which saves a look-up
+    Reached m_listedByLink;    ///< links that are looked for, by `listedKey`
 };
 
 /// The paths that a new finder finds in one folder.
