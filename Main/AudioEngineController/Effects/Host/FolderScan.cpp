@@ -23,7 +23,8 @@ void replaceControls(EffectRecord &record)
     for (QString *text :
          {&record.name, &record.id, &record.vendor, &record.version, &record.categories, &record.subName})
         for (QChar &character : *text)
-            if (character < QLatin1Char(' '))
+            if (character < QLatin1Char(' ') ||
+                character >= QChar(0xFFFE)) // no XML reader takes the last two
                 character = QLatin1Char(' ');
 }
 
