@@ -119,9 +119,9 @@ TEST_F(Looking, EverythingIsToldOfOnePlugin)
          {"state +disabled", "sub-plug-in +Two \\(2\\)",
           kPathCase == Qt::CaseSensitive
               ? "crashed at(.|\n)*Shell\\.\\w+\\+0x"
-              : "with exit code 3 while it was starting"}}, // abort() is an exit on Windows
+              : "with exit code 3 when it was started"}}, // abort() is an exit on Windows
         {"One", 0, {"state +ok", "last probe +listed"}},
-        {"Null", 0, {"last probe +failed while it was starting", "reason +its entry point returned null"}},
+        {"Null", 0, {"last probe +failed when it was started", "reason +its entry point returned null"}},
         {"Empty", 0, {"last probe +failed while it was being loaded, .*\n  reason +it is empty\n"}},
         {"Nobody", 2, {"no plug-in is named 'Nobody'"}},
         {"Bare.vst3", 2, {"Bare.vst3: GetPluginFactory returned null"}},

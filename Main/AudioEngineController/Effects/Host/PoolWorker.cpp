@@ -102,9 +102,9 @@ CrashReport PoolWorker::whyEnded(const WorkerEnd &how, QString printed) const
         DebugLog(L"%ls crashed at %ls", path, crash.frames.join(QStringLiteral(" < ")));
     QString text = endedFor + when;
     if (endedFor.isEmpty() && !crash.summary.isEmpty())
-        text = QStringLiteral("it crashed%1: %2").arg(when, crash.summary);
+        text = QStringLiteral("it crashed%1 (%2)").arg(when, crash.summary);
     else if (endedFor.isEmpty() && how.crashed)
-        text = QStringLiteral("it crashed%1: %2").arg(when, how.text);
+        text = QStringLiteral("it crashed%1 (%2)").arg(when, how.text);
     else if (endedFor.isEmpty() && how.code == kChannelLost)
         text = QStringLiteral("it closed the channel of its worker") + when;
     else if (endedFor.isEmpty())

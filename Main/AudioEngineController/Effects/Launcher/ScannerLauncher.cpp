@@ -23,7 +23,7 @@ QString blame(const ScannerRunEnd &end, std::optional<ProbeStage> stage)
     const QString when = stage ? QLatin1String(duringStage(*stage)) : QLatin1String();
     switch (end.how) {
     case ScannerRunEnd::How::Crashed:
-        return QStringLiteral("it crashed the scanner%1: %2").arg(when, end.text);
+        return QStringLiteral("it crashed the scanner%1 (%2)").arg(when, end.text);
     case ScannerRunEnd::How::TimeLimit:
         return QStringLiteral("it gave no answer for %1 s%2").arg(end.code).arg(when);
     default:

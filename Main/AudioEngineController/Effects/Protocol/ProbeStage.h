@@ -16,7 +16,7 @@ inline const char *duringStage(ProbeStage stage)
     case ProbeStage::Load:
         return " while it was being loaded";
     case ProbeStage::Start:
-        return " while it was starting";
+        return " when it was started";
     case ProbeStage::Ask:
         return " while it was asked for its data";
     case ProbeStage::Close:
