@@ -237,8 +237,8 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
         m_host.setHidden(likely.first, true);
     }
     for (const EffectRecord &record : records.listed)
-        if (!records.likelyMarks.empty()) // else they would speak for the file if this process ends
-            m_host.setUnsettled(record.id, true);
+        if (!records.likelyMarks.empty() && (record.enabled || record.working)) // what crashed is not asked
+            m_host.setUnsettled(record.id, true); // it would speak for the file if this process ends
     m_memory.keep();
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
