@@ -236,6 +236,11 @@ void ScanPlan::settleAllGone(const QStringList &modules)
 {
     if (m_gone.empty())
         return;
+    // Of several of one name the first one's records move.
+    std::stable_partition(m_gone.begin(), m_gone.end(), [](const KnownFile &gone) {
+        return std::any_of(gone.records.begin(), gone.records.end(),
+                           [](const EffectRecord *record) { return record->hasMarks(); });
+    });
     QHash<QString, QStringList> namesakes;
     for (const QString &path : modules)
         namesakes[pathKey(fileNameOf(path))].append(path);
