@@ -55,7 +55,7 @@ void EffectList::setHidden(const QString &id, bool isHidden)
 void EffectList::setUnsettled(const QString &id, bool isUnsettled)
 {
     const auto entry = m_entries.find(id);
-    if (entry == m_entries.end())
+    if (entry == m_entries.end() || entry->second.isUnsettled == isUnsettled)
         return;
     entry->second.isUnsettled = isUnsettled;
     entry->second.forgetText();

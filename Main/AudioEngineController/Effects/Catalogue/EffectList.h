@@ -24,10 +24,12 @@ public:
     const QByteArray &text(const CatalogueFormat &format)
     {
         if (m_rendered.isNull()) {
-            EffectRecord written = record;
-            if (isUnsettled)
-                written.fileTime.clear();
-            m_rendered = renderRecord(format, written);
+            EffectRecord untimed;
+            if (isUnsettled) {
+                untimed = record;
+                untimed.fileTime.clear();
+            }
+            m_rendered = renderRecord(format, isUnsettled ? untimed : record);
         }
         return m_rendered;
     }

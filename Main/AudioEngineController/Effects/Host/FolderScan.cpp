@@ -236,9 +236,10 @@ bool FolderScan::keepOutcome(const ScanItem &item, const ProbeOutcome &outcome)
         m_likelyMarks.push_back(likely);
         m_host.setHidden(likely.first, true);
     }
-    for (const EffectRecord &record : records.listed)
-        if (!records.likelyMarks.empty() && (record.enabled || record.working)) // what crashed is not asked
-            m_host.setUnsettled(record.id, true); // it would speak for the file if this process ends
+    if (!records.likelyMarks.empty()) // else its other records would speak for the file if this process ends
+        for (const EffectRecord &record : records.listed)
+            if (record.enabled || record.working) // what crashed is not asked
+                m_host.setUnsettled(record.id, true);
     m_memory.keep();
     if (!m_hasCollected && added)
         collectWaiting(m_done + 1);
@@ -395,18 +396,22 @@ void FolderScan::finish(bool isWhole)
         if (!m_host.AddEffect(record))
             passMarksToHolder(record);
     QSet<const EffectRecord *> replaced;
+    QSet<QString> open; // files of which a record stays hidden
     for (const auto &[id, old] : m_likelyMarks) {
-        if (mayYetBeListed(*old)) // the next scan knows
+        if (mayYetBeListed(*old)) { // the next scan knows
+            if (const std::optional<EffectRecord> hidden = m_host.findEffect(id))
+                open.insert(pathKey(hidden->path));
             continue;
-        for (const EffectRecord &record : m_host.effects())
-            if (isSamePath(record.path, m_host.findEffect(id)->path))
-                m_host.setUnsettled(record.id, false);
+        }
         if (!m_host.isListed(old->id)) {
             m_host.passMarks(*old, id);
             replaced.insert(old);
         }
         m_host.setHidden(id, false);
     }
+    for (const EffectRecord &record : m_likelyMarks.empty() ? std::vector<EffectRecord>() : m_host.effects())
+        if (!open.contains(pathKey(record.path)))
+            m_host.setUnsettled(record.id, false);
     const auto moved = isWhole ? m_plan->movedToCrashed() : ScanPlan::MovedToCrashed();
     QSet<QString> settled;
     for (const EffectRecord &record : moved.records)
