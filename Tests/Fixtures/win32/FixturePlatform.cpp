@@ -23,13 +23,18 @@ std::string modulePath()
 bool appendToFile(const std::string &path, const std::string &text)
 {
     // Whoever reads the file must be able to remove it meanwhile, as elsewhere.
-    const HANDLE file = CreateFileW(std::filesystem::u8path(path).c_str(), FILE_APPEND_DATA,
+    const HANDLE file = CreateFileW(std::filesystem::u8path(path).c_str(), FILE_APPEND_DATA | FILE_READ_DATA,
                                     FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE, nullptr,
                                     OPEN_ALWAYS, FILE_ATTRIBUTE_NORMAL, nullptr);
     if (file == INVALID_HANDLE_VALUE)
         return false;
+    // NOTE: Wine looks for the file's end and writes in two steps, so that of two modules that write at
+    // once the later line would replace the earlier one. The locked byte is far behind what is read.
+    OVERLAPPED farAway = {};
+    farAway.OffsetHigh = 0x40000000;
     DWORD written = 0;
-    WriteFile(file, text.data(), static_cast<DWORD>(text.size()), &written, nullptr);
+    if (LockFileEx(file, LOCKFILE_EXCLUSIVE_LOCK, 0, 1, 0, &farAway) != FALSE)
+        WriteFile(file, text.data(), static_cast<DWORD>(text.size()), &written, nullptr);
     CloseHandle(file);
     return written == text.size();
 }
