@@ -335,6 +335,32 @@ clap Name Path Favourite CategoryMask: A|b/M.clap|1|0, B|b/M.clap|0|4
 vst2 Name Path Favourite CategoryMask: A|b/M.vst2|1|0, B|b/M.vst2|0|4
 same
 
+= A copy that crashed before keeps what an uninstalled one held, disabled
+put a/M.vst3: class A | #1 | class B | #2
+put a/N.vst2: child 1 C | child 2 D
+write Plugins/a/other: x
+scan
+mark A Favourite 1, B CategoryMask 4, D Favourite 1
+put b/M.vst3: class A | #1 | class B | #2
+put b/N.vst2: child 1 C | child 2 D
+scan
+new b/M.vst3: fault module-entry kill
+new b/N.vst2: fault get-plug-category kill
+scan 3
+remove Plugins/a/M.vst3
+remove Plugins/a/N.vst2
+scan
+loaded .
+vst3 Name Path Favourite CategoryMask Enabled Working: A|b/M.vst3|1|0|0|0, B|b/M.vst3|0|4|0|0, M|b/M.vst3|0|0|0|0
+same
+retry M
+retry N
+new b/M.vst3: class A | #1 | class B | #2
+new b/N.vst2: child 1 C | child 2 D
+scan
+vst3 Name Path Favourite CategoryMask Enabled Working: A|b/M.vst3|1|0|1|1, B|b/M.vst3|0|4|1|1
+vst2 Name Path Favourite Enabled Working: C|b/N.vst2|0|1|1, D|b/N.vst2|1|1|1
+
 = A copy lists what another file of another name held, with its marks, also when the rest of it is switched off and nothing is remembered
 put x/M.vst3: class A | #1 | class D | #4
 put z/Other.vst3: class A | #1 | class C | #3

@@ -65,8 +65,8 @@ private:
 
     void addCopy(const PluginFormatInfo &format, const RememberedProbe &probe)
     {
-        if (!fileAnswers(probe.path) || !QFileInfo::exists(probe.path))
-            return; // gone since
+        if (isCrash(probe.status) || !fileAnswers(probe.path) || !QFileInfo::exists(probe.path))
+            return; // not used whatever the others do, or gone since
         for (const RememberedPlugin &plugin : probe.plugins) {
             const auto holder = m_holders.find({&format, plugin.heldBy, plugin.id});
             if (plugin.heldBy.isEmpty() || holder == m_holders.end())

@@ -45,6 +45,8 @@ void ScanMemory::end(const EffectRecord &file, const ProbeOutcome &outcome, bool
     for (const EffectRecord &record : outcome.records)
         m_item.plugins.push_back({record.id, record.subId, children[record.subId].reason, record.inputs,
                                   record.outputs, QString(), record.name, children[record.subId].frames});
+    if (isCrash(outcome.status) && outcome.records.empty())
+        m_item.plugins = m_probes->listed(m_host.format(), file.path);
 }
 
 void ScanMemory::setHolder(const QString &id, const QString &holder) { setHolderIn(m_item, id, holder); }

@@ -216,9 +216,7 @@ bool ScanPlan::mayMoveOutside(const QString &path) const
     bool hasCopy = false;
     if (m_area.isLimited())
         m_memory.forEach(m_host.format(), [&](const RememberedProbe &last) {
-            hasCopy |= isOutside(last.path) &&
-                       std::any_of(last.plugins.begin(), last.plugins.end(),
-                                   [&](const auto &plugin) { return isSamePath(plugin.heldBy, path); });
+            hasCopy |= isOutside(last.path) && last.hasPluginsOf(path);
         });
     return hasCopy;
 }
@@ -362,10 +360,14 @@ ScanPlan::MovedToCrashed ScanPlan::movedToCrashed() const
 
 void ScanPlan::moveToCrashed(const KnownFile &gone, const QStringList &namesakes, MovedToCrashed &all) const
 {
-    const auto isOnlyCrashed = [this](const QString &path) {
+    // What crashed long ago is none that has moved just now, but it may be a copy.
+    const auto isHeir = [&](const QString &path) {
+        const RememberedProbe *last = m_memory.find(m_host.format(), path);
+        return isNewCrash(path) || (last && last->hasPluginsOf(gone.path));
+    };
+    const auto isOnlyCrashed = [&](const QString &path) {
         const KnownList::Records known = m_host.known().recordsOfPath(path);
-        return !known.empty() && known.front()->isCrashedFile() &&
-               isNewCrash(path) && // what crashed long ago is none that has moved just now
+        return !known.empty() && known.front()->isCrashedFile() && isHeir(path) &&
                std::all_of(known.begin() + 1, known.end(), isFromMarker);
     };
     const auto crashed = std::find_if(namesakes.begin(), namesakes.end(), isOnlyCrashed);
@@ -428,7 +430,7 @@ bool ScanPlan::isUnchangedCopy(const ScanItem &item) const
     if (!item.known.empty() || !item.moved.empty())
         return false;
     const RememberedProbe *last = m_memory.find(m_host.format(), item.path);
-    if (!last || last->fileTime != item.fileTime || !last->isCopy())
+    if (!last || last->fileTime != item.fileTime || !last->isCopy() || isCrash(last->status))
         return false;
     return std::all_of(last->plugins.begin(), last->plugins.end(),
                        [this](const RememberedPlugin &plugin) { return isHeld(plugin); });

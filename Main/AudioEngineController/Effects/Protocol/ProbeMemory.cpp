@@ -158,6 +158,12 @@ bool RememberedProbe::isCopy() const
                         [](const RememberedPlugin &plugin) { return plugin.heldBy.isEmpty(); });
 }
 
+bool RememberedProbe::hasPluginsOf(const QString &holder) const
+{
+    return std::any_of(plugins.begin(), plugins.end(),
+                       [&](const RememberedPlugin &plugin) { return isSamePath(plugin.heldBy, holder); });
+}
+
 QString RememberedProbe::reasonOf(quint32 subId) const
 {
     for (const RememberedPlugin &plugin : plugins)
@@ -240,6 +246,7 @@ void ProbeMemory::setCrash(PluginFormat format, const EffectRecord &plugin, Prob
         probe.status = status;
         probe.reason = reason;
         probe.frames.clear();
+        probe.plugins = listed(format, plugin.path);
     } else {
         const auto isIt = [&](const RememberedPlugin &each) { return each.subId == plugin.subId; };
         probe.plugins.erase(std::remove_if(probe.plugins.begin(), probe.plugins.end(), isIt),
@@ -247,6 +254,16 @@ void ProbeMemory::setCrash(PluginFormat format, const EffectRecord &plugin, Prob
         probe.plugins.push_back({QString(), plugin.subId, reason, -1, -1, QString()});
     }
     set(probe);
+}
+
+std::vector<RememberedPlugin> ProbeMemory::listed(PluginFormat format, const QString &path) const
+{
+    std::vector<RememberedPlugin> plugins;
+    if (const RememberedProbe *last = find(format, path))
+        for (const RememberedPlugin &plugin : last->plugins)
+            if (!plugin.id.isEmpty())
+                plugins.push_back({plugin.id, plugin.subId, QString(), -1, -1, plugin.heldBy, plugin.name});
+    return plugins;
 }
 
 void ProbeMemory::addCrash(PluginFormat format, const EffectRecord &marker)

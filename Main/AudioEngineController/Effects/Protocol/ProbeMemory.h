@@ -39,10 +39,12 @@ struct RememberedProbe {
     /// It crashed, and no scan that saw all folders has come to its end since: a file that is gone may yet
     /// turn out to have moved there.
     bool isUnsettled = false;
-    std::vector<RememberedPlugin> plugins;
+    std::vector<RememberedPlugin> plugins; ///< of a file that crashed: what it listed before
 
     /// True for a copy: other files hold the identifiers of everything that it lists.
     bool isCopy() const;
+    /// Whether another file holds the identifier of anything that it lists.
+    bool hasPluginsOf(const QString &holder) const;
     /// Why a plug-in of the file, or the file itself (0), failed; empty when nobody knows.
     QString reasonOf(quint32 subId) const;
     /// Where a plug-in of the file, or the file itself (0), crashed; empty when it did not, or nobody knows.
@@ -62,6 +64,8 @@ public:
     const RememberedProbe *find(PluginFormat format, const QString &path) const;
     /// Calls back for each probe of a format.
     void forEach(PluginFormat format, const std::function<void(const RememberedProbe &)> &operation) const;
+    /// Which plug-ins a file listed when it was asked last: what a crash leaves of what was known.
+    std::vector<RememberedPlugin> listed(PluginFormat format, const QString &path) const;
     void set(const RememberedProbe &probe);
     /// Remembers that a plug-in, or a sub-plug-in, ended the process that probed it, or gave no answer. Of
     /// the plug-in its path, file time, identifier and name count. The crash is unsettled.
