@@ -3,11 +3,14 @@
 #include "Tests/Fixtures/FixtureScript.h"
 #include "Tests/Support/TestFolder.h"
 
+#include <QEventLoop>
 #include <QFile>
+#include <QTimer>
 
 #include <gtest/gtest.h>
 
 #include <chrono>
+#include <optional>
 
 namespace {
 
@@ -35,6 +38,20 @@ void settleSanitizers(QProcessEnvironment &environment)
     environment.insert("LSAN_OPTIONS", "print_suppressions=0:suppressions=" FXPROBE_LEAK_SUPPRESSIONS);
 }
 
+/// Waits for the end, or for as long, in a loop of events.
+/// NOTE: QProcess::waitForFinished stops to watch the process in the moment in which it ends. Wine 8 may then
+/// tell of the end afterwards, in a thread of its own, to an object that is gone.
+void waitForEnd(QProcess &process, std::optional<std::chrono::milliseconds> atMost = std::nullopt)
+{
+    QEventLoop events;
+    QObject::connect(&process, QOverload<int, QProcess::ExitStatus>::of(&QProcess::finished), &events,
+                     &QEventLoop::quit);
+    if (atMost)
+        QTimer::singleShot(*atMost, Qt::PreciseTimer, &events, &QEventLoop::quit);
+    if (process.state() != QProcess::NotRunning)
+        events.exec();
+}
+
 } // namespace
 
 ScannerRun::ScannerRun(const QString &program, const TestFolder &folder)
@@ -53,7 +70,7 @@ ScannerRun::~ScannerRun()
     if (m_process.state() == QProcess::NotRunning)
         return;
     m_process.kill();
-    m_process.waitForFinished(-1);
+    waitForEnd(m_process);
 }
 
 bool ScannerRun::start()
@@ -75,7 +92,7 @@ bool ScannerRun::waitUntil(const std::function<bool()> &condition)
     while (!condition()) {
         if (m_deadline.hasExpired() || m_process.state() == QProcess::NotRunning)
             return false;
-        m_process.waitForFinished(5);
+        waitForEnd(m_process, std::chrono::milliseconds(5));
     }
     return true;
 }
@@ -89,7 +106,7 @@ const ScannerOutcome &ScannerRun::wait()
     const bool inTime = waitUntil([this] { return m_process.state() == QProcess::NotRunning; });
     if (!inTime) {
         m_process.kill();
-        m_process.waitForFinished(-1);
+        waitForEnd(m_process);
     }
     m_outcome.standardOutput = m_process.readAllStandardOutput();
     m_outcome.standardError = m_process.readAllStandardError();
