@@ -335,6 +335,15 @@ clap Name Path Favourite CategoryMask: A|b/M.clap|1|0, B|b/M.clap|0|4
 vst2 Name Path Favourite CategoryMask: A|b/M.vst2|1|0, B|b/M.vst2|0|4
 same
 
+= A folder that bears a marker's name costs no crash
+write Effects/Kill.scan3/x: x
+write Effects/Dead.scan/x: x
+put Kill.vst3: fault module-entry kill
+put Dead.vst2: fault entry kill
+scan 3
+vst3 Name Enabled Working: Kill|0|0
+vst2 Name Enabled Working: Dead|0|0
+
 = A copy that crashed before keeps what an uninstalled one held, disabled
 put a/M.vst3: class A | #1 | class B | #2
 put a/N.vst2: child 1 C | child 2 D

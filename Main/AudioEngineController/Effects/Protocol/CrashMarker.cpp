@@ -6,6 +6,7 @@
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 
 #include <QFile>
+#include <QFileInfo>
 
 #include <algorithm>
 #include <mutex>
@@ -112,12 +113,20 @@ QString markerPath(const MarkerFormat &format, const QString &folder, const QStr
            ending;
 }
 
+/// Whether something else bears a marker's name: a folder cannot be written to, and a pipe never ends.
+bool isBlocked(const QString &marker)
+{
+    const QFileInfo info(marker);
+    return info.exists() && !info.isFile();
+}
+
 /// A path that no marker in use has; called with the active markers locked.
 QString freeMarkerPath(const MarkerFormat &format, const QString &folder, const EffectRecord &plugin,
                        const QStringList &taken)
 {
     const auto isTaken = [&](const QString &marker) {
-        return contains(activeMarkers().paths, marker) || taken.contains(marker, Qt::CaseInsensitive);
+        return contains(activeMarkers().paths, marker) || taken.contains(marker, Qt::CaseInsensitive) ||
+               isBlocked(marker);
     };
     QString marker = markerPath(format, folder, plugin.name);
     // A sub-plug-in may bear the name of its shell, whose own marker must stay as it is.
