@@ -210,11 +210,15 @@ vst3 Name Path Favourite: B|b/B.vst3|0, S|c/A.vst3|1, T|c/A.vst3|0, D|d/D.vst3|0
 = A copy has what the last file to crash listed
 put b/B.vst3: class S | #1
 put c/A.vst3: class S | #1 | class T | #2
+put b/B.vst2, c/A.vst2: name D | id 7
 scan
-mark S Favourite 1
+mark S Favourite 1, D Favourite 1
 new b/B.vst3: class S | #1 | fault module-entry kill
-scan 2
+new b/B.vst2: fault entry kill
+scan 3
 vst3 Name Path Favourite: B|b/B.vst3|0, S|c/A.vst3|1, T|c/A.vst3|0
+vst2 Name Path Favourite Working: A|c/A.vst2|1|1, D|b/B.vst2|1|0
+scan
 same
 
 = A file is asked for what another one lists no more, whatever a scan that was cut off remembers

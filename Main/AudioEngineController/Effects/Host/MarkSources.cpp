@@ -24,6 +24,12 @@ void MarkSources::addAsked(const KnownList::Records &records)
             m_unsettled.insert(record->id, record);
 }
 
+void MarkSources::addCrashed(const EffectRecord *record, const QString &id)
+{
+    if (!m_unsettled.contains(id))
+        m_unsettled.insert(id, record);
+}
+
 void MarkSources::addGone(const KnownList::Records &records)
 {
     m_missing.insert(m_missing.end(), records.begin(), records.end());
@@ -59,8 +65,7 @@ const EffectRecord *MarkSources::sourceOf(const ScanItem &item, const EffectReco
 /// is gone: its version may have been a part of its name.
 const EffectRecord *MarkSources::unsettled(const EffectRecord &probed) const
 {
-    const EffectRecord *same = m_unsettled.value(probed.id);
-    return same && same->id == probed.id ? same : nullptr; // a crash may have taken it the identifier since
+    return m_unsettled.value(probed.id); // a crash may have taken it the identifier since
 }
 
 /// The sub-plug-in of a missing namesake that crashed, and so lost its identifier.

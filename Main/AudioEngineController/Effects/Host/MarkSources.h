@@ -24,6 +24,8 @@ public:
     void addAway(const KnownList::Records &records);
     /// What is known of a file that is asked, or has moved to one. Of one identifier the first counts.
     void addAsked(const KnownList::Records &records);
+    /// A plug-in that has crashed, and lost its identifier to its file's record: a copy may have it.
+    void addCrashed(const EffectRecord *record, const QString &id);
     /// What is known of a file that is gone.
     void addGone(const KnownList::Records &records);
 
@@ -41,5 +43,5 @@ private:
     const KnownList &m_known;
     KnownList::Records m_away;
     KnownList::Records m_missing;                     ///< away or gone
-    QHash<QString, const EffectRecord *> m_unsettled; ///< asked or gone, by identifier
+    QHash<QString, const EffectRecord *> m_unsettled; ///< asked, crashed or gone, by identifier
 };

@@ -121,6 +121,17 @@ void ScanPlan::decide(const QStringList &modules)
             m_marks.addAsked(records);
     for (const KnownFile &gone : m_gone)
         m_marks.addGone(gone.records);
+    for (const EffectRecord *record : m_kept)
+        if (record->isCrashedFile() && record->hasMarks())
+            addCrashedPlugin(*record);
+}
+
+/// A record for a file has marks where it was that of its only plug-in.
+void ScanPlan::addCrashedPlugin(const EffectRecord &record)
+{
+    const std::vector<RememberedPlugin> listed = m_memory.listed(m_host.format(), record.path);
+    if (listed.size() == 1 && listed.front().subId == 0)
+        m_marks.addCrashed(&record, listed.front().id);
 }
 
 void ScanPlan::decideModule(const QString &path)

@@ -85,6 +85,7 @@ private:
     };
 
     bool isNewCrash(const QString &path) const;
+    void addCrashedPlugin(const EffectRecord &record);
     void decideModule(const QString &path);
     void sortMissing(const QSet<QString> &found);
     void collectSought();
