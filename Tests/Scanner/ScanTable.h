@@ -19,6 +19,7 @@
 //   write FILE: TEXT; remove FILE; move FILE FILE (or folder); holds FILE: TEXT
 //   link FILE FILE                where it lies and where it leads; where there are links
 //   short FILE BYTES              ends a file after so many and dates it as updated; date FILE TIME
+//   blank FILE BYTES              the same with zeros behind, so that its size stays
 //   folders FOLDER…               what the scan list names; only PATH… what scans from now on search of it
 //   excluded PATH…, ignored PATH… what the folder rules name
 //   mark NAME ELEMENT VALUE, …    as the user does
@@ -92,6 +93,7 @@ protected:
             {"remove", [&] { EXPECT_TRUE(QFile::remove(m_folder.path(spelt(file)))); }},
             {"link", [&] { link(spelt(file).section(' ', 0, 0), spelt(file).section(' ', 1)); }},
             {"short", [&] { cutShort(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
+            {"blank", [&] { blank(file.section(' ', 0, 0), file.section(' ', 1).toLongLong()); }},
             {"move", [&] { move(spelt(file).split(' ')); }},
             {"date", [&] { date(file.section(' ', 0, -2), file.section(' ', -1) + ':' + text); }},
             {"during", [&] { during(file, step.section(": ", 1)); }},
@@ -188,6 +190,13 @@ private:
         const QString path = m_folder.path(spelt(file));
         EXPECT_TRUE(QFile::resize(path, size));
         dateLater(path);
+    }
+    /// As a copy leaves it for which space was made, and that broke off.
+    void blank(const QString &file, qint64 from) const
+    {
+        const qint64 size = QFileInfo(m_folder.path(spelt(file))).size();
+        cutShort(file, from);
+        cutShort(file, size); // longer again, with zeros
     }
     void markAsUser(const QString &words) const
     {

@@ -218,6 +218,24 @@ vst3 Name Favourite Working: A|1|1, New|0|1
 vst2 Name Enabled Working: B|1|1, One|1|1, Two|0|0
 same
 
+= A module of which a part is blank is looked at until it is whole again
+put C.clap, D.vst2, E.vst3:
+scan
+mark C Favourite 1, D Favourite 1, E Favourite 1
+blank Plugins/C.clap 20000
+blank Plugins/D.vst2 0
+blank Plugins/E.vst3 8192
+scan
+loaded .
+log: C.clap: it is cut short: a part of it is blank
+vst2 Name FileTime Enabled Working: D||1|0
+same
+put C.clap, D.vst2, E.vst3:
+scan
+clap Name Favourite Working: C|1|1
+vst2 Name Favourite Working: D|1|1
+vst3 Name Favourite Working: E|1|1
+
 = A file that is not a program library is not a plug-in
 put T.vst3:
 put Other.vst3: class Other

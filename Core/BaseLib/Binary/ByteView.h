@@ -57,6 +57,13 @@ public:
         return copy(index * sizeof(T), &value, sizeof(T)) ? std::make_optional(value) : std::nullopt;
     }
 
+    /// Whether the first bytes are all zero; false when they are not all there.
+    bool hasOnlyZeros(quint64 size) const
+    {
+        QByteArray found(static_cast<int>(std::min(size, m_size)), Qt::Uninitialized);
+        return size > 0 && size <= m_size && copy(0, found.data(), size) && found.count('\0') == found.size();
+    }
+
     /// Whether the text stands at `offset`, with its terminating zero.
     bool holdsText(quint64 offset, const QByteArray &text) const
     {

@@ -3,6 +3,7 @@
 #include "Core/BaseLib/Binary/LoadFailure.h"
 #include "Core/BaseLib/Binary/PagedFile.h"
 #include "Core/BaseLib/Binary/PeFormat.h"
+#include "Core/BaseLib/Binary/PeImage.h"
 
 #include <QLocale>
 
@@ -19,7 +20,9 @@ constexpr quint64 kElfOrder = 5; ///< and the one that is 1 where the lowest byt
 constexpr quint64 kElfMachine = 18;
 constexpr quint16 kElfMachineX86_64 = 62;
 constexpr quint32 kElfSegmentUnused = 0;       ///< PT_NULL
+constexpr quint32 kElfSegmentDynamic = 2;      ///< PT_DYNAMIC: what the loader needs to know
 constexpr quint16 kElfCountElsewhere = 0xffff; ///< PN_XNUM: more segments than fit
+constexpr quint64 kPage = 4096;                ///< bytes: disks write in such units
 
 /// Where the numbers that tell the size of an ELF file stand in its header, and in that of a segment.
 struct ElfLayout {
@@ -45,15 +48,20 @@ quint64 numberAt(ByteView bytes, quint64 offset, quint64 width)
     return width == sizeof(quint32) ? at.item<quint32>(0).value_or(0) : at.item<quint64>(0).value_or(0);
 }
 
-/// Where an ELF file must not end before; 0 when it does not tell.
-quint64 elfEnd(ByteView file)
+/// What a file that is whole has.
+struct Extent {
+    quint64 end = 0;      ///< where it must not end before; 0 when it does not tell
+    bool isBlank = false; ///< only zeros are where something must be: space was made for it, and no more
+};
+
+Extent elfExtent(ByteView file)
 {
     if (file.from(kElfOrder).item<uchar>(0).value_or(1) != 1)
-        return 0;
+        return {};
     const ElfLayout &layout = file.from(kElfClass).item<uchar>(0) == 1 ? kElf32 : kElf64;
     quint64 end = layout.headerSize;
     if (file.size() < end)
-        return end;
+        return {end};
     const ByteView counts = file.from(layout.counts);
     const quint64 segmentHeader = counts.item<quint16>(0).value_or(0);
     const quint16 segmentCount = counts.item<quint16>(1).value_or(0);
@@ -62,27 +70,33 @@ quint64 elfEnd(ByteView file)
     if (sectionHeaders > 0)
         end = endOf(numberAt(file, layout.sections, layout.width), sectionHeaders);
     if (segmentCount == kElfCountElsewhere)
-        return end;
+        return {end};
+    bool isBlank = false;
     const quint64 table = numberAt(file, layout.segments, layout.width);
     end = std::max(end, endOf(table, segmentHeader * segmentCount));
     for (quint64 index = 0; end <= file.size() && index < segmentCount; ++index) {
         const ByteView header = file.from(table + index * segmentHeader);
         const quint64 size = numberAt(header, layout.segmentSize, layout.width);
-        if (size > 0 && header.item<quint32>(0) != kElfSegmentUnused)
-            end = std::max(end, endOf(numberAt(header, layout.segmentOffset, layout.width), size));
+        const quint32 type = header.item<quint32>(0).value_or(kElfSegmentUnused);
+        if (size == 0 || type == kElfSegmentUnused)
+            continue;
+        const quint64 offset = numberAt(header, layout.segmentOffset, layout.width);
+        end = std::max(end, endOf(offset, size));
+        // Each entry is two numbers.
+        isBlank |= type == kElfSegmentDynamic && file.from(offset).hasOnlyZeros(2 * layout.width);
     }
-    return end;
+    return {end, isBlank};
 }
 
-/// Where a PE file must not end before; none when it is not one after all, but a program of DOS.
-std::optional<quint64> peEnd(ByteView file)
+/// None when it is no PE file after all, but a program of DOS.
+std::optional<Extent> peExtent(ByteView file)
 {
     const auto start = file.from(kDosNewHeader).item<quint32>(0);
     if (start && *start >= kMostPeStart)
         return std::nullopt; // a text
     const quint64 headerEnd = start.value_or(kDosNewHeader) + sizeof(PeHeader);
     if (!start || file.size() < headerEnd)
-        return headerEnd;
+        return Extent{headerEnd};
     const PeHeader header = file.from(*start).item<PeHeader>(0).value_or(PeHeader{});
     if (header.magic != kPeMagic)
         return std::nullopt;
@@ -93,7 +107,8 @@ std::optional<quint64> peEnd(ByteView file)
         if (section.fileSize > 0 && section.offset > 0)
             end = std::max(end, endOf(section.offset, section.fileSize));
     }
-    return end;
+    const std::optional<PeImage> image = PeImage::read(file);
+    return Extent{end, image && image->isBlank()};
 }
 
 quint16 machineOf(LibraryForm form, ByteView file)
@@ -154,16 +169,20 @@ ModuleInspection inspectContent(ByteView file, const std::vector<QByteArray> &ex
         return {Verdict::CutShort, QLatin1String(kEmptyFile)};
     const bool isElf = start == kElfMagic;
     const bool isPe = file.item<quint16>(0) == kDosMagic;
-    std::optional<quint64> end = isElf ? elfEnd(file) : peEnd(file);
+    std::optional<Extent> whole = isElf ? elfExtent(file) : peExtent(file);
     if (!isElf && !isPe)
-        end = mayBecomeLibrary(start) ? std::make_optional(file.size() + 1) : std::nullopt;
-    if (!end)
+        whole = mayBecomeLibrary(start) ? std::make_optional(Extent{file.size() + 1}) : std::nullopt;
+    if (file.hasOnlyZeros(std::min(file.size(), kPage)))
+        whole = Extent{0, true};
+    if (!whole)
         return {Verdict::NoLibrary, QStringLiteral("it is not a program library")};
-    if (*end > file.size())
+    if (whole->end > file.size())
         return {Verdict::CutShort, QStringLiteral("%1: %2 of at least %3 bytes are there")
                                        .arg(QLatin1String(kCutShort))
                                        .arg(file.size())
-                                       .arg(*end)};
+                                       .arg(whole->end)};
+    if (whole->isBlank)
+        return {Verdict::CutShort, QLatin1String(kCutShort) + QStringLiteral(": a part of it is blank")};
     const QString foreign = foreignness(isElf ? LibraryForm::Elf : LibraryForm::Pe, file);
     if (!exports.empty() && findExports(file, exports) == ExportAnswer::NotExported)
         return {Verdict::NoExport, QStringLiteral("it does not export what was asked for")};

@@ -14,7 +14,8 @@ struct ModuleInspection {
         NoLibrary, ///< it starts with no header of a program library
         NoExport,  ///< it exports nothing of what was asked for
         Foreign,   ///< built for another machine or system
-        CutShort,  ///< its headers speak of more than is there: a copy that has not ended, or broke off
+        CutShort,  ///< its headers speak of what is not there, or blank: a copy that has not ended, or broke
+                   ///< off
         Unopened,  ///< the system does not let us read it
     };
 
@@ -25,7 +26,8 @@ struct ModuleInspection {
 };
 
 /// Looks at a file: one open and a few reads. With names, a library that surely exports none of them is told
-/// apart. Loading a file that is cut short would end the process at the first page that is not there.
+/// apart. Loading a file that is cut short would end the process at the first page that is not there, and at
+/// the first table that is blank.
 ModuleInspection inspectModule(const QString &path, const std::vector<QByteArray> &exports = {});
 
 /// The same for the content of a file, which need not be trustworthy.

@@ -77,6 +77,8 @@ static_assert(sizeof(PeDirectory) == 8 && std::is_trivially_copyable_v<PeDirecto
 
 inline constexpr quint32 kPeDirectoryExports = 0;       // IMAGE_DIRECTORY_ENTRY_EXPORT
 inline constexpr quint32 kPeDirectoryImports = 1;       // IMAGE_DIRECTORY_ENTRY_IMPORT
+inline constexpr quint32 kPeDirectoryExceptions = 3;    // IMAGE_DIRECTORY_ENTRY_EXCEPTION
+inline constexpr quint32 kPeDirectoryRelocations = 5;   // IMAGE_DIRECTORY_ENTRY_BASERELOC
 inline constexpr quint32 kPeDirectoryDelayImports = 13; // IMAGE_DIRECTORY_ENTRY_DELAY_IMPORT
 
 struct PeSection { // IMAGE_SECTION_HEADER
@@ -104,6 +106,10 @@ struct PeExports { // IMAGE_EXPORT_DIRECTORY
     quint32 ordinals; ///< 16-bit indexes of functions, one for each name
 };
 static_assert(sizeof(PeExports) == 40 && std::is_trivially_copyable_v<PeExports>);
+
+/// The sizes of the first entries of tables in which none is all zero.
+inline constexpr quint32 kPeFunctionSize = 12;        // RUNTIME_FUNCTION
+inline constexpr quint32 kPeRelocationHeaderSize = 8; // IMAGE_BASE_RELOCATION
 
 struct PeImport { // IMAGE_IMPORT_DESCRIPTOR
     quint32 lookUpTable;

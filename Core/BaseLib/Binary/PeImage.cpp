@@ -92,6 +92,20 @@ PeDirectory PeImage::directory(quint32 index) const
     return m_directories.item<PeDirectory>(index).value_or(PeDirectory{});
 }
 
+bool PeImage::isBlank() const
+{
+    const struct {
+        quint32 index, firstEntrySize;
+    } tables[] = {{kPeDirectoryExports, sizeof(PeExports)},
+                  {kPeDirectoryExceptions, kPeFunctionSize},
+                  {kPeDirectoryRelocations, kPeRelocationHeaderSize}};
+    return std::any_of(std::begin(tables), std::end(tables), [this](const auto &table) {
+        const PeDirectory place = directory(table.index);
+        return m_isComplete && place.address != 0 && place.size >= table.firstEntrySize &&
+               m_parts.from(place.address).hasOnlyZeros(table.firstEntrySize);
+    });
+}
+
 ExportAnswer PeImage::findExports(const std::vector<QByteArray> &names) const
 {
     const quint32 address = directory(kPeDirectoryExports).address;

@@ -22,6 +22,8 @@ public:
     /// Whether all that the loader would take from the file is there. The tables of other files are all
     /// unreadable.
     bool isComplete() const { return m_isComplete; }
+    /// Whether a table that is there has only zeros where its first entry must be.
+    bool isBlank() const;
 
     /// Whether it exports one of these names. A forwarder to another library counts, an export that has only
     /// a number does not.
