@@ -339,6 +339,16 @@ clap Name Path Favourite CategoryMask: A|b/M.clap|1|0, B|b/M.clap|0|4
 vst2 Name Path Favourite CategoryMask: A|b/M.vst2|1|0, B|b/M.vst2|0|4
 same
 
+= What a process that ended may not have written down is asked again
+put Fail.vst3: answer module-entry false
+put Kill.vst3:
+scan
+write Effects/FXProbes.json: {}
+write Effects/1.scan3: <CrashedPlugin><Path>@/Plugins/Kill.vst3</Path><Name>Kill</Name></CrashedPlugin>
+scan
+loaded Fail
+same
+
 = A folder that bears a marker's name costs no crash
 write Effects/Kill.scan3/x: x
 write Effects/Dead.scan/x: x

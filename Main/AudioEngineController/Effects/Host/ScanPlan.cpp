@@ -145,10 +145,17 @@ void ScanPlan::decideModule(const QString &path)
     const QString fileTime = m_host.moduleTime(path);
     const bool isAbsent = fileTime.isEmpty(); // not a module after all; unless nobody lets us see
     if (m_host.isLeftAlone(path) || (isAbsent && (cannotBeExamined(path) || leadsNowhere(path))) ||
-        (!isAbsent && !known.empty() && !isOutdated(known, fileTime)))
+        (!isAbsent && !known.empty() && !isOutdated(known, fileTime) && !mayBeForgotten(*known.front())))
         keep(known);
     else if (!isAbsent)
         m_items.push_back({path, fileTime, std::move(known), {}});
+}
+
+/// Whether a process that ended knew more of a file than it had time to write down: the memory is not
+/// written after each file.
+bool ScanPlan::mayBeForgotten(const EffectRecord &first) const
+{
+    return m_hasNewCrashes && first.enabled && !m_memory.find(m_host.format(), first.path);
 }
 
 void ScanPlan::sortMissing(const QSet<QString> &found)

@@ -87,6 +87,7 @@ private:
     bool isNewCrash(const QString &path) const;
     void addCrashedPlugin(const EffectRecord &record);
     void decideModule(const QString &path);
+    bool mayBeForgotten(const EffectRecord &first) const;
     void sortMissing(const QSet<QString> &found);
     void collectSought();
     bool isMissing(const QString &path);
