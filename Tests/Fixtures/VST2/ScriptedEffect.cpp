@@ -329,9 +329,10 @@ private:
         const std::size_t count = subjects.size() - 1, place = m_listed++;
         const auto madeUp = static_cast<std::int32_t>(1000000 + place);
         FixtureSubject child = m_subject;
-        if (place < count)
-            script().reach("shell-next", child = subjects[1 + place]);
-        else if (afterChildren() == "repeat")
+        if (place < count) {
+            script().reach("shell-next", subjects[1 + place]); // a fault here leaves no copy behind
+            child = subjects[1 + place];
+        } else if (afterChildren() == "repeat")
             child = subjects[1 + place % count];
         else if (afterChildren() == "endless")
             child = {"Endless " + std::to_string(madeUp), madeUp};
