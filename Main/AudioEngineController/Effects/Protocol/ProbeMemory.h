@@ -52,8 +52,8 @@ struct RememberedProbe {
 };
 
 /// The outcomes of the last probes, of all formats, in a file beside the catalogues, which have no place for
-/// them. Losing the file costs the reasons, and the time to probe copies again; and where a scan was cut off
-/// after a file had moved and crashed, the marks of what it held.
+/// them. Losing the file costs the reasons, and the time to probe copies again; and marks where nothing else
+/// tells whose they are: of a file that moved and crashed in a scan that was cut off, and of a crashed copy.
 /// docs/protocol.md describes it.
 class ProbeMemory {
 public:
