@@ -29,7 +29,8 @@ struct ElfLayout {
     quint64 width; ///< of an offset, in bytes
     quint64 headerSize;
     quint64 segments, sections; ///< offsets of the tables
-    quint64 counts;             ///< size and count of segment headers, then of section headers, 16 bits each
+    quint64 counts; ///< size and count of segment headers, then of section headers, and the place among these
+                    ///< of the one that leads to their names, 16 bits each
     quint64 segmentOffset, segmentSize;
 };
 constexpr ElfLayout kElf32{4, 52, 28, 32, 42, 4, 16};
@@ -65,13 +66,17 @@ Extent elfExtent(ByteView file)
     const ByteView counts = file.from(layout.counts);
     const quint64 segmentHeader = counts.item<quint16>(0).value_or(0);
     const quint16 segmentCount = counts.item<quint16>(1).value_or(0);
-    const quint64 sectionHeaders =
-        quint64(counts.item<quint16>(2).value_or(0)) * counts.item<quint16>(3).value_or(0);
-    if (sectionHeaders > 0)
-        end = endOf(numberAt(file, layout.sections, layout.width), sectionHeaders);
+    const quint64 sectionHeader = counts.item<quint16>(2).value_or(0);
+    const quint16 sectionCount = counts.item<quint16>(3).value_or(0);
+    const quint16 sectionOfNames = counts.item<quint16>(4).value_or(0);
+    const quint64 sections = numberAt(file, layout.sections, layout.width);
+    if (sectionHeader * sectionCount > 0)
+        end = endOf(sections, sectionHeader * sectionCount);
+    // The loader needs no section, but linkers put them behind all else: what ends in zeros is blank here.
+    bool isBlank = sectionOfNames > 0 && sectionOfNames < sectionCount &&
+                   file.from(endOf(sections, sectionOfNames * sectionHeader)).hasOnlyZeros(sectionHeader);
     if (segmentCount == kElfCountElsewhere)
-        return {end};
-    bool isBlank = false;
+        return {end, isBlank};
     const quint64 table = numberAt(file, layout.segments, layout.width);
     end = std::max(end, endOf(table, segmentHeader * segmentCount));
     for (quint64 index = 0; end <= file.size() && index < segmentCount; ++index) {

@@ -156,4 +156,11 @@ TEST(ModuleFile, TellsBeforeLoadingWhatCannotBeLoaded)
             ASSERT_EQ(inspectContent(part.view()).verdict, Is::CutShort)
                 << name << ", " << part.content.size() << " bytes";
         }
+    const int header = 64; // bytes, of the file and of a section
+    CorpusFile blank("elf/needs-two");
+    for (int from = blank.content.size() - header; from >= header; --from) {
+        const int size = blank.content.size() - from;
+        blank.content.replace(from, size, QByteArray(size, '\0'));
+        ASSERT_EQ(inspectContent(blank.view()).verdict, Is::CutShort) << "zeros from " << from;
+    }
 }
