@@ -248,10 +248,14 @@ vst3 Name: Other
 vst2 Name: .
 same
 
-= A bundle without a module for this machine says what it has
+= A bundle without a module for this machine says what it has, and is looked at until it has one
 write Plugins/X.vst3/Contents/aarch64-linux/X.so: x
 scan
 log: X.vst3: the bundle has modules for aarch64-linux only
+vst3 FileTime Working: |0
+put X.bundle:
+scan
+vst3 Name Working: X|1
 write Plugins/Y.vst3/Contents/arm64-win/Y.vst3: y
 write Plugins/Y.vst3/Contents/Resources/y.txt: y
 write Plugins/Y.vst3/Contents/x86_64-linux/y.txt: y

@@ -85,7 +85,9 @@ struct Remedy {
 constexpr Remedy kRemedies[] = {
     {kNeedsLibrary, "Install what it needs. Then, to ask it again:", true},
     {kBuiltFor, "Only another build of it can help. It is asked again when its file changes.", false},
-    {kBundleFor, "Only another build of it can help. It is asked again when its file changes.", false},
+    {kBundleFor, "Only another build of it can help. The next scan looks at it again.", false},
+    {kBundleHas, "Copy or install it anew. The next scan looks at it again.", false},
+    {kBundleClosed, "Let yourself read the folder. The next scan looks at it again.", false},
     {kUnopened, "Let yourself read the file. The next scan looks at it again.", false},
     {kCutShort, "Copy or install it anew. The next scan looks at it again.", false},
     {kEmptyFile, "Copy or install it anew. The next scan looks at it again.", false},

@@ -16,6 +16,8 @@ inline constexpr char kNeedsLibrary[] = "it needs ";
 /// is not whole, is empty, or cannot be read; and that of a bundle without a module for this machine.
 inline constexpr char kBuiltFor[] = "it is built for ";
 inline constexpr char kBundleFor[] = "the bundle has modules for ";
+inline constexpr char kBundleHas[] = "the bundle has "; ///< also of one with none at all, or with several
+inline constexpr char kBundleClosed[] = "its folder Contents cannot be searched: ";
 inline constexpr char kUnopened[] = "it cannot be opened: ";
 inline constexpr char kCutShort[] = "it is cut short";
 inline constexpr char kEmptyFile[] = "it is empty";

@@ -17,6 +17,7 @@ struct ModuleInspection {
         CutShort,  ///< its headers speak of what is not there, or blank: a copy that has not ended, or broke
                    ///< off
         Unopened,  ///< the system does not let us read it
+        Absent, ///< a bundle that holds none for this machine: made for others, or a copy that has not ended
     };
 
     Verdict verdict = Verdict::Loadable;

@@ -48,7 +48,7 @@ struct ProbeOutcome {
     enum class IfFailed {
         Record,    ///< a record of the file says that it does not work; it is asked again when it changes
         KeepKnown, ///< what was known stays as it is; the next scan asks again
-        LookAgain, ///< as `Record`, without a time stamp: copies that are cut short keep their time
+        LookAgain, ///< as `Record`, without a time stamp: what is copied may be whole with the same one
     };
 
     ProbeStatus status = ProbeStatus::Failed;
@@ -100,7 +100,8 @@ struct ProbeOutcome {
         outcome.ifFailed = ifFailed;
         if (file.verdict == Verdict::NoLibrary || file.verdict == Verdict::NoExport)
             outcome.status = ProbeStatus::NoPlugin;
-        if (file.verdict == Verdict::CutShort || file.verdict == Verdict::Unopened)
+        if (file.verdict == Verdict::CutShort || file.verdict == Verdict::Unopened ||
+            file.verdict == Verdict::Absent)
             outcome.ifFailed = IfFailed::LookAgain;
         return outcome;
     }

@@ -25,7 +25,7 @@ ModuleInspection VST3Module::inspect(const QString &path)
     QString reason;
     const QString binary = VST3ModuleFile::binary(path, reason);
     if (binary.isEmpty())
-        return {ModuleInspection::Verdict::Foreign, reason};
+        return {ModuleInspection::Verdict::Absent, reason};
     return PluginLibrary::inspect(binary);
 }
 

@@ -35,9 +35,9 @@ QString VST3ModuleFile::whyNoBinary(const QString &bundle, const char *machine)
     const FolderContent contents = listFolder(path);
     for (const QString &problem : {contents.problem, listFolder(machineFolder(bundle, machine)).problem})
         if (!problem.isEmpty())
-            return QStringLiteral("its folder Contents cannot be searched: ") + problem;
+            return QLatin1String(kBundleClosed) + problem;
     const QStringList machines = otherMachines(contents, path, machine);
     if (!machines.isEmpty())
         return QLatin1String(kBundleFor) + machines.join(QLatin1String(", ")) + QLatin1String(" only");
-    return QStringLiteral("the bundle has no module in Contents/") + QLatin1String(machine);
+    return QLatin1String(kBundleHas) + QLatin1String("no module in Contents/") + QLatin1String(machine);
 }

@@ -1,5 +1,6 @@
 #include "Main/AudioEngineController/Effects/VST3/VST3ModuleFile.h"
 
+#include "Core/BaseLib/Binary/LoadFailure.h"
 #include "Core/BaseLib/Files/FileTime.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
 
@@ -28,7 +29,7 @@ QString unlessSpecial(const QString &path, QString &reason)
     const QFileInfo file(path);
     if (!file.exists() || file.isFile())
         return path;
-    reason = QStringLiteral("it is not a regular file");
+    reason = QLatin1String(kUnopened) + QLatin1String("it is not a regular file");
     return QString();
 }
 
@@ -51,8 +52,9 @@ QString VST3ModuleFile::binary(const QString &path, QString &reason)
     const QStringList found = QDir(folder).entryList({QStringLiteral("*.so")}, QDir::Files);
     if (found.size() == 1)
         return folder + QLatin1Char('/') + found.first();
-    reason = found.isEmpty() ? whyNoBinary(path, kMachine)
-                             : QStringLiteral("the bundle has several modules and none of its own name");
+    reason = found.isEmpty()
+                 ? whyNoBinary(path, kMachine)
+                 : QLatin1String(kBundleHas) + QLatin1String("several modules and none of its own name");
     return QString();
 }
 
