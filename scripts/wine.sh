@@ -36,10 +36,22 @@ prepare_wine() {
     wine rundll32 user32.dll,MessageBeep >/dev/null 2>&1
 }
 
+# What was ended while Wine was starting it may have stayed.
+# shellcheck disable=SC2317 # called by the trap
+end_leftovers() {
+    local process
+    for process in /proc/[0-9]*; do
+        if grep -qsxF wine64 "$process/comm" && grep -qsxzF "WINEPREFIX=$WINEPREFIX" "$process/environ"; then
+            kill -KILL "${process#/proc/}" 2>/dev/null || true
+        fi
+    done
+}
+
 # shellcheck disable=SC2317 # called by the trap
 stop_wine() {
     [[ -n $wine_folder ]] || return 0
     wineserver --kill || true
+    end_leftovers
     if [[ -n $screen ]]; then kill "$screen" 2>/dev/null || true; fi
     wait
     rm -rf "$wine_folder"
