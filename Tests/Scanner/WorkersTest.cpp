@@ -40,6 +40,15 @@ protected:
     {
         return std::any_of(processes.begin(), processes.end(), isProcessRunning);
     }
+    /// Whether all of them end soon: what is ended by force is gone a moment later, and later on a loaded
+    /// machine.
+    static bool endSoon(const std::vector<qint64> &processes)
+    {
+        QElapsedTimer clock;
+        for (clock.start(); runs(processes) && clock.elapsed() < 5000;)
+            QThread::msleep(10);
+        return !runs(processes);
+    }
     /// Ends the scanner by force. What it started must be gone soon after, and what plug-ins started.
     void killAndWatch(ScannerRun &scanner) const
     {
@@ -49,10 +58,7 @@ protected:
             started.push_back(process);
         scanner.kill();
         scanner.wait();
-        QElapsedTimer clock;
-        for (clock.start(); runs(started) && clock.elapsed() < 5000;)
-            QThread::msleep(10);
-        EXPECT_LT(clock.elapsed(), 1000);
+        EXPECT_TRUE(endSoon(started));
     }
     /// The reason that is kept of a module; empty where it has none.
     QString reason(const QString &module) const
@@ -84,8 +90,8 @@ TEST_F(Workers, KeepToThemselvesWhatPluginsDo)
                 {"Garbage", "effect initialize garbage 1\n", "it wrote into the channel of its worker"},
                 {"Greedy", "fault initialize memory\n", "it took more than 400 MiB of memory"},
                 {"Input", "effect initialize input 1\n", ""},
-                {"Late", "effect module-exit late-fault 400\n", ""},
-                {"Patient", "delay initialize 900\n", ""},
+                {"Late", "effect module-exit late-fault 1000\n", ""},
+                {"Patient", "delay initialize 1500\n", ""},
                 {"Printed", "effect initialize print 1\nfault initialize abort\n",
                  "it gave up (abort)/it ended its process with exit code 3"},
                 {"Terminal", "effect initialize terminal 1\n", ""}};
@@ -105,7 +111,7 @@ TEST_F(Workers, KeepToThemselvesWhatPluginsDo)
     }
     EXPECT_EQ(sortedRecords("Name Enabled Working"), expected) << qPrintable(outcome.log);
     EXPECT_GE(this->left().size(), 2U);
-    EXPECT_FALSE(runs(this->left()));
+    EXPECT_TRUE(endSoon(this->left()));
 }
 
 TEST_F(Workers, LeaveWithTheirScannerAndBlameNobody)
