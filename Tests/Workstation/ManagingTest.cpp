@@ -155,7 +155,8 @@ TEST_F(Managing, OnlyWhatTheScanIsLimitedToIsAskedAgain)
     put("b/Kill.vst3", "fault initialize abort\n");
     scan();
     for (const char *options : {"--retry-failed @a", "--retry-failed --rescan-all @a"}) {
-        EXPECT_EQ(runLine(options).exitCode, 0);
+        const ScannerOutcome outcome = runLine(options);
+        EXPECT_EQ(outcome.exitCode, 0) << outcome.standardError.constData();
         EXPECT_EQ(asked(), "Crash");
         EXPECT_EQ(marks(), "Crashx Killx") << "that of the other stays disabled";
     }

@@ -59,8 +59,10 @@ PROCESS_INFORMATION startIdle(DWORD flags)
     STARTUPINFOW start = {};
     start.cb = sizeof start;
     PROCESS_INFORMATION process = {};
-    CreateProcessW(program.c_str(), nullptr, nullptr, nullptr, FALSE, CREATE_SUSPENDED | flags, nullptr,
-                   nullptr, &start, &process);
+    // NOTE: Wine 8 at times starts no process on a busy machine, but does when it is asked again.
+    for (int attempt = 0; attempt < 3 && process.dwProcessId == 0; ++attempt)
+        CreateProcessW(program.c_str(), nullptr, nullptr, nullptr, FALSE, CREATE_SUSPENDED | flags, nullptr,
+                       nullptr, &start, &process);
     return process;
 }
 

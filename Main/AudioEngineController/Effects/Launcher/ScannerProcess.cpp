@@ -16,6 +16,8 @@ namespace {
 constexpr std::chrono::milliseconds kPatience(4000);
 constexpr qint64 kLook = 100;    ///< ms
 constexpr int kMaxOutput = 2000; ///< bytes
+/// NOTE: Wine 8 at times starts no process ("Internal error") on a busy machine where others are crashing.
+constexpr int kStartAttempts = 3;
 
 } // namespace
 
@@ -46,8 +48,11 @@ void ScannerProcess::setEnvironment(const char *variable, int value)
 bool ScannerProcess::start(const QString &program, const QStringList &arguments,
                            std::chrono::milliseconds timeout)
 {
-    m_child->start(program, arguments, QIODevice::ReadWrite);
-    m_started = m_child->waitForStarted(static_cast<int>(timeout.count()));
+    const QDeadlineTimer deadline(timeout);
+    for (int attempt = 0; attempt < kStartAttempts && !m_started && !deadline.hasExpired(); ++attempt) {
+        m_child->start(program, arguments, QIODevice::ReadWrite);
+        m_started = m_child->waitForStarted(static_cast<int>(deadline.remainingTime()));
+    }
     return m_started;
 }
 
