@@ -137,14 +137,14 @@ int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &
     registry.initialise(options.dataFolder, QString(), PluginHost::kDefaultSampleRate,
                         PluginHost::kDefaultBlockSize);
     registry.setSearchedOnly(folders.searched);
-    const CatalogueView before = onlyBelow(readCatalogues(files.effects), folders.reached);
+    const CatalogueView before = onlyBelow(readCatalogues(files.effects), folders.shown);
     const QStringList searched = folders.shown.isEmpty() ? folders.listed : folders.shown;
     if (!place.writeList(workstation.scanFolders())) { // else an old one is scanned
         complain(place.reason());
         return ScanExit::kNotFinished;
     }
     if (options.asksAgain())
-        if (const int failed = prepareAskAgain(options, searched, folders.reached, registry);
+        if (const int failed = prepareAskAgain(options, searched, folders.shown, registry);
             failed != ScanExit::kDone)
             return failed;
     if (options.inProcess)
@@ -155,9 +155,9 @@ int scan(const ScanOptions &options, const DataFiles &files, const ScanFolders &
     const bool isFinished = session.run();
     const ProbeMemory memory(files.effects);
     const CatalogueView now = readCatalogues(files.effects);
-    ScanSummary summary = summariseScan(onlyBelow(now, folders.reached), before, session.account(), memory);
+    ScanSummary summary = summariseScan(onlyBelow(now, folders.shown), before, session.account(), memory);
     if (!folders.shown.isEmpty()) // the one that is used in place of a copy may lie elsewhere
-        summary.duplicates = duplicatesBelow(findDuplicates(now.plugins, memory), folders.reached);
+        summary.duplicates = duplicatesBelow(findDuplicates(now.plugins, memory), folders.shown);
     summary.finished = isFinished;
     if (!isFinished)
         complain(session.reason());

@@ -1,8 +1,6 @@
 #include "Workstation/ScanFolders.h"
 
 #include "Core/BaseLib/Files/AnswerInTime.h"
-#include "Core/BaseLib/Files/FolderListing.h"
-#include "Core/BaseLib/Files/NativeFile.h"
 #include "Core/BaseLib/Files/SearchArea.h"
 #include "Main/AudioEngineController/Effects/Catalogue/CatalogueFile.h"
 #include "Main/AudioEngineController/Effects/Catalogue/PluginFormats.h"
@@ -24,36 +22,6 @@ bool isModuleName(const QString &path)
     return std::any_of(formats.begin(), formats.end(), [&](const PluginFormatInfo &format) {
         return format.isScanned() && path.endsWith(format.moduleEnding, Qt::CaseInsensitive);
     });
-}
-
-/// Some paths, and where links below them lead, but for folders around one of them: no search goes there.
-QStringList withLinked(const QStringList &paths)
-{
-    QStringList real;
-    for (const QString &path : paths)
-        real.append(answers(path) ? realPath(path).value_or(path) : path);
-    QStringList linked;
-    for (QStringList open = paths; !open.isEmpty();) {
-        const QString folder = open.takeLast();
-        const auto pathOf = [&](const QString &name) { return folder + QLatin1Char('/') + name; };
-        const auto isAround = [&](const QString &target) {
-            return std::any_of(real.begin(), real.end(),
-                               [&](const QString &path) { return isBelow(path, target); });
-        };
-        const FolderContent content =
-            answers(folder) ? listFolder(folder, [&](const QString &name) { return answers(pathOf(name)); })
-                            : FolderContent();
-        for (const FolderEntry &entry : content.entries) {
-            const QString path = pathOf(entry.name);
-            const QString target = entry.isLink ? realPath(path).value_or(path) : path;
-            const bool isNew = entry.isLink && !linked.contains(target) && !isAround(target);
-            if (isNew)
-                linked.append(target);
-            if (entry.isFolder && (isNew || !entry.isLink))
-                open.append(target);
-        }
-    }
-    return paths + linked;
 }
 
 bool hasRecordsBelow(const QString &folder, const QString &effectsFolder)
@@ -158,6 +126,5 @@ ScanFolders foldersToScan(const ScanOptions &options, const QString &effectsFold
         if (!isBelowAny(path, folders.listed))
             folders.listed.append(path);
     folders.searched = folders.shown;
-    folders.reached = withLinked(folders.shown);
     return folders;
 }

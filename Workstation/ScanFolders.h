@@ -11,7 +11,6 @@ struct ScanFolders {
     QStringList listed;     ///< for the scan list
     QStringList searched;   ///< of those the only ones to search; none: all
     QStringList shown;      ///< whose plug-ins are printed; none: all
-    QStringList reached;    ///< these, and where links in them lead: plug-ins are known by one path only
     QStringList leftOut;    ///< one sentence each
     QString unusable;       ///< why nothing can be scanned
     bool isDamaged = false; ///< because a file cannot be used that says what to scan and what not

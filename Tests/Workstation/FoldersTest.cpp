@@ -60,7 +60,7 @@ usual .
 shows @/Plugins/a @/Plugins/b: One ok, Two ok, Four ok
 new b/Two.vst3:
 put b/Three.vst3:
-shows @/Plugins/a: One ok, Two ok, Three ok, Four ok
+shows @/Plugins/a: One ok, Three ok
 loaded Two Three
 shows : One ok, Two ok, Three ok, Four ok
 loaded .
